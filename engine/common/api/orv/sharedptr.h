@@ -1,0 +1,144 @@
+#pragma once
+
+#include "orv/log.h"
+#include "orv/shared.h"
+
+#include <cstddef>
+#include <new>
+#include <utility>
+
+namespace orv
+{
+
+/// Smart pointer to a Shared object: one raw pointer, which may be null. Empty stands for "not found" or
+/// "failed" throughout the engine.
+///
+/// Dereferencing an empty pointer logs two errors and yields null; it does not stop the process.
+template <class T>
+class ORV_API SharedPtr
+{
+public:
+    SharedPtr() = default;
+    SharedPtr(std::nullptr_t) {}
+
+    /// Takes a share of the object; a new object's count becomes 1.
+    SharedPtr(T* pointer)
+        : m_ptr(pointer)
+    {
+        if (m_ptr)
+            m_ptr->sharedAcquire();
+    }
+
+    SharedPtr(const SharedPtr& other)
+        : m_ptr(other.m_ptr)
+    {
+        acquireCopied();
+    }
+
+    SharedPtr(SharedPtr&& other) noexcept
+        : m_ptr(std::exchange(other.m_ptr, nullptr))
+    {
+    }
+
+    /// From a pointer to a derived class.
+    template <class U>
+    SharedPtr(const SharedPtr<U>& other)
+        : m_ptr(other.get())
+    {
+        acquireCopied();
+    }
+
+    ~SharedPtr() { release(); }
+
+    SharedPtr& operator=(const SharedPtr& other)
+    {
+        SharedPtr copy(other);
+        swap(copy);
+        return *this;
+    }
+
+    SharedPtr& operator=(SharedPtr&& other) noexcept
+    {
+        SharedPtr taken(std::move(other));
+        swap(taken);
+        return *this;
+    }
+
+    void reset(T* pointer = nullptr)
+    {
+        SharedPtr replacement(pointer);
+        swap(replacement);
+    }
+
+    void swap(SharedPtr& other) noexcept { std::swap(m_ptr, other.m_ptr); }
+
+    T* get() const { return m_ptr; }
+    explicit operator bool() const { return m_ptr != nullptr; }
+
+    T* operator->() const
+    {
+        if (!m_ptr) [[unlikely]]
+        {
+            ORV_LOG_ERROR("Error: pointer operator on null. class: %s", T::className());
+            ORV_ASSERT(m_ptr);
+        }
+        return m_ptr;
+    }
+
+    T& operator*() const
+    {
+        if (!m_ptr) [[unlikely]]
+        {
+            ORV_LOG_ERROR("Error: null shared pointer dereference. class: %s", T::className());
+            ORV_ASSERT(m_ptr);
+        }
+        return *m_ptr;
+    }
+
+private:
+    void acquireCopied()
+    {
+        if (!m_ptr)
+            return;
+        ORV_ASSERT(m_ptr->sharedGetCount() > 0);
+        m_ptr->sharedAcquire();
+    }
+
+    void release()
+    {
+        if (!m_ptr)
+            return;
+        ORV_ASSERT(m_ptr->sharedGetCount() > 0);
+        if (m_ptr->sharedRelease() <= 0)
+            delete m_ptr;
+    }
+
+    T* m_ptr = nullptr;
+};
+
+template <class T, class U>
+bool operator==(const SharedPtr<T>& a, const SharedPtr<U>& b)
+{
+    return a.get() == b.get();
+}
+
+template <class T>
+bool operator==(const SharedPtr<T>& a, const T* b)
+{
+    return a.get() == b;
+}
+
+template <class T>
+bool operator==(const SharedPtr<T>& a, std::nullptr_t)
+{
+    return !a.get();
+}
+
+/// Makes an object and the first pointer to it; empty when there is no memory for it.
+template <class T, class... Arguments>
+SharedPtr<T> makeShared(Arguments&&... arguments)
+{
+    return SharedPtr<T>(new (std::nothrow) T(std::forward<Arguments>(arguments)...));
+}
+
+} // namespace orv

@@ -1,0 +1,8 @@
+#include "orv/shared.h"
+
+namespace orv
+{
+
+Shared::~Shared() = default;
+
+} // namespace orv

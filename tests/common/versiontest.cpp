@@ -1,0 +1,74 @@
+#include "orv/version.h"
+#include "orv/colour.h"
+
+#include <gtest/gtest.h>
+
+#include <string>
+
+using namespace orv;
+
+// Fault caught: ordering by text ("0.9" after "0.14"), by the extra text, or with a later number outvoting an
+// earlier one.
+TEST(Version, orderedByItsNumbersAlone)
+{
+    const struct
+    {
+        Version a;
+        Version b;
+        int order; // the sign of a - b
+    } cases[] = {
+        {Version(1, 0, 0, "a"), Version(1, 0, 0, "b"), 0}, {Version(1, 2, 3, ""), Version(1, 2, 3, "x"), 0},
+        {Version(0, 14, 0, ""), Version(0, 13, 9, ""), 1}, {Version(0, 9, 0, ""), Version(0, 14, 0, ""), -1},
+        {Version(1, 0, 0, ""), Version(0, 99, 99, ""), 1}, {Version(1, 2, 3, ""), Version(1, 2, 4, ""), -1},
+        {Version(-1, 5, 0, ""), Version(0, 0, 0, ""), -1},
+    };
+    for (const auto& c : cases)
+    {
+        SCOPED_TRACE(std::to_string(&c - cases));
+        EXPECT_EQ(c.order == 0, c.a == c.b);
+        EXPECT_EQ(c.order != 0, c.a != c.b);
+        EXPECT_EQ(c.order < 0, c.a < c.b);
+        EXPECT_EQ(c.order > 0, c.a > c.b);
+        EXPECT_EQ(c.order <= 0, c.a <= c.b);
+        EXPECT_EQ(c.order >= 0, c.a >= c.b);
+    }
+}
+
+TEST(Version, ownsItsExtraText)
+{
+    char extra[] = "rc1";
+    const Version version(1, 2, 3, extra);
+    extra[0] = 'X';
+    EXPECT_STREQ("rc1", version.getExtra());
+    EXPECT_STREQ("", Version(1, 2, 3, nullptr).getExtra());
+}
+
+TEST(Version, buildInfoNamesTheChange)
+{
+    const std::string info = getBuildInfo();
+    EXPECT_EQ(0u, info.find("   "));
+    EXPECT_NE(' ', info[3]);
+    const std::string ending = std::string(": ") + CHANGE_ID + "\n";
+    ASSERT_GT(info.size(), ending.size());
+    EXPECT_EQ(ending, info.substr(info.size() - ending.size()));
+    EXPECT_EQ(getBuildInfo(), getBuildInfo()) << "kept, not built anew";
+}
+
+// Fault caught: opacity left out of the arithmetic, or bytes divided by 256.
+TEST(Colour4f, arithmeticTakesInAllFourComponents)
+{
+    Colour4f colour;
+    colour.setColour(255, 0, 128, 255);
+    EXPECT_EQ(Colour4f(1.0f, 0.0f, 128.0f / 255.0f, 1.0f), colour);
+
+    const Colour4f a(0.5f, 1.0f, 1.5f, 2.0f);
+    const Colour4f b(0.25f, 0.5f, 2.0f, 4.0f);
+    EXPECT_EQ(Colour4f(0.75f, 1.5f, 3.5f, 6.0f), a + b);
+    EXPECT_EQ(Colour4f(0.25f, 0.5f, -0.5f, -2.0f), a - b);
+    EXPECT_EQ(Colour4f(0.125f, 0.5f, 3.0f, 8.0f), a * b);
+    EXPECT_EQ(Colour4f(2.0f, 2.0f, 0.75f, 0.5f), a / b);
+
+    colour = a;
+    colour.scale(2.0f);
+    EXPECT_EQ(Colour4f(1.0f, 2.0f, 3.0f, 4.0f), colour);
+}
