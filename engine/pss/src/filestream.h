@@ -1,0 +1,50 @@
+#pragma once
+
+#include "orv/stream.h"
+
+#include <fstream>
+
+namespace orv::detail
+{
+
+/// Reads a regular file. The state is the standard file stream's: a read past the end sets its end-of-file and
+/// fail flags, after which tell() and seek() give -1.
+class FileInputStream : public Stream
+{
+public:
+    /// Measures the file. A size that no int32_t can hold leaves the stream failed.
+    explicit FileInputStream(const char* path);
+
+    bool valid() const override;
+    bool eof() const override;
+    int32_t size() const override;
+    int32_t seek(unsigned int position) override;
+    int32_t tell() const override;
+    int32_t read(void* buffer, unsigned int count) override;
+    int32_t write(const void* buffer, unsigned int count) override;
+
+private:
+    mutable std::ifstream m_file; ///< asking a standard stream for its position is not const
+    int32_t m_size = 0;
+};
+
+/// Creates or empties a file and writes it, unbuffered: what write() returns is what the system took.
+class FileOutputStream : public Stream
+{
+public:
+    explicit FileOutputStream(const char* path);
+
+    /// Looks at the bad flag only, which a failed opening does not set.
+    bool valid() const override;
+    bool eof() const override;
+    int32_t size() const override;
+    int32_t seek(unsigned int position) override;
+    int32_t tell() const override;
+    int32_t read(void* buffer, unsigned int count) override;
+    int32_t write(const void* buffer, unsigned int count) override;
+
+private:
+    mutable std::ofstream m_file;
+};
+
+} // namespace orv::detail

@@ -1,0 +1,176 @@
+// Runs against the real Android log and asset libraries.
+
+#include "orv/assetmgrstreamsource.h"
+#include "orv/log.h"
+
+#include "storedzip.h"
+#include "support/tempdir.h"
+
+#include <android/log.h>
+#include <androidfw/Asset.h>
+#include <androidfw/AssetManager.h>
+#include <gtest/gtest.h>
+
+#include <string>
+#include <vector>
+
+using namespace orv;
+
+namespace
+{
+
+struct Record
+{
+    int priority;
+    std::string tag;
+    std::string message;
+};
+
+bool operator==(const Record& a, const Record& b)
+{
+    return a.priority == b.priority && a.tag == b.tag && a.message == b.message;
+}
+
+void PrintTo(const Record& record, std::ostream* out)
+{
+    *out << record.priority << ' ' << record.tag << ": " << record.message;
+}
+
+std::vector<Record> g_records;
+
+/// Collects what the engine hands to the Android log; the platform's own records go where they always do.
+class AndroidLog : public testing::Test
+{
+protected:
+    void SetUp() override
+    {
+        g_records.clear();
+        __android_log_set_minimum_priority(ANDROID_LOG_VERBOSE);
+        __android_log_set_logger(
+            [](const __android_logger_data* data, const char* message)
+            {
+                if (data->tag && std::string(data->tag).compare(0, 3, "ORV") == 0)
+                    g_records.push_back({data->priority, data->tag, message});
+                else
+                    __android_log_stderr_logger(data, message);
+            });
+    }
+    void TearDown() override { __android_log_set_logger(__android_log_stderr_logger); }
+};
+
+/// A package whose assets folder holds "forty" (40 bytes) and "sub/one" (1 byte).
+class AssetMgrStreamSourceTest : public AndroidLog
+{
+protected:
+    void SetUp() override
+    {
+        const std::string package = pssandroid::makeStoredZip({{"AndroidManifest.xml", "<manifest/>"},
+                                                               {"assets/forty", FORTY},
+                                                               {"assets/sub/one", "1"},
+                                                               {"outside", "not an asset"}});
+        const std::string path = m_dir.write("test.apk", package);
+        ASSERT_TRUE(m_manager.addAssetPath(android::String8(path.c_str()), nullptr));
+        AndroidLog::SetUp();
+    }
+
+    const std::string FORTY = "0123456789012345678901234567890123456789";
+    support::TempDir m_dir;
+    android::AssetManager m_manager;
+    AssetMgrStreamSource m_source{&m_manager};
+};
+
+} // namespace
+
+// Fault caught: a record under another tag or priority, by which the log's filters lose it.
+TEST_F(AndroidLog, recordsCarryTagPriorityAndPlace)
+{
+    pssLogInit();
+    pssLogError("engine/facility/src/assetpath", "open", 1, "%s %d", "one", 1);
+    pssLogWarn("engine\\assetpath", "open", 2, "two%%");
+    pssLogInfo("assetpath", "open", 3, "three");
+    pssLogDebug("a/assetpath", "open", 4, "four");
+    pssLogDeInit();
+    const std::vector<Record> expected = {{6, "ORV", "assetpath; open; 1; one 1"},
+                                          {5, "ORV", "assetpath; open; 2; two%"},
+                                          {4, "ORV", "assetpath; open; 3; three"},
+                                          {3, "ORV", "assetpath; open; 4; four"}};
+    EXPECT_EQ(expected, g_records);
+}
+
+TEST_F(AssetMgrStreamSourceTest, readsWhatThePackageHolds)
+{
+    EXPECT_TRUE(m_source.exists("forty"));
+    EXPECT_TRUE(m_source.exists("sub/one"));
+    const SharedPtr<Stream> stream = m_source.open("forty", false);
+    ASSERT_TRUE(stream);
+    EXPECT_TRUE(stream->valid());
+    EXPECT_EQ(40, stream->size());
+    EXPECT_EQ(0, stream->tell());
+
+    char buffer[128] = {};
+    EXPECT_EQ(36, stream->seek(36));
+    EXPECT_FALSE(stream->eof());
+    EXPECT_EQ(2, stream->read(buffer, 2));
+    EXPECT_EQ(std::string("67"), buffer);
+    EXPECT_EQ(38, stream->tell());
+    EXPECT_EQ(2, stream->read(buffer, 2));
+    EXPECT_TRUE(stream->eof());
+
+    EXPECT_EQ(0, stream->read(nullptr, 2));
+    EXPECT_EQ(0, stream->write("x", 1));
+    EXPECT_EQ(40, stream->tell());
+    EXPECT_TRUE(g_records.empty());
+}
+
+// Fault caught: a position that follows the bytes read, with which an over-long read never reaches eof().
+TEST_F(AssetMgrStreamSourceTest, positionAdvancesByTheBytesAskedFor)
+{
+    const SharedPtr<Stream> stream = m_source.open("forty", false);
+    ASSERT_TRUE(stream);
+    char buffer[128] = {};
+    EXPECT_EQ(40, stream->read(buffer, 100));
+    EXPECT_EQ(FORTY, buffer);
+    EXPECT_EQ(100, stream->tell());
+    EXPECT_TRUE(stream->eof());
+    EXPECT_EQ(0, stream->seek(0));
+    EXPECT_FALSE(stream->eof());
+    EXPECT_EQ(-1, stream->seek(41)) << "the platform's answer";
+}
+
+TEST_F(AssetMgrStreamSourceTest, whatIsMissingIsReportedUnderItsOwnTag)
+{
+    EXPECT_FALSE(m_source.exists("outside"));
+    EXPECT_FALSE(m_source.open("outside", false));
+    const std::vector<Record> expected = {
+        {4, "ORV Asset Mgr", "AssetMgrStreamSource outside  could not load from apk/assets folder"},
+        {6, "ORV Asset Mgr", "AssetMgrStreamSource outside  not found"}};
+    EXPECT_EQ(expected, g_records);
+
+    g_records.clear();
+    EXPECT_FALSE(m_source.exists(""));
+    EXPECT_FALSE(m_source.exists(nullptr));
+    EXPECT_TRUE(g_records.empty());
+
+    EXPECT_FALSE(m_source.open(nullptr, false));
+    EXPECT_FALSE(m_source.open("forty", true));
+    ASSERT_EQ(2u, g_records.size());
+    EXPECT_EQ(6, g_records[1].priority);
+    EXPECT_EQ("ORV", g_records[1].tag);
+    const std::string ending = "; Cannot open a ZIP stream for writing";
+    EXPECT_NE(std::string::npos, g_records[1].message.find(ending));
+}
+
+// Fault caught: an asset that stays open with its mapping when its stream goes.
+TEST_F(AssetMgrStreamSourceTest, streamsCloseTheirAssets)
+{
+    const int before = android::Asset::getGlobalCount();
+    {
+        const SharedPtr<Stream> first = m_source.open("forty", false);
+        const SharedPtr<Stream> second = m_source.open("forty", false);
+        EXPECT_TRUE(m_source.exists("forty"));
+        EXPECT_EQ(before + 2, android::Asset::getGlobalCount());
+        first->seek(7);
+        EXPECT_EQ(0, second->tell());
+    }
+    EXPECT_EQ(before, android::Asset::getGlobalCount());
+}

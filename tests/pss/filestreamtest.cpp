@@ -1,0 +1,171 @@
+#include "orv/filestreamsource.h"
+
+#include "support/logcapture.h"
+#include "support/tempdir.h"
+
+#include <gtest/gtest.h>
+
+#include <cstdlib>
+#include <string>
+
+#include <sys/stat.h>
+#include <unistd.h>
+
+using namespace orv;
+
+namespace
+{
+
+std::string contentOf(const std::string& path)
+{
+    const std::vector<uint8_t> bytes = support::readFile(path);
+    return std::string(bytes.begin(), bytes.end());
+}
+
+} // namespace
+
+// Fault caught: eof() that is already true after the last byte, or a stream that still knows its position after
+// a short read; the readers of scene files are written for neither.
+TEST(FileStream, endOfFileIsThatOfAStandardStream)
+{
+    const support::TempDir dir;
+    dir.write("ten", std::string("0123456789"));
+    const SharedPtr<Stream> stream = FileStreamSource(dir.path().c_str()).open("ten", false);
+    ASSERT_TRUE(stream);
+    char buffer[16] = {};
+    EXPECT_EQ(10, stream->size());
+    EXPECT_EQ(0, stream->tell());
+    EXPECT_EQ(0, stream->read(nullptr, 4));
+    EXPECT_EQ(0, stream->write("x", 1));
+
+    EXPECT_EQ(8, stream->seek(8));
+    EXPECT_EQ(2, stream->read(buffer, 2));
+    EXPECT_EQ(std::string("89"), buffer);
+    EXPECT_FALSE(stream->eof()) << "all read, but nothing was missing yet";
+    EXPECT_EQ(10, stream->tell());
+    EXPECT_TRUE(stream->valid());
+
+    EXPECT_EQ(4, stream->seek(4));
+    EXPECT_EQ(6, stream->read(buffer, 7));
+    EXPECT_TRUE(stream->eof());
+    EXPECT_FALSE(stream->valid());
+    EXPECT_EQ(-1, stream->tell());
+    EXPECT_EQ(-1, stream->seek(0));
+    EXPECT_EQ(0, stream->read(buffer, 1));
+    EXPECT_EQ(10, stream->size());
+}
+
+// Fault caught: names that reach something which is no stream: a directory, which opens but cannot be read, a
+// pipe, which would wait for ever, or a file whose size an int32_t cannot hold.
+TEST(FileStreamSource, onlyReadableFilesExist)
+{
+    const support::TempDir dir;
+    dir.write("folder/file", std::string("x"));
+    dir.write("empty", std::string());
+    ASSERT_EQ(0, mkfifo(dir.path("pipe").c_str(), 0600));
+    const int64_t largest = 0x7fffffff;
+    ASSERT_EQ(0, truncate(dir.write("largest", std::string()).c_str(), off_t(largest)));
+    ASSERT_EQ(0, truncate(dir.write("huge", std::string()).c_str(), off_t(largest + 1)));
+    const struct
+    {
+        const char* name;
+        int64_t size; // -1: there is no such stream
+    } cases[] = {
+        {"folder/file", 1}, {"./folder//file", 1}, {"empty", 0},    {"largest", largest},
+        {"huge", -1},       {"folder", -1},        {"folder/", -1}, {"pipe", -1},
+        {"missing", -1},    {"Empty", -1},         {"", -1},        {nullptr, -1},
+    };
+
+    FileStreamSource source(dir.path().c_str());
+    support::LogCapture log;
+    for (const auto& c : cases)
+    {
+        SCOPED_TRACE(c.name ? c.name : "null");
+        EXPECT_EQ(c.size >= 0, source.exists(c.name));
+        const SharedPtr<Stream> stream = source.open(c.name, false);
+        EXPECT_EQ(c.size, stream ? stream->size() : -1);
+    }
+    EXPECT_EQ("", log.text()) << "what cannot be opened is for the caller to report";
+}
+
+TEST(FileStreamSource, withoutRootReadsBelowTheWorkingDirectory)
+{
+    const support::TempDir dir;
+    dir.write("here", std::string("abc"));
+    char* const before = getcwd(nullptr, 0);
+    ASSERT_EQ(0, chdir(dir.path().c_str()));
+    for (const char* root : {"", static_cast<const char*>(nullptr)})
+    {
+        FileStreamSource source(root);
+        EXPECT_STREQ(".", source.getName());
+        EXPECT_TRUE(source.exists("here"));
+    }
+    EXPECT_EQ(0, chdir(before));
+    std::free(before);
+}
+
+TEST(FileStreamSource, writesWholeFilesAndPatches)
+{
+    const support::TempDir dir;
+    dir.write("out", std::string("something longer that was there before"));
+    FileStreamSource source((dir.path() + "/").c_str());
+    SharedPtr<Stream> stream = source.open("out", true);
+    ASSERT_TRUE(stream);
+    EXPECT_EQ(0, stream->size());
+    EXPECT_EQ(6, stream->write("abcdef", 6));
+    EXPECT_EQ(6, stream->size());
+    EXPECT_EQ(0, stream->write(nullptr, 6));
+    EXPECT_EQ("abcdef", contentOf(dir.path("out"))) << "a reader sees it at once";
+
+    EXPECT_EQ(2, stream->seek(2));
+    EXPECT_EQ(2, stream->size()) << "size is the write position";
+    EXPECT_EQ(1, stream->write("X", 1));
+    EXPECT_EQ(3, stream->tell());
+    char buffer[4];
+    EXPECT_EQ(0, stream->read(buffer, 4));
+    EXPECT_TRUE(stream->valid());
+    stream.reset();
+    EXPECT_EQ("abXdef", contentOf(dir.path("out")));
+}
+
+// Fault caught: a full disk or a missing directory that looks like success.
+TEST(FileStreamSource, whatCannotBeWrittenTakesNothing)
+{
+    const support::TempDir dir;
+    const struct
+    {
+        const char* name;
+        std::string root;
+        const char* file;
+    } cases[] = {
+        {"missing directory", dir.path(), "missing/out"},
+        {"a directory", dir.path(), "."},
+        {"full disk", "/dev", "full"},
+    };
+    for (const auto& c : cases)
+    {
+        SCOPED_TRACE(c.name);
+        const SharedPtr<Stream> stream = FileStreamSource(c.root.c_str()).open(c.file, true);
+        ASSERT_TRUE(stream) << "an output stream is handed out even so";
+        EXPECT_TRUE(stream->valid());
+        EXPECT_EQ(0, stream->write("abc", 3));
+        EXPECT_FALSE(stream->valid());
+        EXPECT_EQ(0, stream->write("abc", 3));
+    }
+    EXPECT_FALSE(FileStreamSource(dir.path().c_str()).open("", true));
+    EXPECT_FALSE(FileStreamSource(dir.path().c_str()).open(nullptr, true));
+}
+
+TEST(StreamSource, getKnowsDirectoriesOnly)
+{
+    const support::TempDir dir;
+    dir.write("file", std::string("x"));
+    support::LogCapture log;
+    const SharedPtr<StreamSource> source = StreamSource::get(dir.path().c_str(), false);
+    ASSERT_TRUE(source);
+    EXPECT_TRUE(source->exists("file"));
+    EXPECT_EQ("", log.text());
+    EXPECT_FALSE(StreamSource::get(dir.path().c_str(), true));
+    EXPECT_EQ(1, log.countMessage("Archive streams are not currently supported."));
+    EXPECT_EQ(1, log.count('I'));
+}
