@@ -1,0 +1,20 @@
+#pragma once
+
+#include "orv/export.h"
+
+#include <cstdint>
+
+namespace orv::detail
+{
+
+/// Moves whenever something outside the draw path has changed a GL binding; bindingsChanged() alone writes it.
+extern ORV_API uint64_t g_bindingEpoch;
+
+/// To be called after every glBind*, glUseProgram, glDelete* or vertex array call that does not go through a
+/// RenderContext. Each context then forgets what it remembers about bindings before its next draw.
+inline void bindingsChanged()
+{
+    ++g_bindingEpoch;
+}
+
+} // namespace orv::detail

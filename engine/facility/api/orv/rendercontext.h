@@ -1,0 +1,259 @@
+#pragma once
+
+#include "orv/detail/bindingepoch.h"
+#include "orv/detail/programhandle.h"
+#include "orv/export.h"
+#include "orv/renderstate.h"
+#include "orv/shared.h"
+#include "orv/sharedptr.h"
+
+#include <cstdint>
+#include <map>
+#include <string>
+
+namespace orv
+{
+
+class ShaderUniformBase;
+
+/// The owner of one GL context's fixed-function state and of its global shader properties.
+///
+/// Every setter compares with a cached copy and calls GL only when something differs. The cache starts with
+/// the defaults of a freshly created context, so a RenderContext is made once, on a fresh GL context, and
+/// after a context loss a new one is made for the new context. State changed behind its back stays unnoticed;
+/// bindings (textures, buffers, programs) are the exception, see detail/bindingepoch.h.
+/// An enum value outside its enum is logged, cached, and sent as GL_INVALID_ENUM, which GL refuses.
+/// GL thread only.
+class ORV_API RenderContext : public Shared
+{
+public:
+    using Ptr = SharedPtr<RenderContext>;
+
+    ORV_CLASS_NAME("RenderContext")
+
+    /// Reads the scissor box and the viewport from GL and changes nothing there.
+    RenderContext();
+    ~RenderContext() override;
+
+    void setBlendEnabled(bool enabled);
+    void setBlendColour(const Colour4f& colour);
+    /// Both sources first, unlike glBlendFuncSeparate.
+    void setBlendFactors(BlendFactor srcColour, BlendFactor srcAlpha, BlendFactor dstColour,
+                         BlendFactor dstAlpha);
+    void setBlendFunctions(BlendFunction colour, BlendFunction alpha);
+    void setCullingMode(CullingMode mode);
+    void setWindingOrder(WindingOrder order);
+    void setLineWidth(float pixels);
+    void setColourMask(bool red, bool green, bool blue, bool alpha);
+    void setDepthWriteEnabled(bool enabled);
+    /// The offset that reaches GL lags one change behind: each change sends the values set before it, and the
+    /// first one from (0, 0) switches the offset on with (0, 0). Setting (0, 0) switches it off at once.
+    void setDepthOffset(float factor, float units);
+    void setDepthTestEnabled(bool enabled);
+    void setDepthTestFunction(DepthFunction function);
+    void setScissorTestEnabled(bool enabled);
+    void setScissorBox(int x, int y, int width, int height);
+    void setStencilTestEnabled(bool enabled);
+    /// The stencil setters touch the given face alone. A face outside its enum is not cached.
+    void setStencilFunction(StencilFace face, StencilFunction function, int reference, unsigned mask);
+    void setStencilOperations(StencilFace face, StencilOperation stencilFail, StencilOperation depthFail,
+                              StencilOperation pass);
+    void setStencilMask(StencilFace face, unsigned mask);
+    void setViewport(int x, int y, int width, int height);
+    void setDepthRange(float zNear, float zFar);
+    void setClearColour(const Colour4f& colour);
+    void setClearDepth(float depth);
+    void setClearStencil(int stencil);
+
+    /// Clears colour, depth and stencil buffers together, every time; masks and scissor box apply as set.
+    void clear();
+
+    bool isBlendEnabled() const { return m_blendEnabled; }
+    /// All cached state that materials set. stencilFunctionMask holds what was sent to GL.
+    const RenderState& getState() const { return m_state; }
+    int getViewportX() const { return m_viewport[0]; }
+    int getViewportY() const { return m_viewport[1]; }
+    int getViewportWidth() const { return m_viewport[2]; }
+    int getViewportHeight() const { return m_viewport[3]; }
+    float getDepthRangeNear() const { return m_depthRange[0]; }
+    float getDepthRangeFar() const { return m_depthRange[1]; }
+    const Colour4f& getClearColour() const { return m_clearColour; }
+    float getClearDepth() const { return m_clearDepth; }
+    int getClearStencil() const { return m_clearStencil; }
+
+    /// Adds a global property. A name that is there already keeps its first holder (logged); so does a
+    /// missing property or name, which is not stored (logged).
+    void addProperty(const SharedPtr<ShaderUniformBase>& property, const char* name);
+    /// @return empty when there is no such property.
+    SharedPtr<ShaderUniformBase> getProperty(const char* name) const;
+    /// Makes uniform the very holder that is stored under name; leaves it alone when there is none.
+    void linkUniform(SharedPtr<ShaderUniformBase>& uniform, const char* name) const;
+
+    /// Identity: no other render context of this process has or had it, so it may be remembered in place of
+    /// a pointer.
+    uint64_t getRevision() const { return m_revision; }
+    /// Another number after every addProperty() that stored something.
+    uint64_t getPropertyRevision() const { return m_propertyRevision; }
+
+    /// Draw path: sends a material's whole state through the setters above, in their order.
+    ///
+    /// The stencil comparison mask that is sent is the state's write mask.
+    /// @param stateRevision  stamp of state: the same stamp, blendEnabled and turnWinding as last time, with
+    ///                       no setter having changed anything since, return at once.
+    /// @param turnWinding    sends the opposite winding order, for geometry that a transform mirrors.
+    void apply(const RenderState& state, uint64_t stateRevision, bool blendEnabled, bool turnWinding = false)
+    {
+        const uint32_t flags = (blendEnabled ? APPLY_BLEND : 0u) | (turnWinding ? APPLY_TURNED : 0u);
+        if (stateRevision != m_appliedRevision || flags != m_appliedFlags)
+            applyChanged(state, stateRevision, flags);
+    }
+
+    // Draw path: bindings. Each operation does nothing when GL is known to hold what it asks for; what was
+    // remembered is forgotten first if bindings were changed elsewhere.
+
+    void useProgram(unsigned name)
+    {
+        checkBindings();
+        if (name != m_program)
+            sendProgram(name);
+    }
+
+    /// The program that GL draws with, 0 for none.
+    unsigned getProgramInUse() const;
+
+    /// The program object that was enabled last, for ShaderProgram::getCurrent(), which see.
+    void setCurrentProgram(const SharedPtr<detail::ProgramHandle>& handle) { m_currentProgram = handle; }
+    const SharedPtr<detail::ProgramHandle>& getCurrentProgram() const { return m_currentProgram; }
+
+    /// @param unit    from 0; GL_TEXTURE0 + unit is active afterwards if GL had to be called.
+    /// @param target  GL_TEXTURE_2D, GL_TEXTURE_CUBE_MAP or GL_TEXTURE_EXTERNAL_OES; what the unit's other
+    ///                targets hold stays.
+    void bindTexture(int unit, unsigned target, unsigned name)
+    {
+        checkBindings();
+        const int slot = getTextureSlot(unit, target);
+        if (slot < 0 || m_textures[slot] != name)
+            sendTexture(unit, target, name, slot);
+    }
+
+    void bindArrayBuffer(unsigned name)
+    {
+        checkBindings();
+        if (name != m_arrayBuffer)
+            sendArrayBuffer(name);
+    }
+
+    void bindElementBuffer(unsigned name)
+    {
+        checkBindings();
+        if (name != m_elementBuffer)
+            sendElementBuffer(name);
+    }
+
+    /// Switches vertex attribute arrays so that those of the mask's bits are enabled and all others are not.
+    void setAttribArrays(uint32_t enabledMask)
+    {
+        checkBindings();
+        if (!m_attribArraysKnown || enabledMask != m_attribArrays)
+            sendAttribArrays(enabledMask);
+    }
+
+    /// Gives a disabled attribute array's location the constant value (1, 1, 1, 1).
+    void setAttribOnes(unsigned location);
+
+    /// Whether arrays, pointers and constants are still those that were set up last for this pair.
+    bool isVertexInputBound(uint64_t programRevision, uint64_t vertexBufferRevision) const
+    {
+        return m_epoch == detail::g_bindingEpoch && m_inputProgram == programRevision &&
+               m_inputBuffer == vertexBufferRevision;
+    }
+
+    void setVertexInputBound(uint64_t programRevision, uint64_t vertexBufferRevision)
+    {
+        checkBindings();
+        m_inputProgram = programRevision;
+        m_inputBuffer = vertexBufferRevision;
+    }
+
+private:
+    static constexpr int TEXTURE_UNITS = 32; ///< remembered; higher units are bound every time
+    static constexpr int TEXTURE_TARGETS = 3;
+    static constexpr uint32_t APPLY_BLEND = 1; ///< bits of m_appliedFlags
+    static constexpr uint32_t APPLY_TURNED = 2;
+    static constexpr unsigned UNKNOWN = 0xFFFFFFFFu; ///< no GL object has this name
+
+    /// @return index into m_textures, -1 for what is not remembered.
+    static int getTextureSlot(int unit, unsigned target)
+    {
+        if (unsigned(unit) >= unsigned(TEXTURE_UNITS))
+            return -1;
+        switch (target)
+        {
+        case 0x0DE1: return unit * TEXTURE_TARGETS;     // GL_TEXTURE_2D
+        case 0x8513: return unit * TEXTURE_TARGETS + 1; // GL_TEXTURE_CUBE_MAP
+        case 0x8D65: return unit * TEXTURE_TARGETS + 2; // GL_TEXTURE_EXTERNAL_OES
+        default: return -1;
+        }
+    }
+
+    void checkBindings()
+    {
+        if (m_epoch != detail::g_bindingEpoch) [[unlikely]]
+            forgetBindings();
+    }
+
+    void forgetBindings();
+    void sendProgram(unsigned name);
+    void sendTexture(int unit, unsigned target, unsigned name, int slot);
+    void sendArrayBuffer(unsigned name);
+    void sendElementBuffer(unsigned name);
+    void sendAttribArrays(uint32_t enabledMask);
+
+    void applyChanged(const RenderState& state, uint64_t stateRevision, uint32_t flags);
+    void stateChanged() { m_appliedRevision = 0; }
+
+    static unsigned glBlendFactorConvert(BlendFactor factor);
+    static unsigned glBlendFunctionConvert(BlendFunction function);
+    static unsigned glCullingModeConvert(CullingMode mode);
+    static unsigned glWindingOrderConvert(WindingOrder order);
+    static unsigned glDepthFunctionConvert(DepthFunction function);
+    static unsigned glStencilFaceConvert(StencilFace face);
+    static unsigned glStencilFunctionConvert(StencilFunction function);
+    static unsigned glStencilOperationConvert(StencilOperation operation);
+
+    std::map<std::string, SharedPtr<ShaderUniformBase>, std::less<>> m_properties;
+    SharedPtr<detail::ProgramHandle> m_currentProgram;
+    bool m_blendEnabled = false;
+    RenderState m_state;
+    float m_depthRange[2] = {0.0f, 1.0f};
+    int m_viewport[4] = {0, 0, 0, 0};
+    Colour4f m_clearColour;
+    float m_clearDepth = 1.0f;
+    int m_clearStencil = 0;
+
+    uint64_t m_revision;
+    uint64_t m_propertyRevision;
+    uint64_t m_appliedRevision = 0;
+    uint32_t m_appliedFlags = 0;
+
+    bool m_attribArraysKnown = false;
+    uint32_t m_attribArrays = 0;
+    uint32_t m_attribOnes = 0; ///< locations known to hold the constant (1, 1, 1, 1)
+    uint64_t m_epoch = 0;
+    uint64_t m_inputProgram = 0;
+    uint64_t m_inputBuffer = 0;
+    unsigned m_program = UNKNOWN;
+    unsigned m_arrayBuffer = UNKNOWN;
+    unsigned m_elementBuffer = UNKNOWN;
+    unsigned m_activeUnit = UNKNOWN;
+    unsigned m_textures[TEXTURE_UNITS * TEXTURE_TARGETS];
+};
+
+/// The same for the back face and then the front face, each only when it differs.
+ORV_API void setStencilFunction(RenderContext& context, StencilFunction function, int reference,
+                                unsigned mask);
+ORV_API void setStencilOperations(RenderContext& context, StencilOperation stencilFail,
+                                  StencilOperation depthFail, StencilOperation pass);
+ORV_API void setStencilMask(RenderContext& context, unsigned mask);
+
+} // namespace orv

@@ -1,0 +1,216 @@
+#pragma once
+
+#include "orv/detail/revision.h"
+#include "orv/export.h"
+#include "orv/matrix.h"
+#include "orv/sharedptr.h"
+#include "orv/vector.h"
+
+#include <cstdint>
+#include <type_traits>
+
+namespace orv
+{
+
+class ShaderProgram;
+class Texture2D;
+class TextureCube;
+
+namespace detail
+{
+
+template <class... Types>
+struct TypeList
+{
+    static constexpr int COUNT = sizeof...(Types);
+
+    /// Position of T in the list, COUNT when it is not there.
+    template <class T>
+    static constexpr int indexOf()
+    {
+        const bool matches[] = {std::is_same_v<T, Types>...};
+        int index = 0;
+        while (index < COUNT && !matches[index])
+            ++index;
+        return index;
+    }
+};
+
+/// The value types that a uniform can have, in the order of the typed operations of ShaderUniformBase.
+using UniformTypes =
+    TypeList<bool, Vector2<bool>, Vector3<bool>, Vector4<bool>, unsigned char, Vector2<unsigned char>,
+             Vector3<unsigned char>, Vector4<unsigned char>, int, Vector2<int>, Vector3<int>, Vector4<int>,
+             float, Vector2<float>, Vector3<float>, Vector4<float>, Matrix2<float>, Matrix3<float>,
+             Matrix4<float>, SharedPtr<Texture2D>, SharedPtr<TextureCube>>;
+
+} // namespace detail
+
+/// An array of values of one type that feeds shader uniforms: an appearance's property, a global property of a
+/// render context, or a program's memory of what it sent last.
+///
+/// The class is closed: ShaderUniform<T> is its only implementation. GL thread only.
+class ORV_API ShaderUniformBase : public Shared
+{
+public:
+    ORV_CLASS_NAME("ShaderUniformBase")
+
+    /// Takes over what differs in source and sends all own values to the current GL program when anything did,
+    /// or when force is set. A null source changes nothing. A source of another type is ignored; of a shorter
+    /// one (an assertion is logged) the values that it has are taken.
+    ///
+    /// This is the plain form, which calls GL without telling a render context beforehand; programs that are
+    /// enabled through a context do not come through here.
+    /// @param location     uniform location in the current program.
+    /// @param textureUnit  first unit of a sampler; unused by other types.
+    virtual void enable(const SharedPtr<ShaderUniformBase>& source, int location, int textureUnit,
+                        bool force) = 0;
+
+    /// One setter for each value type. @return false when the holder has another type, which is not logged, or
+    /// index is not in [0, getSize()), which is; nothing changes then.
+    virtual bool setValue(const bool&, int) { return false; }
+    virtual bool setValue(const Vector2<bool>&, int) { return false; }
+    virtual bool setValue(const Vector3<bool>&, int) { return false; }
+    virtual bool setValue(const Vector4<bool>&, int) { return false; }
+    virtual bool setValue(const unsigned char&, int) { return false; }
+    virtual bool setValue(const Vector2<unsigned char>&, int) { return false; }
+    virtual bool setValue(const Vector3<unsigned char>&, int) { return false; }
+    virtual bool setValue(const Vector4<unsigned char>&, int) { return false; }
+    virtual bool setValue(const int&, int) { return false; }
+    virtual bool setValue(const Vector2<int>&, int) { return false; }
+    virtual bool setValue(const Vector3<int>&, int) { return false; }
+    virtual bool setValue(const Vector4<int>&, int) { return false; }
+    virtual bool setValue(const float&, int) { return false; }
+    virtual bool setValue(const Vector2<float>&, int) { return false; }
+    virtual bool setValue(const Vector3<float>&, int) { return false; }
+    virtual bool setValue(const Vector4<float>&, int) { return false; }
+    virtual bool setValue(const Matrix2<float>&, int) { return false; }
+    virtual bool setValue(const Matrix3<float>&, int) { return false; }
+    virtual bool setValue(const Matrix4<float>&, int) { return false; }
+    virtual bool setValue(const SharedPtr<Texture2D>&, int) { return false; }
+    virtual bool setValue(const SharedPtr<TextureCube>&, int) { return false; }
+
+    /// One getter for each value type. @return false, quietly and with the output untouched, when the holder
+    /// has another type or index is not in [0, getSize()).
+    virtual bool getValue(bool&, int) const { return false; }
+    virtual bool getValue(Vector2<bool>&, int) const { return false; }
+    virtual bool getValue(Vector3<bool>&, int) const { return false; }
+    virtual bool getValue(Vector4<bool>&, int) const { return false; }
+    virtual bool getValue(unsigned char&, int) const { return false; }
+    virtual bool getValue(Vector2<unsigned char>&, int) const { return false; }
+    virtual bool getValue(Vector3<unsigned char>&, int) const { return false; }
+    virtual bool getValue(Vector4<unsigned char>&, int) const { return false; }
+    virtual bool getValue(int&, int) const { return false; }
+    virtual bool getValue(Vector2<int>&, int) const { return false; }
+    virtual bool getValue(Vector3<int>&, int) const { return false; }
+    virtual bool getValue(Vector4<int>&, int) const { return false; }
+    virtual bool getValue(float&, int) const { return false; }
+    virtual bool getValue(Vector2<float>&, int) const { return false; }
+    virtual bool getValue(Vector3<float>&, int) const { return false; }
+    virtual bool getValue(Vector4<float>&, int) const { return false; }
+    virtual bool getValue(Matrix2<float>&, int) const { return false; }
+    virtual bool getValue(Matrix3<float>&, int) const { return false; }
+    virtual bool getValue(Matrix4<float>&, int) const { return false; }
+    virtual bool getValue(SharedPtr<Texture2D>&, int) const { return false; }
+    virtual bool getValue(SharedPtr<TextureCube>&, int) const { return false; }
+
+    /// Count of values, at least 1.
+    virtual int getSize() const = 0;
+
+    /// Changes whenever a value changes and is never the same for two holders.
+    uint64_t getRevision() const { return m_revision; }
+
+    /// Whether this is a ShaderUniform<T>; a static_cast is then safe.
+    template <class T>
+    bool holds() const
+    {
+        return m_type == detail::UniformTypes::indexOf<T>();
+    }
+
+protected:
+    explicit ShaderUniformBase(int type) : m_type(type) {}
+
+    void touch() { m_revision = detail::nextRevision(); }
+
+private:
+    friend class ShaderProgram;
+
+    /// Takes over the source's values. @return whether any own value changed.
+    virtual bool copyFrom(const ShaderUniformBase& source) = 0;
+
+    /// Sends all own values to the current program.
+    virtual void send(int location, int textureUnit) const = 0;
+
+    uint64_t m_revision = detail::nextRevision();
+    int m_type;
+};
+
+/// The value holder for one of the 21 types of detail::UniformTypes. Values start zeroed (null for textures).
+///
+/// set() and get() are the short way for whoever holds the typed pointer; they take no virtual call.
+template <class T>
+class ORV_API ShaderUniform final : public ShaderUniformBase
+{
+    static_assert(detail::UniformTypes::indexOf<T>() < detail::UniformTypes::COUNT,
+                  "not a type of shader uniform");
+
+public:
+    using Ptr = SharedPtr<ShaderUniform<T>>;
+
+    /// @param size  count of values; below 1 is an error and counts as 1.
+    explicit ShaderUniform(int size);
+    ~ShaderUniform() override;
+
+    using ShaderUniformBase::getValue;
+    using ShaderUniformBase::setValue;
+
+    void enable(const SharedPtr<ShaderUniformBase>& source, int location, int textureUnit,
+                bool force) override;
+    bool setValue(const T& value, int index) override;
+    bool getValue(T& value, int index) const override;
+    int getSize() const override { return m_size; }
+
+    /// @param index  in [0, getSize()); not checked.
+    const T& get(int index = 0) const { return m_values[index]; }
+
+    /// Stores the value; an equal one (components compared with ==) changes nothing.
+    /// @param index  in [0, getSize()); not checked.
+    void set(const T& value, int index = 0)
+    {
+        if (m_values[index] == value)
+            return;
+        m_values[index] = value;
+        touch();
+    }
+
+private:
+    bool copyFrom(const ShaderUniformBase& source) override;
+    void send(int location, int textureUnit) const override;
+
+    int m_size;
+    T* m_values; ///< m_single, or an array of its own when there are more
+    T m_single{};
+};
+
+extern template class ShaderUniform<bool>;
+extern template class ShaderUniform<Vector2<bool>>;
+extern template class ShaderUniform<Vector3<bool>>;
+extern template class ShaderUniform<Vector4<bool>>;
+extern template class ShaderUniform<unsigned char>;
+extern template class ShaderUniform<Vector2<unsigned char>>;
+extern template class ShaderUniform<Vector3<unsigned char>>;
+extern template class ShaderUniform<Vector4<unsigned char>>;
+extern template class ShaderUniform<int>;
+extern template class ShaderUniform<Vector2<int>>;
+extern template class ShaderUniform<Vector3<int>>;
+extern template class ShaderUniform<Vector4<int>>;
+extern template class ShaderUniform<float>;
+extern template class ShaderUniform<Vector2<float>>;
+extern template class ShaderUniform<Vector3<float>>;
+extern template class ShaderUniform<Vector4<float>>;
+extern template class ShaderUniform<Matrix2<float>>;
+extern template class ShaderUniform<Matrix3<float>>;
+extern template class ShaderUniform<Matrix4<float>>;
+extern template class ShaderUniform<SharedPtr<Texture2D>>;
+extern template class ShaderUniform<SharedPtr<TextureCube>>;
+
+} // namespace orv

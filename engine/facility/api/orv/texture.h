@@ -1,0 +1,97 @@
+#pragma once
+
+#include "orv/export.h"
+
+#include <cstdint>
+
+namespace orv
+{
+
+/// Pixel layouts of both kinds of texture.
+struct ORV_API Texture
+{
+    enum class Format : int32_t
+    {
+        RGBA = 0,
+        RGB = 1,
+        LUMINANCE_ALPHA = 2,
+        LUMINANCE = 3,
+        ALPHA = 4,
+        DEPTH = 5
+    };
+
+    enum class Type : int32_t
+    {
+        UNSIGNED_BYTE = 0,
+        UNSIGNED_SHORT = 1,
+        UNSIGNED_SHORT_4_4_4_4 = 2,
+        UNSIGNED_SHORT_5_5_5_1 = 3,
+        UNSIGNED_SHORT_5_6_5 = 4
+    };
+
+    /// 0 for a format or type outside its enum.
+    static unsigned getBytesPerPixel(Format format, Type type);
+
+    /// The format that an image of so many 8-bit channels is uploaded as; one channel is ALPHA.
+    /// @param channelCount  1 to 4.
+    static Format getFormat(int channelCount);
+};
+
+/// How a texture is sampled: a plain record.
+struct TextureParameters
+{
+    enum class FilterMode : int32_t
+    {
+        NEAREST = 0,
+        LINEAR = 1,
+        NEAREST_MIPMAP_NEAREST = 2,
+        NEAREST_MIPMAP_LINEAR = 3,
+        LINEAR_MIPMAP_NEAREST = 4,
+        LINEAR_MIPMAP_LINEAR = 5
+    };
+
+    enum class WrapMode : int32_t
+    {
+        REPEAT = 0,
+        CLAMP = 1,
+        MIRRORED_REPEAT = 2
+    };
+
+    constexpr TextureParameters(FilterMode min, FilterMode mag, WrapMode horizontal, WrapMode vertical)
+        : minFilter(min)
+        , magFilter(mag)
+        , horizontalWrap(horizontal)
+        , verticalWrap(vertical)
+    {
+    }
+
+    FilterMode minFilter;
+    FilterMode magFilter;
+    WrapMode horizontalWrap;
+    WrapMode verticalWrap;
+};
+
+namespace detail
+{
+
+// Engine to GL values, indexed by the enums above.
+inline constexpr unsigned GL_TEXTURE_FORMATS[] = {0x1908, 0x1907, 0x190A, 0x1909, 0x1906, 0x1902};
+inline constexpr unsigned GL_TEXTURE_TYPES[] = {0x1401, 0x1403, 0x8033, 0x8034, 0x8363};
+inline constexpr int GL_FILTER_MODES[] = {0x2600, 0x2601, 0x2700, 0x2702, 0x2701, 0x2703};
+inline constexpr int GL_WRAP_MODES[] = {0x2901, 0x812F, 0x8370};
+
+/// GL_INVALID_ENUM for a value outside the enum.
+unsigned getGlTextureFormat(Texture::Format format);
+unsigned getGlTextureType(Texture::Type type);
+/// -1 for a value outside the enum.
+int getGlFilterMode(TextureParameters::FilterMode mode);
+int getGlWrapMode(TextureParameters::WrapMode mode);
+
+/// Whether the mode reads from mipmaps.
+bool isMipmapFilter(TextureParameters::FilterMode mode);
+/// Whether both are powers of two (0 is not).
+bool isPowerOfTwo(unsigned width, unsigned height);
+
+} // namespace detail
+
+} // namespace orv

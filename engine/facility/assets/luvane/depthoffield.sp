@@ -1,0 +1,12 @@
+1.0
+vertex_source_file luvane#depthoffield.vert
+fragment_source_file luvane#depthoffield.frag
+
+uniform u_t_modelViewProjection T_MODEL_VIEW_PROJECTION
+uniform u_m_uvOffsetScale M_UV_OFFSET_SCALE
+uniform u_m_diffuseTexture M_DIFFUSE_TEXTURE
+uniform u_m_blurredTexture M_BLURRED_TEXTURE
+uniform u_m_depthTexture M_DEPTH_TEXTURE
+uniform u_m_depthRange M_DEPTH_RANGE
+uniform u_m_focus M_FOCUS
+uniform u_m_opacity M_OPACITY

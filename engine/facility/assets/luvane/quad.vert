@@ -1,0 +1,26 @@
+// A flat textured shape in the scene, unlit: vertex stage.
+//
+// M_UV_OFFSET_SCALE (offset u, offset v, scale u, scale v) moves and scales the texture; v counts upwards in meshes and
+// downwards in pictures, so it is turned. For what was rendered into a target take 0 1 1 -1.
+
+#ifdef GL_FRAGMENT_PRECISION_HIGH
+#define FINE highp
+#else
+#define FINE mediump
+#endif
+
+attribute vec3 a_position;
+attribute vec2 a_uv0;
+
+uniform mat4 u_t_modelViewProjection;
+uniform vec4 u_m_uvOffsetScale;
+
+varying FINE vec2 v_uv;
+
+void main()
+{
+    gl_Position = u_t_modelViewProjection * vec4(a_position, 1.0);
+
+    vec2 uv = a_uv0 * u_m_uvOffsetScale.zw + u_m_uvOffsetScale.xy;
+    v_uv = vec2(uv.x, 1.0 - uv.y);
+}

@@ -1,0 +1,12 @@
+1.0
+vertex_source_file luvane#weather.vert
+fragment_source_file luvane#weather.frag
+
+uniform u_t_modelViewProjection T_MODEL_VIEW_PROJECTION
+uniform u_m_uvOffsetScale M_UV_OFFSET_SCALE
+uniform u_m_diffuseTexture M_DIFFUSE_TEXTURE
+uniform u_m_diffuseColour M_DIFFUSE_COLOUR
+uniform u_m_opacity M_OPACITY
+uniform u_m_weatherFall M_WEATHER_FALL
+uniform u_m_weatherStretch M_WEATHER_STRETCH
+uniform u_time TIME

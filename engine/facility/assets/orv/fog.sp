@@ -1,0 +1,3 @@
+1.0
+vertex_source_file orv#fog.vert
+fragment_source_file orv#fog.frag

@@ -1,0 +1,103 @@
+// The standard material, lit at each vertex: fragment stage. The vertex stage says what the features mean.
+//
+// Light that arrives from the vertices is multiplied with the textures:
+//   colour  = diffuse light * M_DIFFUSE_TEXTURE                                    (DIFF)
+//           + ambient light * M_AMBIENT_TEXTURE * M_DIFFUSE_TEXTURE where DIFF     (AMBI)
+//           + highlights * gloss                                                   (SPEC)
+//           + M_REFLECTION_TEXTURE * gloss, or all of it without SPEC              (REFL)
+//           + M_EMISSIVE_COLOUR * M_EMISSIVE_TEXTURE                               (EMIS)
+//   gloss   = M_SPECULAR_COLOUR * M_SPECULAR_LEVEL * M_SPECULAR_TEXTURE
+//   opacity = M_OPACITY * alpha of M_DIFFUSE_TEXTURE where DIFF
+// The alphas of the colours do not count. Colour and opacity are straight, not premultiplied.
+
+precision mediump float;
+
+#if defined(DIFF) || defined(SPEC) || defined(AMBI) || defined(EMIS)
+#ifdef GL_FRAGMENT_PRECISION_HIGH
+varying highp vec2 v_uv;
+#else
+varying mediump vec2 v_uv;
+#endif
+#endif
+
+uniform float u_m_opacity;
+
+#ifdef DIFF
+uniform sampler2D u_m_diffuseTexture;
+
+varying mediump vec3 v_diffuse;
+#endif
+
+#ifdef SPEC
+uniform sampler2D u_m_specularTexture;
+uniform vec4 u_m_specularColour;
+uniform float u_m_specularLevel;
+
+varying mediump vec3 v_specular;
+#endif
+
+#ifdef AMBI
+uniform sampler2D u_m_ambientTexture;
+
+varying mediump vec3 v_ambient;
+#endif
+
+#ifdef EMIS
+uniform sampler2D u_m_emissiveTexture;
+uniform vec4 u_m_emissiveColour;
+#endif
+
+#ifdef REFL
+#ifdef CUBE
+uniform samplerCube u_m_reflectionTexture;
+
+varying mediump vec3 v_reflection;
+#else
+uniform sampler2D u_m_reflectionTexture;
+
+varying mediump vec2 v_reflection;
+#endif
+#endif
+
+void main()
+{
+    vec3 colour = vec3(0.0);
+    float opacity = u_m_opacity;
+
+#ifdef DIFF
+    vec4 base = texture2D(u_m_diffuseTexture, v_uv);
+    colour += v_diffuse * base.rgb;
+    opacity *= base.a;
+#endif
+
+#ifdef AMBI
+    vec3 ambient = v_ambient * texture2D(u_m_ambientTexture, v_uv).rgb;
+#ifdef DIFF
+    ambient *= base.rgb;
+#endif
+    colour += ambient;
+#endif
+
+#ifdef SPEC
+    vec3 gloss = u_m_specularColour.rgb * u_m_specularLevel * texture2D(u_m_specularTexture, v_uv).rgb;
+    colour += v_specular * gloss;
+#endif
+
+#ifdef REFL
+#ifdef CUBE
+    vec3 mirrored = textureCube(u_m_reflectionTexture, v_reflection).rgb;
+#else
+    vec3 mirrored = texture2D(u_m_reflectionTexture, v_reflection).rgb;
+#endif
+#ifdef SPEC
+    mirrored *= min(gloss, 1.0);
+#endif
+    colour += mirrored;
+#endif
+
+#ifdef EMIS
+    colour += u_m_emissiveColour.rgb * texture2D(u_m_emissiveTexture, v_uv).rgb;
+#endif
+
+    gl_FragColor = vec4(colour, opacity);
+}

@@ -1,0 +1,266 @@
+// The standard material, lit at each vertex: vertex stage.
+//
+// Features are switched on by defines that stand in front of this text:
+//   DIFF       diffuse light on M_DIFFUSE_COLOUR, and M_SELF_ILLUMINATION as light of the surface's own
+//   SPEC       highlights (half-vector model, exponent M_SHININESS)
+//   AMBI       M_AMBIENT_COLOUR in the sum of all L_AMBIENT_COLOUR
+//   REFL       M_REFLECTION_TEXTURE as a sphere map, seen from the eye
+//   CUBE       with REFL: the reflection is a cube map, in world directions
+//   EMIS       M_EMISSIVE_COLOUR, whatever the light
+//   SKIN       the vertex follows up to four joints
+//   INVSQROOT  a light's fall-off is x * inversesqrt(x) of the usual straight line x: brighter for longer,
+//              then a steep end, as the lamps of some authoring tools have it
+//
+// Lighting is done in world space. The texture is moved and scaled by M_UV_OFFSET_SCALE (offset u, offset v, scale
+// u, scale v); v counts upwards here and downwards in GL, which has a picture's top row at 0, so v is turned.
+//
+// Everything together fits the 128 uniform vectors that every device has.
+
+#if defined(DIFF) || defined(SPEC)
+#define LIT
+#endif
+#if defined(LIT) || defined(REFL)
+#define SURFACE
+#endif
+#if defined(DIFF) || defined(SPEC) || defined(AMBI) || defined(EMIS)
+#define TEXTURED
+#endif
+
+#ifdef GL_FRAGMENT_PRECISION_HIGH
+#define FINE highp
+#else
+#define FINE mediump
+#endif
+
+attribute vec3 a_position;
+#ifdef SURFACE
+attribute vec3 a_normal;
+#endif
+#ifdef TEXTURED
+attribute vec2 a_uv0;
+#endif
+
+#ifdef SKIN
+attribute vec4 a_joints;
+attribute vec4 a_weights;
+
+uniform int u_j_count;
+uniform mat4 u_j_world[20];
+uniform mat4 u_t_model;
+uniform mat4 u_t_viewProjection;
+#else
+uniform mat4 u_t_modelViewProjection;
+#ifdef SURFACE
+uniform mat4 u_t_model;
+uniform mat3 u_t_normalModel;
+#endif
+#endif
+
+#ifdef TEXTURED
+uniform vec4 u_m_uvOffsetScale;
+
+varying FINE vec2 v_uv;
+#endif
+
+#ifdef SURFACE
+uniform vec4 u_t_cameraPosition;
+#endif
+
+#if defined(LIT) || defined(AMBI)
+const int LIGHTS = 5;
+
+uniform int u_l_count;
+#endif
+
+#ifdef LIT
+uniform vec4 u_l_position[LIGHTS];      // w 0: directional, xyz points towards the light
+uniform vec4 u_l_diffuseColour[LIGHTS]; // highlights have the same colour
+uniform float u_l_attenuationNear[LIGHTS];
+uniform float u_l_attenuationReciprocal[LIGHTS];
+uniform float u_l_spotInnerCos[LIGHTS];
+uniform float u_l_spotOuterCos[LIGHTS];
+uniform vec3 u_l_spotDirection[LIGHTS]; // points back, from the lit place towards the light
+#endif
+
+#ifdef DIFF
+uniform vec4 u_m_diffuseColour;
+uniform float u_m_selfIllumination;
+
+varying mediump vec3 v_diffuse;
+#endif
+
+#ifdef SPEC
+uniform float u_m_shininess;
+
+varying mediump vec3 v_specular;
+#endif
+
+#ifdef AMBI
+uniform vec4 u_l_ambientColour[LIGHTS];
+uniform vec4 u_m_ambientColour;
+
+varying mediump vec3 v_ambient;
+#endif
+
+#ifdef REFL
+#ifdef CUBE
+varying mediump vec3 v_reflection;
+#else
+uniform mat4 u_t_view;
+
+varying mediump vec2 v_reflection;
+#endif
+#endif
+
+// A zero vector, as a mesh with damaged normals has it, stays zero.
+vec3 safeNormalize(vec3 v)
+{
+    return v * inversesqrt(max(dot(v, v), 1.0e-30));
+}
+
+#ifdef SKIN
+// Takes the vertex to world space: the weighted joints or, without joints, the model transform.
+mat4 worldTransform()
+{
+    if (u_j_count < 1)
+        return u_t_model;
+
+    // Fewer components than four are filled up by GL with 0, 0, 1: then the last weight is no weight.
+    vec4 weights = a_weights;
+    if (weights.w == 1.0 && weights.x + weights.y + weights.z > 0.0)
+        weights.w = 0.0;
+    float total = weights.x + weights.y + weights.z + weights.w;
+    weights = total > 0.0 ? weights / total : vec4(1.0, 0.0, 0.0, 0.0);
+
+    vec4 joints = clamp(a_joints, 0.0, float(u_j_count - 1)) + 0.5;
+    return u_j_world[int(joints.x)] * weights.x + u_j_world[int(joints.y)] * weights.y +
+           u_j_world[int(joints.z)] * weights.z + u_j_world[int(joints.w)] * weights.w;
+}
+
+// What a normal is multiplied by: the inverse transpose of the transform's upper 3x3, but for a positive factor.
+mat3 normalTransform(mat4 transform)
+{
+    vec3 x = transform[0].xyz;
+    vec3 y = transform[1].xyz;
+    vec3 z = transform[2].xyz;
+    vec3 yz = cross(y, z);
+    float side = dot(x, yz) < 0.0 ? -1.0 : 1.0;
+    return mat3(yz * side, cross(z, x) * side, cross(x, y) * side);
+}
+#endif
+
+#ifdef LIT
+// 1 up to the light's near distance, then falling to 0 at its far one. A reciprocal of 0 never falls.
+float fallOff(float range, float near, float reciprocal)
+{
+    float x = 1.0 - clamp((range - near) * reciprocal, 0.0, 1.0);
+#ifdef INVSQROOT
+    x *= inversesqrt(max(x, 0.0001));
+#endif
+    return x;
+}
+
+// 1 inside the inner cone, 0 outside the outer one. An inner cosine of -1 means a light that shines everywhere.
+float cone(float cosine, float inner, float outer)
+{
+    float x = clamp((cosine - outer) / max(inner - outer, 0.0001), 0.0, 1.0);
+    return inner <= -0.99999 ? 1.0 : x * x * (3.0 - 2.0 * x);
+}
+#endif
+
+#if defined(REFL) && !defined(CUBE)
+// Where a sphere map shows what lies in a direction of eye space.
+vec2 sphereMap(vec3 direction)
+{
+    float m = 2.0 * sqrt(2.0 * max(direction.z + 1.0, 0.0001));
+    return vec2(0.5 + direction.x / m, 0.5 - direction.y / m);
+}
+#endif
+
+void main()
+{
+#ifdef SKIN
+    mat4 transform = worldTransform();
+    vec4 world = transform * vec4(a_position, 1.0);
+    gl_Position = u_t_viewProjection * world;
+#ifdef SURFACE
+    vec3 position = world.xyz;
+    vec3 normal = safeNormalize(normalTransform(transform) * a_normal);
+#endif
+#else
+    gl_Position = u_t_modelViewProjection * vec4(a_position, 1.0);
+#ifdef SURFACE
+    vec3 position = (u_t_model * vec4(a_position, 1.0)).xyz;
+    vec3 normal = safeNormalize(u_t_normalModel * a_normal);
+#endif
+#endif
+
+#ifdef TEXTURED
+    vec2 uv = a_uv0 * u_m_uvOffsetScale.zw + u_m_uvOffsetScale.xy;
+    v_uv = vec2(uv.x, 1.0 - uv.y);
+#endif
+
+#ifdef SURFACE
+    vec3 toEye = safeNormalize(u_t_cameraPosition.xyz - position);
+#endif
+
+#ifdef LIT
+    vec3 diffuse = vec3(0.0);
+    vec3 specular = vec3(0.0);
+    for (int i = 0; i < LIGHTS; i++)
+    {
+        if (i >= u_l_count)
+            break;
+
+        vec3 toLight = u_l_position[i].xyz;
+        float strength = 1.0;
+        if (u_l_position[i].w != 0.0)
+        {
+            toLight -= position;
+            float range = length(toLight);
+            toLight /= max(range, 1.0e-30);
+            strength = fallOff(range, u_l_attenuationNear[i], u_l_attenuationReciprocal[i]);
+        }
+        strength *= cone(dot(toLight, u_l_spotDirection[i]), u_l_spotInnerCos[i], u_l_spotOuterCos[i]);
+
+        float facing = dot(normal, toLight);
+        if (facing > 0.0)
+        {
+            vec3 light = u_l_diffuseColour[i].rgb * strength;
+            diffuse += light * facing;
+#ifdef SPEC
+            float shine = dot(normal, safeNormalize(toLight + toEye));
+            if (shine > 0.0)
+                specular += light * pow(shine, max(u_m_shininess, 0.0));
+#endif
+        }
+    }
+#endif
+
+#ifdef DIFF
+    v_diffuse = u_m_diffuseColour.rgb * (diffuse + u_m_selfIllumination);
+#endif
+#ifdef SPEC
+    v_specular = specular;
+#endif
+
+#ifdef AMBI
+    vec3 ambient = vec3(0.0);
+    for (int i = 0; i < LIGHTS; i++)
+    {
+        if (i >= u_l_count)
+            break;
+        ambient += u_l_ambientColour[i].rgb;
+    }
+    v_ambient = u_m_ambientColour.rgb * ambient;
+#endif
+
+#ifdef REFL
+    vec3 reflection = reflect(-toEye, normal);
+#ifdef CUBE
+    v_reflection = reflection;
+#else
+    v_reflection = sphereMap((u_t_view * vec4(reflection, 0.0)).xyz);
+#endif
+#endif
+}

@@ -1,0 +1,6 @@
+1.0
+vertex_source_file orv#motionblur.vert
+fragment_source_file orv#motionblur.frag
+
+uniform u_m_sharpTexture M_SHARP_TEXTURE
+uniform u_m_velocityTexture M_VELOCITY_TEXTURE

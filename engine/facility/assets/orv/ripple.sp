@@ -1,0 +1,3 @@
+1.0
+vertex_source_file orv#ripple.vert
+fragment_source_file orv#ripple.frag

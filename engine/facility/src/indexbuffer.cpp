@@ -1,0 +1,112 @@
+#include "orv/indexbuffer.h"
+
+#include "orv/detail/bindingepoch.h"
+#include "orv/detail/resource.h"
+#include "orv/rendercontext.h"
+#include "orv/renderdevice.h"
+
+#include <GLES2/gl2.h>
+
+#include <algorithm>
+#include <new>
+
+namespace orv
+{
+
+namespace
+{
+
+GLenum glPrimitiveConvert(IndexBuffer::Primitive primitive)
+{
+    constexpr bool ORV_FALSE = false;
+    if (uint32_t(primitive) < IndexBuffer::PRIMITIVES.size())
+        return IndexBuffer::PRIMITIVES[uint32_t(primitive)].glMode;
+    ORV_ASSERT(ORV_FALSE);
+    return GL_POINTS;
+}
+
+} // namespace
+
+IndexBuffer::IndexBuffer(Primitive primitive, int count, bool allocate,
+                         const SharedPtr<detail::BufferResource>& resource)
+    : m_primitive(primitive)
+    , m_count(std::max(0, count))
+    , m_resource(resource)
+{
+    if (allocate)
+        m_indices.reset(new (std::nothrow) unsigned short[unsigned(m_count)]());
+}
+
+IndexBuffer::~IndexBuffer() = default;
+
+void IndexBuffer::commit()
+{
+    if (!m_indices || !m_resource || !m_resource->allocate())
+        return;
+    glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, getId());
+    glBufferData(GL_ELEMENT_ARRAY_BUFFER, GLsizeiptr(m_count) * 2, m_indices.get(), GL_STATIC_DRAW);
+    checkGLError("engine/facility/src/indexbuffer", __func__, __LINE__); // the one sign of lacking memory
+    glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, 0);
+    detail::bindingsChanged();
+    m_indices.reset();
+    m_committed = true;
+}
+
+void IndexBuffer::draw()
+{
+    if (!m_enabled)
+        return;
+    const GLuint buffer = getId();
+    if (buffer == 0 && m_committed)
+        return;
+    const GLenum mode = glPrimitiveConvert(m_primitive);
+    if (buffer != 0)
+    {
+        glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, buffer);
+        glDrawElements(mode, m_count, GL_UNSIGNED_SHORT, nullptr);
+        glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, 0);
+        detail::bindingsChanged();
+    }
+    else if (m_indices)
+    {
+        glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, 0);
+        glDrawElements(mode, m_count, GL_UNSIGNED_SHORT, m_indices.get());
+        detail::bindingsChanged();
+    }
+    else
+        glDrawArrays(mode, 0, m_count);
+}
+
+void IndexBuffer::draw(RenderContext& context)
+{
+    if (!m_enabled)
+        return;
+    const GLuint buffer = getId();
+    if (!isIndexed())
+    {
+        glDrawArrays(glPrimitiveConvert(m_primitive), 0, m_count);
+        return;
+    }
+    if (buffer == 0 && m_committed)
+        return;
+    context.bindElementBuffer(buffer);
+    glDrawElements(glPrimitiveConvert(m_primitive), m_count, GL_UNSIGNED_SHORT, m_indices.get());
+}
+
+unsigned int IndexBuffer::getId() const
+{
+    return m_resource ? m_resource->getId() : 0;
+}
+
+int getTriangleCount(const IndexBuffer& buffer)
+{
+    switch (buffer.getPrimitive())
+    {
+    case IndexBuffer::Primitive::TRIANGLE_STRIP:
+    case IndexBuffer::Primitive::TRIANGLE_FAN: return buffer.getCount() - 2;
+    case IndexBuffer::Primitive::TRIANGLES: return buffer.getCount() / 3;
+    default: return 0;
+    }
+}
+
+} // namespace orv

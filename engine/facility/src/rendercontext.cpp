@@ -1,0 +1,567 @@
+#include "orv/rendercontext.h"
+
+#include "orv/detail/revision.h"
+#include "orv/log.h"
+#include "orv/shaderuniform.h"
+
+#include <GLES2/gl2.h>
+
+#include <algorithm>
+#include <bit>
+#include <iterator>
+
+namespace orv
+{
+
+namespace
+{
+
+/// The table's entry for an enum value; null outside the enum.
+template <class Enum, std::size_t N>
+const RenderStateWord* findWord(const RenderStateWord (&table)[N], Enum value)
+{
+    const auto index = uint32_t(value);
+    return index < N ? &table[index] : nullptr;
+}
+
+void setCapability(GLenum capability, bool enabled)
+{
+    if (enabled)
+        glEnable(capability);
+    else
+        glDisable(capability);
+}
+
+WindingOrder turned(WindingOrder order)
+{
+    switch (order)
+    {
+    case WindingOrder::WINDING_CCW: return WindingOrder::WINDING_CW;
+    case WindingOrder::WINDING_CW: return WindingOrder::WINDING_CCW;
+    default: return order; // outside the enum: reported when it is sent
+    }
+}
+
+} // namespace
+
+RenderContext::RenderContext()
+    : m_revision(detail::nextRevision())
+    , m_propertyRevision(detail::nextRevision())
+{
+    // Where a new GL context differs from a new material.
+    m_state.cullingMode = CullingMode::CULL_NONE;
+    m_state.depthTestEnabled = false;
+
+    GLint scissor[4] = {0, 0, 0, 0};
+    glGetIntegerv(GL_SCISSOR_BOX, scissor);
+    m_state.scissorX = scissor[0];
+    m_state.scissorY = scissor[1];
+    m_state.scissorWidth = scissor[2];
+    m_state.scissorHeight = scissor[3];
+    glGetIntegerv(GL_VIEWPORT, m_viewport);
+
+    forgetBindings();
+}
+
+RenderContext::~RenderContext() = default;
+
+void RenderContext::setBlendEnabled(bool enabled)
+{
+    if (enabled == m_blendEnabled)
+        return;
+    stateChanged();
+    m_blendEnabled = enabled;
+    setCapability(GL_BLEND, enabled);
+}
+
+void RenderContext::setBlendColour(const Colour4f& colour)
+{
+    if (colour == m_state.blendColour)
+        return;
+    stateChanged();
+    m_state.blendColour = colour;
+    glBlendColor(colour.r, colour.g, colour.b, colour.a);
+}
+
+void RenderContext::setBlendFactors(BlendFactor srcColour, BlendFactor srcAlpha, BlendFactor dstColour,
+                                    BlendFactor dstAlpha)
+{
+    if (srcColour == m_state.blendSrcColour && srcAlpha == m_state.blendSrcAlpha &&
+        dstColour == m_state.blendDstColour && dstAlpha == m_state.blendDstAlpha)
+        return;
+    stateChanged();
+    m_state.blendSrcColour = srcColour;
+    m_state.blendSrcAlpha = srcAlpha;
+    m_state.blendDstColour = dstColour;
+    m_state.blendDstAlpha = dstAlpha;
+    glBlendFuncSeparate(glBlendFactorConvert(srcColour), glBlendFactorConvert(dstColour),
+                        glBlendFactorConvert(srcAlpha), glBlendFactorConvert(dstAlpha));
+}
+
+void RenderContext::setBlendFunctions(BlendFunction colour, BlendFunction alpha)
+{
+    if (colour == m_state.blendFunctionColour && alpha == m_state.blendFunctionAlpha)
+        return;
+    stateChanged();
+    m_state.blendFunctionColour = colour;
+    m_state.blendFunctionAlpha = alpha;
+    glBlendEquationSeparate(glBlendFunctionConvert(colour), glBlendFunctionConvert(alpha));
+}
+
+void RenderContext::setCullingMode(CullingMode mode)
+{
+    if (mode == m_state.cullingMode)
+        return;
+    stateChanged();
+    const CullingMode previous = m_state.cullingMode;
+    m_state.cullingMode = mode;
+    if (mode == CullingMode::CULL_NONE)
+    {
+        glDisable(GL_CULL_FACE);
+        return;
+    }
+
+    if (previous == CullingMode::CULL_NONE)
+        glEnable(GL_CULL_FACE);
+    glCullFace(glCullingModeConvert(mode));
+}
+
+void RenderContext::setWindingOrder(WindingOrder order)
+{
+    if (order == m_state.windingOrder)
+        return;
+    stateChanged();
+    m_state.windingOrder = order;
+    glFrontFace(glWindingOrderConvert(order));
+}
+
+void RenderContext::setLineWidth(float pixels)
+{
+    if (pixels == m_state.lineWidth)
+        return;
+    stateChanged();
+    m_state.lineWidth = pixels;
+    glLineWidth(pixels);
+}
+
+void RenderContext::setColourMask(bool red, bool green, bool blue, bool alpha)
+{
+    if (red == m_state.colourMaskRed && green == m_state.colourMaskGreen && blue == m_state.colourMaskBlue &&
+        alpha == m_state.colourMaskAlpha)
+        return;
+    stateChanged();
+    m_state.colourMaskRed = red;
+    m_state.colourMaskGreen = green;
+    m_state.colourMaskBlue = blue;
+    m_state.colourMaskAlpha = alpha;
+    glColorMask(red, green, blue, alpha);
+}
+
+void RenderContext::setDepthWriteEnabled(bool enabled)
+{
+    if (enabled == m_state.depthWriteEnabled)
+        return;
+    stateChanged();
+    m_state.depthWriteEnabled = enabled;
+    glDepthMask(enabled);
+}
+
+void RenderContext::setDepthOffset(float factor, float units)
+{
+    const float previousFactor = m_state.depthOffsetFactor;
+    const float previousUnits = m_state.depthOffsetUnits;
+    if (factor == previousFactor && units == previousUnits)
+        return;
+    stateChanged();
+    m_state.depthOffsetFactor = factor;
+    m_state.depthOffsetUnits = units;
+    if (factor == 0.0f && units == 0.0f)
+    {
+        glDisable(GL_POLYGON_OFFSET_FILL);
+        return;
+    }
+
+    if (previousFactor == 0.0f && previousUnits == 0.0f)
+        glEnable(GL_POLYGON_OFFSET_FILL);
+    // One change behind, as promised in the header.
+    glPolygonOffset(previousFactor, previousUnits);
+}
+
+void RenderContext::setDepthTestEnabled(bool enabled)
+{
+    if (enabled == m_state.depthTestEnabled)
+        return;
+    stateChanged();
+    m_state.depthTestEnabled = enabled;
+    setCapability(GL_DEPTH_TEST, enabled);
+}
+
+void RenderContext::setDepthTestFunction(DepthFunction function)
+{
+    if (function == m_state.depthFunction)
+        return;
+    stateChanged();
+    m_state.depthFunction = function;
+    glDepthFunc(glDepthFunctionConvert(function));
+}
+
+void RenderContext::setScissorTestEnabled(bool enabled)
+{
+    if (enabled == m_state.scissorTestEnabled)
+        return;
+    stateChanged();
+    m_state.scissorTestEnabled = enabled;
+    setCapability(GL_SCISSOR_TEST, enabled);
+}
+
+void RenderContext::setScissorBox(int x, int y, int width, int height)
+{
+    if (x == m_state.scissorX && y == m_state.scissorY && width == m_state.scissorWidth &&
+        height == m_state.scissorHeight)
+        return;
+    stateChanged();
+    m_state.scissorX = x;
+    m_state.scissorY = y;
+    m_state.scissorWidth = width;
+    m_state.scissorHeight = height;
+    glScissor(x, y, width, height);
+}
+
+void RenderContext::setStencilTestEnabled(bool enabled)
+{
+    if (enabled == m_state.stencilTestEnabled)
+        return;
+    stateChanged();
+    m_state.stencilTestEnabled = enabled;
+    setCapability(GL_STENCIL_TEST, enabled);
+}
+
+void RenderContext::setStencilFunction(StencilFace face, StencilFunction function, int reference,
+                                       unsigned mask)
+{
+    const auto i = unsigned(face);
+    if (i < STENCIL_FACE_COUNT)
+    {
+        if (function == m_state.stencilFunction[i] && reference == m_state.stencilReference[i] &&
+            mask == m_state.stencilFunctionMask[i])
+            return;
+        stateChanged();
+        m_state.stencilFunction[i] = function;
+        m_state.stencilReference[i] = reference;
+        m_state.stencilFunctionMask[i] = mask;
+    }
+    glStencilFuncSeparate(glStencilFaceConvert(face), glStencilFunctionConvert(function), reference, mask);
+}
+
+void RenderContext::setStencilOperations(StencilFace face, StencilOperation stencilFail,
+                                         StencilOperation depthFail, StencilOperation pass)
+{
+    const auto i = unsigned(face);
+    if (i < STENCIL_FACE_COUNT)
+    {
+        if (stencilFail == m_state.stencilFailOperation[i] &&
+            depthFail == m_state.stencilDepthFailOperation[i] && pass == m_state.stencilPassOperation[i])
+            return;
+        stateChanged();
+        m_state.stencilFailOperation[i] = stencilFail;
+        m_state.stencilDepthFailOperation[i] = depthFail;
+        m_state.stencilPassOperation[i] = pass;
+    }
+    glStencilOpSeparate(glStencilFaceConvert(face), glStencilOperationConvert(stencilFail),
+                        glStencilOperationConvert(depthFail), glStencilOperationConvert(pass));
+}
+
+void RenderContext::setStencilMask(StencilFace face, unsigned mask)
+{
+    const auto i = unsigned(face);
+    if (i < STENCIL_FACE_COUNT)
+    {
+        if (mask == m_state.stencilWriteMask[i])
+            return;
+        stateChanged();
+        m_state.stencilWriteMask[i] = mask;
+    }
+    glStencilMaskSeparate(glStencilFaceConvert(face), mask);
+}
+
+void RenderContext::setViewport(int x, int y, int width, int height)
+{
+    if (x == m_viewport[0] && y == m_viewport[1] && width == m_viewport[2] && height == m_viewport[3])
+        return;
+    m_viewport[0] = x;
+    m_viewport[1] = y;
+    m_viewport[2] = width;
+    m_viewport[3] = height;
+    glViewport(x, y, width, height);
+}
+
+void RenderContext::setDepthRange(float zNear, float zFar)
+{
+    if (zNear == m_depthRange[0] && zFar == m_depthRange[1])
+        return;
+    m_depthRange[0] = zNear;
+    m_depthRange[1] = zFar;
+    glDepthRangef(zNear, zFar);
+}
+
+void RenderContext::setClearColour(const Colour4f& colour)
+{
+    if (colour == m_clearColour)
+        return;
+    m_clearColour = colour;
+    glClearColor(colour.r, colour.g, colour.b, colour.a);
+}
+
+void RenderContext::setClearDepth(float depth)
+{
+    if (depth == m_clearDepth)
+        return;
+    m_clearDepth = depth;
+    glClearDepthf(depth);
+}
+
+void RenderContext::setClearStencil(int stencil)
+{
+    if (stencil == m_clearStencil)
+        return;
+    m_clearStencil = stencil;
+    glClearStencil(stencil);
+}
+
+void RenderContext::clear()
+{
+    glClear(GL_COLOR_BUFFER_BIT | GL_DEPTH_BUFFER_BIT | GL_STENCIL_BUFFER_BIT);
+}
+
+void RenderContext::addProperty(const SharedPtr<ShaderUniformBase>& property, const char* name)
+{
+    if (!property || !name)
+    {
+        ORV_LOG_ERROR("Property \"%s\" not added: %s.", name ? name : "",
+                      name ? "there is no value" : "it has no name");
+        return;
+    }
+    if (!m_properties.try_emplace(name, property).second)
+    {
+        ORV_LOG_ERROR("Property \"%s\" already exists in context.", name);
+        return;
+    }
+    m_propertyRevision = detail::nextRevision();
+}
+
+SharedPtr<ShaderUniformBase> RenderContext::getProperty(const char* name) const
+{
+    SharedPtr<ShaderUniformBase> property;
+    linkUniform(property, name);
+    return property;
+}
+
+void RenderContext::linkUniform(SharedPtr<ShaderUniformBase>& uniform, const char* name) const
+{
+    const auto found = name ? m_properties.find(std::string_view(name)) : m_properties.end();
+    if (found != m_properties.end())
+        uniform = found->second;
+}
+
+void RenderContext::applyChanged(const RenderState& state, uint64_t stateRevision, uint32_t flags)
+{
+    setBlendEnabled((flags & APPLY_BLEND) != 0);
+    setBlendColour(state.blendColour);
+    setBlendFactors(state.blendSrcColour, state.blendSrcAlpha, state.blendDstColour, state.blendDstAlpha);
+    setBlendFunctions(state.blendFunctionColour, state.blendFunctionAlpha);
+    setCullingMode(state.cullingMode);
+    setWindingOrder((flags & APPLY_TURNED) != 0 ? turned(state.windingOrder) : state.windingOrder);
+    setLineWidth(state.lineWidth);
+    setColourMask(state.colourMaskRed, state.colourMaskGreen, state.colourMaskBlue, state.colourMaskAlpha);
+    setDepthWriteEnabled(state.depthWriteEnabled);
+    setDepthOffset(state.depthOffsetFactor, state.depthOffsetUnits);
+    setDepthTestEnabled(state.depthTestEnabled);
+    setDepthTestFunction(state.depthFunction);
+    setScissorTestEnabled(state.scissorTestEnabled);
+    setScissorBox(state.scissorX, state.scissorY, state.scissorWidth, state.scissorHeight);
+    setStencilTestEnabled(state.stencilTestEnabled);
+    for (int i = 0; i < STENCIL_FACE_COUNT; ++i)
+    {
+        const auto face = StencilFace(i);
+        // The write mask twice, as promised in the header.
+        setStencilFunction(face, state.stencilFunction[i], state.stencilReference[i],
+                           state.stencilWriteMask[i]);
+        setStencilOperations(face, state.stencilFailOperation[i], state.stencilDepthFailOperation[i],
+                             state.stencilPassOperation[i]);
+        setStencilMask(face, state.stencilWriteMask[i]);
+    }
+    m_appliedRevision = stateRevision;
+    m_appliedFlags = flags;
+}
+
+unsigned RenderContext::getProgramInUse() const
+{
+    if (m_epoch == detail::g_bindingEpoch && m_program != UNKNOWN)
+        return m_program;
+    GLint program = 0;
+    glGetIntegerv(GL_CURRENT_PROGRAM, &program);
+    return unsigned(program);
+}
+
+void RenderContext::setAttribOnes(unsigned location)
+{
+    static const GLfloat ONES[4] = {1.0f, 1.0f, 1.0f, 1.0f};
+    checkBindings();
+    const uint32_t bit = location < 32 ? 1u << location : 0u;
+    if ((m_attribOnes & bit) != 0)
+        return;
+    glVertexAttrib4fv(location, ONES);
+    m_attribOnes |= bit;
+}
+
+void RenderContext::forgetBindings()
+{
+    m_epoch = detail::g_bindingEpoch;
+    m_attribArraysKnown = false;
+    m_attribOnes = 0;
+    m_inputProgram = 0;
+    m_inputBuffer = 0;
+    m_program = UNKNOWN;
+    m_arrayBuffer = UNKNOWN;
+    m_elementBuffer = UNKNOWN;
+    m_activeUnit = UNKNOWN;
+    std::fill(std::begin(m_textures), std::end(m_textures), UNKNOWN);
+}
+
+void RenderContext::sendProgram(unsigned name)
+{
+    glUseProgram(name);
+    m_program = name;
+}
+
+void RenderContext::sendTexture(int unit, unsigned target, unsigned name, int slot)
+{
+    if (m_activeUnit != unsigned(unit))
+    {
+        glActiveTexture(GL_TEXTURE0 + unsigned(unit));
+        m_activeUnit = unsigned(unit);
+    }
+    glBindTexture(target, name);
+    if (slot >= 0)
+        m_textures[slot] = name;
+}
+
+void RenderContext::sendArrayBuffer(unsigned name)
+{
+    glBindBuffer(GL_ARRAY_BUFFER, name);
+    m_arrayBuffer = name;
+}
+
+void RenderContext::sendElementBuffer(unsigned name)
+{
+    glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, name);
+    m_elementBuffer = name;
+}
+
+void RenderContext::sendAttribArrays(uint32_t enabledMask)
+{
+    uint32_t different = enabledMask ^ m_attribArrays;
+    if (!m_attribArraysKnown)
+    {
+        GLint count = 0;
+        glGetIntegerv(GL_MAX_VERTEX_ATTRIBS, &count);
+        different = count < 32 ? (1u << count) - 1u : ~0u;
+    }
+    for (; different != 0; different &= different - 1u)
+    {
+        const auto location = unsigned(std::countr_zero(different));
+        if ((enabledMask >> location & 1u) != 0)
+            glEnableVertexAttribArray(location);
+        else
+            glDisableVertexAttribArray(location);
+    }
+    m_attribArrays = enabledMask;
+    m_attribArraysKnown = true;
+    // A draw leaves the constant value of an enabled array's location undefined.
+    m_attribOnes &= ~enabledMask;
+}
+
+unsigned RenderContext::glBlendFactorConvert(BlendFactor factor)
+{
+    if (const RenderStateWord* word = findWord(BLEND_FACTORS, factor))
+        return word->glValue;
+    ORV_LOG_ERROR("Invalid blend factor %d", int(factor));
+    return GL_INVALID_ENUM;
+}
+
+unsigned RenderContext::glBlendFunctionConvert(BlendFunction function)
+{
+    if (const RenderStateWord* word = findWord(BLEND_FUNCTIONS, function))
+        return word->glValue;
+    ORV_LOG_ERROR("Invalid blend function %d", int(function));
+    return GL_INVALID_ENUM;
+}
+
+unsigned RenderContext::glCullingModeConvert(CullingMode mode)
+{
+    if (const RenderStateWord* word = findWord(CULLING_MODES, mode))
+        return word->glValue;
+    ORV_LOG_ERROR("Invalid culling mode %d", int(mode));
+    return GL_INVALID_ENUM;
+}
+
+unsigned RenderContext::glWindingOrderConvert(WindingOrder order)
+{
+    if (const RenderStateWord* word = findWord(WINDING_ORDERS, order))
+        return word->glValue;
+    ORV_LOG_ERROR("Invalid winding order %d", int(order));
+    return GL_INVALID_ENUM;
+}
+
+unsigned RenderContext::glDepthFunctionConvert(DepthFunction function)
+{
+    if (const RenderStateWord* word = findWord(COMPARISONS, function))
+        return word->glValue;
+    ORV_LOG_ERROR("Invalid depth function %d", int(function));
+    return GL_INVALID_ENUM;
+}
+
+unsigned RenderContext::glStencilFaceConvert(StencilFace face)
+{
+    if (const RenderStateWord* word = findWord(STENCIL_FACES, face))
+        return word->glValue;
+    ORV_LOG_ERROR("Invalid stencil face %d", int(face));
+    return GL_INVALID_ENUM;
+}
+
+unsigned RenderContext::glStencilFunctionConvert(StencilFunction function)
+{
+    if (const RenderStateWord* word = findWord(COMPARISONS, function))
+        return word->glValue;
+    ORV_LOG_ERROR("Invalid stencil function %d", int(function));
+    return GL_INVALID_ENUM;
+}
+
+unsigned RenderContext::glStencilOperationConvert(StencilOperation operation)
+{
+    if (const RenderStateWord* word = findWord(STENCIL_OPERATIONS, operation))
+        return word->glValue;
+    ORV_LOG_ERROR("Invalid stencil operation %d", int(operation));
+    return GL_INVALID_ENUM;
+}
+
+void setStencilFunction(RenderContext& context, StencilFunction function, int reference, unsigned mask)
+{
+    context.setStencilFunction(StencilFace::BACK, function, reference, mask);
+    context.setStencilFunction(StencilFace::FRONT, function, reference, mask);
+}
+
+void setStencilOperations(RenderContext& context, StencilOperation stencilFail, StencilOperation depthFail,
+                          StencilOperation pass)
+{
+    context.setStencilOperations(StencilFace::BACK, stencilFail, depthFail, pass);
+    context.setStencilOperations(StencilFace::FRONT, stencilFail, depthFail, pass);
+}
+
+void setStencilMask(RenderContext& context, unsigned mask)
+{
+    context.setStencilMask(StencilFace::BACK, mask);
+    context.setStencilMask(StencilFace::FRONT, mask);
+}
+
+} // namespace orv

@@ -1,0 +1,28 @@
+#pragma once
+
+#include "orv/charrange.h"
+
+#include <functional>
+#include <map>
+#include <string>
+
+namespace orv::detail
+{
+
+/// What a ".sp" file says.
+struct ShaderProgramFile
+{
+    std::string vertexSource; ///< asset name
+    std::string fragmentSource;
+    std::map<std::string, std::string, std::less<>> properties; ///< property name by GLSL uniform name
+
+    /// @param text  the whole file; it is taken apart in place.
+    /// @param name  the file's name, for messages.
+    /// @return false, after logging why, if the text is no such file.
+    bool read(CharRange text, const char* name);
+
+private:
+    void readUniform(CharRange& text, char* lineEnd, const char* name);
+};
+
+} // namespace orv::detail

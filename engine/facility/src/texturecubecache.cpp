@@ -1,0 +1,56 @@
+#include "orv/texturecubecache.h"
+
+#include <string>
+
+namespace orv
+{
+
+namespace
+{
+
+std::string joinNames(const char* const (&names)[TextureCube::FACE_COUNT])
+{
+    std::string joined;
+    for (const char* name : names)
+    {
+        joined += name ? name : "";
+        joined += ';';
+    }
+    joined.pop_back();
+    return joined;
+}
+
+} // namespace
+
+TextureCubeCache::TextureCubeCache() = default;
+
+TextureCubeCache::~TextureCubeCache() = default;
+
+SharedPtr<TextureCube> TextureCubeCache::create(unsigned width, unsigned height, Texture::Format format,
+                                                Texture::Type type, const char* name)
+{
+    const auto resource = makeShared<detail::TextureResource>();
+    getResourceCache()->add(resource);
+    if (!resource->allocate())
+        return {};
+
+    auto cube = makeShared<TextureCube>(width, height, format, type, resource);
+    add(cube, name);
+    return cube;
+}
+
+bool exists(TextureCubeCache& cache, const char* positiveX, const char* negativeX, const char* positiveY,
+            const char* negativeY, const char* positiveZ, const char* negativeZ)
+{
+    return cache.exists(
+        joinNames({positiveX, negativeX, positiveY, negativeY, positiveZ, negativeZ}).c_str());
+}
+
+SharedPtr<TextureCube> get(TextureCubeCache& cache, const char* positiveX, const char* negativeX,
+                           const char* positiveY, const char* negativeY, const char* positiveZ,
+                           const char* negativeZ)
+{
+    return cache.get(joinNames({positiveX, negativeX, positiveY, negativeY, positiveZ, negativeZ}).c_str());
+}
+
+} // namespace orv

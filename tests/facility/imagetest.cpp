@@ -1,0 +1,175 @@
+#include "orv/image.h"
+
+#include "imagefiles.h"
+#include "orv/memorystream.h"
+#include "support/damage.h"
+#include "support/logcapture.h"
+
+#include <gtest/gtest.h>
+
+#include <climits>
+
+using namespace orv;
+using imagefiles::Bytes;
+using support::LogCapture;
+
+namespace
+{
+
+SharedPtr<Image> decode(const Bytes& file)
+{
+    MemoryStream stream(file.data(), int(file.size()));
+    return makeShared<Image>(stream);
+}
+
+/// Byte i is i.
+Bytes counting(size_t count)
+{
+    Bytes bytes(count);
+    for (size_t i = 0; i < count; ++i)
+        bytes[i] = uint8_t(i);
+    return bytes;
+}
+
+Bytes pixelsOf(const Image& image)
+{
+    return Bytes(image.data(), image.data() + image.width() * image.height() * image.channelCount());
+}
+
+/// A bitmap header for 24-bit pixels, and no pixels.
+Bytes bitmapHeader(unsigned width, unsigned height)
+{
+    Bytes file = imagefiles::encodeFlat("bmp", 1, 1, 3);
+    for (size_t i = 0; i < 4; ++i)
+    {
+        file[18 + i] = uint8_t(width >> 8 * i);
+        file[22 + i] = uint8_t(height >> 8 * i);
+    }
+    return file;
+}
+
+} // namespace
+
+// Faults caught: a format left out of the decoder, channels converted, or rows upside down.
+TEST(Image, decodesEveryFormatTopRowFirst)
+{
+    const struct
+    {
+        const char* suffix;
+        int channels;
+        int decodedChannels;
+    } cases[] = {{"png", 1, 1}, {"png", 2, 2}, {"png", 3, 3}, {"png", 4, 4}, {"bmp", 3, 3},
+                 {"tga", 1, 1}, {"tga", 2, 2}, {"tga", 3, 3}, {"tga", 4, 4}};
+    for (const auto& test : cases)
+    {
+        const Bytes pixels = counting(size_t(3 * 2 * test.channels));
+        const auto image = decode(imagefiles::encode(test.suffix, 3, 2, test.channels, pixels));
+        ASSERT_TRUE(image->data()) << test.suffix << test.channels;
+        EXPECT_EQ(3, image->width());
+        EXPECT_EQ(2, image->height());
+        EXPECT_EQ(test.decodedChannels, image->channelCount()) << test.suffix;
+        EXPECT_EQ(pixels, pixelsOf(*image)) << test.suffix << test.channels;
+    }
+
+    Bytes split(16 * 16 * 3, 0);
+    std::fill(split.begin(), split.begin() + 8 * 16 * 3, uint8_t(255));
+    const auto photo = decode(imagefiles::encode("jpg", 16, 16, 3, split));
+    ASSERT_TRUE(photo->data());
+    EXPECT_EQ(3, photo->channelCount());
+    EXPECT_GT(photo->data()[0], 240);
+    EXPECT_LT(photo->data()[15 * 16 * 3], 15);
+}
+
+// Fault caught: 16-bit channels read as twice as many bytes, beyond what the texture upload expects.
+TEST(Image, sixteenBitChannelsBecomeEight)
+{
+    const Bytes greyPng = {0x89, 0x50, 0x4e, 0x47, 0x0d, 0x0a, 0x1a, 0x0a, 0x00, 0x00, 0x00, 0x0d, 0x49, 0x48,
+                           0x44, 0x52, 0x00, 0x00, 0x00, 0x01, 0x00, 0x00, 0x00, 0x01, 0x10, 0x00, 0x00, 0x00,
+                           0x00, 0x6a, 0xee, 0x47, 0x16, 0x00, 0x00, 0x00, 0x0b, 0x49, 0x44, 0x41, 0x54, 0x78,
+                           0x9c, 0x63, 0x68, 0x70, 0x00, 0x00, 0x01, 0x43, 0x00, 0xc1, 0x5f, 0xd4, 0x95, 0x0d,
+                           0x00, 0x00, 0x00, 0x00, 0x49, 0x45, 0x4e, 0x44, 0xae, 0x42, 0x60, 0x82};
+    const auto image = decode(greyPng);
+    ASSERT_TRUE(image->data());
+    EXPECT_EQ(1, image->channelCount());
+    EXPECT_EQ(0x80, image->data()[0]);
+}
+
+// Faults caught: a crash, a read past the file, or hundreds of megabytes taken for a file of a few bytes.
+TEST(Image, badFilesHaveNoDataOrAtLeastDoNoHarm)
+{
+    for (const char* suffix : {"png", "jpg", "bmp", "tga"})
+    {
+        const Bytes file = imagefiles::encode(suffix, 8, 8, 3, counting(8 * 8 * 3));
+        support::forEachCut(file, [](const Bytes& cut, size_t) { decode(cut); });
+        support::forEachSpoiledByte(file, [](const Bytes& spoiled, size_t) { decode(spoiled); });
+        support::forEachRandomDamage(file, 200, [](const Bytes& spoiled, int) { decode(spoiled); });
+    }
+    EXPECT_FALSE(decode({})->data());
+    EXPECT_FALSE(decode(Bytes(1000, uint8_t('x')))->data());
+    EXPECT_TRUE(decode(bitmapHeader(100, 100))->data());
+    EXPECT_FALSE(decode(bitmapHeader(8000, 8000))->data());
+    EXPECT_FALSE(decode(bitmapHeader(20000, 1))->data());
+}
+
+TEST(Image, refusesSizesThatCannotBe)
+{
+    const struct
+    {
+        int width;
+        int height;
+        int channels;
+        const char* message; ///< null for a good image
+    } cases[] = {{2, 2, 4, nullptr},
+                 {0, 5, 1, nullptr},
+                 {-1, 2, 4, "Invalid image construction inputs."},
+                 {2, -1, 4, "Invalid image construction inputs."},
+                 {2, 2, 0, "Invalid image construction inputs."},
+                 {INT_MAX, INT_MAX, INT_MAX,
+                  "No memory for an image of 2147483647 x 2147483647 pixels of 2147483647 bytes."}};
+    for (const auto& test : cases)
+    {
+        LogCapture log;
+        const Image image(test.width, test.height, test.channels, nullptr);
+        EXPECT_EQ(test.message == nullptr, image.data() != nullptr) << test.width;
+        EXPECT_EQ(test.message ? 1 : 0, log.countMessage(test.message ? test.message : "")) << test.width;
+    }
+}
+
+// Fault caught: rows cut at the wrong stride, or a rectangle that reaches outside and is read there.
+TEST(Image, cropCutsToTheSource)
+{
+    const Bytes pixels = counting(10 * 10 * 2);
+    const Image source(10, 10, 2, pixels.data());
+    const struct
+    {
+        int x, y, width, height;
+        int wantedX, wantedY, wantedWidth, wantedHeight;
+        bool warns;
+    } cases[] = {
+        {2, 3, 4, 5, 2, 3, 4, 5, false},   {0, 0, 10, 10, 0, 0, 10, 10, false},
+        {-5, 3, 20, 0, 0, 3, 10, 1, true}, {50, 60, 2, 2, 9, 9, 1, 1, true},
+        {8, 8, 5, -7, 8, 8, 2, 1, true},   {9, 9, INT_MAX, INT_MAX, 9, 9, 1, 1, true},
+    };
+    for (const auto& test : cases)
+    {
+        LogCapture log;
+        const auto result = Image::crop(source, test.x, test.y, test.width, test.height);
+        ASSERT_TRUE(result);
+        EXPECT_EQ(test.warns ? 1 : 0, log.count('W'));
+        EXPECT_EQ(test.warns, log.contains("Invalid crop extents adjusted to fit source."));
+        ASSERT_EQ(test.wantedWidth, result->width());
+        ASSERT_EQ(test.wantedHeight, result->height());
+        ASSERT_EQ(2, result->channelCount());
+        Bytes wanted;
+        for (int y = test.wantedY; y < test.wantedY + test.wantedHeight; ++y)
+        {
+            const auto row = pixels.begin() + (y * 10 + test.wantedX) * 2;
+            wanted.insert(wanted.end(), row, row + test.wantedWidth * 2);
+        }
+        EXPECT_EQ(wanted, pixelsOf(*result)) << test.x;
+    }
+
+    LogCapture log;
+    EXPECT_FALSE(Image::crop(Image(-1, 1, 1, nullptr), 0, 0, 1, 1));
+    EXPECT_EQ(1, log.countMessage("Cannot crop: source image has no data."));
+}

@@ -1,0 +1,350 @@
+#include "orv/rendercontext.h"
+
+#include "orv/shaderuniform.h"
+#include "support/gltest.h"
+#include "support/logcapture.h"
+
+#include <functional>
+#include <string>
+#include <vector>
+
+using namespace orv;
+using support::LogCapture;
+
+namespace
+{
+
+using Calls = std::vector<std::string>;
+
+/// What GL hears while something is done.
+template <class Function>
+Calls callsOf(const Function& function)
+{
+    glcalls::startRecording();
+    function();
+    glcalls::stopRecording();
+    return glcalls::recorded();
+}
+
+class RenderContextTest : public support::GlTest
+{
+};
+
+using Set = std::function<void(RenderContext&)>;
+
+/// One thing that is done, and what GL hears of it.
+struct Step
+{
+    Set set;
+    Calls expected;
+};
+
+} // namespace
+
+// Fault caught: a wrong constant in the tables, or two entries swapped.
+TEST(RenderState, tablesHoldTheGlValuesOfTheirWords)
+{
+    const auto valuesOf = [](const auto& table)
+    {
+        std::vector<unsigned> values;
+        for (const RenderStateWord& word : table)
+            values.push_back(word.glValue);
+        return values;
+    };
+    using Values = std::vector<unsigned>;
+    EXPECT_EQ((Values{GL_CONSTANT_ALPHA, GL_CONSTANT_COLOR, GL_DST_ALPHA, GL_DST_COLOR, GL_ONE,
+                      GL_ONE_MINUS_CONSTANT_ALPHA, GL_ONE_MINUS_CONSTANT_COLOR, GL_ONE_MINUS_DST_ALPHA,
+                      GL_ONE_MINUS_DST_COLOR, GL_ONE_MINUS_SRC_ALPHA, GL_ONE_MINUS_SRC_COLOR, GL_SRC_ALPHA,
+                      GL_SRC_ALPHA_SATURATE, GL_SRC_COLOR, GL_ZERO}),
+              valuesOf(BLEND_FACTORS));
+    EXPECT_EQ((Values{GL_FUNC_ADD, GL_FUNC_REVERSE_SUBTRACT, GL_FUNC_SUBTRACT}), valuesOf(BLEND_FUNCTIONS));
+    EXPECT_EQ((Values{GL_BACK, GL_FRONT, GL_FRONT_AND_BACK, GL_NONE}), valuesOf(CULLING_MODES));
+    EXPECT_EQ((Values{GL_CCW, GL_CW}), valuesOf(WINDING_ORDERS));
+    EXPECT_EQ((Values{GL_NEVER, GL_LESS, GL_EQUAL, GL_LEQUAL, GL_GREATER, GL_NOTEQUAL, GL_GEQUAL, GL_ALWAYS}),
+              valuesOf(COMPARISONS));
+    EXPECT_EQ((Values{GL_ZERO, GL_KEEP, GL_REPLACE, GL_INCR, GL_DECR, GL_INVERT, GL_INCR_WRAP, GL_DECR_WRAP}),
+              valuesOf(STENCIL_OPERATIONS));
+    EXPECT_EQ((Values{GL_BACK, GL_FRONT}), valuesOf(STENCIL_FACES));
+}
+
+// Faults caught: a default that is not GL's (the first real setting is then swallowed), a setter that calls
+// GL again for what is set, or that sends its arguments in the wrong order.
+TEST_F(RenderContextTest, settersCallGlOnChangeOnly)
+{
+    using F = BlendFactor;
+    using O = StencilOperation;
+    const auto setDefaults = [](RenderContext& c)
+    {
+        c.setBlendEnabled(false);
+        c.setBlendColour(Colour4f());
+        c.setBlendFactors(F::ONE, F::ONE, F::ZERO, F::ZERO);
+        c.setBlendFunctions(BlendFunction::ADD, BlendFunction::ADD);
+        c.setCullingMode(CullingMode::CULL_NONE);
+        c.setWindingOrder(WindingOrder::WINDING_CCW);
+        c.setLineWidth(1.0f);
+        c.setColourMask(true, true, true, true);
+        c.setDepthWriteEnabled(true);
+        c.setDepthOffset(0.0f, 0.0f);
+        c.setDepthTestEnabled(false);
+        c.setDepthTestFunction(DepthFunction::LESS);
+        c.setScissorTestEnabled(false);
+        c.setScissorBox(0, 0, 64, 64);
+        c.setStencilTestEnabled(false);
+        setStencilFunction(c, StencilFunction::ALWAYS, 0, 0xFFFFFFFFu);
+        setStencilOperations(c, O::KEEP, O::KEEP, O::KEEP);
+        setStencilMask(c, 0xFFFFFFFFu);
+        c.setViewport(0, 0, 64, 64);
+        c.setDepthRange(0.0f, 1.0f);
+        c.setClearColour(Colour4f());
+        c.setClearDepth(1.0f);
+        c.setClearStencil(0);
+    };
+    const Colour4f colour(0.25f, 0.5f, 0.75f, 1.0f);
+    const Step steps[] = {
+        {[](auto& c) { c.setBlendEnabled(true); }, {"glEnable(0x0be2)"}},
+        {[&](auto& c) { c.setBlendColour(colour); }, {"glBlendColor(0.25, 0.5, 0.75, 1)"}},
+        {[](auto& c) { c.setBlendFactors(F::SRC_ALPHA, F::ONE, F::ONE_MINUS_SRC_ALPHA, F::CONSTANT_COLOUR); },
+         {"glBlendFuncSeparate(0x0302, 0x0303, 0x0001, 0x8001)"}},
+        {[](auto& c) { c.setBlendFunctions(BlendFunction::SUBTRACT, BlendFunction::REVERSE_SUBTRACT); },
+         {"glBlendEquationSeparate(0x800a, 0x800b)"}},
+        {[](auto& c) { c.setWindingOrder(WindingOrder::WINDING_CW); }, {"glFrontFace(0x0900)"}},
+        {[](auto& c) { c.setLineWidth(2.0f); }, {"glLineWidth(2)"}},
+        {[](auto& c) { c.setColourMask(true, false, true, false); }, {"glColorMask(1, 0, 1, 0)"}},
+        {[](auto& c) { c.setDepthWriteEnabled(false); }, {"glDepthMask(0)"}},
+        {[](auto& c) { c.setDepthTestEnabled(true); }, {"glEnable(0x0b71)"}},
+        {[](auto& c) { c.setDepthTestFunction(DepthFunction::GEQUAL); }, {"glDepthFunc(0x0206)"}},
+        {[](auto& c) { c.setScissorTestEnabled(true); }, {"glEnable(0x0c11)"}},
+        {[](auto& c) { c.setScissorBox(1, 2, 3, 4); }, {"glScissor(1, 2, 3, 4)"}},
+        {[](auto& c) { c.setStencilTestEnabled(true); }, {"glEnable(0x0b90)"}},
+        {[](auto& c) { c.setStencilFunction(StencilFace::FRONT, StencilFunction::EQUAL, 3, 15u); },
+         {"glStencilFuncSeparate(0x0404, 0x0202, 3, 15)"}},
+        {[](auto& c) { c.setStencilOperations(StencilFace::BACK, O::ZERO, O::INVERT, O::INCR_WRAP); },
+         {"glStencilOpSeparate(0x0405, 0x0000, 0x150a, 0x8507)"}},
+        {[](auto& c) { c.setStencilMask(StencilFace::FRONT, 7u); }, {"glStencilMaskSeparate(0x0404, 7)"}},
+        {[](auto& c) { c.setViewport(4, 3, 2, 1); }, {"glViewport(4, 3, 2, 1)"}},
+        {[](auto& c) { c.setDepthRange(0.25f, 0.5f); }, {"glDepthRangef(0.25, 0.5)"}},
+        {[&](auto& c) { c.setClearColour(colour); }, {"glClearColor(0.25, 0.5, 0.75, 1)"}},
+        {[](auto& c) { c.setClearDepth(0.5f); }, {"glClearDepthf(0.5)"}},
+        {[](auto& c) { c.setClearStencil(9); }, {"glClearStencil(9)"}},
+    };
+
+    RenderContext::Ptr target;
+    EXPECT_EQ((Calls{"glGetIntegerv(0x0c10, data)", "glGetIntegerv(0x0ba2, data)"}),
+              callsOf([&] { target = makeShared<RenderContext>(); }));
+    EXPECT_EQ(Calls(), callsOf([&] { setDefaults(*target); }));
+    for (const Step& step : steps)
+    {
+        EXPECT_EQ(step.expected, callsOf([&] { step.set(*target); }));
+        EXPECT_EQ(Calls(), callsOf([&] { step.set(*target); })) << step.expected[0] << " again";
+    }
+    EXPECT_EQ(std::size(steps), callsOf([&] { setDefaults(*target); }).size());
+}
+
+// Faults caught: culling enabled again with every face; the offset's lag "corrected"; both stencil faces sent
+// where one differs.
+TEST_F(RenderContextTest, sequencesOfSettings)
+{
+    RenderContext target;
+    const Step steps[] = {
+        {[](auto& c) { c.setCullingMode(CullingMode::CULL_BACK); },
+         {"glEnable(0x0b44)", "glCullFace(0x0405)"}},
+        {[](auto& c) { c.setCullingMode(CullingMode::CULL_FRONT); }, {"glCullFace(0x0404)"}},
+        {[](auto& c) { c.setCullingMode(CullingMode::CULL_NONE); }, {"glDisable(0x0b44)"}},
+        {[](auto& c) { c.setDepthOffset(1.0f, 1.0f); }, {"glEnable(0x8037)", "glPolygonOffset(0, 0)"}},
+        {[](auto& c) { c.setDepthOffset(2.0f, 2.0f); }, {"glPolygonOffset(1, 1)"}},
+        {[](auto& c) { c.setDepthOffset(2.0f, 2.0f); }, {}},
+        {[](auto& c) { c.setDepthOffset(0.0f, 0.0f); }, {"glDisable(0x8037)"}},
+        {[](auto& c) { c.setStencilFunction(StencilFace::STENCIL_BACK, StencilFunction::NEVER, 1, 255u); },
+         {"glStencilFuncSeparate(0x0405, 0x0200, 1, 255)"}},
+        {[](auto& c) { setStencilFunction(c, StencilFunction::NEVER, 1, 255u); },
+         {"glStencilFuncSeparate(0x0404, 0x0200, 1, 255)"}},
+    };
+    for (size_t i = 0; i < std::size(steps); ++i)
+        EXPECT_EQ(steps[i].expected, callsOf([&] { steps[i].set(target); })) << "step " << i;
+}
+
+// Faults caught: reading past a table, or an invalid value that GL never gets to refuse.
+TEST_F(RenderContextTest, invalidEnumsAreLoggedAndRefusedByGl)
+{
+    const struct
+    {
+        Set set;
+        const char* message;
+    } cases[] = {
+        {[](auto& c)
+         { c.setBlendFactors(BlendFactor(15), BlendFactor::ONE, BlendFactor::ONE, BlendFactor::ONE); },
+         "Invalid blend factor 15"},
+        {[](auto& c) { c.setBlendFunctions(BlendFunction(7), BlendFunction::ADD); },
+         "Invalid blend function 7"},
+        {[](auto& c) { c.setCullingMode(CullingMode(4)); }, "Invalid culling mode 4"},
+        {[](auto& c) { c.setWindingOrder(WindingOrder(-1)); }, "Invalid winding order -1"},
+        {[](auto& c) { c.setDepthTestFunction(DepthFunction(8)); }, "Invalid depth function 8"},
+        {[](auto& c) { c.setStencilFunction(StencilFace(2), StencilFunction::ALWAYS, 0, 0u); },
+         "Invalid stencil face 2"},
+        {[](auto& c) { c.setStencilFunction(StencilFace::BACK, StencilFunction(8), 0, 0u); },
+         "Invalid stencil function 8"},
+        {[](auto& c)
+         {
+             c.setStencilOperations(StencilFace::BACK, StencilOperation(8), StencilOperation::KEEP,
+                                    StencilOperation::KEEP);
+         },
+         "Invalid stencil operation 8"},
+    };
+    RenderContext target;
+    for (const auto& test : cases)
+    {
+        LogCapture log;
+        test.set(target);
+        EXPECT_EQ(1, log.countMessage(test.message)) << test.message;
+        EXPECT_EQ(GLenum(GL_INVALID_ENUM), glGetError()) << test.message;
+    }
+    EXPECT_EQ(BlendFunction(7), target.getState().blendFunctionColour);
+}
+
+// Faults caught: a stamp that is trusted although a setter came between, a mirrored solid drawn inside out,
+// the stored comparison mask sent, or the lagging offset moved on by a repeated draw.
+TEST_F(RenderContextTest, applySendsDifferencesAndSkipsWhatWasApplied)
+{
+    RenderContext target;
+    RenderState state;
+    state.depthOffsetFactor = 1.0f;
+    state.stencilFunction[1] = StencilFunction::EQUAL;
+    state.stencilReference[1] = 1;
+    state.stencilFunctionMask[1] = 0x0F;
+    state.stencilWriteMask[1] = 0xF0;
+    // The scissor box is cached as the surface's, a material's default is empty.
+    EXPECT_EQ((Calls{"glEnable(0x0be2)", "glEnable(0x0b44)", "glCullFace(0x0405)", "glEnable(0x8037)",
+                     "glPolygonOffset(0, 0)", "glEnable(0x0b71)", "glScissor(0, 0, 0, 0)",
+                     "glStencilFuncSeparate(0x0404, 0x0202, 1, 240)", "glStencilMaskSeparate(0x0404, 240)"}),
+              callsOf([&] { target.apply(state, 77, true); }));
+    EXPECT_EQ(Calls(), callsOf([&] { target.apply(state, 77, true); }));
+    EXPECT_EQ(Calls{"glFrontFace(0x0900)"}, callsOf([&] { target.apply(state, 77, true, true); }));
+    EXPECT_EQ(Calls{"glFrontFace(0x0901)"}, callsOf([&] { target.apply(state, 77, true, false); }));
+    EXPECT_EQ(Calls{"glDisable(0x0be2)"}, callsOf([&] { target.apply(state, 77, false); }));
+
+    target.setDepthWriteEnabled(false);
+    EXPECT_EQ(Calls{"glDepthMask(1)"}, callsOf([&] { target.apply(state, 77, false); }));
+
+    state.lineWidth = 3.0f;
+    EXPECT_EQ(Calls{"glLineWidth(3)"}, callsOf([&] { target.apply(state, 78, false); }));
+}
+
+// Faults caught: a binding sent twice, one that is not sent though something else changed it, or units and
+// targets mixed up.
+TEST_F(RenderContextTest, bindingsAreSentOnceUntilTheyChangeElsewhere)
+{
+    GLuint textures[2] = {};
+    glGenTextures(2, textures);
+    GLuint buffer = 0;
+    glGenBuffers(1, &buffer);
+    const std::string first = std::to_string(textures[0]);
+    const std::string bufferText = std::to_string(buffer);
+
+    auto target = makeShared<RenderContext>();
+    const Step steps[] = {
+        {[&](auto& c) { c.bindTexture(1, GL_TEXTURE_2D, textures[0]); },
+         {"glActiveTexture(0x84c1)", "glBindTexture(0x0de1, " + first + ")"}},
+        {[&](auto& c) { c.bindTexture(1, GL_TEXTURE_2D, textures[0]); }, {}},
+        {[&](auto& c) { c.bindTexture(1, GL_TEXTURE_CUBE_MAP, 0); }, {"glBindTexture(0x8513, 0)"}},
+        {[&](auto& c) { c.bindTexture(1, GL_TEXTURE_2D, textures[0]); }, {}},
+        {[&](auto& c) { c.bindTexture(0, GL_TEXTURE_2D, textures[0]); },
+         {"glActiveTexture(0x84c0)", "glBindTexture(0x0de1, " + first + ")"}},
+        {[&](auto& c) { c.bindArrayBuffer(buffer); }, {"glBindBuffer(0x8892, " + bufferText + ")"}},
+        {[&](auto& c) { c.bindElementBuffer(buffer); }, {"glBindBuffer(0x8893, " + bufferText + ")"}},
+        {[&](auto& c) { c.bindArrayBuffer(buffer), c.bindElementBuffer(buffer); }, {}},
+        {[&](auto& c) { c.useProgram(0); }, {"glUseProgram(0)"}},
+        {[&](auto& c) { c.useProgram(0); }, {}},
+    };
+    for (size_t i = 0; i < std::size(steps); ++i)
+        EXPECT_EQ(steps[i].expected, callsOf([&] { steps[i].set(*target); })) << "step " << i;
+
+    target->setVertexInputBound(5, 6);
+    EXPECT_TRUE(target->isVertexInputBound(5, 6));
+    EXPECT_FALSE(target->isVertexInputBound(5, 7));
+    detail::bindingsChanged();
+    EXPECT_FALSE(target->isVertexInputBound(5, 6));
+    EXPECT_EQ((Calls{"glActiveTexture(0x84c1)", "glBindTexture(0x0de1, " + first + ")"}),
+              callsOf([&] { target->bindTexture(1, GL_TEXTURE_2D, textures[0]); }));
+    EXPECT_EQ(Calls{"glUseProgram(0)"}, callsOf([&] { target->useProgram(0); }));
+
+    const uint64_t revision = target->getRevision();
+    target = makeShared<RenderContext>();
+    EXPECT_NE(revision, target->getRevision());
+    EXPECT_EQ(Calls{"glUseProgram(0)"}, callsOf([&] { target->useProgram(0); }));
+    glDeleteTextures(2, textures);
+    glDeleteBuffers(1, &buffer);
+}
+
+// Faults caught: an array of an earlier program left enabled (a driver may then read freed memory), or a
+// constant trusted after an array was enabled in its place.
+TEST_F(RenderContextTest, attributeArraysAreSwitchedByDifference)
+{
+    RenderContext target;
+    glEnableVertexAttribArray(7);
+    target.setAttribArrays(0b0111u);
+    for (GLuint i = 0; i < 8; ++i)
+    {
+        GLint enabled = -1;
+        glGetVertexAttribiv(i, GL_VERTEX_ATTRIB_ARRAY_ENABLED, &enabled);
+        EXPECT_EQ(i < 3 ? 1 : 0, enabled) << i;
+    }
+    EXPECT_EQ((Calls{"glDisableVertexAttribArray(2)", "glEnableVertexAttribArray(3)"}),
+              callsOf([&] { target.setAttribArrays(0b1011u); }));
+    EXPECT_EQ(Calls(), callsOf([&] { target.setAttribArrays(0b1011u); }));
+
+    EXPECT_EQ(Calls{"glVertexAttrib4fv(2, {1, 1, 1, 1})"}, callsOf([&] { target.setAttribOnes(2); }));
+    EXPECT_EQ(Calls(), callsOf([&] { target.setAttribOnes(2); }));
+    target.setAttribArrays(0b0100u);
+    target.setAttribArrays(0);
+    EXPECT_EQ(1u, callsOf([&] { target.setAttribOnes(2); }).size());
+}
+
+// Fault caught: "no program" answered while one is current that came from outside the draw path.
+TEST_F(RenderContextTest, programInUseIsKnownAfterOutsideChanges)
+{
+    GLuint current = 0;
+    glcalls::replace(glUseProgram, [&](GLuint program) { current = program; });
+    glcalls::replace(glGetIntegerv,
+                     [&](GLenum name, GLint* value) {
+                         name == GL_CURRENT_PROGRAM ? void(*value = GLint(current))
+                                                    : glcalls::real(glGetIntegerv)(name, value);
+                     });
+    RenderContext target;
+    EXPECT_EQ(0u, target.getProgramInUse());
+    target.useProgram(3);
+    EXPECT_EQ(3u, target.getProgramInUse());
+    glUseProgram(4);
+    detail::bindingsChanged();
+    EXPECT_EQ(4u, target.getProgramInUse());
+}
+
+// Faults caught: a property overwritten under those who linked it, a null holder handed out, or programs that
+// never learn of a property added later.
+TEST_F(RenderContextTest, propertiesKeepTheirFirstHolder)
+{
+    LogCapture log;
+    RenderContext target;
+    const SharedPtr<ShaderUniformBase> first = makeShared<ShaderUniform<float>>(1);
+    const SharedPtr<ShaderUniformBase> second = makeShared<ShaderUniform<int>>(1);
+    const uint64_t empty = target.getPropertyRevision();
+    target.addProperty(first, "TIME");
+    const uint64_t added = target.getPropertyRevision();
+    EXPECT_NE(empty, added);
+
+    target.addProperty(second, "TIME");
+    EXPECT_EQ(1, log.countMessage("Property \"TIME\" already exists in context."));
+    target.addProperty(nullptr, "NONE");
+    target.addProperty(second, nullptr);
+    EXPECT_EQ(3, log.count('E'));
+    EXPECT_EQ(added, target.getPropertyRevision());
+
+    EXPECT_TRUE(target.getProperty("TIME") == first);
+    EXPECT_FALSE(target.getProperty("NONE"));
+    EXPECT_FALSE(target.getProperty(nullptr));
+
+    SharedPtr<ShaderUniformBase> uniform = second;
+    target.linkUniform(uniform, "UNKNOWN");
+    EXPECT_TRUE(uniform == second);
+    target.linkUniform(uniform, "TIME");
+    EXPECT_TRUE(uniform == first);
+}

@@ -1,0 +1,455 @@
+#include "orv/shaderprogram.h"
+
+#include "orv/detail/bindingepoch.h"
+#include "orv/detail/resource.h"
+#include "orv/rendercontext.h"
+#include "orv/shaderprogramcache.h"
+#include "orv/texture2dcache.h"
+#include "orv/texturecubecache.h"
+#include "orv/vertexbuffercache.h"
+
+#include "support/gltest.h"
+#include "support/logcapture.h"
+#include "support/picture.h"
+
+#include <GLES2/gl2ext.h>
+
+#include <new>
+
+using namespace orv;
+using support::LogCapture;
+using support::Rgba;
+
+namespace
+{
+
+const char* const VERTEX = "attribute vec2 a_position;\n"
+                           "void main() { gl_Position = vec4(a_position, 0.0, 1.0); }\n";
+const char* const TEXTURED = "precision mediump float;\n"
+                             "uniform sampler2D u_texture;\n"
+                             "void main() { gl_FragColor = texture2D(u_texture, vec2(0.5)); }\n";
+const char* const COLOURED = "precision mediump float;\n"
+                             "uniform vec4 u_colour;\n"
+                             "void main() { gl_FragColor = u_colour; }\n";
+
+/// Programs, textures and a square that fills the view, on a render context of their own.
+class ShaderProgramTest : public support::GlTest
+{
+protected:
+    void SetUp() override
+    {
+        GlTest::SetUp();
+        m_programs = makeShared<ShaderProgramCache>();
+        m_textures = makeShared<Texture2DCache>();
+        m_buffers = makeShared<VertexBufferCache>();
+        m_renderContext = makeShared<RenderContext>();
+        m_square = m_buffers->create(nullptr);
+        addAttrib("a_position", {-1, -1, 1, -1, -1, 1, 1, 1});
+    }
+
+    void TearDown() override
+    {
+        m_square.reset();
+        m_renderContext.reset();
+        for (int i = 0; i < 2; ++i)
+        {
+            m_programs->flush();
+            m_textures->flush();
+            m_buffers->flush();
+        }
+        EXPECT_EQ("", glcalls::describeLiveNames());
+        GlTest::TearDown();
+    }
+
+    void addAttrib(const char* name, const std::vector<float>& values)
+    {
+        const SharedPtr<VertexArray> array = makeShared<VertexArray>(4, 4, int(values.size() / 4));
+        std::copy(values.begin(), values.end(), array->getData<float>());
+        m_square->addAttrib(array, name, VertexBuffer::AttribFormat::FLOAT,
+                            VertexBuffer::AttribUsage::GL_BUFFER, false);
+    }
+
+    /// A program whose only named uniform takes the property.
+    SharedPtr<ShaderProgram> makeProgram(const char* fragment, const char* property,
+                                         const char* vertex = VERTEX)
+    {
+        const SharedPtr<ShaderProgram> program = m_programs->create(vertex, fragment, nullptr);
+        if (program && program->getUniformCount() > 0)
+            program->setUniformPropertyName(0, property);
+        return program;
+    }
+
+    SharedPtr<Texture2D> makeTexture(const Rgba& colour)
+    {
+        return m_textures->create(1, 1, Texture::Format::RGBA, Texture::Type::UNSIGNED_BYTE, &colour,
+                                  nullptr);
+    }
+
+    template <class T>
+    SharedPtr<ShaderUniformBase> makeValue(const T& value)
+    {
+        SharedPtr<ShaderUniformBase> holder = makeShared<ShaderUniform<T>>(1);
+        holder->setValue(value, 0);
+        return holder;
+    }
+
+    /// One draw of the square, values as an appearance hands them over. @return the colour of the view.
+    Rgba draw(ShaderProgram& program, const ShaderUniformBase* value = nullptr)
+    {
+        detail::UniformSources sources;
+        program.enable(*m_renderContext, &value, sources);
+        program.bind(*m_renderContext, *m_square);
+        glDrawArrays(GL_TRIANGLE_STRIP, 0, 4);
+        return support::readFrame().pixel(32, 32);
+    }
+
+    SharedPtr<ShaderProgramCache> m_programs;
+    SharedPtr<Texture2DCache> m_textures;
+    SharedPtr<VertexBufferCache> m_buffers;
+    SharedPtr<RenderContext> m_renderContext;
+    SharedPtr<VertexBuffer> m_square;
+};
+
+} // namespace
+
+// Fault caught: array names that keep their "[0]", sizes lost, samplers of different kinds meeting on one unit.
+TEST_F(ShaderProgramTest, learnsUniformsAndGivesSamplersTheirUnits)
+{
+    const char* const vertex =
+        "attribute vec4 a_position;\n"
+        "uniform vec4 u_l_position[4];\n"
+        "void main() { gl_Position = a_position + u_l_position[0] + u_l_position[3]; }\n";
+    const char* const fragment =
+        "precision mediump float;\n"
+        "uniform sampler2D u_a;\n"
+        "uniform sampler2D u_b;\n"
+        "uniform samplerCube u_c[2];\n"
+        "void main() { gl_FragColor = texture2D(u_a, vec2(0.5)) + texture2D(u_b, vec2(0.5))\n"
+        "    + textureCube(u_c[0], vec3(1.0)) + textureCube(u_c[1], vec3(1.0)); }\n";
+    const SharedPtr<ShaderProgram> program = m_programs->create(vertex, fragment, "p");
+    ASSERT_TRUE(program);
+    EXPECT_TRUE(m_programs->exists("p"));
+
+    const struct
+    {
+        const char* name;
+        const char* lookup;
+        std::vector<int> units;
+    } expected[] = {{"u_l_position", "u_l_position", {}},
+                    {"u_a", "u_a", {0}},
+                    {"u_b", "u_b", {1}},
+                    {"u_c", "u_c[0]", {2}},
+                    {"u_c", "u_c[1]", {3}}};
+    std::vector<std::string> names;
+    for (int i = 0; i < program->getUniformCount(); ++i)
+        names.push_back(program->getUniformInstanceName(i));
+    EXPECT_EQ(4u, names.size());
+    for (const auto& uniform : expected)
+    {
+        EXPECT_NE(names.end(), std::find(names.begin(), names.end(), uniform.name)) << uniform.name;
+        for (const int unit : uniform.units)
+        {
+            GLint value = -1;
+            glGetUniformiv(program->getId(), glGetUniformLocation(program->getId(), uniform.lookup), &value);
+            EXPECT_EQ(unit, value) << uniform.lookup;
+        }
+    }
+    GLint current = -1;
+    glGetIntegerv(GL_CURRENT_PROGRAM, &current);
+    EXPECT_EQ(0, current); // making a program changes nothing that is in use
+
+    program->setUniformPropertyValue(
+        int(std::find(names.begin(), names.end(), "u_l_position") - names.begin()),
+        makeShared<ShaderUniform<Vector4f>>(4));
+    LogCapture log;
+    program->enable(*m_renderContext);
+    EXPECT_EQ("", log.text()); // sizes agree
+}
+
+// Fault caught: a type of the table sent by the wrong call, with the wrong count, or not at all.
+TEST_F(ShaderProgramTest, sendsEveryTypeOnce)
+{
+    const struct
+    {
+        const char* declaration; ///< of the uniform u, "%" its name
+        const char* use;         ///< a float made of it
+        SharedPtr<ShaderUniformBase> value;
+        std::vector<float> sent;
+    } cases[] = {
+        {"float u", "u", makeValue(1.5f), {1.5f}},
+        {"vec2 u", "u.x + u.y", makeValue(Vector2f(1, 2)), {1, 2}},
+        {"vec3 u", "u.x + u.z", makeValue(Vector3f(1, 2, 3)), {1, 2, 3}},
+        {"vec4 u", "u.x + u.w", makeValue(Vector4f(1, 2, 3, 4)), {1, 2, 3, 4}},
+        {"int u", "float(u)", makeValue(-7), {-7}},
+        {"ivec2 u", "float(u.x + u.y)", makeValue(Vector2<int>(1, -2)), {1, -2}},
+        {"ivec3 u", "float(u.x + u.z)", makeValue(Vector3<int>(1, 2, 3)), {1, 2, 3}},
+        {"ivec4 u", "float(u.x + u.w)", makeValue(Vector4<int>(1, 2, 3, 4)), {1, 2, 3, 4}},
+        {"bool u", "float(u)", makeValue(true), {1}},
+        {"bvec2 u", "float(u.x) + float(u.y)", makeValue(Vector2<bool>(false, true)), {0, 1}},
+        {"bvec3 u", "float(u.x) + float(u.z)", makeValue(Vector3<bool>(true, false, true)), {1, 0, 1}},
+        {"bvec4 u",
+         "float(u.x) + float(u.w)",
+         makeValue(Vector4<bool>(true, false, false, true)),
+         {1, 0, 0, 1}},
+        {"mat2 u",
+         "u[0].x + u[1].y",
+         makeValue(Matrix2<float>(Vector2f(1, 2), Vector2f(3, 4))),
+         {1, 2, 3, 4}},
+        {"mat3 u",
+         "u[0].x + u[2].y",
+         makeValue(Matrix3f(Vector3f(1, 2, 3), Vector3f(4, 5, 6), Vector3f(7, 8, 9))),
+         {1, 2, 3, 4, 5, 6, 7, 8, 9}},
+        {"mat4 u",
+         "u[0].x + u[3].y",
+         makeValue(Matrix4f(Vector4f(1, 2, 3, 4), Vector4f(5, 6, 7, 8), Vector4f(9, 10, 11, 12),
+                            Vector4f(13, 14, 15, 16))),
+         {1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 11, 12, 13, 14, 15, 16}},
+    };
+    for (const auto& test : cases)
+    {
+        const std::string vertex = std::string("attribute vec4 a_position;\nuniform ") + test.declaration +
+                                   ";\nvoid main() { gl_Position = a_position * (" + test.use + "); }\n";
+        const SharedPtr<ShaderProgram> program = m_programs->create(vertex.c_str(), COLOURED, nullptr);
+        ASSERT_TRUE(program) << test.declaration;
+        const int index = program->getUniformInstanceName(0) == std::string("u") ? 0 : 1;
+        program->setUniformPropertyValue(index, test.value);
+
+        program->enable(*m_renderContext);
+        GLfloat read[16] = {};
+        glGetUniformfv(program->getId(), glGetUniformLocation(program->getId(), "u"), read);
+        EXPECT_EQ(test.sent, std::vector<float>(read, read + test.sent.size())) << test.declaration;
+
+        glcalls::resetCounts();
+        program->enable(*m_renderContext);
+        EXPECT_EQ(0u, glcalls::total()) << test.declaration;
+    }
+}
+
+// Faults caught: a value of another type that is sent nevertheless; a source of the last draw that stays.
+TEST_F(ShaderProgramTest, sourcesInTheirOrder)
+{
+    const SharedPtr<ShaderProgram> program = makeProgram(COLOURED, "COLOUR");
+    const auto global = makeValue(Vector4f(0, 0, 1, 1));
+    m_renderContext->addProperty(global, "COLOUR");
+    const auto own = makeValue(Vector4f(0, 1, 0, 1));
+    const auto handed = makeValue(Vector4f(1, 0, 0, 1));
+    const auto wrongType = makeValue(0.5f);
+
+    EXPECT_EQ((Rgba{0, 0, 255}), draw(*program));
+    EXPECT_EQ((Rgba{255, 0, 0}), draw(*program, handed.get()));
+    EXPECT_EQ((Rgba{0, 0, 255}), draw(*program));
+    program->setUniformPropertyValue(0, own);
+    EXPECT_EQ((Rgba{0, 255, 0}), draw(*program));
+    EXPECT_EQ((Rgba{255, 0, 0}), draw(*program, handed.get()));
+    glcalls::resetCounts();
+    EXPECT_EQ((Rgba{255, 0, 0}), draw(*program, wrongType.get()));
+    EXPECT_EQ(0u, glcalls::count(glUniform4fv));
+    program->setUniformPropertyValue(0, nullptr);
+    own->setValue(Vector4f(1, 1, 1, 1), 0);
+    EXPECT_EQ((Rgba{0, 0, 255}), draw(*program));
+}
+
+// Fault caught: a program linked before its property existed, or to a context that is gone, is never fed.
+TEST_F(ShaderProgramTest, linksAgainWhenTheContextChanges)
+{
+    const SharedPtr<ShaderProgram> program = makeProgram(COLOURED, "COLOUR");
+    EXPECT_EQ((Rgba{0, 0, 0, 0}), draw(*program));
+    m_renderContext->addProperty(makeValue(Vector4f(1, 0, 0, 1)), "COLOUR");
+    EXPECT_EQ((Rgba{255, 0, 0}), draw(*program));
+
+    // A new context in the very memory of the old one.
+    alignas(RenderContext) static unsigned char memory[sizeof(RenderContext)];
+    const Vector4f colours[] = {{0, 1, 0, 1}, {0, 0, 1, 1}};
+    for (const Vector4f& colour : colours)
+    {
+        RenderContext* context = new (memory) RenderContext;
+        context->addProperty(makeValue(colour), "COLOUR");
+        program->enable(*context);
+        GLfloat sent[4] = {};
+        glGetUniformfv(program->getId(), glGetUniformLocation(program->getId(), "u_colour"), sent);
+        EXPECT_EQ(colour, Vector4f(sent[0], sent[1], sent[2], sent[3]));
+        context->~RenderContext();
+    }
+}
+
+// Fault caught: a remembered texture binding that something else has taken.
+TEST_F(ShaderProgramTest, programsInTurnShowTheirOwnTextures)
+{
+    const SharedPtr<ShaderProgram> programs[] = {makeProgram(TEXTURED, "T"), makeProgram(TEXTURED, "T")};
+    const Rgba colours[] = {{255, 0, 0}, {0, 255, 0}};
+    const SharedPtr<Texture2D> textures[] = {makeTexture(colours[0]), makeTexture(colours[1])};
+    const SharedPtr<ShaderUniformBase> values[] = {makeValue(textures[0]), makeValue(textures[1])};
+
+    const std::function<void()> disturbances[] = {
+        [] {},
+        [this] {
+            makeTexture({9, 9, 9});
+        },
+        [&] { textures[1]->setMinFilter(TextureParameters::FilterMode::NEAREST); },
+        [this] { m_textures->flush(); },
+        [&] { textures[0]->enable(); },
+        [&]
+        {
+            glActiveTexture(GL_TEXTURE0);
+            glBindTexture(GL_TEXTURE_2D, 0);
+            detail::bindingsChanged();
+        },
+    };
+    for (const auto& disturb : disturbances)
+    {
+        for (int i = 0; i < 4; ++i)
+        {
+            disturb();
+            EXPECT_EQ(colours[i % 2], draw(*programs[i % 2], values[i % 2].get()))
+                << "disturbance " << &disturb - disturbances << ", draw " << i;
+        }
+    }
+    glcalls::resetCounts();
+    draw(*programs[1], values[1].get());
+    EXPECT_EQ(0u,
+              glcalls::count(glBindTexture) + glcalls::count(glActiveTexture) + glcalls::count(glUniform1iv));
+}
+
+// Faults caught: a sampler without a texture that shows what was there; a draw that keeps a texture alive.
+TEST_F(ShaderProgramTest, samplersKeepNothing)
+{
+    const SharedPtr<ShaderProgram> program = makeProgram(TEXTURED, "T");
+    SharedPtr<Texture2D> texture = makeTexture({255, 255, 255});
+    SharedPtr<ShaderUniformBase> value = makeValue(texture);
+    const auto empty = makeValue(SharedPtr<Texture2D>());
+    const auto cube = makeValue(SharedPtr<TextureCube>());
+
+    const ShaderUniformBase* const nothings[] = {nullptr, empty.get(), cube.get()};
+    for (const ShaderUniformBase* nothing : nothings)
+    {
+        EXPECT_EQ((Rgba{255, 255, 255}), draw(*program, value.get()));
+        EXPECT_EQ((Rgba{0, 0, 0}), draw(*program, nothing));
+    }
+
+    draw(*program, value.get());
+    value.reset();
+    texture.reset();
+    m_textures->flush();
+    EXPECT_TRUE(glcalls::liveNames(glcalls::Kind::TEXTURE).empty());
+    EXPECT_EQ((Rgba{0, 0, 0}), draw(*program));
+}
+
+// Fault caught: arrays of another program left on, and read past the end of their buffers.
+TEST_F(ShaderProgramTest, plainBindDisablesWhatIsLeftOver)
+{
+    const char* const five = "attribute vec2 a_position; attribute float a_1, a_2, a_3, a_4;\n"
+                             "void main() { gl_Position = vec4(a_position, a_1 + a_2, a_3 + a_4); }\n";
+    const char* const three = "attribute vec2 a_position; attribute float a_1, a_2;\n"
+                              "void main() { gl_Position = vec4(a_position, a_1, a_2); }\n";
+    const SharedPtr<ShaderProgram> programs[] = {makeProgram(COLOURED, "C", five),
+                                                 makeProgram(COLOURED, "C", three)};
+    for (const char* name : {"a_1", "a_3", "a_4"})
+        addAttrib(name, {0, 0, 0, 0});
+    m_square->commit();
+
+    programs[0]->bind(*m_square);
+    const GLuint missing = GLuint(glGetAttribLocation(programs[0]->getId(), "a_2"));
+    GLfloat constant[4] = {};
+    glGetVertexAttribfv(missing, GL_CURRENT_VERTEX_ATTRIB, constant);
+    EXPECT_EQ(std::vector<float>(4, 1.0f), std::vector<float>(constant, constant + 4));
+
+    glcalls::startRecording();
+    programs[1]->bind(*m_square);
+    const std::vector<std::string> off = glcalls::recorded("glDisableVertexAttribArray");
+    for (const char* call : {"glDisableVertexAttribArray(3)", "glDisableVertexAttribArray(4)"})
+        EXPECT_NE(off.end(), std::find(off.begin(), off.end(), call)) << call;
+}
+
+// Fault caught: GL calls with names of a context that is lost.
+TEST_F(ShaderProgramTest, releasedProgramDoesNothing)
+{
+    const SharedPtr<ShaderProgram> program = makeProgram(TEXTURED, "T");
+    const GLuint name = program->getId();
+    m_programs->getResourceCache()->release();
+    glcalls::resetCounts();
+    program->enable(*m_renderContext);
+    program->bind(*m_renderContext, *m_square);
+    program->bind(*m_square);
+    EXPECT_FALSE(program->isValid());
+    EXPECT_EQ(0u, glcalls::total());
+    glDeleteProgram(name);
+    for (const GLuint shader : glcalls::liveNames(glcalls::Kind::SHADER))
+        glDeleteShader(shader);
+}
+
+// Fault caught: a program that is gone, or no longer in use, taken for the current one.
+TEST_F(ShaderProgramTest, knowsTheCurrentProgram)
+{
+    SharedPtr<ShaderProgram> program = makeProgram(COLOURED, "C");
+    EXPECT_EQ(nullptr, ShaderProgram::getCurrent(*m_renderContext));
+    program->enable(*m_renderContext);
+    EXPECT_EQ(program.get(), ShaderProgram::getCurrent(*m_renderContext));
+    detail::bindingsChanged();
+    EXPECT_EQ(program.get(), ShaderProgram::getCurrent(*m_renderContext));
+    glUseProgram(0);
+    detail::bindingsChanged();
+    EXPECT_EQ(nullptr, ShaderProgram::getCurrent(*m_renderContext));
+
+    program->enable(*m_renderContext);
+    program.reset();
+    m_programs->flush();
+    EXPECT_EQ(nullptr, ShaderProgram::getCurrent(*m_renderContext));
+}
+
+TEST_F(ShaderProgramTest, badIndicesAreLogged)
+{
+    const SharedPtr<ShaderProgram> program = makeProgram(COLOURED, "C");
+    for (const int index : {-1, 1})
+    {
+        LogCapture log;
+        EXPECT_EQ(nullptr, program->getUniformInstanceName(index));
+        EXPECT_EQ(nullptr, program->getUniformPropertyName(index));
+        program->setUniformPropertyName(index, "X");
+        program->setUniformPropertyValue(index, nullptr);
+        EXPECT_EQ(4, log.countMessage("Uniform index (" + std::to_string(index) + ") out of range [0:1)."));
+    }
+    EXPECT_TRUE(program->uniformExists("C"));
+    EXPECT_FALSE(program->uniformExists("u_colour"));
+    EXPECT_FALSE(program->usesMirrorTexture());
+    program->setUniformPropertyName(0, "M_MIRROR_TEXTURE");
+    EXPECT_TRUE(program->usesMirrorTexture());
+}
+
+// Fault caught: half-made programs handed out or left in the cache, and GL objects leaked (see TearDown()).
+TEST_F(ShaderProgramTest, failedCreationGivesNothing)
+{
+    const char* const broken = "void main() { nonsense }\n";
+    const char* const unlinkable = "precision mediump float; varying vec4 v_missing;\n"
+                                   "void main() { gl_FragColor = v_missing; }\n";
+    const struct
+    {
+        const char* vertex;
+        const char* fragment;
+        const char* message;
+        std::function<void()> prepare;
+        unsigned int shaders; ///< asked for before the failure
+    } cases[] = {
+        {nullptr, COLOURED, "ShaderProgram source code cannot be empty", [] {}, 0},
+        {VERTEX, nullptr, "ShaderProgram source code cannot be empty", [] {}, 0},
+        {broken, COLOURED, "Failed to compile shader:\n", [] {}, 1},
+        {"", broken, "Failed to compile shader:\n", [] {}, 1},
+        {VERTEX, broken, "Failed to compile shader:\n", [] {}, 2},
+        {VERTEX, unlinkable, "Failed to link shader program:\n", [] {}, 2},
+        {VERTEX, COLOURED, "Failed to allocate program resource",
+         [] { glcalls::setDropped(glCreateProgram); }, 0},
+        {VERTEX, COLOURED, "Failed to allocate vertex shader resource",
+         [] { glcalls::setDropped(glCreateShader); }, 1},
+    };
+    for (const auto& test : cases)
+    {
+        glcalls::resetCounts();
+        test.prepare();
+        LogCapture log;
+        EXPECT_FALSE(m_programs->create(test.vertex, test.fragment, "failed")) << test.message;
+        EXPECT_TRUE(log.contains(test.message)) << test.message << " in " << log.text();
+        EXPECT_FALSE(m_programs->exists("failed"));
+        EXPECT_EQ(test.shaders, glcalls::count(glCreateShader)) << test.message;
+        glcalls::setDropped(glCreateProgram, false);
+        glcalls::setDropped(glCreateShader, false);
+    }
+}

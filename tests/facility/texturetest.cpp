@@ -1,0 +1,309 @@
+#include "orv/texture2d.h"
+
+#include "orv/extensions.h"
+#include "orv/rendercontext.h"
+#include "orv/rendertarget.h"
+#include "orv/texture2dcache.h"
+#include "orv/texture2dloader.h"
+#include "support/logcapture.h"
+#include "support/picture.h"
+#include "texturefixture.h"
+
+using namespace orv;
+using imagefiles::Bytes;
+using support::LogCapture;
+
+namespace
+{
+
+using Format = Texture::Format;
+using Type = Texture::Type;
+using Filter = TextureParameters::FilterMode;
+using Wrap = TextureParameters::WrapMode;
+
+class TextureTest : public TextureFixture<Texture2DCache>
+{
+protected:
+    SharedPtr<Texture2D> create(unsigned width, unsigned height, Format format = Format::RGBA,
+                                Type type = Type::UNSIGNED_BYTE)
+    {
+        return cache->create(width, height, format, type, nullptr, nullptr);
+    }
+};
+
+} // namespace
+
+// Faults caught: a texture that GL takes for incomplete and shows black, and sizes miscounted.
+TEST_F(TextureTest, createChoosesWhatTheSizeAndFormatAllow)
+{
+    const struct
+    {
+        unsigned width, height;
+        Format format;
+        Type type;
+        bool isFull; ///< mipmaps and repeat
+        unsigned bytes;
+    } cases[] = {
+        {64, 64, Format::RGB, Type::UNSIGNED_BYTE, true, 12288},
+        {64, 1, Format::RGBA, Type::UNSIGNED_BYTE, true, 256},
+        {100, 60, Format::RGB, Type::UNSIGNED_BYTE, false, 18000},
+        {64, 60, Format::LUMINANCE_ALPHA, Type::UNSIGNED_BYTE, false, 7680},
+        {8, 8, Format::ALPHA, Type::UNSIGNED_BYTE, true, 64},
+        {8, 8, Format::RGB, Type::UNSIGNED_SHORT_5_6_5, true, 128},
+        {8, 8, Format::RGBA, Type::UNSIGNED_SHORT_4_4_4_4, true, 128},
+        {16, 16, Format::DEPTH, Type::UNSIGNED_SHORT, false, 512},
+    };
+    for (const auto& test : cases)
+    {
+        const auto texture = create(test.width, test.height, test.format, test.type);
+        ASSERT_TRUE(texture);
+        const Wrap wrap = test.isFull ? Wrap::REPEAT : Wrap::CLAMP;
+        EXPECT_EQ(test.isFull, texture->hasMipmaps()) << test.width << " x " << test.height;
+        EXPECT_EQ(test.isFull ? Filter::LINEAR_MIPMAP_NEAREST : Filter::LINEAR, texture->getMinFilter());
+        EXPECT_EQ(Filter::LINEAR, texture->getMagFilter());
+        EXPECT_EQ(wrap, texture->getHorizontalWrap());
+        EXPECT_EQ(wrap, texture->getVerticalWrap());
+        EXPECT_EQ(test.bytes, texture->getSizeInBytes());
+    }
+    EXPECT_EQ(0u, Texture::getBytesPerPixel(Format(6), Type::UNSIGNED_BYTE));
+    EXPECT_EQ(0u, Texture::getBytesPerPixel(Format::RGB, Type(5)));
+    EXPECT_EQ(6u, Texture::getBytesPerPixel(Format::RGB, Type::UNSIGNED_SHORT));
+
+    EXPECT_FALSE(create(0, 8));
+    EXPECT_FALSE(create(8, 0));
+    EXPECT_FALSE(create(8, 8, Format(6)));
+    EXPECT_FALSE(create(8, 8, Format::RGB, Type(-1)));
+    EXPECT_EQ(std::size(cases), glcalls::count(glTexImage2D));
+
+    LogCapture log;
+    glcalls::refuseNames(glGenTextures);
+    EXPECT_FALSE(create(8, 8));
+    EXPECT_EQ(1, log.countMessage("Failed to create OpenGL texture"));
+}
+
+// Fault caught: rows of three bytes per pixel skewed by GL's default row alignment, or turned upside down.
+TEST_F(TextureTest, rowsArriveAsGiven)
+{
+    Bytes pixels(5 * 3 * 3, 0);
+    for (int y = 0; y < 3; ++y)
+        pixels[size_t((y * 5 + 1 + y) * 3)] = 255; // a red diagonal from (1, 0)
+    const auto texture = cache->create(5, 3, Format::RGB, Type::UNSIGNED_BYTE, pixels.data(), nullptr);
+    RenderTarget target(texture, nullptr, false, false);
+    target.enable();
+    auto expected = support::Picture::filled(5, 3, {0, 0, 0, 255});
+    for (int y = 0; y < 3; ++y)
+        expected.setPixel(1 + y, 2 - y, {255, 0, 0, 255}); // GL's first row is the picture's last
+    EXPECT_TRUE(comparePictures("textureRows", expected, support::readFramebuffer(0, 0, 5, 3)));
+    target.disable();
+}
+
+// Faults caught: settings under which GL shows the texture black, and mipmaps asked for but never made.
+TEST_F(TextureTest, settingsThatWouldTurnATextureBlackAreRefused)
+{
+    GLuint compressedName = 0;
+    glGenTextures(1, &compressedName);
+    const struct
+    {
+        const char* name;
+        SharedPtr<Texture2D> texture;
+        bool canMipmap;
+        bool canRepeat;
+    } cases[] = {
+        {"power of two", create(8, 8), true, true},
+        {"other size", create(6, 8), false, false},
+        {"depth", create(8, 8, Format::DEPTH, Type::UNSIGNED_SHORT), false, true},
+        {"compressed", cache->create(8, 8, 0.5f, false, compressedName, nullptr), false, true},
+    };
+    for (const auto& test : cases)
+    {
+        LogCapture log;
+        test.texture->setMinFilter(Filter::NEAREST);
+        test.texture->setHorizontalWrap(Wrap::CLAMP);
+        test.texture->setVerticalWrap(Wrap::CLAMP);
+        test.texture->setMagFilter(Filter::LINEAR);
+        EXPECT_EQ(0, log.count('E')) << test.name;
+
+        test.texture->setMinFilter(Filter::LINEAR_MIPMAP_LINEAR);
+        EXPECT_EQ(test.canMipmap ? Filter::LINEAR_MIPMAP_LINEAR : Filter::NEAREST,
+                  test.texture->getMinFilter())
+            << test.name;
+        EXPECT_EQ(test.canMipmap, test.texture->hasMipmaps()) << test.name;
+        EXPECT_EQ(test.canMipmap ? 0 : 1, log.count('E')) << test.name;
+
+        log.clear();
+        test.texture->setHorizontalWrap(Wrap::REPEAT);
+        test.texture->setVerticalWrap(Wrap::MIRRORED_REPEAT);
+        EXPECT_EQ(test.canRepeat ? Wrap::REPEAT : Wrap::CLAMP, test.texture->getHorizontalWrap())
+            << test.name;
+        EXPECT_EQ(test.canRepeat ? Wrap::MIRRORED_REPEAT : Wrap::CLAMP, test.texture->getVerticalWrap())
+            << test.name;
+        EXPECT_EQ(test.canRepeat ? 0 : 2, log.count('E')) << test.name;
+
+        log.clear();
+        test.texture->setMagFilter(Filter::LINEAR_MIPMAP_LINEAR);
+        EXPECT_EQ(1, log.countMessage("Only LINEAR and NEAREST supported for Mag Filter."));
+        EXPECT_EQ(Filter::LINEAR, test.texture->getMagFilter());
+    }
+    EXPECT_EQ(1u, glcalls::count(glGenerateMipmap)) << "made once, when the texture was created";
+
+    cases[0].texture->setMinFilter(Filter(6));
+    EXPECT_EQ(GLenum(GL_INVALID_ENUM), glGetError());
+    cases[0].texture->setHorizontalWrap(Wrap(3));
+    EXPECT_EQ(GLenum(GL_INVALID_ENUM), glGetError());
+}
+
+// Faults caught: mipmaps that a wrapped texture lacks are never made; a released texture's setters reach
+// whatever is bound as name 0.
+TEST_F(TextureTest, mipmapsOnDemandAndNothingAfterRelease)
+{
+    GLuint name = 0;
+    glGenTextures(1, &name);
+    glBindTexture(GL_TEXTURE_2D, name);
+    glTexImage2D(GL_TEXTURE_2D, 0, GL_RGBA, 4, 4, 0, GL_RGBA, GL_UNSIGNED_BYTE, nullptr);
+    const auto texture = cache->create(4, 4, 4.0f, false, name, "wrapped");
+    texture->setMinFilter(Filter::LINEAR_MIPMAP_NEAREST);
+    texture->setMinFilter(Filter::NEAREST_MIPMAP_NEAREST);
+    EXPECT_EQ(1u, glcalls::count(glGenerateMipmap));
+    EXPECT_EQ(Filter::NEAREST_MIPMAP_NEAREST, texture->getMinFilter());
+    EXPECT_EQ(64u, getTotalAssetSizeInBytes(*cache));
+
+    cache->getResourceCache()->release();
+    glcalls::startRecording();
+    texture->setParameters(TextureParameters(Filter::NEAREST, Filter::NEAREST, Wrap::CLAMP, Wrap::CLAMP));
+    EXPECT_EQ(Filter::NEAREST, texture->getMinFilter());
+    EXPECT_TRUE(glcalls::recorded().empty());
+    texture->enable();
+    EXPECT_EQ(std::vector<std::string>{"glBindTexture(0x0de1, 0)"}, glcalls::recorded());
+    glDeleteTextures(1, &name);
+}
+
+// Fault caught: a render context that draws with what it bound before, although the unit was taken.
+TEST_F(TextureTest, everyBindOutsideDrawingMovesTheEpoch)
+{
+    const auto texture = create(8, 8);
+    RenderContext render;
+    const std::function<void()> operations[] = {
+        [&] { texture->enable(); },
+        [&] { texture->setMinFilter(Filter::LINEAR); },
+        [&] { texture->setMagFilter(Filter::NEAREST); },
+        [&] { texture->setVerticalWrap(Wrap::CLAMP); },
+        [&] { texture->getHorizontalWrap(); },
+        [&] { create(4, 4); },
+        [&] { cache->createFromBackbuffer(render, Format::RGB, nullptr); },
+        [&] { cache->flush(); },
+    };
+    for (size_t i = 0; i < std::size(operations); ++i)
+    {
+        const uint64_t epoch = detail::g_bindingEpoch;
+        operations[i]();
+        EXPECT_NE(epoch, detail::g_bindingEpoch) << "operation " << i;
+    }
+}
+
+// Faults caught: rows of the surface missing, RGB refused for a surface with alpha, the sampling of a
+// non-power-of-two texture left at GL's defaults, or names leaked where the copy fails.
+TEST_F(TextureTest, backbufferCopies)
+{
+    RenderContext render;
+    render.setViewport(0, 0, 20, 10);
+    render.setClearColour(Colour4f(1.0f, 0.0f, 0.0f, 0.5f));
+    render.clear();
+    for (const Format format : {Format::RGB, Format::RGBA})
+    {
+        const auto texture = cache->createFromBackbuffer(render, format, "mirror");
+        ASSERT_TRUE(texture);
+        EXPECT_TRUE(cache->get("mirror") == texture) << "a held name is replaced";
+        EXPECT_EQ(20u, texture->getWidth());
+        EXPECT_EQ(10u, texture->getHeight());
+        EXPECT_EQ(format == Format::RGB ? 600u : 800u, texture->getSizeInBytes());
+        EXPECT_EQ(Filter::NEAREST, texture->getMinFilter());
+        EXPECT_EQ(Filter::LINEAR, texture->getMagFilter());
+        EXPECT_EQ(Wrap::CLAMP, texture->getHorizontalWrap());
+        RenderTarget target(texture, nullptr, false, false);
+        target.enable();
+        const uint8_t alpha = format == Format::RGB ? 255 : 128;
+        EXPECT_TRUE(isNear({255, 0, 0, alpha}, support::readFramebuffer(0, 0, 20, 10).average(), 1));
+        target.disable();
+    }
+
+    LogCapture log;
+    EXPECT_FALSE(cache->createFromBackbuffer(render, Format::DEPTH, "depth"));
+    EXPECT_EQ(1, log.countMessage("Creating depth texture from backbuffer is not permitted."));
+    const size_t before = glcalls::liveNames(glcalls::Kind::TEXTURE).size();
+    glcalls::replace(glCopyTexImage2D, [](GLenum, GLint, GLenum, GLint, GLint, GLsizei, GLsizei, GLint)
+                     { glcalls::queueError(GL_INVALID_OPERATION); });
+    EXPECT_FALSE(cache->createFromBackbuffer(render, Format::RGBA, "refused"));
+    EXPECT_TRUE(log.contains("OpenGL error 3: Invalid operation"));
+    EXPECT_EQ(before, glcalls::liveNames(glcalls::Kind::TEXTURE).size());
+    render.setViewport(0, 0, 0, 10);
+    EXPECT_FALSE(cache->createFromBackbuffer(render, Format::RGB, "empty"));
+    EXPECT_FALSE(cache->exists("empty"));
+    EXPECT_EQ(3, log.count('E'));
+}
+
+TEST_F(TextureTest, externalTexturesNeedTheirExtension)
+{
+    LogCapture log;
+    const auto texture = cache->createForExternalSource();
+    if (!GL_OES_EGL_image_external_supported())
+    {
+        EXPECT_FALSE(texture);
+        EXPECT_EQ(1, log.countMessage("Extension \"GL_OES_EGL_image_external\" not supported."));
+        return;
+    }
+    ASSERT_TRUE(texture);
+    EXPECT_TRUE(texture->isExternal());
+    EXPECT_EQ(0u, texture->getSizeInBytes());
+    EXPECT_EQ(Filter::NEAREST, texture->getMinFilter());
+    texture->setMinFilter(Filter::LINEAR_MIPMAP_LINEAR);
+    texture->setVerticalWrap(Wrap::REPEAT);
+    EXPECT_EQ(2, log.count('E'));
+    EXPECT_EQ(Wrap::CLAMP, texture->getVerticalWrap());
+}
+
+// Faults caught: a channel count uploaded as another format, files that no loader claims, and failures without
+// their message.
+TEST_F(TextureTest, loaderReadsImagesByName)
+{
+    const struct
+    {
+        const char* name;
+        Bytes file;
+        const char* upload;  ///< the GL call, up to the pixels; null for no texture
+        const char* message; ///< null for none
+    } cases[] = {
+        {"grey.png", imagefiles::encodeFlat("png", 4, 2, 1),
+         "glTexImage2D(0x0de1, 0, 6406, 4, 2, 0, 0x1906, 0x1401, ", nullptr},
+        {"greyalpha.TGA", imagefiles::encodeFlat("tga", 4, 2, 2),
+         "glTexImage2D(0x0de1, 0, 6410, 4, 2, 0, 0x190a, 0x1401, ", nullptr},
+        {"colour.Jpeg", imagefiles::encodeFlat("jpg", 4, 2, 3),
+         "glTexImage2D(0x0de1, 0, 6407, 4, 2, 0, 0x1907, 0x1401, ", nullptr},
+        {"alpha.png", imagefiles::encodeFlat("png", 4, 2, 4),
+         "glTexImage2D(0x0de1, 0, 6408, 4, 2, 0, 0x1908, 0x1401, ", nullptr},
+        {"oddly.named", imagefiles::encodeFlat("bmp", 4, 2, 3),
+         "glTexImage2D(0x0de1, 0, 6407, 4, 2, 0, 0x1907, 0x1401, ", nullptr},
+        {"broken.png", Bytes(100, 1), nullptr, "Image failed to load texture \"broken.png\""},
+        {"broken.pvr", Bytes(100, 1), nullptr, nullptr},
+    };
+    cache->registerLoader(makeShared<Texture2DLoader>());
+    for (const auto& test : cases)
+    {
+        addFile(test.name, test.file);
+        LogCapture log;
+        glcalls::startRecording();
+        const auto texture = cache->get(test.name);
+        glcalls::stopRecording();
+        EXPECT_EQ(test.upload != nullptr, bool(texture)) << test.name;
+        const auto uploads = glcalls::recorded("glTexImage2D");
+        ASSERT_EQ(test.upload ? 1u : 0u, uploads.size()) << test.name;
+        EXPECT_EQ(0u, test.upload ? uploads[0].find(test.upload) : 0u) << test.name;
+        EXPECT_EQ(test.message ? 1 : 0, log.count('E')) << test.name;
+        EXPECT_EQ(test.message ? 1 : 0, log.countMessage(test.message ? test.message : "")) << test.name;
+    }
+    LogCapture log;
+    EXPECT_FALSE(cache->get("missing.png"));
+    EXPECT_EQ(0, log.count('E'));
+    Texture2DLoader loader;
+    EXPECT_TRUE(loader.isKnown("a.JPG"));
+    EXPECT_FALSE(loader.isKnown("a.pvr"));
+}

@@ -1,0 +1,197 @@
+#include "orv/tokenreader.h"
+
+#include "orv/filetostring.h"
+#include "orv/memorystream.h"
+#include "orv/textsuffix.h"
+
+#include "support/tempdir.h"
+
+#include <gtest/gtest.h>
+
+#include <cmath>
+#include <string>
+
+using namespace orv;
+
+namespace
+{
+
+/// A text as FileToString would hold it.
+struct Text
+{
+    explicit Text(const std::string& content)
+        : buffer(content)
+        , range{buffer.data(), buffer.data() + buffer.size()}
+    {
+    }
+
+    std::string rest() const { return std::string(range.start, range.end); }
+
+    std::string buffer;
+    CharRange range;
+};
+
+std::string toText(const CharRange& token)
+{
+    return std::string(token.start, token.end);
+}
+
+} // namespace
+
+// Fault caught: quotes or ends of the buffer handled wrongly, which garbles every name in a material.
+TEST(TokenReader, tokens)
+{
+    const struct
+    {
+        const char* input;
+        const char* token;
+        const char* rest;
+    } cases[] = {{"  \"a b\" c", "a b", " c"},
+                 {"abc", "abc", ""},
+                 {"abc def", "abc", "def"},
+                 {"\t\r\n\v\fx", "x", ""},
+                 {"\"open", "open", ""},
+                 {"\"\" x", "", " x"},
+                 {"   ", "", ""},
+                 {"", "", ""},
+                 {"a\"b c", "a\"b", "c"},
+                 {"one\ntwo", "one", "two"}};
+    for (const auto& test : cases)
+    {
+        Text text(test.input);
+        EXPECT_EQ(test.token, toText(readToken(text.range))) << test.input;
+        EXPECT_EQ(test.rest, text.rest()) << test.input;
+    }
+
+    Text text("one two");
+    EXPECT_STREQ("one", readToken(text.range).start) << "not terminated in place";
+
+    // A range that is a part of a larger text never reads on, even where the next character is a quote.
+    Text part("ab \"cd\" e");
+    part.range.end = part.range.start + 3;
+    EXPECT_EQ("ab", toText(readToken(part.range)));
+    EXPECT_TRUE(readToken(part.range).empty());
+    EXPECT_TRUE(part.range.empty());
+}
+
+TEST(TokenReader, floats)
+{
+    const struct
+    {
+        const char* input;
+        float value;
+        const char* rest;
+    } cases[] = {{"1.5e2", 150.0f, ""}, {"-.25", -0.25f, ""}, {"x", 0.0f, "x"},    {"abc", 0.0f, "abc"},
+                 {"  ", 99.0f, ""},     {"", 99.0f, ""},      {"-", 99.0f, ""},    {"+7 8", 7.0f, " 8"},
+                 {".", 0.0f, ""},       {"2.", 2.0f, ""},     {"25e-1", 2.5f, ""}, {"3E+1x", 30.0f, "x"},
+                 {"1e", 1.0f, ""},      {"-x", -0.0f, "x"},   {"1,5", 1.0f, ",5"}, {"0x10", 0.0f, "x10"}};
+    for (const auto& test : cases)
+    {
+        Text text(test.input);
+        const float value = readFloat(text.range, 99.0f);
+        EXPECT_FLOAT_EQ(test.value, value) << test.input;
+        EXPECT_EQ(std::signbit(test.value), std::signbit(value)) << test.input;
+        EXPECT_EQ(test.rest, text.rest()) << test.input;
+    }
+}
+
+TEST(TokenReader, integersAndBooleans)
+{
+    const struct
+    {
+        const char* input;
+        int asInt;
+        const char* restOfInt;
+        unsigned int asUnsigned;
+        bool asBool;
+    } cases[] = {{"12 3", 12, " 3", 12, true},
+                 {"-x", 99, "x", 98, false},
+                 {"-40", -40, "", 98, false},
+                 {"+5", 5, "", 98, false},
+                 {"", 99, "", 98, false},
+                 {"True", 99, "True", 98, true},
+                 {"yes", 99, "yes", 98, false},
+                 {"t", 99, "t", 98, true},
+                 {"10", 10, "", 10, true},
+                 {"0", 0, "", 0, false},
+                 {"4294967295", -1, "", 4294967295u, false},
+                 {"-2147483648", -2147483647 - 1, "", 98, false}};
+    for (const auto& test : cases)
+    {
+        Text forInt(test.input), forUnsigned(test.input), forBool(test.input);
+        EXPECT_EQ(test.asInt, readInt(forInt.range, 99)) << test.input;
+        EXPECT_EQ(test.restOfInt, forInt.rest()) << test.input;
+        EXPECT_EQ(test.asUnsigned, readUInt(forUnsigned.range, 98)) << test.input;
+        EXPECT_EQ(test.asBool, readBool(forBool.range)) << test.input;
+    }
+}
+
+TEST(TokenReader, requiredCharacter)
+{
+    Text missing("  x");
+    EXPECT_FALSE(requireChar(missing.range, '{'));
+    EXPECT_EQ("x", missing.rest());
+    Text present(" {x");
+    EXPECT_TRUE(requireChar(present.range, '{'));
+    EXPECT_EQ("x", present.rest());
+    Text blank("  ");
+    EXPECT_FALSE(requireChar(blank.range, '\0')) << "the byte behind the range is not part of it";
+}
+
+TEST(TextSuffix, matches)
+{
+    const struct
+    {
+        const char* text;
+        const char* suffix;
+        bool exact;
+        bool ignoringCase;
+    } cases[] = {{"IMAGE.PNG", ".png", false, true},
+                 {"a.png", ".png", true, true},
+                 {"g", ".png", false, false},
+                 {"x", "", true, true},
+                 {"", "", true, true},
+                 {"a[", "a{", false, false},
+                 {nullptr, "", false, false},
+                 {"a", nullptr, false, false}};
+    for (const auto& test : cases)
+    {
+        EXPECT_EQ(test.exact, endsWith(test.text, test.suffix)) << (test.text ? test.text : "null");
+        EXPECT_EQ(test.ignoringCase, endsWithI(test.text, test.suffix)) << (test.text ? test.text : "null");
+    }
+}
+
+namespace
+{
+
+/// Says that it is larger than it is.
+class ShortStream : public MemoryStream
+{
+public:
+    using MemoryStream::MemoryStream;
+    int32_t size() const override { return 1000; }
+};
+
+} // namespace
+
+// Fault caught: text behind the part that was really read.
+TEST(FileToString, readsTheRestOfAStream)
+{
+    MemoryStream stream("0123456789", 10);
+    stream.seek(4);
+    FileToString text(stream);
+    EXPECT_STREQ("456789", text.getStart());
+    EXPECT_EQ('\0', *text.getEnd());
+    EXPECT_EQ(6, text.getEnd() - text.getStart());
+
+    ShortStream shortStream("abc", 3);
+    text.read(shortStream);
+    EXPECT_STREQ("abc", text.getStart());
+    EXPECT_EQ(3, text.getEnd() - text.getStart());
+
+    text.read(stream); // at its end
+    EXPECT_STREQ("", text.getStart());
+
+    EXPECT_EQ(nullptr, FileToString("no/such/file").getStart());
+    EXPECT_EQ(nullptr, FileToString("no/such/file").getEnd());
+}
