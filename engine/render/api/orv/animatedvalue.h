@@ -1,0 +1,22 @@
+#pragma once
+
+#include "orv/shared.h"
+#include "orv/sharedptr.h"
+
+namespace orv
+{
+
+/// A value for every time. T is float, Vector3f, Vector4f or Colour4f.
+template <class T>
+class AnimatedValue : public Shared
+{
+public:
+    ORV_CLASS_NAME("AnimatedValue")
+    using Ptr = SharedPtr<AnimatedValue<T>>;
+
+    virtual T getValue(float time) const = 0;
+    virtual float getStart() const = 0;
+    virtual float getEnd() const = 0;
+};
+
+} // namespace orv

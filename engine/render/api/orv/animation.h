@@ -1,0 +1,24 @@
+#pragma once
+
+#include "orv/shared.h"
+#include "orv/sharedptr.h"
+
+namespace orv
+{
+
+/// Anything that can put itself into its state at a time. Times are seconds on the animation's own time line.
+class ORV_API Animation : public Shared
+{
+public:
+    ORV_CLASS_NAME("Animation")
+    using Ptr = SharedPtr<Animation>;
+
+    virtual void apply(float progress) = 0;
+    virtual float getStart() const = 0;
+    virtual float getEnd() const = 0;
+};
+
+/// End minus start, never below 0.
+ORV_API float getLength(const Animation& animation);
+
+} // namespace orv

@@ -1,0 +1,58 @@
+#pragma once
+
+#include "orv/animatedvalue.h"
+#include "orv/animation.h"
+#include "orv/animator.h"
+
+namespace orv
+{
+
+/// Couples a value with the animator that writes it. Both are shared.
+///
+/// A channel that lacks either logs an error each time it is needed and does nothing.
+template <class T>
+class AnimationChannel : public Animation
+{
+public:
+    ORV_CLASS_NAME("AnimationChannel")
+    using Ptr = SharedPtr<AnimationChannel<T>>;
+
+    AnimationChannel(const typename AnimatedValue<T>::Ptr& value, const typename Animator<T>::Ptr& animator)
+        : m_value(value)
+        , m_animator(animator)
+    {
+    }
+
+    void apply(float progress) override
+    {
+        Animator<T>* animator = m_animator.operator->(); // logs when there is none
+        const AnimatedValue<T>* value = m_value.operator->();
+        if (animator && value)
+            animator->apply(value->getValue(progress));
+    }
+
+    float getStart() const override
+    {
+        const AnimatedValue<T>* value = m_value.operator->();
+        return value ? value->getStart() : 0.0f;
+    }
+
+    float getEnd() const override
+    {
+        const AnimatedValue<T>* value = m_value.operator->();
+        return value ? value->getEnd() : 0.0f;
+    }
+
+private:
+    typename AnimatedValue<T>::Ptr m_value;
+    typename Animator<T>::Ptr m_animator;
+};
+
+template <class T>
+typename AnimationChannel<T>::Ptr createAnimationChannel(const SharedPtr<AnimatedValue<T>>& value,
+                                                         const SharedPtr<Animator<T>>& animator)
+{
+    return makeShared<AnimationChannel<T>>(value, animator);
+}
+
+} // namespace orv

@@ -1,0 +1,44 @@
+#pragma once
+
+#include "orv/colour.h"
+#include "orv/export.h"
+
+#include <cstdint>
+
+namespace orv
+{
+
+class RenderContext;
+
+/// What a view is cleared to, and which buffers are: a mask that is off keeps its buffer.
+class ORV_API Background
+{
+public:
+    Background() = default;
+    explicit Background(const Colour4f& colour) : m_colour(colour) {}
+
+    const Colour4f& getColour() const { return m_colour; }
+    void setColour(const Colour4f& colour) { m_colour = colour; }
+    float getDepth() const { return m_depth; }
+    void setDepth(float depth) { m_depth = depth; }
+    int getStencil() const { return m_stencil; }
+    void setStencil(int stencil) { m_stencil = stencil; }
+
+    void setColourMask(bool red, bool green, bool blue, bool alpha);
+    void setDepthMask(bool enabled) { m_depthMask = enabled; }
+    void setStencilMask(uint32_t mask) { m_stencilMask = mask; }
+
+    /// Sets masks and clear values, switches the scissor test off and clears. The state stays set.
+    /// GL thread only.
+    void enable(RenderContext& context) const;
+
+private:
+    Colour4f m_colour;
+    float m_depth = 1.0f;
+    int m_stencil = 0;
+    bool m_colourMask[4] = {true, true, true, true};
+    bool m_depthMask = true;
+    uint32_t m_stencilMask = 0xFFFFFFFF;
+};
+
+} // namespace orv

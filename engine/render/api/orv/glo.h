@@ -1,0 +1,132 @@
+#pragma once
+
+#include "orv/export.h"
+#include "orv/shared.h"
+#include "orv/sharedptr.h"
+#include "orv/version.h"
+
+#include <map>
+#include <string>
+#include <vector>
+
+namespace orv
+{
+
+class AnimationGroup;
+class Appearance;
+class AssetCachePool;
+class Camera;
+class Light;
+class SceneNode;
+
+namespace detail
+{
+class GloBuilder;
+}
+
+/// What loadGloFile() made of a scene file (".glo").
+///
+/// Everything handed out is shared: the tree lives on in the scene and the animations with their targets after
+/// this object is gone. Questions by name compare exactly; a null name finds nothing.
+class ORV_API Glo : public Shared
+{
+public:
+    using Ptr = SharedPtr<Glo>;
+
+    ORV_CLASS_NAME("Glo")
+
+    ~Glo() override;
+
+    /// The version that the file was written in, without extra text.
+    const Version& getFileVersion() const { return m_fileVersion; }
+
+    /// The top of the loaded tree; empty if the file has no scene.
+    const SharedPtr<SceneNode>& getTopNode() const { return m_topNode; }
+
+    /// All of the file's animations, a group each; an empty group if it has none. For an AnimationController.
+    const SharedPtr<AnimationGroup>& getAnimationGroup() const { return m_animationGroup; }
+
+    /// The animations of the file's list, in its order. Those inside others are only reached through them.
+    int getAnimationCount() const { return int(m_animations.size()); }
+
+    /// @return null outside 0 to the count, for getAnimation() empty.
+    const char* getAnimationName(int index) const;
+    SharedPtr<AnimationGroup> getAnimation(int index) const;
+
+    /// The first animation of that name.
+    SharedPtr<AnimationGroup> getAnimation(const char* name) const;
+
+    /// The file's loop range in seconds, for setLoopRange(); both 0, which is no loop, if it has none.
+    float getLoopBegin() const { return m_loopBegin; }
+    float getLoopEnd() const { return m_loopEnd; }
+
+    /// Cameras and lights in the order of the tree, parents first.
+    int getCameraCount() const { return int(m_cameras.size()); }
+    int getLightCount() const { return int(m_lights.size()); }
+
+    /// Empty outside 0 to the count.
+    SharedPtr<Camera> getCamera(int index) const;
+    SharedPtr<Light> getLight(int index) const;
+
+    /// The first one whose node has that name, or else the first one made from the definition of that name.
+    SharedPtr<Camera> getCamera(const char* name) const;
+    SharedPtr<Light> getLight(const char* name) const;
+
+    /// The appearance of the material of that name.
+    SharedPtr<Appearance> getAppearance(const char* name) const;
+
+    /// All appearances, by material name.
+    const std::map<std::string, SharedPtr<Appearance>, std::less<>>& getAppearances() const
+    {
+        return m_appearances;
+    }
+
+private:
+    friend class detail::GloBuilder;
+
+    template <class T>
+    struct Placed
+    {
+        SharedPtr<T> node;
+        std::string definition;
+    };
+
+    struct NamedAnimation
+    {
+        std::string name;
+        SharedPtr<AnimationGroup> group;
+    };
+
+    template <class T>
+    static SharedPtr<T> at(const std::vector<Placed<T>>& all, int index);
+    template <class T>
+    static SharedPtr<T> find(const std::vector<Placed<T>>& all, const char* name);
+
+    Glo();
+
+    Version m_fileVersion;
+    SharedPtr<SceneNode> m_topNode;
+    SharedPtr<AnimationGroup> m_animationGroup;
+    std::vector<NamedAnimation> m_animations;
+    float m_loopBegin = 0.0f;
+    float m_loopEnd = 0.0f;
+    std::vector<Placed<Camera>> m_cameras;
+    std::vector<Placed<Light>> m_lights;
+    std::map<std::string, SharedPtr<Appearance>, std::less<>> m_appearances;
+};
+
+/// Loads a scene file and hangs its tree under a node.
+///
+/// Textures and shader programs come from the pool by name; buffers, meshes and appearances are made anew by
+/// every load. Where a name in the file is borne by several nodes, the first in the order of the tree is meant.
+/// GL thread only.
+///
+/// @param parent  gets the top node as its last child; empty: the tree is a root that only the result holds.
+/// @param name    looked for on the pool's path.
+/// @return empty, after logging why, if the file is missing, damaged, newer than the loader, or names something
+/// that it does not hold; parent is unchanged then. Missing textures, materials and joints and unknown animated
+/// properties are logged and replaced or left out.
+ORV_API SharedPtr<Glo> loadGloFile(AssetCachePool& pool, const SharedPtr<SceneNode>& parent,
+                                   const char* name);
+
+} // namespace orv

@@ -1,0 +1,29 @@
+#pragma once
+
+#include "orv/renderblock.h"
+
+#include <vector>
+
+namespace orv
+{
+
+/// Several blocks, in order. Blocks are shared.
+class ORV_API RenderBlockGroup : public RenderBlockBase
+{
+public:
+    ORV_CLASS_NAME("RenderBlockGroup")
+    using Ptr = SharedPtr<RenderBlockGroup>;
+
+    void
+    addBlock(const SharedPtr<RenderBlockBase>& block); ///< appends; an empty one is refused with an error
+    void removeBlock(const SharedPtr<RenderBlockBase>& block); ///< every occurrence; unknown ones are ignored
+
+    void render() override;
+    void update(float time) override;
+    void setStereo(float focalDistance, float eyeSeparation) override;
+
+private:
+    std::vector<SharedPtr<RenderBlockBase>> m_blocks;
+};
+
+} // namespace orv

@@ -1,0 +1,96 @@
+#pragma once
+
+#include "orv/animator.h"
+#include "orv/colour.h"
+#include "orv/export.h"
+#include "orv/propertyref.h"
+#include "orv/sharedptr.h"
+#include "orv/vector.h"
+
+namespace orv
+{
+
+class Appearance;
+class Light;
+class SceneNode;
+
+/// The animators of scene objects. Each shares its target; one without a target logs an error each time it is
+/// applied and does nothing.
+
+class ORV_API SceneNodePositionAnimator : public Animator<Vector3f>
+{
+public:
+    explicit SceneNodePositionAnimator(const SharedPtr<SceneNode>& node);
+    ~SceneNodePositionAnimator() override;
+    void apply(const Vector3f& position) override;
+
+private:
+    SharedPtr<SceneNode> m_node;
+};
+
+class ORV_API SceneNodeRotationAnimator : public Animator<Vector4f>
+{
+public:
+    explicit SceneNodeRotationAnimator(const SharedPtr<SceneNode>& node);
+    ~SceneNodeRotationAnimator() override;
+    /// @param axisAngle  axis x, y, z, taken as it is (not normalised), and angle in radians.
+    void apply(const Vector4f& axisAngle) override;
+
+private:
+    SharedPtr<SceneNode> m_node;
+};
+
+/// Leaves the node alone, and so its transform clean, while the value stays the one it applied last.
+class ORV_API SceneNodeScaleAnimator : public Animator<Vector3f>
+{
+public:
+    explicit SceneNodeScaleAnimator(const SharedPtr<SceneNode>& node);
+    ~SceneNodeScaleAnimator() override;
+    void apply(const Vector3f& scale) override;
+
+private:
+    SharedPtr<SceneNode> m_node;
+    Vector3f m_lastScale; // not a number before the first apply(), so that any first scale differs
+};
+
+class ORV_API LightColourAnimator : public Animator<Colour4f>
+{
+public:
+    explicit LightColourAnimator(const SharedPtr<Light>& light);
+    ~LightColourAnimator() override;
+    void apply(const Colour4f& colour) override;
+
+private:
+    SharedPtr<Light> m_light;
+};
+
+class ORV_API LightIntensityAnimator : public Animator<float>
+{
+public:
+    explicit LightIntensityAnimator(const SharedPtr<Light>& light);
+    ~LightIntensityAnimator() override;
+    void apply(const float& intensity) override;
+
+private:
+    SharedPtr<Light> m_light;
+};
+
+/// Writes element 0 of a named property, which is created when absent. T is float or Vector4f.
+template <class T>
+class AppearancePropertyAnimator : public Animator<T>
+{
+public:
+    /// @param name  copied.
+    AppearancePropertyAnimator(const SharedPtr<Appearance>& appearance, const char* name);
+    ~AppearancePropertyAnimator() override;
+    void apply(const T& value) override;
+
+private:
+    SharedPtr<Appearance> m_appearance;
+    PropertyRef m_property;
+};
+
+extern template class ORV_API AppearancePropertyAnimator<float>;
+extern template class ORV_API AppearancePropertyAnimator<Vector4f>;
+
+} // namespace orv

@@ -1,0 +1,151 @@
+#pragma once
+
+#include "orv/matrix.h"
+#include "orv/quaternion.h"
+#include "orv/shared.h"
+#include "orv/sharedptr.h"
+#include "orv/vector.h"
+
+#include <cstdint>
+#include <string>
+#include <vector>
+
+namespace orv
+{
+
+class SceneNodeVisitor;
+
+/// A place in the scene tree: a local transform, a lazily kept world transform, flags, a name and children.
+///
+/// Ownership: a node owns its children; the parent is a plain back-pointer that the parent clears when it is
+/// destroyed. A child that leaves its parent lives on only if somebody else holds it.
+/// Transforms: world = parent's world * local, local = rotation * scale with the position as translation
+/// (column vectors, right-handed). Setters only mark; matrices are rebuilt when read, parents first.
+/// Depth: walks, marking and updating recurse once per level, so keep a tree below some thousands of levels;
+/// destruction does not recurse.
+/// Threads: none, one thread at a time.
+class ORV_API SceneNode : public Shared
+{
+public:
+    ORV_CLASS_NAME("SceneNode")
+    using Ptr = SharedPtr<SceneNode>;
+
+    /// Tells node classes apart; compare with a class's NODE_TYPE.
+    using NodeType = uint32_t;
+    static constexpr NodeType NODE_TYPE = 0;
+
+    SceneNode() = default;
+    explicit SceneNode(const char* name);
+    ~SceneNode() override;
+
+    virtual NodeType getNodeType() const { return NODE_TYPE; }
+
+    /// Calls the visitor's visit() for this node's own class; children are not walked (see visitScene()).
+    virtual void accept(SceneNodeVisitor& visitor);
+
+    const char* getName() const { return m_name.c_str(); }
+    /// @param name  copied; null counts as empty.
+    void setName(const char* name);
+
+    /// Flag bits as stored: wanted state XOR the flag's inverted bit; see FlagMask and setFlags().
+    uint32_t getFlags() const { return m_flags; }
+    void setFlags(uint32_t storedBits) { m_flags = storedBits; }
+
+    const Vector3f& getPosition() const { return m_position; }
+    const Quaternionf& getRotation() const { return m_rotation; }
+    const Vector3f& getScale() const { return m_scale; }
+
+    /// These three do nothing at all, and mark nothing, when the value equals the stored one exactly.
+    void setPosition(const Vector3f& position);
+    void setRotation(const Quaternionf& rotation);
+    void setScale(const Vector3f& scale);
+
+    /// Replaces the local matrix. Position, rotation and scale are not derived from it and keep their values;
+    /// changing one of them later rebuilds the matrix from them and discards this one.
+    void setLocalTransform(const Matrix4f& transform);
+
+    const Matrix4f& getLocalTransform() const;
+    const Matrix4f& getWorldTransform() const;
+    bool getLocalMirrored() const; ///< the local transform flips handedness
+    bool getWorldMirrored() const; ///< the world transform flips handedness
+
+    /// The world matrix that updateMotionData() saved; identity before the first call.
+    const Matrix4f& getLastWorldTransform() const { return m_lastWorldTransform; }
+
+    /// Marks the local matrix, and so this subtree's world matrices, for rebuilding.
+    void setTransformChanged();
+    /// Marks this subtree's world matrices; returns at once when they are marked already.
+    void setWorldTransformChanged();
+
+    void updateLocal() const;
+    /// Brings this node up to date below a parent with the given world transform.
+    void updateAll(const Matrix4f& parentWorld, bool parentMirrored) const;
+    /// Brings the stale ancestors, from the topmost down, and this node up to date.
+    void update() const;
+    /// Saves the current world matrix as the last one; once per frame, after drawing.
+    void updateMotionData();
+
+    SceneNode* getParent() const { return m_parent; }
+
+    /// Moves the node, last, under another parent. The node may be destroyed by this call when its old parent
+    /// alone held it and the new one is empty.
+    /// @param parent  empty makes the node a root. The node itself or one of its descendants is refused
+    /// silently: nothing happens.
+    /// @param preserveWorldTransform  true gives the node the local matrix that keeps it where it is in the
+    /// world (position, rotation and scale stay as they were); false keeps its local transform.
+    void setParent(const SharedPtr<SceneNode>& parent, bool preserveWorldTransform = false);
+
+    /// Makes a child of this node a root and drops this node's share of it; other nodes are left alone.
+    void removeChild(const SharedPtr<SceneNode>& child);
+
+    /// True also for the node itself.
+    bool hasAncestor(const SceneNode* node) const;
+
+    /// Called by the parent's destructor: the node becomes a root.
+    void onParentDestroyed();
+
+    unsigned int getChildCount() const { return static_cast<unsigned int>(m_children.size()); }
+    /// @return empty, after logging an assertion, for an index beyond the last child.
+    const SharedPtr<SceneNode>& getChild(unsigned int i) const;
+    /// In the order in which they were added.
+    const std::vector<SharedPtr<SceneNode>>& getChildren() const { return m_children; }
+
+    /// Depth first, this node before its children, children in order; names compare exactly.
+    /// @return borrowed; null when no node of this subtree has the name.
+    SceneNode* find(const char* name);
+    const SceneNode* find(const char* name) const;
+
+private:
+    SharedPtr<SceneNode> takeChild(const SceneNode* child);
+
+    mutable bool m_localMirrored = false;
+    mutable bool m_worldMirrored = false;
+    mutable bool m_localTransformChanged = false;
+    mutable bool m_worldTransformChanged = false;
+    uint32_t m_flags = 0;
+    std::string m_name;
+    Vector3f m_scale{1.0f, 1.0f, 1.0f};
+    Quaternionf m_rotation;
+    Vector3f m_position;
+    mutable Matrix4f m_localTransform = Matrix4f::IDENTITY;
+    mutable Matrix4f m_worldTransform = Matrix4f::IDENTITY;
+    Matrix4f m_lastWorldTransform = Matrix4f::IDENTITY;
+    std::vector<SharedPtr<SceneNode>> m_children;
+    SceneNode* m_parent = nullptr;
+};
+
+inline const Matrix4f& SceneNode::getWorldTransform() const
+{
+    if (m_worldTransformChanged)
+        update();
+    return m_worldTransform;
+}
+
+inline bool SceneNode::getWorldMirrored() const
+{
+    if (m_worldTransformChanged)
+        update();
+    return m_worldMirrored;
+}
+
+} // namespace orv

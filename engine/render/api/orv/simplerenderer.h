@@ -1,0 +1,107 @@
+#pragma once
+
+#include "orv/detail/viewport.h"
+#include "orv/matrix.h"
+#include "orv/renderer.h"
+
+#include <memory>
+#include <vector>
+
+namespace orv
+{
+
+class AssetCachePool;
+class Light;
+class PropertyRef;
+class RenderTarget;
+
+namespace detail
+{
+struct Eye;
+struct RendererProperties;
+} // namespace detail
+
+/// The forward renderer: opaque solids, then mirrors, then transparent solids back to front.
+///
+/// It feeds shaders through global properties of its render context, registered when it is made. Renderers on
+/// one context share them; what is there already is used, not replaced.
+///
+/// - L_COUNT, and five elements each of L_DIFFUSE_COLOUR, L_AMBIENT_COLOUR, L_SPECULAR_COLOUR, L_POSITION
+///   (w 0: a direction towards the light), L_ATTENUATION_NEAR, L_ATTENUATION_RECIPROCAL, L_SPOT_INNER_COS,
+///   L_SPOT_OUTER_COS, L_SPOT_DIRECTION (against the light's shine). The first five lights of the walk count.
+/// - J_COUNT and J_WORLD (20 matrices, mesh space to world space).
+/// - T_MODEL, T_VIEW, T_MODEL_VIEW, T_VIEW_PROJECTION, T_MODEL_VIEW_PROJECTION, T_NORMAL_MODEL (model space
+///   normals to world space), T_CAMERA_POSITION.
+/// - TIME, in seconds, wrapping at 60. FOG_DENSITY and FOG_COLOUR are the application's to set.
+/// - M_BLACK_TEXTURE, M_WHITE_TEXTURE, M_ERROR_TEXTURE, and a default for each material value that an
+///   appearance may leave out: M_DIFFUSE_COLOUR, M_SPECULAR_COLOUR (white), M_AMBIENT_COLOUR,
+///   M_EMISSIVE_COLOUR (black), M_SHININESS (5), M_SPECULAR_LEVEL (1), M_OPACITY (1), M_SELF_ILLUMINATION
+///   (0), M_UV_OFFSET_SCALE (0, 0, 1, 1), and white 2D textures M_DIFFUSE_TEXTURE, M_SPECULAR_TEXTURE,
+///   M_AMBIENT_TEXTURE, M_EMISSIVE_TEXTURE, M_GLOSS_TEXTURE, M_SPECULAR_LEVEL_TEXTURE.
+///
+/// Mirrors: a solid whose program takes M_MIRROR_TEXTURE lies in the plane through its position across its
+/// z axis. Before it is drawn the opaque and transparent solids are drawn, reflected, into one texture that
+/// all mirrors share; during that pass T_VIEW and T_CAMERA_POSITION are the reflected eye's. The picture is
+/// upside down: a fragment at normalised device coordinates (x, y) finds its reflection at texture
+/// coordinates (0.5 + 0.5 x, 0.5 - 0.5 y). It is cleared to the clear values last set (the render block's
+/// background). The texture is made at the first mirror, as large as the viewport is then, and keeps that
+/// size; it is RGB. Solids behind the mirror's plane are not cut away. Framebuffer and viewport come back.
+///
+/// The context is not to outlive its pool with the textures above in it: when the last renderer of a context
+/// goes it takes them out of the context, so drop renderers before the last AssetCachePool::flush().
+/// GL thread only.
+class ORV_API SimpleRenderer : public Renderer
+{
+public:
+    ORV_CLASS_NAME("SimpleRenderer")
+    using Ptr = SharedPtr<SimpleRenderer>;
+
+    /// @param context  shared; must not be empty.
+    /// @param pool  shared; where the textures come from. Empty: there are none, and no mirrors.
+    SimpleRenderer(const SharedPtr<RenderContext>& context, const SharedPtr<AssetCachePool>& pool);
+    ~SimpleRenderer() override;
+
+    /// A camera with a stereo eye separation draws twice, the left eye to the left half of the viewport.
+    void render(Camera* camera, SceneNode& scene, const FlagMask& renderFlags,
+                const FlagMask& recursiveFlags) override;
+    void update(float time) override { m_time = time; }
+    const SharedPtr<RenderContext>& getRenderContext() const override { return m_context; }
+
+    /// The scene walk of render() arrives here.
+    using SceneNodeVisitor::visit;
+    void visit(Solid* solid) override;
+    void visit(Light* light) override;
+
+private:
+    struct SortKey
+    {
+        float depth; ///< along the eye's z axis; never NaN
+        Solid* solid;
+    };
+
+    void publishLights();
+    void publishLight(const Light& light, int index);
+    void publishEye(const Matrix4f& world, const Matrix4f& view);
+    void publishJoints(const Solid& solid);
+    void sortTransparent(const Vector3f& eyeZ);
+    void renderEye(const detail::Eye& eye, const detail::Viewport& viewport);
+    bool prepareMirrorTarget();
+    void renderReflection(const Solid& mirror, const detail::Eye& eye, const detail::Viewport& viewport);
+    void draw(Solid* const* solids, size_t count, const Matrix4f& view, const Matrix4f& projection);
+
+    SharedPtr<RenderContext> m_context;
+    SharedPtr<AssetCachePool> m_pool;
+    std::unique_ptr<detail::RendererProperties> m_properties;
+    std::vector<Solid*> m_opaque; // these four are valid during render() only
+    std::vector<Solid*> m_transparent;
+    std::vector<Solid*> m_mirrors;
+    std::vector<Light*> m_lights;
+    std::vector<SortKey> m_sortKeys;
+    std::vector<PropertyRef> m_mirrorProperties; // one for each place in m_mirrors
+    detail::Viewport m_viewport;                 // of the whole picture
+    SharedPtr<RenderTarget> m_mirrorTarget;
+    bool m_mirrorTargetTried = false;
+    float m_time = 0.0f;
+};
+
+} // namespace orv

@@ -1,0 +1,88 @@
+#pragma once
+
+#include "orv/matrix.h"
+#include "orv/scenenode.h"
+#include "orv/sharedptr.h"
+
+#include <vector>
+
+namespace orv
+{
+
+class Appearance;
+class Mesh;
+class RenderContext;
+
+/// A mesh in the scene, drawn with an appearance, perhaps skinned by joints.
+class ORV_API Solid : public SceneNode
+{
+public:
+    ORV_CLASS_NAME("Solid")
+    using Ptr = SharedPtr<Solid>;
+    static constexpr NodeType NODE_TYPE = 1;
+
+    static constexpr int MAX_JOINTS_PER_VERTEX = 4;
+    /// The joint matrices that reach a shader; further joints are kept but have no effect.
+    static constexpr int MAX_JOINTS = 20;
+
+    /// A node that moves vertices. A joint at or above the solid in the tree is borrowed, since a share of it
+    /// would keep both alive for ever, and counts as unbound once it is no longer above.
+    struct JointAttachment
+    {
+        SharedPtr<SceneNode> joint;       ///< empty when unbound or borrowed
+        const SceneNode* above = nullptr; ///< the borrowed joint; looked at only while it is an ancestor
+        Matrix4f inverseBind = Matrix4f::IDENTITY; ///< mesh space, after the bind shape, to joint space
+    };
+
+    Solid();
+    Solid(const SharedPtr<Mesh>& mesh, const SharedPtr<Appearance>& appearance);
+    ~Solid() override;
+
+    NodeType getNodeType() const override { return NODE_TYPE; }
+    void accept(SceneNodeVisitor& visitor) override;
+
+    const SharedPtr<Mesh>& getMesh() const { return m_mesh; }
+    void setMesh(const SharedPtr<Mesh>& mesh);
+    const SharedPtr<Appearance>& getAppearance() const { return m_appearance; }
+    void setAppearance(const SharedPtr<Appearance>& appearance);
+
+    int getJointsPerVertex() const { return m_jointsPerVertex; }
+    /// @param count  0 to 4; larger is clamped with a warning, negative counts as 0.
+    void setJointsPerVertex(int count);
+
+    /// The transform of the mesh into the space in which the joints were bound; identity at first.
+    const Matrix4f& getBindShapeTransform() const { return m_bindShapeTransform; }
+    void setBindShapeTransform(const Matrix4f& transform) { m_bindShapeTransform = transform; }
+
+    /// Adds the next joint (index 0 first, as the vertices' joint numbers count).
+    /// @param joint  shared, or borrowed if it is this node or above it; empty leaves the joint unbound.
+    /// @param inverseBind  inverse of the joint's world transform in the pose of binding.
+    /// One error is logged when the count first exceeds MAX_JOINTS.
+    void attachJoint(const SharedPtr<SceneNode>& joint, const Matrix4f& inverseBind);
+    int getJointCount() const { return static_cast<int>(m_joints.size()); }
+    /// @param i  0 to getJointCount() - 1.
+    const JointAttachment& getJoint(int i) const { return m_joints[static_cast<size_t>(i)]; }
+
+    /// Mesh space to world space for one joint: its world transform * inverse bind * bind shape. An unbound
+    /// joint is in its rest pose: this solid's world transform * bind shape.
+    Matrix4f calculateJointTransform(const JointAttachment& attachment) const;
+    Matrix4f getJointTransform(int i) const { return calculateJointTransform(getJoint(i)); }
+
+    /// Draws the mesh with the solid's own appearance; nothing without one. GL thread only.
+    void draw(RenderContext& context);
+
+    /// Enables the appearance and draws the mesh. The winding sent is the appearance's, turned when the
+    /// world transform is mirrored, so that front faces stay front faces.
+    /// An appearance without a program draws with the program that is current; with none current, nothing is
+    /// drawn. GL thread only.
+    void draw(RenderContext& context, Appearance& appearance);
+
+private:
+    SharedPtr<Mesh> m_mesh;
+    SharedPtr<Appearance> m_appearance;
+    int m_jointsPerVertex = 0;
+    Matrix4f m_bindShapeTransform = Matrix4f::IDENTITY;
+    std::vector<JointAttachment> m_joints;
+};
+
+} // namespace orv

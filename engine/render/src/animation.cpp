@@ -1,0 +1,186 @@
+#include "orv/animation.h"
+
+#include "orv/animationcontroller.h"
+#include "orv/log.h"
+
+#include <algorithm>
+#include <cmath>
+
+// Whatever moves along an animation's time line is here; users find loopSize's assertion under this name.
+
+namespace orv
+{
+
+namespace
+{
+
+/// As many whole loops as are taken off one by one; farther away the remainder is calculated at once, so that
+/// a tiny loop or a huge step does not hold up the frame.
+constexpr int MAX_SINGLE_LOOPS = 16;
+
+/// @param next  at or after loopEnd.
+/// @return the same moment of the loop, in [loopStart, loopEnd).
+float wrapForwards(double next, float loopStart, float loopEnd)
+{
+    const double size = double(loopEnd) - double(loopStart);
+    const float wrapped = float(loopStart + std::fmod(next - loopStart, size));
+    return wrapped < loopEnd ? wrapped : loopStart;
+}
+
+/// @param next  at or before loopStart.
+/// @return the same moment of the loop, in (loopStart, loopEnd].
+float wrapBackwards(double next, float loopStart, float loopEnd)
+{
+    const double size = double(loopEnd) - double(loopStart);
+    const float wrapped = float(loopEnd - std::fmod(loopEnd - next, size));
+    return wrapped > loopStart ? wrapped : loopEnd;
+}
+
+} // namespace
+
+float getLength(const Animation& animation)
+{
+    return std::max(animation.getEnd() - animation.getStart(), 0.0f);
+}
+
+AnimationController::AnimationController(const Animation::Ptr& animation)
+    : m_start(animation ? animation->getStart() : 0.0f)
+    , m_end(animation ? animation->getEnd() : 0.0f)
+    , m_animation(animation)
+{
+}
+
+void AnimationController::update(float deltaTime)
+{
+    if (!m_enabled)
+        return;
+    m_progress = clampToRange(m_progress);
+    const float step = deltaTime * m_speed;
+    if (!m_paused && std::isfinite(step))
+        m_progress = clampToRange(advance(step));
+    if (m_animation)
+        m_animation->apply(m_progress);
+}
+
+float AnimationController::clampToRange(float progress) const
+{
+    if (!(progress > m_start)) // also what is not a number
+        return m_start;
+    return m_end <= progress ? m_end : progress;
+}
+
+/// @return where a finite step leads from the current progress, not yet clamped.
+float AnimationController::advance(float step) const
+{
+    float next = m_progress + step;
+    if (!m_looping || !(m_loopStart < m_loopEnd))
+        return next;
+
+    const float loopSize = m_loopEnd - m_loopStart;
+    ORV_ASSERT(loopSize > 0.0f);
+    if (!(loopSize > 0.0f) || !std::isfinite(loopSize))
+        return next;
+
+    if (step > 0.0f && m_progress <= m_loopEnd)
+    {
+        for (int i = 0; i < MAX_SINGLE_LOOPS && next >= m_loopEnd; ++i)
+            next -= loopSize;
+        if (next >= m_loopEnd)
+            next = wrapForwards(double(m_progress) + double(step), m_loopStart, m_loopEnd);
+    }
+    else if (step < 0.0f && m_progress >= m_loopStart)
+    {
+        for (int i = 0; i < MAX_SINGLE_LOOPS && next <= m_loopStart; ++i)
+            next += loopSize;
+        if (next <= m_loopStart)
+            next = wrapBackwards(double(m_progress) + double(step), m_loopStart, m_loopEnd);
+    }
+    return next;
+}
+
+void play(AnimationController& controller, bool update)
+{
+    controller.setEnabled(true);
+    controller.setPaused(false);
+    if (isFinished(controller))
+        rewind(controller, update);
+    else if (update)
+        controller.update(0.0f);
+}
+
+void pause(AnimationController& controller, bool update)
+{
+    controller.setPaused(true);
+    if (update)
+        controller.update(0.0f);
+}
+
+void stop(AnimationController& controller, bool update)
+{
+    controller.setEnabled(true);
+    rewind(controller, update);
+    controller.setEnabled(false);
+}
+
+void rewind(AnimationController& controller, bool update)
+{
+    if (controller.getSpeed() > 0.0f)
+        controller.setProgress(controller.getStart());
+    else if (controller.getSpeed() < 0.0f)
+        controller.setProgress(controller.getEnd());
+    if (update)
+        controller.update(0.0f);
+}
+
+void seek(AnimationController& controller, float progress)
+{
+    controller.setProgress(progress);
+    controller.update(0.0f);
+}
+
+void setRange(AnimationController& controller, float start, float end)
+{
+    controller.setStart(start);
+    controller.setEnd(end);
+}
+
+void setLoopRange(AnimationController& controller, float start, float end)
+{
+    controller.setLoopStart(start);
+    controller.setLoopEnd(end);
+}
+
+float getLength(const AnimationController& controller)
+{
+    return std::max(controller.getEnd() - controller.getStart(), 0.0f);
+}
+
+float getLoopLength(const AnimationController& controller)
+{
+    return std::max(controller.getLoopEnd() - controller.getLoopStart(), 0.0f);
+}
+
+bool hasLoop(const AnimationController& controller)
+{
+    return controller.getLoopStart() < controller.getLoopEnd();
+}
+
+bool isInsideLoop(const AnimationController& controller)
+{
+    return hasLoop(controller) && controller.isLooping() &&
+           controller.getLoopStart() <= controller.getProgress() &&
+           controller.getProgress() <= controller.getLoopEnd();
+}
+
+bool isFinished(const AnimationController& controller)
+{
+    if (isInsideLoop(controller))
+        return false;
+    if (controller.getSpeed() > 0.0f)
+        return controller.getProgress() >= controller.getEnd();
+    if (controller.getSpeed() < 0.0f)
+        return controller.getProgress() <= controller.getStart();
+    return false;
+}
+
+} // namespace orv

@@ -1,0 +1,56 @@
+#include "orv/animationgroup.h"
+
+#include "orv/log.h"
+
+#include <algorithm>
+
+namespace orv
+{
+
+void AnimationGroup::addAnimation(const Animation::Ptr& animation)
+{
+    if (!animation)
+    {
+        ORV_LOG_ERROR("Cannot add an empty animation to a group.");
+        return;
+    }
+    m_animations.push_back(animation);
+}
+
+Animation::Ptr AnimationGroup::getAnimation(int index) const
+{
+    if (index >= getAnimationCount())
+    {
+        ORV_LOG_ERROR("Index %d exceeds animation count %d.", index, getAnimationCount());
+        return nullptr;
+    }
+    return m_animations[static_cast<size_t>(index)];
+}
+
+void AnimationGroup::apply(float progress)
+{
+    for (const Animation::Ptr& animation : m_animations)
+        animation->apply(progress);
+}
+
+float AnimationGroup::getStart() const
+{
+    if (m_animations.empty())
+        return 0.0f;
+    float start = m_animations.front()->getStart();
+    for (const Animation::Ptr& animation : m_animations)
+        start = std::min(start, animation->getStart());
+    return start;
+}
+
+float AnimationGroup::getEnd() const
+{
+    if (m_animations.empty())
+        return 0.0f;
+    float end = m_animations.front()->getEnd();
+    for (const Animation::Ptr& animation : m_animations)
+        end = std::max(end, animation->getEnd());
+    return end;
+}
+
+} // namespace orv

@@ -1,0 +1,28 @@
+#include "orv/background.h"
+
+#include "orv/rendercontext.h"
+
+namespace orv
+{
+
+void Background::setColourMask(bool red, bool green, bool blue, bool alpha)
+{
+    m_colourMask[0] = red;
+    m_colourMask[1] = green;
+    m_colourMask[2] = blue;
+    m_colourMask[3] = alpha;
+}
+
+void Background::enable(RenderContext& context) const
+{
+    context.setColourMask(m_colourMask[0], m_colourMask[1], m_colourMask[2], m_colourMask[3]);
+    context.setDepthWriteEnabled(m_depthMask);
+    orv::setStencilMask(context, m_stencilMask);
+    context.setClearDepth(m_depth);
+    context.setClearStencil(m_stencil);
+    context.setClearColour(m_colour);
+    context.setScissorTestEnabled(false);
+    context.clear();
+}
+
+} // namespace orv

@@ -1,0 +1,288 @@
+#include "globuilder.h"
+
+#include "glolog.h"
+
+#include "orv/animationchannel.h"
+#include "orv/animationgroup.h"
+#include "orv/animationkeysequence.h"
+#include "orv/light.h"
+#include "orv/sceneanimators.h"
+
+#include <cmath>
+#include <cstring>
+
+namespace orv::detail
+{
+
+using namespace glo;
+
+namespace
+{
+
+/// Coefficients that a value of the type can be made of, and the value.
+template <class T>
+struct KeyValue;
+
+template <>
+struct KeyValue<float>
+{
+    static constexpr uint32_t FEWEST = 1;
+    static constexpr uint32_t MOST = 1;
+    static float make(const float* c) { return c[0]; }
+};
+
+template <>
+struct KeyValue<Vector3f>
+{
+    static constexpr uint32_t FEWEST = 3;
+    static constexpr uint32_t MOST = 3;
+    static Vector3f make(const float* c) { return Vector3f(c[0], c[1], c[2]); }
+};
+
+/// An axis and an angle.
+template <>
+struct KeyValue<Vector4f>
+{
+    static constexpr uint32_t FEWEST = 4;
+    static constexpr uint32_t MOST = 4;
+    static Vector4f make(const float* c) { return Vector4f(c[0], c[1], c[2], c[3]); }
+};
+
+/// A colour may lack its opacity.
+template <>
+struct KeyValue<Colour4f>
+{
+    static constexpr uint32_t FEWEST = 3;
+    static constexpr uint32_t MOST = 4;
+    static Colour4f make(const float* c) { return Colour4f(c[0], c[1], c[2], c[3]); }
+};
+
+float readFloat(const uint8_t* bytes)
+{
+    const uint32_t word =
+        uint32_t(bytes[0]) | uint32_t(bytes[1]) << 8 | uint32_t(bytes[2]) << 16 | uint32_t(bytes[3]) << 24;
+    float value;
+    std::memcpy(&value, &word, sizeof(value));
+    return value;
+}
+
+/// Integers count as the numbers that they are.
+float readCoefficient(const uint8_t* bytes, uint32_t type)
+{
+    switch (type)
+    {
+    case type::INT8: return float(int8_t(bytes[0]));
+    case type::UINT8: return float(bytes[0]);
+    case type::INT16: return float(int16_t(bytes[0] | bytes[1] << 8));
+    case type::UINT16: return float(bytes[0] | bytes[1] << 8);
+    default: return readFloat(bytes);
+    }
+}
+
+template <class T>
+bool readKeys(const Channel& channel, const char* fileName, std::vector<AnimationKey<T>>& keys)
+{
+    const char* property = channel.property.c_str();
+    const char* target = channel.targetName.c_str();
+    if (channel.coefficientCount < KeyValue<T>::FEWEST || channel.coefficientCount > KeyValue<T>::MOST)
+    {
+        ORV_GLO_ERROR("\"%s\" of \"%s\" has %u coefficients per key in %s; wanted are %u", property, target,
+                      channel.coefficientCount, fileName, KeyValue<T>::MOST);
+        return false;
+    }
+    const uint32_t size = type::SIZES[channel.type];
+    if (channel.type > type::FLOAT)
+    {
+        ORV_GLO_ERROR("\"%s\" of \"%s\" has keys of the type %u in %s, which have no meaning", property,
+                      target, channel.type, fileName);
+        return false;
+    }
+    const uint8_t* bytes = channel.keys.data();
+    for (uint32_t i = 0; i < channel.keyCount; ++i)
+    {
+        const float time = readFloat(bytes);
+        bytes += 4;
+        float coefficients[4] = {0.0f, 0.0f, 0.0f, 1.0f};
+        for (uint32_t c = 0; c < channel.coefficientCount; ++c, bytes += size)
+            coefficients[c] = readCoefficient(bytes, channel.type);
+        if (std::isnan(time))
+        {
+            ORV_GLO_ERROR("\"%s\" of \"%s\" has a key whose time is not a number in %s", property, target,
+                          fileName);
+            return false;
+        }
+        keys.push_back({time, KeyValue<T>::make(coefficients)});
+    }
+    return true;
+}
+
+template <class T>
+SharedPtr<AnimatedValue<T>> makeValue(const Channel& channel, const char* fileName)
+{
+    std::vector<AnimationKey<T>> keys;
+    if (!readKeys(channel, fileName, keys))
+        return {};
+    return makeShared<AnimationKeySequence<T>>(std::move(keys)); // sorts them
+}
+
+template <class T, class SomeAnimator>
+bool addChannel(const Channel& channel, const char* fileName, const SharedPtr<SomeAnimator>& animator,
+                AnimationGroup& group)
+{
+    const SharedPtr<AnimatedValue<T>> value = makeValue<T>(channel, fileName);
+    if (!value)
+        return false;
+    group.addAnimation(createAnimationChannel<T>(value, animator));
+    return true;
+}
+
+template <class T>
+bool addMaterialChannels(const std::vector<AnimationKey<T>>& keys, const char* property,
+                         GloMaterial& material, AnimationGroup& group)
+{
+    for (const AnimationKey<T>& key : keys)
+        material.reach(property, key.value);
+    const SharedPtr<AnimatedValue<T>> value = makeShared<AnimationKeySequence<T>>(keys);
+    material.forEachAppearance(
+        [&](const SharedPtr<Appearance>& appearance)
+        {
+            const auto animator = makeShared<AppearancePropertyAnimator<T>>(appearance, property);
+            group.addAnimation(createAnimationChannel<T>(value, animator));
+        });
+    return true;
+}
+
+struct MaterialProperty
+{
+    const char* name;
+    const char* property;
+    bool isColour;
+};
+
+constexpr MaterialProperty MATERIAL_PROPERTIES[] = {
+    {"ambient", "M_AMBIENT_COLOUR", true},
+    {"diffuse", "M_DIFFUSE_COLOUR", true},
+    {"specular", "M_SPECULAR_COLOUR", true},
+    {"emission", "M_EMISSIVE_COLOUR", true},
+    {"self_illumination", "M_SELF_ILLUMINATION", false},
+    {"specular_level", "M_SPECULAR_LEVEL", false},
+    {"shininess", "M_SHININESS", false},
+    {"opacity", "M_OPACITY", false},
+};
+
+const MaterialProperty* findMaterialProperty(const std::string& name)
+{
+    for (const MaterialProperty& known : MATERIAL_PROPERTIES)
+    {
+        if (name == known.name)
+            return &known;
+    }
+    return nullptr;
+}
+
+bool isOneOf(const std::string& text, std::initializer_list<const char*> texts)
+{
+    for (const char* known : texts)
+    {
+        if (text == known)
+            return true;
+    }
+    return false;
+}
+
+} // namespace
+
+bool GloBuilder::makeAnimation(const AnimationData& data, AnimationGroup& group)
+{
+    if (!data.loopRanges.empty())
+    {
+        m_glo->m_loopBegin = data.loopRanges.back().begin;
+        m_glo->m_loopEnd = data.loopRanges.back().end;
+    }
+    for (const Channel& channel : data.channels)
+    {
+        if (!makeChannel(channel, group))
+            return false;
+    }
+    for (const AnimationData& inner : data.animations)
+    {
+        const SharedPtr<AnimationGroup> innerGroup = makeShared<AnimationGroup>();
+        if (!makeAnimation(inner, *innerGroup))
+            return false;
+        group.addAnimation(innerGroup);
+    }
+    return true;
+}
+
+bool GloBuilder::makeChannel(const Channel& channel, AnimationGroup& group)
+{
+    const std::string& name = channel.targetName;
+    const std::string target = name.compare(0, 5, "node-") == 0 ? name.substr(5) : name;
+    const std::string& property = channel.property;
+    if (channel.targetType == "node" && isOneOf(property, {"translation", "rotation", "scale"}))
+        return makeNodeChannel(channel, target, group);
+    if (channel.targetType == "light" && isOneOf(property, {"colour", "multiplier"}))
+        return makeLightChannel(channel, target, group);
+    if (channel.targetType == "material" && findMaterialProperty(property))
+        return makeMaterialChannel(channel, target, group);
+    ORV_GLO_WARN("Ignoring unknown property in %s", m_name);
+    return true;
+}
+
+bool GloBuilder::makeNodeChannel(const Channel& channel, const std::string& target, AnimationGroup& group)
+{
+    const auto found = m_nodes.lower_bound(target); // the first of that name
+    if (found == m_nodes.end() || found->first != target)
+        return fail("Animation node not present in %s");
+    const SharedPtr<SceneNode>& node = found->second;
+    if (channel.property == "translation")
+        return addChannel<Vector3f>(channel, m_name, makeShared<SceneNodePositionAnimator>(node), group);
+    if (channel.property == "rotation")
+        return addChannel<Vector4f>(channel, m_name, makeShared<SceneNodeRotationAnimator>(node), group);
+    return addChannel<Vector3f>(channel, m_name, makeShared<SceneNodeScaleAnimator>(node), group);
+}
+
+/// The target is the definition: every light made from it gets the channel.
+bool GloBuilder::makeLightChannel(const Channel& channel, const std::string& target, AnimationGroup& group)
+{
+    bool known = false;
+    for (const LightDefinition& definition : m_scene.lights)
+        known = known || definition.name == target;
+    if (!known)
+        return fail("No light for animation in %s");
+    for (const auto& light : m_glo->m_lights)
+    {
+        if (light.definition != target)
+            continue;
+        const bool added =
+            channel.property == "colour"
+                ? addChannel<Colour4f>(channel, m_name, makeShared<LightColourAnimator>(light.node), group)
+                : addChannel<float>(channel, m_name, makeShared<LightIntensityAnimator>(light.node), group);
+        if (!added)
+            return false;
+    }
+    return true;
+}
+
+bool GloBuilder::makeMaterialChannel(const Channel& channel, const std::string& target, AnimationGroup& group)
+{
+    const auto found = m_materials.find(target);
+    if (found == m_materials.end())
+        return fail("No appearance material for animation in %s");
+    const MaterialProperty& property = *findMaterialProperty(channel.property);
+    if (!property.isColour)
+    {
+        std::vector<AnimationKey<float>> keys;
+        return readKeys(channel, m_name, keys) &&
+               addMaterialChannels(keys, property.property, found->second, group);
+    }
+    std::vector<AnimationKey<Colour4f>> colours;
+    if (!readKeys(channel, m_name, colours))
+        return false;
+    std::vector<AnimationKey<Vector4f>> keys;
+    for (const AnimationKey<Colour4f>& key : colours)
+        keys.push_back({key.time, Vector4f(key.value.r, key.value.g, key.value.b, key.value.a)});
+    return addMaterialChannels(keys, property.property, found->second, group);
+}
+
+} // namespace orv::detail

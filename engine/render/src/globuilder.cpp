@@ -1,0 +1,339 @@
+#include "globuilder.h"
+
+#include "glolog.h"
+
+#include "orv/animationgroup.h"
+#include "orv/appearance.h"
+#include "orv/assetcachepool.h"
+#include "orv/camera.h"
+#include "orv/light.h"
+#include "orv/mesh.h"
+#include "orv/shaderprogramcache.h"
+
+#include <algorithm>
+
+namespace orv::detail
+{
+
+using namespace glo;
+
+namespace
+{
+
+/// The first record of that name.
+template <class Record>
+const Record* findRecord(const std::vector<Record>& records, const std::string& name)
+{
+    const auto found = std::find_if(records.begin(), records.end(),
+                                    [&name](const Record& record) { return record.name == name; });
+    return found != records.end() ? &*found : nullptr;
+}
+
+} // namespace
+
+GloBuilder::GloBuilder(AssetCachePool& pool, GloScene& scene, FileVersion version, AuthoringTool tool,
+                       const char* name)
+    : m_pool(pool)
+    , m_scene(scene)
+    , m_version(version)
+    , m_tool(tool)
+    , m_name(name)
+    , m_glo(new Glo)
+{
+}
+
+GloBuilder::~GloBuilder() = default;
+
+SharedPtr<Glo> GloBuilder::build(const SharedPtr<SceneNode>& parent)
+{
+    if (m_scene.scene && m_scene.upAxis > uint32_t(UpAxis::Z))
+    {
+        fail("Unrecognized up-axis option in %s");
+        return {};
+    }
+    if (!makeGeometries())
+        return {};
+    makeMaterials();
+
+    SharedPtr<SceneNode> top;
+    if (m_scene.scene)
+    {
+        top = makeNode(m_scene.scene->top, {});
+        if (!top)
+            return {};
+    }
+    m_glo->m_animationGroup = makeShared<AnimationGroup>();
+    for (const AnimationData& animation : m_scene.animations)
+    {
+        const SharedPtr<AnimationGroup> group = makeShared<AnimationGroup>();
+        if (!makeAnimation(animation, *group))
+            return {};
+        m_glo->m_animations.push_back({animation.name, group});
+        m_glo->m_animationGroup->addAnimation(group);
+    }
+    for (const SkinnedSolids& skinned : m_skinnedSolids)
+        linkSkin(skinned);
+    for (auto& [name, material] : m_materials)
+    {
+        material.choosePrograms();
+        m_glo->m_appearances[name] = material.getAppearance();
+    }
+
+    if (top)
+    {
+        // Coming under a parent rebuilds the local matrix from its components.
+        const Matrix4f transform = top->getLocalTransform();
+        top->setParent(parent, false);
+        top->setLocalTransform(transform);
+    }
+    m_glo->m_topNode = top;
+    m_glo->m_fileVersion = Version(m_version.first, m_version.second, m_version.third, nullptr);
+    return m_glo;
+}
+
+bool GloBuilder::fail(const char* format) const
+{
+    ORV_GLO_ERROR(format, m_name);
+    return false;
+}
+
+bool GloBuilder::failUnknown(const char* kind, const std::string& name) const
+{
+    ORV_GLO_ERROR("There is no %s \"%s\" in %s", kind, name.c_str(), m_name);
+    return false;
+}
+
+bool GloBuilder::makeGeometries()
+{
+    for (Geometry& geometry : m_scene.geometries)
+    {
+        GloGeometry made;
+        if (!makeGeometry(m_pool, geometry, m_version, m_name, made))
+            return false;
+        m_geometries.emplace(geometry.name, std::move(made));
+    }
+    return true;
+}
+
+void GloBuilder::makeMaterials()
+{
+    for (const Material& material : m_scene.materials)
+    {
+        if (!material.techniques.empty())
+            m_materials.insert_or_assign(material.name, GloMaterial(m_pool, m_version, m_tool, material.name,
+                                                                    material.techniques.back()));
+    }
+}
+
+/// @return empty on failure, with nothing left under parent.
+SharedPtr<SceneNode> GloBuilder::makeNode(const NodeData& data, const SharedPtr<SceneNode>& parent)
+{
+    Objects objects;
+    if (!makeObjects(data, objects))
+        return {};
+    if (objects.empty())
+        objects.push_back(makeShared<SceneNode>());
+
+    const SharedPtr<SceneNode> node = objects.front();
+    node->setName(data.name.c_str());
+    m_nodes.emplace(data.name, node);
+    m_scopedNodes.emplace(data.scopedName, node);
+    if (parent)
+        node->setParent(parent, false);
+    setTransform(*node, data, !parent);
+    for (size_t i = 1; i < objects.size(); ++i)
+        objects[i]->setParent(node, false);
+    for (const NodeData& child : data.children)
+    {
+        if (!makeNode(child, node))
+            return {};
+    }
+    return node;
+}
+
+void GloBuilder::setTransform(SceneNode& node, const NodeData& data, bool top) const
+{
+    node.setPosition(data.translation);
+    node.setRotation(quaternionFromAxisAngle(Vector3f(data.rotation.x, data.rotation.y, data.rotation.z),
+                                             Anglef::fromRadians(data.rotation.w)));
+    node.setScale(data.scale);
+    if (hasNodeTransform(m_version))
+        node.setLocalTransform(data.transform);
+    if (!top)
+        return;
+
+    const Anglef quarter = Anglef::fromRadians(1.5707964f);
+    if (m_scene.upAxis == uint32_t(UpAxis::X))
+        node.setRotation(quaternionFromAxisAngle(Vector3f(0.0f, 0.0f, 1.0f), quarter));
+    else if (m_scene.upAxis == uint32_t(UpAxis::Z))
+        node.setRotation(quaternionFromAxisAngle(Vector3f(1.0f, 0.0f, 0.0f), -quarter));
+}
+
+/// What the filled reference slots stand for: the first is to be the node, the others its children.
+bool GloBuilder::makeObjects(const NodeData& data, Objects& objects)
+{
+    std::vector<SharedPtr<Solid>> solids;
+    if (data.geometry && !makeSolids(data.geometry->geometry, data.geometry->materials, false, solids))
+        return false;
+    if (data.skin && !makeSkinnedSolids(*data.skin, solids))
+        return false;
+    objects.assign(solids.begin(), solids.end());
+    if (data.light && !makeLight(*data.light, objects))
+        return false;
+    return !data.camera || makeCamera(*data.camera, objects);
+}
+
+bool GloBuilder::makeSolids(const std::string& geometry, const std::vector<std::string>& materials,
+                            bool skinned, std::vector<SharedPtr<Solid>>& solids)
+{
+    const auto found = m_geometries.find(geometry);
+    if (found == m_geometries.end())
+        return failUnknown("geometry", geometry);
+    bool missing = false;
+    const std::vector<SharedPtr<Mesh>>& meshes = found->second.meshes;
+    for (size_t i = 0; i < meshes.size(); ++i)
+        solids.push_back(makeShared<Solid>(meshes[i], findAppearance(materials, i, skinned, missing)));
+    if (missing)
+        ORV_GLO_WARN("Geometry has no material; using default appearance.");
+    return true;
+}
+
+SharedPtr<Appearance> GloBuilder::findAppearance(const std::vector<std::string>& materials, size_t index,
+                                                 bool skinned, bool& missing)
+{
+    const auto found = index < materials.size() ? m_materials.find(materials[index]) : m_materials.end();
+    if (found != m_materials.end())
+        return found->second.use(skinned);
+    missing = true;
+    return getDefaultAppearance(skinned);
+}
+
+SharedPtr<Appearance> GloBuilder::getDefaultAppearance(bool skinned)
+{
+    SharedPtr<Appearance>& appearance = m_defaultAppearances[skinned ? 1 : 0];
+    if (appearance)
+        return appearance;
+    appearance = loadAppearance(m_pool, "orv#default_pvl.ap");
+    if (!appearance || !appearance->getShaderProgram())
+        ORV_GLO_ERROR("%s", "ORV_ASSERT: appearance");
+    if (appearance && skinned)
+        appearance->setShaderProgram(
+            m_pool.getShaderProgramCache()->get("orv#max_pvl.sp$DIFF$SPEC$AMBI$EMIS$SKIN"));
+    return appearance;
+}
+
+bool GloBuilder::makeSkinnedSolids(const SkinReference& reference, std::vector<SharedPtr<Solid>>& solids)
+{
+    const Skin* skin = findRecord(m_scene.skins, reference.skin);
+    if (!skin)
+        return failUnknown("skin", reference.skin);
+    SkinnedSolids skinned{skin, &reference, {}};
+    if (!makeSolids(skin->geometry, reference.materials, true, skinned.solids))
+        return false;
+    if (size_t(m_geometries.find(skin->geometry)->second.jointCount) > skin->attachments.size())
+        ORV_GLO_WARN("Geometry \"%s\" names joints that skin \"%s\" lacks in %s; the last one moves them",
+                     skin->geometry.c_str(), skin->name.c_str(), m_name);
+    for (const SharedPtr<Solid>& solid : skinned.solids)
+    {
+        solid->setJointsPerVertex(skin->jointsPerVertex);
+        solid->setBindShapeTransform(skin->bindShape);
+        solids.push_back(solid);
+    }
+    m_skinnedSolids.push_back(std::move(skinned));
+    return true;
+}
+
+void GloBuilder::linkSkin(const SkinnedSolids& skinned) const
+{
+    for (const Attachment& attachment : skinned.skin->attachments)
+    {
+        const SharedPtr<SceneNode> joint = findJoint(attachment.joint, *skinned.reference);
+        if (!joint)
+            ORV_GLO_ERROR("Joint node \"%s\" not found.", attachment.joint.c_str());
+        for (const SharedPtr<Solid>& solid : skinned.solids)
+            solid->attachJoint(joint, attachment.inverseBindPose);
+    }
+}
+
+/// By scoped name, then by name; of several nodes, the first below one of the reference's skeletons, since two
+/// figures of the same build have the same joint names.
+SharedPtr<SceneNode> GloBuilder::findJoint(const std::string& name, const SkinReference& reference) const
+{
+    for (const NodesByName* nodes : {&m_scopedNodes, &m_nodes})
+    {
+        const auto [begin, end] = nodes->equal_range(name);
+        for (auto node = begin; node != end; ++node)
+        {
+            for (const std::string& skeleton : reference.skeletons)
+            {
+                const auto root = m_nodes.find(skeleton);
+                if (root != m_nodes.end() && node->second->hasAncestor(root->second.get()))
+                    return node->second;
+            }
+        }
+        if (begin != end)
+            return begin->second;
+    }
+    return {};
+}
+
+bool GloBuilder::makeLight(const LightReference& reference, Objects& objects)
+{
+    const LightDefinition* definition = findRecord(m_scene.lights, reference.light);
+    if (!definition)
+        return failUnknown("light", reference.light);
+    if (definition->type > light::SPOT)
+    {
+        ORV_GLO_ERROR("Light \"%s\" has the unknown type %u in %s", definition->name.c_str(),
+                      definition->type, m_name);
+        return false;
+    }
+    constexpr Light::LightType TYPES[] = {Light::LightType::POINT, Light::LightType::POINT,
+                                          Light::LightType::DIRECTIONAL, Light::LightType::SPOT};
+    if (definition->type == light::AMBIENT)
+        ORV_GLO_WARN("Ambient light type not supported; defaulting to point light.");
+
+    const SharedPtr<Light> made = makeShared<Light>();
+    made->setLightName(definition->name.c_str());
+    made->setLightType(TYPES[definition->type]);
+    made->setColour(Colour4f(definition->colour.x, definition->colour.y, definition->colour.z, 1.0f));
+    made->setIntensity(definition->intensity);
+    made->setAttenuated(definition->attenuated != 0);
+    made->setAttenuationNear(definition->attenuationNear);
+    made->setAttenuationFar(definition->attenuationFar);
+    made->setSpotInnerAngle(Anglef::fromRadians(definition->spotInner));
+    made->setSpotOuterAngle(Anglef::fromRadians(definition->spotOuter));
+    made->setAmbientLevel(m_tool == AuthoringTool::BLENDER ? 0.0f : 0.1f);
+    m_glo->m_lights.push_back({made, definition->name});
+    objects.push_back(made);
+    return true;
+}
+
+bool GloBuilder::makeCamera(const CameraReference& reference, Objects& objects)
+{
+    const CameraDefinition* definition = findRecord(m_scene.cameras, reference.camera);
+    if (!definition)
+        return failUnknown("camera", reference.camera);
+    if (definition->projection > projection::PERSPECTIVE)
+    {
+        ORV_GLO_ERROR("Camera \"%s\" has the unknown projection %u in %s", definition->name.c_str(),
+                      definition->projection, m_name);
+        return false;
+    }
+    const SharedPtr<Camera> made = makeShared<Camera>();
+    made->setProjectionType(Camera::ProjectionType(definition->projection));
+    // What the projection does not use is passed on only if it differs from what the camera has: the camera warns.
+    const bool perspective = definition->projection == projection::PERSPECTIVE;
+    const Anglef fieldOfView = Anglef::fromRadians(definition->fieldOfView);
+    if (perspective || std::abs(fieldOfView.radians() - made->getFieldOfView().radians()) > 1e-6f)
+        made->setFieldOfView(fieldOfView);
+    if (!perspective || definition->width != made->getWidth())
+        made->setWidth(definition->width);
+    made->setNear(definition->nearDistance);
+    made->setFar(definition->farDistance);
+    m_glo->m_cameras.push_back({made, definition->name});
+    objects.push_back(made);
+    return true;
+}
+
+} // namespace orv::detail

@@ -1,0 +1,32 @@
+#pragma once
+
+#include "orv/detail/glorecords.h"
+#include "orv/sharedptr.h"
+
+#include <vector>
+
+namespace orv
+{
+
+class AssetCachePool;
+class Mesh;
+
+namespace detail
+{
+
+/// A geometry of a scene file in the GL: a mesh for each primitive set, over one vertex buffer.
+struct GloGeometry
+{
+    std::vector<SharedPtr<Mesh>> meshes;
+    int jointCount = 0; ///< one more than the highest joint that a vertex names
+};
+
+/// @param geometry  its vertex bytes are given up once the GL has them.
+/// @param fileName  for messages.
+/// @return false, after logging, if the GL would be led outside the vertices or cannot take them.
+bool makeGeometry(AssetCachePool& pool, glo::Geometry& geometry, glo::FileVersion version,
+                  const char* fileName, GloGeometry& made);
+
+} // namespace detail
+
+} // namespace orv

@@ -1,0 +1,88 @@
+#pragma once
+
+#include "orv/detail/glofields.h"
+#include "orv/stream.h"
+
+#include <map>
+#include <string>
+#include <vector>
+
+namespace orv::detail
+{
+
+/// Reads a scene file into plain records, checking every chunk against its size; makes nothing of them.
+///
+/// One per load. Every failure is logged once, where it was met, and ends the reading.
+class GloReader
+{
+public:
+    /// @param name  for messages.
+    GloReader(const SharedPtr<Stream>& stream, const char* name);
+
+    /// The whole file. @return false, after logging, with the scene in part read.
+    bool read();
+
+    glo::GloScene& scene() { return m_scene; }
+
+    // What glo::fields() asks for.
+    glo::FileVersion version() const { return m_version; }
+    bool acceptVersion(const std::string& text);
+    bool acceptTool(const std::string& text);
+    glo::AuthoringTool tool() const { return m_tool; }
+    bool u32(const char* label, uint32_t& value);
+    bool i32(const char* label, int32_t& value);
+    bool f32(const char* label, float& value);
+    bool floats(const char* label, float* values, int count);
+    bool text(const char* label, std::string& value);
+    bool bytes(glo::VertexData& data);
+    bool indices(glo::IndexData& data);
+    bool keys(glo::Channel& channel);
+    bool body(glo::GloScene& scene);
+    bool fail(const char* format) const;
+
+    template <class Fields>
+    bool block(const char* label, uint32_t size, Fields&& blockFields);
+    template <class Record>
+    bool chunk(Record& record);
+    template <class Optional>
+    bool optionalChunk(Optional& record);
+    template <class Record>
+    bool chunks(uint32_t count, std::vector<Record>& records, bool skipUnknown);
+    template <class Element, class Fields>
+    bool each(uint32_t count, std::vector<Element>& elements, Fields&& elementFields);
+
+private:
+    using ChunkReader = bool (GloReader::*)();
+
+    template <class Record>
+    void addChunkReader();
+    template <class Record>
+    bool readRecord();
+    template <auto LIST>
+    bool readList();
+    bool readInfo();
+    bool readScene();
+
+    bool readChunk(const uint32_t ids[], bool skipUnknown);
+    bool readChunk(uint32_t id, bool skipUnknown);
+    bool readListedChunk(uint32_t id, uint32_t size);
+    bool skipChunk(uint32_t id, uint32_t size);
+    bool readExactly(void* buffer, uint32_t size);
+    bool readField(const char* label, void* buffer, uint32_t size);
+    uint32_t position() const;
+    uint32_t remaining() const;
+    bool sizeMismatch(uint32_t id, uint32_t consumed, uint32_t size) const;
+
+    SharedPtr<Stream> m_stream;
+    std::string m_name;
+    std::map<uint32_t, ChunkReader> m_chunkReaders;
+    void* m_record = nullptr; ///< what the chunk about to be read is to fill; null once it is at it
+    bool m_ended = false;     ///< the stream had no further chunk
+    uint32_t m_chunkSize = 0;
+    int m_depth = 0;
+    glo::FileVersion m_version;
+    glo::AuthoringTool m_tool = glo::AuthoringTool::MAX;
+    glo::GloScene m_scene;
+};
+
+} // namespace orv::detail

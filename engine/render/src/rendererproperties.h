@@ -1,0 +1,90 @@
+#pragma once
+
+#include "orv/log.h"
+#include "orv/rendercontext.h"
+#include "orv/shaderuniform.h"
+#include "orv/sharedptr.h"
+
+#include <vector>
+
+namespace orv
+{
+
+class AssetCachePool;
+
+namespace detail
+{
+
+inline constexpr int MAX_LIGHTS = 5;
+
+/// The context's property of this name, made with every element at the initial value when there is none. One
+/// of another type or with fewer elements cannot serve (logged): what comes back is then in no context.
+template <class T>
+SharedPtr<ShaderUniform<T>> shareProperty(RenderContext& context, const char* name, int size,
+                                          const T& initial)
+{
+    const SharedPtr<ShaderUniformBase> held = context.getProperty(name);
+    if (held && held->holds<T>() && held->getSize() >= size)
+        return SharedPtr<ShaderUniform<T>>(static_cast<ShaderUniform<T>*>(held.get()));
+
+    const SharedPtr<ShaderUniform<T>> property = makeShared<ShaderUniform<T>>(size);
+    for (int i = 0; i < size; ++i)
+        property->set(initial, i);
+    if (held)
+        ORV_LOG_ERROR("Property \"%s\" of the context has another type or fewer than %d elements.", name,
+                      size);
+    else
+        context.addProperty(property, name);
+    return property;
+}
+
+/// The global properties that SimpleRenderer writes or provides; see there for their meaning.
+struct RendererProperties
+{
+    /// @param pool  may be null: texture properties stay null then.
+    RendererProperties(RenderContext& context, AssetCachePool* pool);
+
+    /// If no other renderer shares these properties, takes the textures that were there since construction
+    /// out of them, so that a context does not keep its pool's textures.
+    ~RendererProperties();
+    RendererProperties(const RendererProperties&) = delete;
+    RendererProperties& operator=(const RendererProperties&) = delete;
+
+    SharedPtr<ShaderUniform<int>> lightCount;
+    SharedPtr<ShaderUniform<Vector4f>> lightDiffuse;
+    SharedPtr<ShaderUniform<Vector4f>> lightAmbient;
+    SharedPtr<ShaderUniform<Vector4f>> lightSpecular;
+    SharedPtr<ShaderUniform<Vector4f>> lightPosition;
+    SharedPtr<ShaderUniform<float>> lightAttenuationNear;
+    SharedPtr<ShaderUniform<float>> lightAttenuationReciprocal;
+    SharedPtr<ShaderUniform<float>> lightSpotInnerCos;
+    SharedPtr<ShaderUniform<float>> lightSpotOuterCos;
+    SharedPtr<ShaderUniform<Vector3f>> lightSpotDirection;
+    SharedPtr<ShaderUniform<int>> jointCount;
+    SharedPtr<ShaderUniform<Matrix4f>> jointWorld;
+    SharedPtr<ShaderUniform<Matrix4f>> model;
+    SharedPtr<ShaderUniform<Matrix4f>> view;
+    SharedPtr<ShaderUniform<Matrix4f>> modelView;
+    SharedPtr<ShaderUniform<Matrix4f>> viewProjection;
+    SharedPtr<ShaderUniform<Matrix4f>> modelViewProjection;
+    SharedPtr<ShaderUniform<Matrix3f>> normalModel;
+    SharedPtr<ShaderUniform<Vector4f>> cameraPosition;
+    SharedPtr<ShaderUniform<float>> time;
+
+private:
+    using TextureProperty = ShaderUniform<SharedPtr<Texture2D>>;
+
+    struct HeldTexture
+    {
+        SharedPtr<TextureProperty> property;
+        SharedPtr<Texture2D> texture;
+    };
+
+    void provideTexture(RenderContext& context, AssetCachePool* pool, const char* name, const char* asset);
+
+    std::vector<HeldTexture> m_textures;
+    SharedPtr<ShaderUniform<int>> m_sharers; // no shader's: held by the context and by each renderer on it
+};
+
+} // namespace detail
+} // namespace orv

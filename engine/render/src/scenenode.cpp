@@ -1,0 +1,234 @@
+#include "orv/scenenode.h"
+
+#include "orv/log.h"
+#include "orv/scenenodevisitor.h"
+
+#include <algorithm>
+#include <utility>
+
+namespace orv
+{
+
+SceneNode::SceneNode(const char* name)
+{
+    setName(name);
+}
+
+SceneNode::~SceneNode()
+{
+    // Descendants that die with this node are gathered here and die one by one: a chain of nodes as long as
+    // a damaged or generated scene likes must not recurse through as many destructors.
+    std::vector<SharedPtr<SceneNode>> orphans = std::move(m_children);
+    for (const SharedPtr<SceneNode>& child : orphans)
+        child->onParentDestroyed();
+
+    while (!orphans.empty())
+    {
+        const SharedPtr<SceneNode> orphan = std::move(orphans.back());
+        orphans.pop_back();
+        SceneNode& node = *orphan.get();
+        if (node.sharedGetCount() > 1)
+            continue;
+        for (SharedPtr<SceneNode>& child : node.m_children)
+        {
+            child->onParentDestroyed();
+            orphans.push_back(std::move(child));
+        }
+        node.m_children.clear();
+    }
+}
+
+void SceneNode::accept(SceneNodeVisitor& visitor)
+{
+    visitor.visit(this);
+}
+
+void SceneNode::setName(const char* name)
+{
+    m_name = name ? name : "";
+}
+
+void SceneNode::setPosition(const Vector3f& position)
+{
+    if (position == m_position)
+        return;
+    setTransformChanged();
+    m_position = position;
+}
+
+void SceneNode::setRotation(const Quaternionf& rotation)
+{
+    if (rotation == m_rotation)
+        return;
+    setTransformChanged();
+    m_rotation = rotation;
+}
+
+void SceneNode::setScale(const Vector3f& scale)
+{
+    if (scale == m_scale)
+        return;
+    setTransformChanged();
+    m_scale = scale;
+}
+
+void SceneNode::setLocalTransform(const Matrix4f& transform)
+{
+    m_localTransform = transform;
+    m_localTransformChanged = false;
+    m_localMirrored = determinant(upper3x3(transform)) < 0.0f;
+    setWorldTransformChanged();
+}
+
+const Matrix4f& SceneNode::getLocalTransform() const
+{
+    updateLocal();
+    return m_localTransform;
+}
+
+bool SceneNode::getLocalMirrored() const
+{
+    updateLocal();
+    return m_localMirrored;
+}
+
+void SceneNode::setTransformChanged()
+{
+    m_localTransformChanged = true;
+    setWorldTransformChanged();
+}
+
+void SceneNode::setWorldTransformChanged()
+{
+    if (m_worldTransformChanged)
+        return;
+    m_worldTransformChanged = true;
+    for (const SharedPtr<SceneNode>& child : m_children)
+        child->setWorldTransformChanged();
+}
+
+void SceneNode::updateLocal() const
+{
+    if (!m_localTransformChanged)
+        return;
+
+    const Matrix3f rotation = toMatrix3(m_rotation);
+    m_localTransform = Matrix4f(Vector4f(rotation.columns[0] * m_scale.x, 0.0f),
+                                Vector4f(rotation.columns[1] * m_scale.y, 0.0f),
+                                Vector4f(rotation.columns[2] * m_scale.z, 0.0f), Vector4f(m_position, 1.0f));
+    m_localMirrored = (m_scale.x < 0.0f) != ((m_scale.y < 0.0f) != (m_scale.z < 0.0f));
+    m_localTransformChanged = false;
+}
+
+void SceneNode::updateAll(const Matrix4f& parentWorld, bool parentMirrored) const
+{
+    updateLocal();
+    m_worldTransform = parentWorld * m_localTransform;
+    m_worldMirrored = parentMirrored != m_localMirrored;
+    m_worldTransformChanged = false;
+}
+
+void SceneNode::update() const
+{
+    if (!m_worldTransformChanged)
+        return;
+    if (!m_parent)
+    {
+        updateAll(Matrix4f::IDENTITY, false);
+        return;
+    }
+    m_parent->update();
+    updateAll(m_parent->m_worldTransform, m_parent->m_worldMirrored);
+}
+
+void SceneNode::updateMotionData()
+{
+    update();
+    m_lastWorldTransform = m_worldTransform;
+}
+
+void SceneNode::setParent(const SharedPtr<SceneNode>& parent, bool preserveWorldTransform)
+{
+    if (parent && parent->hasAncestor(this))
+        return;
+
+    // The caller's pointer may lie in the child list that is about to change, and the old parent's share of
+    // this node may be the last one: both are held until the end.
+    const SharedPtr<SceneNode> newParent = parent;
+    SharedPtr<SceneNode> self;
+    const Matrix4f world = getWorldTransform();
+    if (m_parent)
+        self = m_parent->takeChild(this);
+    if (newParent)
+        newParent->m_children.push_back(SharedPtr<SceneNode>(this));
+    m_parent = newParent.get();
+
+    const Matrix4f toParent = newParent ? inverse(newParent->getWorldTransform()) : Matrix4f::IDENTITY;
+    // A parent squeezed flat has no inverse: then no local matrix keeps the node in place.
+    if (preserveWorldTransform && !(toParent == Matrix4f()))
+        setLocalTransform(toParent * world);
+    else
+        setTransformChanged();
+}
+
+void SceneNode::removeChild(const SharedPtr<SceneNode>& child)
+{
+    const SharedPtr<SceneNode> taken = takeChild(child.get());
+    if (taken)
+        taken->onParentDestroyed();
+}
+
+bool SceneNode::hasAncestor(const SceneNode* node) const
+{
+    const SceneNode* ancestor = this;
+    while (ancestor && ancestor != node)
+        ancestor = ancestor->m_parent;
+    return ancestor != nullptr;
+}
+
+void SceneNode::onParentDestroyed()
+{
+    m_parent = nullptr;
+    setWorldTransformChanged();
+}
+
+const SharedPtr<SceneNode>& SceneNode::getChild(unsigned int i) const
+{
+    static const SharedPtr<SceneNode> none;
+    ORV_ASSERT(i < m_children.size());
+    return i < m_children.size() ? m_children[i] : none;
+}
+
+SceneNode* SceneNode::find(const char* name)
+{
+    return const_cast<SceneNode*>(std::as_const(*this).find(name));
+}
+
+const SceneNode* SceneNode::find(const char* name) const
+{
+    if (!name)
+        return nullptr;
+    if (m_name == name)
+        return this;
+    for (const SharedPtr<SceneNode>& child : m_children)
+    {
+        if (const SceneNode* found = std::as_const(*child).find(name))
+            return found;
+    }
+    return nullptr;
+}
+
+/// @return the share that the child list held; empty when the node is no child of this one.
+SharedPtr<SceneNode> SceneNode::takeChild(const SceneNode* child)
+{
+    const auto found =
+        std::find_if(m_children.begin(), m_children.end(),
+                     [child](const SharedPtr<SceneNode>& held) { return held.get() == child; });
+    if (found == m_children.end())
+        return nullptr;
+    SharedPtr<SceneNode> taken = std::move(*found);
+    m_children.erase(found);
+    return taken;
+}
+
+} // namespace orv

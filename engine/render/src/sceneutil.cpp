@@ -1,0 +1,195 @@
+#include "orv/sceneutil.h"
+
+#include "orv/appearance.h"
+#include "orv/assetcachepool.h"
+#include "orv/meshutil.h"
+#include "orv/scenenode.h"
+#include "orv/scenenodevisitor.h"
+#include "orv/solid.h"
+
+#include <cmath>
+
+namespace orv
+{
+
+namespace
+{
+
+/// What the flag-restricted walk hands from a node to its children.
+struct WalkState
+{
+    uint32_t accumulated = 0; ///< the recursive flags met on the way down, in stored polarity
+    bool satisfied = false;   ///< whether the recursive condition held at the parent
+};
+
+/// What stays the same during one walk.
+struct Walk
+{
+    SceneNodeVisitor& visitor;
+    const FlagMask& renderFlags;
+    const FlagMask& recursiveFlags;
+    bool plainFlags; ///< no recursive flag is on by default: once the condition holds, it holds below
+};
+
+void visitRestricted(const Walk& walk, SceneNode& node, WalkState state)
+{
+    const FlagMask& render = walk.renderFlags;
+    const FlagMask& recursive = walk.recursiveFlags;
+    state.accumulated |= node.getFlags() & recursive.mask;
+    const bool nowSatisfied = ((recursive.inverted ^ state.accumulated) & recursive.mask) == recursive.mask;
+    const bool stop = nowSatisfied ? walk.plainFlags : state.satisfied;
+    state.satisfied = nowSatisfied;
+    if (stop && nowSatisfied)
+    {
+        visitScene(walk.visitor, node);
+        return;
+    }
+
+    const uint32_t flags = (node.getFlags() | state.accumulated) ^ render.inverted;
+    if ((flags & render.mask) == render.mask)
+        node.accept(walk.visitor);
+    if (stop)
+        return; // the condition was lost here and cannot come back further down
+    for (const SharedPtr<SceneNode>& child : node.getChildren())
+        visitRestricted(walk, *child, state);
+}
+
+class AppearanceSetter : public SceneNodeVisitor
+{
+public:
+    explicit AppearanceSetter(const SharedPtr<Appearance>& appearance) : m_appearance(appearance) {}
+
+    using SceneNodeVisitor::visit;
+    void visit(Solid* solid) override { solid->setAppearance(m_appearance); }
+
+private:
+    const SharedPtr<Appearance>& m_appearance;
+};
+
+class ShaderProgramSetter : public SceneNodeVisitor
+{
+public:
+    explicit ShaderProgramSetter(const SharedPtr<ShaderProgram>& program) : m_program(program) {}
+
+    using SceneNodeVisitor::visit;
+    void visit(Solid* solid) override
+    {
+        if (solid->getAppearance())
+            solid->getAppearance()->setShaderProgram(m_program);
+    }
+
+private:
+    const SharedPtr<ShaderProgram>& m_program;
+};
+
+SharedPtr<Solid> makeSolid(AssetCachePool& pool, const SharedPtr<Mesh>& mesh)
+{
+    if (!mesh)
+        return nullptr;
+    return makeShared<Solid>(mesh, loadAppearance(pool, "orv#default_pvl.ap"));
+}
+
+/// @param m  a pure rotation.
+Quaternionf toQuaternion(const Matrix3f& m)
+{
+    const Vector3f& x = m.columns[0];
+    const Vector3f& y = m.columns[1];
+    const Vector3f& z = m.columns[2];
+
+    // Each of the four squares is 4 times a component squared; dividing by the largest loses nothing.
+    const float squares[4] = {1.0f + x.x + y.y + z.z, 1.0f + x.x - y.y - z.z, 1.0f - x.x + y.y - z.z,
+                              1.0f - x.x - y.y + z.z};
+    int largest = 0;
+    for (int i = 1; i < 4; ++i)
+    {
+        if (squares[i] > squares[largest])
+            largest = i;
+    }
+    const float root = std::sqrt(squares[largest]);
+    const float half = 0.5f / root;
+    switch (largest)
+    {
+    case 0: return Quaternionf(0.5f * root, (y.z - z.y) * half, (z.x - x.z) * half, (x.y - y.x) * half);
+    case 1: return Quaternionf((y.z - z.y) * half, 0.5f * root, (x.y + y.x) * half, (z.x + x.z) * half);
+    case 2: return Quaternionf((z.x - x.z) * half, (x.y + y.x) * half, 0.5f * root, (y.z + z.y) * half);
+    default: return Quaternionf((x.y - y.x) * half, (z.x + x.z) * half, (y.z + z.y) * half, 0.5f * root);
+    }
+}
+
+} // namespace
+
+void setFlags(SceneNode& node, const FlagMask& flags, bool state)
+{
+    const uint32_t stored = (state ? 0xFFFFFFFF : 0u) ^ flags.inverted;
+    node.setFlags((node.getFlags() & ~flags.mask) | (stored & flags.mask));
+}
+
+bool getDerivedFlags(const SceneNode& node, const FlagMask& flags)
+{
+    uint32_t combined = 0;
+    for (const SceneNode* ancestor = &node; ancestor; ancestor = ancestor->getParent())
+        combined |= ancestor->getFlags();
+    return ((combined ^ flags.inverted) & flags.mask) == flags.mask;
+}
+
+void visitScene(SceneNodeVisitor& visitor, SceneNode& node)
+{
+    node.accept(visitor);
+    for (const SharedPtr<SceneNode>& child : node.getChildren())
+        visitScene(visitor, *child);
+}
+
+void visitScene(SceneNodeVisitor& visitor, SceneNode& node, const FlagMask& renderFlags,
+                const FlagMask& recursiveFlags)
+{
+    if (renderFlags.mask == 0)
+    {
+        visitScene(visitor, node);
+        return;
+    }
+    const bool plainFlags = (recursiveFlags.mask & recursiveFlags.inverted) == 0;
+    visitRestricted({visitor, renderFlags, recursiveFlags, plainFlags}, node, WalkState());
+}
+
+void setAppearance(SceneNode& node, const SharedPtr<Appearance>& appearance)
+{
+    AppearanceSetter setter(appearance);
+    node.accept(setter);
+}
+
+void setShaderProgram(SceneNode& node, const SharedPtr<ShaderProgram>& program)
+{
+    ShaderProgramSetter setter(program);
+    node.accept(setter);
+}
+
+SharedPtr<Solid> createSquare(AssetCachePool& pool, const Vector2f& uvScale)
+{
+    return makeSolid(pool, createSquareMesh(*pool.getMeshCache(), uvScale));
+}
+
+SharedPtr<Solid> createCube(AssetCachePool& pool, const Vector2f& uvScale)
+{
+    return makeSolid(pool, createCubeMesh(*pool.getMeshCache(), uvScale));
+}
+
+SharedPtr<Solid> createSphere(AssetCachePool& pool, unsigned int segments, unsigned int wedges,
+                              const Vector2f& uvScale)
+{
+    return makeSolid(pool, createSphereMesh(*pool.getMeshCache(), segments, wedges, uvScale));
+}
+
+void point(SceneNode& node, const Vector3f& target, const Vector3f& up)
+{
+    // Straight lines stay straight between a parent's space and the world, so it is enough to meet the target
+    // in the parent's space, whatever the parents' scales are.
+    const SceneNode* parent = node.getParent();
+    const Matrix4f toParent = parent ? inverse(parent->getWorldTransform()) : Matrix4f::IDENTITY;
+    const Vector3f localTarget = (toParent * Vector4f(target, 1.0f)).xyz();
+    const Vector3f localUp = (toParent * Vector4f(up, 0.0f)).xyz();
+    if (target == node.getWorldTransform().columns[3].xyz() || toParent == Matrix4f())
+        return;
+    node.setRotation(toQuaternion(upper3x3(lookAt(node.getPosition(), localTarget, localUp))));
+}
+
+} // namespace orv

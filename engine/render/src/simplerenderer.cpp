@@ -1,0 +1,277 @@
+#include "orv/simplerenderer.h"
+
+#include "eyes.h"
+#include "rendererproperties.h"
+
+#include "orv/appearance.h"
+#include "orv/assetcachepool.h"
+#include "orv/light.h"
+#include "orv/log.h"
+#include "orv/maths.h"
+#include "orv/propertyref.h"
+#include "orv/rendertarget.h"
+#include "orv/sceneutil.h"
+#include "orv/shaderprogram.h"
+#include "orv/solid.h"
+#include "orv/texture2dcache.h"
+
+#include <algorithm>
+#include <cmath>
+#include <limits>
+
+namespace orv
+{
+
+namespace
+{
+
+/// The inverse transpose of the upper 3x3 part: the cofactors over the determinant. A solid squeezed flat has
+/// no inverse; its cofactors still point the right way.
+Matrix3f normalMatrix(const Matrix4f& world)
+{
+    const Vector3f x = world.columns[0].xyz();
+    const Vector3f y = world.columns[1].xyz();
+    const Vector3f z = world.columns[2].xyz();
+    const Vector3f yz = cross(y, z);
+    const float reciprocal = 1.0f / dot(x, yz);
+    const float factor = std::isfinite(reciprocal) ? reciprocal : 1.0f;
+    return Matrix3f(yz * factor, cross(z, x) * factor, cross(x, y) * factor);
+}
+
+/// Reflects about the plane through the solid's position across its z axis.
+Matrix4f reflectionMatrix(const Matrix4f& world)
+{
+    const Vector3f n = normalize(world.columns[2].xyz());
+    const float d = dot(n, world.columns[3].xyz());
+    return Matrix4f(Vector4f(Vector3f::X_AXIS - n * (2.0f * n.x), 0.0f),
+                    Vector4f(Vector3f::Y_AXIS - n * (2.0f * n.y), 0.0f),
+                    Vector4f(Vector3f::Z_AXIS - n * (2.0f * n.z), 0.0f), Vector4f(n * (2.0f * d), 1.0f));
+}
+
+Vector4f toVector(const Colour4f& colour)
+{
+    return Vector4f(colour.r, colour.g, colour.b, colour.a);
+}
+
+} // namespace
+
+SimpleRenderer::SimpleRenderer(const SharedPtr<RenderContext>& context, const SharedPtr<AssetCachePool>& pool)
+    : m_context(context)
+    , m_pool(pool)
+    , m_properties(std::make_unique<detail::RendererProperties>(*m_context, m_pool.get()))
+{
+}
+
+SimpleRenderer::~SimpleRenderer() = default;
+
+void SimpleRenderer::visit(Solid* solid)
+{
+    const Appearance* appearance = solid->getAppearance().get();
+    ORV_ASSERT(appearance);
+    if (!appearance)
+        return;
+    const ShaderProgram* program = appearance->getShaderProgram().get();
+    ORV_ASSERT(program);
+    if (!program)
+        return;
+
+    if (program->usesMirrorTexture())
+        m_mirrors.push_back(solid);
+    else if (appearance->isOpaque())
+        m_opaque.push_back(solid);
+    else
+        m_transparent.push_back(solid);
+}
+
+void SimpleRenderer::visit(Light* light)
+{
+    m_lights.push_back(light);
+}
+
+void SimpleRenderer::render(Camera* camera, SceneNode& scene, const FlagMask& renderFlags,
+                            const FlagMask& recursiveFlags)
+{
+    m_opaque.clear();
+    m_transparent.clear();
+    m_mirrors.clear();
+    m_lights.clear();
+    visitScene(*this, scene, renderFlags, recursiveFlags);
+
+    m_viewport = detail::getViewport(*m_context);
+    detail::Eye eyes[2];
+    const int eyeCount = detail::findEyes(camera, detail::getAspect(m_viewport), eyes);
+    m_properties->time->set(fmod(m_time, 60.0f));
+    publishLights();
+
+    for (int i = 0; i < eyeCount; ++i)
+    {
+        const detail::Viewport viewport = eyeCount > 1 ? detail::getHalf(m_viewport, i) : m_viewport;
+        detail::setViewport(*m_context, viewport);
+        renderEye(eyes[i], viewport);
+    }
+    detail::setViewport(*m_context, m_viewport);
+}
+
+void SimpleRenderer::publishLights()
+{
+    const int count = static_cast<int>(std::min(m_lights.size(), size_t(detail::MAX_LIGHTS)));
+    m_properties->lightCount->set(count);
+    for (int i = 0; i < count; ++i)
+        publishLight(*m_lights[static_cast<size_t>(i)], i);
+}
+
+void SimpleRenderer::publishLight(const Light& light, int index)
+{
+    detail::RendererProperties& properties = *m_properties;
+    const Matrix4f& world = light.getWorldTransform();
+    const Vector3f zAxis = normalize(world.columns[2].xyz());
+    const Light::LightType type = light.getLightType();
+
+    properties.lightPosition->set(
+        type == Light::LightType::DIRECTIONAL ? Vector4f(zAxis, 0.0f) : world.columns[3], index);
+
+    const Vector4f colour = toVector(light.getColour()) * light.getIntensity();
+    properties.lightAmbient->set(colour * light.getAmbientLevel(), index);
+    properties.lightDiffuse->set(colour, index);
+    properties.lightSpecular->set(colour, index);
+
+    float attenuationReciprocal = 0.0f;
+    if (light.isAttenuated())
+    {
+        const float scale = length(world.columns[0].xyz());
+        const float nearDistance = light.getAttenuationNear() * scale;
+        const float farDistance = std::max(light.getAttenuationFar() * scale, nearDistance + 0.001f);
+        properties.lightAttenuationNear->set(nearDistance, index);
+        attenuationReciprocal = 1.0f / (farDistance - nearDistance);
+    }
+    properties.lightAttenuationReciprocal->set(attenuationReciprocal, index);
+
+    const bool isSpot = type == Light::LightType::SPOT;
+    properties.lightSpotInnerCos->set(isSpot ? std::cos(light.getSpotInnerAngle().radians() * 0.5f) : -1.0f,
+                                      index);
+    properties.lightSpotOuterCos->set(isSpot ? std::cos(light.getSpotOuterAngle().radians() * 0.5f) : -1.0f,
+                                      index);
+    if (isSpot)
+        properties.lightSpotDirection->set(zAxis, index);
+}
+
+void SimpleRenderer::renderEye(const detail::Eye& eye, const detail::Viewport& viewport)
+{
+    const Matrix4f view = inverse(eye.world);
+    publishEye(eye.world, view);
+    sortTransparent(eye.world.columns[2].xyz());
+
+    draw(m_opaque.data(), m_opaque.size(), view, eye.projection);
+    for (size_t i = 0; i < m_mirrors.size(); ++i)
+    {
+        Solid* mirror = m_mirrors[i];
+        if (prepareMirrorTarget())
+        {
+            renderReflection(*mirror, eye, viewport);
+            publishEye(eye.world, view);
+            if (m_mirrorProperties.size() <= i)
+                m_mirrorProperties.emplace_back("M_MIRROR_TEXTURE");
+            m_mirrorProperties[i].set(*mirror->getAppearance(), m_mirrorTarget->getColourTexture());
+        }
+        draw(&mirror, 1, view, eye.projection);
+    }
+    draw(m_transparent.data(), m_transparent.size(), view, eye.projection);
+}
+
+void SimpleRenderer::publishEye(const Matrix4f& world, const Matrix4f& view)
+{
+    m_properties->cameraPosition->set(world.columns[3]);
+    m_properties->view->set(view);
+}
+
+/// Farthest first: eyes look along -z.
+void SimpleRenderer::sortTransparent(const Vector3f& eyeZ)
+{
+    m_sortKeys.clear();
+    for (Solid* solid : m_transparent)
+    {
+        const float depth = dot(eyeZ, solid->getWorldTransform().columns[3].xyz());
+        // Sorting needs an order; what is nowhere counts as farthest.
+        m_sortKeys.push_back({std::isnan(depth) ? -std::numeric_limits<float>::infinity() : depth, solid});
+    }
+    std::sort(m_sortKeys.begin(), m_sortKeys.end(),
+              [](const SortKey& a, const SortKey& b) { return a.depth < b.depth; });
+    for (size_t i = 0; i < m_sortKeys.size(); ++i)
+        m_transparent[i] = m_sortKeys[i].solid;
+}
+
+/// @return false if there is no target to reflect into; tried once only, not frame after frame.
+bool SimpleRenderer::prepareMirrorTarget()
+{
+    const bool empty = m_viewport.width <= 0 || m_viewport.height <= 0;
+    if (!m_mirrorTargetTried && m_pool && !empty)
+    {
+        m_mirrorTargetTried = true;
+        detail::setViewport(*m_context, m_viewport); // in stereo as well the texture has the whole size
+        const SharedPtr<Texture2D> texture =
+            m_pool->getTexture2DCache()->createFromBackbuffer(*m_context, Texture::Format::RGB, nullptr);
+        if (texture)
+            m_mirrorTarget = makeShared<RenderTarget>(texture, nullptr, true, false);
+    }
+    return m_mirrorTarget && m_mirrorTarget->isComplete();
+}
+
+/// Draws what the mirror shows into the mirror target; framebuffer and viewport come back.
+void SimpleRenderer::renderReflection(const Solid& mirror, const detail::Eye& eye,
+                                      const detail::Viewport& viewport)
+{
+    const unsigned framebuffer = RenderTarget::getBoundFramebuffer();
+    const Texture2D& texture = *m_mirrorTarget->getColourTexture();
+    m_mirrorTarget->enable();
+    m_context->setViewport(0, 0, static_cast<int>(texture.getWidth()), static_cast<int>(texture.getHeight()));
+
+    // Masks and scissor box are those of the last draw; they must not keep anything from being cleared.
+    m_context->setColourMask(true, true, true, true);
+    m_context->setDepthWriteEnabled(true);
+    setStencilMask(*m_context, 0xFFFFFFFF);
+    m_context->setScissorTestEnabled(false);
+    m_context->clear();
+
+    // The reflection and the upside-down picture each turn the winding, so front faces stay front faces.
+    const Matrix4f world = reflectionMatrix(mirror.getWorldTransform()) * eye.world;
+    const Matrix4f view = inverse(world);
+    Matrix4f projection = eye.projection;
+    projection.columns[1] = -projection.columns[1];
+
+    publishEye(world, view);
+    draw(m_opaque.data(), m_opaque.size(), view, projection);
+    draw(m_transparent.data(), m_transparent.size(), view, projection);
+
+    RenderTarget::bindFramebuffer(framebuffer);
+    detail::setViewport(*m_context, viewport);
+}
+
+void SimpleRenderer::draw(Solid* const* solids, size_t count, const Matrix4f& view,
+                          const Matrix4f& projection)
+{
+    detail::RendererProperties& properties = *m_properties;
+    RenderContext& context = *m_context;
+    properties.viewProjection->set(projection * view);
+    for (size_t i = 0; i < count; ++i)
+    {
+        Solid& solid = *solids[i];
+        const Matrix4f& world = solid.getWorldTransform();
+        const Matrix4f modelView = view * world;
+        properties.modelViewProjection->set(projection * modelView);
+        properties.modelView->set(modelView);
+        properties.model->set(world);
+        properties.normalModel->set(normalMatrix(world));
+        publishJoints(solid);
+        solid.draw(context);
+    }
+}
+
+void SimpleRenderer::publishJoints(const Solid& solid)
+{
+    const int count = std::min(solid.getJointCount(), Solid::MAX_JOINTS);
+    m_properties->jointCount->set(count);
+    for (int i = 0; i < count; ++i)
+        m_properties->jointWorld->set(solid.getJointTransform(i), i);
+}
+
+} // namespace orv

@@ -1,0 +1,645 @@
+#include "glotest.h"
+
+#include "support/logcapture.h"
+
+#include "orv/animationgroup.h"
+#include "orv/appearance.h"
+#include "orv/camera.h"
+#include "orv/light.h"
+#include "orv/mesh.h"
+#include "orv/shaderprogramcache.h"
+#include "orv/solid.h"
+#include "orv/texture2d.h"
+#include "orv/texture2dcache.h"
+
+#include <cmath>
+#include <functional>
+#include <limits>
+
+using namespace orv;
+using support::LogCapture;
+
+namespace
+{
+
+glo::SamplerField image(const char* name, uint32_t type = glo::sampler::TEXTURE_2D)
+{
+    glo::Sampler sampler;
+    sampler.type = type;
+    sampler.image = name;
+    return sampler;
+}
+
+/// A square with one material, as the top node.
+glo::GloScene makeSquareScene(const glo::Material& material)
+{
+    glo::GloScene scene;
+    scene.geometries.push_back(makeSquareGeometry("square"));
+    scene.materials.push_back(material);
+    glo::NodeData top = makeNode("top");
+    top.geometry = glo::GeometryReference{"square", {material.name}};
+    scene.scene = glo::SceneData{"scene", top};
+    return scene;
+}
+
+glo::Channel makeChannel(const char* type, const char* name, const char* property,
+                         const std::vector<float>& values)
+{
+    glo::Channel channel;
+    channel.targetType = type;
+    channel.targetName = name;
+    channel.property = property;
+    glo::addKey(channel, 1.0f, values);
+    return channel;
+}
+
+const Solid& asSolid(const SceneNode& node)
+{
+    EXPECT_EQ(Solid::NODE_TYPE, node.getNodeType());
+    return static_cast<const Solid&>(node);
+}
+
+float getFloat(const Appearance& appearance, const char* name)
+{
+    float value = -1.0f;
+    EXPECT_TRUE(appearance.getPropertyUniform(name) &&
+                appearance.getPropertyUniform(name)->getValue(value, 0))
+        << name;
+    return value;
+}
+
+class GloSceneTest : public GloTest
+{
+protected:
+    bool hasProgram(const SharedPtr<Appearance>& appearance, const char* name)
+    {
+        return m_pool->getShaderProgramCache()->exists(name) &&
+               m_pool->getShaderProgramCache()->get(name) == appearance->getShaderProgram();
+    }
+};
+
+} // namespace
+
+// Fault caught: a shader program without a feature that a material needs, or with one that costs for nothing.
+TEST_F(GloSceneTest, programs)
+{
+    using Change = std::function<void(glo::StandardMaterial&)>;
+    const Change none = [](glo::StandardMaterial&) {};
+    const Change bump = [](glo::StandardMaterial& m) { m.bump = image("orv#white.png"); };
+    const Change all = [](glo::StandardMaterial& m)
+    {
+        m.bump = image("orv#white.png");
+        m.diffuse.colour.x = m.ambient.colour.y = m.specular.colour.z = m.emissive.colour.x = 0.1f;
+        m.specularLevel = 0.1f;
+        m.reflection.sampler = image("orv#white.png", glo::sampler::TEXTURE_CUBE);
+    };
+    const struct
+    {
+        const char* material;
+        const char* tool;
+        Change change;
+        const char* program;
+    } cases[] = {
+        {"m", "blender2.63.0", none, "orv#max_pvl.sp"},
+        {"m", "3ds_max2012", none, "orv#max_pvl.sp$INVSQROOT"},
+        {"m", "3ds_max2012", bump, "orv#max_ppl.sp$BUMP$INVY$INVSQROOT"},
+        {"m", "blender2.63.0", bump, "orv#max_ppl.sp$BUMP"},
+        {"a zun_ppl b", "blender2.63.0", none, "orv#max_ppl.sp"},
+        {"m", "blender2.63.0", [](glo::StandardMaterial& m) { m.bump = image(""); }, "orv#max_pvl.sp"},
+        {"m", "blender2.63.0", [](glo::StandardMaterial& m) { m.specularLevel = 1.0f; }, "orv#max_pvl.sp"},
+        {"m", "blender2.63.0", [](glo::StandardMaterial& m) { m.specular.colour.x = 1.0f; },
+         "orv#max_pvl.sp"},
+        {"m", "blender2.63.0",
+         [](glo::StandardMaterial& m) { m.reflection.sampler = image("orv#white.png"); },
+         "orv#max_pvl.sp$REFL"},
+        {"m", "3ds_max2012", all, "orv#max_ppl.sp$BUMP$INVY$INVSQROOT$DIFF$SPEC$AMBI$REFL$CUBE$EMIS"},
+    };
+    for (const auto& item : cases)
+    {
+        glo::Material material = makeMaterial(item.material, Vector4f(0, 0, 0, 1));
+        item.change(material.techniques[0]);
+        glo::GloScene scene = makeSquareScene(material);
+        scene.info.authoringTool = item.tool;
+        LogCapture log;
+        const Glo::Ptr loaded = load(scene);
+        ASSERT_TRUE(loaded) << log.text();
+        EXPECT_TRUE(hasProgram(loaded->getAppearance(item.material), item.program)) << item.program;
+    }
+}
+
+// Fault caught: an opaque glass, a one-sided leaf, a missing picture that leaves a hole, sampler settings that turn
+// a texture black or reach the built-in ones.
+TEST_F(GloSceneTest, materials)
+{
+    glo::Material material = makeMaterial("m", Vector4f(1, 1, 1, 1));
+    glo::StandardMaterial last = material.techniques[0];
+    last.opacity = 0.5f;
+    last.doubleSided = 1;
+    last.shininess = 7.0f;
+    last.emissive.sampler = image("missing.png");
+    last.gloss = image("orv#white.png", 5);
+    last.specularLevelMap = image("orv#error.png");
+    last.specularLevelMap->minFilter = 0;
+    last.specularLevelMap->magFilter = 99;
+    material.techniques.push_back(last);
+
+    LogCapture log;
+    const Glo::Ptr loaded = load(makeSquareScene(material));
+    ASSERT_TRUE(loaded);
+    EXPECT_EQ(2, log.count('E')) << log.text();
+    EXPECT_TRUE(log.contains("Failed to find 2d texture \"missing.png\"; using \"missing\" texture."));
+    EXPECT_TRUE(log.contains("Unsupported sampler type; using \"missing\" texture."));
+
+    const SharedPtr<Appearance> appearance = loaded->getAppearance("m");
+    EXPECT_STREQ("m", appearance->getName());
+    EXPECT_FALSE(appearance->isOpaque());
+    EXPECT_EQ(CullingMode::CULL_NONE, appearance->getRenderState().cullingMode);
+    EXPECT_EQ(7.0f, getFloat(*appearance, "M_SHININESS"));
+    EXPECT_FALSE(appearance->propertyExists("M_BUMP_TEXTURE"));
+    EXPECT_FALSE(appearance->propertyExists("M_UV_OFFSET_SCALE"));
+    const auto getTexture = [&](const char* name)
+    {
+        SharedPtr<Texture2D> texture;
+        EXPECT_TRUE(appearance->getPropertyUniform(name)->getValue(texture, 0)) << name;
+        return texture;
+    };
+    const SharedPtr<Texture2DCache>& textures = m_pool->getTexture2DCache();
+    EXPECT_EQ(textures->get("orv#white.png"), getTexture("M_DIFFUSE_TEXTURE"));
+    EXPECT_EQ(textures->get("orv#missing.png"), getTexture("M_EMISSIVE_TEXTURE"));
+    EXPECT_EQ(textures->get("orv#missing.png"), getTexture("M_GLOSS_TEXTURE"));
+    EXPECT_NE(TextureParameters::FilterMode::NEAREST, getTexture("M_SPECULAR_LEVEL_TEXTURE")->getMinFilter());
+}
+
+// Fault caught: sampler settings lost, or forced on a texture that cannot have them.
+TEST_F(GloSceneTest, samplers)
+{
+    using FilterMode = TextureParameters::FilterMode;
+    using WrapMode = TextureParameters::WrapMode;
+    const struct
+    {
+        int width;
+        uint32_t minFilter, wrap;
+        FilterMode min;
+        WrapMode made;
+    } cases[] = {
+        {8, 5, 2, FilterMode::LINEAR_MIPMAP_LINEAR, WrapMode::MIRRORED_REPEAT},
+        {8, 0, 1, FilterMode::NEAREST, WrapMode::CLAMP},
+        {8, 77, 77, FilterMode::LINEAR_MIPMAP_NEAREST, WrapMode::REPEAT},
+        {6, 5, 2, FilterMode::LINEAR, WrapMode::CLAMP},
+        {6, 3, 0, FilterMode::NEAREST, WrapMode::CLAMP},
+    };
+    for (const auto& item : cases)
+    {
+        // An uncompressed true-colour TGA.
+        std::vector<uint8_t> tga(size_t(18 + item.width * 8 * 3));
+        tga[2] = 2;
+        tga[12] = uint8_t(item.width);
+        tga[14] = 8;
+        tga[16] = 24;
+        const std::string name = std::to_string(&item - cases) + ".tga";
+        m_source->set(name, tga);
+
+        glo::Material material = makeMaterial("m", Vector4f(1, 1, 1, 1));
+        glo::SamplerField& sampler = material.techniques[0].diffuse.sampler;
+        sampler = image(name.c_str());
+        sampler->minFilter = item.minFilter;
+        sampler->magFilter = 0;
+        sampler->wrapHorizontal = sampler->wrapVertical = item.wrap;
+        LogCapture log;
+        ASSERT_TRUE(load(makeSquareScene(material)));
+        EXPECT_EQ(0, log.count('E')) << log.text();
+        const SharedPtr<Texture2D> texture = m_pool->getTexture2DCache()->get(name.c_str());
+        EXPECT_EQ(item.min, texture->getMinFilter()) << item.minFilter;
+        EXPECT_EQ(FilterMode::NEAREST, texture->getMagFilter());
+        EXPECT_EQ(item.made, texture->getHorizontalWrap()) << item.minFilter;
+        EXPECT_EQ(item.made, texture->getVerticalWrap()) << item.minFilter;
+    }
+}
+
+// Fault caught: parts of a node that get lost, or hang somewhere else.
+TEST_F(GloSceneTest, tree)
+{
+    glo::GloScene scene = makeFullScene();
+    glo::NodeData& top = scene.scene->top;
+    glo::NodeData& both = top.children[0];
+    both.light = glo::LightReference{"lamp"};
+    both.camera = glo::CameraReference{"lens"};
+    moveTo(both, Vector3f(1, 2, 3));
+    both.rotation = Vector4f(0, 0, 1, 2); // the matrix counts until a component is set
+    scene.geometries[0].primitiveSets.push_back({glo::primitive::TRIANGLE_FAN, {}});
+    scene.geometries[0].primitiveSets.push_back({99, glo::IndexData{3, {0, 1, 2}}});
+    both.geometry->materials = {"red", "no such"};
+
+    LogCapture log;
+    const Glo::Ptr loaded = load(scene);
+    ASSERT_TRUE(loaded) << log.text();
+    EXPECT_EQ(1, log.countMessage("Geometry has no material; using default appearance.")) << log.text();
+    ASSERT_EQ(1u, m_root->getChildCount());
+    EXPECT_EQ(m_root->getChild(0), loaded->getTopNode());
+    EXPECT_STREQ("top", loaded->getTopNode()->getName());
+    ASSERT_EQ(5u, loaded->getTopNode()->getChildCount());
+
+    SceneNode& node = *loaded->getTopNode()->getChild(0);
+    EXPECT_EQ(translationMatrix(Vector3f(1, 2, 3)), node.getWorldTransform());
+    node.setPosition(Vector3f(0, 0, 0));
+    EXPECT_NEAR(std::cos(2.0f), node.getWorldTransform()[0].x, 1e-6f);
+
+    ASSERT_EQ(4u, node.getChildCount());
+    const Solid* const solids[] = {&asSolid(node), &asSolid(*node.getChild(0)), &asSolid(*node.getChild(1))};
+    EXPECT_EQ(loaded->getAppearance("red"), solids[0]->getAppearance());
+    EXPECT_TRUE(hasProgram(solids[1]->getAppearance(), "orv#max_pvl.sp$DIFF$SPEC$AMBI$EMIS"));
+    EXPECT_EQ(solids[1]->getAppearance(), solids[2]->getAppearance());
+    EXPECT_STREQ("", solids[1]->getName());
+    EXPECT_EQ(solids[0]->getMesh()->getVertexBuffer(), solids[2]->getMesh()->getVertexBuffer());
+    EXPECT_EQ(IndexBuffer::Primitive::TRIANGLE_FAN, solids[1]->getMesh()->getIndexBuffer()->getPrimitive());
+    EXPECT_EQ(4, solids[1]->getMesh()->getIndexBuffer()->getCount());
+    EXPECT_EQ(IndexBuffer::Primitive::TRIANGLE_FAN, solids[2]->getMesh()->getIndexBuffer()->getPrimitive());
+    EXPECT_EQ(3, solids[2]->getMesh()->getIndexBuffer()->getCount());
+    EXPECT_EQ(Light::NODE_TYPE, node.getChild(2)->getNodeType());
+    EXPECT_EQ(Camera::NODE_TYPE, node.getChild(3)->getNodeType());
+
+    // By node first, by definition otherwise.
+    EXPECT_EQ(2, loaded->getLightCount());
+    EXPECT_EQ(loaded->getLight(1), loaded->getLight("lamp node"));
+    EXPECT_EQ(loaded->getLight(0), loaded->getLight("lamp"));
+    EXPECT_EQ(loaded->getCamera(1), loaded->getCamera("eye"));
+    EXPECT_FALSE(loaded->getCamera("nobody"));
+    EXPECT_FALSE(loaded->getLight(2));
+}
+
+// Fault caught: light and camera fields in the wrong order or unit, unknown codes that are let through.
+TEST_F(GloSceneTest, lightsAndCameras)
+{
+    glo::GloScene scene;
+    glo::LightDefinition& light = scene.lights.emplace_back();
+    light = {"lamp", glo::light::SPOT, Vector3f(0.1f, 0.2f, 0.3f), 4, 5, 0.6f, 0.7f, 0, 8};
+    glo::CameraDefinition& camera = scene.cameras.emplace_back();
+    camera = {"lens", glo::projection::ORTHOGRAPHIC, 0.5f, 6, 7, 8};
+    glo::NodeData top = makeNode("top");
+    top.light = glo::LightReference{"lamp"};
+    top.camera = glo::CameraReference{"lens"};
+    scene.scene = glo::SceneData{"scene", top};
+    {
+        LogCapture log;
+        const Glo::Ptr loaded = load(scene);
+        ASSERT_TRUE(loaded);
+        const Light& made = *loaded->getLight(0);
+        EXPECT_EQ(Light::LightType::SPOT, made.getLightType());
+        EXPECT_EQ(Colour4f(0.1f, 0.2f, 0.3f, 1.0f), made.getColour());
+        EXPECT_EQ(4.0f, made.getAttenuationNear());
+        EXPECT_EQ(5.0f, made.getAttenuationFar());
+        EXPECT_EQ(0.6f, made.getSpotInnerAngle().radians());
+        EXPECT_EQ(0.7f, made.getSpotOuterAngle().radians());
+        EXPECT_FALSE(made.isAttenuated());
+        EXPECT_EQ(8.0f, made.getIntensity());
+        EXPECT_EQ(0.0f, made.getAmbientLevel());
+        EXPECT_STREQ("lamp", made.getLightName());
+        const Camera& eye = *loaded->getCamera(0);
+        EXPECT_EQ(Camera::ProjectionType::ORTHOGRAPHIC, eye.getProjectionType());
+        EXPECT_EQ(0.5f, eye.getFieldOfView().radians());
+        EXPECT_EQ(6.0f, eye.getWidth());
+        EXPECT_EQ(7.0f, eye.getNear());
+        EXPECT_EQ(8.0f, eye.getFar());
+        EXPECT_EQ(1, log.count('W')) << log.text(); // a field of view without a use
+    }
+
+    const struct
+    {
+        uint32_t lightType, projection;
+        bool loads;
+        Light::LightType made;
+        const char* message;
+    } cases[] = {
+        {0, 1, true, Light::LightType::POINT, "Ambient light type not supported; defaulting to point light."},
+        {1, 1, true, Light::LightType::POINT, ""},
+        {2, 0, true, Light::LightType::DIRECTIONAL, ""},
+        {3, 0, true, Light::LightType::SPOT, ""},
+        {4, 0, false, Light::LightType::POINT, "Light \"lamp\" has the unknown type 4 in test.glo"},
+        {0xffffffffu, 0, false, Light::LightType::POINT,
+         "Light \"lamp\" has the unknown type 4294967295 in test.glo"},
+        {1, 2, false, Light::LightType::POINT, "Camera \"lens\" has the unknown projection 2 in test.glo"},
+    };
+    for (const auto& item : cases)
+    {
+        light.type = item.lightType;
+        camera = {"lens", item.projection};
+        LogCapture log;
+        const Glo::Ptr loaded = load(scene);
+        EXPECT_EQ(item.loads, bool(loaded)) << item.message;
+        EXPECT_EQ(*item.message ? 1 : 0, int(log.records().size())) << log.text();
+        EXPECT_TRUE(!*item.message || log.countMessage(item.message) == 1) << log.text();
+        EXPECT_TRUE(!loaded || item.made == loaded->getLight(0)->getLightType()) << item.lightType;
+    }
+}
+
+// Fault caught: vertices or indices through which the GL reads outside its buffers.
+TEST_F(GloSceneTest, geometryIsChecked)
+{
+    using Change = std::function<void(glo::Geometry&)>;
+    const char* const misfit =
+        "Vertex attribute \"a_position\" of geometry \"square\" does not fit its vertex data in test.glo";
+    const char* const index = "Geometry \"square\" has an index beyond its 4 vertices in test.glo";
+    const struct
+    {
+        const char* what;
+        Change change;
+        const char* message;
+    } cases[] = {
+        {"unchanged", [](glo::Geometry&) {}, ""},
+        {"an index too high", [](glo::Geometry& g) { g.primitiveSets[0].indices->indices[3] = 4; }, index},
+        {"a byte short", [](glo::Geometry& g) { g.vertices.data.bytes.pop_back(); },
+         "Vertex attribute \"a_uv0\" of geometry \"square\" does not fit its vertex data in test.glo"},
+        {"a vertex too many", [](glo::Geometry& g) { ++g.vertices.vertexCount; }, misfit},
+        {"four billion vertices", [](glo::Geometry& g) { g.vertices.vertexCount = 0xffffffffu; }, misfit},
+        {"four billion vertices of nothing",
+         [](glo::Geometry& g)
+         {
+             g.vertices.attributes.clear();
+             g.vertices.vertexCount = 0xffffffffu;
+         },
+         "Geometry \"square\" has no data for its 4294967295 vertices in test.glo"},
+        {"no vertices",
+         [](glo::Geometry& g)
+         {
+             g.vertices = {};
+             g.primitiveSets[0].indices.reset();
+         },
+         ""},
+        {"indices into no vertices", [](glo::Geometry& g) { g.vertices = {}; },
+         "Geometry \"square\" has an index beyond its 0 vertices in test.glo"},
+        {"five components", [](glo::Geometry& g) { g.vertices.attributes[0].componentCount = 5; }, misfit},
+        {"no component", [](glo::Geometry& g) { g.vertices.attributes[0].componentCount = 0; }, misfit},
+        {"a negative count", [](glo::Geometry& g) { g.vertices.attributes[0].componentCount = -3; }, misfit},
+        {"a negative offset", [](glo::Geometry& g) { g.vertices.attributes[0].offset = -4; }, misfit},
+        {"an offset too far", [](glo::Geometry& g) { g.vertices.attributes[0].offset = 24; }, misfit},
+        {"a negative stride", [](glo::Geometry& g) { g.vertices.attributes[0].stride = -32; }, misfit},
+        {"a stride too far", [](glo::Geometry& g) { g.vertices.attributes[0].stride = 0x7fffffff; }, misfit},
+        {"two bytes read as four",
+         [](glo::Geometry& g)
+         {
+             g.vertices.attributes = {{"a_position", 3, 7, 0, 6, 0}};
+             g.vertices.data.bytes.resize(24);
+         },
+         misfit},
+    };
+    for (const auto& item : cases)
+    {
+        glo::GloScene scene = makeSquareScene(makeMaterial("m", Vector4f(1, 1, 1, 1)));
+        item.change(scene.geometries[0]);
+        LogCapture log;
+        EXPECT_EQ(!*item.message, bool(load(scene))) << item.what << log.text();
+        EXPECT_EQ(*item.message ? 1 : 0, log.count('E')) << item.what << log.text();
+        EXPECT_TRUE(!*item.message || log.countMessage(item.message) == 1) << item.what << log.text();
+    }
+}
+
+// Fault caught: a radius that culls what is in sight; formats that change on the way to the GL.
+TEST_F(GloSceneTest, formatsAndRadii)
+{
+    constexpr unsigned BYTE = 0x1400, UNSIGNED_SHORT = 0x1403, FLOAT = 0x1406, FIXED = 0x140c;
+    const struct
+    {
+        uint32_t type;
+        uint32_t normalize;
+        std::vector<uint8_t> vertex;
+        unsigned glType;
+        float radius;
+    } cases[] = {
+        {0, 0, {0x80, 0, 0}, BYTE, 128.0f},
+        {0, 1, {127, 0, 0}, BYTE, 1.0f},
+        {3, 0, {0, 1, 0, 0, 0, 0}, UNSIGNED_SHORT, 256.0f},
+        {3, 1, {255, 255, 255, 255, 0, 0}, UNSIGNED_SHORT, std::sqrt(2.0f)},
+        {4, 0, {0, 0, 64, 64, 0, 0, 0, 0, 0, 0, 128, 64}, FLOAT, 5.0f},
+        {99, 0, {0, 0, 64, 64, 0, 0, 0, 0, 0, 0, 128, 64}, FLOAT, 5.0f},
+        {8, 0, {0, 0, 2, 0, 0, 0, 0, 0, 0, 0, 0, 0}, FIXED, 2.0f},
+    };
+    for (const auto& item : cases)
+    {
+        glo::GloScene scene = makeSquareScene(makeMaterial("m", Vector4f(1, 1, 1, 1)));
+        glo::VertexSet& vertices = scene.geometries[0].vertices;
+        vertices.attributes = {{"a_position", 3, item.type, 0, 0, item.normalize}};
+        vertices.data.bytes = item.vertex;
+        vertices.vertexCount = 1;
+        scene.geometries[0].primitiveSets = {{glo::primitive::POINTS, {}}};
+        LogCapture log;
+        const Glo::Ptr loaded = load(scene);
+        ASSERT_TRUE(loaded) << log.text();
+        const Mesh& mesh = *asSolid(*loaded->getTopNode()).getMesh();
+        EXPECT_FLOAT_EQ(item.radius, mesh.getHeader().boundingRadius) << item.type;
+        const detail::AttribRecord* record = mesh.getVertexBuffer()->findAttrib("a_position");
+        ASSERT_TRUE(record);
+        EXPECT_EQ(item.glType, record->glType) << item.type;
+        EXPECT_EQ(item.normalize != 0, record->normalised) << item.type;
+    }
+}
+
+// Fault caught: animations that move the wrong thing, nothing, or stop a file that could be shown.
+TEST_F(GloSceneTest, channels)
+{
+    const struct
+    {
+        const char* what;
+        glo::Channel channel;
+        char level; ///< of the one record, 0 for none
+        const char* message;
+    } cases[] = {
+        {"a node", makeChannel("node", "node-square node", "translation", {1, 2, 3}), 0, ""},
+        {"without prefix", makeChannel("node", "square node", "scale", {1, 2, 3}), 0, ""},
+        {"a rotation", makeChannel("node", "hip", "rotation", {0, 0, 1, 1}), 0, ""},
+        {"a missing node", makeChannel("node", "nobody", "scale", {1, 2, 3}), 'E',
+         "Animation node not present in test.glo"},
+        {"visibility", makeChannel("node", "nobody", "visibility", {1}), 'W',
+         "Ignoring unknown property in test.glo"},
+        {"a cloud", makeChannel("cloud", "nobody", "scale", {1}), 'W',
+         "Ignoring unknown property in test.glo"},
+        {"a light's definition", makeChannel("light", "lamp", "multiplier", {1}), 0, ""},
+        {"a colour", makeChannel("light", "lamp", "colour", {1, 1, 1}), 0, ""},
+        {"a light's node", makeChannel("light", "lamp node", "colour", {1, 1, 1}), 'E',
+         "No light for animation in test.glo"},
+        {"a material", makeChannel("material", "red", "diffuse", {1, 1, 1, 1}), 0, ""},
+        {"a missing material", makeChannel("material", "green", "opacity", {1}), 'E',
+         "No appearance material for animation in test.glo"},
+        {"two numbers for three", makeChannel("node", "hip", "scale", {1, 2}), 'E',
+         "\"scale\" of \"hip\" has 2 coefficients per key in test.glo; wanted are 3"},
+        {"five for a colour", makeChannel("material", "red", "diffuse", {1, 2, 3, 4, 5}), 'E',
+         "\"diffuse\" of \"red\" has 5 coefficients per key in test.glo; wanted are 4"},
+        {"no time",
+         []
+         {
+             glo::Channel c = makeChannel("node", "hip", "scale", {1, 2, 3});
+             glo::addKey(c, std::numeric_limits<float>::quiet_NaN(), {1, 2, 3});
+             return c;
+         }(),
+         'E', "\"scale\" of \"hip\" has a key whose time is not a number in test.glo"},
+    };
+    for (const auto& item : cases)
+    {
+        glo::GloScene scene = makeFullScene();
+        scene.animations[0].channels = {item.channel};
+        LogCapture log;
+        const Glo::Ptr loaded = load(scene);
+        EXPECT_EQ(item.level != 'E', bool(loaded)) << item.what;
+        EXPECT_EQ(item.level == 'E' ? 1 : 0, log.count('E')) << item.what << log.text();
+        EXPECT_TRUE(item.level == 0 || log.countMessage(item.message) == 1) << item.what << log.text();
+    }
+    EXPECT_EQ(8u, m_root->getChildCount()); // only those that loaded
+}
+
+// Fault caught: key values in the wrong place or order, a light left behind, groups flattened or misnamed.
+TEST_F(GloSceneTest, animationsApply)
+{
+    glo::GloScene scene = makeFullScene();
+    glo::AnimationData& walk = scene.animations[0];
+    glo::Channel move = makeChannel("node", "node-hip", "translation", {1, 0, 0}); // at 1
+    glo::addKey(move, 0.5f, {2, 0, 0});
+    glo::Channel turn = makeChannel("node", "knee", "rotation", {0, 0, 2, 1});
+    glo::Channel bytes = makeChannel("node", "eye", "scale", {});
+    bytes.coefficientCount = 3;
+    bytes.type = glo::type::INT8;
+    bytes.keys.insert(bytes.keys.end(), {1, 2, 0xff});
+    walk.channels = {move, turn, bytes, makeChannel("light", "lamp", "colour", {0.1f, 0.2f, 0.3f}),
+                     makeChannel("light", "lamp", "multiplier", {6})};
+    walk.animations[0].channels = {makeChannel("material", "red", "opacity", {0.25f}),
+                                   makeChannel("material", "red", "emission", {0.5f, 0.6f, 0.7f})};
+    scene.animations.push_back({"second", {{3.0f, 4.0f}, {5.0f, 6.0f}}, {}, {}});
+    glo::NodeData lamp = makeNode("second lamp");
+    lamp.light = glo::LightReference{"lamp"};
+    scene.scene->top.children.push_back(lamp);
+
+    const Glo::Ptr loaded = load(scene);
+    ASSERT_TRUE(loaded);
+    EXPECT_EQ(5.0f, loaded->getLoopBegin());
+    EXPECT_EQ(6.0f, loaded->getLoopEnd());
+    ASSERT_EQ(2, loaded->getAnimationCount());
+    EXPECT_STREQ("second", loaded->getAnimationName(1));
+    EXPECT_EQ(loaded->getAnimationGroup()->getAnimation(0).get(), loaded->getAnimation("walk").get());
+    EXPECT_FALSE(loaded->getAnimation("inner"));
+    EXPECT_FALSE(loaded->getAnimation("WALK"));
+    EXPECT_EQ(1.0f, loaded->getAnimationGroup()->getEnd());
+
+    // Blended and with the feature that the animation needs, though the file starts opaque and black.
+    EXPECT_FALSE(loaded->getAppearance("red")->isOpaque());
+    EXPECT_TRUE(hasProgram(loaded->getAppearance("red"), "orv#max_pvl.sp$DIFF$EMIS"));
+    EXPECT_EQ(1.0f, getFloat(*loaded->getAppearance("red"), "M_OPACITY"));
+
+    SceneNode& top = *loaded->getTopNode();
+    loaded->getAnimationGroup()->apply(0.75f);
+    EXPECT_EQ(Vector3f(2, 0, 0), top.find("hip")->getPosition());
+    loaded->getAnimationGroup()->apply(2.0f);
+    EXPECT_EQ(Vector3f(1, 0, 0), top.find("hip")->getPosition());
+    EXPECT_EQ(2.0f * std::sin(0.5f), top.find("knee")->getRotation().z);
+    EXPECT_EQ(Vector3f(1, 2, -1), top.find("eye")->getScale());
+    for (int i = 0; i < 2; ++i)
+    {
+        EXPECT_EQ(Colour4f(0.1f, 0.2f, 0.3f, 1.0f), loaded->getLight(i)->getColour()) << i;
+        EXPECT_EQ(6.0f, loaded->getLight(i)->getIntensity()) << i;
+    }
+    EXPECT_EQ(0.25f, getFloat(*loaded->getAppearance("red"), "M_OPACITY"));
+    Vector4f colour;
+    EXPECT_TRUE(loaded->getAppearance("red")->getPropertyUniform("M_EMISSIVE_COLOUR")->getValue(colour, 0));
+    EXPECT_EQ(Vector4f(0.5f, 0.6f, 0.7f, 1.0f), colour);
+}
+
+// Fault caught: joints bound to a node of the same name elsewhere; a material that skins what has no joints, or
+// the other way round.
+TEST_F(GloSceneTest, skins)
+{
+    glo::GloScene scene = makeFullScene();
+    scene.skins[0].attachments = {
+        {"bone", Matrix4f::IDENTITY}, {"knee", Matrix4f::IDENTITY}, {"nobody", Matrix4f::IDENTITY}};
+    scene.skins[0].jointsPerVertex = 3;
+    scene.skins[0].bindShape = translationMatrix(Vector3f(0, 0, 9));
+    glo::NodeData& top = scene.scene->top;
+    const auto makeRig = [](const std::string& name)
+    {
+        glo::NodeData rig = makeNode(name);
+        rig.scopedName = "rig of " + name;
+        rig.children.push_back(makeNode(name + " bone"));
+        rig.children[0].scopedName = "bone";
+        return rig;
+    };
+    top.children.push_back(makeRig("first"));
+    top.children.push_back(makeRig("second"));
+    glo::NodeData named = makeNode("bone"); // by its plain name only
+    named.scopedName = "";
+    top.children.insert(top.children.begin(), named);
+    glo::NodeData& figure = top.children[2];
+    figure.skin->skeletons = {"second"};
+    figure.skin->materials = {"red", "no such"};
+
+    LogCapture log;
+    const Glo::Ptr loaded = load(scene);
+    ASSERT_TRUE(loaded) << log.text();
+    EXPECT_EQ(1, log.countMessage("Joint node \"nobody\" not found.")) << log.text();
+    EXPECT_EQ(1, log.count('E')) << log.text();
+    const SceneNode* node = loaded->getTopNode()->find("figure");
+    for (const Solid* solid : {&asSolid(*node), &asSolid(*node->getChild(0))})
+    {
+        ASSERT_EQ(3, solid->getJointCount());
+        EXPECT_STREQ("second bone", solid->getJoint(0).joint->getName());
+        EXPECT_STREQ("knee", solid->getJoint(1).joint->getName());
+        EXPECT_FALSE(solid->getJoint(2).joint);
+        EXPECT_EQ(3, solid->getJointsPerVertex());
+        EXPECT_EQ(9.0f, solid->getBindShapeTransform()[3].z);
+    }
+    const detail::AttribRecord* joints = asSolid(*node).getMesh()->getVertexBuffer()->findAttrib("a_joints");
+    EXPECT_FALSE(joints->normalised);
+
+    const SharedPtr<Appearance> plain = asSolid(*loaded->getTopNode()->find("square node")).getAppearance();
+    const SharedPtr<Appearance> skinned = asSolid(*node).getAppearance();
+    EXPECT_EQ(loaded->getAppearance("red"), plain);
+    EXPECT_TRUE(hasProgram(plain, "orv#max_pvl.sp$DIFF"));
+    EXPECT_TRUE(hasProgram(skinned, "orv#max_pvl.sp$DIFF$SKIN"));
+    EXPECT_TRUE(
+        hasProgram(asSolid(*node->getChild(0)).getAppearance(), "orv#max_pvl.sp$DIFF$SPEC$AMBI$EMIS$SKIN"));
+    loaded->getAnimationGroup()->apply(0.0f);
+    plain->setProperty<float>("M_OPACITY", 0.0f);
+    skinned->setProperty<float>("M_OPACITY", 0.0f);
+    loaded->getAnimationGroup()->apply(0.0f);
+    EXPECT_EQ(1.0f, getFloat(*plain, "M_OPACITY"));
+    EXPECT_EQ(1.0f, getFloat(*skinned, "M_OPACITY"));
+}
+
+// Fault caught: a name that leads nowhere and is dereferenced, or a half-built tree left under the parent.
+TEST_F(GloSceneTest, unknownNames)
+{
+    using Change = std::function<void(glo::GloScene&)>;
+    const struct
+    {
+        const char* message;
+        Change change;
+    } cases[] = {
+        {"There is no geometry \"x\" in test.glo",
+         [](glo::GloScene& s) { s.scene->top.children[0].geometry->geometry = "x"; }},
+        {"There is no skin \"x\" in test.glo",
+         [](glo::GloScene& s) { s.scene->top.children[1].skin->skin = "x"; }},
+        {"There is no geometry \"x\" in test.glo", [](glo::GloScene& s) { s.skins[0].geometry = "x"; }},
+        {"There is no light \"x\" in test.glo",
+         [](glo::GloScene& s) { s.scene->top.children[3].light->light = "x"; }},
+        {"There is no camera \"x\" in test.glo",
+         [](glo::GloScene& s) { s.scene->top.children[4].camera->camera = "x"; }},
+        {"Unrecognized up-axis option in test.glo", [](glo::GloScene& s) { s.upAxis = 3; }},
+    };
+    for (const auto& item : cases)
+    {
+        glo::GloScene scene = makeFullScene();
+        item.change(scene);
+        LogCapture log;
+        EXPECT_FALSE(load(scene)) << item.message;
+        EXPECT_EQ(1, log.count('E')) << log.text();
+        EXPECT_EQ(1, log.countMessage(item.message)) << log.text();
+        EXPECT_EQ(0u, m_root->getChildCount());
+    }
+
+    glo::GloScene empty;
+    empty.upAxis = 3; // of no matter without a scene
+    const Glo::Ptr loaded = load(empty);
+    ASSERT_TRUE(loaded);
+    EXPECT_FALSE(loaded->getTopNode());
+    EXPECT_EQ(0, loaded->getAnimationGroup()->getAnimationCount());
+
+    m_root.reset();
+    const Glo::Ptr rootless = load(makeFullScene());
+    ASSERT_TRUE(rootless);
+    EXPECT_FALSE(rootless->getTopNode()->getParent());
+}

@@ -1,0 +1,318 @@
+#include "scenetest.h"
+
+#include "orv/renderblock.h"
+#include "orv/rendertarget.h"
+
+using namespace orv;
+using support::Picture;
+using support::Rgba;
+
+namespace
+{
+
+const Rgba RED = {255, 0, 0, 255};
+const Rgba GREEN = {0, 255, 0, 255};
+const Rgba BLUE = {0, 0, 255, 255};
+const Rgba WHITE = {255, 255, 255, 255};
+const Rgba BLACK = {0, 0, 0, 255};
+
+} // namespace
+
+/// What a user sees, through the built-in materials.
+class PictureTest : public SceneTest
+{
+protected:
+    void SetUp() override
+    {
+        SceneTest::SetUp();
+        // As a picture file has it, top row first: red green / blue white.
+        const unsigned char pixels[] = {255, 0, 0, 0, 255, 0, 0, 0, 255, 255, 255, 255};
+        quarters = pool->getTexture2DCache()->create(2, 2, Texture::Format::RGB, Texture::Type::UNSIGNED_BYTE,
+                                                     pixels, nullptr);
+        quarters->setMinFilter(TextureParameters::FilterMode::NEAREST);
+        quarters->setMagFilter(TextureParameters::FilterMode::NEAREST);
+    }
+
+    void TearDown() override
+    {
+        quarters = nullptr;
+        SceneTest::TearDown();
+    }
+
+    /// A material that needs no light: its texture shines by itself.
+    SharedPtr<Appearance> makeShining(const SharedPtr<Texture2D>& texture)
+    {
+        auto appearance = makeShared<Appearance>();
+        appearance->setShaderProgram(pool->getShaderProgramCache()->get("orv#max_pvl.sp$DIFF"));
+        appearance->setProperty("M_DIFFUSE_TEXTURE", texture);
+        appearance->setProperty("M_SELF_ILLUMINATION", 1.0f);
+        return appearance;
+    }
+
+    /// From the camera, white.
+    void addSun()
+    {
+        const auto sun = makeShared<Light>();
+        sun->setLightType(Light::LightType::DIRECTIONAL);
+        sun->setParent(scene);
+    }
+
+    /// The middles of the four quarters around the centre.
+    static void expectQuarters(const Picture& frame, const Rgba& upperLeft, const Rgba& upperRight,
+                               const Rgba& lowerLeft, const Rgba& lowerRight)
+    {
+        EXPECT_EQ(upperLeft, frame.pixel(27, 27));
+        EXPECT_EQ(upperRight, frame.pixel(36, 27));
+        EXPECT_EQ(lowerLeft, frame.pixel(27, 36));
+        EXPECT_EQ(lowerRight, frame.pixel(36, 36));
+    }
+
+    SharedPtr<Texture2D> quarters;
+};
+
+TEST_F(PictureTest, textureStandsUprightOnASquare)
+{
+    addSquare(Vector3f(), 2.0f, makeShining(quarters));
+    renderFrame();
+    expectQuarters(support::readFrame(), RED, GREEN, BLUE, WHITE);
+}
+
+TEST_F(PictureTest, textureStandsUprightOnEveryFaceOfACube)
+{
+    const auto cube = createCube(*pool, Vector2f(1, 1));
+    cube->setAppearance(makeShining(quarters));
+    cube->setParent(scene);
+    const Vector3f up(0, 1, 0);
+    const struct
+    {
+        Vector3f from, up;
+    } views[] = {{Vector3f(0, 0, 4), up},
+                 {Vector3f(0, 0, -4), up},
+                 {Vector3f(4, 0, 0), up},
+                 {Vector3f(-4, 0, 0), up},
+                 {Vector3f(0, 4, 0), Vector3f(0, 0, -1)},
+                 {Vector3f(0, -4, 0), Vector3f(0, 0, 1)}};
+    for (const auto& view : views)
+    {
+        SCOPED_TRACE(toString(view.from));
+        camera->setPosition(view.from);
+        point(*camera, Vector3f(), view.up);
+        renderFrame();
+        expectQuarters(support::readFrame(), RED, GREEN, BLUE, WHITE);
+    }
+}
+
+// Fault caught: a mirrored node shown from the inside, or not at all.
+TEST_F(PictureTest, mirroredNodesShowTheirFrontFaces)
+{
+    const auto square = addSquare(Vector3f(), 2.0f, makeShining(quarters));
+    square->setScale(Vector3f(-2, 2, 2));
+    renderFrame();
+    expectQuarters(support::readFrame(), GREEN, RED, WHITE, BLUE);
+
+    square->setScale(Vector3f(2, 2, 2));
+    square->setRotation(quaternionFromAxisAngle(Vector3f::Y_AXIS, Anglef::fromDegrees(180.0f)));
+    renderFrame();
+    expectQuarters(support::readFrame(), BLACK, BLACK, BLACK, BLACK);
+}
+
+// Fault caught: normals turned by the model matrix itself: 114 instead of 228.
+TEST_F(PictureTest, normalsSurviveUnevenScale)
+{
+    for (const char* program : {"orv#max_pvl.sp$DIFF", "orv#max_ppl.sp$DIFF", "orv#fallback.sp"})
+    {
+        SCOPED_TRACE(program);
+        scene = makeShared<SceneNode>();
+        addSun();
+        const auto squeezed = makeShared<SceneNode>();
+        squeezed->setParent(scene);
+        squeezed->setScale(Vector3f(1, 1, 0.5f));
+        const auto appearance = makeShared<Appearance>();
+        appearance->setShaderProgram(pool->getShaderProgramCache()->get(program));
+        appearance->setProperty("M_SPECULAR_LEVEL", 0.0f);
+        const auto square = addSquare(Vector3f(), 2.0f, appearance);
+        square->setParent(squeezed);
+        square->setRotation(quaternionFromAxisAngle(Vector3f::Y_AXIS, Anglef::fromDegrees(45.0f)));
+        renderFrame();
+        const Rgba lit = support::readFrame().pixel(32, 32);
+        EXPECT_TRUE(support::isNear({228, 228, 228, 255}, lit, 3)) << lit;
+    }
+}
+
+TEST_F(PictureTest, opacityLetsTheBackgroundThrough)
+{
+    const auto glass = makeShining(quarters);
+    glass->setProperty("M_OPACITY", 0.25f);
+    glass->setBlendFactors(BlendFactor::SRC_ALPHA, BlendFactor::SRC_ALPHA, BlendFactor::ONE_MINUS_SRC_ALPHA,
+                           BlendFactor::ONE_MINUS_SRC_ALPHA);
+    addSquare(Vector3f(), 2.0f, glass);
+    addSquare(Vector3f(0, 0, -1), 20.0f, makePaint(Colour4f(0, 0, 1, 1)));
+    renderFrame();
+    const Rgba overRed = support::readFrame().pixel(27, 27);
+    EXPECT_TRUE(support::isNear({64, 0, 191, overRed.a}, overRed, 2)) << overRed;
+}
+
+// Fault caught: materials that leave values out turned black by what they lack.
+TEST_F(PictureTest, materialsThatSetNothingAreWhite)
+{
+    addSun();
+    for (const char* program :
+         {"orv#max_pvl.sp$DIFF$AMBI$EMIS", "orv#max_ppl.sp$DIFF$AMBI$EMIS", "orv#fallback.sp"})
+    {
+        SCOPED_TRACE(program);
+        const auto appearance = makeShared<Appearance>();
+        appearance->setShaderProgram(pool->getShaderProgramCache()->get(program));
+        const auto square = addSquare(Vector3f(), 2.0f, appearance);
+        renderFrame();
+        EXPECT_EQ(WHITE, support::readFrame().pixel(32, 32));
+        square->setParent(nullptr);
+    }
+}
+
+// Fault caught: a picture of a picture upside down.
+TEST_F(PictureTest, renderTargetStandsUprightOnASquare)
+{
+    const auto texture = pool->getTexture2DCache()->create(64, 64, Texture::Format::RGB,
+                                                           Texture::Type::UNSIGNED_BYTE, nullptr, nullptr);
+    const auto target = makeShared<RenderTarget>(texture, nullptr, true, false);
+    addSquare(Vector3f(), 2.0f, makeShining(quarters));
+    RenderBlock intoTexture(renderer, scene, camera);
+    intoTexture.setRenderTarget(target);
+    intoTexture.render();
+
+    texture->setMinFilter(TextureParameters::FilterMode::NEAREST);
+    const auto screen = makeShining(texture);
+    screen->setProperty("M_UV_OFFSET_SCALE", Vector4f(0, 1, 1, -1));
+    scene = makeShared<SceneNode>();
+    addSquare(Vector3f(), 6.0f, screen); // fills the view
+    renderFrame();
+    expectQuarters(support::readFrame(), RED, GREEN, BLUE, WHITE);
+}
+
+/// A mirror in the plane z = 0 that fills the view, and a red square that looks at it from behind the camera.
+class MirrorPictureTest : public PictureTest
+{
+protected:
+    void SetUp() override
+    {
+        PictureTest::SetUp();
+        auto appearance = makeShared<Appearance>();
+        appearance->setShaderProgram(makeProgram(
+            "attribute vec3 a_position; uniform mat4 u_transform; varying highp vec4 v_place;"
+            "void main() { v_place = u_transform * vec4(a_position, 1.0); gl_Position = v_place; }",
+            "varying highp vec4 v_place; uniform sampler2D u_mirror; void main() {"
+            "    highp vec2 p = v_place.xy / v_place.w;"
+            "    gl_FragColor = texture2D(u_mirror, vec2(0.5 + 0.5 * p.x, 0.5 - 0.5 * p.y)); }",
+            {{"u_transform", "T_MODEL_VIEW_PROJECTION"}, {"u_mirror", "M_MIRROR_TEXTURE"}}));
+        mirror = addSquare(Vector3f(), 6.0f, appearance);
+        red = addSquare(Vector3f(3.5f, 3.5f, 4), 3.0f, makePaint(Colour4f::RED));
+        red->setRotation(quaternionFromAxisAngle(Vector3f::Y_AXIS, Anglef::fromDegrees(180.0f)));
+    }
+
+    void TearDown() override
+    {
+        mirror = nullptr;
+        red = nullptr;
+        PictureTest::TearDown();
+    }
+
+    static void expectReflection(const Picture& frame)
+    {
+        EXPECT_EQ(RED, frame.pixel(48, 16));
+        EXPECT_EQ(BLACK, frame.pixel(16, 16));
+        EXPECT_EQ(BLACK, frame.pixel(16, 48));
+        EXPECT_EQ(BLACK, frame.pixel(48, 48));
+    }
+
+    SharedPtr<Solid> mirror;
+    SharedPtr<Solid> red;
+};
+
+// Faults caught: a reflection upside down, inside out or missing; masks and scissor box of a draw that keep
+// the mirror's last picture from being cleared; the reflected eye left behind as the eye.
+TEST_F(MirrorPictureTest, showsWhatStandsBeforeIt)
+{
+    const auto spoiler = makePaint(Colour4f::WHITE);
+    spoiler->setScissorTestEnabled(true);
+    spoiler->setScissorBox(0, 0, 1, 1);
+    spoiler->setColourMask(false, false, false, false);
+    spoiler->setDepthWriteEnabled(false);
+    addSquare(Vector3f(0, 0, -50), 1.0f, spoiler);
+
+    red->setPosition(Vector3f(-3.5f, -3.5f, 4));
+    renderFrame();
+    EXPECT_EQ(RED, support::readFrame().pixel(16, 48));
+    red->setPosition(Vector3f(3.5f, 3.5f, 4));
+    renderFrame();
+    expectReflection(support::readFrame());
+    EXPECT_EQ(Vector4f(0, 0, 3, 1), property<Vector4f>("T_CAMERA_POSITION"));
+    EXPECT_EQ(inverse(camera->getWorldTransform()), property<Matrix4f>("T_VIEW"));
+}
+
+TEST_F(MirrorPictureTest, reflectedEyeStandsBehindTheMirror)
+{
+    // Paints the eye's z as red; in the mirror it is -3, shown as black, and green says that it was drawn.
+    const auto appearance = makeShared<Appearance>();
+    appearance->setShaderProgram(makeProgram(
+        "attribute vec3 a_position; uniform mat4 u_transform; uniform vec4 u_eye; varying mediump vec4 v_c;"
+        "void main() { v_c = vec4(u_eye.z, 1.0, 0.0, 1.0); gl_Position = u_transform * vec4(a_position, "
+        "1.0); }",
+        "varying mediump vec4 v_c; void main() { gl_FragColor = v_c; }",
+        {{"u_transform", "T_MODEL_VIEW_PROJECTION"}, {"u_eye", "T_CAMERA_POSITION"}}));
+    red->setAppearance(appearance);
+    renderFrame();
+    EXPECT_EQ(GREEN, support::readFrame().pixel(48, 16));
+}
+
+// Fault caught: the rest of a frame that goes to the surface after a mirror was drawn inside a target.
+TEST_F(MirrorPictureTest, worksInsideARenderTarget)
+{
+    const auto texture = pool->getTexture2DCache()->create(64, 64, Texture::Format::RGB,
+                                                           Texture::Type::UNSIGNED_BYTE, nullptr, nullptr);
+    const auto target = makeShared<RenderTarget>(texture, nullptr, true, false);
+    RenderBlock block(renderer, scene, camera);
+    block.setBackgroundColour(Colour4f::BLACK);
+    block.setRenderTarget(target);
+    Background(Colour4f(0, 0, 1, 1)).enable(*renderContext);
+    block.render();
+    EXPECT_EQ(BLUE, support::readFrame().average()) << "the surface is untouched";
+    target->enable();
+    expectReflection(support::readFramebuffer(0, 0, 64, 64));
+    target->disable();
+}
+
+// Fault caught: each eye's picture drawn over the whole view after its mirror pass.
+TEST_F(MirrorPictureTest, worksInStereo)
+{
+    camera->setStereo(7.0f, 0.01f);
+    renderFrame();
+    const Picture frame = support::readFrame();
+    for (const int left : {0, 32})
+    {
+        EXPECT_EQ(RED, frame.pixel(left + 24, 16));
+        EXPECT_EQ(BLACK, frame.pixel(left + 8, 16));
+        EXPECT_EQ(BLACK, frame.pixel(left + 24, 48));
+    }
+    EXPECT_EQ(64, renderContext->getViewportWidth());
+}
+
+// Fault caught: one mirror showing the other's picture.
+TEST_F(MirrorPictureTest, eachMirrorShowsItsOwnReflection)
+{
+    mirror->setScale(Vector3f(3, 6, 1));
+    mirror->setPosition(Vector3f(-1.5f, 0, 0));
+    const auto second = makeShared<Solid>(mirror->getMesh(), mirror->getAppearance());
+    second->setScale(Vector3f(3, 6, 1));
+    second->setPosition(Vector3f(1.5f, 0, 1));
+    second->setParent(scene);
+    red->setPosition(Vector3f(-3.5f, 3.5f, 4));
+    const auto white = addSquare(Vector3f(3.5f, 3.5f, 4), 3.0f, makePaint(Colour4f::WHITE));
+    white->setRotation(red->getRotation());
+    renderFrame();
+    const Picture frame = support::readFrame();
+    EXPECT_EQ(RED, frame.pixel(21, 20)) << "in the first mirror; the second would show it farther out";
+    EXPECT_EQ(BLACK, frame.pixel(3, 3));
+    EXPECT_EQ(BLACK, frame.pixel(42, 20));
+    EXPECT_EQ(WHITE, frame.pixel(60, 3)) << "in the second mirror; the first would show it farther in";
+    EXPECT_EQ(1u, glcalls::liveNames(glcalls::Kind::FRAMEBUFFER).size()) << "one target for both";
+}

@@ -1,0 +1,104 @@
+#include "scenetest.h"
+
+#include "orv/renderblockgroup.h"
+#include "orv/rendertarget.h"
+
+#include <GLES2/gl2.h>
+
+using namespace orv;
+using support::LogCapture;
+using support::Rgba;
+
+class RenderBlockTest : public SceneTest
+{
+protected:
+    SharedPtr<RenderTarget> makeTarget(unsigned width, unsigned height)
+    {
+        return makeShared<RenderTarget>(pool->getTexture2DCache()->create(width, height, Texture::Format::RGB,
+                                                                          Texture::Type::UNSIGNED_BYTE,
+                                                                          nullptr, nullptr),
+                                        nullptr, true, false);
+    }
+
+    static const Rgba BLACK;
+    static const Rgba RED;
+    static const Rgba GREEN;
+};
+
+const Rgba RenderBlockTest::BLACK = {0, 0, 0, 255};
+const Rgba RenderBlockTest::RED = {255, 0, 0, 255};
+const Rgba RenderBlockTest::GREEN = {0, 255, 0, 255};
+
+// Fault caught: a clear that the last draw's masks or scissor box cut short.
+TEST_F(RenderBlockTest, clearsWhateverTheLastDrawLeftBehind)
+{
+    const auto appearance = makePaint(Colour4f::RED);
+    appearance->setScissorTestEnabled(true);
+    appearance->setScissorBox(0, 0, 8, 8);
+    appearance->setColourMask(true, false, false, false);
+    appearance->setDepthWriteEnabled(false);
+    addSquare(Vector3f(), 20.0f, appearance);
+    RenderBlock block(renderer, scene, camera);
+    block.setBackgroundColour(Colour4f(0, 1, 0, 1));
+    block.render();
+    block.setBackgroundColour(Colour4f(0, 0, 0, 1));
+    block.render();
+    const support::Picture frame = support::readFrame();
+    EXPECT_EQ(RED, frame.pixel(2, 61));
+    EXPECT_EQ(BLACK, frame.pixel(40, 20));
+}
+
+TEST_F(RenderBlockTest, keepsBuffersThatItIsNotToClear)
+{
+    const auto wall = addSquare(Vector3f(0, 0, 0), 20.0f, makePaint(Colour4f::RED));
+    const auto group = makeShared<RenderBlockGroup>();
+    const auto first = makeShared<RenderBlock>(renderer, scene, camera);
+    const auto other = makeShared<SceneNode>();
+    const auto behind = addSquare(Vector3f(0, 0, -1), 40.0f, makePaint(Colour4f::GREEN));
+    behind->setParent(other);
+    const auto second = makeShared<RenderBlock>(renderer, other, camera);
+    second->setBackgroundColour(Colour4f(0, 0, 1, 1));
+    second->setColourClear(false);
+    group->addBlock(first);
+    group->addBlock(second);
+
+    second->setDepthClear(false);
+    group->render();
+    EXPECT_EQ(RED, support::readFrame().pixel(32, 32)) << "the second scene is behind the first";
+    second->setDepthClear(true);
+    group->render();
+    EXPECT_EQ(GREEN, support::readFrame().pixel(32, 32));
+
+    group->removeBlock(second);
+    group->render();
+    EXPECT_EQ(RED, support::readFrame().pixel(32, 32));
+    group->update(7.0f);
+    group->render();
+    EXPECT_EQ(7.0f, property<float>("TIME"));
+    group->setStereo(9.0f, 0.0f);
+    EXPECT_EQ(9.0f, camera->getStereoFocalDistance());
+}
+
+// Fault caught: a block that draws nothing, or into a corner, because nobody gave it a viewport.
+TEST_F(RenderBlockTest, drawsToTheWholeTargetUnlessTold)
+{
+    addSquare(Vector3f(), 100.0f, makePaint(Colour4f::RED));
+    RenderBlock block(renderer, scene, camera);
+    RenderBlock inset(renderer, nullptr, camera);
+    inset.setViewport(0, 32, 32, 32);
+    inset.render();
+    block.render();
+    EXPECT_EQ(RED, support::readFrame().average()) << "although the inset left its viewport behind";
+
+    const SharedPtr<RenderTarget> target = makeTarget(128, 16);
+    block.setRenderTarget(target);
+    glcalls::startRecording();
+    block.render();
+    EXPECT_EQ(std::vector<std::string>{"glViewport(0, 0, 128, 16)"}, glcalls::recorded("glViewport"));
+    EXPECT_EQ(0u, RenderTarget::getBoundFramebuffer());
+    target->enable();
+    EXPECT_EQ(RED, support::readFramebuffer(0, 0, 128, 16).average());
+    target->disable();
+
+    RenderBlock(nullptr, nullptr, nullptr).render();
+}

@@ -1,0 +1,168 @@
+#include "orv/camera.h"
+#include "orv/light.h"
+#include "orv/scenenodevisitor.h"
+#include "orv/sceneutil.h"
+#include "orv/solid.h"
+
+#include <gtest/gtest.h>
+
+#include <string>
+
+using namespace orv;
+
+namespace
+{
+
+/// Writes down the initials of what it meets: n, s, c or l for the class, then the name.
+class Recorder : public SceneNodeVisitor
+{
+public:
+    void visit(SceneNode* node) override { add('n', *node); }
+    void visit(Solid* solid) override { add('s', *solid); }
+    void visit(Camera* camera) override { add('c', *camera); }
+    void visit(Light* light) override { add('l', *light); }
+
+    std::string text;
+
+private:
+    void add(char kind, const SceneNode& node)
+    {
+        text += text.empty() ? "" : " ";
+        text += kind;
+        text += node.getName();
+    }
+};
+
+struct Tree
+{
+    explicit Tree(uint32_t aFlags = 0, uint32_t bFlags = 0, uint32_t cFlags = 0, uint32_t dFlags = 0)
+    {
+        b->setParent(a);
+        c->setParent(b);
+        d->setParent(a);
+        c->setName("C");
+        a->setFlags(aFlags);
+        b->setFlags(bFlags);
+        c->setFlags(cFlags);
+        d->setFlags(dFlags);
+    }
+
+    SharedPtr<SceneNode> a = makeShared<SceneNode>("A");
+    SharedPtr<Light> b = makeShared<Light>("B");
+    SharedPtr<Solid> c = makeShared<Solid>();
+    SharedPtr<Camera> d = makeShared<Camera>("D");
+};
+
+} // namespace
+
+// Fault caught: a node class that hands itself over as another one, children before parents, or flags read in
+// the wrong polarity. The tree is A with the children B (with the child C) and D.
+TEST(SceneWalk, visitsWhatTheFlagsAdmit)
+{
+    const FlagMask none;
+    const FlagMask shown(1);
+    const FlagMask shownByDefault(1, 1);
+    const FlagMask inherited(2);
+    const FlagMask inheritedByDefault(4, 4);
+    const struct
+    {
+        const char* name;
+        uint32_t flags[4]; // of A, B, C, D, as stored
+        FlagMask render;
+        FlagMask recursive;
+        const char* visited;
+    } cases[] = {
+        {"no render flags: everything", {0, 0, 0, 0}, none, inherited, "nA lB sC cD"},
+        {"render flag only where set", {0, 1, 0, 1}, shown, inherited, "lB cD"},
+        {"render flag on by default", {0, 1, 0, 0}, shownByDefault, inherited, "nA sC cD"},
+        {"ordinary inherited flag admits all below", {0, 2, 0, 0}, shown, inherited, "lB sC"},
+        {"no inherited flag meant: admits all", {0, 0, 0, 0}, shown, none, "nA lB sC cD"},
+        {"inherited flag on by default", {1, 1, 1, 0}, shown, inheritedByDefault, "nA lB sC"},
+        {"switched off: the node itself and nothing below",
+         {1, 5, 1, 1},
+         shown,
+         inheritedByDefault,
+         "nA lB cD"},
+        {"switched off at the root", {4, 1, 1, 1}, shown, inheritedByDefault, "lB sC cD"},
+        {"both kinds, one lacking", {1, 1, 1, 1}, shown, FlagMask(6, 4), "nA lB sC cD"},
+        {"both kinds, lost on the way", {3, 5, 1, 1}, shown, FlagMask(6, 4), "nA lB cD"},
+        {"a render flag counts as inherited", {0, 2, 0, 0}, FlagMask(2), FlagMask(6, 4), "lB sC"},
+    };
+    for (const auto& c : cases)
+    {
+        SCOPED_TRACE(c.name);
+        const Tree tree(c.flags[0], c.flags[1], c.flags[2], c.flags[3]);
+        Recorder recorder;
+        visitScene(recorder, *tree.a, c.render, c.recursive);
+        EXPECT_EQ(c.visited, recorder.text);
+    }
+}
+
+TEST(SceneWalk, derivesFlagsFromThePath)
+{
+    const struct
+    {
+        const char* name;
+        uint32_t parentFlags;
+        uint32_t flags;
+        FlagMask mask;
+        bool expected;
+    } cases[] = {
+        {"ordinary, unset", 0, 0, FlagMask(1), false},
+        {"ordinary, set above", 1, 0, FlagMask(1), true},
+        {"one of two", 1, 0, FlagMask(3), false},
+        {"one each", 1, 2, FlagMask(3), true},
+        {"on by default", 0, 0, FlagMask(1, 1), true},
+        {"on by default, switched off above", 1, 0, FlagMask(1, 1), false},
+        {"other bits do not matter", 0xFFFFFFF0, 0xFF, FlagMask(1), true},
+        {"no flag meant", 0, 0, FlagMask(), true},
+    };
+    for (const auto& c : cases)
+    {
+        SCOPED_TRACE(c.name);
+        const Tree tree(c.parentFlags, c.flags);
+        EXPECT_EQ(c.expected, getDerivedFlags(*tree.b, c.mask));
+    }
+}
+
+// Fault caught: touching flags that are not meant, or forgetting the inverted polarity.
+TEST(SceneWalk, setsFlagsInStoredPolarity)
+{
+    SceneNode node;
+    node.setFlags(0xF0);
+    setFlags(node, FlagMask(0x3, 0x2), true);
+    EXPECT_EQ(0xF1u, node.getFlags());
+    setFlags(node, FlagMask(0x3, 0x2), false);
+    EXPECT_EQ(0xF2u, node.getFlags());
+    EXPECT_FALSE(getDerivedFlags(node, FlagMask(0x2, 0x2)));
+}
+
+// Fault caught: a node that looks beside its target under a parent that is turned and stretched.
+TEST(SceneWalk, pointsAtAPlaceInTheWorld)
+{
+    const auto parent = makeShared<SceneNode>();
+    parent->setPosition(Vector3f(1, -2, 3));
+    parent->setScale(Vector3f(1, 4, 0.5f));
+    parent->setRotation(quaternionFromAxisAngle(Vector3f::X_AXIS, Anglef::fromDegrees(75.0f)));
+    const auto node = makeShared<SceneNode>();
+    node->setParent(parent);
+    node->setPosition(Vector3f(2, 2, 2));
+
+    const Vector3f from = node->getWorldTransform().columns[3].xyz();
+    const Vector3f targets[] = {Vector3f(0, 0, 0), Vector3f(0, 9, 0), Vector3f(from.x, from.y + 3, from.z),
+                                Vector3f(from.x, from.y - 3, from.z), Vector3f(-50, 1, 8)};
+    for (const Vector3f& target : targets)
+    {
+        point(*node, target);
+        const Vector3f looks = normalize(-node->getWorldTransform().columns[2].xyz());
+        EXPECT_GT(dot(looks, normalize(target - from)), 0.99999f);
+    }
+
+    const Quaternionf before = node->getRotation();
+    point(*node, node->getWorldTransform().columns[3].xyz());
+    EXPECT_EQ(before, node->getRotation());
+
+    SceneNode root;
+    point(root, Vector3f(5, 0, 0), Vector3f(0, 0, 1));
+    EXPECT_GT(root.getWorldTransform().columns[1].z, 0.99999f);
+}

@@ -1,0 +1,172 @@
+#include "scenetest.h"
+
+#include "orv/indexbuffercache.h"
+#include "orv/mesh.h"
+#include "orv/vertexbuffercache.h"
+
+#include <GLES2/gl2.h>
+
+using namespace orv;
+using support::LogCapture;
+using support::Rgba;
+
+class SolidTest : public SceneTest
+{
+};
+
+TEST_F(SolidTest, clampsJointsPerVertex)
+{
+    const struct
+    {
+        int given, stored, warnings;
+    } cases[] = {{4, 4, 0}, {5, 4, 1}, {7, 4, 1}, {-2, 0, 0}};
+    for (const auto& c : cases)
+    {
+        LogCapture log;
+        Solid solid;
+        solid.setJointsPerVertex(c.given);
+        EXPECT_EQ(c.stored, solid.getJointsPerVertex());
+        EXPECT_EQ(c.warnings, log.count('W'));
+        EXPECT_EQ(c.warnings > 0,
+                  log.contains(" is greater than the maximum joints per vertex; clamping to 4"));
+    }
+}
+
+// Faults caught: factors in the wrong order, an unbound joint collapsing its vertices, a count over the limit
+// reported for every joint.
+TEST_F(SolidTest, jointsMoveTheMeshIntoTheWorld)
+{
+    const auto solid = makeShared<Solid>();
+    solid->setParent(scene);
+    solid->setPosition(Vector3f(0, 5, 0));
+    solid->setBindShapeTransform(scaleMatrix(Vector3f(2, 2, 2)));
+    const auto joint = makeShared<SceneNode>();
+    joint->setPosition(Vector3f(1, 0, 0));
+    joint->setRotation(quaternionFromAxisAngle(Vector3f::Z_AXIS, Anglef::fromDegrees(90.0f)));
+    solid->attachJoint(joint, translationMatrix(Vector3f(-3, 0, 0)));
+    solid->attachJoint(nullptr, translationMatrix(Vector3f(-3, 0, 0)));
+
+    const Vector4f moved = solid->getJointTransform(0) * Vector4f(2, 0, 0, 1);
+    EXPECT_NEAR(1.0f, moved.x, 1e-5f);
+    EXPECT_NEAR(1.0f, moved.y, 1e-5f);
+    EXPECT_EQ(Vector4f(4, 5, 0, 1), solid->getJointTransform(1) * Vector4f(2, 0, 0, 1)) << "rest pose";
+
+    renderer->visit(static_cast<SceneNode*>(nullptr)); // plain nodes mean nothing to the renderer
+    solid->setMesh(createSquare(*pool, Vector2f(1, 1))->getMesh());
+    solid->setAppearance(makePaint(Colour4f::WHITE));
+    render();
+    EXPECT_EQ(2, property<int>("J_COUNT"));
+    EXPECT_EQ(solid->getJointTransform(1), property<Matrix4f>("J_WORLD", 1));
+
+    LogCapture log;
+    while (solid->getJointCount() < 23)
+        solid->attachJoint(joint, Matrix4f::IDENTITY);
+    EXPECT_EQ(1, log.count('E'));
+    render();
+    EXPECT_EQ(20, property<int>("J_COUNT"));
+}
+
+// Fault caught: a solid below its own joint that keeps both alive for ever, or reads the joint after its end.
+TEST_F(SolidTest, doesNotOwnTheJointsAboveIt)
+{
+    auto joint = makeShared<SceneNode>();
+    joint->setPosition(Vector3f(1, 0, 0));
+    const auto solid = makeShared<Solid>();
+    solid->setParent(joint);
+    solid->attachJoint(joint, translationMatrix(Vector3f(0, 1, 0)));
+    EXPECT_EQ(1, joint->sharedGetCount());
+    EXPECT_EQ(translationMatrix(Vector3f(1, 1, 0)), solid->getJointTransform(0));
+    joint = nullptr;
+    EXPECT_EQ(Matrix4f::IDENTITY, solid->getJointTransform(0)) << "unbound";
+}
+
+// Fault caught: mirrored solids turned inside out, or the appearance's own winding forgotten.
+TEST_F(SolidTest, turnsTheWindingOfMirroredSolids)
+{
+    const auto appearance = makePaint(Colour4f::WHITE);
+    const auto solid = addSquare(Vector3f(), 1.0f, appearance);
+    const struct
+    {
+        const char* name;
+        float sceneScale;
+        float scale;
+        WindingOrder order;
+        const char* expected; // the cached state starts counter-clockwise, 0x0901
+    } cases[] = {
+        {"plain", 1, 1, WindingOrder::WINDING_CCW, ""},
+        {"mirrored", 1, -1, WindingOrder::WINDING_CCW, "glFrontFace(0x0900)"},
+        {"mirrored by the parent as well", -1, -1, WindingOrder::WINDING_CCW, "glFrontFace(0x0901)"},
+        {"mirrored by the parent", -1, 1, WindingOrder::WINDING_CCW, "glFrontFace(0x0900)"},
+        {"and the appearance is clockwise", -1, 1, WindingOrder::WINDING_CW, "glFrontFace(0x0901)"},
+    };
+    for (const auto& c : cases)
+    {
+        SCOPED_TRACE(c.name);
+        scene->setScale(Vector3f(c.sceneScale, 1, 1));
+        solid->setScale(Vector3f(1, c.scale, 1));
+        appearance->setWindingOrder(c.order);
+        glcalls::startRecording();
+        render();
+        const std::vector<std::string> calls = glcalls::recorded("glFrontFace");
+        EXPECT_EQ(c.expected, calls.empty() ? "" : calls.back());
+    }
+}
+
+// Fault caught: the buffers of a mesh read by a program that was never told about them, or by none.
+TEST_F(SolidTest, drawsWithTheCurrentProgramWhenItHasNone)
+{
+    const auto square = addSquare(Vector3f(), 1.0f, makeShared<Appearance>());
+    glcalls::resetCounts();
+    square->draw(*renderContext);
+    EXPECT_EQ(0u, glcalls::count(glDrawElements));
+
+    // The current program's values are those of its last use: red, over the whole view.
+    const auto painted = addSquare(Vector3f(), 100.0f, makePaint(Colour4f::RED));
+    square->setParent(nullptr);
+    renderContext->setViewport(0, 0, 1, 1);
+    renderFrame();
+    renderContext->setViewport(0, 0, 64, 64);
+    square->draw(*renderContext);
+    EXPECT_EQ((Rgba{255, 0, 0, 255}), support::readFrame().pixel(32, 32));
+
+    glUseProgram(0); // behind the engine's back, so it is told
+    detail::bindingsChanged();
+    glcalls::resetCounts();
+    square->draw(*renderContext);
+    Solid().draw(*renderContext);
+    painted->getAppearance()->setShaderProgram(nullptr);
+    painted->draw(*renderContext);
+    EXPECT_EQ(0u, glcalls::count(glDrawElements));
+}
+
+// Fault caught: garbage drawn from what a lost context has left of a solid.
+TEST_F(SolidTest, drawsNothingWithoutAllOfItsParts)
+{
+    const auto square = addSquare(Vector3f(), 1.0f, makePaint(Colour4f::RED));
+    const auto inOrder =
+        create(*pool->getIndexBufferCache(), IndexBuffer::Primitive::TRIANGLE_FAN, 4, nullptr);
+    const VertexBuffer::Ptr vertices = square->getMesh()->getVertexBuffer();
+    square->setMesh(makeShared<Mesh>(MeshHeader(), inOrder, vertices));
+    square->draw(*renderContext);
+    EXPECT_EQ(1u, glcalls::count(glDrawArrays));
+
+    replaceContext();
+    const auto fresh = makeShared<RenderContext>();
+    pool->getVertexBufferCache()->getResourceCache()->release();
+    square->getAppearance()->setShaderProgram(makeProgram("void main() { gl_Position = vec4(1.0); }",
+                                                          "void main() { gl_FragColor = vec4(1.0); }", {}));
+    glcalls::resetCounts();
+    square->draw(*fresh);
+    EXPECT_EQ(0u, glcalls::count(glDrawArrays)) << "vertices lost";
+
+    square->setMesh(createSquare(*pool, Vector2f(1, 1))->getMesh());
+    glcalls::resetCounts();
+    square->draw(*fresh);
+    EXPECT_EQ(1u, glcalls::count(glDrawElements));
+    pool->getShaderProgramCache()->getResourceCache()->release();
+    glcalls::resetCounts();
+    square->draw(*fresh);
+    EXPECT_EQ(0u, glcalls::count(glDrawElements)) << "program lost";
+    pool->release();
+    replaceContext();
+}
