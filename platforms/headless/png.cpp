@@ -1,0 +1,44 @@
+#include "headless/png.h"
+
+#include <cerrno>
+#include <cstdio>
+#include <cstring>
+
+#include <unistd.h>
+
+#define STB_IMAGE_WRITE_IMPLEMENTATION
+#define STB_IMAGE_WRITE_STATIC
+#pragma GCC diagnostic push
+#pragma GCC diagnostic ignored "-Wunused-function"
+#include <stb/stb_image_write.h>
+#pragma GCC diagnostic pop
+
+namespace headless
+{
+
+bool writePng(const std::string& path, int width, int height, const uint8_t* rgba, std::string& error)
+{
+    const std::string temporary = path + ".tmp" + std::to_string(getpid());
+    std::FILE* file = std::fopen(temporary.c_str(), "wb");
+    if (!file)
+    {
+        error = path + ": cannot be written: " + std::strerror(errno);
+        return false;
+    }
+
+    const auto write = [](void* context, void* data, int size)
+    { std::fwrite(data, 1, size_t(size), static_cast<std::FILE*>(context)); };
+    errno = 0;
+    bool isWritten = stbi_write_png_to_func(write, file, width, height, 4, rgba, width * 4) != 0;
+    isWritten = !std::ferror(file) && isWritten;
+    isWritten = std::fclose(file) == 0 && isWritten; // a full disk may show only here
+    isWritten = isWritten && std::rename(temporary.c_str(), path.c_str()) == 0;
+    if (isWritten)
+        return true;
+
+    error = path + ": cannot be written: " + (errno ? std::strerror(errno) : "the picture is too large");
+    std::remove(temporary.c_str());
+    return false;
+}
+
+} // namespace headless

@@ -1,0 +1,132 @@
+#include "headless/headless.h"
+
+#include "headless/png.h"
+#include "support/gltest.h"
+#include "support/picture.h"
+#include "support/tempdir.h"
+
+using support::GlTest;
+using support::Picture;
+using support::Rgba;
+
+namespace
+{
+
+class HeadlessTest : public GlTest
+{
+};
+
+void clearRegion(int x, int y, int width, int height, float r, float g, float b)
+{
+    glEnable(GL_SCISSOR_TEST);
+    glScissor(x, y, width, height);
+    glClearColor(r, g, b, 1.0f);
+    glClear(GL_COLOR_BUFFER_BIT);
+    glDisable(GL_SCISSOR_TEST);
+}
+
+} // namespace
+
+// Fault caught: a picture upside down or one row off, which would make every later picture test lie.
+TEST_F(HeadlessTest, readsTheTopRowFirst)
+{
+    clearRegion(0, 0, 64, 64, 0.0f, 0.0f, 1.0f);
+    clearRegion(0, 63, 32, 1, 1.0f, 0.0f, 0.0f); // the upper left, as GL counts
+    const Picture frame = support::readFrame();
+    EXPECT_EQ((Rgba{255, 0, 0, 255}), frame.pixel(0, 0));
+    EXPECT_EQ((Rgba{255, 0, 0, 255}), frame.pixel(31, 0));
+    EXPECT_EQ((Rgba{0, 0, 255, 255}), frame.pixel(32, 0));
+    EXPECT_EQ((Rgba{0, 0, 255, 255}), frame.pixel(0, 1));
+}
+
+// Fault caught: reading whatever framebuffer a test left bound, or leaving another one bound.
+TEST_F(HeadlessTest, readsTheSurfaceWhateverIsBound)
+{
+    clearRegion(0, 0, 64, 64, 0.0f, 1.0f, 0.0f);
+    GLuint framebuffer;
+    glGenFramebuffers(1, &framebuffer);
+    glBindFramebuffer(GL_FRAMEBUFFER, framebuffer);
+    EXPECT_EQ((Rgba{0, 255, 0, 255}), support::readFrame().average());
+    GLint bound = 0;
+    glGetIntegerv(GL_FRAMEBUFFER_BINDING, &bound);
+    EXPECT_EQ(GLint(framebuffer), bound);
+    glDeleteFramebuffers(1, &framebuffer);
+}
+
+TEST_F(HeadlessTest, contextsAreSeparate)
+{
+    clearRegion(0, 0, 64, 64, 1.0f, 0.0f, 0.0f);
+    const auto other = makeContext(16, 8);
+    EXPECT_FALSE(context().isCurrent());
+    EXPECT_TRUE(context().readPixels().empty());
+    clearRegion(0, 0, 16, 8, 0.0f, 1.0f, 0.0f);
+    EXPECT_EQ(size_t(16 * 8 * 4), other->readPixels().size());
+    ASSERT_TRUE(context().makeCurrent());
+    EXPECT_EQ((Rgba{255, 0, 0, 255}), support::readFrame().average());
+}
+
+TEST_F(HeadlessTest, givesTheBitsAskedFor)
+{
+    headless::Options options;
+    options.depthBits = 0;
+    options.stencilBits = 0;
+    options.samples = 1000; // more than any driver has: does without
+    std::string error;
+    const auto plain = headless::Context::create(options, error);
+    ASSERT_TRUE(plain) << error;
+    GLint bits[6];
+    const GLenum names[] = {GL_RED_BITS,   GL_GREEN_BITS, GL_BLUE_BITS,
+                            GL_ALPHA_BITS, GL_DEPTH_BITS, GL_STENCIL_BITS};
+    for (int i = 0; i < 6; ++i)
+        glGetIntegerv(names[i], &bits[i]);
+    EXPECT_EQ((std::vector<int>{8, 8, 8, 8, 0, 0}), (std::vector<int>(bits, bits + 6)));
+    ASSERT_TRUE(context().makeCurrent());
+    glGetIntegerv(GL_DEPTH_BITS, &bits[4]);
+    glGetIntegerv(GL_STENCIL_BITS, &bits[5]);
+    EXPECT_LE(24, bits[4]);
+    EXPECT_LE(8, bits[5]);
+}
+
+// Fault caught: a failure without a reason, or one that takes the current context away.
+TEST_F(HeadlessTest, failureNamesTheReasonAndChangesNothing)
+{
+    struct Case
+    {
+        headless::Options options;
+        const char* reason;
+    };
+    const Case cases[] = {
+        {{0, 64, 24, 8, 0}, "0 x 64"},
+        {{64, -1, 24, 8, 0}, "64 x -1"},
+        {{64, 64, 999, 8, 0}, "depth 999"},
+    };
+    for (const Case& bad : cases)
+    {
+        std::string error;
+        EXPECT_FALSE(headless::Context::create(bad.options, error));
+        EXPECT_NE(std::string::npos, error.find(bad.reason)) << error;
+    }
+    EXPECT_TRUE(context().isCurrent());
+}
+
+// Fault caught: a PNG with its rows or channels turned round, or half a file left where a write failed.
+TEST(Png, isWrittenWholeOrNotAtAll)
+{
+    support::TempDir directory;
+    Picture picture = Picture::filled(3, 2, {10, 20, 30, 255});
+    picture.setPixel(2, 0, {200, 100, 50, 128});
+    std::string error;
+    ASSERT_TRUE(headless::writePng(directory.path("a.png"), 3, 2, picture.rgba.data(), error)) << error;
+
+    const Picture read = support::readPng(directory.path("a.png"));
+    EXPECT_TRUE(support::comparePictures("png", picture, read, {.perChannel = 0}));
+
+    directory.write("taken/file", "a directory in the way");
+    const std::string bad[] = {directory.path("missing/a.png"), directory.path("taken")};
+    for (const std::string& path : bad)
+    {
+        EXPECT_FALSE(headless::writePng(path, 3, 2, picture.rgba.data(), error));
+        EXPECT_EQ(0u, error.find(path + ": ")) << error;
+    }
+    EXPECT_EQ((std::vector<std::string>{"a.png", "taken"}), directory.list());
+}

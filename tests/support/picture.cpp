@@ -1,0 +1,209 @@
+#include "support/picture.h"
+
+#include "headless/headless.h"
+#include "headless/png.h"
+
+#include <EGL/egl.h>
+#include <GLES2/gl2.h>
+
+#define STB_IMAGE_IMPLEMENTATION
+#define STB_IMAGE_STATIC
+#define STBI_ONLY_PNG
+#pragma GCC diagnostic push
+#pragma GCC diagnostic ignored "-Wunused-function"
+#include <stb/stb_image.h>
+#pragma GCC diagnostic pop
+
+#include <algorithm>
+#include <cstdlib>
+
+namespace support
+{
+
+namespace
+{
+
+constexpr int DIFFERENCE_GAIN = 8; // a channel off by 32 shows as white
+
+int largestDifference(const Rgba& a, const Rgba& b)
+{
+    return std::max({std::abs(a.r - b.r), std::abs(a.g - b.g), std::abs(a.b - b.b), std::abs(a.a - b.a)});
+}
+
+Picture makeDifference(const Picture& a, const Picture& b)
+{
+    Picture difference = Picture::filled(a.width, a.height, {});
+    for (size_t i = 0; i < a.rgba.size(); ++i)
+    {
+        const int gained = std::abs(a.rgba[i] - b.rgba[i]) * DIFFERENCE_GAIN;
+        if (i % 4 != 3)
+            difference.rgba[i] = uint8_t(std::min(gained, 255));
+    }
+    return difference;
+}
+
+std::string save(const std::string& path, const Picture& picture)
+{
+    std::string error;
+    if (picture.width <= 0 || picture.height <= 0)
+        return path + ": empty picture";
+    if (!headless::writePng(path, picture.width, picture.height, picture.rgba.data(), error))
+        return error;
+    return path;
+}
+
+} // namespace
+
+std::ostream& operator<<(std::ostream& stream, const Rgba& colour)
+{
+    return stream << "(" << int(colour.r) << " " << int(colour.g) << " " << int(colour.b) << " "
+                  << int(colour.a) << ")";
+}
+
+bool isNear(const Rgba& a, const Rgba& b, int tolerance)
+{
+    return largestDifference(a, b) <= tolerance;
+}
+
+Picture Picture::filled(int width, int height, const Rgba& colour)
+{
+    Picture picture{width, height, std::vector<uint8_t>(size_t(width) * size_t(height) * 4)};
+    picture.fillRectangle(0, 0, width, height, colour);
+    return picture;
+}
+
+Rgba Picture::pixel(int x, int y) const
+{
+    if (x < 0 || y < 0 || x >= width || y >= height)
+    {
+        ADD_FAILURE() << "pixel " << x << ", " << y << " is outside " << width << " x " << height;
+        return {0, 0, 0, 0};
+    }
+    const uint8_t* bytes = &rgba[(size_t(y) * size_t(width) + size_t(x)) * 4];
+    return {bytes[0], bytes[1], bytes[2], bytes[3]};
+}
+
+void Picture::setPixel(int x, int y, const Rgba& colour)
+{
+    if (x < 0 || y < 0 || x >= width || y >= height)
+        return;
+    uint8_t* bytes = &rgba[(size_t(y) * size_t(width) + size_t(x)) * 4];
+    bytes[0] = colour.r;
+    bytes[1] = colour.g;
+    bytes[2] = colour.b;
+    bytes[3] = colour.a;
+}
+
+void Picture::fillRectangle(int x, int y, int rectWidth, int rectHeight, const Rgba& colour)
+{
+    for (int row = y; row < y + rectHeight; ++row)
+    {
+        for (int column = x; column < x + rectWidth; ++column)
+            setPixel(column, row, colour);
+    }
+}
+
+Rgba Picture::average(int x, int y, int regionWidth, int regionHeight) const
+{
+    const int count = regionWidth * regionHeight;
+    long sums[4] = {};
+    if (count <= 0)
+    {
+        ADD_FAILURE() << "an empty region has no average";
+        return {0, 0, 0, 0};
+    }
+    for (int row = y; row < y + regionHeight; ++row)
+    {
+        for (int column = x; column < x + regionWidth; ++column)
+        {
+            const Rgba colour = pixel(column, row);
+            sums[0] += colour.r;
+            sums[1] += colour.g;
+            sums[2] += colour.b;
+            sums[3] += colour.a;
+        }
+    }
+    const auto mean = [&](int channel) { return uint8_t((sums[channel] + count / 2) / count); };
+    return {mean(0), mean(1), mean(2), mean(3)};
+}
+
+Rgba Picture::average() const
+{
+    return average(0, 0, width, height);
+}
+
+Picture readFrame()
+{
+    EGLint width = 0;
+    EGLint height = 0;
+    EGLSurface surface = eglGetCurrentSurface(EGL_DRAW);
+    eglQuerySurface(eglGetCurrentDisplay(), surface, EGL_WIDTH, &width);
+    eglQuerySurface(eglGetCurrentDisplay(), surface, EGL_HEIGHT, &height);
+    GLint bound = 0;
+    glGetIntegerv(GL_FRAMEBUFFER_BINDING, &bound);
+    glBindFramebuffer(GL_FRAMEBUFFER, 0);
+    Picture frame = readFramebuffer(0, 0, width, height);
+    glBindFramebuffer(GL_FRAMEBUFFER, GLuint(bound));
+    return frame;
+}
+
+Picture readFramebuffer(int x, int y, int width, int height)
+{
+    return {width, height, headless::readFramebuffer(x, y, width, height)};
+}
+
+Picture readPng(const std::string& path)
+{
+    Picture picture;
+    int channels = 0;
+    stbi_uc* pixels = stbi_load(path.c_str(), &picture.width, &picture.height, &channels, 4);
+    if (!pixels)
+    {
+        ADD_FAILURE() << path << ": " << stbi_failure_reason();
+        return {};
+    }
+    picture.rgba.assign(pixels, pixels + size_t(picture.width) * size_t(picture.height) * 4);
+    stbi_image_free(pixels);
+    return picture;
+}
+
+testing::AssertionResult comparePictures(const std::string& name, const Picture& expected,
+                                         const Picture& actual, const Tolerance& tolerance)
+{
+    const bool isSameSize = expected.width == actual.width && expected.height == actual.height;
+    const int count = expected.width * expected.height;
+    int differing = 0;
+    int largest = 0;
+    std::string firstPlace;
+    for (int i = 0; isSameSize && i < count; ++i)
+    {
+        const int x = i % expected.width;
+        const int y = i / expected.width;
+        const int difference = largestDifference(expected.pixel(x, y), actual.pixel(x, y));
+        largest = std::max(largest, difference);
+        if (difference > tolerance.perChannel && differing++ == 0)
+            firstPlace = std::to_string(x) + ", " + std::to_string(y);
+    }
+    if (isSameSize && differing <= tolerance.differingShare * count)
+        return testing::AssertionSuccess();
+
+    testing::AssertionResult failure = testing::AssertionFailure() << name << ": ";
+    if (!isSameSize)
+        failure << "expected " << expected.width << " x " << expected.height << " pixels, came "
+                << actual.width << " x " << actual.height;
+    else
+        failure << differing << " of " << count << " pixels differ by more than " << tolerance.perChannel
+                << " (largest " << largest << ", first at " << firstPlace << ")";
+    failure << "\n  " << save(name + "-actual.png", actual) << "\n  "
+            << save(name + "-expected.png", expected);
+    if (isSameSize)
+        failure << "\n  " << save(name + "-difference.png", makeDifference(expected, actual));
+    return failure;
+}
+
+std::string savePicture(const std::string& name, const Picture& actual)
+{
+    return save(name + "-actual.png", actual);
+}
+
+} // namespace support
