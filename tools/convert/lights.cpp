@@ -1,0 +1,107 @@
+#include "lights.h"
+
+#include <assimp/camera.h>
+#include <assimp/light.h>
+
+#include <algorithm>
+#include <cmath>
+
+namespace convert
+{
+
+namespace
+{
+
+constexpr float PHYSICAL = 4.0f; ///< a light that is brighter is in physical units, which the engine has not
+constexpr float SPENT = 0.02f;   ///< of a light's strength: where it ends
+
+/// What comes through at a distance, by the model's three factors.
+float attenuate(const aiLight& light, float distance)
+{
+    const float divisor = float(light.mAttenuationConstant + light.mAttenuationLinear * distance +
+                                light.mAttenuationQuadratic * distance * distance);
+    return divisor > 0.0f ? 1.0f / divisor : 1.0f;
+}
+
+void setAttenuation(const aiLight& light, float strength, glo::LightDefinition& made)
+{
+    made.attenuated = light.mAttenuationLinear > 0.0f || light.mAttenuationQuadratic > 0.0f;
+    if (made.attenuated == 0)
+        return;
+    made.attenuationNear = 0.0f;
+    float distance = 1e-3f;
+    while (distance < 1e6f && strength * attenuate(light, distance) > SPENT)
+        distance *= 1.1f;
+    made.attenuationFar = distance;
+}
+
+} // namespace
+
+bool convertLight(const aiLight& light, bool isGltf, glo::LightDefinition& made, Report& report)
+{
+    switch (light.mType)
+    {
+    case aiLightSource_DIRECTIONAL: made.type = glo::light::DIRECTIONAL; break;
+    case aiLightSource_POINT: made.type = glo::light::POINT; break;
+    case aiLightSource_SPOT: made.type = glo::light::SPOT; break;
+    case aiLightSource_AREA:
+        made.type = glo::light::POINT;
+        report.lose("the extent of an area light (a point light instead)");
+        break;
+    default: report.lose("an ambient light (the engine's lights have places)"); return false;
+    }
+    const aiColor3D& colour = light.mColorDiffuse;
+    const float strength = std::max({float(colour.r), float(colour.g), float(colour.b)});
+    if (!(strength > 0.0f) || !std::isfinite(strength))
+    {
+        report.lose("a light without any brightness");
+        return false;
+    }
+    made.colour = orv::Vector3f(colour.r / strength, colour.g / strength, colour.b / strength);
+    made.intensity = strength;
+    if (light.mAttenuationConstant > 0.0f && light.mType != aiLightSource_DIRECTIONAL)
+        made.intensity = strength / float(light.mAttenuationConstant);
+    if (made.intensity > PHYSICAL)
+    {
+        report.lose("the brightness of a light in physical units (1 instead)");
+        made.intensity = 1.0f;
+    }
+    made.attenuated = 0;
+    if (light.mType != aiLightSource_DIRECTIONAL)
+        setAttenuation(light, strength, made);
+    if (light.mType == aiLightSource_SPOT)
+    {
+        const float factor = isGltf ? 2.0f : 1.0f;
+        made.spotInner = float(light.mAngleInnerCone) * factor;
+        made.spotOuter = std::max(made.spotInner, float(light.mAngleOuterCone) * factor);
+    }
+    return true;
+}
+
+glo::CameraDefinition convertCamera(const aiCamera& camera, bool isGltf)
+{
+    glo::CameraDefinition made;
+    made.farDistance = camera.mClipPlaneFar > 0.0f ? float(camera.mClipPlaneFar) : 1000.0f;
+    made.nearDistance = float(camera.mClipPlaneNear);
+    if (!(made.nearDistance > 0.0f && made.nearDistance < made.farDistance))
+        made.nearDistance = made.farDistance / 1000.0f;
+    if (camera.mOrthographicWidth > 0.0f)
+    {
+        made.projection = glo::projection::ORTHOGRAPHIC;
+        made.width = 2.0f * float(camera.mOrthographicWidth);
+        return made;
+    }
+    // The model's angle is from left to right, the engine's spans the shorter side.
+    const float angle = float(camera.mHorizontalFOV);
+    if (!(angle > 0.0f && angle < 3.1f))
+        return made;
+    made.fieldOfView = angle;
+    const float aspect = camera.mAspect > 0.0f ? float(camera.mAspect) : 1.0f;
+    if (isGltf)
+        made.fieldOfView = angle / aspect; // the importer stretches the upright angle to this one
+    else if (aspect > 1.0f)
+        made.fieldOfView = 2.0f * std::atan(std::tan(angle * 0.5f) / aspect);
+    return made;
+}
+
+} // namespace convert

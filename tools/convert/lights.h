@@ -1,0 +1,18 @@
+#pragma once
+
+#include "glo/glowriter.h"
+#include "report.h"
+
+struct aiCamera;
+struct aiLight;
+
+namespace convert
+{
+
+/// @param isGltf  whose cone angles are taken from the axis, not from edge to edge.
+/// @return false, with the loss reported, for a kind of light that the engine does not have.
+bool convertLight(const aiLight& light, bool isGltf, glo::LightDefinition& made, Report& report);
+
+glo::CameraDefinition convertCamera(const aiCamera& camera, bool isGltf);
+
+} // namespace convert

@@ -1,0 +1,27 @@
+#pragma once
+
+#include "glo/glowriter.h"
+#include "names.h"
+#include "textures.h"
+
+struct aiMaterial;
+
+namespace convert
+{
+
+/// A material, and what its meshes need to know of it.
+struct ConvertedMaterial
+{
+    glo::Material material;
+    unsigned uvChannel = 0; ///< of the model's texture coordinates, the one to take
+    bool hasNormalMap = false;
+};
+
+/// @param wanted  the channel of texture coordinates that the material's pictures ask for.
+unsigned findUvChannel(const aiMaterial& material);
+
+/// @param repeats  texture coordinates leave the pictures.
+ConvertedMaterial convertMaterial(const aiMaterial& material, bool repeats, TextureStore& textures,
+                                  NameMaker& names, Report& report);
+
+} // namespace convert

@@ -1,0 +1,31 @@
+#pragma once
+
+#include "glo/glowriter.h"
+#include "report.h"
+#include "textures.h"
+
+#include <string>
+#include <vector>
+
+namespace convert
+{
+
+/// A model as it is to be written.
+struct ConvertedModel
+{
+    glo::GloScene scene;
+    std::vector<OutputFile> textures;
+    Report report;
+    unsigned nodeCount = 0; ///< of the model; the scene has some more
+    size_t vertexCount = 0;
+    size_t triangleCount = 0;
+};
+
+/// Reads a model file and makes a scene of it.
+/// @param stem   names the scene and begins the names of its pictures.
+/// @param fps    samples per second of animations.
+/// @param error  why not.
+bool convertModel(const std::string& path, const std::string& stem, double fps, ConvertedModel& model,
+                  std::string& error);
+
+} // namespace convert

@@ -1,0 +1,29 @@
+#pragma once
+
+#include <set>
+#include <string>
+
+namespace convert
+{
+
+/// Makes names that a scene file can hold and that are borne only once.
+class NameMaker
+{
+public:
+    /// @param wanted    as the model has it; taken if it is free.
+    /// @param fallback  for an empty one.
+    std::string make(const std::string& wanted, const std::string& fallback)
+    {
+        constexpr size_t LONGEST = 1000; // of 1023, with room for a number
+        const std::string stem = wanted.empty() ? fallback : wanted.substr(0, LONGEST);
+        std::string name = stem;
+        for (int number = 2; !m_taken.insert(name).second; ++number)
+            name = stem + " " + std::to_string(number);
+        return name;
+    }
+
+private:
+    std::set<std::string> m_taken;
+};
+
+} // namespace convert

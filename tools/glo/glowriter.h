@@ -1,0 +1,37 @@
+#pragma once
+
+#include "orv/detail/glorecords.h"
+
+#include <cstdint>
+#include <string>
+#include <vector>
+
+/// The writing side of scene files: fill a GloScene, write it.
+namespace glo
+{
+
+using namespace orv::detail::glo;
+
+/// Writes a scene in the version that its info names.
+/// @param file   replaced by the bytes of the whole file.
+/// @param error  what cannot be written: a version that is not known, something that the version does not have,
+///               a text that is too long.
+/// @return false on an error; file is not to be used then.
+bool writeGlo(const GloScene& scene, std::vector<uint8_t>& file, std::string& error);
+
+/// Values of one attribute for all vertices.
+struct FloatAttribute
+{
+    std::string name;
+    int componentCount;
+    std::vector<float> values; ///< vertex by vertex
+};
+
+/// Interleaves attributes in their order.
+/// @param attributes  all for the same number of vertices.
+VertexSet makeVertexSet(const std::vector<FloatAttribute>& attributes);
+
+/// Appends a key of floats to a channel. All keys of a channel have the same number of values.
+void addKey(Channel& channel, float time, const std::vector<float>& values);
+
+} // namespace glo
