@@ -1,0 +1,249 @@
+// The show-piece: what the engine can do, in one picture. A bumpy tiled floor, crates, a chrome ball that reflects
+// the sky, glass, a planar mirror with a program of its own, a spot light and a point light, and a converted
+// model that drives past with its own animation.
+//
+//   build/default/examples/showpiece --out showpiece.png [--model truck.glo] [--time 2.5] [--stereo] [--size 960x540]
+
+#include "headless/headless.h"
+#include "headless/png.h"
+
+#include <orv/orv.h>
+
+#include <cmath>
+#include <cstdio>
+#include <cstring>
+#include <string>
+
+using namespace orv;
+
+namespace
+{
+
+struct Arguments
+{
+    std::string out = "showpiece.png";
+    std::string model; ///< path of a .glo; none leaves the road empty
+    float time = 2.5f; ///< seconds
+    bool stereo = false;
+    int width = 960;
+    int height = 540;
+};
+
+bool parse(int argc, char** argv, Arguments& arguments)
+{
+    for (int i = 1; i < argc; ++i)
+    {
+        const bool hasValue = i + 1 < argc;
+        if (!std::strcmp(argv[i], "--stereo"))
+            arguments.stereo = true;
+        else if (!std::strcmp(argv[i], "--out") && hasValue)
+            arguments.out = argv[++i];
+        else if (!std::strcmp(argv[i], "--model") && hasValue)
+            arguments.model = argv[++i];
+        else if (!std::strcmp(argv[i], "--time") && hasValue)
+            arguments.time = std::strtof(argv[++i], nullptr);
+        else if (!std::strcmp(argv[i], "--size") && hasValue)
+        {
+            if (std::sscanf(argv[++i], "%dx%d", &arguments.width, &arguments.height) != 2)
+                return false;
+        }
+        else
+            return false;
+    }
+    return arguments.width > 0 && arguments.height > 0;
+}
+
+/// Puts a solid into the scene, wearing the appearance file of that name.
+bool place(const SharedPtr<Solid>& solid, const char* appearance, AssetCachePool& pool,
+           const SharedPtr<SceneNode>& parent, const Vector3f& position, const Vector3f& scale)
+{
+    if (!solid)
+        return false; // the log says why
+    solid->setAppearance(loadAppearance(pool, appearance));
+    solid->setPosition(position);
+    solid->setScale(scale);
+    solid->setParent(parent, false);
+    return bool(solid->getAppearance()->getShaderProgram());
+}
+
+/// A square in the plane y = 0 with the tangents that a bump map needs: side 1, texture upright seen from +z.
+SharedPtr<Solid> createFloor(AssetCachePool& pool)
+{
+    struct Attribute
+    {
+        const char* name;
+        int componentCount;
+        float values[4][3];
+    };
+    const Attribute attributes[] = {
+        {"a_position", 3, {{-0.5f, 0, 0.5f}, {0.5f, 0, 0.5f}, {0.5f, 0, -0.5f}, {-0.5f, 0, -0.5f}}},
+        {"a_normal", 3, {{0, 1, 0}, {0, 1, 0}, {0, 1, 0}, {0, 1, 0}}},
+        {"a_tangent", 3, {{1, 0, 0}, {1, 0, 0}, {1, 0, 0}, {1, 0, 0}}},
+        {"a_binormal", 3, {{0, 0, -1}, {0, 0, -1}, {0, 0, -1}, {0, 0, -1}}},
+        {"a_uv0", 2, {{0, 0}, {1, 0}, {1, 1}, {0, 1}}},
+    };
+    const SharedPtr<VertexBuffer> vertices = pool.getVertexBufferCache()->create(nullptr);
+    for (const Attribute& attribute : attributes)
+    {
+        const auto array = makeShared<VertexArray>(4, int(sizeof(float)), attribute.componentCount);
+        float* out = array->getData<float>();
+        for (const float(&value)[3] : attribute.values)
+            for (int i = 0; i < attribute.componentCount; ++i)
+                *out++ = value[i];
+        vertices->addAttrib(array, attribute.name, VertexBuffer::AttribFormat::FLOAT,
+                            VertexBuffer::AttribUsage::GL_BUFFER, false);
+    }
+    vertices->commit();
+
+    const unsigned short indices[] = {0, 1, 2, 0, 2, 3};
+    const SharedPtr<IndexBuffer> triangles =
+        pool.getIndexBufferCache()->create(IndexBuffer::Primitive::TRIANGLES, 6, indices, nullptr);
+    triangles->commit();
+    return makeShared<Solid>(pool.getMeshCache()->create(MeshHeader(), triangles, vertices, nullptr),
+                             nullptr);
+}
+
+void addLights(const SharedPtr<SceneNode>& scene)
+{
+    const auto sun = makeShared<Light>("sun");
+    sun->setLightType(Light::LightType::DIRECTIONAL);
+    sun->setColour(Colour4f(0.62f, 0.60f, 0.56f, 1.0f));
+    sun->setAmbientLevel(0.45f);
+    sun->setPosition(Vector3f(4.5f, 6.5f, 7.0f));
+    sun->setParent(scene, false);
+    point(*sun, Vector3f());
+
+    const auto spot = makeShared<Light>("spot");
+    spot->setLightType(Light::LightType::SPOT);
+    spot->setColour(Colour4f(1.0f, 0.85f, 0.55f, 1.0f));
+    spot->setIntensity(0.9f);
+    spot->setSpotInnerAngle(Anglef::fromDegrees(24.0f));
+    spot->setSpotOuterAngle(Anglef::fromDegrees(44.0f));
+    spot->setPosition(Vector3f(-1.5f, 7.0f, 3.0f));
+    spot->setParent(scene, false);
+    point(*spot, Vector3f(-0.6f, 0.0f, 0.4f));
+
+    const auto lamp = makeShared<Light>("lamp");
+    lamp->setColour(Colour4f(0.35f, 0.45f, 1.0f, 1.0f));
+    lamp->setAttenuated(true);
+    lamp->setAttenuationNear(0.5f);
+    lamp->setAttenuationFar(5.0f);
+    lamp->setPosition(Vector3f(3.4f, 1.1f, 1.6f));
+    lamp->setParent(scene, false);
+}
+
+bool addSolids(AssetCachePool& pool, const SharedPtr<SceneNode>& scene)
+{
+    const Vector2f once(1.0f, 1.0f);
+    bool complete = place(createSphere(pool, 24, 48, once), "sky.ap", pool, scene, {}, {80, 80, 80});
+    complete &= place(createFloor(pool), "floor.ap", pool, scene, {}, {20, 1, 20});
+
+    const SharedPtr<Solid> crate = createCube(pool, once);
+    complete &= place(crate, "crate.ap", pool, scene, {-3.2f, 0.75f, 0.2f}, {0.75f, 0.75f, 0.75f});
+    crate->setRotation(quaternionFromAxisAngle(Vector3f::Y_AXIS, Anglef::fromDegrees(24.0f)));
+    const SharedPtr<Solid> small = createCube(pool, once);
+    complete &= place(small, "crate.ap", pool, scene, {-3.1f, 1.95f, 0.1f}, {0.45f, 0.45f, 0.45f});
+    small->setRotation(quaternionFromAxisAngle(Vector3f::Y_AXIS, Anglef::fromDegrees(52.0f)));
+
+    complete &=
+        place(createSphere(pool, 32, 64, once), "chrome.ap", pool, scene, {3.7f, 1.0f, -0.7f}, {2, 2, 2});
+    complete &= place(createSphere(pool, 32, 64, once), "glass.ap", pool, scene, {-1.2f, 0.8f, 2.6f},
+                      {1.6f, 1.6f, 1.6f});
+
+    complete &= place(createSquare(pool, once), "mirror.ap", pool, scene, {0, 1.75f, -3.9f}, {6.4f, 3.1f, 1});
+    complete &= place(createSquare(pool, once), "frame.ap", pool, scene, {0, 1.75f, -3.95f}, {6.7f, 3.4f, 1});
+    return complete;
+}
+
+/// Loads a model, drives it round in a circle and plays its own animation.
+bool addModel(AssetCachePool& pool, const SharedPtr<SceneNode>& scene, const std::string& path, float time)
+{
+    const std::string::size_type slash = path.rfind('/');
+    registerSource(pool, slash == std::string::npos ? "." : path.substr(0, slash).c_str(), false);
+
+    const float angle = -0.35f + time * 0.4f;
+    const auto car = makeShared<SceneNode>("car");
+    car->setParent(scene, false);
+    car->setPosition(Vector3f(std::cos(angle) * 1.0f, 0.0f, std::sin(angle) * 1.0f));
+    car->setRotation(quaternionFromAxisAngle(Vector3f::Y_AXIS, Anglef::fromRadians(0.5f - angle)));
+    car->setScale(Vector3f(0.55f, 0.55f, 0.55f));
+    const Glo::Ptr model =
+        loadGloFile(pool, car, slash == std::string::npos ? path.c_str() : path.substr(slash + 1).c_str());
+    if (!model)
+        return false;
+
+    AnimationController controller(model->getAnimationGroup());
+    setLoopRange(controller, controller.getStart(), controller.getEnd());
+    controller.update(time);
+    return true;
+}
+
+bool draw(const SharedPtr<AssetCachePool>& pool, const Arguments& arguments)
+{
+    const auto context = makeShared<RenderContext>();
+    const auto renderer = makeShared<SimpleRenderer>(context, pool);
+
+    const auto scene = makeShared<SceneNode>("scene");
+    addLights(scene);
+    if (!addSolids(*pool, scene))
+        return false;
+    if (!arguments.model.empty() && !addModel(*pool, scene, arguments.model, arguments.time))
+        return false;
+
+    const auto camera = makeShared<Camera>("camera");
+    camera->setPosition(Vector3f(1.8f, 3.3f, 9.2f));
+    camera->setFieldOfView(Anglef::fromDegrees(42.0f));
+    camera->setParent(scene, false);
+    point(*camera, Vector3f(0.0f, 1.0f, 0.0f));
+
+    const auto block = makeShared<RenderBlock>(renderer, scene, camera);
+    block->setViewport(0, 0, arguments.width, arguments.height);
+    if (arguments.stereo)
+        block->setStereo(9.0f, 0.4f);
+    block->update(arguments.time);
+    block->render();
+    return true;
+}
+
+} // namespace
+
+int main(int argc, char** argv)
+{
+    Arguments arguments;
+    if (!parse(argc, argv, arguments))
+    {
+        std::fprintf(stderr,
+                     "usage: showpiece [--out FILE.png] [--model SCENE.glo] [--time SECONDS] [--stereo] "
+                     "[--size WxH]\n");
+        return 2;
+    }
+
+    headless::Options options;
+    options.width = arguments.width;
+    options.height = arguments.height;
+    std::string error;
+    const auto gl = headless::Context::create(options, error);
+    if (!gl)
+    {
+        std::fprintf(stderr, "no GL context: %s\n", error.c_str());
+        return 1;
+    }
+
+    const auto pool = makeShared<AssetCachePool>();
+    registerSource(*pool, SAMPLES_FOLDER "/showpiece", false);
+    const bool drawn = draw(pool, arguments);
+
+    // Nothing uses the assets any more: the first flush drops them, the second what they were made of.
+    pool->flush();
+    pool->flush();
+    if (!drawn)
+        return 1;
+
+    if (!headless::writePng(arguments.out, arguments.width, arguments.height, gl->readPixels().data(), error))
+    {
+        std::fprintf(stderr, "%s\n", error.c_str());
+        return 1;
+    }
+    std::printf("wrote %s\n", arguments.out.c_str());
+    return 0;
+}

@@ -1,0 +1,13 @@
+// A planar mirror: hands the clip position on, by which the fragment stage finds its place in the mirror image.
+
+attribute vec3 a_position;
+
+uniform mat4 u_t_modelViewProjection;
+
+varying vec3 v_clip;
+
+void main()
+{
+    gl_Position = u_t_modelViewProjection * vec4(a_position, 1.0);
+    v_clip = gl_Position.xyw;
+}

@@ -1,0 +1,6 @@
+1.0
+vertex_source_file sky.vert
+fragment_source_file sky.frag
+
+uniform u_t_modelViewProjection T_MODEL_VIEW_PROJECTION
+uniform u_m_skyTexture M_SKY_TEXTURE

@@ -1,0 +1,13 @@
+// The sky: a sphere about the scene whose every point shows what the sky looks like in its direction.
+
+attribute vec3 a_position;
+
+uniform mat4 u_t_modelViewProjection;
+
+varying vec3 v_direction;
+
+void main()
+{
+    gl_Position = u_t_modelViewProjection * vec4(a_position, 1.0);
+    v_direction = a_position;
+}
