@@ -150,6 +150,28 @@ bool makeAnywhere(const Options& options, Made& made, std::string& error)
     return false;
 }
 
+/// Reads a surface with several samples per pixel by way of a texture: a copy mixes the samples, whereas
+/// glReadPixels on Mesa's off-screen surfaces picks one of them. Leaves another framebuffer bound.
+std::vector<uint8_t> readResolved(int width, int height)
+{
+    GLint boundTexture = 0;
+    GLuint texture = 0;
+    GLuint framebuffer = 0;
+    glGetIntegerv(GL_TEXTURE_BINDING_2D, &boundTexture);
+    glGenTextures(1, &texture);
+    glBindTexture(GL_TEXTURE_2D, texture);
+    glCopyTexImage2D(GL_TEXTURE_2D, 0, GL_RGBA, 0, 0, width, height, 0);
+    glGenFramebuffers(1, &framebuffer);
+    glBindFramebuffer(GL_FRAMEBUFFER, framebuffer);
+    glFramebufferTexture2D(GL_FRAMEBUFFER, GL_COLOR_ATTACHMENT0, GL_TEXTURE_2D, texture, 0);
+
+    std::vector<uint8_t> pixels = readFramebuffer(0, 0, width, height);
+    glDeleteFramebuffers(1, &framebuffer);
+    glBindTexture(GL_TEXTURE_2D, GLuint(boundTexture));
+    glDeleteTextures(1, &texture);
+    return pixels;
+}
+
 } // namespace
 
 std::unique_ptr<Context> Context::create(const Options& options, std::string& error)
@@ -205,9 +227,12 @@ std::vector<uint8_t> Context::readPixels() const
     if (!isCurrent())
         return {};
     GLint bound = 0;
+    GLint samples = 0;
     glGetIntegerv(GL_FRAMEBUFFER_BINDING, &bound);
     glBindFramebuffer(GL_FRAMEBUFFER, 0);
-    std::vector<uint8_t> pixels = readFramebuffer(0, 0, m_width, m_height);
+    glGetIntegerv(GL_SAMPLES, &samples);
+    std::vector<uint8_t> pixels =
+        samples > 0 ? readResolved(m_width, m_height) : readFramebuffer(0, 0, m_width, m_height);
     glBindFramebuffer(GL_FRAMEBUFFER, GLuint(bound));
     return pixels;
 }

@@ -135,7 +135,8 @@ TEST(Matrix, rotationsTurnCounterClockwise)
         const Quaternionf longer(q.a * 3, q.x * 3, q.y * 3, q.z * 3);
         expectNear(toMatrix4(q), toMatrix4(longer), 1e-6f);
     }
-    EXPECT_EQ(Matrix4f::IDENTITY, toMatrix4(Quaternionf(0, 0, 0, 0)));
+    for (float size : {0.0f, 1e-20f, 1e25f, std::nanf("")}) // of which 1 / length² is no number
+        EXPECT_EQ(Matrix4f::IDENTITY, toMatrix4(Quaternionf(size, size, 0, 0))) << size;
 
     const Quaternionf p = quaternionFromAxisAngle(Vector3f::X_AXIS, Anglef::fromDegrees(40));
     const Quaternionf q = quaternionFromAxisAngle(Vector3f::Y_AXIS, Anglef::fromDegrees(70));

@@ -87,6 +87,50 @@ TEST_F(HeadlessTest, givesTheBitsAskedFor)
     EXPECT_LE(8, bits[5]);
 }
 
+// Fault caught: a picture of one sample per pixel, jagged although the driver has several.
+TEST_F(HeadlessTest, mixesTheSamplesOfAPixel)
+{
+    headless::Options options;
+    options.samples = 4;
+    std::string error;
+    const auto smooth = headless::Context::create(options, error);
+    ASSERT_TRUE(smooth) << error;
+    GLint samples = 0;
+    glGetIntegerv(GL_SAMPLES, &samples);
+    if (samples == 0)
+        GTEST_SKIP() << "the driver has one sample per pixel only";
+
+    const char* sources[] = {
+        "attribute vec2 a_position; void main() { gl_Position = vec4(a_position, 0.0, 1.0); }",
+        "void main() { gl_FragColor = vec4(1.0); }"};
+    const GLuint program = glCreateProgram();
+    for (int i = 0; i < 2; ++i)
+    {
+        const GLuint shader = glCreateShader(i == 0 ? GL_VERTEX_SHADER : GL_FRAGMENT_SHADER);
+        glShaderSource(shader, 1, &sources[i], nullptr);
+        glCompileShader(shader);
+        glAttachShader(program, shader);
+    }
+    glLinkProgram(program);
+    glUseProgram(program);
+    const float corners[] = {-1.0f, -1.0f, 1.0f, -0.7f, -0.8f, 1.0f};
+    glVertexAttribPointer(0, 2, GL_FLOAT, GL_FALSE, 0, corners);
+    glEnableVertexAttribArray(0);
+    glDrawArrays(GL_TRIANGLES, 0, 3);
+
+    const Picture frame = {64, 64, smooth->readPixels()};
+    int mixed = 0;
+    for (int i = 0; i < 64 * 64; ++i)
+    {
+        const int level = frame.pixel(i % 64, i / 64).r;
+        mixed += level > 20 && level < 235;
+    }
+    EXPECT_LT(64, mixed) << "the slanted edge crosses all columns";
+    EXPECT_EQ(GLenum(GL_NO_ERROR), glGetError());
+    EXPECT_EQ(255, frame.pixel(5, 40).r);
+    EXPECT_EQ(0, frame.pixel(60, 5).r);
+}
+
 // Fault caught: a failure without a reason, or one that takes the current context away.
 TEST_F(HeadlessTest, failureNamesTheReasonAndChangesNothing)
 {

@@ -120,7 +120,8 @@ float readFloat(CharRange& range, float defaultValue)
         ++range.start;
         const bool isExponentNegative = readSign(range);
         const float exponent = readFloatDigits(range);
-        value *= powf(10.0f, isExponentNegative ? -exponent : exponent);
+        if (value != 0.0f) // a power beyond floats would make NaN of 0
+            value *= powf(10.0f, isExponentNegative ? -exponent : exponent);
     }
     return isNegative ? -value : value;
 }

@@ -169,7 +169,9 @@ Matrix4f scaleMatrix(const Vector3f& factors)
 Matrix3f toMatrix3(const Quaternionf& q)
 {
     const float squaredLength = q.a * q.a + q.x * q.x + q.y * q.y + q.z * q.z;
-    const float twice = squaredLength > 0.0f ? 2.0f / squaredLength : 0.0f;
+    if (!std::isnormal(squaredLength))
+        return Matrix3f::IDENTITY;
+    const float twice = 2.0f / squaredLength;
     const float xx = twice * q.x * q.x;
     const float yy = twice * q.y * q.y;
     const float zz = twice * q.z * q.z;

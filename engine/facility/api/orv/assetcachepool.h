@@ -44,8 +44,8 @@ public:
     /// Drops the assets that only the caches hold and deletes GL objects that nobody uses.
     void flush();
 
-    /// After the GL context was lost: forgets every GL object without a GL call. The assets stay but draw
-    /// nothing; what is needed is to be loaded or made anew.
+    /// After the GL context was lost: forgets every GL object without a GL call. The assets stay, under their
+    /// names, but draw nothing: drop them and call flush(), then load or make anew what is needed.
     void release();
 
     const SharedPtr<IndexBufferCache>& getIndexBufferCache() const { return m_indexBufferCache; }

@@ -142,8 +142,8 @@ inline Matrix3f upper3x3(const Matrix4f& m)
 ORV_API Matrix4f translationMatrix(const Vector3f& offset);
 ORV_API Matrix4f scaleMatrix(const Vector3f& factors);
 
-/// The rotation alone: a quaternion that is not of unit length turns as its normalised form would; a zero one
-/// does not turn.
+/// The rotation alone: a quaternion that is not of unit length turns as its normalised form would; one whose
+/// squared length is zero or beyond floats does not turn.
 ORV_API Matrix3f toMatrix3(const Quaternionf& q);
 ORV_API Matrix4f toMatrix4(const Quaternionf& q);
 
