@@ -95,12 +95,13 @@ glo::CameraDefinition convertCamera(const aiCamera& camera, bool isGltf)
     const float angle = float(camera.mHorizontalFOV);
     if (!(angle > 0.0f && angle < 3.1f))
         return made;
-    made.fieldOfView = angle;
     const float aspect = camera.mAspect > 0.0f ? float(camera.mAspect) : 1.0f;
-    if (isGltf)
-        made.fieldOfView = angle / aspect; // the importer stretches the upright angle to this one
-    else if (aspect > 1.0f)
-        made.fieldOfView = 2.0f * std::atan(std::tan(angle * 0.5f) / aspect);
+    const auto scaled = [](float whole, float factor)
+    { return 2.0f * std::atan(std::tan(whole * 0.5f) * factor); };
+    if (isGltf) // the importer stretches the upright angle to this one
+        made.fieldOfView = scaled(angle / aspect, std::min(aspect, 1.0f));
+    else
+        made.fieldOfView = scaled(angle, std::min(1.0f / aspect, 1.0f));
     return made;
 }
 

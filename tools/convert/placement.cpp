@@ -3,7 +3,6 @@
 #include "orv/matrix.h"
 #include "orv/quaternion.h"
 
-
 #include <algorithm>
 #include <cmath>
 

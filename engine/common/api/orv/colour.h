@@ -14,11 +14,7 @@ struct ORV_API Colour4f
     float a = 0.0f;
 
     constexpr Colour4f() = default;
-    constexpr Colour4f(float red, float green, float blue, float alpha)
-        : r(red)
-        , g(green)
-        , b(blue)
-        , a(alpha)
+    constexpr Colour4f(float red, float green, float blue, float alpha) : r(red), g(green), b(blue), a(alpha)
     {
     }
 

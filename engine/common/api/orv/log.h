@@ -13,29 +13,29 @@
 extern "C"
 {
 
-/// The platform's log. Every call writes one record, unfiltered:
-///
-///     file name without directories; function; line; formatted message
-///
-/// On Android it goes to the system log under the tag "ORV" at priority 6 (error), 5 (warning), 4 (info)
-/// or 3 (debug); on Linux the same record goes to standard error after "E/ORV: ", "W/ORV: ", "I/ORV: " or
-/// "D/ORV: ". Safe to call from any thread as far as the platform's log is.
-///
-/// @param file      source path; everything up to the last '/' or '\\' is cut. Together with function it
-///                  becomes part of the printf format, so neither may hold a '%'.
-/// @param function  bare name of the calling function.
-ORV_API void pssLogError(const char* file, const char* function, int line, const char* format, ...)
-    ORV_PRINTF(4, 5);
-ORV_API void pssLogWarn(const char* file, const char* function, int line, const char* format, ...)
-    ORV_PRINTF(4, 5);
-ORV_API void pssLogInfo(const char* file, const char* function, int line, const char* format, ...)
-    ORV_PRINTF(4, 5);
-ORV_API void pssLogDebug(const char* file, const char* function, int line, const char* format, ...)
-    ORV_PRINTF(4, 5);
+    /// The platform's log. Every call writes one record, unfiltered:
+    ///
+    ///     file name without directories; function; line; formatted message
+    ///
+    /// On Android it goes to the system log under the tag "ORV" at priority 6 (error), 5 (warning), 4 (info)
+    /// or 3 (debug); on Linux the same record goes to standard error after "E/ORV: ", "W/ORV: ", "I/ORV: " or
+    /// "D/ORV: ". Safe to call from any thread as far as the platform's log is.
+    ///
+    /// @param file      source path; everything up to the last '/' or '\\' is cut. Together with function it
+    ///                  becomes part of the printf format, so neither may hold a '%'.
+    /// @param function  bare name of the calling function.
+    ORV_API void pssLogError(const char* file, const char* function, int line, const char* format, ...)
+        ORV_PRINTF(4, 5);
+    ORV_API void pssLogWarn(const char* file, const char* function, int line, const char* format, ...)
+        ORV_PRINTF(4, 5);
+    ORV_API void pssLogInfo(const char* file, const char* function, int line, const char* format, ...)
+        ORV_PRINTF(4, 5);
+    ORV_API void pssLogDebug(const char* file, const char* function, int line, const char* format, ...)
+        ORV_PRINTF(4, 5);
 
-/// Nothing on today's platforms; called around everything else by a platform whose log needs setting up.
-ORV_API void pssLogInit();
-ORV_API void pssLogDeInit();
+    /// Nothing on today's platforms; called around everything else by a platform whose log needs setting up.
+    ORV_API void pssLogInit();
+    ORV_API void pssLogDeInit();
 
 } // extern "C"
 

@@ -22,28 +22,19 @@ public:
     SharedPtr(std::nullptr_t) {}
 
     /// Takes a share of the object; a new object's count becomes 1.
-    SharedPtr(T* pointer)
-        : m_ptr(pointer)
+    SharedPtr(T* pointer) : m_ptr(pointer)
     {
         if (m_ptr)
             m_ptr->sharedAcquire();
     }
 
-    SharedPtr(const SharedPtr& other)
-        : m_ptr(other.m_ptr)
-    {
-        acquireCopied();
-    }
+    SharedPtr(const SharedPtr& other) : m_ptr(other.m_ptr) { acquireCopied(); }
 
-    SharedPtr(SharedPtr&& other) noexcept
-        : m_ptr(std::exchange(other.m_ptr, nullptr))
-    {
-    }
+    SharedPtr(SharedPtr&& other) noexcept : m_ptr(std::exchange(other.m_ptr, nullptr)) {}
 
     /// From a pointer to a derived class.
     template <class U>
-    SharedPtr(const SharedPtr<U>& other)
-        : m_ptr(other.get())
+    SharedPtr(const SharedPtr<U>& other) : m_ptr(other.get())
     {
         acquireCopied();
     }
