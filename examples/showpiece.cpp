@@ -1,8 +1,9 @@
 // The show-piece: what the engine can do, in one picture. A bumpy tiled floor, crates, a chrome ball that reflects
-// the sky, glass, a planar mirror with a program of its own, a spot light and a point light, and a converted
-// model that drives past with its own animation.
+// the sky, glass, a planar mirror with a program of its own, a spot light and a point light, and two converted
+// models: a duck that slides past, and a figure that moves as its file says.
 //
-//   build/default/examples/showpiece --out showpiece.png [--model truck.glo] [--time 2.5] [--stereo] [--size 960x540]
+//   build/default/examples/showpiece --out showpiece.png [--duck duck.glo] [--dancer motion.glo] [--time 3.2]
+//                                    [--stereo] [--size 960x540]
 
 #include "headless/headless.h"
 #include "headless/png.h"
@@ -22,8 +23,9 @@ namespace
 struct Arguments
 {
     std::string out = "showpiece.png";
-    std::string model; ///< path of a .glo; none leaves the road empty
-    float time = 2.5f; ///< seconds
+    std::string duck;   ///< path of a .glo that slides past; none leaves it out
+    std::string dancer; ///< path of a .glo that plays its own animation; none leaves it out
+    float time = 2.5f;  ///< seconds
     bool stereo = false;
     int width = 960;
     int height = 540;
@@ -38,8 +40,10 @@ bool parse(int argc, char** argv, Arguments& arguments)
             arguments.stereo = true;
         else if (!std::strcmp(argv[i], "--out") && hasValue)
             arguments.out = argv[++i];
-        else if (!std::strcmp(argv[i], "--model") && hasValue)
-            arguments.model = argv[++i];
+        else if (!std::strcmp(argv[i], "--duck") && hasValue)
+            arguments.duck = argv[++i];
+        else if (!std::strcmp(argv[i], "--dancer") && hasValue)
+            arguments.dancer = argv[++i];
         else if (!std::strcmp(argv[i], "--time") && hasValue)
             arguments.time = std::strtof(argv[++i], nullptr);
         else if (!std::strcmp(argv[i], "--size") && hasValue)
@@ -155,27 +159,41 @@ bool addSolids(AssetCachePool& pool, const SharedPtr<SceneNode>& scene)
     return complete;
 }
 
-/// Loads a model, drives it round in a circle and plays its own animation.
-bool addModel(AssetCachePool& pool, const SharedPtr<SceneNode>& scene, const std::string& path, float time)
+/// Loads a model as it stands on the floor at that place, turned and scaled, and plays its own animation up to now.
+bool addModel(AssetCachePool& pool, const SharedPtr<SceneNode>& scene, const std::string& path, float time,
+              const Vector3f& position, float turnRadians, float scale)
 {
     const std::string::size_type slash = path.rfind('/');
     registerSource(pool, slash == std::string::npos ? "." : path.substr(0, slash).c_str(), false);
 
-    const float angle = -0.35f + time * 0.4f;
-    const auto car = makeShared<SceneNode>("car");
-    car->setParent(scene, false);
-    car->setPosition(Vector3f(std::cos(angle) * 1.0f, 0.0f, std::sin(angle) * 1.0f));
-    car->setRotation(quaternionFromAxisAngle(Vector3f::Y_AXIS, Anglef::fromRadians(0.5f - angle)));
-    car->setScale(Vector3f(0.55f, 0.55f, 0.55f));
+    const auto place = makeShared<SceneNode>("place");
+    place->setParent(scene, false);
+    place->setPosition(position);
+    place->setRotation(quaternionFromAxisAngle(Vector3f::Y_AXIS, Anglef::fromRadians(turnRadians)));
+    place->setScale(Vector3f(scale, scale, scale));
     const Glo::Ptr model =
-        loadGloFile(pool, car, slash == std::string::npos ? path.c_str() : path.substr(slash + 1).c_str());
+        loadGloFile(pool, place, slash == std::string::npos ? path.c_str() : path.substr(slash + 1).c_str());
     if (!model)
-        return false;
+        return false; // the log says why
+    for (int i = 0; i < model->getLightCount(); ++i)
+        model->getLight(i)->setParent(nullptr, false); // the scene has lights of its own
 
     AnimationController controller(model->getAnimationGroup());
     setLoopRange(controller, controller.getStart(), controller.getEnd());
     controller.update(time);
     return true;
+}
+
+/// The duck slides round in a circle; the dancer stays and moves as it was recorded.
+bool addModels(AssetCachePool& pool, const SharedPtr<SceneNode>& scene, const Arguments& arguments)
+{
+    const float angle = 0.3f + arguments.time * 0.4f;
+    const Vector3f track(0.5f + std::cos(angle) * 1.2f, 0.0f, 0.6f + std::sin(angle) * 1.2f);
+    if (!arguments.duck.empty() &&
+        !addModel(pool, scene, arguments.duck, arguments.time, track, -1.1f - angle, 0.75f))
+        return false;
+    return arguments.dancer.empty() || addModel(pool, scene, arguments.dancer, arguments.time,
+                                                Vector3f(-0.9f, 0.0f, -1.0f), 0.3f, 0.045f);
 }
 
 bool draw(const SharedPtr<AssetCachePool>& pool, const Arguments& arguments)
@@ -187,7 +205,7 @@ bool draw(const SharedPtr<AssetCachePool>& pool, const Arguments& arguments)
     addLights(scene);
     if (!addSolids(*pool, scene))
         return false;
-    if (!arguments.model.empty() && !addModel(*pool, scene, arguments.model, arguments.time))
+    if (!addModels(*pool, scene, arguments))
         return false;
 
     const auto camera = makeShared<Camera>("camera");
@@ -212,9 +230,8 @@ int main(int argc, char** argv)
     Arguments arguments;
     if (!parse(argc, argv, arguments))
     {
-        std::fprintf(stderr,
-                     "usage: showpiece [--out FILE.png] [--model SCENE.glo] [--time SECONDS] [--stereo] "
-                     "[--size WxH]\n");
+        std::fprintf(stderr, "usage: showpiece [--out FILE.png] [--duck SCENE.glo] [--dancer SCENE.glo] "
+                             "[--time SECONDS] [--stereo] [--size WxH]\n");
         return 2;
     }
 

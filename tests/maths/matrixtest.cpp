@@ -135,7 +135,7 @@ TEST(Matrix, rotationsTurnCounterClockwise)
         const Quaternionf longer(q.a * 3, q.x * 3, q.y * 3, q.z * 3);
         expectNear(toMatrix4(q), toMatrix4(longer), 1e-6f);
     }
-    for (float size : {0.0f, 1e-20f, 1e25f, std::nanf("")}) // of which 1 / length² is no number
+    for (float size : {0.0f, 1e-20f, 1e25f, std::nanf("")}) // the squares leave the range of a float
         EXPECT_EQ(Matrix4f::IDENTITY, toMatrix4(Quaternionf(size, size, 0, 0))) << size;
 
     const Quaternionf p = quaternionFromAxisAngle(Vector3f::X_AXIS, Anglef::fromDegrees(40));
