@@ -125,31 +125,57 @@ TEST(Appearance, opaqueOnlyWithTheDefaultBlending)
     }
 }
 
-// Faults caught: the compare mask sent in place of the write mask; winding that stays turned; state sent again.
+// Faults caught: a setter whose change never reaches GL, the stored compare mask sent in place of the write mask,
+// winding that stays turned, state sent again.
 TEST_F(AppearanceTest, sendsItsState)
 {
+    using F = BlendFactor;
+    using O = StencilOperation;
+    using Calls = std::vector<std::string>;
+    const struct
+    {
+        std::function<void(Appearance&)> set;
+        Calls expected;
+    } steps[] = {
+        {[](auto& a) { a.setBlendFactors(F::SRC_ALPHA, F::ONE, F::ONE_MINUS_SRC_ALPHA, F::ZERO); },
+         {"glEnable(0x0be2)", "glBlendFuncSeparate(0x0302, 0x0303, 0x0001, 0x0000)"}},
+        {[](auto& a) { a.setBlendColour(Colour4f(1, 0, 0, 0)); }, {"glBlendColor(1, 0, 0, 0)"}},
+        {[](auto& a) { a.setBlendFunctions(BlendFunction::SUBTRACT, BlendFunction::ADD); },
+         {"glBlendEquationSeparate(0x800a, 0x8006)"}},
+        {[](auto& a) { a.setForceOpaque(true); }, {"glDisable(0x0be2)"}},
+        {[](auto& a) { a.setCullingMode(CullingMode::CULL_FRONT); }, {"glCullFace(0x0404)"}},
+        {[](auto& a) { a.setWindingOrder(WindingOrder::WINDING_CW); }, {"glFrontFace(0x0900)"}},
+        {[](auto& a) { a.setLineWidth(2.0f); }, {"glLineWidth(2)"}},
+        {[](auto& a) { a.setColourMask(true, true, false, true); }, {"glColorMask(1, 1, 0, 1)"}},
+        {[](auto& a) { a.setDepthWriteEnabled(false); }, {"glDepthMask(0)"}},
+        {[](auto& a) { a.setDepthOffset(1.0f, 2.0f); }, {"glEnable(0x8037)", "glPolygonOffset(0, 0)"}},
+        {[](auto& a) { a.setDepthTestEnabled(false); }, {"glDisable(0x0b71)"}},
+        {[](auto& a) { a.setDepthTestFunction(DepthFunction::ALWAYS); }, {"glDepthFunc(0x0207)"}},
+        {[](auto& a) { a.setScissorTestEnabled(true); }, {"glEnable(0x0c11)"}},
+        {[](auto& a) { a.setScissorBox(1, 2, 3, 4); }, {"glScissor(1, 2, 3, 4)"}},
+        {[](auto& a) { a.setStencilTestEnabled(true); }, {"glEnable(0x0b90)"}},
+        {[](auto& a) { a.setStencilFunction(StencilFace::FRONT, StencilFunction::EQUAL, 1, 0x0f); },
+         {"glStencilFuncSeparate(0x0404, 0x0202, 1, 4294967295)"}},
+        {[](auto& a) { a.setStencilOperations(StencilFace::BACK, O::ZERO, O::KEEP, O::INCR); },
+         {"glStencilOpSeparate(0x0405, 0x0000, 0x1e00, 0x1e02)"}},
+        {[](auto& a) { a.setStencilMask(StencilFace::FRONT, 0xf0); },
+         {"glStencilFuncSeparate(0x0404, 0x0202, 1, 240)", "glStencilMaskSeparate(0x0404, 240)"}},
+    };
     const auto enable = [this](bool turnWinding)
     {
         glcalls::startRecording();
         m_appearance->enable(*m_context, turnWinding);
         return glcalls::recorded();
     };
-    using Calls = std::vector<std::string>;
     enable(false); // the defaults
-    m_appearance->setStencilFunction(StencilFace::FRONT, StencilFunction::EQUAL, 1, 0x0f);
-    EXPECT_EQ(Calls{"glStencilFuncSeparate(0x0404, 0x0202, 1, 4294967295)"}, enable(false));
-    m_appearance->setStencilMask(StencilFace::FRONT, 0xf0);
-    EXPECT_EQ((Calls{"glStencilFuncSeparate(0x0404, 0x0202, 1, 240)", "glStencilMaskSeparate(0x0404, 240)"}),
-              enable(false));
+    for (const auto& step : steps)
+    {
+        step.set(*m_appearance);
+        EXPECT_EQ(step.expected, enable(false));
+    }
     EXPECT_EQ(Calls{}, enable(false));
-    EXPECT_EQ(Calls{"glFrontFace(0x0900)"}, enable(true));
-    EXPECT_EQ(Calls{"glFrontFace(0x0901)"}, enable(false));
-    m_appearance->setBlendFactors(BlendFactor::SRC_ALPHA, BlendFactor::ONE, BlendFactor::ONE_MINUS_SRC_ALPHA,
-                                  BlendFactor::ZERO);
-    EXPECT_EQ((Calls{"glEnable(0x0be2)", "glBlendFuncSeparate(0x0302, 0x0303, 0x0001, 0x0000)"}),
-              enable(false));
-    m_appearance->setForceOpaque(true);
-    EXPECT_EQ(Calls{"glDisable(0x0be2)"}, enable(false));
+    EXPECT_EQ(Calls{"glFrontFace(0x0901)"}, enable(true));
+    EXPECT_EQ(Calls{"glFrontFace(0x0900)"}, enable(false));
 
     LogCapture log;
     m_appearance->setStencilMask(StencilFace(2), 0);

@@ -57,9 +57,8 @@ TEST(Image, decodesEveryFormatTopRowFirst)
     {
         const char* suffix;
         int channels;
-        int decodedChannels;
-    } cases[] = {{"png", 1, 1}, {"png", 2, 2}, {"png", 3, 3}, {"png", 4, 4}, {"bmp", 3, 3},
-                 {"tga", 1, 1}, {"tga", 2, 2}, {"tga", 3, 3}, {"tga", 4, 4}};
+    } cases[] = {{"png", 1}, {"png", 2}, {"png", 3}, {"png", 4}, {"bmp", 3},
+                 {"tga", 1}, {"tga", 2}, {"tga", 3}, {"tga", 4}};
     for (const auto& test : cases)
     {
         const Bytes pixels = counting(size_t(3 * 2 * test.channels));
@@ -67,7 +66,7 @@ TEST(Image, decodesEveryFormatTopRowFirst)
         ASSERT_TRUE(image->data()) << test.suffix << test.channels;
         EXPECT_EQ(3, image->width());
         EXPECT_EQ(2, image->height());
-        EXPECT_EQ(test.decodedChannels, image->channelCount()) << test.suffix;
+        EXPECT_EQ(test.channels, image->channelCount()) << test.suffix;
         EXPECT_EQ(pixels, pixelsOf(*image)) << test.suffix << test.channels;
     }
 

@@ -222,6 +222,8 @@ TEST_F(ShaderProgramLoaderTest, defines)
             (std::vector<std::string>{std::string(test.block) + VERTEX, std::string(test.block) + FRAGMENT}),
             sources);
     }
+    EXPECT_TRUE(m_loader->isKnown("T.SP"));
+    EXPECT_FALSE(m_loader->isKnown("t.sp$A")); // and yet loaded above
     EXPECT_FALSE(m_cache->get("t.sp$A$B") == m_cache->get("t.sp"));
     EXPECT_TRUE(m_cache->get("t.sp$A$B") == m_cache->get("t.sp$A$B"));
 

@@ -249,13 +249,18 @@ TEST_F(ShaderProgramTest, sourcesInTheirOrder)
     EXPECT_EQ((Rgba{0, 0, 255}), draw(*program));
 }
 
-// Fault caught: a program linked before its property existed, or to a context that is gone, is never fed.
+// Fault caught: a program linked before its property existed, under another name, or to a context that is gone, is
+// never fed.
 TEST_F(ShaderProgramTest, linksAgainWhenTheContextChanges)
 {
     const SharedPtr<ShaderProgram> program = makeProgram(COLOURED, "COLOUR");
     EXPECT_EQ((Rgba{0, 0, 0, 0}), draw(*program));
     m_renderContext->addProperty(makeValue(Vector4f(1, 0, 0, 1)), "COLOUR");
+    m_renderContext->addProperty(makeValue(Vector4f(1, 1, 0, 1)), "OTHER");
     EXPECT_EQ((Rgba{255, 0, 0}), draw(*program));
+    program->setUniformPropertyName(0, "OTHER");
+    EXPECT_EQ((Rgba{255, 255, 0}), draw(*program));
+    program->setUniformPropertyName(0, "COLOUR");
 
     // A new context in the very memory of the old one.
     alignas(RenderContext) static unsigned char memory[sizeof(RenderContext)];
@@ -332,6 +337,42 @@ TEST_F(ShaderProgramTest, samplersKeepNothing)
     m_textures->flush();
     EXPECT_TRUE(glcalls::liveNames(glcalls::Kind::TEXTURE).empty());
     EXPECT_EQ((Rgba{0, 0, 0}), draw(*program));
+}
+
+// Faults caught: units of a sampler array left to whatever was there, or given to its other elements; a count of units
+// that is reported one too early.
+TEST_F(ShaderProgramTest, samplerArraysShowTheirFirstTexture)
+{
+    const char* const fragment =
+        "precision mediump float;\n"
+        "uniform sampler2D u_texture[3];\n"
+        "void main() { gl_FragColor = texture2D(u_texture[0], vec2(0.5))\n"
+        "    * texture2D(u_texture[1], vec2(0.5)) * texture2D(u_texture[2], vec2(0.5)); }\n";
+    const auto create = [&](GLint units)
+    {
+        glcalls::replace(glGetIntegerv,
+                         [units](GLenum name, GLint* value) {
+                             name == GL_MAX_TEXTURE_IMAGE_UNITS ? void(*value = units)
+                                                                : glcalls::real(glGetIntegerv)(name, value);
+                         });
+        return makeProgram(fragment, "T");
+    };
+    LogCapture log;
+    const SharedPtr<ShaderProgram> program = create(2); // one unit too many passes
+    EXPECT_EQ(0, log.count('I'));
+    create(1);
+    EXPECT_EQ(1, log.countMessage("Max texture units (1) exceeded by shader program (2)."));
+    glcalls::restore(glGetIntegerv);
+
+    const SharedPtr<ShaderUniformBase> value = makeShared<ShaderUniform<SharedPtr<Texture2D>>>(3);
+    value->setValue(makeTexture({0, 255, 255}), 0);
+    value->setValue(makeTexture({0, 0, 0}), 1);
+    program->setUniformPropertyValue(0, value);
+    EXPECT_EQ((Rgba{0, 255, 255}), draw(*program));
+    makeTexture({9, 9, 9});
+    program->enableUniforms();
+    glDrawArrays(GL_TRIANGLE_STRIP, 0, 4);
+    EXPECT_EQ((Rgba{0, 255, 255}), support::readFrame().pixel(32, 32));
 }
 
 // Fault caught: arrays of another program left on, and read past the end of their buffers.

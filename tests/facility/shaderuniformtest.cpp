@@ -47,24 +47,6 @@ TEST(ShaderUniform, sizeBelowOneCountsAsOne)
     }
 }
 
-// Fault caught: a value taken for another type, such as an int written into a bool.
-TEST(ShaderUniform, otherTypesAreRefused)
-{
-    ShaderUniform<bool> uniform(1);
-    ShaderUniformBase& base = uniform;
-    int integer = 7;
-    unsigned char byte = 7;
-    EXPECT_FALSE(base.setValue(1, 0));
-    EXPECT_FALSE(base.setValue(byte, 0));
-    EXPECT_FALSE(base.setValue(1.0f, 0));
-    EXPECT_FALSE(base.getValue(integer, 0));
-    EXPECT_FALSE(base.getValue(byte, 0));
-    EXPECT_EQ(7, integer);
-    EXPECT_FALSE(uniform.get());
-    EXPECT_TRUE(uniform.holds<bool>());
-    EXPECT_FALSE(uniform.holds<unsigned char>());
-}
-
 // Fault caught: a stamp that stays although a value changed (the change never reaches GL), or that moves without a
 // change (every draw compares again).
 TEST(ShaderUniform, revisionFollowsTheValues)

@@ -100,8 +100,8 @@ TEST_F(TextureTest, rowsArriveAsGiven)
 // Faults caught: settings under which GL shows the texture black, and mipmaps asked for but never made.
 TEST_F(TextureTest, settingsThatWouldTurnATextureBlackAreRefused)
 {
-    GLuint compressedName = 0;
-    glGenTextures(1, &compressedName);
+    GLuint names[2] = {};
+    glGenTextures(2, names);
     const struct
     {
         const char* name;
@@ -112,7 +112,8 @@ TEST_F(TextureTest, settingsThatWouldTurnATextureBlackAreRefused)
         {"power of two", create(8, 8), true, true},
         {"other size", create(6, 8), false, false},
         {"depth", create(8, 8, Format::DEPTH, Type::UNSIGNED_SHORT), false, true},
-        {"compressed", cache->create(8, 8, 0.5f, false, compressedName, nullptr), false, true},
+        {"compressed", cache->create(8, 8, 0.5f, false, names[0], nullptr), false, true},
+        {"compressed with mipmaps", cache->create(8, 8, 0.5f, true, names[1], nullptr), true, true},
     };
     for (const auto& test : cases)
     {
@@ -210,6 +211,7 @@ TEST_F(TextureTest, backbufferCopies)
     render.clear();
     for (const Format format : {Format::RGB, Format::RGBA})
     {
+        glcalls::queueError(GL_INVALID_ENUM); // an older one, which is not the copy's
         const auto texture = cache->createFromBackbuffer(render, format, "mirror");
         ASSERT_TRUE(texture);
         EXPECT_TRUE(cache->get("mirror") == texture) << "a held name is replaced";

@@ -116,6 +116,7 @@ TEST_F(HeadlessTest, mixesTheSamplesOfAPixel)
     const float corners[] = {-1.0f, -1.0f, 1.0f, -0.7f, -0.8f, 1.0f};
     glVertexAttribPointer(0, 2, GL_FLOAT, GL_FALSE, 0, corners);
     glEnableVertexAttribArray(0);
+    glClear(GL_COLOR_BUFFER_BIT);
     glDrawArrays(GL_TRIANGLES, 0, 3);
 
     const Picture frame = {64, 64, smooth->readPixels()};

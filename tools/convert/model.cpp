@@ -203,7 +203,9 @@ private:
                 continue;
             glo::CameraDefinition definition = convertCamera(camera, m_fromGltf);
             definition.name = m_cameraNames.make(camera.mName.C_Str(), "camera");
-            const aiMatrix4x4 transform = lookingAlong(camera.mPosition, camera.mLookAt, camera.mUp);
+            // The glTF importer repeats the node's position in the camera.
+            const aiVector3D position = m_fromGltf ? aiVector3D() : camera.mPosition;
+            const aiMatrix4x4 transform = lookingAlong(position, camera.mLookAt, camera.mUp);
             addHolder(node, !node.camera, definition.name + " view", transform).camera =
                 glo::CameraReference{definition.name};
             m_model.scene.cameras.push_back(definition);

@@ -74,8 +74,12 @@ bool place(glo::NodeData& node, const aiMatrix4x4& transform)
         columns[i] = columns[i].NormalizeSafe();
     if ((columns[0] ^ columns[1]) * columns[2] < 0.0f)
     {
-        scale.x = -scale.x;
-        columns[0] = -columns[0];
+        // Of the three axes that could be turned round, the one that leaves the least to rotate.
+        unsigned turned = 0;
+        for (unsigned i = 1; i < 3; ++i)
+            turned = columns[i][i] < columns[turned][turned] ? i : turned;
+        scale[int(turned)] = -scale[int(turned)];
+        columns[turned] = -columns[turned];
     }
     orthonormalise(columns);
 
