@@ -396,7 +396,7 @@ TEST_F(GloSceneTest, geometryIsChecked)
 // Fault caught: a radius that culls what is in sight; formats that change on the way to the GL.
 TEST_F(GloSceneTest, formatsAndRadii)
 {
-    constexpr unsigned BYTE = 0x1400, UNSIGNED_SHORT = 0x1403, FLOAT = 0x1406, FIXED = 0x140c;
+    constexpr unsigned BYTE = 0x1400, SHORT = 0x1402, UNSIGNED_SHORT = 0x1403, FLOAT = 0x1406, FIXED = 0x140c;
     const struct
     {
         uint32_t type;
@@ -411,13 +411,15 @@ TEST_F(GloSceneTest, formatsAndRadii)
         {3, 1, {255, 255, 255, 255, 0, 0}, UNSIGNED_SHORT, std::sqrt(2.0f)},
         {4, 0, {0, 0, 64, 64, 0, 0, 0, 0, 0, 0, 128, 64}, FLOAT, 5.0f},
         {99, 0, {0, 0, 64, 64, 0, 0, 0, 0, 0, 0, 128, 64}, FLOAT, 5.0f},
+        {2, 0, {3, 0, 4, 0, 0, 0, 1, 0}, SHORT, 5.0f}, // the fourth is no distance
         {8, 0, {0, 0, 2, 0, 0, 0, 0, 0, 0, 0, 0, 0}, FIXED, 2.0f},
     };
     for (const auto& item : cases)
     {
         glo::GloScene scene = makeSquareScene(makeMaterial("m", Vector4f(1, 1, 1, 1)));
         glo::VertexSet& vertices = scene.geometries[0].vertices;
-        vertices.attributes = {{"a_position", 3, item.type, 0, 0, item.normalize}};
+        const int components = item.type == 2 ? 4 : 3;
+        vertices.attributes = {{"a_position", components, item.type, 0, 0, item.normalize}};
         vertices.data.bytes = item.vertex;
         vertices.vertexCount = 1;
         scene.geometries[0].primitiveSets = {{glo::primitive::POINTS, {}}};
@@ -463,6 +465,16 @@ TEST_F(GloSceneTest, channels)
          "\"scale\" of \"hip\" has 2 coefficients per key in test.glo; wanted are 3"},
         {"five for a colour", makeChannel("material", "red", "diffuse", {1, 2, 3, 4, 5}), 'E',
          "\"diffuse\" of \"red\" has 5 coefficients per key in test.glo; wanted are 4"},
+        {"two-byte keys without a meaning",
+         []
+         {
+             glo::Channel c = makeChannel("node", "hip", "scale", {});
+             c.coefficientCount = 3;
+             c.type = 7;
+             c.keys.resize(4 + 3 * 2);
+             return c;
+         }(),
+         'W', "Ignoring \"scale\" of \"hip\" in test.glo: keys of the type 7 have no meaning"},
         {"no time",
          []
          {
@@ -482,7 +494,7 @@ TEST_F(GloSceneTest, channels)
         EXPECT_EQ(item.level == 'E' ? 1 : 0, log.count('E')) << item.what << log.text();
         EXPECT_TRUE(item.level == 0 || log.countMessage(item.message) == 1) << item.what << log.text();
     }
-    EXPECT_EQ(8u, m_root->getChildCount()); // only those that loaded
+    EXPECT_EQ(9u, m_root->getChildCount()); // only those that loaded
 }
 
 // Fault caught: key values in the wrong place or order, a light left behind, groups flattened or misnamed.

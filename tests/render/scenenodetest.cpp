@@ -218,7 +218,7 @@ TEST(SceneNode, becomesARootWithItsOwnTransform)
     makeNode("root", nullptr)->removeChild(stranger);
 }
 
-// Fault caught: destruction that recurses once per level and runs out of stack.
+// Fault caught: destruction, or marking what is about to go, that recurses once per level and runs out of stack.
 TEST(SceneNode, deepTreesAreDestroyed)
 {
     int deaths = 0;
@@ -233,6 +233,8 @@ TEST(SceneNode, deepTreesAreDestroyed)
     top = nullptr;
     EXPECT_EQ(2, deaths);
     EXPECT_EQ(nullptr, held->getParent());
+    for (SceneNode* node = held.get(); node; node = node->getChildCount() ? node->getChild(0).get() : nullptr)
+        node->getWorldTransform(); // so that nothing is marked
     held = nullptr;
     EXPECT_EQ(200000, deaths);
 }

@@ -68,6 +68,9 @@ TEST_F(SimpleRendererTest, publishesLights)
     EXPECT_EQ(Vector3f(0, 0, 1), property<Vector3f>("L_SPOT_DIRECTION", 2));
     EXPECT_EQ(10.0f, property<float>("L_ATTENUATION_NEAR", 2));
     EXPECT_NEAR(1000.0f, property<float>("L_ATTENUATION_RECIPROCAL", 2), 5.0f);
+    spot->setAttenuationNear(1e6f); // where floats are coarser than the least difference
+    render();
+    EXPECT_NEAR(1000.0f, property<float>("L_ATTENUATION_RECIPROCAL", 2), 5.0f);
 }
 
 TEST_F(SimpleRendererTest, takesTheFirstFiveLights)

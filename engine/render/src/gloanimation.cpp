@@ -91,12 +91,6 @@ bool readKeys(const Channel& channel, const char* fileName, std::vector<Animatio
         return false;
     }
     const uint32_t size = type::SIZES[channel.type];
-    if (channel.type > type::FLOAT)
-    {
-        ORV_GLO_ERROR("\"%s\" of \"%s\" has keys of the type %u in %s, which have no meaning", property,
-                      target, channel.type, fileName);
-        return false;
-    }
     const uint8_t* bytes = channel.keys.data();
     for (uint32_t i = 0; i < channel.keyCount; ++i)
     {
@@ -133,6 +127,19 @@ bool addChannel(const Channel& channel, const char* fileName, const SharedPtr<So
     if (!value)
         return false;
     group.addAnimation(createAnimationChannel<T>(value, animator));
+    return true;
+}
+
+/// All lights share the keys.
+template <class T, class LightAnimator>
+bool addLightChannels(const Channel& channel, const char* fileName,
+                      const std::vector<SharedPtr<Light>>& lights, AnimationGroup& group)
+{
+    const SharedPtr<AnimatedValue<T>> value = makeValue<T>(channel, fileName);
+    if (!value)
+        return false;
+    for (const SharedPtr<Light>& light : lights)
+        group.addAnimation(createAnimationChannel<T>(value, makeShared<LightAnimator>(light)));
     return true;
 }
 
@@ -219,6 +226,12 @@ bool GloBuilder::makeChannel(const Channel& channel, AnimationGroup& group)
     const std::string& name = channel.targetName;
     const std::string target = name.compare(0, 5, "node-") == 0 ? name.substr(5) : name;
     const std::string& property = channel.property;
+    if (channel.type > type::FLOAT)
+    {
+        ORV_GLO_WARN("Ignoring \"%s\" of \"%s\" in %s: keys of the type %u have no meaning", property.c_str(),
+                     name.c_str(), m_name, channel.type);
+        return true;
+    }
     if (channel.targetType == "node" && isOneOf(property, {"translation", "rotation", "scale"}))
         return makeNodeChannel(channel, target, group);
     if (channel.targetType == "light" && isOneOf(property, {"colour", "multiplier"}))
@@ -250,18 +263,15 @@ bool GloBuilder::makeLightChannel(const Channel& channel, const std::string& tar
         known = known || definition.name == target;
     if (!known)
         return fail("No light for animation in %s");
+    std::vector<SharedPtr<Light>> lights;
     for (const auto& light : m_glo->m_lights)
     {
-        if (light.definition != target)
-            continue;
-        const bool added =
-            channel.property == "colour"
-                ? addChannel<Colour4f>(channel, m_name, makeShared<LightColourAnimator>(light.node), group)
-                : addChannel<float>(channel, m_name, makeShared<LightIntensityAnimator>(light.node), group);
-        if (!added)
-            return false;
+        if (light.definition == target)
+            lights.push_back(light.node);
     }
-    return true;
+    if (channel.property == "colour")
+        return addLightChannels<Colour4f, LightColourAnimator>(channel, m_name, lights, group);
+    return addLightChannels<float, LightIntensityAnimator>(channel, m_name, lights, group);
 }
 
 bool GloBuilder::makeMaterialChannel(const Channel& channel, const std::string& target, AnimationGroup& group)

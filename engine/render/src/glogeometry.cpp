@@ -127,15 +127,17 @@ float readComponent(const uint8_t* bytes, Format format, bool normalised)
     return value;
 }
 
-/// Calls use(vertex, value) with every component of an attribute.
+/// Calls use(vertex, value) with the first components of an attribute, at most so many of each vertex.
 template <class Use>
-void forEachComponent(const VertexAttribute& attribute, const VertexSet& vertices, bool normalised, Use&& use)
+void forEachComponent(const VertexAttribute& attribute, const VertexSet& vertices, bool normalised,
+                      int32_t most, Use&& use)
 {
     const Format format = getFormat(attribute.type);
-    const uint8_t* bytes = vertices.data.bytes.data() + attribute.offset;
-    for (uint32_t vertex = 0; vertex < vertices.vertexCount; ++vertex, bytes += getStride(attribute))
+    for (uint32_t vertex = 0; vertex < vertices.vertexCount; ++vertex)
     {
-        for (uint32_t i = 0; i < uint32_t(attribute.componentCount); ++i)
+        const size_t start = size_t(attribute.offset) + size_t(vertex) * getStride(attribute);
+        const uint8_t* bytes = vertices.data.bytes.data() + start;
+        for (uint32_t i = 0; i < uint32_t(std::min(attribute.componentCount, most)); ++i)
             use(vertex, readComponent(bytes + i * getComponentSize(format), format, normalised));
     }
 }
@@ -148,7 +150,7 @@ std::vector<float> getSquaredDistances(const Geometry& geometry, FileVersion ver
     if (!position)
         return distances;
     distances.resize(geometry.vertices.vertexCount);
-    forEachComponent(*position, geometry.vertices, isNormalised(*position, version),
+    forEachComponent(*position, geometry.vertices, isNormalised(*position, version), 3,
                      [&distances](uint32_t vertex, float value) { distances[vertex] += value * value; });
     return distances;
 }
@@ -161,7 +163,7 @@ int countJoints(const Geometry& geometry)
     int count = 0;
     if (joints)
         forEachComponent(
-            *joints, geometry.vertices, false,
+            *joints, geometry.vertices, false, 4,
             [&count](uint32_t, float value)
             { count = std::max(count, value >= 0.0f && value < LIMIT ? int(value) + 1 : int(LIMIT)); });
     return count;

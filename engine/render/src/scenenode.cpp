@@ -17,10 +17,10 @@ SceneNode::SceneNode(const char* name)
 SceneNode::~SceneNode()
 {
     // Descendants that die with this node are gathered here and die one by one: a chain of nodes as long as
-    // a damaged or generated scene likes must not recurse through as many destructors.
+    // a damaged or generated scene likes must not recurse through as many destructors, nor marks.
     std::vector<SharedPtr<SceneNode>> orphans = std::move(m_children);
     for (const SharedPtr<SceneNode>& child : orphans)
-        child->onParentDestroyed();
+        child->m_parent = nullptr;
 
     while (!orphans.empty())
     {
@@ -28,10 +28,13 @@ SceneNode::~SceneNode()
         orphans.pop_back();
         SceneNode& node = *orphan.get();
         if (node.sharedGetCount() > 1)
+        {
+            node.onParentDestroyed();
             continue;
+        }
         for (SharedPtr<SceneNode>& child : node.m_children)
         {
-            child->onParentDestroyed();
+            child->m_parent = nullptr;
             orphans.push_back(std::move(child));
         }
         node.m_children.clear();

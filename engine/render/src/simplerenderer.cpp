@@ -140,9 +140,9 @@ void SimpleRenderer::publishLight(const Light& light, int index)
     {
         const float scale = length(world.columns[0].xyz());
         const float nearDistance = light.getAttenuationNear() * scale;
-        const float farDistance = std::max(light.getAttenuationFar() * scale, nearDistance + 0.001f);
+        const float range = light.getAttenuationFar() * scale - nearDistance;
         properties.lightAttenuationNear->set(nearDistance, index);
-        attenuationReciprocal = 1.0f / (farDistance - nearDistance);
+        attenuationReciprocal = 1.0f / std::max(0.001f, range); // also of distances without a difference
     }
     properties.lightAttenuationReciprocal->set(attenuationReciprocal, index);
 

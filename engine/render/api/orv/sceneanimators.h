@@ -20,6 +20,9 @@ class SceneNode;
 class ORV_API SceneNodePositionAnimator : public Animator<Vector3f>
 {
 public:
+    ORV_CLASS_NAME("SceneNodePositionAnimator")
+    using Ptr = SharedPtr<SceneNodePositionAnimator>;
+
     explicit SceneNodePositionAnimator(const SharedPtr<SceneNode>& node);
     ~SceneNodePositionAnimator() override;
     void apply(const Vector3f& position) override;
@@ -31,6 +34,9 @@ private:
 class ORV_API SceneNodeRotationAnimator : public Animator<Vector4f>
 {
 public:
+    ORV_CLASS_NAME("SceneNodeRotationAnimator")
+    using Ptr = SharedPtr<SceneNodeRotationAnimator>;
+
     explicit SceneNodeRotationAnimator(const SharedPtr<SceneNode>& node);
     ~SceneNodeRotationAnimator() override;
     /// @param axisAngle  axis x, y, z, taken as it is (not normalised), and angle in radians.
@@ -44,6 +50,9 @@ private:
 class ORV_API SceneNodeScaleAnimator : public Animator<Vector3f>
 {
 public:
+    ORV_CLASS_NAME("SceneNodeScaleAnimator")
+    using Ptr = SharedPtr<SceneNodeScaleAnimator>;
+
     explicit SceneNodeScaleAnimator(const SharedPtr<SceneNode>& node);
     ~SceneNodeScaleAnimator() override;
     void apply(const Vector3f& scale) override;
@@ -56,6 +65,9 @@ private:
 class ORV_API LightColourAnimator : public Animator<Colour4f>
 {
 public:
+    ORV_CLASS_NAME("LightColourAnimator")
+    using Ptr = SharedPtr<LightColourAnimator>;
+
     explicit LightColourAnimator(const SharedPtr<Light>& light);
     ~LightColourAnimator() override;
     void apply(const Colour4f& colour) override;
@@ -67,6 +79,9 @@ private:
 class ORV_API LightIntensityAnimator : public Animator<float>
 {
 public:
+    ORV_CLASS_NAME("LightIntensityAnimator")
+    using Ptr = SharedPtr<LightIntensityAnimator>;
+
     explicit LightIntensityAnimator(const SharedPtr<Light>& light);
     ~LightIntensityAnimator() override;
     void apply(const float& intensity) override;
@@ -80,6 +95,9 @@ template <class T>
 class AppearancePropertyAnimator : public Animator<T>
 {
 public:
+    ORV_CLASS_NAME("AppearancePropertyAnimator")
+    using Ptr = SharedPtr<AppearancePropertyAnimator<T>>;
+
     /// @param name  copied.
     AppearancePropertyAnimator(const SharedPtr<Appearance>& appearance, const char* name);
     ~AppearancePropertyAnimator() override;

@@ -101,7 +101,7 @@ public:
     /// True also for the node itself.
     bool hasAncestor(const SceneNode* node) const;
 
-    /// Called by the parent's destructor: the node becomes a root.
+    /// Called by the parent's destructor on a node that lives on: it becomes a root.
     void onParentDestroyed();
 
     unsigned int getChildCount() const { return static_cast<unsigned int>(m_children.size()); }
