@@ -2,8 +2,7 @@
 
 #include "orv/rendercontext.h"
 
-#include "support/gltest.h"
-#include "support/logcapture.h"
+#include "facilitytest.h"
 
 using namespace orv;
 using Primitive = IndexBuffer::Primitive;
@@ -14,7 +13,7 @@ namespace
 
 const unsigned short INDICES[] = {0, 1, 2, 2, 1, 3};
 
-class IndexBufferTest : public support::GlTest
+class IndexBufferTest : public FacilityTest
 {
 protected:
     /// The calls of a draw that a released context would crash on are only recorded.
@@ -25,28 +24,15 @@ protected:
         glcalls::setDropped(glDrawArrays);
     }
 
-    void TearDown() override
-    {
-        cache->flush();
-        EXPECT_EQ("", glcalls::describeLiveNames());
-        GlTest::TearDown();
-    }
+    void flush() override { cache->flush(); }
 
-    static std::vector<std::string> callsOfDraw(IndexBuffer& buffer, RenderContext* context = nullptr)
+    static Calls callsOfDraw(IndexBuffer& buffer, RenderContext* context = nullptr)
     {
-        glcalls::startRecording();
-        if (context)
-            buffer.draw(*context);
-        else
-            buffer.draw();
-        glcalls::stopRecording();
-        return glcalls::recorded();
+        return callsOf([&] { context ? buffer.draw(*context) : buffer.draw(); });
     }
 
     SharedPtr<IndexBufferCache> cache = makeShared<IndexBufferCache>();
 };
-
-using Calls = std::vector<std::string>;
 
 } // namespace
 
@@ -89,15 +75,11 @@ TEST_F(IndexBufferTest, drawsFromMemoryThenFromGl)
     EXPECT_EQ((Calls{"glBindBuffer(0x8893, " + id + ")", "glDrawElements(0x0004, 6, 0x1403, 0)",
                      "glBindBuffer(0x8893, 0)"}),
               callsOfDraw(*buffer));
-    const uint64_t calls = glcalls::total();
-    buffer->commit();
-    EXPECT_EQ(calls, glcalls::total());
-
-    glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, buffer->getId());
+    EXPECT_EQ(Calls{}, callsOf([&] { buffer->commit(); }));
     GLint size = 0;
+    glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, buffer->getId());
     glGetBufferParameteriv(GL_ELEMENT_ARRAY_BUFFER, GL_BUFFER_SIZE, &size);
     EXPECT_EQ(12, size);
-
     buffer->setEnabled(false);
     EXPECT_EQ(Calls{}, callsOfDraw(*buffer));
 }
@@ -110,19 +92,18 @@ TEST_F(IndexBufferTest, drawPathBindsOnChangeOnly)
     committed->commit();
     const IndexBuffer::Ptr inMemory = cache->create(Primitive::LINES, 6, INDICES, nullptr);
     const IndexBuffer::Ptr plain = create(*cache, Primitive::POINTS, 3, nullptr);
-    const std::string id = std::to_string(committed->getId());
+    const std::string bind = "glBindBuffer(0x8893, " + std::to_string(committed->getId()) + ")";
     const std::string address = std::to_string(reinterpret_cast<uintptr_t>(inMemory->getIndices()));
     const std::string drawCommitted = "glDrawElements(0x0004, 6, 0x1403, 0)";
 
-    EXPECT_EQ((Calls{"glBindBuffer(0x8893, " + id + ")", drawCommitted}),
-              callsOfDraw(*committed, context.get()));
+    EXPECT_EQ((Calls{bind, drawCommitted}), callsOfDraw(*committed, context.get()));
     EXPECT_EQ(Calls{drawCommitted}, callsOfDraw(*committed, context.get()));
     EXPECT_EQ(Calls{"glDrawArrays(0x0000, 0, 3)"}, callsOfDraw(*plain, context.get()));
     EXPECT_EQ((Calls{"glBindBuffer(0x8893, 0)", "glDrawElements(0x0001, 6, 0x1403, " + address + ")"}),
               callsOfDraw(*inMemory, context.get()));
+    EXPECT_EQ((Calls{bind, drawCommitted}), callsOfDraw(*committed, context.get()));
     committed->draw(); // unbinds behind the context's back
-    EXPECT_EQ((Calls{"glBindBuffer(0x8893, " + id + ")", drawCommitted}),
-              callsOfDraw(*committed, context.get()));
+    EXPECT_EQ((Calls{bind, drawCommitted}), callsOfDraw(*committed, context.get()));
     committed->setEnabled(false);
     EXPECT_EQ(Calls{}, callsOfDraw(*committed, context.get()));
 }

@@ -1,12 +1,8 @@
 #include "orv/rendercontext.h"
 
-#include "orv/shaderuniform.h"
-#include "support/gltest.h"
-#include "support/logcapture.h"
+#include "facilitytest.h"
 
 #include <functional>
-#include <string>
-#include <vector>
 
 using namespace orv;
 using support::LogCapture;
@@ -14,22 +10,7 @@ using support::LogCapture;
 namespace
 {
 
-using Calls = std::vector<std::string>;
-
-/// What GL hears while something is done.
-template <class Function>
-Calls callsOf(const Function& function)
-{
-    glcalls::startRecording();
-    function();
-    glcalls::stopRecording();
-    return glcalls::recorded();
-}
-
-class RenderContextTest : public support::GlTest
-{
-};
-
+using RenderContextTest = support::GlTest;
 using Set = std::function<void(RenderContext&)>;
 
 /// One thing that is done, and what GL hears of it.
@@ -67,8 +48,7 @@ TEST(RenderState, tablesHoldTheGlValuesOfTheirWords)
     EXPECT_EQ((Values{GL_BACK, GL_FRONT}), valuesOf(STENCIL_FACES));
 }
 
-// Faults caught: a default that is not GL's (the first real setting is then swallowed), a setter that calls
-// GL again for what is set, or that sends its arguments in the wrong order.
+// Faults caught: a default that is not GL's (the first setting is swallowed), repeated or swapped arguments.
 TEST_F(RenderContextTest, settersCallGlOnChangeOnly)
 {
     using F = BlendFactor;
@@ -140,8 +120,7 @@ TEST_F(RenderContextTest, settersCallGlOnChangeOnly)
     EXPECT_EQ(std::size(steps), callsOf([&] { setDefaults(*target); }).size());
 }
 
-// Faults caught: culling enabled again with every face; the offset's lag "corrected"; both stencil faces sent
-// where one differs.
+// Faults caught: culling enabled again with every face; the offset's lag "corrected"; both faces sent for one.
 TEST_F(RenderContextTest, sequencesOfSettings)
 {
     RenderContext target;
@@ -152,7 +131,6 @@ TEST_F(RenderContextTest, sequencesOfSettings)
         {[](auto& c) { c.setCullingMode(CullingMode::CULL_NONE); }, {"glDisable(0x0b44)"}},
         {[](auto& c) { c.setDepthOffset(1.0f, 1.0f); }, {"glEnable(0x8037)", "glPolygonOffset(0, 0)"}},
         {[](auto& c) { c.setDepthOffset(2.0f, 2.0f); }, {"glPolygonOffset(1, 1)"}},
-        {[](auto& c) { c.setDepthOffset(2.0f, 2.0f); }, {}},
         {[](auto& c) { c.setDepthOffset(0.0f, 0.0f); }, {"glDisable(0x8037)"}},
         {[](auto& c) { c.setStencilFunction(StencilFace::STENCIL_BACK, StencilFunction::NEVER, 1, 255u); },
          {"glStencilFuncSeparate(0x0405, 0x0200, 1, 255)"}},
@@ -178,17 +156,10 @@ TEST_F(RenderContextTest, invalidEnumsAreLoggedAndRefusedByGl)
          "Invalid blend function 7"},
         {[](auto& c) { c.setCullingMode(CullingMode(4)); }, "Invalid culling mode 4"},
         {[](auto& c) { c.setWindingOrder(WindingOrder(-1)); }, "Invalid winding order -1"},
-        {[](auto& c) { c.setDepthTestFunction(DepthFunction(8)); }, "Invalid depth function 8"},
         {[](auto& c) { c.setStencilFunction(StencilFace(2), StencilFunction::ALWAYS, 0, 0u); },
          "Invalid stencil face 2"},
         {[](auto& c) { c.setStencilFunction(StencilFace::BACK, StencilFunction(8), 0, 0u); },
          "Invalid stencil function 8"},
-        {[](auto& c)
-         {
-             c.setStencilOperations(StencilFace::BACK, StencilOperation(8), StencilOperation::KEEP,
-                                    StencilOperation::KEEP);
-         },
-         "Invalid stencil operation 8"},
     };
     RenderContext target;
     for (const auto& test : cases)
@@ -201,8 +172,7 @@ TEST_F(RenderContextTest, invalidEnumsAreLoggedAndRefusedByGl)
     EXPECT_EQ(BlendFunction(7), target.getState().blendFunctionColour);
 }
 
-// Faults caught: a stamp that is trusted although a setter came between, a mirrored solid drawn inside out,
-// the stored comparison mask sent, or the lagging offset moved on by a repeated draw.
+// Faults caught: a stamp trusted after a setter, a mirrored solid inside out, the lagging offset moved on.
 TEST_F(RenderContextTest, applySendsDifferencesAndSkipsWhatWasApplied)
 {
     RenderContext target;
@@ -229,26 +199,22 @@ TEST_F(RenderContextTest, applySendsDifferencesAndSkipsWhatWasApplied)
     EXPECT_EQ(Calls{"glLineWidth(3)"}, callsOf([&] { target.apply(state, 78, false); }));
 }
 
-// Faults caught: a binding sent twice, one that is not sent though something else changed it, or units and
-// targets mixed up.
+// Faults caught: a binding sent twice, or not although something else changed it; units and targets mixed up.
 TEST_F(RenderContextTest, bindingsAreSentOnceUntilTheyChangeElsewhere)
 {
-    GLuint textures[2] = {};
-    glGenTextures(2, textures);
-    GLuint buffer = 0;
+    GLuint texture = 0, buffer = 0;
+    glGenTextures(1, &texture);
     glGenBuffers(1, &buffer);
-    const std::string first = std::to_string(textures[0]);
+    const std::string bindTexture = "glBindTexture(0x0de1, " + std::to_string(texture) + ")";
     const std::string bufferText = std::to_string(buffer);
-
     auto target = makeShared<RenderContext>();
     const Step steps[] = {
-        {[&](auto& c) { c.bindTexture(1, GL_TEXTURE_2D, textures[0]); },
-         {"glActiveTexture(0x84c1)", "glBindTexture(0x0de1, " + first + ")"}},
-        {[&](auto& c) { c.bindTexture(1, GL_TEXTURE_2D, textures[0]); }, {}},
+        {[&](auto& c) { c.bindTexture(1, GL_TEXTURE_2D, texture); },
+         {"glActiveTexture(0x84c1)", bindTexture}},
         {[&](auto& c) { c.bindTexture(1, GL_TEXTURE_CUBE_MAP, 0); }, {"glBindTexture(0x8513, 0)"}},
-        {[&](auto& c) { c.bindTexture(1, GL_TEXTURE_2D, textures[0]); }, {}},
-        {[&](auto& c) { c.bindTexture(0, GL_TEXTURE_2D, textures[0]); },
-         {"glActiveTexture(0x84c0)", "glBindTexture(0x0de1, " + first + ")"}},
+        {[&](auto& c) { c.bindTexture(1, GL_TEXTURE_2D, texture); }, {}},
+        {[&](auto& c) { c.bindTexture(0, GL_TEXTURE_2D, texture); },
+         {"glActiveTexture(0x84c0)", bindTexture}},
         {[&](auto& c) { c.bindArrayBuffer(buffer); }, {"glBindBuffer(0x8892, " + bufferText + ")"}},
         {[&](auto& c) { c.bindElementBuffer(buffer); }, {"glBindBuffer(0x8893, " + bufferText + ")"}},
         {[&](auto& c) { c.bindArrayBuffer(buffer), c.bindElementBuffer(buffer); }, {}},
@@ -263,20 +229,17 @@ TEST_F(RenderContextTest, bindingsAreSentOnceUntilTheyChangeElsewhere)
     EXPECT_FALSE(target->isVertexInputBound(5, 7));
     detail::bindingsChanged();
     EXPECT_FALSE(target->isVertexInputBound(5, 6));
-    EXPECT_EQ((Calls{"glActiveTexture(0x84c1)", "glBindTexture(0x0de1, " + first + ")"}),
-              callsOf([&] { target->bindTexture(1, GL_TEXTURE_2D, textures[0]); }));
+    EXPECT_EQ((Calls{"glActiveTexture(0x84c1)", bindTexture}),
+              callsOf([&] { target->bindTexture(1, GL_TEXTURE_2D, texture); }));
     EXPECT_EQ(Calls{"glUseProgram(0)"}, callsOf([&] { target->useProgram(0); }));
 
-    const uint64_t revision = target->getRevision();
     target = makeShared<RenderContext>();
-    EXPECT_NE(revision, target->getRevision());
     EXPECT_EQ(Calls{"glUseProgram(0)"}, callsOf([&] { target->useProgram(0); }));
-    glDeleteTextures(2, textures);
+    glDeleteTextures(1, &texture);
     glDeleteBuffers(1, &buffer);
 }
 
-// Faults caught: an array of an earlier program left enabled (a driver may then read freed memory), or a
-// constant trusted after an array was enabled in its place.
+// Faults caught: an array of an earlier program left on; a constant trusted after an array was in its place.
 TEST_F(RenderContextTest, attributeArraysAreSwitchedByDifference)
 {
     RenderContext target;
@@ -299,38 +262,14 @@ TEST_F(RenderContextTest, attributeArraysAreSwitchedByDifference)
     EXPECT_EQ(1u, callsOf([&] { target.setAttribOnes(2); }).size());
 }
 
-// Fault caught: "no program" answered while one is current that came from outside the draw path.
-TEST_F(RenderContextTest, programInUseIsKnownAfterOutsideChanges)
-{
-    GLuint current = 0;
-    glcalls::replace(glUseProgram, [&](GLuint program) { current = program; });
-    glcalls::replace(glGetIntegerv,
-                     [&](GLenum name, GLint* value) {
-                         name == GL_CURRENT_PROGRAM ? void(*value = GLint(current))
-                                                    : glcalls::real(glGetIntegerv)(name, value);
-                     });
-    RenderContext target;
-    EXPECT_EQ(0u, target.getProgramInUse());
-    target.useProgram(3);
-    EXPECT_EQ(3u, target.getProgramInUse());
-    glUseProgram(4);
-    detail::bindingsChanged();
-    EXPECT_EQ(4u, target.getProgramInUse());
-}
-
-// Faults caught: a property overwritten under those who linked it, a null holder handed out, or programs that
-// never learn of a property added later.
+// Faults caught: a property overwritten under those who linked it; programs that never learn of a later one.
 TEST_F(RenderContextTest, propertiesKeepTheirFirstHolder)
 {
     LogCapture log;
     RenderContext target;
-    const SharedPtr<ShaderUniformBase> first = makeShared<ShaderUniform<float>>(1);
-    const SharedPtr<ShaderUniformBase> second = makeShared<ShaderUniform<int>>(1);
-    const uint64_t empty = target.getPropertyRevision();
+    const auto first = makeValue(1.0f), second = makeValue(2);
     target.addProperty(first, "TIME");
     const uint64_t added = target.getPropertyRevision();
-    EXPECT_NE(empty, added);
-
     target.addProperty(second, "TIME");
     EXPECT_EQ(1, log.countMessage("Property \"TIME\" already exists in context."));
     target.addProperty(nullptr, "NONE");
@@ -340,8 +279,6 @@ TEST_F(RenderContextTest, propertiesKeepTheirFirstHolder)
 
     EXPECT_TRUE(target.getProperty("TIME") == first);
     EXPECT_FALSE(target.getProperty("NONE"));
-    EXPECT_FALSE(target.getProperty(nullptr));
-
     SharedPtr<ShaderUniformBase> uniform = second;
     target.linkUniform(uniform, "UNKNOWN");
     EXPECT_TRUE(uniform == second);

@@ -589,13 +589,12 @@ TEST_F(ShaderAssetsGl, shadeAsTheyShould)
 {
     const float corners[] = {-.1f, -.1f, 0, 0, 0, .1f, -.1f, 0, 1, 0, -.1f, .1f, 0, 0, 1, .1f, .1f, 0, 1, 1};
     std::map<std::string, GLuint> programs; // the driver takes its time for the first draw with each
-    int shadings = 0;
     for (const std::string& shading : split(std::regex_replace(SHADINGS, std::regex("\n  "), " "), '\n'))
     {
         if (shading.empty())
             continue;
-        ++shadings;
         const Words columns = split(shading, '|');
+        ASSERT_EQ(4u, columns.size()) << shading;
         auto inputs = readValues(columns.at(2));
         inputs.merge(readValues(STANDARD));
         std::istringstream words(columns.at(3));
@@ -647,5 +646,4 @@ TEST_F(ShaderAssetsGl, shadeAsTheyShould)
             }
         }
     }
-    EXPECT_EQ(51, shadings);
 }

@@ -1,32 +1,25 @@
 #pragma once
 
+#include "facilitytest.h"
 #include "imagefiles.h"
+
 #include "orv/memorystreamsource.h"
-#include "support/gltest.h"
 
 #include <deque>
 #include <string>
 
 /// A cache of textures with files in memory. What a test leaves in GL beyond the cache's last flush() fails it.
 template <class Cache>
-class TextureFixture : public support::GlTest
+class TextureFixture : public FacilityTest
 {
 protected:
     void SetUp() override
     {
-        support::GlTest::SetUp();
-        cache = orv::makeShared<Cache>();
-        m_source = orv::makeShared<orv::MemoryStreamSource>();
+        GlTest::SetUp();
         cache->registerSource(m_source);
     }
 
-    void TearDown() override
-    {
-        cache->flush();
-        EXPECT_EQ("", glcalls::describeLiveNames()) << "GL objects leaked";
-        cache.reset();
-        support::GlTest::TearDown();
-    }
+    void flush() override { cache->flush(); }
 
     void addFile(const std::string& name, const imagefiles::Bytes& file)
     {
@@ -35,9 +28,9 @@ protected:
                       orv::makeShared<orv::MemoryStream>(m_files.back().data(), int(file.size())));
     }
 
-    orv::SharedPtr<Cache> cache;
+    orv::SharedPtr<Cache> cache = orv::makeShared<Cache>();
 
 private:
-    orv::SharedPtr<orv::MemoryStreamSource> m_source;
+    orv::SharedPtr<orv::MemoryStreamSource> m_source = orv::makeShared<orv::MemoryStreamSource>();
     std::deque<imagefiles::Bytes> m_files;
 };
