@@ -466,6 +466,8 @@ pow(x, 0) | BOTH$SPEC | u_m_shininess 0; u_m_specularColour .5 .5 .5 1 | 128 128
 pow(0, 0), half vector of opposites | BOTH$SPEC$EMIS | u_m_shininess 0; u_m_specularColour 1 1 1 1;
   u_m_emissiveColour .5 .5 .5 1; u_t_cameraPosition 0 0 -1e18 1 | 128 128 128 255
 highlights from behind | BOTH$SPEC | u_m_specularColour 1 1 1 1; u_l_position 0 0 -1 0 | 0 0 0 255
+exponent of highlights | BOTH$SPEC | u_m_specularColour 1 1 1 1; u_l_position .96 0 .28 0; u_m_shininess 3;
+  u_t_cameraPosition 0 0 1e4 1 | 131 131 131 255
 level without effect | BOTH$SPEC | u_m_specularColour 1 1 1 1; u_m_specularLevel .25 | 64 64 64 255
 ambient light of one light only | BOTH$AMBI
   | u_l_count 2; u_l_ambientColour 2* .5 .5 .5 1; u_m_ambientColour .5 1 0 1 | 128 255 0 255
