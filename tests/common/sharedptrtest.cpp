@@ -25,30 +25,22 @@ private:
     std::atomic<int>& m_deaths;
 };
 
-class DerivedProbe : public Probe
-{
-public:
-    using Probe::Probe;
-};
-
 } // namespace
 
 // Fault caught: a copy, move or assignment that takes or drops one reference too many or too few.
 TEST(SharedPtr, deletesOnceWithTheLastReference)
 {
     std::atomic<int> deaths = 0;
-    DerivedProbe* const object = new DerivedProbe(deaths);
-    EXPECT_EQ(0, object->sharedGetCount());
-
-    SharedPtr<DerivedProbe> first(object);
-    SharedPtr<Probe> second(first);
-    SharedPtr<Probe> third;
+    Probe* const object = new Probe(deaths);
+    SharedPtr<Probe> first(object);
+    SharedPtr<Shared> second(first);
+    SharedPtr<Shared> third;
     third = second;
     EXPECT_EQ(3, object->sharedGetCount());
 
-    SharedPtr<Probe> moved(std::move(third));
+    SharedPtr<Shared> moved(std::move(third));
     third = std::move(moved);
-    const SharedPtr<Probe>& itself = third;
+    const SharedPtr<Shared>& itself = third;
     third = itself;
     EXPECT_EQ(3, object->sharedGetCount());
     EXPECT_TRUE(moved == nullptr);
@@ -103,12 +95,7 @@ TEST(SharedPtr, emptyArrowLogsTwiceAndGivesNull)
     ASSERT_EQ(2u, records.size());
     EXPECT_EQ("Error: pointer operator on null. class: Probe", records[0].message);
     EXPECT_EQ("ORV_ASSERT: m_ptr", records[1].message);
-    for (const support::LogCapture::Record& record : records)
-    {
-        EXPECT_EQ('E', record.level);
-        EXPECT_EQ("sharedptr", record.source);
-        EXPECT_EQ("operator->", record.function);
-    }
+    EXPECT_EQ("sharedptr operator->", records[0].source + " " + records[0].function);
 }
 
 // Fault caught: an object that is copied while its count is 0 (inside its destructor, say) passing unnoticed.

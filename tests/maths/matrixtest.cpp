@@ -14,8 +14,8 @@ namespace
 
 void expectNear(const Vector4f& expected, const Vector4f& actual, float tolerance)
 {
-    for (int i = 0; i < 4; ++i)
-        EXPECT_NEAR(expected[i], actual[i], tolerance) << toString(actual);
+    const Vector4f off = expected - actual;
+    EXPECT_NEAR(0.0f, std::sqrt(dot(off, off)), tolerance) << toString(actual);
 }
 
 void expectNear(const Matrix4f& expected, const Matrix4f& actual, float tolerance)
@@ -44,12 +44,10 @@ TEST(Matrix, columnsAreWeightedByTheVector)
     const Matrix3f three(Vector3f(1, 2, 3), Vector3f(4, 5, 6), Vector3f(7, 8, 9));
     EXPECT_EQ(Vector3f(4, 5, 6), three * Vector3f::Y_AXIS);
     EXPECT_EQ(Matrix3f(Vector3f(1, 4, 7), Vector3f(2, 5, 8), Vector3f(3, 6, 9)), transpose(three));
-    EXPECT_EQ(three, three * Matrix3f::IDENTITY);
 
     const Matrix4f moveThenScale = scaleMatrix(Vector3f(2, 2, 2)) * translationMatrix(Vector3f(1, 2, 3));
     EXPECT_EQ(Vector4f(4, 6, 8, 1), moveThenScale * Vector4f(1, 1, 1, 1)) << "the right one acts first";
     EXPECT_EQ(2.0f, moveThenScale.data()[12]) << "translation in the last column of GL's order";
-    EXPECT_EQ(moveThenScale[3], transpose(transpose(moveThenScale))[3]);
     EXPECT_EQ(2.0f, transpose(moveThenScale)[0].w);
 }
 
@@ -95,51 +93,38 @@ TEST(Matrix, inverseOfExtremeScales)
 TEST(Matrix, withoutInverseComesZeroAndNeverNaN)
 {
     const float infinity = std::numeric_limits<float>::infinity();
-    const struct
+    const Matrix4f cases[] = {
+        Matrix4f(),
+        scaleMatrix(Vector3f(1, 0, 1)),
+        Matrix4f(Vector4f(1, 2, 3, 0), Vector4f(1, 2, 3, 0), Vector4f(0, 0, 1, 0), Vector4f(0, 0, 0, 1)),
+        scaleMatrix(Vector3f(1, infinity, 1)),
+        scaleMatrix(Vector3f(1, 1, std::nanf(""))),
+        scaleMatrix(Vector3f(1, 1, 1e-42f))}; // the inverse is beyond floats
+    for (const Matrix4f& m : cases)
     {
-        const char* name;
-        Matrix4f m;
-    } cases[] = {
-        {"zero", Matrix4f()},
-        {"flat", scaleMatrix(Vector3f(1, 0, 1))},
-        {"equal columns",
-         Matrix4f(Vector4f(1, 2, 3, 0), Vector4f(1, 2, 3, 0), Vector4f(0, 0, 1, 0), Vector4f(0, 0, 0, 1))},
-        {"infinite", scaleMatrix(Vector3f(1, infinity, 1))},
-        {"not a number", scaleMatrix(Vector3f(1, 1, std::nanf("")))},
-        {"inverse beyond floats", scaleMatrix(Vector3f(1, 1, 1e-42f))},
-    };
-    for (const auto& c : cases)
-    {
-        EXPECT_EQ(Matrix4f(), inverse(c.m)) << c.name;
-        EXPECT_EQ(Matrix3f(), inverse(upper3x3(c.m))) << c.name;
+        EXPECT_EQ(Matrix4f(), inverse(m)) << toString(m);
+        EXPECT_EQ(Matrix3f(), inverse(upper3x3(m))) << toString(m);
     }
 }
 
 TEST(Matrix, rotationsTurnCounterClockwise)
 {
-    const struct
+    const Vector3f& x = Vector3f::X_AXIS;
+    const Vector3f& y = Vector3f::Y_AXIS;
+    const Vector3f& z = Vector3f::Z_AXIS;
+    const Vector3f turns[3][3] = {{z, x, y}, {x, y, z}, {y, z, x}};
+    for (const auto& [axis, from, to] : turns)
     {
-        Vector3f axis;
-        Vector3f from;
-        Vector3f to;
-    } cases[] = {
-        {Vector3f::Z_AXIS, Vector3f::X_AXIS, Vector3f::Y_AXIS},
-        {Vector3f::X_AXIS, Vector3f::Y_AXIS, Vector3f::Z_AXIS},
-        {Vector3f::Y_AXIS, Vector3f::Z_AXIS, Vector3f::X_AXIS},
-    };
-    for (const auto& c : cases)
-    {
-        const Quaternionf q = quaternionFromAxisAngle(c.axis, Anglef::fromDegrees(90));
-        expectNear(Vector4f(c.to, 0), Vector4f(toMatrix3(q) * c.from, 0), 1e-6f);
+        const Quaternionf q = quaternionFromAxisAngle(axis, Anglef::fromDegrees(90));
+        expectNear(Vector4f(to, 0), Vector4f(toMatrix3(q) * from, 0), 1e-6f);
         // Fault caught: a file's axis of length 2 that skews instead of turning.
-        const Quaternionf longer(q.a * 3, q.x * 3, q.y * 3, q.z * 3);
-        expectNear(toMatrix4(q), toMatrix4(longer), 1e-6f);
+        expectNear(toMatrix4(q), toMatrix4(Quaternionf(q.a * 3, q.x * 3, q.y * 3, q.z * 3)), 1e-6f);
     }
     for (float size : {0.0f, 1e-20f, 1e25f, std::nanf("")}) // the squares leave the range of a float
         EXPECT_EQ(Matrix4f::IDENTITY, toMatrix4(Quaternionf(size, size, 0, 0))) << size;
 
-    const Quaternionf p = quaternionFromAxisAngle(Vector3f::X_AXIS, Anglef::fromDegrees(40));
-    const Quaternionf q = quaternionFromAxisAngle(Vector3f::Y_AXIS, Anglef::fromDegrees(70));
+    const Quaternionf p = quaternionFromAxisAngle(x, Anglef::fromDegrees(40));
+    const Quaternionf q = quaternionFromAxisAngle(y, Anglef::fromDegrees(70));
     expectNear(toMatrix4(p) * toMatrix4(q), toMatrix4(p * q), 1e-6f);
 }
 
@@ -175,8 +160,6 @@ TEST(Matrix, textForms)
 {
     EXPECT_EQ("Matrix2f(\n  Vector2f(1, 0), \n  Vector2f(0, 1)\n)",
               toString(Matrix2f(Vector2f(1, 0), Vector2f(0, 1))));
-    EXPECT_EQ("Matrix3f(\n  Vector3f(1, 0, 0), \n  Vector3f(0, 1, 0), \n  Vector3f(0, 0, 1)\n)",
-              toString(Matrix3f::IDENTITY));
     EXPECT_EQ("Matrix4f(\n  Vector4f(1, 0, 0, 0), \n  Vector4f(0, 1, 0, 0), \n  Vector4f(0, 0, 1, 0), \n"
               "  Vector4f(7, 8, 9, 1)\n)",
               toString(translationMatrix(Vector3f(7, 8, 9))));
@@ -184,22 +167,19 @@ TEST(Matrix, textForms)
 
 TEST(Quaternion, textForms)
 {
+    EXPECT_EQ("Anglef(90 degrees)", toString(Anglef::fromDegrees(90)));
     const struct
     {
-        const char* name;
-        std::string text;
+        Quaternionf q;
         const char* expected;
     } cases[] = {
-        {"degrees", toString(Anglef::fromDegrees(90)), "Anglef(90 degrees)"},
-        {"identity", toString(Quaternionf::IDENTITY),
-         "Quaternionf(1, 0, 0, 0) (\n  Vector3f(0, 1, 0)\n  Anglef(0 degrees)\n)"},
-        {"half turn", toString(Quaternionf(0, 0, 0, 1)),
-         "Quaternionf(0, 0, 0, 1) (\n  Vector3f(0, 0, 1)\n  Anglef(180 degrees)\n)"},
-        {"turned fully", toString(Quaternionf(-1, 0, 0, 0)),
+        {Quaternionf::IDENTITY, "Quaternionf(1, 0, 0, 0) (\n  Vector3f(0, 1, 0)\n  Anglef(0 degrees)\n)"},
+        {Quaternionf(0, 0, 0, 1), "Quaternionf(0, 0, 0, 1) (\n  Vector3f(0, 0, 1)\n  Anglef(180 degrees)\n)"},
+        {Quaternionf(-1, 0, 0, 0),
          "Quaternionf(-1, 0, 0, 0) (\n  Vector3f(0, 1, 0)\n  Anglef(360 degrees)\n)"},
-        {"scalar above 1 by rounding", toString(Quaternionf(std::nextafter(1.0f, 2.0f), 0, 0, 0)),
+        {Quaternionf(std::nextafter(1.0f, 2.0f), 0, 0, 0), // by rounding
          "Quaternionf(1, 0, 0, 0) (\n  Vector3f(0, 1, 0)\n  Anglef(0 degrees)\n)"},
     };
     for (const auto& c : cases)
-        EXPECT_EQ(c.expected, c.text) << c.name;
+        EXPECT_EQ(c.expected, toString(c.q));
 }

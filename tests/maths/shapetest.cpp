@@ -38,12 +38,10 @@ TEST(Shape, raycast)
     } cases[] = {
         {"plane", makeShared<Plane>(identity), down, true, 5, Vector3f::Z_AXIS},
         {"plane behind", makeShared<Plane>(identity), up, true, -5, Vector3f::Z_AXIS},
-        {"plane beside", makeShared<Plane>(identity), beside, true, 5, Vector3f::Z_AXIS},
         {"plane alongside", makeShared<Plane>(identity), along, false, 0, Vector3f()},
         {"plane turned", makeShared<Plane>(aside), along, true, 10, Vector3f::X_AXIS},
         {"plane flat in y", makeShared<Plane>(flat), down, false, 0, Vector3f()},
         {"plane, broken ray", makeShared<Plane>(identity), broken, false, 0, Vector3f()},
-        {"square", makeShared<Square>(identity), down, true, 5, Vector3f::Z_AXIS},
         {"square corner", makeShared<Square>(identity), edge, true, 5, Vector3f::Z_AXIS},
         {"square beside", makeShared<Square>(identity), beside, false, 0, Vector3f()},
         {"square doubled", makeShared<Square>(doubled), beside, true, 5, Vector3f::Z_AXIS},

@@ -21,20 +21,15 @@ TEST(MemoryStream, readStaysWithinTheBlock)
     const struct
     {
         const char* name;
-        unsigned int seek;
+        unsigned seek;
         int position;
-        unsigned int count;
+        unsigned count;
         const char* read;
         bool eof; // afterwards
     } cases[] = {
-        {"start", 0, 0, 4, "0123", false},
-        {"whole", 0, 0, 10, "0123456789", true},
-        {"more than there is", 8, 8, 4, "89", true},
-        {"far more than there is", 8, 8, 0xffffffffu, "89", true},
-        {"nothing", 8, 8, 0, "", false},
-        {"at the end", 10, 10, 1, "", true},
-        {"beyond the end", 20, 10, 4, "", true},
-        {"a negative position", 0xfffffff0u, -16, 4, "", false},
+        {"whole", 0, 0, 10, "0123456789", true}, {"far more than there is", 8, 8, 0xffffffffu, "89", true},
+        {"nothing", 8, 8, 0, "", false},         {"at the end", 10, 10, 1, "", true},
+        {"beyond the end", 20, 10, 4, "", true}, {"a negative position", 0xfffffff0u, -16, 4, "", false},
     };
     for (const auto& c : cases)
     {
@@ -68,13 +63,11 @@ TEST(MemoryStreamSource, everyOpeningStartsAnew)
     const SharedPtr<MemoryStream> added = makeShared<MemoryStream>(TEN, 10);
     added->seek(5);
     source.add("a.txt", added);
-
     const SharedPtr<Stream> first = source.open("a.txt", false);
-    const SharedPtr<Stream> second = source.open("a.txt", false);
-    ASSERT_TRUE(first && second);
+    ASSERT_TRUE(first);
     EXPECT_EQ(0, first->tell());
     first->seek(7);
-    EXPECT_EQ(0, second->tell());
+    EXPECT_EQ(0, source.open("a.txt", false)->tell());
     EXPECT_EQ(5, added->tell());
 }
 

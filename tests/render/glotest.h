@@ -2,6 +2,7 @@
 
 #include "glo/glowriter.h"
 #include "support/gltest.h"
+#include "support/logcapture.h"
 
 #include "orv/assetcachepool.h"
 #include "orv/glo.h"
@@ -34,9 +35,6 @@ private:
 class GloTest : public support::GlTest
 {
 protected:
-    GloTest() = default;
-    explicit GloTest(const headless::Options& options) : GlTest(options) {}
-
     void SetUp() override
     {
         GlTest::SetUp();
@@ -71,6 +69,18 @@ protected:
 
     orv::Glo::Ptr load(const glo::GloScene& scene) { return load(write(scene)); }
 
+    /// Expects the one error with which the file is refused, or that it loads without any where error is empty.
+    template <class File>
+    orv::Glo::Ptr expectLoad(const File& file, const std::string& error, const std::string& what)
+    {
+        support::LogCapture log;
+        const orv::Glo::Ptr loaded = load(file);
+        EXPECT_EQ(error.empty(), bool(loaded)) << what << log.text();
+        EXPECT_EQ(error.empty() ? 0 : 1, log.count('E')) << what << log.text();
+        EXPECT_TRUE(error.empty() || log.countMessage(error) == 1) << what << log.text();
+        return loaded;
+    }
+
     orv::SharedPtr<orv::AssetCachePool> m_pool;
     orv::SharedPtr<GloTestSource> m_source;
     orv::SharedPtr<orv::SceneNode> m_root;
@@ -96,12 +106,32 @@ inline glo::Material makeMaterial(const std::string& name, const orv::Vector4f& 
     return {name, {technique}};
 }
 
-inline glo::NodeData makeNode(const std::string& name)
+inline glo::NodeData makeNode(const std::string& name, const std::vector<glo::NodeData>& children = {})
 {
     glo::NodeData node;
-    node.name = name;
-    node.scopedName = name;
+    node.name = node.scopedName = name;
+    node.children = children;
     return node;
+}
+
+/// A node that shows one part of the file: node.*slot = reference.
+template <class Slot, class Reference>
+glo::NodeData makeNode(const std::string& name, Slot glo::NodeData::*slot, const Reference& reference)
+{
+    glo::NodeData node = makeNode(name);
+    node.*slot = reference;
+    return node;
+}
+
+inline glo::NodeData makeSolidNode(const std::string& name, const std::string& geometry,
+                                   const std::string& material)
+{
+    return makeNode(name, &glo::NodeData::geometry, glo::GeometryReference{geometry, {material}});
+}
+
+inline glo::NodeData makeLightNode(const std::string& name)
+{
+    return makeNode(name, &glo::NodeData::light, glo::LightReference{"lamp"});
 }
 
 /// Places a node, in matrix and components alike.
@@ -111,66 +141,48 @@ inline void moveTo(glo::NodeData& node, const orv::Vector3f& position)
     node.transform = orv::translationMatrix(position);
 }
 
+inline glo::Channel makeChannel(const char* type, const char* name, const char* property,
+                                const std::vector<float>& values, float time = 1.0f)
+{
+    glo::Channel channel;
+    channel.targetType = type;
+    channel.targetName = name;
+    channel.property = property;
+    glo::addKey(channel, time, values);
+    return channel;
+}
+
 /// One of everything that a file can hold.
 inline glo::GloScene makeFullScene()
 {
     glo::GloScene scene;
     scene.geometries = {makeSquareGeometry("square"), makeSquareGeometry("skinned")};
-    glo::VertexSet& vertices = scene.geometries[1].vertices;
-    vertices = glo::makeVertexSet({{"a_position", 3, {0, 0, 0, 1, 0, 0, 1, 1, 0, 0, 1, 0}},
-                                   {"a_joints", 4, {0, 1, 0, 0, 0, 1, 0, 0, 0, 1, 0, 0, 0, 1, 0, 0}},
-                                   {"a_weights", 4, {1, 0, 0, 0, 1, 0, 0, 0, 0, 1, 0, 0, 0, 1, 0, 0}}});
+    scene.geometries[1].vertices =
+        glo::makeVertexSet({{"a_position", 3, {0, 0, 0, 1, 0, 0, 1, 1, 0, 0, 1, 0}},
+                            {"a_joints", 4, {0, 1, 0, 0, 0, 1, 0, 0, 0, 1, 0, 0, 0, 1, 0, 0}},
+                            {"a_weights", 4, {1, 0, 0, 0, 1, 0, 0, 0, 0, 1, 0, 0, 0, 1, 0, 0}}});
     scene.geometries[1].primitiveSets.push_back({glo::primitive::LINE_LOOP, {}});
 
-    glo::Skin skin;
+    glo::Skin& skin = scene.skins.emplace_back();
     skin.name = "skin";
     skin.geometry = "skinned";
     skin.attachments = {{"hip", orv::Matrix4f::IDENTITY}, {"knee", orv::Matrix4f::IDENTITY}};
-    scene.skins.push_back(skin);
-
-    glo::LightDefinition light;
-    light.name = "lamp";
-    scene.lights.push_back(light);
-    glo::CameraDefinition camera;
-    camera.name = "lens";
-    scene.cameras.push_back(camera);
-
+    scene.lights.emplace_back().name = "lamp";
+    scene.cameras.emplace_back().name = "lens";
     scene.materials = {makeMaterial("red", orv::Vector4f(1, 0, 0, 1)),
                        makeMaterial("blue", orv::Vector4f(0, 0, 1, 1))};
-    glo::Sampler sampler;
-    sampler.image = "orv#white.png";
-    scene.materials[0].techniques[0].diffuse.sampler = sampler;
+    scene.materials[0].techniques[0].diffuse.sampler.emplace().image = "orv#white.png";
 
-    glo::Channel move;
-    move.targetType = "node";
-    move.targetName = "node-hip";
-    move.property = "translation";
-    glo::addKey(move, 0.0f, {0, 0, 0});
+    glo::Channel move = makeChannel("node", "node-hip", "translation", {0, 0, 0}, 0.0f);
     glo::addKey(move, 1.0f, {0, 1, 0});
-    glo::Channel fade;
-    fade.targetType = "material";
-    fade.targetName = "red";
-    fade.property = "opacity";
-    glo::addKey(fade, 0.0f, {1.0f});
-    glo::AnimationData animation;
-    animation.name = "walk";
-    animation.loopRanges.push_back({0.25f, 0.75f});
-    animation.channels.push_back(move);
-    animation.animations.push_back({"inner", {}, {fade}, {}});
-    scene.animations.push_back(animation);
+    const glo::Channel fade = makeChannel("material", "red", "opacity", {1.0f}, 0.0f);
+    scene.animations.push_back({"walk", {{0.25f, 0.75f}}, {move}, {{"inner", {}, {fade}, {}}}});
 
-    glo::NodeData top = makeNode("top");
-    glo::NodeData square = makeNode("square node");
-    square.geometry = glo::GeometryReference{"square", {"red"}};
-    glo::NodeData figure = makeNode("figure");
-    figure.skin = glo::SkinReference{"skin", {"blue", "blue"}, {"hip"}};
-    glo::NodeData hip = makeNode("hip");
-    hip.children.push_back(makeNode("knee"));
-    glo::NodeData lamp = makeNode("lamp node");
-    lamp.light = glo::LightReference{"lamp"};
-    glo::NodeData eye = makeNode("eye");
-    eye.camera = glo::CameraReference{"lens"};
-    top.children = {square, figure, hip, lamp, eye};
-    scene.scene = glo::SceneData{"scene", top};
+    const glo::SkinReference figure = {"skin", {"blue", "blue"}, {"hip"}};
+    scene.scene = glo::SceneData{
+        "scene", makeNode("top", {makeSolidNode("square node", "square", "red"),
+                                  makeNode("figure", &glo::NodeData::skin, figure),
+                                  makeNode("hip", {makeNode("knee")}), makeLightNode("lamp node"),
+                                  makeNode("eye", &glo::NodeData::camera, glo::CameraReference{"lens"})})};
     return scene;
 }

@@ -6,6 +6,7 @@
 #include "orv/camera.h"
 #include "orv/light.h"
 #include "orv/rendercontext.h"
+#include "orv/rendertarget.h"
 #include "orv/sceneutil.h"
 #include "orv/shaderprogramcache.h"
 #include "orv/simplerenderer.h"
@@ -21,14 +22,17 @@
 #include <utility>
 #include <vector>
 
+constexpr support::Rgba RED = {255, 0, 0, 255};
+constexpr support::Rgba GREEN = {0, 255, 0, 255};
+constexpr support::Rgba BLUE = {0, 0, 255, 255};
+constexpr support::Rgba WHITE = {255, 255, 255, 255};
+constexpr support::Rgba BLACK = {0, 0, 0, 255};
+
 /// A scene with a camera at (0, 0, 3) that looks at the origin and sees 3 units up, down, left and right
 /// there. At the end things are dropped as the manual says; what stays behind or is logged is a failure.
 class SceneTest : public support::GlTest
 {
 protected:
-    SceneTest() = default;
-    explicit SceneTest(const headless::Options& options) : GlTest(options) {}
-
     void SetUp() override
     {
         GlTest::SetUp();
@@ -47,6 +51,7 @@ protected:
         scene = nullptr;
         camera = nullptr;
         renderer = nullptr;
+        m_paintProgram = nullptr;
         pool->flush();
         pool->flush();
         pool = nullptr;
@@ -68,10 +73,9 @@ protected:
     /// @param properties  GLSL names of uniforms and what they take.
     orv::SharedPtr<orv::ShaderProgram>
     makeProgram(const char* vertex, const char* fragment,
-                const std::vector<std::pair<const char*, const char*>>& properties,
-                const char* name = nullptr)
+                const std::vector<std::pair<const char*, const char*>>& properties)
     {
-        auto program = pool->getShaderProgramCache()->create(vertex, fragment, name);
+        auto program = pool->getShaderProgramCache()->create(vertex, fragment, nullptr);
         for (int i = 0; i < program->getUniformCount(); ++i)
         {
             for (const auto& [uniform, property] : properties)
@@ -86,19 +90,23 @@ protected:
     /// Draws in the one colour M_COLOUR, whatever the light.
     orv::SharedPtr<orv::Appearance> makePaint(const orv::Colour4f& colour)
     {
-        static const char NAME[] = "test paint";
-        const auto& programs = pool->getShaderProgramCache();
-        auto program = programs->exists(NAME) ? programs->get(NAME) : nullptr;
-        if (!program)
-            program =
+        if (!m_paintProgram)
+            m_paintProgram =
                 makeProgram("attribute vec3 a_position; uniform mat4 u_transform;"
                             "void main() { gl_Position = u_transform * vec4(a_position, 1.0); }",
                             "uniform mediump vec4 u_colour; void main() { gl_FragColor = u_colour; }",
-                            {{"u_transform", "T_MODEL_VIEW_PROJECTION"}, {"u_colour", "M_COLOUR"}}, NAME);
+                            {{"u_transform", "T_MODEL_VIEW_PROJECTION"}, {"u_colour", "M_COLOUR"}});
         auto appearance = orv::makeShared<orv::Appearance>();
-        appearance->setShaderProgram(program);
+        appearance->setShaderProgram(m_paintProgram);
         appearance->setProperty("M_COLOUR", orv::Vector4f(colour.r, colour.g, colour.b, colour.a));
         return appearance;
+    }
+
+    orv::SharedPtr<orv::RenderTarget> makeTarget(unsigned width, unsigned height)
+    {
+        const auto texture = pool->getTexture2DCache()->create(
+            width, height, orv::Texture::Format::RGB, orv::Texture::Type::UNSIGNED_BYTE, nullptr, nullptr);
+        return orv::makeShared<orv::RenderTarget>(texture, nullptr, true, false);
     }
 
     /// The unit square about a place, facing +z, in the scene.
@@ -127,4 +135,7 @@ protected:
     orv::SharedPtr<orv::SimpleRenderer> renderer;
     orv::SharedPtr<orv::SceneNode> scene;
     orv::SharedPtr<orv::Camera> camera;
+
+private:
+    orv::SharedPtr<orv::ShaderProgram> m_paintProgram;
 };

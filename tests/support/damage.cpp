@@ -35,13 +35,11 @@ void forEachSpoiledByte(const Bytes& file,
     {
         if (!isChosen(offset, step))
             continue;
-        const uint8_t original = file[offset];
-        const uint8_t values[] = {0, 0xff, uint8_t(original ^ (1u << offset % 8))};
         Bytes spoiled = file;
-        for (uint8_t value : values)
+        for (uint8_t value : {uint8_t(0), uint8_t(0xff), uint8_t(file[offset] ^ (1u << offset % 8))})
         {
             spoiled[offset] = value;
-            if (value != original)
+            if (value != file[offset])
                 use(spoiled, offset);
         }
     }

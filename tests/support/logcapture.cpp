@@ -2,6 +2,7 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <cstdint>
 #include <cstdlib>
 #include <sstream>
@@ -109,30 +110,25 @@ std::vector<LogCapture::Record> LogCapture::records() const
     return found;
 }
 
+int LogCapture::countIf(const std::function<bool(const Record&)>& condition) const
+{
+    const std::vector<Record> all = records();
+    return int(std::count_if(all.begin(), all.end(), condition));
+}
+
 int LogCapture::count(char level) const
 {
-    int matching = 0;
-    for (const Record& record : records())
-        matching += record.level == level;
-    return matching;
+    return countIf([=](const Record& record) { return record.level == level; });
 }
 
 bool LogCapture::contains(const std::string& part) const
 {
-    for (const Record& record : records())
-    {
-        if (record.message.find(part) != std::string::npos)
-            return true;
-    }
-    return false;
+    return countIf([&](const Record& record) { return record.message.find(part) != std::string::npos; }) > 0;
 }
 
 int LogCapture::countMessage(const std::string& message) const
 {
-    int matching = 0;
-    for (const Record& record : records())
-        matching += record.message == message;
-    return matching;
+    return countIf([&](const Record& record) { return record.message == message; });
 }
 
 void LogCapture::clear()

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <cstdio>
+#include <functional>
 #include <string>
 #include <vector>
 
@@ -49,6 +50,8 @@ public:
     void clear();
 
 private:
+    int countIf(const std::function<bool(const Record&)>& condition) const;
+
     int m_file;
     int m_savedError;
     long m_start = 0;

@@ -35,9 +35,8 @@ Picture makeDifference(const Picture& a, const Picture& b)
     Picture difference = Picture::filled(a.width, a.height, {});
     for (size_t i = 0; i < a.rgba.size(); ++i)
     {
-        const int gained = std::abs(a.rgba[i] - b.rgba[i]) * DIFFERENCE_GAIN;
         if (i % 4 != 3)
-            difference.rgba[i] = uint8_t(std::min(gained, 255));
+            difference.rgba[i] = uint8_t(std::min(std::abs(a.rgba[i] - b.rgba[i]) * DIFFERENCE_GAIN, 255));
     }
     return difference;
 }
@@ -56,8 +55,7 @@ std::string save(const std::string& path, const Picture& picture)
 
 std::ostream& operator<<(std::ostream& stream, const Rgba& colour)
 {
-    return stream << "(" << int(colour.r) << " " << int(colour.g) << " " << int(colour.b) << " "
-                  << int(colour.a) << ")";
+    return stream << '(' << +colour.r << ' ' << +colour.g << ' ' << +colour.b << ' ' << +colour.a << ')';
 }
 
 bool isNear(const Rgba& a, const Rgba& b, int tolerance)
@@ -67,8 +65,9 @@ bool isNear(const Rgba& a, const Rgba& b, int tolerance)
 
 Picture Picture::filled(int width, int height, const Rgba& colour)
 {
-    Picture picture{width, height, std::vector<uint8_t>(size_t(width) * size_t(height) * 4)};
-    picture.fillRectangle(0, 0, width, height, colour);
+    Picture picture{width, height, {}};
+    for (int i = 0; i < width * height; ++i)
+        picture.rgba.insert(picture.rgba.end(), {colour.r, colour.g, colour.b, colour.a});
     return picture;
 }
 
@@ -85,57 +84,29 @@ Rgba Picture::pixel(int x, int y) const
 
 void Picture::setPixel(int x, int y, const Rgba& colour)
 {
-    if (x < 0 || y < 0 || x >= width || y >= height)
-        return;
-    uint8_t* bytes = &rgba[(size_t(y) * size_t(width) + size_t(x)) * 4];
-    bytes[0] = colour.r;
-    bytes[1] = colour.g;
-    bytes[2] = colour.b;
-    bytes[3] = colour.a;
-}
-
-void Picture::fillRectangle(int x, int y, int rectWidth, int rectHeight, const Rgba& colour)
-{
-    for (int row = y; row < y + rectHeight; ++row)
-    {
-        for (int column = x; column < x + rectWidth; ++column)
-            setPixel(column, row, colour);
-    }
-}
-
-Rgba Picture::average(int x, int y, int regionWidth, int regionHeight) const
-{
-    const int count = regionWidth * regionHeight;
-    long sums[4] = {};
-    if (count <= 0)
-    {
-        ADD_FAILURE() << "an empty region has no average";
-        return {0, 0, 0, 0};
-    }
-    for (int row = y; row < y + regionHeight; ++row)
-    {
-        for (int column = x; column < x + regionWidth; ++column)
-        {
-            const Rgba colour = pixel(column, row);
-            sums[0] += colour.r;
-            sums[1] += colour.g;
-            sums[2] += colour.b;
-            sums[3] += colour.a;
-        }
-    }
-    const auto mean = [&](int channel) { return uint8_t((sums[channel] + count / 2) / count); };
-    return {mean(0), mean(1), mean(2), mean(3)};
+    const uint8_t bytes[] = {colour.r, colour.g, colour.b, colour.a};
+    if (x >= 0 && y >= 0 && x < width && y < height)
+        std::copy(bytes, bytes + 4, &rgba[(size_t(y) * size_t(width) + size_t(x)) * 4]);
 }
 
 Rgba Picture::average() const
 {
-    return average(0, 0, width, height);
+    const size_t count = rgba.size() / 4;
+    if (count == 0)
+    {
+        ADD_FAILURE() << "an empty picture has no average";
+        return {0, 0, 0, 0};
+    }
+    size_t sums[4] = {};
+    for (size_t i = 0; i < rgba.size(); ++i)
+        sums[i % 4] += rgba[i];
+    const auto mean = [&](int channel) { return uint8_t((sums[channel] + count / 2) / count); };
+    return {mean(0), mean(1), mean(2), mean(3)};
 }
 
 Picture readFrame()
 {
-    EGLint width = 0;
-    EGLint height = 0;
+    EGLint width = 0, height = 0;
     EGLSurface surface = eglGetCurrentSurface(EGL_DRAW);
     eglQuerySurface(eglGetCurrentDisplay(), surface, EGL_WIDTH, &width);
     eglQuerySurface(eglGetCurrentDisplay(), surface, EGL_HEIGHT, &height);
@@ -172,8 +143,7 @@ testing::AssertionResult comparePictures(const std::string& name, const Picture&
 {
     const bool isSameSize = expected.width == actual.width && expected.height == actual.height;
     const int count = expected.width * expected.height;
-    int differing = 0;
-    int largest = 0;
+    int differing = 0, largest = 0;
     std::string firstPlace;
     for (int i = 0; isSameSize && i < count; ++i)
     {

@@ -12,10 +12,7 @@ namespace support
 
 struct Rgba
 {
-    uint8_t r = 0;
-    uint8_t g = 0;
-    uint8_t b = 0;
-    uint8_t a = 255;
+    uint8_t r = 0, g = 0, b = 0, a = 255;
 
     bool operator==(const Rgba&) const = default;
 };
@@ -28,8 +25,7 @@ bool isNear(const Rgba& a, const Rgba& b, int tolerance);
 /// A picture in memory, top row first; (0, 0) is the upper left pixel.
 struct Picture
 {
-    int width = 0;
-    int height = 0;
+    int width = 0, height = 0;
     std::vector<uint8_t> rgba;
 
     /// All pixels of one colour.
@@ -38,10 +34,8 @@ struct Picture
     /// @return transparent black outside the picture, after a test failure.
     Rgba pixel(int x, int y) const;
     void setPixel(int x, int y, const Rgba& colour);
-    void fillRectangle(int x, int y, int rectWidth, int rectHeight, const Rgba& colour);
 
-    /// The mean colour of a region (rounded), the whole picture by default.
-    Rgba average(int x, int y, int regionWidth, int regionHeight) const;
+    /// The mean colour of all pixels, rounded.
     Rgba average() const;
 };
 
