@@ -19,23 +19,19 @@ using namespace glo;
 namespace
 {
 
-/// Coefficients that a value of the type can be made of, and the value.
+/// A value of a key's coefficients.
 template <class T>
 struct KeyValue;
 
 template <>
 struct KeyValue<float>
 {
-    static constexpr uint32_t FEWEST = 1;
-    static constexpr uint32_t MOST = 1;
     static float make(const float* c) { return c[0]; }
 };
 
 template <>
 struct KeyValue<Vector3f>
 {
-    static constexpr uint32_t FEWEST = 3;
-    static constexpr uint32_t MOST = 3;
     static Vector3f make(const float* c) { return Vector3f(c[0], c[1], c[2]); }
 };
 
@@ -43,17 +39,12 @@ struct KeyValue<Vector3f>
 template <>
 struct KeyValue<Vector4f>
 {
-    static constexpr uint32_t FEWEST = 4;
-    static constexpr uint32_t MOST = 4;
     static Vector4f make(const float* c) { return Vector4f(c[0], c[1], c[2], c[3]); }
 };
 
-/// A colour may lack its opacity.
 template <>
 struct KeyValue<Colour4f>
 {
-    static constexpr uint32_t FEWEST = 3;
-    static constexpr uint32_t MOST = 4;
     static Colour4f make(const float* c) { return Colour4f(c[0], c[1], c[2], c[3]); }
 };
 
@@ -82,14 +73,6 @@ float readCoefficient(const uint8_t* bytes, uint32_t type)
 template <class T>
 bool readKeys(const Channel& channel, const char* fileName, std::vector<AnimationKey<T>>& keys)
 {
-    const char* property = channel.property.c_str();
-    const char* target = channel.targetName.c_str();
-    if (channel.coefficientCount < KeyValue<T>::FEWEST || channel.coefficientCount > KeyValue<T>::MOST)
-    {
-        ORV_GLO_ERROR("\"%s\" of \"%s\" has %u coefficients per key in %s; wanted are %u", property, target,
-                      channel.coefficientCount, fileName, KeyValue<T>::MOST);
-        return false;
-    }
     const uint32_t size = type::SIZES[channel.type];
     const uint8_t* bytes = channel.keys.data();
     for (uint32_t i = 0; i < channel.keyCount; ++i)
@@ -101,8 +84,8 @@ bool readKeys(const Channel& channel, const char* fileName, std::vector<Animatio
             coefficients[c] = readCoefficient(bytes, channel.type);
         if (std::isnan(time))
         {
-            ORV_GLO_ERROR("\"%s\" of \"%s\" has a key whose time is not a number in %s", property, target,
-                          fileName);
+            ORV_GLO_ERROR("\"%s\" of \"%s\" has a key whose time is not a number in %s",
+                          channel.property.c_str(), channel.targetName.c_str(), fileName);
             return false;
         }
         keys.push_back({time, KeyValue<T>::make(coefficients)});
@@ -187,16 +170,6 @@ const MaterialProperty* findMaterialProperty(const std::string& name)
     return nullptr;
 }
 
-bool isOneOf(const std::string& text, std::initializer_list<const char*> texts)
-{
-    for (const char* known : texts)
-    {
-        if (text == known)
-            return true;
-    }
-    return false;
-}
-
 } // namespace
 
 bool GloBuilder::makeAnimation(const AnimationData& data, AnimationGroup& group)
@@ -223,23 +196,32 @@ bool GloBuilder::makeAnimation(const AnimationData& data, AnimationGroup& group)
 
 bool GloBuilder::makeChannel(const Channel& channel, AnimationGroup& group)
 {
-    const std::string& name = channel.targetName;
-    const std::string target = name.compare(0, 5, "node-") == 0 ? name.substr(5) : name;
-    const std::string& property = channel.property;
+    const std::string target(getTargetName(channel.targetName));
+    const char* const property = channel.property.c_str();
     if (channel.type > type::FLOAT)
     {
-        ORV_GLO_WARN("Ignoring \"%s\" of \"%s\" in %s: keys of the type %u have no meaning", property.c_str(),
-                     name.c_str(), m_name, channel.type);
+        ORV_GLO_WARN("Ignoring \"%s\" of \"%s\" in %s: keys of the type %u have no meaning", property,
+                     channel.targetName.c_str(), m_name, channel.type);
         return true;
     }
-    if (channel.targetType == "node" && isOneOf(property, {"translation", "rotation", "scale"}))
+    const ChannelKind* kind = findChannelKind(channel.targetType, channel.property);
+    if (!kind)
+    {
+        ORV_GLO_WARN("Ignoring unknown property in %s", m_name);
+        return true;
+    }
+    if (channel.coefficientCount < kind->fewestCoefficients ||
+        channel.coefficientCount > kind->mostCoefficients)
+    {
+        ORV_GLO_ERROR("\"%s\" of \"%s\" has %u coefficients per key in %s; wanted are %u", property,
+                      channel.targetName.c_str(), channel.coefficientCount, m_name, kind->mostCoefficients);
+        return false;
+    }
+    if (channel.targetType == "node")
         return makeNodeChannel(channel, target, group);
-    if (channel.targetType == "light" && isOneOf(property, {"colour", "multiplier"}))
+    if (channel.targetType == "light")
         return makeLightChannel(channel, target, group);
-    if (channel.targetType == "material" && findMaterialProperty(property))
-        return makeMaterialChannel(channel, target, group);
-    ORV_GLO_WARN("Ignoring unknown property in %s", m_name);
-    return true;
+    return makeMaterialChannel(channel, target, group);
 }
 
 bool GloBuilder::makeNodeChannel(const Channel& channel, const std::string& target, AnimationGroup& group)

@@ -2,6 +2,7 @@
 
 #include "orv/appearance.h"
 #include "orv/assetcachepool.h"
+#include "orv/detail/glomaterialrules.h"
 #include "orv/propertycollector.h"
 #include "orv/shaderprogramcache.h"
 #include "orv/texture2d.h"
@@ -18,16 +19,6 @@ using namespace glo;
 
 namespace
 {
-
-bool hasImage(const SamplerField& field)
-{
-    return field && !field->image.empty();
-}
-
-bool isBlack(const Vector4f& colour)
-{
-    return colour.x == 0.0f && colour.y == 0.0f && colour.z == 0.0f;
-}
 
 bool isBuiltIn(const std::string& image)
 {
@@ -185,39 +176,11 @@ void GloMaterial::reach(const char* property, float value)
 
 void GloMaterial::setState(Appearance& appearance) const
 {
-    if (m_data.opacity < 1.0f)
+    if (isBlended(m_data))
         appearance.setBlendFactors(BlendFactor::SRC_ALPHA, BlendFactor::SRC_ALPHA_SATURATE,
                                    BlendFactor::ONE_MINUS_SRC_ALPHA, BlendFactor::ONE_MINUS_SRC_ALPHA);
     if (m_data.doubleSided != 0)
         appearance.setCullingMode(CullingMode::CULL_NONE);
-}
-
-std::string GloMaterial::getProgramName(bool skinned) const
-{
-    if (!hasMaterialFeatures(m_version))
-        return "orv#fallback.sp";
-    const bool bump = hasImage(m_data.bump);
-    const bool reflection = hasImage(m_data.reflection.sampler);
-    const bool fromMax = m_tool == AuthoringTool::MAX;
-    const bool perPixel = bump || m_name.find("zun_ppl") != std::string::npos;
-
-    std::string name = perPixel ? "orv#max_ppl.sp" : "orv#max_pvl.sp";
-    const auto feature = [&name](bool wanted, const char* define)
-    {
-        if (wanted)
-            name += define;
-    };
-    feature(bump, "$BUMP");
-    feature(bump && fromMax, "$INVY");
-    feature(fromMax, "$INVSQROOT");
-    feature(!isBlack(m_data.diffuse.colour), "$DIFF");
-    feature(m_data.specularLevel > 0.0f && !isBlack(m_data.specular.colour), "$SPEC");
-    feature(!isBlack(m_data.ambient.colour), "$AMBI");
-    feature(reflection, "$REFL");
-    feature(reflection && m_data.reflection.sampler->type == sampler::TEXTURE_CUBE, "$CUBE");
-    feature(!isBlack(m_data.emissive.colour), "$EMIS");
-    feature(skinned, "$SKIN");
-    return name;
 }
 
 void GloMaterial::choosePrograms()
@@ -225,8 +188,8 @@ void GloMaterial::choosePrograms()
     for (const Use& known : m_uses)
     {
         setState(*known.appearance);
-        known.appearance->setShaderProgram(
-            m_pool->getShaderProgramCache()->get(getProgramName(known.skinned).c_str()));
+        const std::string program = getProgramName(m_version, m_tool, m_name, m_data, known.skinned);
+        known.appearance->setShaderProgram(m_pool->getShaderProgramCache()->get(program.c_str()));
     }
 }
 

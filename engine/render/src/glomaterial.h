@@ -55,7 +55,6 @@ private:
     void setTexture(Appearance& appearance, const char* property, const glo::SamplerField& field,
                     bool whiteWhenEmpty) const;
     void setState(Appearance& appearance) const;
-    std::string getProgramName(bool skinned) const;
 
     AssetCachePool* m_pool;
     glo::FileVersion m_version;

@@ -4,6 +4,7 @@
 #include <cstdint>
 #include <cstdlib>
 #include <limits>
+#include <string_view>
 
 /// The container rules of scene files, shared by what reads, writes and prints them: chunk IDs, type codes and
 /// the differences between versions. What the chunks hold is in glorecords.h and glofields.h.
@@ -234,5 +235,47 @@ namespace projection
 constexpr uint32_t ORTHOGRAPHIC = 0;
 constexpr uint32_t PERSPECTIVE = 1;
 } // namespace projection
+
+/// What a channel can move, and how many coefficients its keys have. A channel of anything else is passed over.
+struct ChannelKind
+{
+    const char* targetType;
+    const char* property;
+    uint32_t fewestCoefficients;
+    uint32_t mostCoefficients;
+};
+
+constexpr ChannelKind CHANNEL_KINDS[] = {
+    {"node", "translation", 3, 3},
+    {"node", "rotation", 4, 4}, // axis and angle
+    {"node", "scale", 3, 3},
+    {"light", "colour", 3, 4}, // the opacity may be left out
+    {"light", "multiplier", 1, 1},
+    {"material", "ambient", 3, 4},
+    {"material", "diffuse", 3, 4},
+    {"material", "specular", 3, 4},
+    {"material", "emission", 3, 4},
+    {"material", "self_illumination", 1, 1},
+    {"material", "specular_level", 1, 1},
+    {"material", "shininess", 1, 1},
+    {"material", "opacity", 1, 1},
+};
+
+/// @return null if there is none.
+constexpr const ChannelKind* findChannelKind(std::string_view targetType, std::string_view property)
+{
+    for (const ChannelKind& kind : CHANNEL_KINDS)
+    {
+        if (targetType == kind.targetType && property == kind.property)
+            return &kind;
+    }
+    return nullptr;
+}
+
+/// The name of what a channel moves: "node-" in front of it counts for nothing.
+constexpr std::string_view getTargetName(std::string_view name)
+{
+    return name.substr(0, 5) == "node-" ? name.substr(5) : name;
+}
 
 } // namespace orv::detail::glo

@@ -1,0 +1,57 @@
+#pragma once
+
+#include "orv/detail/glorecords.h"
+
+#include <string>
+
+/// What follows from the values of a scene file's material, for the loader and for what describes files.
+namespace orv::detail::glo
+{
+
+inline bool hasImage(const SamplerField& field)
+{
+    return field && !field->image.empty();
+}
+
+/// A black colour switches its shader feature off.
+inline bool isBlack(const Vector4f& colour)
+{
+    return colour.x == 0.0f && colour.y == 0.0f && colour.z == 0.0f;
+}
+
+inline bool isBlended(const StandardMaterial& material)
+{
+    return material.opacity < 1.0f;
+}
+
+/// The asset name of the program that draws the material, with its defines in their fixed order.
+inline std::string getProgramName(FileVersion version, AuthoringTool tool, const std::string& materialName,
+                                  const StandardMaterial& material, bool skinned)
+{
+    if (!hasMaterialFeatures(version))
+        return "orv#fallback.sp";
+    const bool bump = hasImage(material.bump);
+    const bool reflection = hasImage(material.reflection.sampler);
+    const bool fromMax = tool == AuthoringTool::MAX;
+    const bool perPixel = bump || materialName.find("zun_ppl") != std::string::npos;
+
+    std::string name = perPixel ? "orv#max_ppl.sp" : "orv#max_pvl.sp";
+    const auto feature = [&name](bool wanted, const char* define)
+    {
+        if (wanted)
+            name += define;
+    };
+    feature(bump, "$BUMP");
+    feature(bump && fromMax, "$INVY");
+    feature(fromMax, "$INVSQROOT");
+    feature(!isBlack(material.diffuse.colour), "$DIFF");
+    feature(material.specularLevel > 0.0f && !isBlack(material.specular.colour), "$SPEC");
+    feature(!isBlack(material.ambient.colour), "$AMBI");
+    feature(reflection, "$REFL");
+    feature(reflection && material.reflection.sampler->type == sampler::TEXTURE_CUBE, "$CUBE");
+    feature(!isBlack(material.emissive.colour), "$EMIS");
+    feature(skinned, "$SKIN");
+    return name;
+}
+
+} // namespace orv::detail::glo
