@@ -1,0 +1,28 @@
+#pragma once
+
+#include "pvr/pvrformat.h"
+
+#include <cstddef>
+#include <vector>
+
+namespace pvr
+{
+
+/// RGBA pixels, 4 bytes each, top row first.
+struct Picture
+{
+    uint32_t width = 0;
+    uint32_t height = 0;
+    std::vector<uint8_t> rgba;
+
+    const uint8_t* pixel(uint32_t x, uint32_t y) const { return &rgba[4 * (size_t(y) * width + x)]; }
+};
+
+/// The picture's pixels in a format: what a level of a PVR file holds.
+///
+/// Luminance is weighed as the eye does. ETC1 comes out as libetc1 makes it. PVRTC is made simply: the darkest and
+/// the brightest colour of each block, and for each pixel the nearest mix of what becomes of them.
+/// @param picture  for PVRTC, of power-of-two sides.
+std::vector<uint8_t> encode(const Picture& picture, Format format, bool bigEndian);
+
+} // namespace pvr
