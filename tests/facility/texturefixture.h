@@ -13,6 +13,8 @@ template <class Cache>
 class TextureFixture : public FacilityTest
 {
 protected:
+    explicit TextureFixture(const orv::SharedPtr<Cache>& made = orv::makeShared<Cache>()) : cache(made) {}
+
     void SetUp() override
     {
         GlTest::SetUp();
@@ -28,7 +30,7 @@ protected:
                       orv::makeShared<orv::MemoryStream>(m_files.back().data(), int(file.size())));
     }
 
-    orv::SharedPtr<Cache> cache = orv::makeShared<Cache>();
+    orv::SharedPtr<Cache> cache;
 
 private:
     orv::SharedPtr<orv::MemoryStreamSource> m_source = orv::makeShared<orv::MemoryStreamSource>();

@@ -1,0 +1,114 @@
+#pragma once
+
+#include "orv/colour.h"
+#include "orv/export.h"
+#include "orv/font.h"
+#include "orv/matrix.h"
+#include "orv/shaderuniform.h"
+#include "orv/shared.h"
+#include "orv/sharedptr.h"
+#include "orv/vector.h"
+
+#include <cstddef>
+#include <cstdint>
+#include <string_view>
+#include <vector>
+
+namespace orv
+{
+
+class Appearance;
+class AssetCachePool;
+class Mesh;
+class RenderContext;
+class ShaderProgram;
+class Solid;
+
+/// Any number of strings in one font and colour, drawn together: over a frame, or in the scene.
+///
+///     const auto text = makeShared<Text>(*pool, get(*pool->getFontCache(), "sans.ttf", 24), Colour4f::WHITE);
+///     text->add("Hello, world", 10.0f, 10.0f);
+///     block->render();
+///     text->draw(*context);
+///
+/// Places are in pixels: x to the right, y downwards, from the upper left corner of the viewport. Glyphs are
+/// put on whole pixels, so that each of the atlas falls on one of the screen.
+/// Strings are UTF-8. "\n" begins a new line; bytes that are not UTF-8, other control characters, and characters
+/// that the font does not have draw nothing and take no room.
+/// Threads: draw() and createSolid() belong to the GL thread; no locks.
+class ORV_API Text : public Shared
+{
+public:
+    ORV_CLASS_NAME("Text")
+    using Ptr = SharedPtr<Text>;
+
+    /// Which part of each line stands at the place that was given.
+    enum class Alignment : int32_t
+    {
+        LEFT = 0,
+        CENTRE = 1,
+        RIGHT = 2
+    };
+
+    /// @param pool  borrowed during the call, for the shader program.
+    /// @param font  shared; an empty one is an error, and nothing is ever drawn.
+    Text(AssetCachePool& pool, const Font::Ptr& font, const Colour4f& colour);
+    ~Text() override;
+
+    /// From the top of a line to the top of the next, in whole pixels.
+    static float getLineHeight(const Font& font);
+
+    /// The room that a string takes, in pixels: as wide as its longest line, as high as its lines, the last
+    /// without the gap below it; 0, 0 for an empty or null one. The tips of slanted letters may reach out of it.
+    static Vector2f measure(const Font& font, const char* utf8);
+
+    /// Adds a string. @param y  top of its first line, not the baseline.
+    void add(const char* utf8, float x, float y, Alignment alignment = Alignment::LEFT);
+
+    void clear(); ///< Takes all strings out again.
+
+    /// Straight, not premultiplied; a is the opacity. Solids made before keep their colour.
+    void setColour(const Colour4f& colour);
+
+    const Font::Ptr& getFont() const { return m_font; }
+
+    /// Draws over what the viewport shows, blended, whatever the depth buffer holds; nothing is written there.
+    ///
+    /// One GL draw for up to MAX_GLYPHS glyphs, one more for each further lot. Without a change since the last
+    /// time nothing is made anew. The strings are kept in client memory, so there is nothing to be flushed here.
+    void draw(RenderContext& context);
+
+    /// A copy of the strings as they are, to be put into a scene.
+    ///
+    /// One unit is one pixel, x to the right, y upwards, in the plane z = 0: what was added at (x, y) is at
+    /// (x, -y). Scale the node to the size wanted. Both sides are visible; it blends, so the renderer draws it
+    /// after opaque solids, and it does not write depth. Beyond MAX_GLYPHS glyphs the rest is in unnamed children.
+    /// @param pool  where the mesh is made, unnamed.
+    /// @return empty, after an error, without a font, any glyph, or memory.
+    SharedPtr<Solid> createSolid(AssetCachePool& pool) const;
+
+    static constexpr unsigned MAX_GLYPHS = 16383; ///< of one draw: four vertices each, below 65,536
+
+private:
+    struct Glyph
+    {
+        float x, y;                      ///< upper left corner, whole pixels
+        const Font::CharacterData* data; ///< m_font's
+    };
+
+    ORV_LOCAL void addLine(std::string_view line, float x, float top, Alignment alignment);
+    ORV_LOCAL SharedPtr<Appearance> makeAppearance() const;
+    ORV_LOCAL SharedPtr<Mesh> makeMesh(std::size_t firstGlyph, AssetCachePool* pool) const;
+    ORV_LOCAL void makeSolids();
+
+    Font::Ptr m_font;
+    Colour4f m_colour;
+    SharedPtr<ShaderProgram> m_program;
+    std::vector<Glyph> m_glyphs;
+    SharedPtr<Appearance> m_overlay;                 ///< what draw() draws with
+    SharedPtr<ShaderUniform<Matrix4f>> m_projection; ///< m_overlay's, from pixels to clip space
+    std::vector<SharedPtr<Solid>> m_solids;          ///< what draw() draws
+    bool m_changed = false;                          ///< m_solids do not show m_glyphs yet
+};
+
+} // namespace orv

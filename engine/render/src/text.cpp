@@ -1,0 +1,302 @@
+#include "orv/text.h"
+
+#include "orv/appearance.h"
+#include "orv/assetcachepool.h"
+#include "orv/indexbuffercache.h"
+#include "orv/log.h"
+#include "orv/mesh.h"
+#include "orv/meshcache.h"
+#include "orv/rendercontext.h"
+#include "orv/shaderprogramcache.h"
+#include "orv/solid.h"
+#include "orv/texture2d.h"
+#include "orv/vertexbuffercache.h"
+
+#include <algorithm>
+#include <cmath>
+#include <string_view>
+
+namespace orv
+{
+
+namespace
+{
+
+/// Takes one code point off the start of a text that is not empty.
+/// @return -1 for what is not UTF-8, of which as much goes as could have been the start of a code point.
+int readCodePoint(std::string_view& text)
+{
+    const auto first = static_cast<unsigned char>(text.front());
+    text.remove_prefix(1);
+    if (first < 0x80)
+        return first;
+    if (first < 0xC2 || first > 0xF4) // followers, longer forms of ASCII, beyond the last code point
+        return -1;
+
+    const int followers = first < 0xE0 ? 1 : (first < 0xF0 ? 2 : 3);
+    int code = first & (0x3F >> followers);
+    for (int i = 0; i < followers; ++i)
+    {
+        const int next = text.empty() ? 0 : static_cast<unsigned char>(text.front());
+        // The first follower also tells longer forms, surrogates and what is beyond the last code point.
+        const int least = i > 0 ? 0x80 : (first == 0xE0 ? 0xA0 : (first == 0xF0 ? 0x90 : 0x80));
+        const int most = i > 0 ? 0xBF : (first == 0xED ? 0x9F : (first == 0xF4 ? 0x8F : 0xBF));
+        if (next < least || next > most)
+            return -1;
+        code = code << 6 | (next & 0x3F);
+        text.remove_prefix(1);
+    }
+    return code;
+}
+
+/// What draws nothing: negative, and control characters, for some of which fonts have a glyph.
+bool isControl(int c)
+{
+    return c < 0x20 || (c >= 0x7F && c < 0xA0);
+}
+
+float getLineWidth(const Font& font, std::string_view line)
+{
+    float width = 0.0f;
+    while (!line.empty())
+    {
+        const int c = readCodePoint(line);
+        width += isControl(c) ? 0.0f : font.getCharacterData(c).xadvance;
+    }
+    return width;
+}
+
+void applyColour(Appearance& appearance, const Colour4f& colour)
+{
+    appearance.setProperty("M_DIFFUSE_COLOUR", Vector4f(colour.r, colour.g, colour.b, 1.0f));
+    appearance.setProperty("M_OPACITY", colour.a);
+}
+
+/// Calls use(line) for every line, the empty one after a last "\n" included.
+template <class Use>
+void forEachLine(std::string_view text, const Use& use)
+{
+    while (true)
+    {
+        const std::size_t end = text.find('\n');
+        use(text.substr(0, end));
+        if (end == std::string_view::npos)
+            return;
+        text.remove_prefix(end + 1);
+    }
+}
+
+} // namespace
+
+Text::Text(AssetCachePool& pool, const Font::Ptr& font, const Colour4f& colour)
+    : m_font(font)
+    , m_colour(colour)
+    , m_program(pool.getShaderProgramCache()->get("luvane#textfadequad.sp"))
+{
+    if (!font || !font->getTexture())
+    {
+        ORV_LOG_ERROR("A text has no font and will not be seen");
+        m_font = nullptr;
+        return;
+    }
+    m_overlay = makeAppearance();
+    m_overlay->setDepthTestEnabled(false);
+    m_overlay->addProperty<Matrix4f>("T_MODEL_VIEW_PROJECTION", 1);
+    m_projection = SharedPtr<ShaderUniform<Matrix4f>>(static_cast<ShaderUniform<Matrix4f>*>(
+        m_overlay->getPropertyUniform("T_MODEL_VIEW_PROJECTION").get()));
+}
+
+Text::~Text() = default;
+
+float Text::getLineHeight(const Font& font)
+{
+    return std::round(font.getAscent() + font.getDescent() + font.getLineGap());
+}
+
+Vector2f Text::measure(const Font& font, const char* utf8)
+{
+    if (!utf8 || !*utf8)
+        return {};
+    Vector2f size(0.0f, std::ceil(font.getAscent()) + std::ceil(font.getDescent()) - getLineHeight(font));
+    forEachLine(utf8,
+                [&](std::string_view line)
+                {
+                    size.x = std::max(size.x, getLineWidth(font, line));
+                    size.y += getLineHeight(font);
+                });
+    return size;
+}
+
+void Text::add(const char* utf8, float x, float y, Alignment alignment)
+{
+    if (!m_font || !utf8)
+        return;
+    float top = std::round(y);
+    forEachLine(utf8,
+                [&](std::string_view line)
+                {
+                    addLine(line, x, top, alignment);
+                    top += getLineHeight(*m_font);
+                });
+}
+
+void Text::addLine(std::string_view line, float x, float top, Alignment alignment)
+{
+    if (alignment == Alignment::CENTRE)
+        x -= getLineWidth(*m_font, line) * 0.5f;
+    else if (alignment == Alignment::RIGHT)
+        x -= getLineWidth(*m_font, line);
+    const float baseline = top + std::ceil(m_font->getAscent());
+    while (!line.empty())
+    {
+        const int c = readCodePoint(line);
+        if (isControl(c))
+            continue;
+        const Font::CharacterData& data = m_font->getCharacterData(c);
+        if (data.x1 > data.x0 && data.y1 > data.y0)
+            m_glyphs.push_back({std::floor(x + data.xoff + 0.5f), baseline + data.yoff, &data});
+        x += data.xadvance;
+    }
+    m_changed = true;
+}
+
+void Text::clear()
+{
+    m_changed = m_changed || !m_glyphs.empty();
+    m_glyphs.clear();
+}
+
+void Text::setColour(const Colour4f& colour)
+{
+    m_colour = colour;
+    if (m_overlay)
+        applyColour(*m_overlay, colour);
+}
+
+void Text::draw(RenderContext& context)
+{
+    const auto width = float(context.getViewportWidth());
+    const auto height = float(context.getViewportHeight());
+    if (!m_font || width <= 0.0f || height <= 0.0f)
+        return;
+    if (m_changed)
+        makeSolids();
+    Matrix4f projection = Matrix4f::IDENTITY;
+    projection[0].x = 2.0f / width;
+    projection[1].y = -2.0f / height;
+    projection[3] = Vector4f(-1.0f, 1.0f, 0.0f, 1.0f);
+    m_projection->set(projection);
+    for (const SharedPtr<Solid>& solid : m_solids)
+        solid->draw(context);
+}
+
+SharedPtr<Solid> Text::createSolid(AssetCachePool& pool) const
+{
+    if (m_glyphs.empty())
+    {
+        ORV_LOG_ERROR("A text without glyphs makes no solid");
+        return {};
+    }
+    // Seen from afar, a blend of two mipmaps is the least ragged.
+    if (m_font->getTexture()->hasMipmaps())
+        m_font->getTexture()->setMinFilter(TextureParameters::FilterMode::LINEAR_MIPMAP_LINEAR);
+    const SharedPtr<Appearance> appearance = makeAppearance();
+    SharedPtr<Solid> solid;
+    for (std::size_t first = 0; first < m_glyphs.size(); first += MAX_GLYPHS)
+    {
+        const SharedPtr<Mesh> mesh = makeMesh(first, &pool);
+        if (!mesh)
+            return {};
+        const auto part = makeShared<Solid>(mesh, appearance);
+        if (solid)
+            part->setParent(solid, false);
+        else
+            solid = part;
+    }
+    return solid;
+}
+
+/// The alpha of what is drawn over grows towards 1, so that a target's picture can be laid over another one.
+SharedPtr<Appearance> Text::makeAppearance() const
+{
+    const auto appearance = makeShared<Appearance>();
+    appearance->setShaderProgram(m_program);
+    appearance->setBlendFactors(BlendFactor::SRC_ALPHA, BlendFactor::ONE, BlendFactor::ONE_MINUS_SRC_ALPHA,
+                                BlendFactor::ONE_MINUS_SRC_ALPHA);
+    appearance->setCullingMode(CullingMode::CULL_NONE);
+    appearance->setDepthWriteEnabled(false);
+    appearance->setProperty("M_DIFFUSE_TEXTURE", m_font->getTexture());
+    appearance->setProperty("M_UV_OFFSET_SCALE", Vector4f(0.0f, 0.0f, 1.0f, 1.0f));
+    appearance->setProperty("M_FADE", Vector2f(0.0f, 0.0f));
+    applyColour(*appearance, m_colour);
+    return appearance;
+}
+
+/// @param pool  where the buffers are made, y upwards; null for client memory, y downwards.
+/// @return empty, after an error, where memory lacks.
+SharedPtr<Mesh> Text::makeMesh(std::size_t firstGlyph, AssetCachePool* pool) const
+{
+    const std::size_t count = std::min<std::size_t>(m_glyphs.size() - firstGlyph, MAX_GLYPHS);
+    const auto positions = makeShared<VertexArray>(int(4 * count), int(sizeof(float)), 2);
+    const auto uvs = makeShared<VertexArray>(int(4 * count), int(sizeof(float)), 2);
+    const auto primitive = IndexBuffer::Primitive::TRIANGLES;
+    const IndexBuffer::Ptr indices =
+        pool ? pool->getIndexBufferCache()->create(primitive, unsigned(6 * count), nullptr, nullptr)
+             : makeShared<IndexBuffer>(primitive, int(6 * count), true, nullptr);
+    if (!indices || !indices->getIndices() || positions->getSizeInBytes() == 0 || uvs->getSizeInBytes() == 0)
+    {
+        ORV_LOG_ERROR("No memory for a text of %u glyphs", unsigned(count));
+        return {};
+    }
+
+    const float ySign = pool ? -1.0f : 1.0f;
+    const auto atlasWidth = float(m_font->getTexture()->getWidth());
+    const auto atlasHeight = float(m_font->getTexture()->getHeight());
+    auto* position = positions->getData<float>();
+    auto* uv = uvs->getData<float>();
+    unsigned short* index = indices->getIndices();
+    for (std::size_t i = 0; i < count; ++i)
+    {
+        const auto& [x, y, data] = m_glyphs[firstGlyph + i];
+        for (const int corner : {0, 1, 2, 3}) // upper left, upper right, lower left, lower right
+        {
+            const bool isRight = corner & 1;
+            const bool isLower = corner & 2;
+            *position++ = isRight ? x + data->x1 - data->x0 : x;
+            *position++ = ySign * (isLower ? y + data->y1 - data->y0 : y);
+            *uv++ = (isRight ? data->x1 : data->x0) / atlasWidth;
+            *uv++ = 1.0f - (isLower ? data->y1 : data->y0) / atlasHeight;
+        }
+        for (const std::size_t corner : {0, 2, 1, 1, 2, 3})
+            *index++ = static_cast<unsigned short>(4 * i + corner);
+    }
+
+    using Format = VertexBuffer::AttribFormat;
+    const auto usage = pool ? VertexBuffer::AttribUsage::GL_BUFFER : VertexBuffer::AttribUsage::CLIENT_MEMORY;
+    const VertexBuffer::Ptr vertices =
+        pool ? pool->getVertexBufferCache()->create(nullptr) : makeShared<VertexBuffer>(nullptr);
+    vertices->addAttrib(positions, "a_position", Format::FLOAT, usage, false);
+    vertices->addAttrib(uvs, "a_uv0", Format::FLOAT, usage, false);
+    if (!pool)
+        return makeShared<Mesh>(MeshHeader(), indices, vertices);
+
+    MeshHeader header;
+    for (const float* at = positions->getData<float>(); at != position; at += 2)
+        header.boundingRadius = std::max(header.boundingRadius, std::hypot(at[0], at[1]));
+    vertices->commit();
+    indices->commit();
+    return pool->getMeshCache()->create(header, indices, vertices, nullptr);
+}
+
+void Text::makeSolids()
+{
+    m_changed = false;
+    m_solids.clear();
+    for (std::size_t first = 0; first < m_glyphs.size(); first += MAX_GLYPHS)
+    {
+        if (const SharedPtr<Mesh> mesh = makeMesh(first, nullptr))
+            m_solids.push_back(makeShared<Solid>(mesh, m_overlay));
+    }
+}
+
+} // namespace orv
