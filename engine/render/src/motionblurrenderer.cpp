@@ -1,0 +1,125 @@
+#include "orv/motionblurrenderer.h"
+
+#include "eyes.h"
+#include "rendererproperties.h"
+
+#include "orv/appearance.h"
+#include "orv/assetcachepool.h"
+#include "orv/maths.h"
+#include "orv/sceneutil.h"
+#include "orv/shaderprogramcache.h"
+#include "orv/solid.h"
+
+namespace orv
+{
+
+namespace
+{
+
+constexpr float FRAME_SECONDS = 1.0f / 60.0f;
+
+} // namespace
+
+struct MotionBlurRenderer::Properties
+{
+    explicit Properties(RenderContext& context)
+        : jointCount(detail::shareProperty<int>(context, "J_COUNT", 1, 0))
+        , jointWorld(detail::shareProperty(context, "J_WORLD", Solid::MAX_JOINTS, Matrix4f()))
+        , viewProjection(shareTransform(context, "T_VIEW_PROJECTION"))
+        , oldModelViewProjection(shareTransform(context, "T_OLD_MODEL_VIEW_PROJECTION"))
+        , modelViewProjection(shareTransform(context, "T_MODEL_VIEW_PROJECTION"))
+        , time(detail::shareProperty(context, "TIME", 1, 0.0f))
+        , deltaTime(detail::shareProperty(context, "DELTA_TIME", 1, 0.0f))
+    {
+        detail::shareProperty(context, "MOTION_BLUR_FACTOR", 1, 0.0f);
+    }
+
+    static SharedPtr<ShaderUniform<Matrix4f>> shareTransform(RenderContext& context, const char* name)
+    {
+        return detail::shareProperty<Matrix4f>(context, name, 1, Matrix4f::IDENTITY);
+    }
+
+    /// Whether there was memory for all that is written each frame.
+    bool isComplete() const
+    {
+        return jointCount && jointWorld && viewProjection && oldModelViewProjection && modelViewProjection &&
+               time && deltaTime;
+    }
+
+    SharedPtr<ShaderUniform<int>> jointCount;
+    SharedPtr<ShaderUniform<Matrix4f>> jointWorld;
+    SharedPtr<ShaderUniform<Matrix4f>> viewProjection;
+    SharedPtr<ShaderUniform<Matrix4f>> oldModelViewProjection;
+    SharedPtr<ShaderUniform<Matrix4f>> modelViewProjection;
+    SharedPtr<ShaderUniform<float>> time;
+    SharedPtr<ShaderUniform<float>> deltaTime;
+};
+
+MotionBlurRenderer::MotionBlurRenderer(const SharedPtr<RenderContext>& context,
+                                       const SharedPtr<AssetCachePool>& pool)
+    : m_context(context)
+    , m_pool(pool)
+    , m_properties(std::make_unique<Properties>(*m_context))
+    , m_velocity(makeShared<Appearance>())
+    , m_skinnedVelocity(makeShared<Appearance>())
+{
+    if (!m_pool || !m_velocity)
+        return;
+    // Both go to the one appearance, on purpose: skinned solids are drawn with the program that is current.
+    // Guarded by MotionBlurTest.skinnedSolidsTakeTheCurrentProgram.
+    ShaderProgramCache& programs = *m_pool->getShaderProgramCache();
+    m_velocity->setShaderProgram(programs.get("orv#gen_velocity.sp"));
+    m_velocity->setShaderProgram(programs.get("orv#gen_velocity.sp$SKIN"));
+}
+
+MotionBlurRenderer::~MotionBlurRenderer() = default;
+
+void MotionBlurRenderer::visit(Solid* solid)
+{
+    m_solids.push_back(solid);
+}
+
+void MotionBlurRenderer::render(Camera* camera, SceneNode& scene, const FlagMask& renderFlags,
+                                const FlagMask& recursiveFlags)
+{
+    m_solids.clear();
+    if (!m_properties->isComplete() || !m_velocity || !m_skinnedVelocity)
+        return; // the log said so when they were made
+    visitScene(*this, scene, renderFlags, recursiveFlags);
+
+    const detail::Viewport full = detail::getViewport(*m_context);
+    detail::Eye eyes[2];
+    const int eyeCount = detail::findEyes(camera, detail::getAspect(full), eyes);
+
+    m_properties->time->set(fmod(m_time, 60.0f));
+    const float passed = m_time - m_lastTime;
+    m_properties->deltaTime->set(passed == 0.0f ? 1.0f : FRAME_SECONDS / passed);
+    m_lastTime = m_time;
+
+    for (int i = 0; i < eyeCount; ++i)
+    {
+        detail::setViewport(*m_context, eyeCount > 1 ? detail::getHalf(full, i) : full);
+        const Matrix4f viewProjection = eyes[i].projection * inverse(eyes[i].world);
+        drawEye(viewProjection, m_lastViewProjections[i]);
+        m_lastViewProjections[i] = viewProjection;
+    }
+    detail::setViewport(*m_context, full);
+
+    for (Solid* solid : m_solids)
+        solid->updateMotionData();
+}
+
+void MotionBlurRenderer::drawEye(const Matrix4f& viewProjection, const Matrix4f& lastViewProjection)
+{
+    Properties& properties = *m_properties;
+    properties.viewProjection->set(viewProjection);
+    for (Solid* solid : m_solids)
+    {
+        properties.oldModelViewProjection->set(lastViewProjection * solid->getLastWorldTransform());
+        properties.modelViewProjection->set(viewProjection * solid->getWorldTransform());
+        detail::publishJoints(*solid, *properties.jointCount, *properties.jointWorld);
+        solid->draw(*m_context, solid->getJointsPerVertex() == 0 ? *m_velocity : *m_skinnedVelocity);
+    }
+}
+
+} // namespace orv
