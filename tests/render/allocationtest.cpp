@@ -1,49 +1,19 @@
 #include "glotest.h"
 #include "scenetest.h"
 
+#include "support/allocation.h"
+
 #include "orv/animationcontroller.h"
 #include "orv/animationgroup.h"
+#include "orv/motionblurrenderer.h"
 #include "orv/renderblock.h"
-
-#include <cstdlib>
-#include <new>
 
 using namespace orv;
 
-namespace
-{
-
-/// Of this thread, by C++ code; what the GL driver takes from malloc() does not count.
-thread_local unsigned allocations = 0;
-
-} // namespace
-
-// Not to be put in place of calls: the compiler would find free() on what came from new.
-[[gnu::noinline]] void* operator new(size_t size, const std::nothrow_t&) noexcept
-{
-    ++allocations;
-    return std::malloc(size > 0 ? size : 1);
-}
-
-[[gnu::noinline]] void* operator new(size_t size)
-{
-    void* memory = operator new(size, std::nothrow);
-    return memory ? memory : (std::abort(), nullptr);
-}
-
-[[gnu::noinline]] void operator delete(void* memory) noexcept
-{
-    std::free(memory);
-}
-
-[[gnu::noinline]] void operator delete(void* memory, size_t) noexcept
-{
-    std::free(memory);
-}
-
 using AllocationTest = SceneTest;
 
-// Fault caught: a frame that makes texts, lists or nodes anew, be it animated, skinned, mirrored or in stereo.
+// Fault caught: a frame that makes texts, lists or nodes anew, be it animated, skinned, mirrored, in stereo or of
+// velocities.
 TEST_F(AllocationTest, framesAllocateNothing)
 {
     glo::GloScene file = makeFullScene();
@@ -67,16 +37,45 @@ TEST_F(AllocationTest, framesAllocateNothing)
 
     AnimationController controller(loaded->getAnimationGroup());
     RenderBlock block(renderer, scene, camera);
+    RenderBlock velocities(makeShared<MotionBlurRenderer>(renderContext, pool), scene, camera);
     const auto drawFrame = [&]
     {
         controller.update(0.3f);
         block.update(0.3f);
         block.render();
+        velocities.render();
     };
     for (int i = 0; i < 3; ++i)
         drawFrame(); // lists find their size, programs are linked
-    const unsigned before = allocations;
+    const uint64_t before = support::countAllocations();
     for (int i = 0; i < 4; ++i)
         drawFrame();
-    EXPECT_EQ(before, allocations);
+    EXPECT_EQ(before, support::countAllocations());
+}
+
+// Fault caught: a still frame that works out world matrices again, or tells GL what GL holds.
+TEST_F(AllocationTest, stillFramesDoNothingTwice)
+{
+    const auto red = makePaint(Colour4f(1.0f, 0.0f, 0.0f, 1.0f));
+    const auto blue = makePaint(Colour4f(0.0f, 0.0f, 1.0f, 1.0f));
+    const auto solid = addSquare(Vector3f(-1.0f, 0.0f, 0.0f), 1.0f, red);
+    addSquare(Vector3f(0.0f, 0.0f, 0.0f), 0.5f, red);
+    addSquare(Vector3f(1.0f, 0.0f, 0.0f), 1.0f, blue);
+    renderFrame();
+    renderFrame();
+
+    // Only a matrix that is left alone keeps such a mark.
+    Matrix4f& world = const_cast<Matrix4f&>(solid->getWorldTransform());
+    world.columns[3].y += 0.25f;
+    const Matrix4f marked = world;
+    glcalls::resetCounts();
+    const uint64_t before = support::countAllocations();
+    render();
+    EXPECT_EQ(before, support::countAllocations());
+    EXPECT_EQ(marked, solid->getWorldTransform());
+
+    EXPECT_EQ(3u, glcalls::count(glDrawElements));
+    EXPECT_EQ(3u, glcalls::count(glUniformMatrix4fv)); // each solid has its own place
+    EXPECT_EQ(2u, glcalls::count(glUniform4fv));       // red, blue
+    EXPECT_EQ(8u + 3u * 3u, glcalls::total());         // and a mesh: two buffers, one attribute
 }

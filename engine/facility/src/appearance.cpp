@@ -6,13 +6,15 @@
 namespace orv
 {
 
-Appearance::Appearance() : m_stateRevision(detail::nextRevision()), m_propertyRevision(detail::nextRevision())
+[[gnu::cold]] Appearance::Appearance()
+    : m_stateRevision(detail::nextRevision())
+    , m_propertyRevision(detail::nextRevision())
 {
 }
 
-Appearance::~Appearance() = default;
+[[gnu::cold]] Appearance::~Appearance() = default;
 
-void Appearance::setName(const char* name)
+[[gnu::cold]] void Appearance::setName(const char* name)
 {
     m_name = name ? name : "";
 }
@@ -198,7 +200,7 @@ bool Appearance::indexAllowed(const char* name, int index) const
     return true;
 }
 
-void Appearance::storeProperty(const char* name, const SharedPtr<ShaderUniformBase>& uniform)
+[[gnu::cold]] void Appearance::storeProperty(const char* name, const SharedPtr<ShaderUniformBase>& uniform)
 {
     if (!uniform)
         return; // no memory
@@ -228,7 +230,7 @@ void Appearance::collectProperties(PropertyCollector* collector) const
     }
 }
 
-void Appearance::linkShaderProgram()
+[[gnu::cold]] void Appearance::linkShaderProgram()
 {
     if (m_linked)
         return;
@@ -283,7 +285,7 @@ void Appearance::enableShaderProgram(RenderContext& context)
 
 void Appearance::enable(RenderContext& context, bool turnWinding)
 {
-    context.apply(m_state, m_stateRevision, !m_opaque, turnWinding);
+    m_stateRevision = context.apply(m_state, m_stateRevision, !m_opaque, turnWinding);
     enableShaderProgram(context);
 }
 

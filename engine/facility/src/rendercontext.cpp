@@ -44,7 +44,7 @@ WindingOrder turned(WindingOrder order)
 
 } // namespace
 
-RenderContext::RenderContext()
+[[gnu::cold]] RenderContext::RenderContext()
     : m_revision(detail::nextRevision())
     , m_propertyRevision(detail::nextRevision())
 {
@@ -333,7 +333,7 @@ void RenderContext::clear()
     glClear(GL_COLOR_BUFFER_BIT | GL_DEPTH_BUFFER_BIT | GL_STENCIL_BUFFER_BIT);
 }
 
-void RenderContext::addProperty(const SharedPtr<ShaderUniformBase>& property, const char* name)
+[[gnu::cold]] void RenderContext::addProperty(const SharedPtr<ShaderUniformBase>& property, const char* name)
 {
     if (!property || !name)
     {
@@ -356,7 +356,7 @@ SharedPtr<ShaderUniformBase> RenderContext::getProperty(const char* name) const
     return property;
 }
 
-void RenderContext::linkUniform(SharedPtr<ShaderUniformBase>& uniform, const char* name) const
+[[gnu::cold]] void RenderContext::linkUniform(SharedPtr<ShaderUniformBase>& uniform, const char* name) const
 {
     const auto found = name ? m_properties.find(std::string_view(name)) : m_properties.end();
     if (found != m_properties.end())
@@ -365,6 +365,9 @@ void RenderContext::linkUniform(SharedPtr<ShaderUniformBase>& uniform, const cha
 
 void RenderContext::applyChanged(const RenderState& state, uint64_t stateRevision, uint32_t flags)
 {
+    const bool isUnchanged = m_appliedRevision != 0 && flags == m_appliedFlags && state == m_appliedState;
+    if (isUnchanged)
+        return;
     setBlendEnabled((flags & APPLY_BLEND) != 0);
     setBlendColour(state.blendColour);
     setBlendFactors(state.blendSrcColour, state.blendSrcAlpha, state.blendDstColour, state.blendDstAlpha);
@@ -390,6 +393,7 @@ void RenderContext::applyChanged(const RenderState& state, uint64_t stateRevisio
                              state.stencilPassOperation[i]);
         setStencilMask(face, state.stencilWriteMask[i]);
     }
+    m_appliedState = state;
     m_appliedRevision = stateRevision;
     m_appliedFlags = flags;
 }
@@ -421,6 +425,7 @@ void RenderContext::forgetBindings()
     m_attribOnes = 0;
     m_inputProgram = 0;
     m_inputBuffer = 0;
+    m_readyProgram = 0;
     m_program = UNKNOWN;
     m_arrayBuffer = UNKNOWN;
     m_elementBuffer = UNKNOWN;
@@ -432,6 +437,7 @@ void RenderContext::sendProgram(unsigned name)
 {
     glUseProgram(name);
     m_program = name;
+    m_readyProgram = 0;
 }
 
 void RenderContext::sendTexture(int unit, unsigned target, unsigned name, int slot)

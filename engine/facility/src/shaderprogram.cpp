@@ -26,15 +26,80 @@ namespace
 {
 
 const char* const MIRROR_TEXTURE = "M_MIRROR_TEXTURE";
+
+struct NamedDrawProperty
+{
+    const char* name;
+    uint32_t bit;
+};
+
+constexpr NamedDrawProperty DRAW_PROPERTIES[] = {
+    {"T_MODEL", detail::DRAW_MODEL},
+    {"T_MODEL_VIEW", detail::DRAW_MODEL_VIEW},
+    {"T_MODEL_VIEW_PROJECTION", detail::DRAW_MODEL_VIEW_PROJECTION},
+    {"T_NORMAL_MODEL", detail::DRAW_NORMAL_MODEL},
+};
+
 const GLfloat MISSING_ATTRIB[4] = {1.0f, 1.0f, 1.0f, 1.0f};
 
 /// The attribute count of the last plain bind() of any program.
 int g_boundAttribCount = 0;
 
 template <class T>
-SharedPtr<ShaderUniformBase> makeHolder(int size)
+[[gnu::cold]] SharedPtr<ShaderUniformBase> makeHolder(int size)
 {
     return makeShared<ShaderUniform<T>>(size);
+}
+
+// One value of each type that most uniforms have.
+void send(GLint location, const float& value)
+{
+    glUniform1fv(location, 1, &value);
+}
+void send(GLint location, const Vector2<float>& value)
+{
+    glUniform2fv(location, 1, value.data());
+}
+void send(GLint location, const Vector3<float>& value)
+{
+    glUniform3fv(location, 1, value.data());
+}
+void send(GLint location, const Vector4<float>& value)
+{
+    glUniform4fv(location, 1, value.data());
+}
+void send(GLint location, const int& value)
+{
+    glUniform1iv(location, 1, &value);
+}
+void send(GLint location, const Matrix3<float>& value)
+{
+    glUniformMatrix3fv(location, 1, GL_FALSE, value.data());
+}
+void send(GLint location, const Matrix4<float>& value)
+{
+    glUniformMatrix4fv(location, 1, GL_FALSE, value.data());
+}
+
+/// The short way for a uniform that takes one value, from a source of its own type: sends it if it differs.
+/// @return false, with nothing done, for other uniforms and sources.
+template <class T>
+bool updateSingle(detail::DrawnUniform& uniform, const ShaderUniformBase& source)
+{
+    auto& sent = static_cast<ShaderUniform<T>&>(*uniform.sent.get());
+    if (sent.getSize() != 1 || !source.holds<T>())
+        return false;
+    const T& value = static_cast<const ShaderUniform<T>&>(source).get();
+    if (sent.get() == value)
+        return true;
+    sent.renew() = value;
+    send(uniform.location, value);
+    return true;
+}
+
+bool updateNothing(detail::DrawnUniform&, const ShaderUniformBase&)
+{
+    return false;
 }
 
 /// How a GL uniform type is held. Samplers have a target in place of a holder: keeping the texture that was sent
@@ -43,32 +108,33 @@ struct UniformType
 {
     GLenum glType;
     SharedPtr<ShaderUniformBase> (*makeHolder)(int size);
+    bool (*update)(detail::DrawnUniform& uniform, const ShaderUniformBase& source);
     GLenum textureTarget;
 };
 
 constexpr UniformType UNIFORM_TYPES[] = {
-    {GL_FLOAT, makeHolder<float>, 0},
-    {GL_FLOAT_VEC2, makeHolder<Vector2<float>>, 0},
-    {GL_FLOAT_VEC3, makeHolder<Vector3<float>>, 0},
-    {GL_FLOAT_VEC4, makeHolder<Vector4<float>>, 0},
-    {GL_INT, makeHolder<int>, 0},
-    {GL_INT_VEC2, makeHolder<Vector2<int>>, 0},
-    {GL_INT_VEC3, makeHolder<Vector3<int>>, 0},
-    {GL_INT_VEC4, makeHolder<Vector4<int>>, 0},
-    {GL_BOOL, makeHolder<bool>, 0},
-    {GL_BOOL_VEC2, makeHolder<Vector2<bool>>, 0},
-    {GL_BOOL_VEC3, makeHolder<Vector3<bool>>, 0},
-    {GL_BOOL_VEC4, makeHolder<Vector4<bool>>, 0},
-    {GL_FLOAT_MAT2, makeHolder<Matrix2<float>>, 0},
-    {GL_FLOAT_MAT3, makeHolder<Matrix3<float>>, 0},
-    {GL_FLOAT_MAT4, makeHolder<Matrix4<float>>, 0},
-    {GL_SAMPLER_2D, nullptr, GL_TEXTURE_2D},
-    {GL_SAMPLER_CUBE, nullptr, GL_TEXTURE_CUBE_MAP},
-    {GL_SAMPLER_EXTERNAL_OES, nullptr, GL_TEXTURE_EXTERNAL_OES},
+    {GL_FLOAT, makeHolder<float>, updateSingle<float>, 0},
+    {GL_FLOAT_VEC2, makeHolder<Vector2<float>>, updateSingle<Vector2<float>>, 0},
+    {GL_FLOAT_VEC3, makeHolder<Vector3<float>>, updateSingle<Vector3<float>>, 0},
+    {GL_FLOAT_VEC4, makeHolder<Vector4<float>>, updateSingle<Vector4<float>>, 0},
+    {GL_INT, makeHolder<int>, updateSingle<int>, 0},
+    {GL_INT_VEC2, makeHolder<Vector2<int>>, updateNothing, 0},
+    {GL_INT_VEC3, makeHolder<Vector3<int>>, updateNothing, 0},
+    {GL_INT_VEC4, makeHolder<Vector4<int>>, updateNothing, 0},
+    {GL_BOOL, makeHolder<bool>, updateNothing, 0},
+    {GL_BOOL_VEC2, makeHolder<Vector2<bool>>, updateNothing, 0},
+    {GL_BOOL_VEC3, makeHolder<Vector3<bool>>, updateNothing, 0},
+    {GL_BOOL_VEC4, makeHolder<Vector4<bool>>, updateNothing, 0},
+    {GL_FLOAT_MAT2, makeHolder<Matrix2<float>>, updateNothing, 0},
+    {GL_FLOAT_MAT3, makeHolder<Matrix3<float>>, updateSingle<Matrix3<float>>, 0},
+    {GL_FLOAT_MAT4, makeHolder<Matrix4<float>>, updateSingle<Matrix4<float>>, 0},
+    {GL_SAMPLER_2D, nullptr, nullptr, GL_TEXTURE_2D},
+    {GL_SAMPLER_CUBE, nullptr, nullptr, GL_TEXTURE_CUBE_MAP},
+    {GL_SAMPLER_EXTERNAL_OES, nullptr, nullptr, GL_TEXTURE_EXTERNAL_OES},
 };
 
 /// The texture that a sampler of this target reads from source; 0 when source holds none that fits.
-GLuint getTextureName(const ShaderUniformBase& source, GLenum target)
+inline GLuint getTextureName(const ShaderUniformBase& source, GLenum target)
 {
     if (source.holds<SharedPtr<Texture2D>>())
     {
@@ -101,7 +167,7 @@ ShaderProgram::ShaderProgram(const SharedPtr<detail::ProgramResource>& resource)
     getAttributes();
 }
 
-ShaderProgram::~ShaderProgram()
+[[gnu::cold]] ShaderProgram::~ShaderProgram()
 {
     if (m_handle)
         m_handle->program = nullptr;
@@ -112,7 +178,7 @@ unsigned ShaderProgram::getId() const
     return m_resource ? m_resource->getId() : 0;
 }
 
-void ShaderProgram::getUniforms()
+[[gnu::cold]] void ShaderProgram::getUniforms()
 {
     const GLuint program = getId();
     GLint nameSize = 0;
@@ -139,7 +205,8 @@ void ShaderProgram::getUniforms()
         setSamplerUnits();
 }
 
-void ShaderProgram::addUniform(const char* name, int location, int size, unsigned glType, int& nextUnit)
+[[gnu::cold]] void ShaderProgram::addUniform(const char* name, int location, int size, unsigned glType,
+                                             int& nextUnit)
 {
     const auto type = std::find_if(std::begin(UNIFORM_TYPES), std::end(UNIFORM_TYPES),
                                    [glType](const UniformType& entry) { return entry.glType == glType; });
@@ -157,6 +224,7 @@ void ShaderProgram::addUniform(const char* name, int location, int size, unsigne
     Uniform uniform;
     uniform.location = location;
     uniform.size = size;
+    uniform.update = type->update;
     if (type->makeHolder)
     {
         uniform.sent = type->makeHolder(size);
@@ -168,13 +236,12 @@ void ShaderProgram::addUniform(const char* name, int location, int size, unsigne
         uniform.textureTarget = type->textureTarget;
         uniform.textureUnit = nextUnit;
         nextUnit += size;
-        m_samplers.push_back(m_uniforms.size());
     }
     m_uniforms.push_back(std::move(uniform));
     m_names.push_back({std::string(name, std::strcspn(name, "[")), std::string()});
 }
 
-void ShaderProgram::setSamplerUnits() const
+[[gnu::cold]] void ShaderProgram::setSamplerUnits() const
 {
     GLint previous = 0;
     glGetIntegerv(GL_CURRENT_PROGRAM, &previous);
@@ -184,11 +251,12 @@ void ShaderProgram::setSamplerUnits() const
         if (uniform.textureUnit >= 0)
             ShaderUniformPrivate::setSamplerUnits(uniform.location, uniform.textureUnit, uniform.size);
     }
-    glUseProgram(GLuint(previous));
+    // A program that was deleted while in use is gone now.
+    glUseProgram(glIsProgram(GLuint(previous)) ? GLuint(previous) : 0);
     detail::bindingsChanged();
 }
 
-void ShaderProgram::getAttributes()
+[[gnu::cold]] void ShaderProgram::getAttributes()
 {
     const GLuint program = getId();
     GLint count = 0;
@@ -223,7 +291,7 @@ const char* ShaderProgram::getUniformPropertyName(int index) const
     return indexInRange(index) ? m_names[std::size_t(index)].property.c_str() : nullptr;
 }
 
-void ShaderProgram::setUniformPropertyName(int index, const char* name)
+[[gnu::cold]] void ShaderProgram::setUniformPropertyName(int index, const char* name)
 {
     if (!indexInRange(index))
         return;
@@ -232,6 +300,9 @@ void ShaderProgram::setUniformPropertyName(int index, const char* name)
     m_linkedRevision = 0;
     m_sourcesRevision = detail::nextRevision();
     m_usesMirrorTexture = uniformExists(MIRROR_TEXTURE);
+    m_drawProperties = 0;
+    for (const NamedDrawProperty& property : DRAW_PROPERTIES)
+        m_drawProperties |= uniformExists(property.name) ? property.bit : 0u;
 }
 
 void ShaderProgram::setUniformPropertyValue(int index, const SharedPtr<ShaderUniformBase>& value)
@@ -242,7 +313,7 @@ void ShaderProgram::setUniformPropertyValue(int index, const SharedPtr<ShaderUni
     m_sourcesRevision = detail::nextRevision();
 }
 
-bool ShaderProgram::uniformExists(const char* propertyName) const
+[[gnu::cold]] bool ShaderProgram::uniformExists(const char* propertyName) const
 {
     return propertyName &&
            std::any_of(m_names.begin(), m_names.end(),
@@ -260,20 +331,20 @@ void ShaderProgram::link(RenderContext& context)
     m_sourcesRevision = detail::nextRevision();
 }
 
-void ShaderProgram::resolve(const ShaderUniformBase* const* values, detail::UniformSources& sources) const
+void ShaderProgram::resolve(const ShaderUniformBase* const* values, detail::UniformSources& sources)
 {
-    sources.values.assign(m_uniforms.size(), nullptr);
-    sources.textures.clear();
+    sources.values.clear();
+    sources.samplers.clear();
     for (std::size_t i = 0; i < m_uniforms.size(); ++i)
     {
-        const Uniform& uniform = m_uniforms[i];
+        Uniform& uniform = m_uniforms[i];
         const ShaderUniformBase* source = values ? values[i] : nullptr;
         if (!source)
             source = uniform.value ? uniform.value.get() : uniform.linked.get();
         if (uniform.textureUnit >= 0)
-            sources.textures.push_back(source);
-        else
-            sources.values[i] = source;
+            sources.samplers.push_back({source, &uniform});
+        else if (source)
+            sources.values.push_back({source, &uniform});
     }
     sources.revision = m_sourcesRevision;
 }
@@ -281,38 +352,35 @@ void ShaderProgram::resolve(const ShaderUniformBase* const* values, detail::Unif
 void ShaderProgram::enable(RenderContext& context, const ShaderUniformBase* const* values,
                            detail::UniformSources& sources)
 {
-    const unsigned program = getId();
-    if (!program)
-        return;
-
+    if (!context.isProgramReady(m_revision))
+    {
+        const unsigned program = getId();
+        if (!program)
+            return;
+        context.useProgram(program);
+        context.setCurrentProgram(m_handle);
+        context.setProgramReady(m_revision);
+    }
     link(context);
     if (sources.revision != m_sourcesRevision)
         resolve(values, sources);
-    context.useProgram(program);
-    if (context.getCurrentProgram().get() != m_handle.get())
-        context.setCurrentProgram(m_handle);
 
-    Uniform* uniform = m_uniforms.data();
-    for (const ShaderUniformBase* source : sources.values)
+    for (const auto& [source, uniform] : sources.values)
     {
-        if (source && source->getRevision() != uniform->sentRevision)
-        {
-            uniform->sentRevision = source->getRevision();
-            ShaderUniformBase& sent = *uniform->sent.get();
-            if (sent.copyFrom(*source))
-                sent.send(uniform->location, uniform->textureUnit);
-        }
-        ++uniform;
+        if (uniform->sentRevision == source->getRevision())
+            continue;
+        uniform->sentRevision = source->getRevision();
+        if (uniform->update(*uniform, *source))
+            continue;
+        ShaderUniformBase& sent = *uniform->sent.get();
+        if (sent.copyFrom(*source))
+            sent.send(uniform->location, uniform->textureUnit);
     }
-
-    const ShaderUniformBase* const* texture = sources.textures.data();
-    for (const std::size_t index : m_samplers)
+    for (const auto& [source, sampler] : sources.samplers)
     {
-        const Uniform& sampler = m_uniforms[index];
-        const GLuint name = *texture ? getTextureName(**texture, sampler.textureTarget) : 0;
-        for (int i = 0; i < sampler.size; ++i)
-            context.bindTexture(sampler.textureUnit + i, sampler.textureTarget, name);
-        ++texture;
+        const GLuint name = source ? getTextureName(*source, sampler->textureTarget) : 0;
+        for (int i = 0; i < sampler->size; ++i)
+            context.bindTexture(sampler->textureUnit + i, sampler->textureTarget, name);
     }
 }
 

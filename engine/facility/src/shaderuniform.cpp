@@ -9,6 +9,7 @@
 #include <GLES2/gl2.h>
 
 #include <algorithm>
+#include <array>
 #include <memory>
 #include <new>
 #include <numeric>
@@ -29,17 +30,17 @@ static_assert(sizeof(Vector2<int>) == 8 && sizeof(Vector3<int>) == 12 && sizeof(
 static_assert(sizeof(Vector2<float>) == 8 && sizeof(Vector3<float>) == 12 && sizeof(Vector4<float>) == 16);
 static_assert(sizeof(Matrix2<float>) == 16 && sizeof(Matrix3<float>) == 36 && sizeof(Matrix4<float>) == 64);
 
-/// The integers 0, 1, 2, ..., one for each texture unit that the GL has.
+/// The integers 0, 1, 2, ..., one for each texture unit that the GL has. A GL that does not answer is asked again.
 const std::vector<GLint>& getUnits()
 {
-    static const std::vector<GLint> units = []
+    static std::vector<GLint> units;
+    if (units.empty())
     {
         GLint count = 0;
         glGetIntegerv(GL_MAX_COMBINED_TEXTURE_IMAGE_UNITS, &count);
-        std::vector<GLint> numbers(std::size_t(std::max(count, 0)));
-        std::iota(numbers.begin(), numbers.end(), 0);
-        return numbers;
-    }();
+        units.resize(std::size_t(std::max(count, 0)));
+        std::iota(units.begin(), units.end(), 0);
+    }
     return units;
 }
 
@@ -196,116 +197,48 @@ void setUniform(int location, int unit, int size, const SharedPtr<TextureCube>* 
 
 } // namespace ShaderUniformPrivate
 
+namespace
+{
+
+using SendValues = void (*)(int location, int unit, int size, const void* values);
+
 template <class T>
-ShaderUniform<T>::ShaderUniform(int size)
-    : ShaderUniformBase(detail::UniformTypes::indexOf<T>())
-    , m_size(size)
-    , m_values(&m_single)
+void sendAs(int location, int unit, int size, const void* values)
+{
+    ShaderUniformPrivate::setUniform(location, unit, size, static_cast<const T*>(values));
+}
+
+/// One for each type of uniform, in their order.
+template <class... Types>
+constexpr std::array<SendValues, sizeof...(Types)> makeSenders(detail::TypeList<Types...>)
+{
+    return {sendAs<Types>...};
+}
+
+constexpr auto SENDERS = makeSenders(detail::UniformTypes());
+
+} // namespace
+
+ShaderUniformBase::ShaderUniformBase(int type, int size) : m_type(type), m_size(size)
 {
     if (m_size < 1)
     {
         ORV_LOG_ERROR("Uniform size must be greater than zero; setting to 1");
         m_size = 1;
     }
-    if (m_size == 1)
-        return;
-
-    if (T* values = new (std::nothrow) T[std::size_t(m_size)]())
-    {
-        m_values = values;
-        return;
-    }
-    ORV_LOG_ERROR("No memory for a uniform of %d values; setting to 1", m_size);
-    m_size = 1;
 }
 
-template <class T>
-ShaderUniform<T>::~ShaderUniform()
+void ShaderUniformBase::sendValues(int location, int textureUnit, const void* values) const
 {
-    if (m_values != &m_single)
-        delete[] m_values;
+    SENDERS[std::size_t(m_type)](location, textureUnit, m_size, values);
 }
 
-template <class T>
-void ShaderUniform<T>::enable(const SharedPtr<ShaderUniformBase>& source, int location, int textureUnit,
-                              bool force)
+void ShaderUniformBase::enable(const SharedPtr<ShaderUniformBase>& source, int location, int textureUnit,
+                               bool force)
 {
     const bool changed = source && copyFrom(*source);
     if (changed || force)
         send(location, textureUnit);
 }
-
-template <class T>
-bool ShaderUniform<T>::setValue(const T& value, int index)
-{
-    if (index < 0 || index >= m_size)
-    {
-        ORV_LOG_ERROR("Uniform value index (%d) out of range [0:%d).", index, m_size);
-        return false;
-    }
-    set(value, index);
-    return true;
-}
-
-template <class T>
-bool ShaderUniform<T>::getValue(T& value, int index) const
-{
-    if (index < 0 || index >= m_size)
-        return false;
-    value = m_values[index];
-    return true;
-}
-
-template <class T>
-bool ShaderUniform<T>::copyFrom(const ShaderUniformBase& source)
-{
-    const ShaderUniformBase* other = &source;
-    const int size = m_size;
-    ORV_ASSERT(other->getSize() >= size);
-    if (!other->holds<T>())
-        return false;
-
-    const ShaderUniform& typed = static_cast<const ShaderUniform&>(source);
-    const int count = std::min(size, typed.m_size);
-    bool changed = false;
-    for (int i = 0; i < count; ++i)
-    {
-        if (m_values[i] == typed.m_values[i])
-            continue;
-        m_values[i] = typed.m_values[i];
-        changed = true;
-    }
-    if (changed)
-        touch();
-    return changed;
-}
-
-template <class T>
-void ShaderUniform<T>::send(int location, int textureUnit) const
-{
-    ShaderUniformPrivate::setUniform(location, textureUnit, m_size, m_values);
-}
-
-template class ShaderUniform<bool>;
-template class ShaderUniform<Vector2<bool>>;
-template class ShaderUniform<Vector3<bool>>;
-template class ShaderUniform<Vector4<bool>>;
-template class ShaderUniform<unsigned char>;
-template class ShaderUniform<Vector2<unsigned char>>;
-template class ShaderUniform<Vector3<unsigned char>>;
-template class ShaderUniform<Vector4<unsigned char>>;
-template class ShaderUniform<int>;
-template class ShaderUniform<Vector2<int>>;
-template class ShaderUniform<Vector3<int>>;
-template class ShaderUniform<Vector4<int>>;
-template class ShaderUniform<float>;
-template class ShaderUniform<Vector2<float>>;
-template class ShaderUniform<Vector3<float>>;
-template class ShaderUniform<Vector4<float>>;
-template class ShaderUniform<Matrix2<float>>;
-template class ShaderUniform<Matrix3<float>>;
-template class ShaderUniform<Matrix4<float>>;
-template class ShaderUniform<SharedPtr<Texture2D>>;
-template class ShaderUniform<SharedPtr<TextureCube>>;
 
 } // namespace orv

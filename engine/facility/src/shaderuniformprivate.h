@@ -1,5 +1,7 @@
 #pragma once
 
+#include "orv/shaderuniform.h"
+
 namespace orv::ShaderUniformPrivate
 {
 
@@ -8,3 +10,31 @@ namespace orv::ShaderUniformPrivate
 void setSamplerUnits(int location, int unit, int size);
 
 } // namespace orv::ShaderUniformPrivate
+
+// Made once, in shaderuniformtypes.cpp, instead of in each source of the library that makes uniforms.
+namespace orv
+{
+
+extern template class ShaderUniform<bool>;
+extern template class ShaderUniform<Vector2<bool>>;
+extern template class ShaderUniform<Vector3<bool>>;
+extern template class ShaderUniform<Vector4<bool>>;
+extern template class ShaderUniform<unsigned char>;
+extern template class ShaderUniform<Vector2<unsigned char>>;
+extern template class ShaderUniform<Vector3<unsigned char>>;
+extern template class ShaderUniform<Vector4<unsigned char>>;
+extern template class ShaderUniform<int>;
+extern template class ShaderUniform<Vector2<int>>;
+extern template class ShaderUniform<Vector3<int>>;
+extern template class ShaderUniform<Vector4<int>>;
+extern template class ShaderUniform<float>;
+extern template class ShaderUniform<Vector2<float>>;
+extern template class ShaderUniform<Vector3<float>>;
+extern template class ShaderUniform<Vector4<float>>;
+extern template class ShaderUniform<Matrix2<float>>;
+extern template class ShaderUniform<Matrix3<float>>;
+extern template class ShaderUniform<Matrix4<float>>;
+extern template class ShaderUniform<SharedPtr<Texture2D>>;
+extern template class ShaderUniform<SharedPtr<TextureCube>>;
+
+} // namespace orv

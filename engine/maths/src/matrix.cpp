@@ -67,6 +67,28 @@ std::string columnLines(const char* name, const Matrix& m, int count)
 
 } // namespace
 
+Matrix4f detail::multiply(const Matrix4f& m, const Matrix4f& n)
+{
+    // A copy, so that it stays in registers: as far as the compiler knows, the result may lie in m.
+    const Matrix4f left = m;
+    const auto weigh = [&left](const Vector4f& v) __attribute__((always_inline))
+    {
+        return left.columns[0] * v.x + left.columns[1] * v.y + left.columns[2] * v.z + left.columns[3] * v.w;
+    };
+    return Matrix4f(weigh(n.columns[0]), weigh(n.columns[1]), weigh(n.columns[2]), weigh(n.columns[3]));
+}
+
+void detail::multiplyAffine(Matrix4f& result, const Matrix4f& m, const Matrix4f& n)
+{
+    const Matrix4f left = m; // as above
+    const auto weigh = [&left](const Vector4f& v) __attribute__((always_inline))
+    {
+        return left.columns[0] * v.x + left.columns[1] * v.y + left.columns[2] * v.z;
+    };
+    result = Matrix4f(weigh(n.columns[0]), weigh(n.columns[1]), weigh(n.columns[2]),
+                      weigh(n.columns[3]) + left.columns[3]);
+}
+
 Matrix2f transpose(const Matrix2f& m)
 {
     return Matrix2f(Vector2f(m.columns[0].x, m.columns[1].x), Vector2f(m.columns[0].y, m.columns[1].y));
@@ -166,25 +188,6 @@ Matrix4f scaleMatrix(const Vector3f& factors)
     return m;
 }
 
-Matrix3f toMatrix3(const Quaternionf& q)
-{
-    const float squaredLength = q.a * q.a + q.x * q.x + q.y * q.y + q.z * q.z;
-    if (!std::isnormal(squaredLength))
-        return Matrix3f::IDENTITY;
-    const float twice = 2.0f / squaredLength;
-    const float xx = twice * q.x * q.x;
-    const float yy = twice * q.y * q.y;
-    const float zz = twice * q.z * q.z;
-    const float xy = twice * q.x * q.y;
-    const float xz = twice * q.x * q.z;
-    const float yz = twice * q.y * q.z;
-    const float ax = twice * q.a * q.x;
-    const float ay = twice * q.a * q.y;
-    const float az = twice * q.a * q.z;
-    return Matrix3f(Vector3f(1.0f - yy - zz, xy + az, xz - ay), Vector3f(xy - az, 1.0f - xx - zz, yz + ax),
-                    Vector3f(xz + ay, yz - ax, 1.0f - xx - yy));
-}
-
 Matrix4f toMatrix4(const Quaternionf& q)
 {
     const Matrix3f m = toMatrix3(q);
@@ -207,17 +210,17 @@ Matrix4f lookAt(const Vector3f& eye, const Vector3f& target, const Vector3f& up)
                     Vector4f(eye, 1.0f));
 }
 
-std::string toString(const Matrix2f& m)
+[[gnu::cold]] std::string toString(const Matrix2f& m)
 {
     return columnLines("Matrix2f", m, 2);
 }
 
-std::string toString(const Matrix3f& m)
+[[gnu::cold]] std::string toString(const Matrix3f& m)
 {
     return columnLines("Matrix3f", m, 3);
 }
 
-std::string toString(const Matrix4f& m)
+[[gnu::cold]] std::string toString(const Matrix4f& m)
 {
     return columnLines("Matrix4f", m, 4);
 }

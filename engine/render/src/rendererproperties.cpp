@@ -4,6 +4,8 @@
 #include "orv/solid.h"
 #include "orv/texture2dcache.h"
 
+#include <algorithm>
+
 namespace orv::detail
 {
 
@@ -43,7 +45,15 @@ constexpr MaterialDefault<const char*> TEXTURES[] = {
 
 } // namespace
 
-RendererProperties::RendererProperties(RenderContext& context, AssetCachePool* pool)
+void publishJoints(const Solid& solid, ShaderUniform<int>& count, ShaderUniform<Matrix4f>& world)
+{
+    const int jointCount = std::min(solid.getJointCount(), Solid::MAX_JOINTS);
+    count.set(jointCount);
+    for (int i = 0; i < jointCount; ++i)
+        world.set(solid.getJointTransform(i), i);
+}
+
+[[gnu::cold]] RendererProperties::RendererProperties(RenderContext& context, AssetCachePool* pool)
     : lightCount(shareProperty<int>(context, "L_COUNT", 1, 0))
     , lightDiffuse(shareProperty(context, "L_DIFFUSE_COLOUR", MAX_LIGHTS, Vector4f()))
     , lightAmbient(shareProperty(context, "L_AMBIENT_COLOUR", MAX_LIGHTS, Vector4f()))
@@ -83,9 +93,9 @@ RendererProperties::RendererProperties(RenderContext& context, AssetCachePool* p
         provideTexture(context, pool, texture.name, texture.value);
 }
 
-RendererProperties::~RendererProperties()
+[[gnu::cold]] RendererProperties::~RendererProperties()
 {
-    const bool othersRemain = m_sharers->sharedGetCount() > 2;
+    const bool othersRemain = m_sharers && m_sharers->sharedGetCount() > 2;
     if (othersRemain)
         return;
     for (const HeldTexture& held : m_textures)
@@ -95,14 +105,24 @@ RendererProperties::~RendererProperties()
     }
 }
 
-void RendererProperties::provideTexture(RenderContext& context, AssetCachePool* pool, const char* name,
-                                        const char* asset)
+bool RendererProperties::isComplete() const
+{
+    return lightCount && lightDiffuse && lightAmbient && lightSpecular && lightPosition &&
+           lightAttenuationNear && lightAttenuationReciprocal && lightSpotInnerCos && lightSpotOuterCos &&
+           lightSpotDirection && jointCount && jointWorld && model && view && modelView && viewProjection &&
+           modelViewProjection && normalModel && cameraPosition && time;
+}
+
+[[gnu::cold]] void RendererProperties::provideTexture(RenderContext& context, AssetCachePool* pool,
+                                                      const char* name, const char* asset)
 {
     const SharedPtr<ShaderUniformBase> present = context.getProperty(name);
     if (present && !present->holds<SharedPtr<Texture2D>>())
         return; // the application's own, a cube perhaps
 
     const SharedPtr<TextureProperty> property = shareProperty(context, name, 1, SharedPtr<Texture2D>());
+    if (!property)
+        return;
     if (!property->get() && pool)
         property->set(pool->getTexture2DCache()->get(asset));
     if (property->get())

@@ -11,6 +11,7 @@ namespace orv
 {
 
 class AssetCachePool;
+class Solid;
 
 namespace detail
 {
@@ -19,15 +20,18 @@ inline constexpr int MAX_LIGHTS = 5;
 
 /// The context's property of this name, made with every element at the initial value when there is none. One
 /// of another type or with fewer elements cannot serve (logged): what comes back is then in no context.
+/// @return empty when there is no memory (logged).
 template <class T>
-SharedPtr<ShaderUniform<T>> shareProperty(RenderContext& context, const char* name, int size,
-                                          const T& initial)
+[[gnu::cold]] SharedPtr<ShaderUniform<T>> shareProperty(RenderContext& context, const char* name, int size,
+                                                        const T& initial)
 {
     const SharedPtr<ShaderUniformBase> held = context.getProperty(name);
     if (held && held->holds<T>() && held->getSize() >= size)
         return SharedPtr<ShaderUniform<T>>(static_cast<ShaderUniform<T>*>(held.get()));
 
     const SharedPtr<ShaderUniform<T>> property = makeShared<ShaderUniform<T>>(size);
+    if (!property || property->getSize() < size)
+        return {};
     for (int i = 0; i < size; ++i)
         property->set(initial, i);
     if (held)
@@ -38,6 +42,10 @@ SharedPtr<ShaderUniform<T>> shareProperty(RenderContext& context, const char* na
     return property;
 }
 
+/// How many joints reach the shader, and where each takes the solid's mesh.
+/// @param world  of Solid::MAX_JOINTS elements; those beyond the count stay as they are.
+void publishJoints(const Solid& solid, ShaderUniform<int>& count, ShaderUniform<Matrix4f>& world);
+
 /// The global properties that SimpleRenderer writes or provides; see there for their meaning.
 struct RendererProperties
 {
@@ -47,6 +55,10 @@ struct RendererProperties
     /// If no other renderer shares these properties, takes the textures that were there since construction
     /// out of them, so that a context does not keep its pool's textures.
     ~RendererProperties();
+
+    /// Whether there was memory for all that is written each frame.
+    bool isComplete() const;
+
     RendererProperties(const RendererProperties&) = delete;
     RendererProperties& operator=(const RendererProperties&) = delete;
 

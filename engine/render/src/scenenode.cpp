@@ -4,17 +4,19 @@
 #include "orv/scenenodevisitor.h"
 
 #include <algorithm>
+#include <cmath>
+#include <new>
 #include <utility>
 
 namespace orv
 {
 
-SceneNode::SceneNode(const char* name)
+[[gnu::cold]] SceneNode::SceneNode(const char* name)
 {
     setName(name);
 }
 
-SceneNode::~SceneNode()
+[[gnu::cold]] SceneNode::~SceneNode()
 {
     // Descendants that die with this node are gathered here and die one by one: a chain of nodes as long as
     // a damaged or generated scene likes must not recurse through as many destructors, nor marks.
@@ -46,7 +48,7 @@ void SceneNode::accept(SceneNodeVisitor& visitor)
     visitor.visit(this);
 }
 
-void SceneNode::setName(const char* name)
+[[gnu::cold]] void SceneNode::setName(const char* name)
 {
     m_name = name ? name : "";
 }
@@ -73,12 +75,14 @@ void SceneNode::setScale(const Vector3f& scale)
         return;
     setTransformChanged();
     m_scale = scale;
+    m_scaled = !(scale == Vector3f(1.0f, 1.0f, 1.0f));
 }
 
 void SceneNode::setLocalTransform(const Matrix4f& transform)
 {
     m_localTransform = transform;
     m_localTransformChanged = false;
+    m_localRigid = false;
     m_localMirrored = determinant(upper3x3(transform)) < 0.0f;
     setWorldTransformChanged();
 }
@@ -106,6 +110,12 @@ void SceneNode::setWorldTransformChanged()
     if (m_worldTransformChanged)
         return;
     m_worldTransformChanged = true;
+    if (!m_children.empty())
+        markChildren();
+}
+
+void SceneNode::markChildren()
+{
     for (const SharedPtr<SceneNode>& child : m_children)
         child->setWorldTransformChanged();
 }
@@ -116,19 +126,36 @@ void SceneNode::updateLocal() const
         return;
 
     const Matrix3f rotation = toMatrix3(m_rotation);
-    m_localTransform = Matrix4f(Vector4f(rotation.columns[0] * m_scale.x, 0.0f),
-                                Vector4f(rotation.columns[1] * m_scale.y, 0.0f),
-                                Vector4f(rotation.columns[2] * m_scale.z, 0.0f), Vector4f(m_position, 1.0f));
-    m_localMirrored = (m_scale.x < 0.0f) != ((m_scale.y < 0.0f) != (m_scale.z < 0.0f));
+    m_localTransform = Matrix4f(Vector4f(rotation.columns[0], 0.0f), Vector4f(rotation.columns[1], 0.0f),
+                                Vector4f(rotation.columns[2], 0.0f), Vector4f(m_position, 1.0f));
+    m_localMirrored = false;
+    m_localRigid = !m_scaled;
     m_localTransformChanged = false;
+    if (!m_scaled)
+        return;
+    m_localTransform.columns[0] *= m_scale.x;
+    m_localTransform.columns[1] *= m_scale.y;
+    m_localTransform.columns[2] *= m_scale.z;
+    m_localMirrored = (m_scale.x < 0.0f) != ((m_scale.y < 0.0f) != (m_scale.z < 0.0f));
+}
+
+void SceneNode::placeBelow(const Matrix4f& parentWorld, bool parentMirrored, bool parentRigid) const
+{
+    if (m_localTransformChanged)
+        updateLocal();
+    if (m_localRigid)
+        detail::multiplyAffine(m_worldTransform, parentWorld, m_localTransform);
+    else
+        m_worldTransform = parentWorld * m_localTransform;
+    m_worldMirrored = parentMirrored != m_localMirrored;
+    m_worldRigid = parentRigid && m_localRigid;
+    m_worldTransformChanged = false;
+    m_normalTransformChanged = true;
 }
 
 void SceneNode::updateAll(const Matrix4f& parentWorld, bool parentMirrored) const
 {
-    updateLocal();
-    m_worldTransform = parentWorld * m_localTransform;
-    m_worldMirrored = parentMirrored != m_localMirrored;
-    m_worldTransformChanged = false;
+    placeBelow(parentWorld, parentMirrored, false);
 }
 
 void SceneNode::update() const
@@ -137,20 +164,36 @@ void SceneNode::update() const
         return;
     if (!m_parent)
     {
-        updateAll(Matrix4f::IDENTITY, false);
+        placeBelow(Matrix4f::IDENTITY, false, true);
         return;
     }
-    m_parent->update();
-    updateAll(m_parent->m_worldTransform, m_parent->m_worldMirrored);
+    if (m_parent->m_worldTransformChanged)
+        m_parent->update();
+    placeBelow(m_parent->m_worldTransform, m_parent->m_worldMirrored, m_parent->m_worldRigid);
+}
+
+void SceneNode::updateNormal() const
+{
+    const Vector3f x = m_worldTransform.columns[0].xyz();
+    const Vector3f y = m_worldTransform.columns[1].xyz();
+    const Vector3f z = m_worldTransform.columns[2].xyz();
+    const Vector3f yz = cross(y, z);
+    const float reciprocal = 1.0f / dot(x, yz);
+    const float factor = std::isfinite(reciprocal) ? reciprocal : 1.0f;
+    m_normalTransform = Matrix3f(yz * factor, cross(z, x) * factor, cross(x, y) * factor);
+    m_normalTransformChanged = false;
 }
 
 void SceneNode::updateMotionData()
 {
     update();
-    m_lastWorldTransform = m_worldTransform;
+    if (!m_lastWorldTransform)
+        m_lastWorldTransform.reset(new (std::nothrow) Matrix4f);
+    if (m_lastWorldTransform)
+        *m_lastWorldTransform = m_worldTransform;
 }
 
-void SceneNode::setParent(const SharedPtr<SceneNode>& parent, bool preserveWorldTransform)
+[[gnu::cold]] void SceneNode::setParent(const SharedPtr<SceneNode>& parent, bool preserveWorldTransform)
 {
     if (parent && parent->hasAncestor(this))
         return;
@@ -222,7 +265,7 @@ const SceneNode* SceneNode::find(const char* name) const
 }
 
 /// @return the share that the child list held; empty when the node is no child of this one.
-SharedPtr<SceneNode> SceneNode::takeChild(const SceneNode* child)
+[[gnu::cold]] SharedPtr<SceneNode> SceneNode::takeChild(const SceneNode* child)
 {
     const auto found =
         std::find_if(m_children.begin(), m_children.end(),

@@ -25,19 +25,6 @@ namespace orv
 namespace
 {
 
-/// The inverse transpose of the upper 3x3 part: the cofactors over the determinant. A solid squeezed flat has
-/// no inverse; its cofactors still point the right way.
-Matrix3f normalMatrix(const Matrix4f& world)
-{
-    const Vector3f x = world.columns[0].xyz();
-    const Vector3f y = world.columns[1].xyz();
-    const Vector3f z = world.columns[2].xyz();
-    const Vector3f yz = cross(y, z);
-    const float reciprocal = 1.0f / dot(x, yz);
-    const float factor = std::isfinite(reciprocal) ? reciprocal : 1.0f;
-    return Matrix3f(yz * factor, cross(z, x) * factor, cross(x, y) * factor);
-}
-
 /// Reflects about the plane through the solid's position across its z axis.
 Matrix4f reflectionMatrix(const Matrix4f& world)
 {
@@ -48,6 +35,16 @@ Matrix4f reflectionMatrix(const Matrix4f& world)
                     Vector4f(Vector3f::Z_AXIS - n * (2.0f * n.z), 0.0f), Vector4f(n * (2.0f * d), 1.0f));
 }
 
+/// Space * the solid's world transform.
+[[gnu::always_inline]] inline void place(Matrix4f& result, const Matrix4f& space, const Solid& solid)
+{
+    const Matrix4f& world = solid.getWorldTransform();
+    if (solid.isWorldRigid())
+        detail::multiplyAffine(result, space, world);
+    else
+        result = space * world;
+}
+
 Vector4f toVector(const Colour4f& colour)
 {
     return Vector4f(colour.r, colour.g, colour.b, colour.a);
@@ -55,14 +52,15 @@ Vector4f toVector(const Colour4f& colour)
 
 } // namespace
 
-SimpleRenderer::SimpleRenderer(const SharedPtr<RenderContext>& context, const SharedPtr<AssetCachePool>& pool)
+[[gnu::cold]] SimpleRenderer::SimpleRenderer(const SharedPtr<RenderContext>& context,
+                                             const SharedPtr<AssetCachePool>& pool)
     : m_context(context)
     , m_pool(pool)
     , m_properties(std::make_unique<detail::RendererProperties>(*m_context, m_pool.get()))
 {
 }
 
-SimpleRenderer::~SimpleRenderer() = default;
+[[gnu::cold]] SimpleRenderer::~SimpleRenderer() = default;
 
 void SimpleRenderer::visit(Solid* solid)
 {
@@ -95,6 +93,8 @@ void SimpleRenderer::render(Camera* camera, SceneNode& scene, const FlagMask& re
     m_transparent.clear();
     m_mirrors.clear();
     m_lights.clear();
+    if (!m_properties->isComplete())
+        return; // the log said so when they were made
     visitScene(*this, scene, renderFlags, recursiveFlags);
 
     m_viewport = detail::getViewport(*m_context);
@@ -201,7 +201,7 @@ void SimpleRenderer::sortTransparent(const Vector3f& eyeZ)
 }
 
 /// @return false if there is no target to reflect into; tried once only, not frame after frame.
-bool SimpleRenderer::prepareMirrorTarget()
+[[gnu::cold]] bool SimpleRenderer::prepareMirrorTarget()
 {
     const bool empty = m_viewport.width <= 0 || m_viewport.height <= 0;
     if (!m_mirrorTargetTried && m_pool && !empty)
@@ -217,8 +217,8 @@ bool SimpleRenderer::prepareMirrorTarget()
 }
 
 /// Draws what the mirror shows into the mirror target; framebuffer and viewport come back.
-void SimpleRenderer::renderReflection(const Solid& mirror, const detail::Eye& eye,
-                                      const detail::Viewport& viewport)
+[[gnu::cold]] void SimpleRenderer::renderReflection(const Solid& mirror, const detail::Eye& eye,
+                                                    const detail::Viewport& viewport)
 {
     const unsigned framebuffer = RenderTarget::getBoundFramebuffer();
     const Texture2D& texture = *m_mirrorTarget->getColourTexture();
@@ -249,29 +249,37 @@ void SimpleRenderer::renderReflection(const Solid& mirror, const detail::Eye& ey
 void SimpleRenderer::draw(Solid* const* solids, size_t count, const Matrix4f& view,
                           const Matrix4f& projection)
 {
-    detail::RendererProperties& properties = *m_properties;
-    RenderContext& context = *m_context;
-    properties.viewProjection->set(projection * view);
+    const detail::RendererProperties& properties = *m_properties;
+    ShaderUniform<Matrix4f>& model = *properties.model;
+    ShaderUniform<Matrix4f>& modelView = *properties.modelView;
+    ShaderUniform<Matrix4f>& modelViewProjection = *properties.modelViewProjection;
+    ShaderUniform<Matrix3f>& normalModel = *properties.normalModel;
+    bool hadJoints = properties.jointCount->get() > 0;
+
+    const Matrix4f viewProjection = projection * view;
+    properties.viewProjection->set(viewProjection);
     for (size_t i = 0; i < count; ++i)
     {
         Solid& solid = *solids[i];
-        const Matrix4f& world = solid.getWorldTransform();
-        const Matrix4f modelView = view * world;
-        properties.modelViewProjection->set(projection * modelView);
-        properties.modelView->set(modelView);
-        properties.model->set(world);
-        properties.normalModel->set(normalMatrix(world));
-        publishJoints(solid);
-        solid.draw(context);
-    }
-}
+        // What the program does not read is not worked out, but for the last solid, whose values are to stay.
+        const bool isLast = i + 1 == count;
+        const ShaderProgram& program = *solid.getAppearance().get()->getShaderProgram().get();
+        const uint32_t wanted = isLast ? detail::DRAW_ALL : program.getDrawProperties();
+        if ((wanted & detail::DRAW_MODEL_VIEW_PROJECTION) != 0)
+            place(modelViewProjection.renew(), viewProjection, solid);
+        if ((wanted & detail::DRAW_MODEL_VIEW) != 0)
+            place(modelView.renew(), view, solid);
+        if ((wanted & detail::DRAW_MODEL) != 0)
+            model.renew() = solid.getWorldTransform();
+        if ((wanted & detail::DRAW_NORMAL_MODEL) != 0)
+            normalModel.renew() = solid.getNormalTransform();
 
-void SimpleRenderer::publishJoints(const Solid& solid)
-{
-    const int count = std::min(solid.getJointCount(), Solid::MAX_JOINTS);
-    m_properties->jointCount->set(count);
-    for (int i = 0; i < count; ++i)
-        m_properties->jointWorld->set(solid.getJointTransform(i), i);
+        const bool hasJoints = solid.getJointCount() > 0;
+        if (hasJoints || hadJoints)
+            detail::publishJoints(solid, *properties.jointCount, *properties.jointWorld);
+        hadJoints = hasJoints;
+        solid.draw(*m_context);
+    }
 }
 
 } // namespace orv

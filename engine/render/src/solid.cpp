@@ -42,10 +42,17 @@ void Solid::setJointsPerVertex(int count)
     if (count > MAX_JOINTS_PER_VERTEX)
         ORV_LOG_WARN("%d is greater than the maximum joints per vertex; clamping to %d", count,
                      MAX_JOINTS_PER_VERTEX);
-    m_jointsPerVertex = std::clamp(count, 0, MAX_JOINTS_PER_VERTEX);
+    makeSkin().jointsPerVertex = std::clamp(count, 0, MAX_JOINTS_PER_VERTEX);
 }
 
-void Solid::attachJoint(const SharedPtr<SceneNode>& joint, const Matrix4f& inverseBind)
+Solid::Skin& Solid::makeSkin()
+{
+    if (!m_skin)
+        m_skin = std::make_unique<Skin>();
+    return *m_skin;
+}
+
+[[gnu::cold]] void Solid::attachJoint(const SharedPtr<SceneNode>& joint, const Matrix4f& inverseBind)
 {
     JointAttachment attachment;
     attachment.inverseBind = inverseBind;
@@ -53,7 +60,7 @@ void Solid::attachJoint(const SharedPtr<SceneNode>& joint, const Matrix4f& inver
         attachment.above = joint.get();
     else
         attachment.joint = joint;
-    m_joints.push_back(attachment);
+    makeSkin().joints.push_back(attachment);
 
     if (getJointCount() == MAX_JOINTS + 1)
         ORV_LOG_ERROR("Solid \"%s\" has more than %d joints; the others have no effect.", getName(),
@@ -66,8 +73,8 @@ Matrix4f Solid::calculateJointTransform(const JointAttachment& attachment) const
     if (!joint && attachment.above && hasAncestor(attachment.above))
         joint = attachment.above;
     if (!joint)
-        return getWorldTransform() * m_bindShapeTransform;
-    return joint->getWorldTransform() * attachment.inverseBind * m_bindShapeTransform;
+        return getWorldTransform() * getBindShapeTransform();
+    return joint->getWorldTransform() * attachment.inverseBind * getBindShapeTransform();
 }
 
 void Solid::draw(RenderContext& context)
@@ -87,10 +94,15 @@ void Solid::draw(RenderContext& context, Appearance& appearance)
         program = ShaderProgram::getCurrent(context);
     VertexBuffer* vertices = m_mesh->getVertexBuffer().get();
     IndexBuffer* indices = m_mesh->getIndexBuffer().get();
-    // Whatever a lost context took along, drawing the rest would read garbage.
-    if (!program || !program->getId() || !vertices || vertices->isLost() || !indices)
+    if (!program || !vertices || !indices)
         return;
-    program->bind(context, *vertices);
+    if (!context.isVertexInputBound(program->getRevision(), vertices->getRevision()))
+    {
+        // Whatever a lost context took along, drawing the rest would read garbage.
+        if (!program->getId() || vertices->isLost())
+            return;
+        program->bind(context, *vertices);
+    }
     indices->draw(context);
 }
 

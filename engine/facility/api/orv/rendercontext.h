@@ -101,11 +101,15 @@ public:
     /// @param stateRevision  stamp of state: the same stamp, blendEnabled and turnWinding as last time, with
     ///                       no setter having changed anything since, return at once.
     /// @param turnWinding    sends the opposite winding order, for geometry that a transform mirrors.
-    void apply(const RenderState& state, uint64_t stateRevision, bool blendEnabled, bool turnWinding = false)
+    /// @return a stamp of state that serves from now on as well: that of the state applied before, if both are
+    ///         equal, so that materials that differ in properties alone come to share one.
+    uint64_t apply(const RenderState& state, uint64_t stateRevision, bool blendEnabled,
+                   bool turnWinding = false)
     {
         const uint32_t flags = (blendEnabled ? APPLY_BLEND : 0u) | (turnWinding ? APPLY_TURNED : 0u);
         if (stateRevision != m_appliedRevision || flags != m_appliedFlags)
             applyChanged(state, stateRevision, flags);
+        return m_appliedRevision;
     }
 
     // Draw path: bindings. Each operation does nothing when GL is known to hold what it asks for; what was
@@ -117,6 +121,14 @@ public:
         if (name != m_program)
             sendProgram(name);
     }
+
+    /// Whether the program of this stamp was made ready and nothing has happened to it or to bindings since.
+    bool isProgramReady(uint64_t programRevision) const
+    {
+        return m_readyProgram == programRevision && m_epoch == detail::g_bindingEpoch;
+    }
+
+    void setProgramReady(uint64_t programRevision) { m_readyProgram = programRevision; }
 
     /// The program that GL draws with, 0 for none.
     unsigned getProgramInUse() const;
@@ -212,14 +224,14 @@ private:
     void applyChanged(const RenderState& state, uint64_t stateRevision, uint32_t flags);
     void stateChanged() { m_appliedRevision = 0; }
 
-    static unsigned glBlendFactorConvert(BlendFactor factor);
-    static unsigned glBlendFunctionConvert(BlendFunction function);
-    static unsigned glCullingModeConvert(CullingMode mode);
-    static unsigned glWindingOrderConvert(WindingOrder order);
-    static unsigned glDepthFunctionConvert(DepthFunction function);
-    static unsigned glStencilFaceConvert(StencilFace face);
-    static unsigned glStencilFunctionConvert(StencilFunction function);
-    static unsigned glStencilOperationConvert(StencilOperation operation);
+    ORV_LOCAL static unsigned glBlendFactorConvert(BlendFactor factor);
+    ORV_LOCAL static unsigned glBlendFunctionConvert(BlendFunction function);
+    ORV_LOCAL static unsigned glCullingModeConvert(CullingMode mode);
+    ORV_LOCAL static unsigned glWindingOrderConvert(WindingOrder order);
+    ORV_LOCAL static unsigned glDepthFunctionConvert(DepthFunction function);
+    ORV_LOCAL static unsigned glStencilFaceConvert(StencilFace face);
+    ORV_LOCAL static unsigned glStencilFunctionConvert(StencilFunction function);
+    ORV_LOCAL static unsigned glStencilOperationConvert(StencilOperation operation);
 
     std::map<std::string, SharedPtr<ShaderUniformBase>, std::less<>> m_properties;
     SharedPtr<detail::ProgramHandle> m_currentProgram;
@@ -235,6 +247,7 @@ private:
     uint64_t m_propertyRevision;
     uint64_t m_appliedRevision = 0;
     uint32_t m_appliedFlags = 0;
+    RenderState m_appliedState; ///< as it was given, before masks and winding order were chosen
 
     bool m_attribArraysKnown = false;
     uint32_t m_attribArrays = 0;
@@ -242,6 +255,7 @@ private:
     uint64_t m_epoch = 0;
     uint64_t m_inputProgram = 0;
     uint64_t m_inputBuffer = 0;
+    uint64_t m_readyProgram = 0;
     unsigned m_program = UNKNOWN;
     unsigned m_arrayBuffer = UNKNOWN;
     unsigned m_elementBuffer = UNKNOWN;

@@ -219,6 +219,8 @@ struct RenderState
     StencilOperation stencilPassOperation[STENCIL_FACE_COUNT] = {StencilOperation::KEEP,
                                                                  StencilOperation::KEEP};
     uint32_t stencilWriteMask[STENCIL_FACE_COUNT] = {0xFFFFFFFFu, 0xFFFFFFFFu};
+
+    bool operator==(const RenderState&) const = default;
 };
 
 } // namespace orv

@@ -21,13 +21,44 @@ namespace detail
 {
 class ProgramResource;
 
+/// What the draw path reads of a uniform.
+struct DrawnUniform
+{
+    SharedPtr<ShaderUniformBase> value;  ///< set from outside, may be null
+    SharedPtr<ShaderUniformBase> linked; ///< the context's property, may be null
+    SharedPtr<ShaderUniformBase> sent;   ///< the values sent last; null for a sampler
+    uint64_t sentRevision = 0;           ///< of the source that was compared last
+    /// Sends the source's value if it differs. @return false, with nothing done, for what needs a longer way.
+    bool (*update)(DrawnUniform& uniform, const ShaderUniformBase& source) = nullptr;
+    int location = -1;
+    int textureUnit = -1;       ///< first of a sampler's units; -1 for other types
+    int size = 1;               ///< array size
+    unsigned textureTarget = 0; ///< of a sampler
+};
+
 /// Where the uniforms of a program take their values from, found out once, so that a draw follows pointers and
 /// compares no names. The pointers are borrowed; the program renews its own stamp when they no longer hold.
 struct UniformSources
 {
-    uint64_t revision = 0;                        ///< the program's stamp; 0 to have everything found anew
-    std::vector<const ShaderUniformBase*> values; ///< by uniform; null for samplers and for want of a source
-    std::vector<const ShaderUniformBase*> textures; ///< by sampler; null for want of a source
+    struct Value
+    {
+        const ShaderUniformBase* source; ///< null for want of one; a sampler always has an entry
+        DrawnUniform* uniform;
+    };
+
+    uint64_t revision = 0; ///< the program's stamp; 0 to have everything found anew
+    std::vector<Value> values;
+    std::vector<Value> samplers;
+};
+
+/// The properties that a renderer would have to work out for each draw.
+enum DrawProperty : uint32_t
+{
+    DRAW_MODEL = 1,
+    DRAW_MODEL_VIEW = 2,
+    DRAW_MODEL_VIEW_PROJECTION = 4,
+    DRAW_NORMAL_MODEL = 8,
+    DRAW_ALL = 15
 };
 
 } // namespace detail
@@ -79,6 +110,10 @@ public:
     /// uniformExists("M_MIRROR_TEXTURE"), answered without comparing names.
     bool usesMirrorTexture() const { return m_usesMirrorTexture; }
 
+    /// Those of T_MODEL, T_MODEL_VIEW, T_MODEL_VIEW_PROJECTION and T_NORMAL_MODEL that a uniform takes: bits of
+    /// detail::DrawProperty.
+    uint32_t getDrawProperties() const { return m_drawProperties; }
+
     /// Looks the property names up in the context, unless that was done before and neither the context nor its
     /// set of properties is another one by now. A name that is not found keeps what it had.
     void link(RenderContext& context);
@@ -114,18 +149,7 @@ public:
     static ShaderProgram* getCurrent(const RenderContext& context);
 
 private:
-    /// What the draw path reads of a uniform.
-    struct Uniform
-    {
-        SharedPtr<ShaderUniformBase> value;  ///< set from outside, may be null
-        SharedPtr<ShaderUniformBase> linked; ///< the context's property, may be null
-        SharedPtr<ShaderUniformBase> sent;   ///< the values sent last; null for a sampler
-        uint64_t sentRevision = 0;           ///< of the source that was compared last
-        int location = -1;
-        int textureUnit = -1;       ///< first of a sampler's units; -1 for other types
-        int size = 1;               ///< array size
-        unsigned textureTarget = 0; ///< of a sampler
-    };
+    using Uniform = detail::DrawnUniform;
 
     struct UniformNames
     {
@@ -133,23 +157,23 @@ private:
         std::string property;
     };
 
-    void getUniforms();
-    void getAttributes();
-    bool indexInRange(int index) const;
-    void addUniform(const char* name, int location, int size, unsigned glType, int& nextUnit);
-    void setSamplerUnits() const;
-    void resolve(const ShaderUniformBase* const* values, detail::UniformSources& sources) const;
+    ORV_LOCAL void getUniforms();
+    ORV_LOCAL void getAttributes();
+    ORV_LOCAL bool indexInRange(int index) const;
+    ORV_LOCAL void addUniform(const char* name, int location, int size, unsigned glType, int& nextUnit);
+    ORV_LOCAL void setSamplerUnits() const;
+    ORV_LOCAL void resolve(const ShaderUniformBase* const* values, detail::UniformSources& sources);
 
     uint64_t m_linkedRevision = 0; ///< the context's property revision at the last link
     uint64_t m_sourcesRevision;    ///< changes with every linked or set value
     SharedPtr<detail::ProgramResource> m_resource;
     std::vector<Uniform> m_uniforms;
-    std::vector<std::size_t> m_samplers; ///< indices into m_uniforms
-    std::vector<UniformNames> m_names;   ///< of m_uniforms
-    detail::UniformSources m_sources;    ///< without an appearance
+    std::vector<UniformNames> m_names; ///< of m_uniforms
+    detail::UniformSources m_sources;  ///< without an appearance
     std::vector<detail::ProgramAttrib> m_attribs;
     SharedPtr<detail::ProgramHandle> m_handle;
     uint64_t m_revision;
+    uint32_t m_drawProperties = 0;
     bool m_usesMirrorTexture = false;
 };
 

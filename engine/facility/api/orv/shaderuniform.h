@@ -4,17 +4,19 @@
 #include "orv/export.h"
 #include "orv/matrix.h"
 #include "orv/sharedptr.h"
+#include "orv/texture.h"
 #include "orv/vector.h"
 
+#include <algorithm>
+#include <cstddef>
 #include <cstdint>
+#include <new>
 #include <type_traits>
 
 namespace orv
 {
 
 class ShaderProgram;
-class Texture2D;
-class TextureCube;
 
 namespace detail
 {
@@ -63,7 +65,7 @@ public:
     /// @param location     uniform location in the current program.
     /// @param textureUnit  first unit of a sampler; unused by other types.
     virtual void enable(const SharedPtr<ShaderUniformBase>& source, int location, int textureUnit,
-                        bool force) = 0;
+                        bool force);
 
     /// One setter for each value type. @return false when the holder has another type, which is not logged, or
     /// index is not in [0, getSize()), which is; nothing changes then.
@@ -114,7 +116,7 @@ public:
     virtual bool getValue(SharedPtr<TextureCube>&, int) const { return false; }
 
     /// Count of values, at least 1.
-    virtual int getSize() const = 0;
+    virtual int getSize() const { return m_size; }
 
     /// Changes whenever a value changes and is never the same for two holders.
     uint64_t getRevision() const { return m_revision; }
@@ -127,8 +129,13 @@ public:
     }
 
 protected:
-    explicit ShaderUniformBase(int type) : m_type(type) {}
+    /// @param size  below 1 is an error and counts as 1.
+    ShaderUniformBase(int type, int size);
 
+    /// Sends the values, which are of the holder's type, to the current program.
+    void sendValues(int location, int textureUnit, const void* values) const;
+
+    void becomeSingle() { m_size = 1; }
     void touch() { m_revision = detail::nextRevision(); }
 
 private:
@@ -142,13 +149,17 @@ private:
 
     uint64_t m_revision = detail::nextRevision();
     int m_type;
+    int m_size;
 };
 
 /// The value holder for one of the 21 types of detail::UniformTypes. Values start zeroed (null for textures).
 ///
 /// set() and get() are the short way for whoever holds the typed pointer; they take no virtual call.
+///
+/// All of it stands here, so that a program makes the few types that it uses itself and the library need not offer
+/// every member of all 21.
 template <class T>
-class ORV_API ShaderUniform final : public ShaderUniformBase
+class ShaderUniform final : public ShaderUniformBase
 {
     static_assert(detail::UniformTypes::indexOf<T>() < detail::UniformTypes::COUNT,
                   "not a type of shader uniform");
@@ -157,20 +168,59 @@ public:
     using Ptr = SharedPtr<ShaderUniform<T>>;
 
     /// @param size  count of values; below 1 is an error and counts as 1.
-    explicit ShaderUniform(int size);
-    ~ShaderUniform() override;
+    explicit ShaderUniform(int size)
+        : ShaderUniformBase(detail::UniformTypes::indexOf<T>(), size)
+        , m_values(&m_single)
+    {
+        if (getSize() == 1)
+            return;
+
+        if (T* values = new (std::nothrow) T[std::size_t(getSize())]())
+        {
+            m_values = values;
+            return;
+        }
+        ORV_LOG_ERROR("No memory for a uniform of %d values; setting to 1", getSize());
+        becomeSingle();
+    }
+
+    ~ShaderUniform() override
+    {
+        if (m_values != &m_single)
+            delete[] m_values;
+    }
 
     using ShaderUniformBase::getValue;
     using ShaderUniformBase::setValue;
 
-    void enable(const SharedPtr<ShaderUniformBase>& source, int location, int textureUnit,
-                bool force) override;
-    bool setValue(const T& value, int index) override;
-    bool getValue(T& value, int index) const override;
-    int getSize() const override { return m_size; }
+    bool setValue(const T& value, int index) override
+    {
+        if (index < 0 || index >= getSize())
+        {
+            ORV_LOG_ERROR("Uniform value index (%d) out of range [0:%d).", index, getSize());
+            return false;
+        }
+        set(value, index);
+        return true;
+    }
+
+    bool getValue(T& value, int index) const override
+    {
+        if (index < 0 || index >= getSize())
+            return false;
+        value = m_values[index];
+        return true;
+    }
 
     /// @param index  in [0, getSize()); not checked.
     const T& get(int index = 0) const { return m_values[index]; }
+
+    /// The first value, to be written: for what is new nearly every time, so that comparing would be in vain.
+    T& renew()
+    {
+        touch();
+        return m_values[0];
+    }
 
     /// Stores the value; an equal one (components compared with ==) changes nothing.
     /// @param index  in [0, getSize()); not checked.
@@ -183,34 +233,33 @@ public:
     }
 
 private:
-    bool copyFrom(const ShaderUniformBase& source) override;
-    void send(int location, int textureUnit) const override;
+    bool copyFrom(const ShaderUniformBase& source) override
+    {
+        const ShaderUniformBase* other = &source;
+        const int size = getSize();
+        ORV_ASSERT(other->getSize() >= size);
+        if (!other->holds<T>())
+            return false;
 
-    int m_size;
+        const ShaderUniform& typed = static_cast<const ShaderUniform&>(source);
+        const int count = std::min(size, typed.getSize());
+        bool changed = false;
+        for (int i = 0; i < count; ++i)
+        {
+            if (m_values[i] == typed.m_values[i])
+                continue;
+            m_values[i] = typed.m_values[i];
+            changed = true;
+        }
+        if (changed)
+            touch();
+        return changed;
+    }
+
+    void send(int location, int textureUnit) const override { sendValues(location, textureUnit, m_values); }
+
     T* m_values; ///< m_single, or an array of its own when there are more
     T m_single{};
 };
-
-extern template class ShaderUniform<bool>;
-extern template class ShaderUniform<Vector2<bool>>;
-extern template class ShaderUniform<Vector3<bool>>;
-extern template class ShaderUniform<Vector4<bool>>;
-extern template class ShaderUniform<unsigned char>;
-extern template class ShaderUniform<Vector2<unsigned char>>;
-extern template class ShaderUniform<Vector3<unsigned char>>;
-extern template class ShaderUniform<Vector4<unsigned char>>;
-extern template class ShaderUniform<int>;
-extern template class ShaderUniform<Vector2<int>>;
-extern template class ShaderUniform<Vector3<int>>;
-extern template class ShaderUniform<Vector4<int>>;
-extern template class ShaderUniform<float>;
-extern template class ShaderUniform<Vector2<float>>;
-extern template class ShaderUniform<Vector3<float>>;
-extern template class ShaderUniform<Vector4<float>>;
-extern template class ShaderUniform<Matrix2<float>>;
-extern template class ShaderUniform<Matrix3<float>>;
-extern template class ShaderUniform<Matrix4<float>>;
-extern template class ShaderUniform<SharedPtr<Texture2D>>;
-extern template class ShaderUniform<SharedPtr<TextureCube>>;
 
 } // namespace orv

@@ -4,6 +4,7 @@
 #include "orv/quaternion.h"
 #include "orv/vector.h"
 
+#include <limits>
 #include <string>
 
 namespace orv
@@ -78,6 +79,25 @@ template <class T>
 constexpr Matrix3<T> Matrix3<T>::IDENTITY(Vector3<T>(T(1), T(0), T(0)), Vector3<T>(T(0), T(1), T(0)),
                                           Vector3<T>(T(0), T(0), T(1)));
 
+template <class T>
+struct Matrix4;
+
+namespace detail
+{
+
+template <class T>
+constexpr Matrix4<T> multiply(const Matrix4<T>& m, const Matrix4<T>& n)
+{
+    return Matrix4<T>(m * n.columns[0], m * n.columns[1], m * n.columns[2], m * n.columns[3]);
+}
+
+/// The same in the fewest steps: frames are full of it.
+ORV_API Matrix4<float> multiply(const Matrix4<float>& m, const Matrix4<float>& n);
+/// Likewise, where the last row of n is 0 0 0 1. The result may be m or n.
+ORV_API void multiplyAffine(Matrix4<float>& result, const Matrix4<float>& m, const Matrix4<float>& n);
+
+} // namespace detail
+
 /// Four columns of four; see Matrix2. A transform of space keeps its translation in column 3.
 template <class T>
 struct ORV_API Matrix4
@@ -100,10 +120,7 @@ struct ORV_API Matrix4
     {
         return m.columns[0] * v.x + m.columns[1] * v.y + m.columns[2] * v.z + m.columns[3] * v.w;
     }
-    friend constexpr Matrix4 operator*(const Matrix4& m, const Matrix4& n)
-    {
-        return Matrix4(m * n.columns[0], m * n.columns[1], m * n.columns[2], m * n.columns[3]);
-    }
+    friend constexpr Matrix4 operator*(const Matrix4& m, const Matrix4& n) { return detail::multiply(m, n); }
     friend constexpr bool operator==(const Matrix4& m, const Matrix4& n)
     {
         return m.columns[0] == n.columns[0] && m.columns[1] == n.columns[1] && m.columns[2] == n.columns[2] &&
@@ -144,7 +161,25 @@ ORV_API Matrix4f scaleMatrix(const Vector3f& factors);
 
 /// The rotation alone: a quaternion that is not of unit length turns as its normalised form would; one whose
 /// squared length is zero or beyond floats does not turn.
-ORV_API Matrix3f toMatrix3(const Quaternionf& q);
+[[gnu::always_inline]] inline Matrix3f toMatrix3(const Quaternionf& q)
+{
+    const float squaredLength = q.a * q.a + q.x * q.x + q.y * q.y + q.z * q.z;
+    if (!(squaredLength >= std::numeric_limits<float>::min() &&
+          squaredLength <= std::numeric_limits<float>::max()))
+        return Matrix3f::IDENTITY;
+    const float twice = 2.0f / squaredLength;
+    const float xx = twice * q.x * q.x;
+    const float yy = twice * q.y * q.y;
+    const float zz = twice * q.z * q.z;
+    const float xy = twice * q.x * q.y;
+    const float xz = twice * q.x * q.z;
+    const float yz = twice * q.y * q.z;
+    const float ax = twice * q.a * q.x;
+    const float ay = twice * q.a * q.y;
+    const float az = twice * q.a * q.z;
+    return Matrix3f(Vector3f(1.0f - yy - zz, xy + az, xz - ay), Vector3f(xy - az, 1.0f - xx - zz, yz + ax),
+                    Vector3f(xz + ay, yz - ax, 1.0f - xx - yy));
+}
 ORV_API Matrix4f toMatrix4(const Quaternionf& q);
 
 /// The world transform of something at eye that looks along its -z at target (a camera, a light).

@@ -7,6 +7,7 @@
 #include "orv/vector.h"
 
 #include <cstdint>
+#include <memory>
 #include <string>
 #include <vector>
 
@@ -66,11 +67,16 @@ public:
 
     const Matrix4f& getLocalTransform() const;
     const Matrix4f& getWorldTransform() const;
+    /// Whether the world transform is known to be made of rotations and translations alone.
+    bool isWorldRigid() const;
+    /// Takes normals to the world: the inverse transpose of the upper 3x3 part of the world transform. Squeezed
+    /// flat, a node has no inverse; then its cofactors, which still point the right way.
+    Matrix3f getNormalTransform() const;
     bool getLocalMirrored() const; ///< the local transform flips handedness
     bool getWorldMirrored() const; ///< the world transform flips handedness
 
     /// The world matrix that updateMotionData() saved; identity before the first call.
-    const Matrix4f& getLastWorldTransform() const { return m_lastWorldTransform; }
+    const Matrix4f& getLastWorldTransform() const;
 
     /// Marks the local matrix, and so this subtree's world matrices, for rebuilding.
     void setTransformChanged();
@@ -116,12 +122,19 @@ public:
     const SceneNode* find(const char* name) const;
 
 private:
-    SharedPtr<SceneNode> takeChild(const SceneNode* child);
+    ORV_LOCAL SharedPtr<SceneNode> takeChild(const SceneNode* child);
+    ORV_LOCAL void placeBelow(const Matrix4f& parentWorld, bool parentMirrored, bool parentRigid) const;
+    void updateNormal() const;
+    ORV_LOCAL void markChildren();
 
     mutable bool m_localMirrored = false;
     mutable bool m_worldMirrored = false;
     mutable bool m_localTransformChanged = false;
     mutable bool m_worldTransformChanged = false;
+    mutable bool m_normalTransformChanged = false;
+    mutable bool m_localRigid = true; ///< known to be rotation and translation alone
+    mutable bool m_worldRigid = true;
+    bool m_scaled = false; ///< m_scale is not all 1
     uint32_t m_flags = 0;
     std::string m_name;
     Vector3f m_scale{1.0f, 1.0f, 1.0f};
@@ -129,7 +142,8 @@ private:
     Vector3f m_position;
     mutable Matrix4f m_localTransform = Matrix4f::IDENTITY;
     mutable Matrix4f m_worldTransform = Matrix4f::IDENTITY;
-    Matrix4f m_lastWorldTransform = Matrix4f::IDENTITY;
+    mutable Matrix3f m_normalTransform;             ///< unless the world transform is rigid
+    std::unique_ptr<Matrix4f> m_lastWorldTransform; ///< few nodes need one
     std::vector<SharedPtr<SceneNode>> m_children;
     SceneNode* m_parent = nullptr;
 };
@@ -139,6 +153,28 @@ inline const Matrix4f& SceneNode::getWorldTransform() const
     if (m_worldTransformChanged)
         update();
     return m_worldTransform;
+}
+
+inline bool SceneNode::isWorldRigid() const
+{
+    if (m_worldTransformChanged)
+        update();
+    return m_worldRigid;
+}
+
+inline Matrix3f SceneNode::getNormalTransform() const
+{
+    const Matrix4f& world = getWorldTransform();
+    if (m_worldRigid)
+        return upper3x3(world);
+    if (m_normalTransformChanged)
+        updateNormal();
+    return m_normalTransform;
+}
+
+inline const Matrix4f& SceneNode::getLastWorldTransform() const
+{
+    return m_lastWorldTransform ? *m_lastWorldTransform : Matrix4f::IDENTITY;
 }
 
 inline bool SceneNode::getWorldMirrored() const

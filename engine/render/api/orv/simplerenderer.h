@@ -79,14 +79,14 @@ private:
         Solid* solid;
     };
 
-    void publishLights();
-    void publishLight(const Light& light, int index);
-    void publishEye(const Matrix4f& world, const Matrix4f& view);
-    void publishJoints(const Solid& solid);
-    void sortTransparent(const Vector3f& eyeZ);
-    void renderEye(const detail::Eye& eye, const detail::Viewport& viewport);
-    bool prepareMirrorTarget();
-    void renderReflection(const Solid& mirror, const detail::Eye& eye, const detail::Viewport& viewport);
+    ORV_LOCAL void publishLights();
+    ORV_LOCAL void publishLight(const Light& light, int index);
+    ORV_LOCAL void publishEye(const Matrix4f& world, const Matrix4f& view);
+    ORV_LOCAL void sortTransparent(const Vector3f& eyeZ);
+    ORV_LOCAL void renderEye(const detail::Eye& eye, const detail::Viewport& viewport);
+    ORV_LOCAL bool prepareMirrorTarget();
+    ORV_LOCAL void renderReflection(const Solid& mirror, const detail::Eye& eye,
+                                    const detail::Viewport& viewport);
     void draw(Solid* const* solids, size_t count, const Matrix4f& view, const Matrix4f& projection);
 
     SharedPtr<RenderContext> m_context;

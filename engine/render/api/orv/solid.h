@@ -4,6 +4,7 @@
 #include "orv/scenenode.h"
 #include "orv/sharedptr.h"
 
+#include <memory>
 #include <vector>
 
 namespace orv
@@ -46,22 +47,22 @@ public:
     const SharedPtr<Appearance>& getAppearance() const { return m_appearance; }
     void setAppearance(const SharedPtr<Appearance>& appearance);
 
-    int getJointsPerVertex() const { return m_jointsPerVertex; }
+    int getJointsPerVertex() const { return m_skin ? m_skin->jointsPerVertex : 0; }
     /// @param count  0 to 4; larger is clamped with a warning, negative counts as 0.
     void setJointsPerVertex(int count);
 
     /// The transform of the mesh into the space in which the joints were bound; identity at first.
-    const Matrix4f& getBindShapeTransform() const { return m_bindShapeTransform; }
-    void setBindShapeTransform(const Matrix4f& transform) { m_bindShapeTransform = transform; }
+    const Matrix4f& getBindShapeTransform() const { return m_skin ? m_skin->bindShape : Matrix4f::IDENTITY; }
+    void setBindShapeTransform(const Matrix4f& transform) { makeSkin().bindShape = transform; }
 
     /// Adds the next joint (index 0 first, as the vertices' joint numbers count).
     /// @param joint  shared, or borrowed if it is this node or above it; empty leaves the joint unbound.
     /// @param inverseBind  inverse of the joint's world transform in the pose of binding.
     /// One error is logged when the count first exceeds MAX_JOINTS.
     void attachJoint(const SharedPtr<SceneNode>& joint, const Matrix4f& inverseBind);
-    int getJointCount() const { return static_cast<int>(m_joints.size()); }
+    int getJointCount() const { return m_skin ? static_cast<int>(m_skin->joints.size()) : 0; }
     /// @param i  0 to getJointCount() - 1.
-    const JointAttachment& getJoint(int i) const { return m_joints[static_cast<size_t>(i)]; }
+    const JointAttachment& getJoint(int i) const { return m_skin->joints[static_cast<size_t>(i)]; }
 
     /// Mesh space to world space for one joint: its world transform * inverse bind * bind shape. An unbound
     /// joint is in its rest pose: this solid's world transform * bind shape.
@@ -78,11 +79,18 @@ public:
     void draw(RenderContext& context, Appearance& appearance);
 
 private:
+    struct Skin
+    {
+        int jointsPerVertex = 0;
+        Matrix4f bindShape = Matrix4f::IDENTITY;
+        std::vector<JointAttachment> joints;
+    };
+
+    Skin& makeSkin();
+
     SharedPtr<Mesh> m_mesh;
     SharedPtr<Appearance> m_appearance;
-    int m_jointsPerVertex = 0;
-    Matrix4f m_bindShapeTransform = Matrix4f::IDENTITY;
-    std::vector<JointAttachment> m_joints;
+    std::unique_ptr<Skin> m_skin; ///< few solids have one
 };
 
 } // namespace orv

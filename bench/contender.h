@@ -1,0 +1,35 @@
+#pragma once
+
+#include "drawscene.h"
+
+#include "headless/headless.h"
+
+#include <memory>
+
+[[noreturn]] void giveUp(const char* reason);
+
+/// One way of drawing a scene, with a GL context of its own.
+class Contender
+{
+public:
+    Contender();
+    virtual ~Contender() = default;
+
+    /// Moves what moves and draws it all.
+    /// @param frame  counts up from 0.
+    virtual void draw(int frame) = 0;
+
+    headless::Context& surface() { return *m_surface; }
+
+    static constexpr int WIDTH = 320;
+    static constexpr int HEIGHT = 240;
+
+private:
+    std::unique_ptr<headless::Context> m_surface;
+};
+
+/// @param scene  borrowed.
+std::unique_ptr<Contender> makeEngineContender(const DrawScene& scene);
+
+/// The floor: what a programmer would write who knows this scene and nothing else.
+std::unique_ptr<Contender> makeHandContender(const DrawScene& scene);
