@@ -6,7 +6,6 @@
 #include "orv/texturecubecache.h"
 
 #include "facilitytest.h"
-#include "support/damage.h"
 
 #include <cstdio>
 
@@ -22,8 +21,7 @@ protected:
     void flush() override { m_pool->flush(); }
 
     /// Applies a "t.ap" that holds these bytes.
-    template <class Text>
-    static void apply(Appearance& appearance, const Text& text)
+    static void apply(Appearance& appearance, const std::string& text)
     {
         const SharedPtr<MemoryStreamSource> source = makeShared<MemoryStreamSource>();
         source->add("t.ap", makeShared<MemoryStream>(text.data(), int(text.size())));
@@ -199,22 +197,4 @@ TEST_F(AppearanceFileTest, builtInMaterials)
         EXPECT_TRUE(texture && texture == m_pool->getTexture2DCache()->get("orv#white.png")) << name;
         appearance->enable(*context);
     }
-}
-
-// Fault caught: reading past the end of a file that stops anywhere, or that holds anything.
-TEST_F(AppearanceFileTest, damagedFiles)
-{
-    const std::string text =
-        "1.0\n// comment\npolygon_mode BACK CCW 1.0\nproperty \"A b\" Vector4f 1 2 3 4e1\n"
-        "stencil_operations FRONT KEEP KEEP KEEP property T Texture2D none.png colour_mask 1 1 1 1";
-    const support::Bytes file(text.begin(), text.end());
-    const auto use = [](const support::Bytes& damaged, size_t)
-    {
-        Appearance appearance;
-        apply(appearance, damaged);
-        EXPECT_EQ(nullptr, appearance.getShaderProgram().get());
-    };
-    LogCapture log;
-    support::forEachCut(file, use);
-    support::forEachSpoiledByte(file, use, 3);
 }

@@ -11,18 +11,16 @@ namespace support
 
 using Bytes = std::vector<uint8_t>;
 
-/// Calls use with the file cut to every length from 0 to one below its size (every step-th; the first 64 and
-/// the last lengths always).
-void forEachCut(const Bytes& file, const std::function<void(const Bytes& cut, size_t length)>& use,
-                size_t step = 1);
-
-/// Calls use with copies of the file in which one byte each is changed to 0, 0xff, and with a bit turned.
-/// @param step  every step-th offset; the first 64 always.
-void forEachSpoiledByte(const Bytes& file,
-                        const std::function<void(const Bytes& spoiled, size_t offset)>& use, size_t step = 1);
-
-/// Calls use with count copies in which 1 to 8 random bytes are random; the same ones on every run.
-void forEachRandomDamage(const Bytes& file, int count,
-                         const std::function<void(const Bytes& spoiled, int index)>& use, uint32_t seed = 1);
+/// Calls use with damaged copies of a file, the same ones on every run, and what was done to each:
+///
+///     cut     to every length below its size
+///     byte    one byte made 0, 255, or another in one bit
+///     number  four bytes made a count or size that is huge, negative, or just beyond what is there
+///     splice  a block taken out, doubled, moved elsewhere, or repeated fifty times, as deep nesting does
+///     random  up to eight bytes random
+///
+/// @param step  all but cuts are done at every step-th place.
+void forEachDamage(const Bytes& file, size_t step,
+                   const std::function<void(const Bytes& damaged, const std::string& what)>& use);
 
 } // namespace support

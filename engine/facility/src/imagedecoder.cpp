@@ -3,10 +3,26 @@
 #include "jpegcheck.h"
 
 #include <climits>
+#include <cstdlib>
 #include <cstring>
 
 namespace
 {
+
+/// stb_image believes what a file says of its parts' sizes; no block that it asks for may be larger than this.
+thread_local std::size_t t_largestBlock = 0;
+
+/// Zeroed, since a cut file leaves pixels and tables unwritten that are used all the same: what the heap held before
+/// must not be seen in a picture.
+void* takeBlock(std::size_t size)
+{
+    return size <= t_largestBlock ? std::calloc(1, size) : nullptr;
+}
+
+void* resizeBlock(void* block, std::size_t size)
+{
+    return size <= t_largestBlock ? std::realloc(block, size) : nullptr;
+}
 
 /// stb_image copies nothing from or to null for some damaged files, which memcpy does not allow.
 void* copyBytes(void* to, const void* from, std::size_t count)
@@ -30,6 +46,9 @@ void* copyBytes(void* to, const void* from, std::size_t count)
 #define STBI_NO_FAILURE_STRINGS
 #define STBI_MAX_DIMENSIONS 16384
 #define STBI_ASSERT(condition) ((void)0)
+#define STBI_MALLOC(size) takeBlock(size)
+#define STBI_REALLOC(block, size) resizeBlock(block, size)
+#define STBI_FREE(block) std::free(block)
 #define memcpy copyBytes
 #pragma GCC diagnostic push
 #pragma GCC diagnostic ignored "-Wunused-function"
@@ -45,9 +64,41 @@ namespace
 
 const std::size_t MAX_DECODED_BYTES = std::size_t(256) << 20;
 
-/// The densest file of all: a one-bit palette PNG, where deflate reaches 1032 : 1 and each bit becomes four
-/// bytes.
-const std::size_t MAX_BYTES_PER_FILE_BYTE = 1032 * 8 * 4;
+const std::size_t DECODER_BYTES = 1 << 15; ///< what the decoder needs for its own records
+
+/// A format, and how many decoded bytes one byte of such a file can stand for. A file that claims more is damaged or
+/// was made to exhaust memory.
+struct Density
+{
+    bool isJpeg;
+    std::size_t bytesPerByte;
+};
+
+Density getDensity(const unsigned char* file, std::size_t size)
+{
+    const auto startsWith = [=](const char* start)
+    { return size >= std::strlen(start) && std::memcmp(file, start, std::strlen(start)) == 0; };
+    // Deflate reaches 1032 : 1, and a pixel of one bit becomes up to four bytes.
+    if (startsWith("\x89PNG"))
+        return {false, size > 24 && file[24] >= 8 ? 1032u * 4 : 1032u * 8 * 4}; // bits of a sample
+    // 18 blocks of one bit, 16 of brightness and 2 of colour, for 32 x 32 pixels of three bytes.
+    if (startsWith("\xff\xd8"))
+        return {true, 1400};
+    // One bit for a pixel of up to four bytes.
+    if (startsWith("BM"))
+        return {false, 32};
+    // TGA: two bytes for a run of 128 pixels.
+    return {false, 256};
+}
+
+/// A PNG takes up to four times its final size while it is inflated; a JPEG is decoded in blocks of up to 32 x 32
+/// pixels and two bytes a coefficient.
+std::size_t getLargestBlock(int width, int height, int channels, std::size_t fileSize, bool isJpeg)
+{
+    const std::size_t margin = isJpeg ? 31 : 0;
+    const std::size_t pixels = (std::size_t(width) + margin) * (std::size_t(height) + margin);
+    return 4 * pixels * std::size_t(channels) + 2 * fileSize + DECODER_BYTES;
+}
 
 } // namespace
 
@@ -59,12 +110,15 @@ unsigned char* decodeImage(const unsigned char* file, std::size_t size, int& wid
     int w = 0;
     int h = 0;
     int channels = 0;
+    t_largestBlock = DECODER_BYTES;
     if (!stbi_info_from_memory(file, int(size), &w, &h, &channels) || w < 1 || h < 1 || channels < 1 ||
         w > STBI_MAX_DIMENSIONS || h > STBI_MAX_DIMENSIONS)
         return nullptr;
     const std::size_t bytes = std::size_t(w) * std::size_t(h) * std::size_t(channels);
-    if (bytes > MAX_DECODED_BYTES || bytes / MAX_BYTES_PER_FILE_BYTE > size)
+    const Density density = getDensity(file, size);
+    if (bytes > MAX_DECODED_BYTES || bytes / density.bytesPerByte > size)
         return nullptr;
+    t_largestBlock = getLargestBlock(w, h, channels, size, density.isJpeg);
 
     unsigned char* pixels = stbi_load_from_memory(file, int(size), &w, &h, &channels, 0);
     if (!pixels)

@@ -1,0 +1,15 @@
+#pragma once
+
+/// A GL that accepts everything and draws nothing, for loading without a context, many thousand times a second.
+namespace nulldriver
+{
+
+/// Puts it in place of the real one until glcalls::reset(). No context may be current: what is not replaced is
+/// then a call that the real library ignores.
+///
+/// Names are handed out, and glcalls counts them. Shaders compile unless their source holds "#error"; programs
+/// link and have three uniforms, u_float, u_texture and u_cube, and one attribute, a_position. A program binary
+/// is taken if its format is 1 and it starts with "binary".
+void install();
+
+} // namespace nulldriver

@@ -1,0 +1,25 @@
+#pragma once
+
+#include "loaders.h"
+
+#include <map>
+
+namespace hostile
+{
+
+struct Seed
+{
+    std::string loader;
+    std::string name;
+    Bytes file;
+    std::string error; ///< in the first message; empty for a file that loads without one
+    bool loads;
+};
+
+/// Small files of every kind, at most 4 KB each, made by the project's own writers.
+std::vector<Seed> makeSeeds();
+
+/// Files by name that seeds may refer to.
+std::map<std::string, Bytes> makeSoundFiles();
+
+} // namespace hostile

@@ -1,0 +1,248 @@
+#include "loaders.h"
+#include "nulldriver.h"
+#include "seeds.h"
+#include "watch.h"
+
+#include "support/damage.h"
+#include "support/gltest.h"
+#include "support/tempdir.h"
+
+#include "orv/appearance.h"
+#include "orv/filestreamsource.h"
+#include "orv/glo.h"
+#include "orv/scenenode.h"
+#include "orv/shaderprogramcache.h"
+#include "orv/texture2dcache.h"
+#include "orv/texturecubecache.h"
+
+#include <EGL/egl.h>
+
+#include <filesystem>
+
+#include <unistd.h>
+
+using namespace hostile;
+
+namespace
+{
+
+/// Attacks that fail print this many lines at most, or one fault would print thousands.
+constexpr int MOST_FAILURES = 5;
+
+class Attack
+{
+public:
+    explicit Attack(Session& session) : m_session(session) {}
+
+    void operator()(const Loader& loader, const std::string& what, const Bytes& file)
+    {
+        const std::string fault = m_failures < MOST_FAILURES ? m_session.attack(loader, file) : "";
+        m_failures += !fault.empty();
+        EXPECT_EQ("", fault) << loader.name << " " << what << ": " << messages().firstError;
+        if (eglGetCurrentContext())
+        {
+            EXPECT_EQ(GLenum(GL_NO_ERROR), glGetError()) << loader.name << " " << what;
+        }
+    }
+
+private:
+    Session& m_session;
+    int m_failures = 0;
+};
+
+/// The engine asks for the entry points of program binaries once: from then on this process has the real driver's.
+bool g_hasDriverBinaries = false;
+
+/// Without a context, with the null driver, every loader; the heap is watched.
+class HostileTest : public testing::TestWithParam<const char*>
+{
+protected:
+    void SetUp() override
+    {
+        if (g_hasDriverBinaries && loader.name == std::string("binary"))
+            GTEST_SKIP() << "a test with the real driver ran before";
+        nulldriver::install();
+        heap().isReported = true;
+    }
+
+    void TearDown() override { glcalls::reset(); }
+
+    const Loader& loader = *findLoader(GetParam());
+};
+
+std::vector<const char*> getLoaderNames()
+{
+    std::vector<const char*> names;
+    for (const Loader& loader : LOADERS)
+        names.push_back(loader.name);
+    return names;
+}
+
+constexpr size_t LARGEST_SEED = 4096; ///< that is damaged; larger ones are nested deep already
+
+/// So that no seed is damaged in more than about 400 places, but for cuts.
+size_t getStep(const Bytes& file)
+{
+    return 1 + file.size() / 400;
+}
+
+} // namespace
+
+INSTANTIATE_TEST_SUITE_P(, HostileTest, testing::ValuesIn(getLoaderNames()),
+                         [](const auto& test) { return test.param; });
+
+// Faults caught: a sound file refused, or a wrong one that is accepted or refused for another reason.
+TEST_P(HostileTest, seeds)
+{
+    Session session;
+    Attack attack(session);
+    int count = 0;
+    for (const Seed& seed : makeSeeds())
+    {
+        if (seed.loader != loader.name)
+            continue;
+        ++count;
+        attack(loader, seed.name, seed.file);
+        EXPECT_EQ(seed.loads, session.wasLoaded()) << seed.name << ": " << messages().firstError;
+        EXPECT_EQ(seed.error.empty(), messages().errors == 0) << seed.name << ": " << messages().firstError;
+        EXPECT_EQ(0u, messages().firstError.find(seed.error)) << seed.name << ": " << messages().firstError;
+    }
+    EXPECT_LT(0, count);
+}
+
+// Faults caught: whatever a damaged file can do, see Session::attack().
+TEST_P(HostileTest, damage)
+{
+    Session session;
+    Attack attack(session);
+    for (const Seed& seed : makeSeeds())
+    {
+        if (seed.loader == loader.name && seed.file.size() <= LARGEST_SEED)
+            support::forEachDamage(seed.file, getStep(seed.file),
+                                   [&](const Bytes& damaged, const std::string& what)
+                                   { attack(loader, seed.name + " " + what, damaged); });
+    }
+}
+
+// Faults caught: those that fuzzing once found, whose inputs lie among the seeds.
+TEST_P(HostileTest, corpus)
+{
+    Session session;
+    Attack attack(session);
+    int count = 0;
+    const std::filesystem::path folder =
+        std::filesystem::path(ORV_SOURCE_FOLDER "/fuzz/corpus") / loader.name;
+    for (const auto& entry : std::filesystem::directory_iterator(folder))
+    {
+        attack(loader, entry.path().filename(), support::readFile(entry.path()));
+        ++count;
+    }
+    EXPECT_LT(0, count);
+}
+
+// Fault caught: rules that nothing can break, so that all of the above passes whatever happens.
+TEST(HostileRules, areNoticedWhenBroken)
+{
+    nulldriver::install();
+    heap().isReported = true;
+    const auto little = [](const Bytes&) { return size_t(1); };
+    const struct
+    {
+        const char* fault;
+        bool (*load)(Session&, const Bytes&, std::string&);
+    } cases[] = {
+        {"", [](Session&, const Bytes&, std::string&) { return true; }},
+        {"refused without a message", [](Session&, const Bytes&, std::string&) { return false; }},
+        {"a fault",
+         [](Session&, const Bytes&, std::string& fault)
+         {
+             fault = "a fault";
+             return true;
+         }},
+        {"left in GL: ",
+         [](Session&, const Bytes&, std::string&)
+         {
+             GLuint name;
+             glGenTextures(1, &name);
+             return true;
+         }},
+        {"1000 reads of a file of 8 bytes",
+         [](Session& session, const Bytes&, std::string&)
+         {
+             const auto stream = session.openFile();
+             for (int i = 0; i < 1000; ++i)
+                 stream->read(&i, 0);
+             return true;
+         }},
+        {"took 10", [](Session&, const Bytes&, std::string&) { return Bytes(1000000).size() > 0; }},
+    };
+    for (const auto& test : cases)
+    {
+        Session session;
+        const std::string fault = session.attack({"test", test.load, little, 1 << 12, false}, Bytes(8));
+        EXPECT_EQ(0u, fault.find(test.fault)) << fault;
+        EXPECT_EQ(!*test.fault, fault.empty()) << fault;
+    }
+    glcalls::reset();
+}
+
+/// What the driver takes is not counted.
+class HostileDriverTest : public support::GlTest
+{
+protected:
+    void SetUp() override
+    {
+        GlTest::SetUp();
+        heap().isReported = false;
+        g_hasDriverBinaries = true;
+    }
+};
+
+// Faults caught: damage that the engine passes on and a real driver stumbles over, or GL errors left behind.
+TEST_F(HostileDriverTest, sparseDamage)
+{
+    Session session;
+    Attack attack(session);
+    for (const Seed& seed : makeSeeds())
+    {
+        const Loader& loader = *findLoader(seed.loader);
+        attack(loader, seed.name, seed.file);
+        if (seed.file.size() > LARGEST_SEED)
+            continue;
+        int index = 0;
+        support::forEachDamage(seed.file, 1 + seed.file.size() / 10,
+                               [&](const Bytes& damaged, const std::string& what)
+                               {
+                                   if (++index % 97 == 0)
+                                       attack(loader, seed.name + " " + what, damaged);
+                               });
+    }
+}
+
+// Faults caught: a directory or a file of more than two gigabytes that is taken for a file, or read whole.
+TEST_F(HostileDriverTest, whatIsNoFile)
+{
+    const support::TempDir directory;
+    const auto pool = orv::makeShared<orv::AssetCachePool>();
+    pool->registerSource(orv::makeShared<orv::FileStreamSource>(directory.path().c_str()));
+    const auto root = orv::makeShared<orv::SceneNode>("root");
+    const auto loadAll = [&](const std::string& start)
+    {
+        const auto name = [&start](const char* suffix) { return start + suffix; };
+        EXPECT_FALSE(pool->getTexture2DCache()->get(name(".png").c_str()));
+        EXPECT_FALSE(pool->getTextureCubeCache()->get(name(".png").c_str()));
+        EXPECT_FALSE(pool->getShaderProgramCache()->get(name(".sp").c_str()));
+        EXPECT_FALSE(orv::loadAppearance(*pool, name(".ap").c_str())->getShaderProgram());
+        EXPECT_FALSE(orv::loadGloFile(*pool, root, name(".glo").c_str()));
+    };
+    for (const char* suffix : {".png", ".sp", ".ap", ".glo"})
+    {
+        std::filesystem::create_directory(directory.path(std::string("folder") + suffix));
+        const std::string path = directory.write(std::string("huge") + suffix, std::string());
+        ASSERT_EQ(0, truncate(path.c_str(), off_t(3) << 30));
+    }
+    heap().start();
+    loadAll("folder");
+    loadAll("huge");
+    EXPECT_GT(size_t(1) << 20, heap().largest);
+}
