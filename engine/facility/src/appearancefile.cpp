@@ -1,4 +1,4 @@
-#include "textstatement.h"
+#include "orv/detail/textstatement.h"
 
 #include "orv/appearance.h"
 #include "orv/assetcachepool.h"

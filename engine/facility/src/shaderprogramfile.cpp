@@ -1,6 +1,6 @@
 #include "shaderprogramfile.h"
 
-#include "textstatement.h"
+#include "orv/detail/textstatement.h"
 
 #include "orv/log.h"
 #include "orv/tokenreader.h"

@@ -1,4 +1,4 @@
-#include "textstatement.h"
+#include "orv/detail/textstatement.h"
 
 #include "orv/tokenreader.h"
 
@@ -37,7 +37,9 @@ bool readStatement(CharRange& text, Statement& statement)
         // and the next line would be taken for the rest of it.
         if (!isComment(text))
         {
-            statement.lineEnd = std::find(text.start, text.end, '\n');
+            // Kept for all statements of one line, or a long line of many would be searched once for each.
+            if (!statement.lineEnd || statement.lineEnd < text.start)
+                statement.lineEnd = std::find(text.start, text.end, '\n');
             statement.tag = readToken(text);
             if (!isComment(statement.tag)) // may still be one, in quotes
                 return true;

@@ -126,22 +126,6 @@ bool addLightChannels(const Channel& channel, const char* fileName,
     return true;
 }
 
-template <class T>
-bool addMaterialChannels(const std::vector<AnimationKey<T>>& keys, const char* property,
-                         GloMaterial& material, AnimationGroup& group)
-{
-    for (const AnimationKey<T>& key : keys)
-        material.reach(property, key.value);
-    const SharedPtr<AnimatedValue<T>> value = makeShared<AnimationKeySequence<T>>(keys);
-    material.forEachAppearance(
-        [&](const SharedPtr<Appearance>& appearance)
-        {
-            const auto animator = makeShared<AppearancePropertyAnimator<T>>(appearance, property);
-            group.addAnimation(createAnimationChannel<T>(value, animator));
-        });
-    return true;
-}
-
 struct MaterialProperty
 {
     const char* name;
@@ -170,6 +154,22 @@ const MaterialProperty* findMaterialProperty(const std::string& name)
     return nullptr;
 }
 
+template <class T>
+bool addMaterialChannels(const std::vector<AnimationKey<T>>& keys, const MaterialProperty& property,
+                         GloMaterial& material, AnimationGroup& group)
+{
+    for (const AnimationKey<T>& key : keys)
+        material.reach(property.name, key.value);
+    const SharedPtr<AnimatedValue<T>> value = makeShared<AnimationKeySequence<T>>(keys);
+    material.forEachAppearance(
+        [&](const SharedPtr<Appearance>& appearance)
+        {
+            const auto animator = makeShared<AppearancePropertyAnimator<T>>(appearance, property.property);
+            group.addAnimation(createAnimationChannel<T>(value, animator));
+        });
+    return true;
+}
+
 } // namespace
 
 bool GloBuilder::makeAnimation(const AnimationData& data, AnimationGroup& group)
@@ -187,7 +187,7 @@ bool GloBuilder::makeAnimation(const AnimationData& data, AnimationGroup& group)
     for (const AnimationData& inner : data.animations)
     {
         const SharedPtr<AnimationGroup> innerGroup = makeShared<AnimationGroup>();
-        if (!makeAnimation(inner, *innerGroup))
+        if (!innerGroup || !makeAnimation(inner, *innerGroup))
             return false;
         group.addAnimation(innerGroup);
     }
@@ -240,17 +240,14 @@ bool GloBuilder::makeNodeChannel(const Channel& channel, const std::string& targ
 /// The target is the definition: every light made from it gets the channel.
 bool GloBuilder::makeLightChannel(const Channel& channel, const std::string& target, AnimationGroup& group)
 {
-    bool known = false;
-    for (const LightDefinition& definition : m_scene.lights)
-        known = known || definition.name == target;
-    if (!known)
+    if (m_lightDefinitions.find(target) == m_lightDefinitions.end())
         return fail("No light for animation in %s");
+    const auto [begin, end] = m_lights.equal_range(target);
     std::vector<SharedPtr<Light>> lights;
-    for (const auto& light : m_glo->m_lights)
-    {
-        if (light.definition == target)
-            lights.push_back(light.node);
-    }
+    for (auto light = begin; light != end; ++light)
+        lights.push_back(light->second);
+    if (!spend(THING * lights.size()))
+        return false;
     if (channel.property == "colour")
         return addLightChannels<Colour4f, LightColourAnimator>(channel, m_name, lights, group);
     return addLightChannels<float, LightIntensityAnimator>(channel, m_name, lights, group);
@@ -265,8 +262,7 @@ bool GloBuilder::makeMaterialChannel(const Channel& channel, const std::string& 
     if (!property.isColour)
     {
         std::vector<AnimationKey<float>> keys;
-        return readKeys(channel, m_name, keys) &&
-               addMaterialChannels(keys, property.property, found->second, group);
+        return readKeys(channel, m_name, keys) && addMaterialChannels(keys, property, found->second, group);
     }
     std::vector<AnimationKey<Colour4f>> colours;
     if (!readKeys(channel, m_name, colours))
@@ -274,7 +270,7 @@ bool GloBuilder::makeMaterialChannel(const Channel& channel, const std::string& 
     std::vector<AnimationKey<Vector4f>> keys;
     for (const AnimationKey<Colour4f>& key : colours)
         keys.push_back({key.time, Vector4f(key.value.r, key.value.g, key.value.b, key.value.a)});
-    return addMaterialChannels(keys, property.property, found->second, group);
+    return addMaterialChannels(keys, property, found->second, group);
 }
 
 } // namespace orv::detail

@@ -2,15 +2,11 @@
 
 #include "orv/appearance.h"
 #include "orv/assetcachepool.h"
-#include "orv/detail/glomaterialrules.h"
 #include "orv/propertycollector.h"
 #include "orv/shaderprogramcache.h"
 #include "orv/texture2d.h"
 #include "orv/texturecube.h"
 #include "orv/texturepropertyutil.h"
-
-#include <algorithm>
-#include <cstring>
 
 namespace orv::detail
 {
@@ -90,9 +86,11 @@ GloMaterial::GloMaterial(AssetCachePool& pool, FileVersion version, AuthoringToo
     , m_data(data)
 {
     const SharedPtr<Appearance> appearance = makeShared<Appearance>();
+    m_uses.push_back({false, appearance});
+    if (!appearance)
+        return;
     appearance->setName(name.c_str());
     setValues(*appearance);
-    m_uses.push_back({false, appearance});
 }
 
 SharedPtr<Appearance> GloMaterial::use(bool skinned)
@@ -106,6 +104,8 @@ SharedPtr<Appearance> GloMaterial::use(bool skinned)
             return known.appearance;
     }
     const SharedPtr<Appearance> copy = makeShared<Appearance>();
+    if (!copy)
+        return {};
     copy->setName(m_name.c_str());
     PropertyCopier copier(*copy);
     getAppearance()->collectProperties(&copier);
@@ -152,26 +152,6 @@ void GloMaterial::setTexture(Appearance& appearance, const char* property, const
     const SharedPtr<ShaderUniformBase>& uniform = appearance.getPropertyUniform(property);
     if (found && !isBuiltIn(sampler.image) && uniform && uniform->getValue(texture, 0) && texture)
         setParameters(*texture, sampler);
-}
-
-void GloMaterial::reach(const char* property, const Vector4f& value)
-{
-    ColourField* const fields[] = {&m_data.diffuse, &m_data.ambient, &m_data.emissive, &m_data.specular};
-    const char* const names[] = {"M_DIFFUSE_COLOUR", "M_AMBIENT_COLOUR", "M_EMISSIVE_COLOUR",
-                                 "M_SPECULAR_COLOUR"};
-    for (int i = 0; i < 4; ++i)
-    {
-        if (std::strcmp(property, names[i]) == 0 && isBlack(fields[i]->colour))
-            fields[i]->colour = value;
-    }
-}
-
-void GloMaterial::reach(const char* property, float value)
-{
-    if (std::strcmp(property, "M_SPECULAR_LEVEL") == 0)
-        m_data.specularLevel = std::max(m_data.specularLevel, value);
-    else if (std::strcmp(property, "M_OPACITY") == 0)
-        m_data.opacity = std::min(m_data.opacity, value);
 }
 
 void GloMaterial::setState(Appearance& appearance) const

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "orv/detail/glorecords.h"
+#include "orv/detail/glomaterialrules.h"
 #include "orv/sharedptr.h"
 
 #include <functional>
@@ -30,16 +30,19 @@ public:
     /// The appearance for geometry of that kind.
     SharedPtr<Appearance> use(bool skinned);
 
-    /// The one that goes by the material's name.
+    /// The one that goes by the material's name; empty when there was no memory for it.
     const SharedPtr<Appearance>& getAppearance() const { return m_uses.front().appearance; }
 
     /// Calls use with each appearance that there is.
     void forEachAppearance(const std::function<void(const SharedPtr<Appearance>&)>& use) const;
 
-    /// An animated colour or level: shader features and blending follow what it reaches, not only what the file
-    /// starts with.
-    void reach(const char* property, const Vector4f& value);
-    void reach(const char* property, float value);
+    /// A key of an animation: the programs and the blending are chosen for all that the material comes to.
+    /// @param property  of the channel, "diffuse" or "opacity".
+    template <class T>
+    void reach(const std::string& property, const T& value)
+    {
+        glo::reach(m_data, property, value);
+    }
 
     /// Once all uses are known: fetches the programs.
     void choosePrograms();

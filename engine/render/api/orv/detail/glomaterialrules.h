@@ -2,7 +2,9 @@
 
 #include "orv/detail/glorecords.h"
 
+#include <algorithm>
 #include <string>
+#include <string_view>
 
 /// What follows from the values of a scene file's material, for the loader and for what describes files.
 namespace orv::detail::glo
@@ -22,6 +24,30 @@ inline bool isBlack(const Vector4f& colour)
 inline bool isBlended(const StandardMaterial& material)
 {
     return material.opacity < 1.0f;
+}
+
+/// What an animated colour or level comes to: shader features and blending follow all that it reaches, not only
+/// what the file starts with.
+/// @param property  of the channel, "diffuse" or "opacity".
+inline void reach(StandardMaterial& material, std::string_view property, const Vector4f& value)
+{
+    const auto widen = [&](const char* name, Vector4f& colour)
+    {
+        if (property == name && isBlack(colour))
+            colour = value;
+    };
+    widen("diffuse", material.diffuse.colour);
+    widen("ambient", material.ambient.colour);
+    widen("emission", material.emissive.colour);
+    widen("specular", material.specular.colour);
+}
+
+inline void reach(StandardMaterial& material, std::string_view property, float value)
+{
+    if (property == "specular_level")
+        material.specularLevel = std::max(material.specularLevel, value);
+    else if (property == "opacity")
+        material.opacity = std::min(material.opacity, value);
 }
 
 /// The asset name of the program that draws the material, with its defines in their fixed order.

@@ -1,0 +1,41 @@
+#pragma once
+
+#include "orv/detail/gloformat.h"
+
+#include <nlohmann/json.hpp>
+
+#include <string>
+#include <vector>
+
+namespace inspect
+{
+
+struct Field
+{
+    std::string label;
+    uint64_t offset; ///< bytes from the start of the file
+    nlohmann::ordered_json value;
+};
+
+/// One chunk as it stands in the file.
+struct Chunk
+{
+    static constexpr size_t NO_RECORD = size_t(-1);
+
+    uint32_t id = 0;
+    uint64_t offset = 0; ///< of the header
+    uint32_t size = 0;   ///< of the data, as the header says
+    bool known = true;
+    std::string path;
+    size_t record = NO_RECORD; ///< its place in the vector of records that it was read into
+    std::vector<Field> fields;
+    std::vector<Chunk> children;
+
+    /// The first text in it, which is the name of everything that has one; "" if there is none.
+    std::string getName() const;
+
+    /// The child of that kind that was read into that place, or that is the only one; this chunk if there is none.
+    const Chunk& find(uint32_t childId, size_t childRecord = NO_RECORD) const;
+};
+
+} // namespace inspect

@@ -1,0 +1,130 @@
+#pragma once
+
+#include <cstdint>
+#include <string>
+#include <vector>
+
+namespace inspect
+{
+
+enum class Severity
+{
+    ERROR,   ///< the engine refuses the file
+    WARNING, ///< the engine takes something else instead, or what is seen is hardly what was meant
+    NOTE     ///< harmless, but unlikely to be on purpose
+};
+
+/// Everything that can be found. The codes are for scripts and do not change.
+enum class Kind
+{
+    NOT_GLO,
+    HEADER_CUT,
+    CHUNK_SIZE,
+    CHUNK_CUT,
+    UNEXPECTED_CHUNK,
+    MISSING_CHUNK,
+    SKIPPED_CHUNK,
+    FIELD_CUT,
+    BAD_TEXT,
+    TRAILING_BYTES,
+    TOO_DEEP,
+    LIST_SHORT,
+    NO_INFO,
+    LATE_INFO,
+    BAD_VERSION,
+    NEW_VERSION,
+    UNKNOWN_TOOL,
+    SECOND_SCENE,
+    NO_SCENE,
+    UP_AXIS,
+    INDEX_BUFFERS,
+    INDEX_TYPE,
+    ODD_INDICES,
+    KEY_TYPE,
+    KEYS_CUT,
+    ATTRIBUTE_BOUNDS,
+    ATTRIBUTE_TYPE,
+    NO_VERTEX_DATA,
+    INDEX_BOUNDS,
+    BAD_NUMBER,
+    NO_POSITIONS,
+    PRIMITIVE_TYPE,
+    DEGENERATE,
+    WEIGHT_SUM,
+    JOINT_NUMBER,
+    MANY_JOINTS,
+    JOINT_MISSING,
+    JOINTS_PER_VERTEX,
+    UNKNOWN_GEOMETRY,
+    UNKNOWN_SKIN,
+    UNKNOWN_LIGHT,
+    UNKNOWN_CAMERA,
+    LIGHT_TYPE,
+    AMBIENT_LIGHT,
+    CAMERA_TYPE,
+    NO_MATERIAL,
+    NO_TECHNIQUE,
+    BLACK_TEXTURED,
+    SAMPLER_TYPE,
+    IMAGE_MISSING,
+    IMAGE_UNREADABLE,
+    NEVER_REPEATS,
+    DUPLICATE_NAME,
+    UNUSED,
+    TRANSFORMS_DIFFER,
+    CHANNEL_TARGET,
+    CHANNEL_PROPERTY,
+    COEFFICIENTS,
+    KEY_TIME,
+    KEY_ORDER,
+    LOOP_RANGE,
+    TEXT_EMPTY,
+    TEXT_VERSION,
+    TEXT_TAG,
+    TEXT_WORD,
+    TEXT_ARGUMENT,
+    SOURCE_MISSING,
+    PROGRAM_MISSING,
+    UNIFORM_UNBOUND,
+    UNIFORM_ABSENT,
+};
+
+struct KindInfo
+{
+    Kind kind;
+    const char* code;
+    Severity severity;
+    const char* meaning; ///< for the list that --codes prints
+};
+
+const KindInfo& getInfo(Kind kind);
+const std::vector<KindInfo>& getAllInfo();
+const char* getName(Severity severity);
+
+struct Finding
+{
+    Kind kind;
+    uint64_t offset;      ///< bytes from the start of the file
+    std::string path;     ///< chunks from the outermost in: "GLO3/LGEO/GEOM[2]"; "line 7" in a text file
+    std::string sentence; ///< for a person
+};
+
+/// What was found so far, in the order in which it was met.
+class Findings
+{
+public:
+    void add(Kind kind, uint64_t offset, const std::string& path, const std::string& sentence);
+
+    /// The worst that was found; NOTE if nothing was.
+    Severity getWorst() const;
+
+    int count(Severity severity) const;
+
+    /// Sorted by offset; those at the same place in the order in which they were met.
+    std::vector<Finding> getSorted() const;
+
+private:
+    std::vector<Finding> m_findings;
+};
+
+} // namespace inspect

@@ -1,0 +1,554 @@
+#include "glochecks.h"
+
+#include "images.h"
+
+#include "orv/detail/glomaterialrules.h"
+#include "orv/detail/glovertices.h"
+#include "orv/quaternion.h"
+
+#include <cmath>
+#include <cstring>
+#include <map>
+#include <set>
+
+namespace inspect
+{
+
+using namespace orv::detail::glo;
+
+namespace
+{
+
+constexpr size_t MOST_JOINTS = 20; ///< of one skin, in the built-in programs
+
+std::string quote(const std::string& text)
+{
+    return "\"" + text + "\"";
+}
+
+std::string number(uint64_t value)
+{
+    return std::to_string(value);
+}
+
+float readFloat(const uint8_t* bytes)
+{
+    return readComponent(bytes, AttribFormat::FLOAT, false);
+}
+
+class GloChecker
+{
+public:
+    GloChecker(const ScannedFile& file, const std::filesystem::path& folder, Findings& findings)
+        : m_file(file)
+        , m_scene(file.scene)
+        , m_images(folder)
+        , m_findings(findings)
+    {
+    }
+
+    void check()
+    {
+        collectNames();
+        for (const Chunk& list : m_file.top.children)
+            checkList(list);
+        if (!m_scene.scene)
+            report(Kind::NO_SCENE, m_file.top, "there is no scene, so nothing of the file will be seen");
+        else if (m_scene.upAxis > uint32_t(UpAxis::Z))
+            report(Kind::UP_AXIS, m_file.top,
+                   "the up-axis option " + number(m_scene.upAxis) + " is none of 0, 1, 2");
+        for (const Chunk& list : m_file.top.children)
+            reportUnused(list);
+    }
+
+private:
+    template <class Record>
+    static std::set<std::string> namesOf(const std::vector<Record>& records)
+    {
+        std::set<std::string> names;
+        for (const Record& record : records)
+            names.insert(record.name);
+        return names;
+    }
+
+    void collectNames()
+    {
+        if (m_scene.scene)
+            collectNodes(m_scene.scene->top);
+        for (const Material& material : m_scene.materials)
+        {
+            if (!material.techniques.empty())
+                m_materials.insert(material.name);
+        }
+    }
+
+    void collectNodes(const NodeData& node)
+    {
+        m_nodes.insert(node.name);
+        m_scopedNodes.insert(node.scopedName);
+        for (const NodeData& child : node.children)
+            collectNodes(child);
+    }
+
+    void report(Kind kind, const Chunk& chunk, const std::string& sentence)
+    {
+        m_findings.add(kind, chunk.offset, chunk.path, sentence);
+    }
+
+    void checkList(const Chunk& list)
+    {
+        std::map<std::string, int> names;
+        for (const Chunk& item : list.children)
+        {
+            if (item.record == Chunk::NO_RECORD)
+                continue;
+            if (item.id != AnimationData::ID && ++names[item.getName()] == 2)
+                report(Kind::DUPLICATE_NAME, item,
+                       "the name " + quote(item.getName()) + " was taken before; " +
+                           (item.id == Material::ID ? "the last one counts" : "the first one counts"));
+            switch (item.id)
+            {
+            case Geometry::ID: checkGeometry(item, m_scene.geometries[item.record]); break;
+            case Material::ID: checkMaterial(item, m_scene.materials[item.record]); break;
+            case Skin::ID: checkSkin(item, m_scene.skins[item.record]); break;
+            case AnimationData::ID: checkAnimation(item, m_scene.animations[item.record]); break;
+            default: break;
+            }
+        }
+        if (list.id == SceneData::ID && m_scene.scene)
+            checkNode(list.find(NodeData::ID), m_scene.scene->top, true);
+    }
+
+    // --- geometries ---------------------------------------------------------------------------------------
+
+    void checkGeometry(const Chunk& chunk, const Geometry& geometry)
+    {
+        const Chunk& set = chunk.find(VertexSet::ID);
+        const VertexSet& vertices = geometry.vertices;
+        bool inside = true;
+        for (size_t i = 0; i < vertices.attributes.size(); ++i)
+            inside =
+                checkAttribute(set.find(VertexAttribute::ID, i), vertices.attributes[i], vertices) && inside;
+        if (vertices.vertexCount > vertices.data.bytes.size())
+            report(Kind::NO_VERTEX_DATA, set.find(VertexData::ID),
+                   number(vertices.vertexCount) + " vertices have only " +
+                       number(vertices.data.bytes.size()) + " bytes");
+        if (inside && vertices.vertexCount > 0)
+        {
+            for (size_t i = 0; i < vertices.attributes.size(); ++i)
+                checkNumbers(set.find(VertexAttribute::ID, i), vertices.attributes[i], vertices);
+            checkWeights(set, geometry);
+        }
+        if (!findAttribute(geometry, "a_position"))
+            report(Kind::NO_POSITIONS, set, "there is no attribute a_position, so nothing will be seen");
+        for (size_t i = 0; i < geometry.primitiveSets.size(); ++i)
+            checkPrimitiveSet(chunk.find(PrimitiveSet::ID, i), geometry.primitiveSets[i],
+                              vertices.vertexCount);
+    }
+
+    bool checkAttribute(const Chunk& chunk, const VertexAttribute& attribute, const VertexSet& vertices)
+    {
+        if (!isInside(attribute, vertices))
+        {
+            report(Kind::ATTRIBUTE_BOUNDS, chunk,
+                   quote(attribute.name) + " with " + std::to_string(attribute.componentCount) +
+                       " components at offset " + std::to_string(attribute.offset) + ", stride " +
+                       std::to_string(attribute.stride) + ", does not fit " + number(vertices.vertexCount) +
+                       " vertices in " + number(vertices.data.bytes.size()) + " bytes");
+            return false;
+        }
+        if (attribute.type >= type::COUNT)
+            report(Kind::ATTRIBUTE_TYPE, chunk,
+                   "the unknown type " + number(attribute.type) + " of " + quote(attribute.name) +
+                       " is read as floats");
+        else if (getFormat(attribute.type) == AttribFormat::FIXED)
+            report(Kind::ATTRIBUTE_TYPE, chunk,
+                   quote(attribute.name) + " is read as 16.16 fixed point numbers");
+        return true;
+    }
+
+    void checkNumbers(const Chunk& chunk, const VertexAttribute& attribute, const VertexSet& vertices)
+    {
+        uint64_t count = 0;
+        forEachComponent(attribute, vertices, false, 4,
+                         [&count](uint32_t, float value) { count += std::isfinite(value) ? 0 : 1; });
+        if (count > 0)
+            report(Kind::BAD_NUMBER, chunk,
+                   number(count) + " values of " + quote(attribute.name) + " are not finite numbers");
+    }
+
+    void checkWeights(const Chunk& chunk, const Geometry& geometry)
+    {
+        const VertexAttribute* weights = findAttribute(geometry, "a_weights");
+        if (!weights || !findAttribute(geometry, "a_joints"))
+            return;
+        std::vector<float> sums(geometry.vertices.vertexCount);
+        forEachComponent(*weights, geometry.vertices, isNormalised(*weights, m_file.version), 4,
+                         [&sums](uint32_t vertex, float value) { sums[vertex] += value; });
+        uint64_t count = 0;
+        for (const float sum : sums)
+            count += std::fabs(sum - 1.0f) > 0.02f ? 1 : 0;
+        // One joint moves vertices whose weights are left out.
+        if (count > 0 && weights->componentCount == 4)
+            report(Kind::WEIGHT_SUM, chunk,
+                   "the weights of " + number(count) + " vertices do not add up to 1");
+    }
+
+    void checkPrimitiveSet(const Chunk& chunk, const PrimitiveSet& set, uint32_t vertexCount)
+    {
+        if (set.primitive > primitive::TRIANGLE_STRIP)
+            report(Kind::PRIMITIVE_TYPE, chunk,
+                   "the unknown primitive type " + number(set.primitive) + " is drawn as a triangle fan");
+        if (!set.indices)
+            return;
+        const std::vector<uint16_t>& indices = set.indices->indices;
+        uint64_t beyond = 0;
+        for (const uint16_t index : indices)
+            beyond += index >= vertexCount ? 1 : 0;
+        if (beyond > 0)
+            report(Kind::INDEX_BOUNDS, chunk.find(IndexData::ID),
+                   number(beyond) + " indices name vertices beyond the " + number(vertexCount) +
+                       " that there are");
+        uint64_t degenerate = 0;
+        for (size_t i = 0; set.primitive == primitive::TRIANGLES && i + 2 < indices.size(); i += 3)
+            degenerate += indices[i] == indices[i + 1] || indices[i] == indices[i + 2] ||
+                                  indices[i + 1] == indices[i + 2]
+                              ? 1
+                              : 0;
+        if (degenerate > 0)
+            report(Kind::DEGENERATE, chunk.find(IndexData::ID),
+                   number(degenerate) + " triangles use a vertex twice and are never seen");
+    }
+
+    // --- materials ----------------------------------------------------------------------------------------
+
+    void checkMaterial(const Chunk& chunk, const Material& material)
+    {
+        if (material.techniques.empty())
+        {
+            report(Kind::NO_TECHNIQUE, chunk, "the material has no technique, so it counts as missing");
+            return;
+        }
+        for (size_t i = 0; i < material.techniques.size(); ++i)
+            checkTechnique(chunk.find(StandardMaterial::ID, i), material.techniques[i]);
+    }
+
+    void checkTechnique(const Chunk& chunk, const StandardMaterial& data)
+    {
+        struct Slot
+        {
+            const char* what;
+            const SamplerField& field;
+            bool isBlack;
+        };
+        const Slot slots[] = {
+            {"ambient", data.ambient.sampler, isBlack(data.ambient.colour)},
+            {"diffuse", data.diffuse.sampler, isBlack(data.diffuse.colour)},
+            {"specular", data.specular.sampler, isBlack(data.specular.colour) || data.specularLevel <= 0.0f},
+            {"emissive", data.emissive.sampler, isBlack(data.emissive.colour)},
+            {"bump", data.bump, false},
+            {"reflection", data.reflection.sampler, false},
+            {"refraction", data.refraction, false},
+            {"filter-colour", data.filterColour, false},
+            {"displacement", data.displacement, false},
+            {"gloss", data.gloss, false},
+            {"specular-level", data.specularLevelMap, false},
+        };
+        size_t sampler = 0; // the samplers' chunks follow each other in this order but for two
+        for (const Slot& slot : slots)
+        {
+            if (!slot.field)
+                continue;
+            const Chunk& place = findSampler(chunk, *slot.field, sampler++);
+            if (!hasImage(slot.field))
+                continue;
+            if (slot.isBlack)
+                report(Kind::BLACK_TEXTURED, place,
+                       "the " + std::string(slot.what) + " image " + quote(slot.field->image) +
+                           " will not be seen: its colour is black" +
+                           (std::strcmp(slot.what, "specular") == 0 ? " or its level 0" : ""));
+            checkImage(place, *slot.field);
+        }
+    }
+
+    static const Chunk& findSampler(const Chunk& chunk, const Sampler& sampler, size_t index)
+    {
+        size_t count = 0;
+        for (const Chunk& child : chunk.children)
+        {
+            if (child.id == Sampler::ID && count++ == index &&
+                (child.fields.size() < 2 || child.fields[1].value == sampler.image))
+                return child;
+        }
+        return chunk;
+    }
+
+    void checkImage(const Chunk& chunk, const Sampler& sampler)
+    {
+        if (sampler.type > sampler::TEXTURE_CUBE)
+        {
+            report(Kind::SAMPLER_TYPE, chunk,
+                   "the sampler type " + number(sampler.type) +
+                       " is neither 2D nor cube; the \"missing\" picture "
+                       "is shown");
+            return;
+        }
+        const ImageSize size = m_images.measure(sampler.image, sampler.type == sampler::TEXTURE_CUBE);
+        if (size.state == ImageState::MISSING)
+            report(Kind::IMAGE_MISSING, chunk, "the picture " + quote(sampler.image) + " is not found");
+        else if (size.state == ImageState::UNREADABLE)
+            report(Kind::IMAGE_UNREADABLE, chunk,
+                   "the picture " + quote(sampler.image) + " cannot be decoded");
+        else if (sampler.type == sampler::TEXTURE_2D && !size.isBuiltIn && !size.isPowerOfTwo() &&
+                 (sampler.wrapHorizontal != 1 || sampler.wrapVertical != 1))
+            report(Kind::NEVER_REPEATS, chunk,
+                   "the picture " + quote(sampler.image) + " of " + number(size.width) + " x " +
+                       number(size.height) + " cannot repeat or be mipmapped");
+    }
+
+    // --- skins --------------------------------------------------------------------------------------------
+
+    void checkSkin(const Chunk& chunk, const Skin& skin)
+    {
+        if (skin.attachments.size() > MOST_JOINTS)
+            report(Kind::MANY_JOINTS, chunk,
+                   number(skin.attachments.size()) + " joints; the built-in programs take " +
+                       number(MOST_JOINTS));
+        if (skin.jointsPerVertex < 1 || skin.jointsPerVertex > 4)
+            report(Kind::JOINTS_PER_VERTEX, chunk,
+                   std::to_string(skin.jointsPerVertex) + " joints for each vertex; 1 to 4 make sense");
+        for (size_t i = 0; i < skin.attachments.size(); ++i)
+        {
+            const std::string& joint = skin.attachments[i].joint;
+            if (m_scene.scene && !m_scopedNodes.count(joint) && !m_nodes.count(joint))
+                report(Kind::JOINT_MISSING, chunk.find(Attachment::ID, i),
+                       "the joint " + quote(joint) + " is no node of the scene; its vertices stay at rest");
+        }
+        for (const Geometry& geometry : m_scene.geometries)
+        {
+            if (geometry.name != skin.geometry || !areReadable(geometry))
+                continue;
+            const int count = countJoints(geometry);
+            if (size_t(count) > skin.attachments.size())
+                report(Kind::JOINT_NUMBER, chunk,
+                       "geometry " + quote(geometry.name) + " names joint " + std::to_string(count - 1) +
+                           ", the skin has " + number(skin.attachments.size()));
+            break;
+        }
+    }
+
+    static bool areReadable(const Geometry& geometry)
+    {
+        for (const VertexAttribute& attribute : geometry.vertices.attributes)
+        {
+            if (!isInside(attribute, geometry.vertices))
+                return false;
+        }
+        return geometry.vertices.vertexCount <= geometry.vertices.data.bytes.size();
+    }
+
+    // --- nodes --------------------------------------------------------------------------------------------
+
+    void checkNode(const Chunk& chunk, const NodeData& node, bool top)
+    {
+        checkTransform(chunk, node, top);
+        if (node.geometry)
+            checkReference(chunk.find(GeometryReference::ID), node.geometry->geometry,
+                           node.geometry->materials);
+        if (node.skin)
+            checkSkinReference(chunk.find(SkinReference::ID), *node.skin);
+        if (node.light)
+            checkLightReference(chunk.find(LightReference::ID), *node.light);
+        if (node.camera)
+            checkCameraReference(chunk.find(CameraReference::ID), *node.camera);
+        for (size_t i = 0; i < node.children.size(); ++i)
+            checkNode(chunk.find(NodeData::ID, i), node.children[i], false);
+    }
+
+    /// The matrix is what counts; the engine goes by the components as soon as one of them is animated.
+    void checkTransform(const Chunk& chunk, const NodeData& node, bool top)
+    {
+        if (!hasNodeTransform(m_file.version) || (top && m_scene.upAxis != uint32_t(UpAxis::Y)))
+            return;
+        const orv::Quaternionf rotation =
+            orv::quaternionFromAxisAngle(orv::Vector3f(node.rotation.x, node.rotation.y, node.rotation.z),
+                                         orv::Anglef::fromRadians(node.rotation.w));
+        const orv::Matrix4f composed = orv::translationMatrix(node.translation) * orv::toMatrix4(rotation) *
+                                       orv::scaleMatrix(node.scale);
+        float largest = 0.0f;
+        float difference = 0.0f;
+        for (int i = 0; i < 16; ++i)
+        {
+            largest = std::max(largest, std::fabs(node.transform.data()[i]));
+            difference = std::max(difference, std::fabs(node.transform.data()[i] - composed.data()[i]));
+        }
+        if (!(difference <= 1e-3f * std::max(1.0f, largest)))
+            report(Kind::TRANSFORMS_DIFFER, chunk,
+                   "the matrix of " + quote(node.name) +
+                       " is not what its translation, rotation and scale come to");
+    }
+
+    void checkReference(const Chunk& chunk, const std::string& name,
+                        const std::vector<std::string>& materials)
+    {
+        m_used.insert({Geometry::ID, name});
+        for (const std::string& material : materials)
+            m_used.insert({Material::ID, material});
+        const auto found = std::find_if(m_scene.geometries.begin(), m_scene.geometries.end(),
+                                        [&name](const Geometry& geometry) { return geometry.name == name; });
+        if (found == m_scene.geometries.end())
+        {
+            report(Kind::UNKNOWN_GEOMETRY, chunk, "there is no geometry " + quote(name));
+            return;
+        }
+        for (size_t i = 0; i < found->primitiveSets.size(); ++i)
+        {
+            if (i >= materials.size() || !m_materials.count(materials[i]))
+                report(Kind::NO_MATERIAL, chunk,
+                       "primitive set " + number(i) + " of " + quote(name) +
+                           " is drawn with the default material: " +
+                           (i >= materials.size() ? "none is named" : "there is no " + quote(materials[i])));
+        }
+    }
+
+    void checkSkinReference(const Chunk& chunk, const SkinReference& reference)
+    {
+        m_used.insert({Skin::ID, reference.skin});
+        const auto found = std::find_if(m_scene.skins.begin(), m_scene.skins.end(),
+                                        [&](const Skin& skin) { return skin.name == reference.skin; });
+        if (found == m_scene.skins.end())
+            report(Kind::UNKNOWN_SKIN, chunk, "there is no skin " + quote(reference.skin));
+        else
+            checkReference(chunk, found->geometry, reference.materials);
+    }
+
+    void checkLightReference(const Chunk& chunk, const LightReference& reference)
+    {
+        m_used.insert({LightDefinition::ID, reference.light});
+        for (const LightDefinition& light : m_scene.lights)
+        {
+            if (light.name != reference.light)
+                continue;
+            if (light.type > light::SPOT)
+                report(Kind::LIGHT_TYPE, chunk,
+                       "light " + quote(light.name) + " has the unknown type " + number(light.type));
+            else if (light.type == light::AMBIENT)
+                report(Kind::AMBIENT_LIGHT, chunk,
+                       "the ambient light " + quote(light.name) + " becomes a point light");
+            return;
+        }
+        report(Kind::UNKNOWN_LIGHT, chunk, "there is no light " + quote(reference.light));
+    }
+
+    void checkCameraReference(const Chunk& chunk, const CameraReference& reference)
+    {
+        m_used.insert({CameraDefinition::ID, reference.camera});
+        for (const CameraDefinition& camera : m_scene.cameras)
+        {
+            if (camera.name != reference.camera)
+                continue;
+            if (camera.projection > projection::PERSPECTIVE)
+                report(Kind::CAMERA_TYPE, chunk,
+                       "camera " + quote(camera.name) + " has the unknown projection " +
+                           number(camera.projection));
+            return;
+        }
+        report(Kind::UNKNOWN_CAMERA, chunk, "there is no camera " + quote(reference.camera));
+    }
+
+    // --- animations ---------------------------------------------------------------------------------------
+
+    void checkAnimation(const Chunk& chunk, const AnimationData& animation)
+    {
+        for (const LoopRange& range : animation.loopRanges)
+        {
+            if (!(range.begin <= range.end))
+                report(Kind::LOOP_RANGE, chunk,
+                       "the loop range from " + std::to_string(range.begin) + " to " +
+                           std::to_string(range.end) + " ends before it begins");
+        }
+        for (size_t i = 0; i < animation.channels.size(); ++i)
+            checkChannel(chunk.find(Channel::ID, i), animation.channels[i]);
+        for (size_t i = 0; i < animation.animations.size(); ++i)
+            checkAnimation(chunk.find(AnimationData::ID, i), animation.animations[i]);
+    }
+
+    void checkChannel(const Chunk& chunk, const Channel& channel)
+    {
+        const ChannelKind* kind = findChannelKind(channel.targetType, channel.property);
+        if (!kind || channel.type > type::FLOAT)
+        {
+            report(Kind::CHANNEL_PROPERTY, chunk,
+                   kind ? "the channel is ignored: keys of type " + number(channel.type) + " have no meaning"
+                        : "the channel is ignored: a " + quote(channel.targetType) + " has no animated " +
+                              quote(channel.property));
+            return;
+        }
+        if (channel.coefficientCount < kind->fewestCoefficients ||
+            channel.coefficientCount > kind->mostCoefficients)
+        {
+            report(Kind::COEFFICIENTS, chunk,
+                   quote(channel.property) + " has " + number(channel.coefficientCount) +
+                       " coefficients in a key; wanted are " + number(kind->mostCoefficients));
+            return;
+        }
+        const std::string target(getTargetName(channel.targetName));
+        const bool known = channel.targetType == "node"    ? m_nodes.count(target) > 0
+                           : channel.targetType == "light" ? namesOf(m_scene.lights).count(target) > 0
+                                                           : m_materials.count(target) > 0;
+        if (!known)
+            report(Kind::CHANNEL_TARGET, chunk, "there is no " + channel.targetType + " " + quote(target));
+        checkKeys(chunk, channel);
+    }
+
+    void checkKeys(const Chunk& chunk, const Channel& channel)
+    {
+        const size_t keySize = 4 + size_t(channel.coefficientCount) * type::SIZES[channel.type];
+        bool ordered = true;
+        float last = -HUGE_VALF;
+        for (size_t at = 0; at + keySize <= channel.keys.size(); at += keySize)
+        {
+            const float time = readFloat(&channel.keys[at]);
+            if (std::isnan(time))
+            {
+                report(Kind::KEY_TIME, chunk, "the time of key " + number(at / keySize) + " is not a number");
+                return;
+            }
+            ordered = ordered && time >= last;
+            last = time;
+        }
+        if (!ordered)
+            report(Kind::KEY_ORDER, chunk,
+                   "the keys are not in the order of their times; the engine sorts them");
+    }
+
+    // ------------------------------------------------------------------------------------------------------
+
+    void reportUnused(const Chunk& list)
+    {
+        for (const Chunk& item : list.children)
+        {
+            if (item.record != Chunk::NO_RECORD && item.id != AnimationData::ID &&
+                !m_used.count({item.id, item.getName()}))
+                report(Kind::UNUSED, item, "nothing in the scene refers to " + quote(item.getName()));
+        }
+    }
+
+    const ScannedFile& m_file;
+    const GloScene& m_scene;
+    Images m_images;
+    Findings& m_findings;
+    std::set<std::string> m_nodes;
+    std::set<std::string> m_scopedNodes;
+    std::set<std::string> m_materials; ///< those with a technique
+    std::set<std::pair<uint32_t, std::string>> m_used;
+};
+
+} // namespace
+
+void checkGlo(const ScannedFile& file, const std::filesystem::path& folder, Findings& findings)
+{
+    GloChecker(file, folder, findings).check();
+}
+
+} // namespace inspect

@@ -1,0 +1,27 @@
+#pragma once
+
+#include "chunk.h"
+#include "findings.h"
+
+#include "orv/detail/glorecords.h"
+
+#include <cstdint>
+#include <vector>
+
+namespace inspect
+{
+
+/// A scene file, read as far as it can be.
+struct ScannedFile
+{
+    Chunk top;
+    orv::detail::glo::GloScene scene;
+    orv::detail::glo::FileVersion version; ///< what the engine takes it for
+    orv::detail::glo::AuthoringTool tool = orv::detail::glo::AuthoringTool::MAX;
+};
+
+/// Reads chunk by chunk by the engine's own field lists. Where the engine stops at the first fault, this reports
+/// it and goes on behind the damaged chunk.
+ScannedFile scanGlo(const std::vector<uint8_t>& bytes, Findings& findings);
+
+} // namespace inspect

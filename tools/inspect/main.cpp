@@ -1,0 +1,163 @@
+// orv-inspect: says what is in a scene file, a material or a shader program file, what the engine will make of it,
+// and what is wrong with it.
+
+#include "glochecks.h"
+#include "print.h"
+
+#include <CLI/CLI.hpp>
+
+#include <cstdio>
+#include <filesystem>
+#include <fstream>
+#include <iterator>
+
+namespace
+{
+
+namespace fs = std::filesystem;
+
+constexpr int WITH_ERRORS = 1; // exit codes
+constexpr int MISUSED = 2;
+constexpr int WITH_WARNINGS = 3;
+
+constexpr uintmax_t LARGEST_FILE = 0x7fffffff; ///< as the engine's streams
+
+struct Options
+{
+    std::vector<std::string> files;
+    bool check = false;
+    bool json = false;
+    bool tree = false;
+};
+
+int printCodes()
+{
+    for (const inspect::KindInfo& info : inspect::getAllInfo())
+        std::printf("%-18s %-8s %s\n", info.code, inspect::getName(info.severity), info.meaning);
+    return 0;
+}
+
+bool fail(const std::string& path, const std::string& reason)
+{
+    std::fprintf(stderr, "orv-inspect: %s: %s\n", path.c_str(), reason.c_str());
+    return false;
+}
+
+bool readFile(const std::string& path, std::vector<uint8_t>& bytes)
+{
+    std::error_code error;
+    const uintmax_t size = fs::file_size(path, error);
+    if (error)
+        return fail(path, error.message());
+    if (size > LARGEST_FILE)
+        return fail(path, "larger than two gigabytes");
+    std::ifstream file(path, std::ios::binary);
+    bytes.assign(std::istreambuf_iterator<char>(file), {});
+    return file.bad() || bytes.size() != size ? fail(path, "cannot be read") : true;
+}
+
+bool inspectFile(const std::string& path, inspect::Report& report)
+{
+    std::vector<uint8_t> bytes;
+    if (!readFile(path, bytes))
+        return false;
+    const fs::path folder = fs::path(path).parent_path();
+    const std::string extension = fs::path(path).extension().string();
+    const std::string text(bytes.begin(), bytes.end());
+    report.path = path;
+    report.size = bytes.size();
+    report.kind = extension == ".ap" ? "appearance" : extension == ".sp" ? "program" : "scene";
+    if (report.kind == "appearance")
+        report.text = inspect::checkAppearanceFile(text, folder, report.findings);
+    else if (report.kind == "program")
+        report.text = inspect::checkProgramFile(text, folder, report.findings);
+    else
+    {
+        report.scene = inspect::scanGlo(bytes, report.findings);
+        if (report.scene.top.id != 0)
+            inspect::checkGlo(report.scene, folder, report.findings);
+        report.forecast = inspect::forecast(report.scene, folder);
+    }
+    return true;
+}
+
+void print(const inspect::Report& report, const Options& options)
+{
+    if (options.check)
+    {
+        inspect::printFindings(report);
+        return;
+    }
+    inspect::printTotals(report);
+    if (options.tree)
+        inspect::printTree(report);
+    inspect::printFindings(report);
+}
+
+int run(const Options& options)
+{
+    inspect::Severity worst = inspect::Severity::NOTE;
+    bool unread = false;
+    nlohmann::ordered_json json = nlohmann::ordered_json::array();
+    for (const std::string& path : options.files)
+    {
+        inspect::Report report;
+        if (!inspectFile(path, report))
+        {
+            unread = true;
+            continue;
+        }
+        worst = std::min(worst, report.findings.getWorst());
+        if (options.json)
+            json.push_back(inspect::toJson(report));
+        else
+            print(report, options);
+    }
+    if (options.json)
+        std::printf("%s\n",
+                    json.dump(1, ' ', true, nlohmann::ordered_json::error_handler_t::replace).c_str());
+    return unread || worst == inspect::Severity::ERROR ? WITH_ERRORS
+           : worst == inspect::Severity::WARNING       ? WITH_WARNINGS
+                                                       : 0;
+}
+
+} // namespace
+
+int main(int argc, char** argv)
+{
+    CLI::App app("Says what is in scene files, materials (.ap) and shader programs (.sp), and what is wrong "
+                 "with them.",
+                 "orv-inspect");
+    app.footer(
+        "Exit code: 0 nothing worse than notes, 1 errors (the engine refuses the file), 2 wrong usage,\n"
+        "3 warnings.\n\n"
+        "Examples:\n"
+        "  orv-inspect duck.glo                  what it holds, what it costs, what is wrong\n"
+        "  orv-inspect --tree duck.glo | less    every chunk and field\n"
+        "  orv-inspect --check *.glo *.ap        only what is wrong, one line each\n"
+        "  orv-inspect --json duck.glo           everything, for a script (docs/inspect.md)\n"
+        "  orv-inspect --codes                   all that can be wrong");
+    Options options;
+    bool codes = false;
+    app.add_option("FILE", options.files, "what to look at; pictures and sources are looked for beside it");
+    app.add_flag("--tree", options.tree, "print every chunk with its fields, every statement of a text file");
+    app.add_flag("--check", options.check, "print nothing but what is wrong");
+    app.add_flag("--json", options.json, "print one JSON array with an object for each file");
+    app.add_flag("--codes", codes, "list every code with its meaning");
+    try
+    {
+        app.parse(argc, argv);
+    }
+    catch (const CLI::ParseError& error)
+    {
+        return app.exit(error) == 0 ? 0 : MISUSED;
+    }
+    if (codes)
+        return printCodes();
+    if (options.files.empty())
+    {
+        std::fprintf(stderr, "orv-inspect: no file is named; --help shows how\n");
+        return MISUSED;
+    }
+    return run(options);
+}
