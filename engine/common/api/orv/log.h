@@ -5,7 +5,8 @@
 #include <cstddef>
 
 #if defined(__GNUC__)
-#define ORV_PRINTF(formatIndex, firstArgument) __attribute__((format(printf, formatIndex, firstArgument)))
+#define ORV_PRINTF(formatIndex, firstArgument)                                                               \
+    __attribute__((cold, format(printf, formatIndex, firstArgument)))
 #else
 #define ORV_PRINTF(formatIndex, firstArgument)
 #endif
@@ -48,7 +49,7 @@ struct SourcePath
 {
     char text[N] = {};
 
-    constexpr explicit SourcePath(const char (&path)[N])
+    consteval SourcePath(const char (&path)[N])
     {
         std::size_t end = N - 1;
         while (end > 0 && path[end] != '.' && path[end] != '/')
@@ -60,14 +61,14 @@ struct SourcePath
     }
 };
 
+/// The text once for all records of a source.
+template <SourcePath PATH>
+inline constexpr const char* sourcePathText = PATH.text;
+
 } // namespace orv::detail
 
 #define ORV_LOG(entryPoint, ...)                                                                             \
-    do                                                                                                       \
-    {                                                                                                        \
-        static constexpr ::orv::detail::SourcePath orvSourcePath(__FILE__);                                  \
-        entryPoint(orvSourcePath.text, __func__, __LINE__, __VA_ARGS__);                                     \
-    } while (false)
+    entryPoint(::orv::detail::sourcePathText<__FILE__>, __func__, __LINE__, __VA_ARGS__)
 
 #define ORV_LOG_ERROR(...) ORV_LOG(pssLogError, __VA_ARGS__)
 #define ORV_LOG_WARN(...) ORV_LOG(pssLogWarn, __VA_ARGS__)

@@ -27,6 +27,7 @@ public:
 
     /// The printable class name used in log records; see ORV_CLASS_NAME.
     virtual const char* getClassName() const = 0;
+    static const char* className() { return "Shared"; }
 
     int32_t sharedGetCount() const { return m_count.load(std::memory_order_relaxed); }
 
@@ -36,9 +37,9 @@ private:
 
     void sharedAcquire() const { m_count.fetch_add(1, std::memory_order_relaxed); }
 
-    /// @return the count after the decrement, by the decrement itself: of two threads that drop the last two
-    /// references at once, exactly one sees 0.
-    int32_t sharedRelease() const { return m_count.fetch_sub(1, std::memory_order_acq_rel) - 1; }
+    // The steps of SharedPtr that are too long to stand wherever a pointer is copied and dropped.
+    void sharedAcquireCopied() const; ///< logs an assertion if there is no share to copy
+    void sharedRelease() const;       ///< gives a share back; deletes the object with the last one
 
     mutable std::atomic<int32_t> m_count = 0;
 };

@@ -10,6 +10,16 @@
 namespace orv
 {
 
+namespace detail
+{
+
+// What SharedPtr does when something is wrong, once instead of wherever a pointer is followed.
+[[gnu::cold]] ORV_API void logNullArrow(const char* className);
+[[gnu::cold]] ORV_API void logNullDereference(const char* className);
+[[gnu::cold]] ORV_API void logNoMemory(const char* className);
+
+} // namespace detail
+
 /// Smart pointer to a Shared object: one raw pointer, which may be null. Empty stands for "not found" or
 /// "failed" throughout the engine.
 ///
@@ -69,39 +79,28 @@ public:
     T* operator->() const
     {
         if (!m_ptr) [[unlikely]]
-        {
-            ORV_LOG_ERROR("Error: pointer operator on null. class: %s", T::className());
-            ORV_ASSERT(m_ptr);
-        }
+            detail::logNullArrow(T::className());
         return m_ptr;
     }
 
     T& operator*() const
     {
         if (!m_ptr) [[unlikely]]
-        {
-            ORV_LOG_ERROR("Error: null shared pointer dereference. class: %s", T::className());
-            ORV_ASSERT(m_ptr);
-        }
+            detail::logNullDereference(T::className());
         return *m_ptr;
     }
 
 private:
     void acquireCopied()
     {
-        if (!m_ptr)
-            return;
-        ORV_ASSERT(m_ptr->sharedGetCount() > 0);
-        m_ptr->sharedAcquire();
+        if (m_ptr)
+            m_ptr->sharedAcquireCopied();
     }
 
     void release()
     {
-        if (!m_ptr)
-            return;
-        ORV_ASSERT(m_ptr->sharedGetCount() > 0);
-        if (m_ptr->sharedRelease() <= 0)
-            delete m_ptr;
+        if (m_ptr)
+            m_ptr->sharedRelease();
     }
 
     T* m_ptr = nullptr;
@@ -125,11 +124,14 @@ bool operator==(const SharedPtr<T>& a, std::nullptr_t)
     return !a.get();
 }
 
-/// Makes an object and the first pointer to it; empty when there is no memory for it.
+/// Makes an object and the first pointer to it; empty when there is no memory for it (logged).
 template <class T, class... Arguments>
 SharedPtr<T> makeShared(Arguments&&... arguments)
 {
-    return SharedPtr<T>(new (std::nothrow) T(std::forward<Arguments>(arguments)...));
+    T* made = new (std::nothrow) T(std::forward<Arguments>(arguments)...);
+    if (!made) [[unlikely]]
+        detail::logNoMemory(T::className());
+    return SharedPtr<T>(made);
 }
 
 } // namespace orv

@@ -1,0 +1,15 @@
+# The target docs: pages of the headers and of docs/, by doxygen where it is installed.
+find_package(Doxygen QUIET)
+if(NOT DOXYGEN_FOUND)
+    return()
+endif()
+set(docInputs "")
+set(docStrip "")
+foreach(room common maths pss facility render)
+    string(APPEND docInputs " ${PROJECT_SOURCE_DIR}/engine/${room}/api/orv")
+    string(APPEND docStrip " ${PROJECT_SOURCE_DIR}/engine/${room}/api")
+endforeach()
+string(APPEND docInputs " ${PROJECT_SOURCE_DIR}/docs ${PROJECT_SOURCE_DIR}/SECURITY.md")
+configure_file(docs/Doxyfile.in ${CMAKE_CURRENT_BINARY_DIR}/Doxyfile @ONLY)
+add_custom_target(docs COMMAND Doxygen::doxygen ${CMAKE_CURRENT_BINARY_DIR}/Doxyfile
+    COMMENT "Making ${CMAKE_BINARY_DIR}/docs/html/index.html")

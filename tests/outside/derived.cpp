@@ -1,0 +1,33 @@
+// Fault caught: classes of a program's own that link only when they are compiled without type information.
+#include <orv/orv.h>
+
+namespace
+{
+
+class NoSource : public orv::StreamSource
+{
+public:
+    bool exists(const char*) const override { return false; }
+    orv::SharedPtr<orv::Stream> open(const char*, bool) override { return {}; }
+    const char* getName() const override { return "none"; }
+};
+
+class Counter : public orv::SceneNodeVisitor
+{
+public:
+    void visit(orv::SceneNode*) override { ++count; }
+
+    using SceneNodeVisitor::visit;
+    int count = 0;
+};
+
+} // namespace
+
+int countNodes(orv::AssetCachePool& pool, orv::SceneNode& scene, orv::Appearance& appearance)
+{
+    pool.registerSource(orv::makeShared<NoSource>());
+    appearance.setProperty("M_OPACITY", 0.5f);
+    Counter counter;
+    orv::visitScene(counter, scene);
+    return counter.count;
+}
