@@ -38,6 +38,8 @@ struct State
     std::string extensions;
     std::map<std::string, Address> procAddresses;
     std::map<std::pair<EGLContext, Kind>, std::set<GLuint>> liveNames;
+    uint64_t callsToRefusal = 0; ///< the last of them is refused; 0 for none
+    std::string refusedCall;
 };
 
 State& state()
@@ -320,7 +322,8 @@ void updateWay(Entry& entry)
 {
     const bool drops = state().dropsAll || entry.isDropped;
     entry.target = drops ? entry.nothing : entry.untypedReal;
-    entry.isSlow = state().isRecording || (!drops && (entry.isReplaced || findMaker(entry)));
+    entry.isSlow = state().isRecording || state().callsToRefusal > 0 ||
+                   (!drops && (entry.isReplaced || findMaker(entry)));
 }
 
 void updateAllWays()
@@ -332,11 +335,47 @@ void updateAllWays()
 // The first call of anything prepares every entry: makers of names are slow from the start.
 [[maybe_unused]] const bool g_prepared = (updateAllWays(), true);
 
+// --- Refusing ----------------------------------------------------------------------------------------------
+
+/// What a refused call leaves in its outputs: nothing, but for names.
+template <class... Arguments>
+void refuseOutputs(Arguments...)
+{
+}
+
+void refuseOutputs(GLsizei count, GLuint* names)
+{
+    std::fill_n(names, count, 0u);
+}
+
+bool isToBeRefused(const Entry& entry)
+{
+    const Entry* const exempt[] = {&entryOf_glGetError(), &entryOf_glBindBuffer(),
+                                   &entryOf_glVertexAttribPointer(), &entryOf_glDisableVertexAttribArray()};
+    const bool counts = state().callsToRefusal > 0 &&
+                        std::find(std::begin(exempt), std::end(exempt), &entry) == std::end(exempt);
+    return counts && --state().callsToRefusal == 0;
+}
+
+template <class Result, class... Arguments>
+Result refuse(const Entry& entry, Arguments... arguments)
+{
+    state().refusedCall = entry.name;
+    queueError(GL_OUT_OF_MEMORY);
+    refuseOutputs(arguments...);
+    if constexpr (std::is_same_v<Result, GLint>) // a location
+        return -1;
+    else
+        return Result();
+}
+
 template <class Result, class... Arguments>
 Result callSlowly(TypedEntry<Result(Arguments...)>& entry, Arguments... arguments)
 {
     if (state().isRecording)
         record(entry, arguments...);
+    if (isToBeRefused(entry))
+        return refuse<Result>(entry, arguments...);
     const bool drops = entry.target == entry.nothing;
     const auto run = [&]
     {
@@ -524,6 +563,18 @@ void failLinking(const std::string& log)
             [log](GLuint, GLsizei size, GLsizei* length, GLchar* text) { giveLog(log, size, length, text); });
 }
 
+void refuseCall(uint64_t number)
+{
+    state().callsToRefusal = number;
+    state().refusedCall.clear();
+    updateAllWays();
+}
+
+const std::string& refusedCall()
+{
+    return state().refusedCall;
+}
+
 void setFramebufferStatus(GLenum status)
 {
     replace(glCheckFramebufferStatus, [status](GLenum) { return status; });
@@ -598,6 +649,15 @@ std::string describeLiveNames()
     }
 GLCALLS_TABLE(GLCALLS_DEFINE)
 #undef GLCALLS_DEFINE
+
+/// GL objects go with their context, and a later context may get its address.
+extern "C" __attribute__((visibility("default"))) EGLBoolean eglDestroyContext(EGLDisplay dpy, EGLContext ctx)
+{
+    static const auto real =
+        reinterpret_cast<decltype(&eglDestroyContext)>(glcalls::resolve("libEGL.so.1", "eglDestroyContext"));
+    std::erase_if(glcalls::state().liveNames, [ctx](const auto& entry) { return entry.first.first == ctx; });
+    return real(dpy, ctx);
+}
 
 extern "C" __attribute__((visibility("default"))) __eglMustCastToProperFunctionPointerType
 eglGetProcAddress(const char* name)

@@ -162,6 +162,15 @@ void refuseNames(EntryPoint<void, GLsizei, GLuint*> entry);
 void failCompiling(const std::string& log);
 void failLinking(const std::string& log);
 
+/// The call of that number from here on (1 is the next) fails as if memory had run out: it does nothing, yields
+/// no name and no answer, and glGetError then says GL_OUT_OF_MEMORY. 0 ends it. Calls that have no way to fail in
+/// a driver do not count: glGetError, and those without which the next draw would read vertices from nowhere
+/// (glBindBuffer, glVertexAttribPointer, glDisableVertexAttribArray).
+void refuseCall(uint64_t number);
+
+/// The entry point that refuseCall() has hit; "" if there were not so many calls.
+const std::string& refusedCall();
+
 /// glCheckFramebufferStatus answers status.
 void setFramebufferStatus(GLenum status);
 
@@ -187,7 +196,7 @@ enum class Kind
 };
 
 /// The names alive in the current context, ascending. A shader or program counts as gone once its deletion
-/// was asked for.
+/// was asked for. What a destroyed context held is gone.
 std::vector<GLuint> liveNames(Kind kind);
 
 /// "" if none is alive, else the live names by kind: "buffers 1 2, textures 7".

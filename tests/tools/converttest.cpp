@@ -62,7 +62,7 @@ protected:
         m_outcome = convert(arguments);
         EXPECT_EQ(0, m_outcome.exitCode) << m_outcome.output;
         LogCapture log;
-        const Glo::Ptr loaded = loadGloFile(*m_pool, m_root, name);
+        const Glo::Ptr loaded = loadGloFile(*m_pool, m_root, name, true);
         EXPECT_TRUE(loaded) << log.text();
         EXPECT_EQ(0, log.count('E')) << log.text();
         return loaded;

@@ -21,7 +21,7 @@ struct ConvertedMaterial
 unsigned findUvChannel(const aiMaterial& material);
 
 /// @param repeats  texture coordinates leave the pictures.
-ConvertedMaterial convertMaterial(const aiMaterial& material, bool repeats, TextureStore& textures,
+ConvertedMaterial convertMaterial(const aiMaterial& source, bool repeats, TextureStore& textures,
                                   NameMaker& names, Report& report);
 
 } // namespace convert

@@ -41,7 +41,7 @@ std::unique_ptr<Stage> Stage::load(const std::string& path, std::string& error)
     stage->m_scene = makeShared<orv::SceneNode>();
     const std::string folder = file.has_parent_path() ? file.parent_path().string() : ".";
     orv::registerSource(*stage->m_pool, folder.c_str(), false);
-    stage->m_glo = orv::loadGloFile(*stage->m_pool, stage->m_scene, file.filename().c_str());
+    stage->m_glo = orv::loadGloFile(*stage->m_pool, stage->m_scene, file.filename().c_str(), true);
     if (!stage->m_glo)
     {
         error = path + ": cannot be loaded as a scene";

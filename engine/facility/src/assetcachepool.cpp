@@ -1,8 +1,10 @@
 #include "orv/assetcachepool.h"
 
+#include "orv/fontcache.h"
 #include "orv/indexbuffercache.h"
 #include "orv/memfilesource.h"
 #include "orv/meshcache.h"
+#include "orv/pvrtextureloader.h"
 #include "orv/shaderprogramcache.h"
 #include "orv/shaderprogramloader.h"
 #include "orv/texture2dcache.h"
@@ -10,6 +12,9 @@
 #include "orv/texturecubecache.h"
 #include "orv/texturecubeloader.h"
 #include "orv/vertexbuffercache.h"
+
+#include <algorithm>
+#include <iterator>
 
 namespace orv
 {
@@ -21,21 +26,40 @@ AssetCachePool::AssetCachePool()
     , m_texture2DCache(makeShared<Texture2DCache>())
     , m_textureCubeCache(makeShared<TextureCubeCache>())
     , m_vertexBufferCache(makeShared<VertexBufferCache>())
+    , m_fontCache(makeShared<FontCache>(m_texture2DCache)) // registers its loader itself
     , m_meshCache(makeShared<MeshCache>(m_indexBufferCache, m_vertexBufferCache))
 {
+    if (!m_assetPath || !areCachesComplete())
+        return;
     m_shaderProgramCache->registerLoader(makeShared<ShaderProgramLoader>());
     m_texture2DCache->registerLoader(makeShared<Texture2DLoader>());
+    m_texture2DCache->registerLoader(makeShared<PvrTextureLoader>());
     m_textureCubeCache->registerLoader(makeShared<TextureCubeLoader>());
-    registerSource(create_memfilesource_orv());
-    registerSource(create_memfilesource_luvane());
+    const SharedPtr<StreamSource> engineAssets = create_memfilesource_orv();
+    const SharedPtr<StreamSource> frameworkAssets = create_memfilesource_luvane();
+    registerSource(engineAssets);
+    registerSource(frameworkAssets);
+    m_complete = areCachesComplete() && engineAssets && frameworkAssets;
 }
 
 AssetCachePool::~AssetCachePool() = default;
 
-/// The order matters to flush(): index buffers before the meshes that hold them, vertex buffers after.
+bool AssetCachePool::areCachesComplete() const
+{
+    const detail::AssetStore* const caches[] = {m_fontCache.get(),        m_indexBufferCache.get(),
+                                                m_meshCache.get(),        m_shaderProgramCache.get(),
+                                                m_texture2DCache.get(),   m_textureCubeCache.get(),
+                                                m_vertexBufferCache.get()};
+    return std::all_of(std::begin(caches), std::end(caches),
+                       [](const detail::AssetStore* cache) { return cache && cache->isComplete(); });
+}
+
+/// The order matters to flush(): fonts before their textures; index buffers before the meshes that hold them,
+/// vertex buffers after.
 template <class Operation>
 void AssetCachePool::forEachCache(const Operation& operation)
 {
+    operation(*m_fontCache);
     operation(*m_indexBufferCache);
     operation(*m_meshCache);
     operation(*m_shaderProgramCache);
@@ -74,6 +98,12 @@ void AssetCachePool::flush()
 void AssetCachePool::release()
 {
     forEachCache([](auto& cache) { cache.getResourceCache()->release(); });
+}
+
+void AssetCachePool::forgetContext()
+{
+    release();
+    forEachCache([](auto& cache) { cache.clear(); });
 }
 
 void registerSource(AssetCachePool& pool, const char* path, bool archive)

@@ -17,7 +17,7 @@ FileToString::FileToString(Stream& stream)
 FileToString::FileToString(const char* path)
 {
     const SharedPtr<StreamSource> source = makeShared<FileStreamSource>(".");
-    if (!source->exists(path))
+    if (!source || !source->exists(path))
         return;
     if (const SharedPtr<Stream> stream = source->open(path, false))
         read(*stream);

@@ -43,11 +43,17 @@ void IndexBuffer::commit()
 {
     if (!m_indices || !m_resource || !m_resource->allocate())
         return;
+    RenderDevice::getError(false);
     glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, getId());
     glBufferData(GL_ELEMENT_ARRAY_BUFFER, GLsizeiptr(m_count) * 2, m_indices.get(), GL_STATIC_DRAW);
-    checkGLError("engine/facility/src/indexbuffer", __func__, __LINE__); // the one sign of lacking memory
+    const bool isRefused = detail::reportGLError("engine/facility/src/indexbuffer", __func__, __LINE__);
     glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, 0);
     detail::bindingsChanged();
+    if (isRefused) // no memory: draws go on from the array
+    {
+        m_resource->deallocate();
+        return;
+    }
     m_indices.reset();
     m_committed = true;
 }
@@ -82,15 +88,16 @@ void IndexBuffer::draw(RenderContext& context)
     if (!m_enabled)
         return;
     const GLuint buffer = getId();
-    if (!isIndexed())
-    {
-        glDrawArrays(glPrimitiveConvert(m_primitive), 0, m_count);
-        return;
-    }
     if (buffer == 0 && m_committed)
         return;
+    const GLenum mode = glPrimitiveConvert(m_primitive);
+    if (buffer == 0 && !m_indices)
+    {
+        glDrawArrays(mode, 0, m_count);
+        return;
+    }
     context.bindElementBuffer(buffer);
-    glDrawElements(glPrimitiveConvert(m_primitive), m_count, GL_UNSIGNED_SHORT, m_indices.get());
+    glDrawElements(mode, m_count, GL_UNSIGNED_SHORT, buffer != 0 ? nullptr : m_indices.get());
 }
 
 unsigned int IndexBuffer::getId() const

@@ -44,7 +44,8 @@ IndexBuffer::Ptr create(IndexBufferCache& cache, IndexBuffer::Primitive primitiv
 {
     const IndexBuffer::Ptr buffer = makeShared<IndexBuffer>(
         primitive, int(std::min(count, unsigned(INT_MAX))), false, createResource(cache));
-    cache.add(buffer, name);
+    if (buffer)
+        cache.add(buffer, name);
     return buffer;
 }
 

@@ -11,10 +11,13 @@ namespace
 SharedPtr<MemoryStreamSource> createSource(const detail::EmbeddedArchive& archive)
 {
     const SharedPtr<MemoryStreamSource> source = makeShared<MemoryStreamSource>();
-    for (size_t i = 0; i < archive.count; ++i)
+    for (size_t i = 0; source && i < archive.count; ++i)
     {
         const detail::EmbeddedAsset& asset = archive.assets[i];
-        source->add(asset.name, makeShared<MemoryStream>(asset.data, asset.size));
+        const SharedPtr<MemoryStream> stream = makeShared<MemoryStream>(asset.data, asset.size);
+        if (!stream)
+            return {};
+        source->add(asset.name, stream);
     }
     return source;
 }

@@ -16,7 +16,8 @@ Mesh::Ptr MeshCache::create(const MeshHeader& header, const IndexBuffer::Ptr& in
                             const VertexBuffer::Ptr& vertexBuffer, const char* name)
 {
     const Mesh::Ptr mesh = makeShared<Mesh>(header, indexBuffer, vertexBuffer);
-    add(mesh, name);
+    if (mesh)
+        add(mesh, name);
     return mesh;
 }
 

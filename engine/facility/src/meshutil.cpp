@@ -84,6 +84,8 @@ Mesh::Ptr createMesh(MeshCache& cache, const Shape& shape, float boundingRadius)
 {
     shape.checkTotals();
     const VertexBuffer::Ptr vertexBuffer = cache.getVertexBufferCache()->create(nullptr);
+    if (!vertexBuffer)
+        return {};
     const auto add = [&vertexBuffer](const SharedPtr<VertexArray>& array, const char* name)
     {
         vertexBuffer->addAttrib(array, name, VertexBuffer::AttribFormat::FLOAT,

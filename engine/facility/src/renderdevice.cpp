@@ -135,10 +135,16 @@ bool RenderDevice::isExtensionSupported(const char* name)
 
 void checkGLError(const char* file, const char* function, int line)
 {
+    detail::reportGLError(file, function, line);
+}
+
+bool detail::reportGLError(const char* file, const char* function, int line)
+{
     const RenderDevice::ErrorCode error = RenderDevice::getError(false);
-    if (error != RenderDevice::ErrorCode::NO_ERROR)
-        pssLogError(file, function, line, "OpenGL error %d: %s", int(error),
-                    RenderDevice::getErrorString(error));
+    if (error == RenderDevice::ErrorCode::NO_ERROR)
+        return false;
+    pssLogError(file, function, line, "OpenGL error %d: %s", int(error), RenderDevice::getErrorString(error));
+    return true;
 }
 
 } // namespace orv

@@ -2,6 +2,7 @@
 
 #include "orv/detail/resource.h"
 #include "orv/extensions.h"
+#include "orv/renderdevice.h"
 
 #include <GLES2/gl2.h>
 
@@ -145,6 +146,7 @@ SharedPtr<ShaderProgram> ShaderProgramCache::create(unsigned int length, unsigne
         programBinary(program->getId(), format, binary, int(length));
     if (!isLinked(program->getId()))
     {
+        RenderDevice::getError(false); // the driver's complaint, which this message stands for
         ORV_LOG_ERROR("ShaderProgram binary load failed");
         return {};
     }

@@ -48,7 +48,7 @@ SharedPtr<detail::TextureResource> Texture2DCache::createResource()
 {
     auto resource = makeShared<detail::TextureResource>();
     getResourceCache()->add(resource);
-    if (!resource->allocate())
+    if (resource && !resource->allocate())
         resource.reset();
     return resource;
 }
@@ -66,6 +66,7 @@ SharedPtr<Texture2D> Texture2DCache::create(unsigned width, unsigned height, Tex
 
     const bool isDepth = format == Texture::Format::DEPTH;
     const bool isFullFeatured = !isDepth && detail::isPowerOfTwo(width, height);
+    RenderDevice::getError(false);
     glPixelStorei(GL_UNPACK_ALIGNMENT, 1);
     glBindTexture(GL_TEXTURE_2D, resource->getId());
     detail::bindingsChanged();
@@ -75,11 +76,18 @@ SharedPtr<Texture2D> Texture2DCache::create(unsigned width, unsigned height, Tex
         glGenerateMipmap(GL_TEXTURE_2D);
     setGlParameters(GL_TEXTURE_2D, isFullFeatured ? GL_LINEAR_MIPMAP_NEAREST : GL_LINEAR, GL_LINEAR,
                     isFullFeatured ? GL_REPEAT : GL_CLAMP_TO_EDGE);
+    // No memory, or no depth textures.
+    if (detail::reportGLError("engine/facility/src/texture2dcache", __func__, __LINE__))
+    {
+        resource->deallocate();
+        return {};
+    }
 
     const auto bytesPerPixel = float(Texture::getBytesPerPixel(format, type));
     auto texture =
         makeShared<Texture2D>(width, height, bytesPerPixel, isFullFeatured, resource, false, isDepth);
-    add(texture, name);
+    if (texture)
+        add(texture, name);
     return texture;
 }
 
@@ -89,7 +97,8 @@ SharedPtr<Texture2D> Texture2DCache::create(unsigned width, unsigned height, flo
     const auto resource = makeShared<detail::TextureResource>(glName);
     getResourceCache()->add(resource);
     auto texture = makeShared<Texture2D>(width, height, bytesPerPixel, hasMipmaps, resource, false);
-    add(texture, name);
+    if (texture)
+        add(texture, name);
     return texture;
 }
 
@@ -130,6 +139,8 @@ SharedPtr<Texture2D> Texture2DCache::createFromBackbuffer(const RenderContext& c
     const auto bytesPerPixel = float(Texture::getBytesPerPixel(format, getSurfaceType()));
     auto texture =
         makeShared<Texture2D>(unsigned(width), unsigned(height), bytesPerPixel, false, resource, false);
+    if (!texture)
+        return {};
     add(texture, name);
     texture->setMagFilter(TextureParameters::FilterMode::LINEAR);
     texture->setMinFilter(TextureParameters::FilterMode::NEAREST);

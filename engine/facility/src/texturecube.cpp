@@ -2,6 +2,7 @@
 
 #include "orv/detail/bindingepoch.h"
 #include "orv/log.h"
+#include "orv/renderdevice.h"
 
 #include <GLES2/gl2.h>
 
@@ -46,7 +47,10 @@ void TextureCube::setFace(Face face, const void* pixels)
                  format, type, pixels);
     ++m_facesSet;
     if (m_facesSet % FACE_COUNT == 0)
+    {
         sendParameters();
+        checkGLError("engine/facility/src/texturecube", __func__, __LINE__); // no memory for one of the faces
+    }
 }
 
 void TextureCube::setParameters(const TextureParameters& parameters)

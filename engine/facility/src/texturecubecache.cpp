@@ -31,11 +31,12 @@ SharedPtr<TextureCube> TextureCubeCache::create(unsigned width, unsigned height,
 {
     const auto resource = makeShared<detail::TextureResource>();
     getResourceCache()->add(resource);
-    if (!resource->allocate())
+    if (!resource || !resource->allocate())
         return {};
 
     auto cube = makeShared<TextureCube>(width, height, format, type, resource);
-    add(cube, name);
+    if (cube)
+        add(cube, name);
     return cube;
 }
 

@@ -154,16 +154,16 @@ bool writeAll(Stream& stream, const unsigned char* data, unsigned int size)
 
 } // namespace
 
-VertexBuffer::VertexBuffer(const SharedPtr<detail::BufferResource>& resource)
+[[gnu::cold]] VertexBuffer::VertexBuffer(const SharedPtr<detail::BufferResource>& resource)
     : m_resource(resource)
     , m_revision(detail::nextRevision())
 {
 }
 
-VertexBuffer::~VertexBuffer() = default;
+[[gnu::cold]] VertexBuffer::~VertexBuffer() = default;
 
-bool VertexBuffer::addAttrib(const SharedPtr<VertexArray>& array, const char* name, AttribFormat format,
-                             AttribUsage usage, bool normalise)
+[[gnu::cold]] bool VertexBuffer::addAttrib(const SharedPtr<VertexArray>& array, const char* name,
+                                           AttribFormat format, AttribUsage usage, bool normalise)
 {
     const GLenum glType = glAttribFormatConvert(format);
     if (!array || !name || getTypeSize(glType) > array->getTypeSize())
@@ -198,7 +198,7 @@ void VertexBuffer::getSizeAndStride(unsigned int& size, int& stride) const
     }
 }
 
-bool VertexBuffer::createTempData(unsigned int size, int stride, unsigned char* out)
+[[gnu::cold]] bool VertexBuffer::createTempData(unsigned int size, int stride, unsigned char* out)
 {
     for (const AttribRecord& record : m_attribs)
     {
@@ -230,7 +230,7 @@ bool VertexBuffer::createTempData(unsigned int size, int stride, unsigned char* 
     return true;
 }
 
-void VertexBuffer::commit()
+[[gnu::cold]] void VertexBuffer::commit()
 {
     unsigned int size = 0;
     int stride = 0;
@@ -249,8 +249,8 @@ void VertexBuffer::commit()
     upload(data.get(), size);
 }
 
-bool VertexBuffer::setAllAttributes(const AttribDescription* descriptions, unsigned int count,
-                                    const unsigned char* data, unsigned int size)
+[[gnu::cold]] bool VertexBuffer::setAllAttributes(const AttribDescription* descriptions, unsigned int count,
+                                                  const unsigned char* data, unsigned int size)
 {
     if ((count > 0 && !descriptions) || (size > 0 && !data))
     {
@@ -280,8 +280,7 @@ bool VertexBuffer::setAllAttributes(const AttribDescription* descriptions, unsig
         }
         m_attribs.push_back(std::move(record));
     }
-    upload(data, size);
-    return true;
+    return upload(data, size);
 }
 
 bool VertexBuffer::enableAttrib(unsigned int location, const char* name)
@@ -331,7 +330,7 @@ bool VertexBuffer::isLost() const
     return getId() == 0 && std::any_of(m_attribs.begin(), m_attribs.end(), isStored);
 }
 
-bool VertexBuffer::save(const SharedPtr<Stream>& stream)
+[[gnu::cold]] bool VertexBuffer::save(const SharedPtr<Stream>& stream)
 {
     if (getId() != 0)
     {
@@ -380,7 +379,7 @@ bool VertexBuffer::save(const SharedPtr<Stream>& stream)
     return true;
 }
 
-bool VertexBuffer::load(const SharedPtr<Stream>& stream)
+[[gnu::cold]] bool VertexBuffer::load(const SharedPtr<Stream>& stream)
 {
     unsigned char header[HEADER_SIZE];
     if (!stream || !readAll(*stream, header, HEADER_SIZE))
@@ -422,7 +421,8 @@ bool VertexBuffer::load(const SharedPtr<Stream>& stream)
         }
         if (!m_resource || !m_resource->allocate())
             return false;
-        upload(tempData.get(), size);
+        if (!upload(tempData.get(), size))
+            return false;
     }
     m_attribs = std::move(attribs);
     attribsChanged();
@@ -459,13 +459,19 @@ const VertexBuffer::Plan& VertexBuffer::getPlan(uint64_t programRevision,
     return plan;
 }
 
-void VertexBuffer::upload(const unsigned char* data, unsigned int size)
+/// @return false if GL has no memory for it: a draw from a buffer without data would read from anywhere, so the
+/// buffer is lost.
+bool VertexBuffer::upload(const unsigned char* data, unsigned int size)
 {
+    RenderDevice::getError(false);
     glBindBuffer(GL_ARRAY_BUFFER, getId());
     glBufferData(GL_ARRAY_BUFFER, GLsizeiptr(size), data, GL_STATIC_DRAW);
-    checkGLError("engine/facility/src/vertexbuffer", __func__, __LINE__); // the one sign of lacking memory
+    const bool isRefused = detail::reportGLError("engine/facility/src/vertexbuffer", __func__, __LINE__);
+    if (isRefused)
+        m_resource->deallocate();
     attribsChanged();
     detail::bindingsChanged();
+    return !isRefused;
 }
 
 void VertexBuffer::attribsChanged()

@@ -11,7 +11,8 @@ VertexBuffer::Ptr VertexBufferCache::create(const char* name)
     const auto resource = makeShared<detail::BufferResource>();
     getResourceCache()->add(resource);
     const VertexBuffer::Ptr buffer = makeShared<VertexBuffer>(resource);
-    add(buffer, name);
+    if (buffer)
+        add(buffer, name);
     return buffer;
 }
 

@@ -20,40 +20,50 @@ using namespace glo;
 namespace
 {
 
-/// The first record of that name.
 template <class Record>
-const Record* findRecord(const std::vector<Record>& records, const std::string& name)
+std::map<std::string_view, const Record*> makeIndex(const std::vector<Record>& records)
 {
-    const auto found = std::find_if(records.begin(), records.end(),
-                                    [&name](const Record& record) { return record.name == name; });
-    return found != records.end() ? &*found : nullptr;
+    std::map<std::string_view, const Record*> byName;
+    for (const Record& record : records)
+        byName.emplace(record.name, &record);
+    return byName;
+}
+
+template <class Record>
+const Record* findRecord(const std::map<std::string_view, const Record*>& records, const std::string& name)
+{
+    const auto found = records.find(name);
+    return found != records.end() ? found->second : nullptr;
 }
 
 } // namespace
 
 GloBuilder::GloBuilder(AssetCachePool& pool, GloScene& scene, FileVersion version, AuthoringTool tool,
-                       const char* name)
+                       uint32_t fileSize, const char* name)
     : m_pool(pool)
     , m_scene(scene)
     , m_version(version)
     , m_tool(tool)
     , m_name(name)
+    , m_credit(THING * (uint64_t(fileSize) + SPARE_THINGS))
+    , m_skins(makeIndex(scene.skins))
+    , m_lightDefinitions(makeIndex(scene.lights))
+    , m_cameraDefinitions(makeIndex(scene.cameras))
     , m_glo(new Glo)
 {
 }
 
 GloBuilder::~GloBuilder() = default;
 
-SharedPtr<Glo> GloBuilder::build(const SharedPtr<SceneNode>& parent)
+SharedPtr<Glo> GloBuilder::build(const SharedPtr<SceneNode>& parent, bool measuresMeshes)
 {
     if (m_scene.scene && m_scene.upAxis > uint32_t(UpAxis::Z))
     {
         fail("Unrecognized up-axis option in %s");
         return {};
     }
-    if (!makeGeometries())
+    if (!makeGeometries(measuresMeshes) || !makeMaterials())
         return {};
-    makeMaterials();
 
     SharedPtr<SceneNode> top;
     if (m_scene.scene)
@@ -63,16 +73,21 @@ SharedPtr<Glo> GloBuilder::build(const SharedPtr<SceneNode>& parent)
             return {};
     }
     m_glo->m_animationGroup = makeShared<AnimationGroup>();
+    if (!m_glo->m_animationGroup)
+        return {};
     for (const AnimationData& animation : m_scene.animations)
     {
         const SharedPtr<AnimationGroup> group = makeShared<AnimationGroup>();
-        if (!makeAnimation(animation, *group))
+        if (!group || !makeAnimation(animation, *group))
             return {};
         m_glo->m_animations.push_back({animation.name, group});
         m_glo->m_animationGroup->addAnimation(group);
     }
     for (const SkinnedSolids& skinned : m_skinnedSolids)
-        linkSkin(skinned);
+    {
+        if (!linkSkin(skinned))
+            return {};
+    }
     for (auto& [name, material] : m_materials)
     {
         material.choosePrograms();
@@ -103,26 +118,40 @@ bool GloBuilder::failUnknown(const char* kind, const std::string& name) const
     return false;
 }
 
-bool GloBuilder::makeGeometries()
+/// References multiply: a geometry of a thousand sets that a thousand nodes refer to is a million solids. Whatever is
+/// made by reference is paid for here, so that a small file cannot ask for more than memory or patience can give.
+bool GloBuilder::spend(uint64_t work)
+{
+    if (work > m_credit)
+        return fail("References in %s ask for more than a file of its size may have");
+    m_credit -= work;
+    return true;
+}
+
+bool GloBuilder::makeGeometries(bool measuresMeshes)
 {
     for (Geometry& geometry : m_scene.geometries)
     {
         GloGeometry made;
-        if (!makeGeometry(m_pool, geometry, m_version, m_name, made))
+        if (!makeGeometry(m_pool, geometry, m_version, m_name, measuresMeshes, made))
             return false;
         m_geometries.emplace(geometry.name, std::move(made));
     }
     return true;
 }
 
-void GloBuilder::makeMaterials()
+bool GloBuilder::makeMaterials()
 {
     for (const Material& material : m_scene.materials)
     {
-        if (!material.techniques.empty())
-            m_materials.insert_or_assign(material.name, GloMaterial(m_pool, m_version, m_tool, material.name,
-                                                                    material.techniques.back()));
+        if (material.techniques.empty())
+            continue;
+        GloMaterial made(m_pool, m_version, m_tool, material.name, material.techniques.back());
+        if (!made.getAppearance())
+            return false;
+        m_materials.insert_or_assign(material.name, std::move(made));
     }
+    return true;
 }
 
 /// @return empty on failure, with nothing left under parent.
@@ -135,6 +164,8 @@ SharedPtr<SceneNode> GloBuilder::makeNode(const NodeData& data, const SharedPtr<
         objects.push_back(makeShared<SceneNode>());
 
     const SharedPtr<SceneNode> node = objects.front();
+    if (!node)
+        return {};
     node->setName(data.name.c_str());
     m_nodes.emplace(data.name, node);
     m_scopedNodes.emplace(data.scopedName, node);
@@ -191,8 +222,16 @@ bool GloBuilder::makeSolids(const std::string& geometry, const std::vector<std::
         return failUnknown("geometry", geometry);
     bool missing = false;
     const std::vector<SharedPtr<Mesh>>& meshes = found->second.meshes;
+    if (!spend(THING * meshes.size()))
+        return false;
     for (size_t i = 0; i < meshes.size(); ++i)
-        solids.push_back(makeShared<Solid>(meshes[i], findAppearance(materials, i, skinned, missing)));
+    {
+        const SharedPtr<Appearance> appearance = findAppearance(materials, i, skinned, missing);
+        const SharedPtr<Solid> solid = makeShared<Solid>(meshes[i], appearance);
+        if (!appearance || !solid)
+            return false;
+        solids.push_back(solid);
+    }
     if (missing)
         ORV_GLO_WARN("Geometry has no material; using default appearance.");
     return true;
@@ -224,7 +263,7 @@ SharedPtr<Appearance> GloBuilder::getDefaultAppearance(bool skinned)
 
 bool GloBuilder::makeSkinnedSolids(const SkinReference& reference, std::vector<SharedPtr<Solid>>& solids)
 {
-    const Skin* skin = findRecord(m_scene.skins, reference.skin);
+    const Skin* skin = findRecord(m_skins, reference.skin);
     if (!skin)
         return failUnknown("skin", reference.skin);
     SkinnedSolids skinned{skin, &reference, {}};
@@ -243,43 +282,64 @@ bool GloBuilder::makeSkinnedSolids(const SkinReference& reference, std::vector<S
     return true;
 }
 
-void GloBuilder::linkSkin(const SkinnedSolids& skinned) const
+bool GloBuilder::linkSkin(const SkinnedSolids& skinned)
 {
+    std::set<const SceneNode*> skeletons;
+    for (const std::string& name : skinned.reference->skeletons)
+    {
+        const auto root = m_nodes.find(name);
+        if (root != m_nodes.end())
+            skeletons.insert(root->second.get());
+    }
     for (const Attachment& attachment : skinned.skin->attachments)
     {
-        const SharedPtr<SceneNode> joint = findJoint(attachment.joint, *skinned.reference);
+        SharedPtr<SceneNode> joint;
+        if (!spend(THING * skinned.solids.size()) || !findJoint(attachment.joint, skeletons, joint))
+            return false;
         if (!joint)
             ORV_GLO_ERROR("Joint node \"%s\" not found.", attachment.joint.c_str());
         for (const SharedPtr<Solid>& solid : skinned.solids)
             solid->attachJoint(joint, attachment.inverseBindPose);
     }
+    return true;
 }
 
 /// By scoped name, then by name; of several nodes, the first below one of the reference's skeletons, since two
 /// figures of the same build have the same joint names.
-SharedPtr<SceneNode> GloBuilder::findJoint(const std::string& name, const SkinReference& reference) const
+/// @param joint  stays empty if there is none.
+/// @return false when the search is not worth the file's size.
+bool GloBuilder::findJoint(const std::string& name, const std::set<const SceneNode*>& skeletons,
+                           SharedPtr<SceneNode>& joint)
 {
     for (const NodesByName* nodes : {&m_scopedNodes, &m_nodes})
     {
         const auto [begin, end] = nodes->equal_range(name);
         for (auto node = begin; node != end; ++node)
         {
-            for (const std::string& skeleton : reference.skeletons)
+            uint64_t steps = 1;
+            const SceneNode* above = node->second.get();
+            for (; above && skeletons.count(above) == 0; above = above->getParent())
+                ++steps;
+            if (above)
             {
-                const auto root = m_nodes.find(skeleton);
-                if (root != m_nodes.end() && node->second->hasAncestor(root->second.get()))
-                    return node->second;
+                joint = node->second;
+                return true;
             }
+            if (!spend(steps))
+                return false;
         }
         if (begin != end)
-            return begin->second;
+        {
+            joint = begin->second;
+            return true;
+        }
     }
-    return {};
+    return true;
 }
 
 bool GloBuilder::makeLight(const LightReference& reference, Objects& objects)
 {
-    const LightDefinition* definition = findRecord(m_scene.lights, reference.light);
+    const LightDefinition* definition = findRecord(m_lightDefinitions, reference.light);
     if (!definition)
         return failUnknown("light", reference.light);
     if (definition->type > light::SPOT)
@@ -294,6 +354,8 @@ bool GloBuilder::makeLight(const LightReference& reference, Objects& objects)
         ORV_GLO_WARN("Ambient light type not supported; defaulting to point light.");
 
     const SharedPtr<Light> made = makeShared<Light>();
+    if (!made)
+        return false;
     made->setLightName(definition->name.c_str());
     made->setLightType(TYPES[definition->type]);
     made->setColour(Colour4f(definition->colour.x, definition->colour.y, definition->colour.z, 1.0f));
@@ -305,13 +367,14 @@ bool GloBuilder::makeLight(const LightReference& reference, Objects& objects)
     made->setSpotOuterAngle(Anglef::fromRadians(definition->spotOuter));
     made->setAmbientLevel(m_tool == AuthoringTool::BLENDER ? 0.0f : 0.1f);
     m_glo->m_lights.push_back({made, definition->name});
+    m_lights.emplace(definition->name, made);
     objects.push_back(made);
     return true;
 }
 
 bool GloBuilder::makeCamera(const CameraReference& reference, Objects& objects)
 {
-    const CameraDefinition* definition = findRecord(m_scene.cameras, reference.camera);
+    const CameraDefinition* definition = findRecord(m_cameraDefinitions, reference.camera);
     if (!definition)
         return failUnknown("camera", reference.camera);
     if (definition->projection > projection::PERSPECTIVE)
@@ -321,6 +384,8 @@ bool GloBuilder::makeCamera(const CameraReference& reference, Objects& objects)
         return false;
     }
     const SharedPtr<Camera> made = makeShared<Camera>();
+    if (!made)
+        return false;
     made->setProjectionType(Camera::ProjectionType(definition->projection));
     // What the projection does not use is passed on only if it differs from what the camera has: the camera warns.
     const bool perspective = definition->projection == projection::PERSPECTIVE;

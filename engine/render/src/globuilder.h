@@ -7,8 +7,11 @@
 #include "orv/glo.h"
 #include "orv/solid.h"
 
+#include <cstdint>
 #include <map>
+#include <set>
 #include <string>
+#include <string_view>
 #include <vector>
 
 namespace orv::detail
@@ -18,17 +21,20 @@ namespace orv::detail
 class GloBuilder
 {
 public:
-    /// @param scene  borrowed; its bulk data is given up on the way.
-    /// @param name   the file, for messages; borrowed.
+    /// @param scene     borrowed; its bulk data is given up on the way.
+    /// @param fileSize  in bytes; what it takes to build the scene is bounded by it.
+    /// @param name      the file, for messages; borrowed.
     GloBuilder(AssetCachePool& pool, glo::GloScene& scene, glo::FileVersion version, glo::AuthoringTool tool,
-               const char* name);
+               uint32_t fileSize, const char* name);
     ~GloBuilder();
 
     /// @return empty, with parent unchanged, on failure.
-    SharedPtr<Glo> build(const SharedPtr<SceneNode>& parent);
+    SharedPtr<Glo> build(const SharedPtr<SceneNode>& parent, bool measuresMeshes);
 
 private:
     using Objects = std::vector<SharedPtr<SceneNode>>;
+    template <class Record>
+    using RecordsByName = std::map<std::string_view, const Record*>; ///< the first of each name
     using NodesByName =
         std::multimap<std::string, SharedPtr<SceneNode>, std::less<>>; ///< in the tree's order
 
@@ -40,8 +46,13 @@ private:
         std::vector<SharedPtr<Solid>> solids;
     };
 
-    bool makeGeometries();
-    void makeMaterials();
+    /// Work is counted in steps of a search. For each byte of a file one thing may be made, and so many more.
+    static constexpr uint64_t THING = 64;
+    static constexpr uint64_t SPARE_THINGS = 256;
+    bool spend(uint64_t work);
+
+    bool makeGeometries(bool measuresMeshes);
+    bool makeMaterials();
     SharedPtr<SceneNode> makeNode(const glo::NodeData& data, const SharedPtr<SceneNode>& parent);
     void setTransform(SceneNode& node, const glo::NodeData& data, bool top) const;
     bool makeObjects(const glo::NodeData& data, Objects& objects);
@@ -53,8 +64,9 @@ private:
     bool makeSkinnedSolids(const glo::SkinReference& reference, std::vector<SharedPtr<Solid>>& solids);
     bool makeLight(const glo::LightReference& reference, Objects& objects);
     bool makeCamera(const glo::CameraReference& reference, Objects& objects);
-    void linkSkin(const SkinnedSolids& skinned) const;
-    SharedPtr<SceneNode> findJoint(const std::string& name, const glo::SkinReference& reference) const;
+    bool linkSkin(const SkinnedSolids& skinned);
+    bool findJoint(const std::string& name, const std::set<const SceneNode*>& skeletons,
+                   SharedPtr<SceneNode>& joint);
     bool fail(const char* format) const;
     bool failUnknown(const char* kind, const std::string& name) const;
 
@@ -69,12 +81,17 @@ private:
     glo::FileVersion m_version;
     glo::AuthoringTool m_tool;
     const char* m_name;
+    uint64_t m_credit; ///< work that may still be done
+    RecordsByName<glo::Skin> m_skins;
+    RecordsByName<glo::LightDefinition> m_lightDefinitions;
+    RecordsByName<glo::CameraDefinition> m_cameraDefinitions;
     SharedPtr<Glo> m_glo;
     std::map<std::string, GloGeometry, std::less<>> m_geometries;
     std::map<std::string, GloMaterial, std::less<>> m_materials;
     SharedPtr<Appearance> m_defaultAppearances[2]; ///< plain, skinned
     NodesByName m_nodes;
     NodesByName m_scopedNodes;
+    std::multimap<std::string_view, SharedPtr<Light>> m_lights; ///< by their definition's name
     std::vector<SkinnedSolids> m_skinnedSolids;
 };
 

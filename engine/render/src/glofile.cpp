@@ -7,6 +7,7 @@
 #include "orv/assetcachepool.h"
 
 #include <algorithm>
+#include <bit>
 #include <cstring>
 #include <new>
 #include <utility>
@@ -110,12 +111,13 @@ bool GloReader::readChunk(const uint32_t ids[], bool skipUnknown)
 {
     ORV_ASSERT(ids);
     unsigned char word[4];
+    const bool isEnd = remaining() < sizeof(word); // or else a read that fails although there is more
     if (!readExactly(word, sizeof(word)))
     {
         m_ended = true;
-        if (!skipUnknown)
+        if (!skipUnknown || !isEnd)
             ORV_GLO_ERROR("Failed to read chunk ID");
-        return skipUnknown;
+        return skipUnknown && isEnd;
     }
     const uint32_t id = readWord(word);
     if (!readExactly(word, sizeof(word)))
@@ -398,7 +400,7 @@ bool GloReader::indices(IndexData& data)
     unsigned char* bytes = reinterpret_cast<unsigned char*>(data.indices.data());
     if (!readExactly(bytes, size / 2 * 2))
         return fail("Failed to read indices in %s");
-    for (uint32_t i = 0; i < size / 2; ++i)
+    for (uint32_t i = 0; std::endian::native != std::endian::little && i < size / 2; ++i)
         data.indices[i] = uint16_t(bytes[2 * i] | bytes[2 * i + 1] << 8);
 
     unsigned char spare;
@@ -423,7 +425,8 @@ bool GloReader::keys(Channel& channel)
 
 } // namespace detail
 
-SharedPtr<Glo> loadGloFile(AssetCachePool& pool, const SharedPtr<SceneNode>& parent, const char* name)
+SharedPtr<Glo> loadGloFile(AssetCachePool& pool, const SharedPtr<SceneNode>& parent, const char* name,
+                           bool measuresMeshes)
 {
     const SharedPtr<Stream> stream = name ? pool.getStream(name) : SharedPtr<Stream>();
     if (!stream)
@@ -434,8 +437,9 @@ SharedPtr<Glo> loadGloFile(AssetCachePool& pool, const SharedPtr<SceneNode>& par
     detail::GloReader reader(stream, name);
     if (!reader.read())
         return {};
-    detail::GloBuilder builder(pool, reader.scene(), reader.version(), reader.tool(), name);
-    return builder.build(parent);
+    detail::GloBuilder builder(pool, reader.scene(), reader.version(), reader.tool(),
+                               uint32_t(std::max(stream->size(), 0)), name);
+    return builder.build(parent, measuresMeshes);
 }
 
 } // namespace orv

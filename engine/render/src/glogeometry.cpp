@@ -72,22 +72,25 @@ std::vector<float> getSquaredDistances(const Geometry& geometry, FileVersion ver
     return distances;
 }
 
-/// Of the vertices that the set draws.
-float getRadius(const PrimitiveSet& set, const std::vector<float>& squaredDistances)
+float getRadius(const std::vector<float>& squaredDistances)
 {
     if (squaredDistances.empty())
         return MeshHeader::INVALID_BOUNDING_RADIUS;
     float largest = 0.0f;
-    if (set.indices)
-    {
-        for (const uint16_t index : set.indices->indices)
-            largest = std::max(largest, squaredDistances[index]);
-    }
-    else
-    {
-        for (const float distance : squaredDistances)
-            largest = std::max(largest, distance);
-    }
+    for (const float distance : squaredDistances)
+        largest = std::max(largest, distance);
+    return std::sqrt(largest);
+}
+
+/// Of the vertices that the set draws.
+/// @param all  the radius of all vertices, which is not computed once more for each set without indices.
+float getRadius(const PrimitiveSet& set, const std::vector<float>& squaredDistances, float all)
+{
+    if (squaredDistances.empty() || !set.indices)
+        return all;
+    float largest = 0.0f;
+    for (const uint16_t index : set.indices->indices)
+        largest = std::max(largest, squaredDistances[index]);
     return std::sqrt(largest);
 }
 
@@ -115,7 +118,7 @@ bool isInside(const PrimitiveSet& set, uint32_t vertexCount)
 } // namespace
 
 bool makeGeometry(AssetCachePool& pool, Geometry& geometry, FileVersion version, const char* fileName,
-                  GloGeometry& made)
+                  bool measuresMeshes, GloGeometry& made)
 {
     VertexSet& vertices = geometry.vertices;
     std::vector<uint8_t>& bytes = vertices.data.bytes;
@@ -147,12 +150,14 @@ bool makeGeometry(AssetCachePool& pool, Geometry& geometry, FileVersion version,
                                          bytes.data(), static_cast<unsigned int>(bytes.size()))))
         return fail(geometry, fileName);
 
-    const std::vector<float> squaredDistances = getSquaredDistances(geometry, version);
+    const std::vector<float> squaredDistances =
+        measuresMeshes ? getSquaredDistances(geometry, version) : std::vector<float>();
+    const float radius = getRadius(squaredDistances);
     bytes = {};
     for (const PrimitiveSet& set : geometry.primitiveSets)
     {
         MeshHeader header;
-        header.boundingRadius = getRadius(set, squaredDistances);
+        header.boundingRadius = getRadius(set, squaredDistances, radius);
         const SharedPtr<IndexBuffer> indexBuffer =
             makeIndexBuffer(*pool.getIndexBufferCache(), set, vertices.vertexCount);
         const SharedPtr<Mesh> mesh =

@@ -25,7 +25,7 @@ struct GloGeometry
 /// @param fileName  for messages.
 /// @return false, after logging, if the GL would be led outside the vertices or cannot take them.
 bool makeGeometry(AssetCachePool& pool, glo::Geometry& geometry, glo::FileVersion version,
-                  const char* fileName, GloGeometry& made);
+                  const char* fileName, bool measuresMeshes, GloGeometry& made);
 
 } // namespace detail
 

@@ -69,25 +69,4 @@ void LightIntensityAnimator::apply(const float& intensity)
         light->setIntensity(intensity);
 }
 
-template <class T>
-AppearancePropertyAnimator<T>::AppearancePropertyAnimator(const SharedPtr<Appearance>& appearance,
-                                                          const char* name)
-    : m_appearance(appearance)
-    , m_property(name)
-{
-}
-
-template <class T>
-AppearancePropertyAnimator<T>::~AppearancePropertyAnimator() = default;
-
-template <class T>
-void AppearancePropertyAnimator<T>::apply(const T& value)
-{
-    if (Appearance* appearance = m_appearance.operator->())
-        m_property.set(*appearance, value);
-}
-
-template class AppearancePropertyAnimator<float>;
-template class AppearancePropertyAnimator<Vector4f>;
-
 } // namespace orv

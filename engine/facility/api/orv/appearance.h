@@ -136,7 +136,7 @@ private:
     };
 
     static bool sizeAllowed(int size);
-    static bool faceAllowed(StencilFace face);
+    ORV_LOCAL static bool faceAllowed(StencilFace face);
     bool indexAllowed(const char* name, int index) const;
     void storeProperty(const char* name, const SharedPtr<ShaderUniformBase>& uniform);
     void stateChanged();

@@ -7,6 +7,7 @@
 namespace orv
 {
 
+class FontCache;
 class IndexBufferCache;
 class MeshCache;
 class ShaderProgramCache;
@@ -29,6 +30,9 @@ public:
     AssetCachePool();
     ~AssetCachePool() override;
 
+    /// False, after a message, if there was no memory for a part of it: such a pool can only be dropped.
+    bool isComplete() const { return m_complete; }
+
     /// Appends a source to the path of the pool and of every cache. An empty one is taken too; see AssetPath.
     void registerSource(const SharedPtr<StreamSource>& source);
 
@@ -48,16 +52,23 @@ public:
     /// names, but draw nothing: drop them and call flush(), then load or make anew what is needed.
     void release();
 
+    /// The same in one call for a program that loads everything again: release(), and the caches let go of every
+    /// asset, also of those that somebody still holds, so that what is asked for from here on is loaded into the
+    /// new context. Sources, loaders and the cache source stay.
+    void forgetContext();
+
     const SharedPtr<IndexBufferCache>& getIndexBufferCache() const { return m_indexBufferCache; }
     const SharedPtr<ShaderProgramCache>& getShaderProgramCache() const { return m_shaderProgramCache; }
     const SharedPtr<Texture2DCache>& getTexture2DCache() const { return m_texture2DCache; }
     const SharedPtr<TextureCubeCache>& getTextureCubeCache() const { return m_textureCubeCache; }
     const SharedPtr<VertexBufferCache>& getVertexBufferCache() const { return m_vertexBufferCache; }
+    const SharedPtr<FontCache>& getFontCache() const { return m_fontCache; }
     const SharedPtr<MeshCache>& getMeshCache() const { return m_meshCache; }
 
 private:
     template <class Operation>
     void forEachCache(const Operation& operation);
+    ORV_LOCAL bool areCachesComplete() const;
 
     SharedPtr<detail::AssetPath> m_assetPath;
     SharedPtr<StreamSource> m_cacheSource;
@@ -66,7 +77,9 @@ private:
     SharedPtr<Texture2DCache> m_texture2DCache;
     SharedPtr<TextureCubeCache> m_textureCubeCache;
     SharedPtr<VertexBufferCache> m_vertexBufferCache;
+    SharedPtr<FontCache> m_fontCache;
     SharedPtr<MeshCache> m_meshCache;
+    bool m_complete = false;
 };
 
 /// Registers a directory as a source. Archives are not supported: with archive true an empty source is registered.

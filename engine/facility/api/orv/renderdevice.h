@@ -54,4 +54,14 @@ public:
 /// Logs a fresh GL error, if there is one, under the caller's position; see RenderDevice::getError(false).
 ORV_API void checkGLError(const char* file, const char* function, int line);
 
+namespace detail
+{
+
+/// The same for those who have to give something up then. Whoever uses it calls RenderDevice::getError(false)
+/// first, so that an older error is not taken for its own.
+/// @return whether there was an error.
+bool reportGLError(const char* file, const char* function, int line);
+
+} // namespace detail
+
 } // namespace orv

@@ -55,10 +55,10 @@ public:
     static void bindFramebuffer(unsigned name);
 
 private:
-    void attach(bool depthBuffer, bool stencilBuffer);
-    bool retryPacked();
-    void deleteRenderbuffers();
-    bool isContextLost() const;
+    ORV_LOCAL void attach(bool depthBuffer, bool stencilBuffer);
+    ORV_LOCAL bool retryPacked();
+    ORV_LOCAL void deleteRenderbuffers();
+    ORV_LOCAL bool isContextLost() const;
 
     unsigned m_framebuffer = 0;
     SharedPtr<Texture2D> m_colour;

@@ -7,6 +7,10 @@
 namespace orv
 {
 
+// Exported from here on: instantiations of exported templates are only if their arguments are.
+class ORV_API Texture2D;
+class ORV_API TextureCube;
+
 /// Pixel layouts of both kinds of texture.
 struct ORV_API Texture
 {

@@ -64,11 +64,11 @@ public:
     unsigned getSizeInBytes() const { return m_sizeInBytes; }
 
 private:
-    bool canHaveMipmaps() const;
-    void setWrap(unsigned parameter, WrapMode mode);
-    FilterMode getFilter(unsigned parameter);
-    WrapMode getWrap(unsigned parameter);
-    int readParameter(unsigned parameter);
+    ORV_LOCAL bool canHaveMipmaps() const;
+    ORV_LOCAL void setWrap(unsigned parameter, WrapMode mode);
+    ORV_LOCAL FilterMode getFilter(unsigned parameter);
+    ORV_LOCAL WrapMode getWrap(unsigned parameter);
+    ORV_LOCAL int readParameter(unsigned parameter);
 
     SharedPtr<detail::TextureResource> m_resource;
     unsigned m_width;

@@ -47,7 +47,7 @@ public:
     SharedPtr<Texture2D> createForExternalSource();
 
 private:
-    SharedPtr<detail::TextureResource> createResource();
+    ORV_LOCAL SharedPtr<detail::TextureResource> createResource();
 };
 
 /// Sum over every held texture, largest levels alone.

@@ -56,7 +56,7 @@ public:
     unsigned getHeight() const { return m_height; } ///< pixels of a face
 
 private:
-    void sendParameters();
+    ORV_LOCAL void sendParameters();
 
     SharedPtr<detail::TextureResource> m_resource;
     unsigned m_width;

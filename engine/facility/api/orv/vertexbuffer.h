@@ -150,9 +150,9 @@ private:
         std::vector<const detail::AttribRecord*> sources;
     };
 
-    const Plan& getPlan(uint64_t programRevision, const detail::ProgramAttrib* attribs, int count);
-    void upload(const unsigned char* data, unsigned int size);
-    void attribsChanged();
+    ORV_LOCAL const Plan& getPlan(uint64_t programRevision, const detail::ProgramAttrib* attribs, int count);
+    ORV_LOCAL bool upload(const unsigned char* data, unsigned int size);
+    ORV_LOCAL void attribsChanged();
 
     std::vector<detail::AttribRecord> m_attribs;
     SharedPtr<detail::BufferResource> m_resource;

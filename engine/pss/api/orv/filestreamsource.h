@@ -33,7 +33,7 @@ public:
     const char* getName() const override;
 
 private:
-    std::string getPath(const char* name) const;
+    ORV_LOCAL std::string getPath(const char* name) const;
 
     std::string m_root;
 };

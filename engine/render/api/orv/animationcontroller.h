@@ -54,8 +54,8 @@ public:
     void setLoopEnd(float loopEnd) { m_loopEnd = loopEnd; }
 
 private:
-    float clampToRange(float progress) const;
-    float advance(float step) const;
+    ORV_LOCAL float clampToRange(float progress) const;
+    ORV_LOCAL float advance(float step) const;
 
     bool m_enabled = true;
     bool m_paused = false;

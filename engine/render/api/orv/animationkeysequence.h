@@ -2,8 +2,13 @@
 
 #include "orv/animatedvalue.h"
 #include "orv/colour.h"
+#include "orv/log.h"
 #include "orv/vector.h"
 
+#include <algorithm>
+#include <cmath>
+#include <iterator>
+#include <utility>
 #include <vector>
 
 namespace orv
@@ -29,7 +34,19 @@ public:
     AnimationKeySequence() = default;
     /// @param keys  in any order; sorted here (equal times in no guaranteed order). Keys whose time is not a
     /// number are left out with a warning.
-    explicit AnimationKeySequence(std::vector<AnimationKey<T>> keys);
+    explicit AnimationKeySequence(std::vector<AnimationKey<T>> keys) : m_keys(std::move(keys))
+    {
+        const auto isUnplaced = [](const AnimationKey<T>& key) { return std::isnan(key.time); };
+        const auto unplaced = std::remove_if(m_keys.begin(), m_keys.end(), isUnplaced);
+        if (unplaced != m_keys.end())
+            ORV_LOG_WARN("Ignoring %d animation keys whose time is not a number.",
+                         int(m_keys.end() - unplaced));
+        m_keys.erase(unplaced, m_keys.end());
+        if (std::is_sorted(m_keys.begin(), m_keys.end(), positionedBefore))
+            return; // as a rule; so what follows may be slow but small, for it is there for each type
+        std::make_heap(m_keys.begin(), m_keys.end(), positionedBefore);
+        std::sort_heap(m_keys.begin(), m_keys.end(), positionedBefore);
+    }
 
     /// The order in which keys are kept.
     static bool positionedBefore(const AnimationKey<T>& a, const AnimationKey<T>& b)
@@ -39,17 +56,23 @@ public:
 
     const std::vector<AnimationKey<T>>& getKeys() const { return m_keys; }
 
-    T getValue(float time) const override;
-    float getStart() const override; ///< the first key's time, 0 without keys
-    float getEnd() const override;   ///< the last key's time, 0 without keys
+    T getValue(float time) const override
+    {
+        if (m_keys.empty())
+            return T();
+        const auto later = std::upper_bound(m_keys.begin(), m_keys.end(), time,
+                                            [](float t, const AnimationKey<T>& key) { return t < key.time; });
+        return later == m_keys.begin() ? later->value : std::prev(later)->value;
+    }
+
+    /// The first key's time, 0 without keys.
+    float getStart() const override { return m_keys.empty() ? 0.0f : m_keys.front().time; }
+
+    /// The last key's time, 0 without keys.
+    float getEnd() const override { return m_keys.empty() ? 0.0f : m_keys.back().time; }
 
 private:
     std::vector<AnimationKey<T>> m_keys;
 };
-
-extern template class ORV_API AnimationKeySequence<float>;
-extern template class ORV_API AnimationKeySequence<Vector3f>;
-extern template class ORV_API AnimationKeySequence<Vector4f>;
-extern template class ORV_API AnimationKeySequence<Colour4f>;
 
 } // namespace orv

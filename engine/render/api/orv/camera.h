@@ -70,7 +70,7 @@ public:
     void getStereoWorldTransform(Matrix4f* left, Matrix4f* right) const;
 
 private:
-    Matrix4f calculateProjection(float aspect, float nearDistance, float farDistance) const;
+    ORV_LOCAL Matrix4f calculateProjection(float aspect, float nearDistance, float farDistance) const;
 
     ProjectionType m_projectionType = ProjectionType::PERSPECTIVE;
     Anglef m_fieldOfView = Anglef::fromDegrees(60.0f);

@@ -123,10 +123,11 @@ private:
 ///
 /// @param parent  gets the top node as its last child; empty: the tree is a root that only the result holds.
 /// @param name    looked for on the pool's path.
+/// @param measuresMeshes  looks at every vertex to find the bounding radius of each mesh, which is unknown otherwise.
 /// @return empty, after logging why, if the file is missing, damaged, newer than the loader, or names something
 /// that it does not hold; parent is unchanged then. Missing textures, materials and joints and unknown animated
 /// properties are logged and replaced or left out.
-ORV_API SharedPtr<Glo> loadGloFile(AssetCachePool& pool, const SharedPtr<SceneNode>& parent,
-                                   const char* name);
+ORV_API SharedPtr<Glo> loadGloFile(AssetCachePool& pool, const SharedPtr<SceneNode>& parent, const char* name,
+                                   bool measuresMeshes = false);
 
 } // namespace orv

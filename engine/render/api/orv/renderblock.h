@@ -68,7 +68,7 @@ public:
     void render() override;
 
 private:
-    detail::Viewport findViewport() const;
+    ORV_LOCAL detail::Viewport findViewport() const;
 
     SharedPtr<Renderer> m_renderer;
     SharedPtr<SceneNode> m_scene;

@@ -99,16 +99,22 @@ public:
     using Ptr = SharedPtr<AppearancePropertyAnimator<T>>;
 
     /// @param name  copied.
-    AppearancePropertyAnimator(const SharedPtr<Appearance>& appearance, const char* name);
-    ~AppearancePropertyAnimator() override;
-    void apply(const T& value) override;
+    AppearancePropertyAnimator(const SharedPtr<Appearance>& appearance, const char* name)
+        : m_appearance(appearance)
+        , m_property(name)
+    {
+    }
+    ~AppearancePropertyAnimator() override = default;
+
+    void apply(const T& value) override
+    {
+        if (Appearance* appearance = m_appearance.operator->()) // which logs when there is none
+            m_property.set(*appearance, value);
+    }
 
 private:
     SharedPtr<Appearance> m_appearance;
     PropertyRef m_property;
 };
-
-extern template class ORV_API AppearancePropertyAnimator<float>;
-extern template class ORV_API AppearancePropertyAnimator<Vector4f>;
 
 } // namespace orv

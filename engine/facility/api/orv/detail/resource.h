@@ -1,6 +1,5 @@
 #pragma once
 
-#include "orv/export.h"
 #include "orv/sharedptr.h"
 
 #include <cstdint>
@@ -10,7 +9,7 @@ namespace orv::detail
 {
 
 /// Something that lives in the GL context and dies with it.
-class ORV_API Resource : public Shared
+class Resource : public Shared
 {
 public:
     ORV_CLASS_NAME("Resource")
@@ -40,7 +39,7 @@ public:
 ///
 /// The destructor makes no GL call: an object that is still ALLOCATED then is leaked, and logged as an assertion.
 /// ResourceCache::flush() deletes in time. Threads: all but the reference count belongs to the GL thread.
-class ORV_API GlResource : public Resource
+class GlResource : public Resource
 {
 public:
     GlResource() = default;
@@ -69,7 +68,7 @@ private:
     unsigned int m_name = 0;
 };
 
-class ORV_API BufferResource : public GlResource
+class BufferResource : public GlResource
 {
 public:
     ~BufferResource() override;
@@ -79,7 +78,7 @@ protected:
     void doDeallocate(unsigned int name) override;
 };
 
-class ORV_API ProgramResource : public GlResource
+class ProgramResource : public GlResource
 {
 public:
     ~ProgramResource() override;
@@ -89,7 +88,7 @@ protected:
     void doDeallocate(unsigned int name) override;
 };
 
-class ORV_API ShaderResource : public GlResource
+class ShaderResource : public GlResource
 {
 public:
     enum class Kind : uint32_t
@@ -112,7 +111,7 @@ private:
     Kind m_kind;
 };
 
-class ORV_API TextureResource : public GlResource
+class TextureResource : public GlResource
 {
 public:
     TextureResource() = default;
@@ -130,7 +129,7 @@ protected:
 ///
 /// A resource is added before it is allocated, so that it is tracked even where that fails. Dropping the cache
 /// makes no GL calls.
-class ORV_API ResourceCache : public Shared
+class ResourceCache : public Shared
 {
 public:
     ORV_CLASS_NAME("ResourceCache")
