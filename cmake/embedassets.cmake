@@ -6,8 +6,8 @@
 # NAMESPACE  asset namespace; the table is called NAMESPACE_ARCHIVE, in upper case
 # OUTPUT     replaced when the assets have changed
 #
-# Shader sources (.vert, .frag) go in without what only their authors read: comments and
-# blanks that separate nothing. Lines stay where they are, so that a driver's message names the line of the file.
+# Shader sources (.vert, .frag) go in without what only their authors read: comments after the opening
+# line and blanks that separate nothing. Lines stay where they are, so that a driver's message names the line of the file.
 # Everything else goes in byte for byte.
 cmake_minimum_required(VERSION 3.22)
 
@@ -34,13 +34,16 @@ function(read_asset path result)
     if(text MATCHES "/\\*|\\\\\n")
         message(FATAL_ERROR "embedassets: ${path}: only comments that begin with // are understood, on lines of their own")
     endif()
+    string(REGEX MATCH "^[^\n]*\n" opening "${text}")
+    string(LENGTH "${opening}" length)
+    string(SUBSTRING "${text}" ${length} -1 text)
     string(REGEX REPLACE "[ \t]*//[^\n]*" "" text "${text}")
     string(REGEX REPLACE "[ \t]+\n" "\n" text "${text}")
     string(REGEX REPLACE "\n[ \t]+" "\n" text "\n${text}")
     # Not around signs and parentheses: a - -b, #define X (y).
     string(REGEX REPLACE "[ \t]*([*/=<>,;{}])[ \t]*" "\\1" text "${text}")
     string(SUBSTRING "${text}" 1 -1 text)
-    string(HEX "${text}" hex)
+    string(HEX "${opening}${text}" hex)
     set(${result} "${hex}" PARENT_SCOPE)
 endfunction()
 
