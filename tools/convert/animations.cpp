@@ -133,7 +133,7 @@ glo::AnimationData convertAnimation(const aiScene& scene, const aiAnimation& sou
 
 std::vector<glo::AnimationData> convertAnimations(const aiScene& scene,
                                                   const std::map<const aiNode*, std::string>& nodeNames,
-                                                  double fps, Report& report)
+                                                  const Options& options, Report& report)
 {
     constexpr double USUAL_TICKS_PER_SECOND = 25.0; // where the model does not say
     std::vector<glo::AnimationData> animations;
@@ -146,7 +146,7 @@ std::vector<glo::AnimationData> convertAnimations(const aiScene& scene,
         sampling.ticksPerSecond =
             source.mTicksPerSecond > 0.0 ? source.mTicksPerSecond : USUAL_TICKS_PER_SECOND;
         sampling.duration = source.mDuration;
-        sampling.ticksPerSample = sampling.ticksPerSecond / fps;
+        sampling.ticksPerSample = sampling.ticksPerSecond / options.fps;
         const double samples = std::ceil(sampling.duration / sampling.ticksPerSample - 1e-6);
         if (!(samples >= 0.0 && samples <= MOST_SAMPLES))
         {

@@ -44,12 +44,12 @@ void print(const std::string& in, const std::string& out, const convert::Convert
                     count > 1 ? (" (" + std::to_string(count) + " times)").c_str() : "");
 }
 
-int run(const std::string& in, const std::string& out, double fps)
+int run(const std::string& in, const std::string& out, const convert::Options& options)
 {
     const std::filesystem::path path(out);
     convert::ConvertedModel model;
     std::string error;
-    if (!convert::convertModel(in, path.stem().string(), fps, model, error))
+    if (!convert::convertModel(in, path.stem().string(), options, model, error))
         return fail(in, error);
 
     convert::OutputFile file{path.filename().string(), {}};
@@ -80,10 +80,10 @@ int main(int argc, char** argv)
                "  orv-convert walk.fbx scenes/walk.glo --fps 60");
     std::string in;
     std::string out;
-    double fps = 30.0;
+    convert::Options options;
     app.add_option("MODEL", in, "the model file")->required();
     app.add_option("OUT.glo", out, "the scene file to write")->required();
-    app.add_option("--fps", fps, "samples per second of animations")
+    app.add_option("--fps", options.fps, "samples per second of animations")
         ->check(CLI::Range(1.0, 1000.0))
         ->capture_default_str();
     try
@@ -99,5 +99,5 @@ int main(int argc, char** argv)
         std::fprintf(stderr, "orv-convert: %s: the output's name has to end in .glo\n", out.c_str());
         return MISUSED;
     }
-    return run(in, out, fps);
+    return run(in, out, options);
 }

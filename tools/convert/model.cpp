@@ -59,7 +59,7 @@ public:
     {
     }
 
-    void convert(double fps)
+    void convert(const Options& options)
     {
         convertMaterials();
         convertMeshes();
@@ -68,7 +68,7 @@ public:
         nameNodes(*m_source.mRootNode);
         top.children.push_back(convertNode(*m_source.mRootNode));
         m_model.scene.scene = glo::SceneData{m_stem, std::move(top)};
-        m_model.scene.animations = convertAnimations(m_source, m_names, fps, m_model.report);
+        m_model.scene.animations = convertAnimations(m_source, m_names, options, m_model.report);
         m_model.textures = m_textures.getFiles();
     }
 
@@ -227,8 +227,8 @@ private:
 
 } // namespace
 
-bool convertModel(const std::string& path, const std::string& stem, double fps, ConvertedModel& model,
-                  std::string& error)
+bool convertModel(const std::string& path, const std::string& stem, const Options& options,
+                  ConvertedModel& model, std::string& error)
 {
     std::error_code reason;
     if (!std::filesystem::is_regular_file(path, reason))
@@ -248,7 +248,7 @@ bool convertModel(const std::string& path, const std::string& stem, double fps, 
         error = "holds nothing that can be drawn";
         return false;
     }
-    ModelConverter(*source, path, stem, isGltf(importer), model).convert(fps);
+    ModelConverter(*source, path, stem, isGltf(importer), model).convert(options);
     return true;
 }
 

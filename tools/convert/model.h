@@ -1,6 +1,7 @@
 #pragma once
 
 #include "glo/glowriter.h"
+#include "options.h"
 #include "report.h"
 #include "textures.h"
 
@@ -23,9 +24,8 @@ struct ConvertedModel
 
 /// Reads a model file and makes a scene of it.
 /// @param stem   names the scene and begins the names of its pictures.
-/// @param fps    samples per second of animations.
 /// @param error  why not.
-bool convertModel(const std::string& path, const std::string& stem, double fps, ConvertedModel& model,
-                  std::string& error);
+bool convertModel(const std::string& path, const std::string& stem, const Options& options,
+                  ConvertedModel& model, std::string& error);
 
 } // namespace convert

@@ -1,23 +1,31 @@
 #pragma once
 
+#include <cstdint>
 #include <map>
 #include <string>
 
 namespace convert
 {
 
-/// What a conversion could not carry over, in sentences for a person.
+/// What became of a model: figures, and in sentences for a person what could not be carried over as it was.
 class Report
 {
 public:
-    /// The same loss again is only counted.
+    /// The same again is only counted.
     void lose(const std::string& what) { ++m_losses[what]; }
+    void approximate(const std::string& what) { ++m_approximations[what]; }
+    /// Adds to a figure, such as "degenerate faces dropped".
+    void count(const std::string& figure, uint64_t number) { m_figures[figure] += number; }
 
     /// By sentence, how often.
     const std::map<std::string, int>& getLosses() const { return m_losses; }
+    const std::map<std::string, int>& getApproximations() const { return m_approximations; }
+    const std::map<std::string, uint64_t>& getFigures() const { return m_figures; }
 
 private:
     std::map<std::string, int> m_losses;
+    std::map<std::string, int> m_approximations;
+    std::map<std::string, uint64_t> m_figures;
 };
 
 } // namespace convert
