@@ -57,25 +57,25 @@ void SceneNode::setPosition(const Vector3f& position)
 {
     if (position == m_position)
         return;
-    setTransformChanged();
     m_position = position;
+    setTransformChanged();
 }
 
 void SceneNode::setRotation(const Quaternionf& rotation)
 {
     if (rotation == m_rotation)
         return;
-    setTransformChanged();
     m_rotation = rotation;
+    setTransformChanged();
 }
 
 void SceneNode::setScale(const Vector3f& scale)
 {
     if (scale == m_scale)
         return;
-    setTransformChanged();
     m_scale = scale;
     m_scaled = !(scale == Vector3f(1.0f, 1.0f, 1.0f));
+    setTransformChanged();
 }
 
 void SceneNode::setLocalTransform(const Matrix4f& transform)
@@ -114,7 +114,7 @@ void SceneNode::setWorldTransformChanged()
         markChildren();
 }
 
-void SceneNode::markChildren()
+[[gnu::noinline]] void SceneNode::markChildren() // most nodes have none
 {
     for (const SharedPtr<SceneNode>& child : m_children)
         child->setWorldTransformChanged();
@@ -122,9 +122,12 @@ void SceneNode::markChildren()
 
 void SceneNode::updateLocal() const
 {
-    if (!m_localTransformChanged)
-        return;
+    if (m_localTransformChanged)
+        buildLocal();
+}
 
+void SceneNode::buildLocal() const
+{
     const Matrix3f rotation = toMatrix3(m_rotation);
     m_localTransform = Matrix4f(Vector4f(rotation.columns[0], 0.0f), Vector4f(rotation.columns[1], 0.0f),
                                 Vector4f(rotation.columns[2], 0.0f), Vector4f(m_position, 1.0f));
@@ -139,10 +142,11 @@ void SceneNode::updateLocal() const
     m_localMirrored = (m_scale.x < 0.0f) != ((m_scale.y < 0.0f) != (m_scale.z < 0.0f));
 }
 
-void SceneNode::placeBelow(const Matrix4f& parentWorld, bool parentMirrored, bool parentRigid) const
+[[gnu::always_inline]] inline void SceneNode::placeBelow(const Matrix4f& parentWorld, bool parentMirrored,
+                                                         bool parentRigid) const
 {
     if (m_localTransformChanged)
-        updateLocal();
+        buildLocal();
     if (m_localRigid)
         detail::multiplyAffine(m_worldTransform, parentWorld, m_localTransform);
     else
@@ -153,7 +157,7 @@ void SceneNode::placeBelow(const Matrix4f& parentWorld, bool parentMirrored, boo
     m_normalTransformChanged = true;
 }
 
-void SceneNode::updateAll(const Matrix4f& parentWorld, bool parentMirrored) const
+[[gnu::cold]] void SceneNode::updateAll(const Matrix4f& parentWorld, bool parentMirrored) const
 {
     placeBelow(parentWorld, parentMirrored, false);
 }
@@ -162,14 +166,18 @@ void SceneNode::update() const
 {
     if (!m_worldTransformChanged)
         return;
-    if (!m_parent)
-    {
-        placeBelow(Matrix4f::IDENTITY, false, true);
-        return;
-    }
-    if (m_parent->m_worldTransformChanged)
-        m_parent->update();
-    placeBelow(m_parent->m_worldTransform, m_parent->m_worldMirrored, m_parent->m_worldRigid);
+    const SceneNode* parent = m_parent;
+    if (parent && parent->m_worldTransformChanged)
+        parent->update();
+    if (parent)
+        placeBelow(parent->m_worldTransform, parent->m_worldMirrored, parent->m_worldRigid);
+    else
+        updateRoot();
+}
+
+[[gnu::cold]] void SceneNode::updateRoot() const
+{
+    placeBelow(Matrix4f::IDENTITY, false, true);
 }
 
 void SceneNode::updateNormal() const

@@ -123,6 +123,8 @@ public:
 
 private:
     ORV_LOCAL SharedPtr<SceneNode> takeChild(const SceneNode* child);
+    ORV_LOCAL void buildLocal() const;
+    ORV_LOCAL void updateRoot() const;
     ORV_LOCAL void placeBelow(const Matrix4f& parentWorld, bool parentMirrored, bool parentRigid) const;
     void updateNormal() const;
     ORV_LOCAL void markChildren();
