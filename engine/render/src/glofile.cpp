@@ -383,12 +383,27 @@ bool GloReader::each(uint32_t count, std::vector<Element>& elements, Fields&& el
     return true;
 }
 
+/// As they stand in the file, by way of the stack: a vector would first fill itself with zeros.
+template <class Element>
+bool GloReader::readElements(std::vector<Element>& elements, uint32_t count)
+{
+    Element block[16384 / sizeof(Element)];
+    elements.reserve(count);
+    while (elements.size() < count)
+    {
+        const size_t step = std::min(count - elements.size(), std::size(block));
+        if (!readExactly(block, uint32_t(step * sizeof(Element))))
+            return false;
+        elements.insert(elements.end(), block, block + step);
+    }
+    return true;
+}
+
 bool GloReader::bytes(VertexData& data)
 {
     if (m_chunkSize > remaining() || !isAllocatable(m_chunkSize))
         return fail("vertex buffer read failed in %s");
-    data.bytes.resize(m_chunkSize);
-    return readExactly(data.bytes.data(), m_chunkSize) || fail("vertex buffer read failed in %s");
+    return readElements(data.bytes, m_chunkSize) || fail("vertex buffer read failed in %s");
 }
 
 bool GloReader::indices(IndexData& data)
@@ -396,12 +411,10 @@ bool GloReader::indices(IndexData& data)
     const uint32_t size = m_chunkSize < 4 ? 0 : m_chunkSize - 4;
     if (size > remaining() || !isAllocatable(size))
         return fail("Failed to read indices in %s");
-    data.indices.resize(size / 2);
-    unsigned char* bytes = reinterpret_cast<unsigned char*>(data.indices.data());
-    if (!readExactly(bytes, size / 2 * 2))
+    if (!readElements(data.indices, size / 2))
         return fail("Failed to read indices in %s");
-    for (uint32_t i = 0; std::endian::native != std::endian::little && i < size / 2; ++i)
-        data.indices[i] = uint16_t(bytes[2 * i] | bytes[2 * i + 1] << 8);
+    for (size_t i = 0; std::endian::native != std::endian::little && i < data.indices.size(); ++i)
+        data.indices[i] = uint16_t(data.indices[i] << 8 | data.indices[i] >> 8);
 
     unsigned char spare;
     return size % 2 == 0 || readExactly(&spare, 1) || fail("Failed to read indices in %s");

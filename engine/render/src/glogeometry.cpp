@@ -10,6 +10,8 @@
 
 #include <algorithm>
 #include <cmath>
+#include <cstdint>
+#include <cstring>
 #include <iterator>
 
 namespace orv::detail
@@ -107,12 +109,31 @@ SharedPtr<IndexBuffer> makeIndexBuffer(IndexBufferCache& cache, const PrimitiveS
     return buffer;
 }
 
+/// Eight at a time, by compilers' vector types: this is all that is done for each element of a large scene.
+bool isBelow(const uint16_t* indices, size_t count, uint16_t limit)
+{
+    typedef uint16_t Lanes __attribute__((vector_size(16)));
+    constexpr size_t WIDTH = sizeof(Lanes) / sizeof(uint16_t);
+    Lanes above = {};
+    size_t i = 0;
+    for (; i + WIDTH <= count; i += WIDTH)
+    {
+        Lanes some;
+        std::memcpy(&some, indices + i, sizeof some);
+        above |= Lanes(some >= limit);
+    }
+    bool all = true;
+    for (size_t lane = 0; lane < WIDTH; ++lane)
+        all = all && above[lane] == 0;
+    return all && std::all_of(indices + i, indices + count, [=](uint16_t index) { return index < limit; });
+}
+
 bool isInside(const PrimitiveSet& set, uint32_t vertexCount)
 {
     if (!set.indices)
         return true;
     const std::vector<uint16_t>& indices = set.indices->indices;
-    return std::all_of(indices.begin(), indices.end(), [=](uint16_t index) { return index < vertexCount; });
+    return vertexCount > UINT16_MAX || isBelow(indices.data(), indices.size(), uint16_t(vertexCount));
 }
 
 } // namespace
