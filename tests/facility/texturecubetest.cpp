@@ -154,6 +154,20 @@ TEST_F(TextureCubeTest, whatCannotBeACubeIsRefused)
     EXPECT_EQ(0u, glcalls::count(glGenTextures));
 }
 
+// Fault caught: a black cube kept under its name because there was no memory for one of its faces.
+TEST_F(TextureCubeTest, aRefusedFaceIsTriedAgain)
+{
+    addFlat("room.png", 24, 16, {9, 9, 9});
+    LogCapture log;
+    glcalls::refuseCall(13); // a name, then three for each face
+    EXPECT_FALSE(cache->get("room.png"));
+    EXPECT_EQ("glTexImage2D", glcalls::refusedCall());
+    EXPECT_EQ(1, log.countMessage("OpenGL error 5: Out of memory")) << log.text();
+    const auto cube = cache->get("room.png");
+    ASSERT_TRUE(cube && cube->isComplete());
+    EXPECT_EQ((Rgba{9, 9, 9, 255}), readFaces(*cube)[3]);
+}
+
 // Faults caught: mipmaps made before all faces are there, parameters that leave a cube black, uploads into name 0.
 TEST_F(TextureCubeTest, theSixthFaceCompletes)
 {

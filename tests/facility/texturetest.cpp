@@ -138,7 +138,8 @@ TEST_F(TextureTest, settingsThatWouldTurnATextureBlackAreRefused)
     EXPECT_EQ(GLenum(GL_INVALID_ENUM), glGetError());
 }
 
-// Faults caught: mipmaps that a wrapped texture lacks are never made; setters that reach name 0.
+// Faults caught: mipmaps that a wrapped texture lacks are never made, or taken for made when there was no memory; setters
+// that reach name 0.
 TEST_F(TextureTest, mipmapsOnDemandAndNothingAfterRelease)
 {
     GLuint name = 0;
@@ -146,9 +147,13 @@ TEST_F(TextureTest, mipmapsOnDemandAndNothingAfterRelease)
     glBindTexture(GL_TEXTURE_2D, name);
     glTexImage2D(GL_TEXTURE_2D, 0, GL_RGBA, 4, 4, 0, GL_RGBA, GL_UNSIGNED_BYTE, nullptr);
     const auto texture = cache->create(4, 4, 4.0f, false, name, "wrapped");
+    LogCapture log;
+    glcalls::refuseCall(2); // behind the binding
+    texture->setMinFilter(Filter::LINEAR_MIPMAP_NEAREST);
+    EXPECT_EQ(1, log.countMessage("OpenGL error 5: Out of memory")) << log.text();
     texture->setMinFilter(Filter::LINEAR_MIPMAP_NEAREST);
     texture->setMinFilter(Filter::NEAREST_MIPMAP_NEAREST);
-    EXPECT_EQ(1u, glcalls::count(glGenerateMipmap));
+    EXPECT_EQ(2u, glcalls::count(glGenerateMipmap)) << "the refused one is made up for";
     EXPECT_EQ(Filter::NEAREST_MIPMAP_NEAREST, texture->getMinFilter());
     EXPECT_EQ(64u, getTotalAssetSizeInBytes(*cache));
 

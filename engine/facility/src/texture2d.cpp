@@ -2,6 +2,7 @@
 
 #include "orv/detail/bindingepoch.h"
 #include "orv/log.h"
+#include "orv/renderdevice.h"
 
 #include <GLES2/gl2.h>
 #include <GLES2/gl2ext.h>
@@ -79,7 +80,10 @@ void Texture2D::setMinFilter(FilterMode mode)
         }
         if (!m_hasMipmaps)
         {
+            RenderDevice::getError(false);
             glGenerateMipmap(GL_TEXTURE_2D);
+            if (detail::reportGLError("engine/facility/src/texture2d", __func__, __LINE__))
+                return; // no memory: without them GL would draw black
             m_hasMipmaps = true;
         }
     }

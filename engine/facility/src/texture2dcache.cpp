@@ -95,6 +95,12 @@ SharedPtr<Texture2D> Texture2DCache::create(unsigned width, unsigned height, flo
                                             bool hasMipmaps, unsigned glName, const char* name)
 {
     const auto resource = makeShared<detail::TextureResource>(glName);
+    if (!resource)
+    {
+        glDeleteTextures(1, &glName);
+        detail::bindingsChanged();
+        return {};
+    }
     getResourceCache()->add(resource);
     auto texture = makeShared<Texture2D>(width, height, bytesPerPixel, hasMipmaps, resource, false);
     if (texture)

@@ -42,6 +42,8 @@ void TextureCube::setFace(Face face, const void* pixels)
         return;
 
     enable();
+    if (m_facesSet % FACE_COUNT == 0)
+        RenderDevice::getError(false); // an older error is not taken for that of these faces
     glPixelStorei(GL_UNPACK_ALIGNMENT, 1);
     glTexImage2D(detail::GL_CUBE_FACES[faceIndex], 0, GLint(format), GLsizei(m_width), GLsizei(m_height), 0,
                  format, type, pixels);
@@ -49,7 +51,8 @@ void TextureCube::setFace(Face face, const void* pixels)
     if (m_facesSet % FACE_COUNT == 0)
     {
         sendParameters();
-        checkGLError("engine/facility/src/texturecube", __func__, __LINE__); // no memory for one of the faces
+        if (detail::reportGLError("engine/facility/src/texturecube", __func__, __LINE__))
+            m_facesSet = 0; // no memory for one of the faces, so all six are wanted again
     }
 }
 

@@ -159,7 +159,7 @@ SharedPtr<TextureCube> TextureCubeLoader::load(AssetCache<TextureCube>& cache, c
         return {};
     for (std::size_t i = 0; i < faces.size(); ++i)
         cube->setFace(TextureCube::Face(i), faces[i]->data());
-    return cube;
+    return cube->isComplete() ? cube : SharedPtr<TextureCube>();
 }
 
 } // namespace orv

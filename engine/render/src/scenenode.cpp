@@ -199,6 +199,8 @@ void SceneNode::updateMotionData()
         m_lastWorldTransform.reset(new (std::nothrow) Matrix4f);
     if (m_lastWorldTransform)
         *m_lastWorldTransform = m_worldTransform;
+    else
+        detail::logNoMemory(className());
 }
 
 [[gnu::cold]] void SceneNode::setParent(const SharedPtr<SceneNode>& parent, bool preserveWorldTransform)

@@ -100,10 +100,15 @@ Text::Text(AssetCachePool& pool, const Font::Ptr& font, const Colour4f& colour)
         return;
     }
     m_overlay = makeAppearance();
-    m_overlay->setDepthTestEnabled(false);
-    m_overlay->addProperty<Matrix4f>("T_MODEL_VIEW_PROJECTION", 1);
-    m_projection = SharedPtr<ShaderUniform<Matrix4f>>(static_cast<ShaderUniform<Matrix4f>*>(
-        m_overlay->getPropertyUniform("T_MODEL_VIEW_PROJECTION").get()));
+    if (m_overlay)
+    {
+        m_overlay->setDepthTestEnabled(false);
+        m_overlay->addProperty<Matrix4f>("T_MODEL_VIEW_PROJECTION", 1);
+        m_projection = SharedPtr<ShaderUniform<Matrix4f>>(static_cast<ShaderUniform<Matrix4f>*>(
+            m_overlay->getPropertyUniform("T_MODEL_VIEW_PROJECTION").get()));
+    }
+    if (!m_projection)
+        m_font = nullptr; // no memory, as the log said
 }
 
 Text::~Text() = default;
@@ -201,13 +206,15 @@ SharedPtr<Solid> Text::createSolid(AssetCachePool& pool) const
     if (m_font->getTexture()->hasMipmaps())
         m_font->getTexture()->setMinFilter(TextureParameters::FilterMode::LINEAR_MIPMAP_LINEAR);
     const SharedPtr<Appearance> appearance = makeAppearance();
+    if (!appearance)
+        return {};
     SharedPtr<Solid> solid;
     for (std::size_t first = 0; first < m_glyphs.size(); first += MAX_GLYPHS)
     {
         const SharedPtr<Mesh> mesh = makeMesh(first, &pool);
-        if (!mesh)
+        const auto part = mesh ? makeShared<Solid>(mesh, appearance) : SharedPtr<Solid>();
+        if (!part)
             return {};
-        const auto part = makeShared<Solid>(mesh, appearance);
         if (solid)
             part->setParent(solid, false);
         else
@@ -220,6 +227,8 @@ SharedPtr<Solid> Text::createSolid(AssetCachePool& pool) const
 SharedPtr<Appearance> Text::makeAppearance() const
 {
     const auto appearance = makeShared<Appearance>();
+    if (!appearance)
+        return {};
     appearance->setShaderProgram(m_program);
     appearance->setBlendFactors(BlendFactor::SRC_ALPHA, BlendFactor::ONE, BlendFactor::ONE_MINUS_SRC_ALPHA,
                                 BlendFactor::ONE_MINUS_SRC_ALPHA);
@@ -243,7 +252,10 @@ SharedPtr<Mesh> Text::makeMesh(std::size_t firstGlyph, AssetCachePool* pool) con
     const IndexBuffer::Ptr indices =
         pool ? pool->getIndexBufferCache()->create(primitive, unsigned(6 * count), nullptr, nullptr)
              : makeShared<IndexBuffer>(primitive, int(6 * count), true, nullptr);
-    if (!indices || !indices->getIndices() || positions->getSizeInBytes() == 0 || uvs->getSizeInBytes() == 0)
+    const VertexBuffer::Ptr vertices =
+        pool ? pool->getVertexBufferCache()->create(nullptr) : makeShared<VertexBuffer>(nullptr);
+    if (!indices || !indices->getIndices() || !vertices || !positions || positions->getSizeInBytes() == 0 ||
+        !uvs || uvs->getSizeInBytes() == 0)
     {
         ORV_LOG_ERROR("No memory for a text of %u glyphs", unsigned(count));
         return {};
@@ -273,8 +285,6 @@ SharedPtr<Mesh> Text::makeMesh(std::size_t firstGlyph, AssetCachePool* pool) con
 
     using Format = VertexBuffer::AttribFormat;
     const auto usage = pool ? VertexBuffer::AttribUsage::GL_BUFFER : VertexBuffer::AttribUsage::CLIENT_MEMORY;
-    const VertexBuffer::Ptr vertices =
-        pool ? pool->getVertexBufferCache()->create(nullptr) : makeShared<VertexBuffer>(nullptr);
     vertices->addAttrib(positions, "a_position", Format::FLOAT, usage, false);
     vertices->addAttrib(uvs, "a_uv0", Format::FLOAT, usage, false);
     if (!pool)
@@ -294,8 +304,9 @@ void Text::makeSolids()
     m_solids.clear();
     for (std::size_t first = 0; first < m_glyphs.size(); first += MAX_GLYPHS)
     {
-        if (const SharedPtr<Mesh> mesh = makeMesh(first, nullptr))
-            m_solids.push_back(makeShared<Solid>(mesh, m_overlay));
+        const SharedPtr<Mesh> mesh = makeMesh(first, nullptr);
+        if (const SharedPtr<Solid> solid = mesh ? makeShared<Solid>(mesh, m_overlay) : SharedPtr<Solid>())
+            m_solids.push_back(solid);
     }
 }
 

@@ -29,7 +29,7 @@ public:
     SharedPtr<Texture2D> create(unsigned width, unsigned height, Texture::Format format, Texture::Type type,
                                 const void* pixels, const char* name);
 
-    /// Takes over a GL texture that exists already.
+    /// Takes over a GL texture that exists already; without memory for it, deletes it.
     /// @param bytesPerPixel  between 0 and 1 for a compressed texture.
     SharedPtr<Texture2D> create(unsigned width, unsigned height, float bytesPerPixel, bool hasMipmaps,
                                 unsigned glName, const char* name);

@@ -42,9 +42,12 @@ public:
 
     /// Uploads one face. Faces must be square (logged otherwise). Each call counts, whatever its face: the
     /// sixth completes the cube. A size that is not a power of two, or a depth format, has no mipmaps and
-    /// clamps.
+    /// clamps. Where GL has no memory for one of the six (logged) all six are wanted again.
     /// @param pixels  width x height pixels without padding, top row first; null leaves them undefined.
     void setFace(Face face, const void* pixels);
+
+    /// Whether GL has all six faces; otherwise it draws the cube black.
+    bool isComplete() const { return getId() != 0 && m_facesSet >= FACE_COUNT; }
 
     /// Takes effect when the cube is complete, at once if it is. A magnification other than NEAREST or LINEAR
     /// and values outside their enums are refused (logged) and nothing changes.

@@ -1,0 +1,34 @@
+#pragma once
+
+#include "glcalls/glcalls.h"
+
+/// Makes the driver below look and refuse like one of the weaker ones that OpenGL ES 2.0 allows.
+namespace glcalls
+{
+
+/// What a device offers. Where the driver below has less, that remains.
+struct Device
+{
+    const char* name = "";
+    int vertexUniformVectors = 0; ///< 0: as many as the driver has
+    int textureUnits = 0;        ///< of fragments and in all, none of them in vertex shaders; 0: the driver's
+    bool hasNpotTextures = true; ///< sizes that are no power of two with mipmaps and repetition
+    bool hasEtc1 = true;
+    bool hasPackedDepthStencil = true;
+    bool hasDepthTextures = true;
+    bool hasProgramBinaries = true;
+    bool hasFragmentHighp = true;
+};
+
+/// Each lack on its own, and then all together; of texture units and vertex uniform vectors the fewest that
+/// OpenGL ES 2.0 allows.
+extern const Device WEAK_DEVICES[9];
+
+/// Until reset(), the driver answers questions as this device would, and refuses what the device lacks:
+/// programs of too many uniform vectors (packed as the shading language's appendix A says) or samplers fail to
+/// link, fragment shaders that say highp fail to compile, textures that the device calls incomplete are black,
+/// and everything else ends in the GL error that the standard names for it. What the device has works as
+/// before; mediump has the precision that the driver gives it. Begin before the first GL object is made.
+void emulate(const Device& device);
+
+} // namespace glcalls
