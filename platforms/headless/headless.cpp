@@ -155,12 +155,14 @@ bool makeAnywhere(const Options& options, Made& made, std::string& error)
 std::vector<uint8_t> readResolved(int width, int height)
 {
     GLint boundTexture = 0;
+    GLint alphaBits = 0; // a window's surface may have none, and what it lacks cannot be copied
     GLuint texture = 0;
     GLuint framebuffer = 0;
     glGetIntegerv(GL_TEXTURE_BINDING_2D, &boundTexture);
     glGenTextures(1, &texture);
     glBindTexture(GL_TEXTURE_2D, texture);
-    glCopyTexImage2D(GL_TEXTURE_2D, 0, GL_RGBA, 0, 0, width, height, 0);
+    glGetIntegerv(GL_ALPHA_BITS, &alphaBits);
+    glCopyTexImage2D(GL_TEXTURE_2D, 0, alphaBits > 0 ? GL_RGBA : GL_RGB, 0, 0, width, height, 0);
     glGenFramebuffers(1, &framebuffer);
     glBindFramebuffer(GL_FRAMEBUFFER, framebuffer);
     glFramebufferTexture2D(GL_FRAMEBUFFER, GL_COLOR_ATTACHMENT0, GL_TEXTURE_2D, texture, 0);
@@ -224,17 +226,7 @@ void Context::makeNoneCurrent()
 
 std::vector<uint8_t> Context::readPixels() const
 {
-    if (!isCurrent())
-        return {};
-    GLint bound = 0;
-    GLint samples = 0;
-    glGetIntegerv(GL_FRAMEBUFFER_BINDING, &bound);
-    glBindFramebuffer(GL_FRAMEBUFFER, 0);
-    glGetIntegerv(GL_SAMPLES, &samples);
-    std::vector<uint8_t> pixels =
-        samples > 0 ? readResolved(m_width, m_height) : readFramebuffer(0, 0, m_width, m_height);
-    glBindFramebuffer(GL_FRAMEBUFFER, GLuint(bound));
-    return pixels;
+    return isCurrent() ? readSurface(m_width, m_height) : std::vector<uint8_t>();
 }
 
 std::string Context::describe() const
@@ -245,6 +237,19 @@ std::string Context::describe() const
         return std::string(found ? reinterpret_cast<const char*>(found) : "unknown");
     };
     return isCurrent() ? text(GL_RENDERER) + ", " + text(GL_VERSION) : "not current";
+}
+
+std::vector<uint8_t> readSurface(int width, int height)
+{
+    GLint bound = 0;
+    GLint samples = 0;
+    glGetIntegerv(GL_FRAMEBUFFER_BINDING, &bound);
+    glBindFramebuffer(GL_FRAMEBUFFER, 0);
+    glGetIntegerv(GL_SAMPLES, &samples);
+    std::vector<uint8_t> pixels =
+        samples > 0 ? readResolved(width, height) : readFramebuffer(0, 0, width, height);
+    glBindFramebuffer(GL_FRAMEBUFFER, GLuint(bound));
+    return pixels;
 }
 
 std::vector<uint8_t> readFramebuffer(int x, int y, int width, int height)

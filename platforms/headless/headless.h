@@ -62,6 +62,9 @@ private:
     int m_height = 0;
 };
 
+/// Reads the lower left of the current context's surface, whoever made it; see Context::readPixels().
+std::vector<uint8_t> readSurface(int width, int height);
+
 /// Reads from the bound framebuffer of the current context.
 /// @param x,y  lower left corner, as GL counts.
 /// @return width x height x 4 bytes RGBA, top row first.

@@ -2,10 +2,34 @@
 
 #include <cerrno>
 #include <cstdio>
+#include <cstdlib>
 #include <cstring>
 
 #include <unistd.h>
+#include <zlib.h>
 
+namespace
+{
+
+/// In place of stb's own, which takes four times as long and leaves more.
+/// @return null, or to be freed.
+unsigned char* compressForPng(unsigned char* data, int size, int* compressedSize, int)
+{
+    constexpr int LEVEL = 4;
+    uLongf room = compressBound(uLong(size));
+    auto* compressed = static_cast<unsigned char*>(std::malloc(room));
+    if (compressed && compress2(compressed, &room, data, uLong(size), LEVEL) == Z_OK)
+    {
+        *compressedSize = int(room);
+        return compressed;
+    }
+    std::free(compressed);
+    return nullptr;
+}
+
+} // namespace
+
+#define STBIW_ZLIB_COMPRESS compressForPng
 #define STB_IMAGE_WRITE_IMPLEMENTATION
 #define STB_IMAGE_WRITE_STATIC
 #pragma GCC diagnostic push
@@ -15,6 +39,14 @@
 
 namespace headless
 {
+
+namespace
+{
+
+constexpr int PNG_FILTER =
+    3; // average; trying all of them on each line takes longer than what it saves is worth
+
+} // namespace
 
 bool writePng(const std::string& path, int width, int height, const uint8_t* rgba, std::string& error)
 {
@@ -28,6 +60,7 @@ bool writePng(const std::string& path, int width, int height, const uint8_t* rgb
 
     const auto write = [](void* context, void* data, int size)
     { std::fwrite(data, 1, size_t(size), static_cast<std::FILE*>(context)); };
+    stbi_write_force_png_filter = PNG_FILTER;
     errno = 0;
     bool isWritten = stbi_write_png_to_func(write, file, width, height, 4, rgba, width * 4) != 0;
     isWritten = !std::ferror(file) && isWritten;

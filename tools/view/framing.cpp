@@ -1,187 +1,166 @@
 #include "framing.h"
 
-#include "scenebounds.h"
+#include "solidvisitor.h"
 #include "stage.h"
-
-#include "headless/headless.h"
-
-#include "orv/sceneutil.h"
 
 #include <algorithm>
 #include <cmath>
 
+namespace view
+{
+
+using orv::Matrix4f;
 using orv::Vector3f;
 
 namespace
 {
 
-const Vector3f VIEW_DIRECTION = normalize(Vector3f(0.5f, 0.4f, 1.0f)); // towards the eye
-const orv::Anglef FIELD_OF_VIEW = orv::Anglef::fromDegrees(40.0f);
+const Vector3f VIEW_DIRECTION(0.5f, 0.4f, 1.0f); // towards the eye
 
-const float FILLED_SHARE = 0.9f; // of the view, by the scene
-const float GOOD_ENOUGH = 0.02f; // off the centre and off that share together
-const int MAX_ROUNDS = 8;
-const size_t MAX_TIMES = 8;
-const int MAX_EDGE = 256; // pixels of the views that are only looked at here
+constexpr float FILLED_SHARE = 0.9f;  // of the view, by the scene
+constexpr float GOOD_ENOUGH = 0.005f; // off the centre and off that share together
+constexpr int MAX_ROUNDS = 8;
+constexpr size_t MAX_SHOTS = 8;
 
-/// No material is likely to have it; seen where the scene is not.
-const uint8_t EMPTY[] = {255, 0, 254};
-
-/// Where the scene shows in the view, from -1 to 1 from left to right and from bottom to top.
-struct Coverage
+/// A box along axes around everything that was added.
+struct Extent
 {
-    float left = 1.0f;
-    float right = -1.0f;
-    float bottom = 1.0f;
-    float top = -1.0f;
+    Vector3f lowest;
+    Vector3f highest;
+    bool isEmpty = true;
 
-    bool isEmpty() const { return left > right; }
-    float centreX() const { return (left + right) / 2.0f; }
-    float centreY() const { return (bottom + top) / 2.0f; }
-    float share() const { return std::max(right - left, top - bottom) / 2.0f; }
+    void add(const Vector3f& place)
+    {
+        if (!std::isfinite(place.x + place.y + place.z))
+            return;
+        for (int axis = 0; axis < 3; ++axis)
+        {
+            lowest[axis] = isEmpty ? place[axis] : std::min(lowest[axis], place[axis]);
+            highest[axis] = isEmpty ? place[axis] : std::max(highest[axis], place[axis]);
+        }
+        isEmpty = false;
+    }
+
+    Vector3f centre() const { return (lowest + highest) * 0.5f; }
+    float radius() const { return length(highest - lowest) * 0.5f; } ///< of the sphere around the box
 };
 
-/// Finds the view step by step. Bounding spheres lie around the meshes' origins, which may be far from their
-/// middles, so they give the first views only; the others come from where the scene shows in those.
+/// Finds the view step by step: what is nearer is larger, so that each step changes what the next one has to fit.
 class Framer
 {
 public:
-    Framer(Stage& stage, const std::vector<float>& times, int width, int height);
+    Framer(Stage& stage, Player& player, const std::vector<Shot>& shots, int width, int height);
 
-    void frame();
+    Orbit frame();
 
 private:
-    Coverage findCoverage() const;
-    void lookFrom(const Vector3f& direction, float distance);
-    void findMiddle();
-    void fillView();
-
-    /// Half of what the view spans at the middle, in world units.
-    float halfWidth(float shorterHalf) const { return shorterHalf * std::max(m_aspect, 1.0f); }
-    float halfHeight(float shorterHalf) const { return shorterHalf * std::max(1.0f / m_aspect, 1.0f); }
+    template <class Operation>
+    void forEachPlace(const Shot& shot, const Operation& operation);
+    Extent findCoverage();
 
     Stage& m_stage;
-    std::vector<float> m_times;
-    int m_width;
-    int m_height;
-    float m_aspect;
-    SceneBounds m_bounds;
-    float m_radius; // around everything, above 0
-    Vector3f m_middle;
-    orv::Camera::Ptr m_camera = orv::makeShared<orv::Camera>();
+    Player& m_player;
+    std::vector<Shot> m_shots;
+    bool m_goesAround = false;
+    float m_halfWidth; ///< of the view, at a distance of 1
+    float m_halfHeight;
+    Orbit m_orbit;
+    std::vector<Vector3f> m_places; ///< of one solid; kept for its memory
 };
 
-Framer::Framer(Stage& stage, const std::vector<float>& times, int width, int height)
+Framer::Framer(Stage& stage, Player& player, const std::vector<Shot>& shots, int width, int height)
     : m_stage(stage)
-    , m_width(std::max(1, width / (1 + std::max(width, height) / MAX_EDGE)))
-    , m_height(std::max(1, height / (1 + std::max(width, height) / MAX_EDGE)))
-    , m_aspect(float(m_width) / float(m_height))
+    , m_player(player)
 {
-    const size_t step = (times.size() + MAX_TIMES - 1) / MAX_TIMES;
-    for (size_t i = 0; i < times.size(); ++i)
+    const float aspect = float(width) / float(height);
+    const float spread = std::tan(m_orbit.fieldOfView.radians() / 2.0f);
+    m_halfWidth = spread * std::max(aspect, 1.0f);
+    m_halfHeight = spread * std::max(1.0f / aspect, 1.0f);
+
+    const size_t step = (shots.size() + MAX_SHOTS - 1) / MAX_SHOTS;
+    for (size_t i = 0; i < shots.size(); ++i)
     {
-        stage.setTime(times[i]);
-        m_bounds.add(stage.getScene());
-        if (i % step == 0 || i + 1 == times.size())
-            m_times.push_back(times[i]);
+        if (i % step == 0 || i + 1 == shots.size())
+            m_shots.push_back(shots[i]);
+        m_goesAround = m_goesAround || shots[i].turn != 0.0f;
     }
-    m_radius = std::max(m_bounds.radius(), 1e-6f);
-    m_middle = m_bounds.centre();
-    stage.addCamera(m_camera);
-    stage.draw(times.front(), width, height); // a mirror's picture keeps the size of the first frame
+    Extent box;
+    for (const Shot& shot : m_shots)
+        forEachPlace(shot, [&box](const Vector3f& place) { box.add(place); });
+    m_orbit.radius = std::max(box.radius(), 1e-6f);
+    m_orbit.centre = box.centre();
+    m_orbit.middle = m_orbit.centre;
+    m_orbit.setDirection(VIEW_DIRECTION);
 }
 
-Coverage Framer::findCoverage() const
+template <class Operation>
+void Framer::forEachPlace(const Shot& shot, const Operation& operation)
 {
-    Coverage seen;
-    for (float time : m_times)
+    m_player.seek(shot.time);
+    forEachSolid(m_stage.getScene(),
+                 [&](orv::Solid& solid)
+                 {
+                     m_stage.getMeshes().placeVertices(solid, m_places);
+                     for (const Vector3f& place : m_places)
+                         operation(place);
+                 });
+}
+
+/// Where the scene shows in the view: from -1 to 1 from left to right and from bottom to top.
+Extent Framer::findCoverage()
+{
+    Extent seen;
+    for (const Shot& shot : m_shots)
     {
-        m_stage.draw(time, m_width, m_height);
-        const std::vector<uint8_t> pixels = headless::readFramebuffer(0, 0, m_width, m_height);
-        for (int i = 0; i < m_width * m_height; ++i)
-        {
-            if (std::equal(EMPTY, EMPTY + 3, &pixels[size_t(i) * 4]))
-                continue;
-            const int x = i % m_width;
-            const int y = m_height - 1 - i / m_width;
-            seen.left = std::min(seen.left, float(x) / float(m_width) * 2.0f - 1.0f);
-            seen.right = std::max(seen.right, float(x + 1) / float(m_width) * 2.0f - 1.0f);
-            seen.bottom = std::min(seen.bottom, float(y) / float(m_height) * 2.0f - 1.0f);
-            seen.top = std::max(seen.top, float(y + 1) / float(m_height) * 2.0f - 1.0f);
-        }
+        Orbit orbit = m_orbit;
+        orbit.yaw += shot.turn;
+        const Vector3f eye = orbit.getEye();
+        const Matrix4f axes = lookAt(eye, orbit.middle, Vector3f::Y_AXIS);
+        const Vector3f right = axes[0].xyz() / m_halfWidth;
+        const Vector3f up = axes[1].xyz() / m_halfHeight;
+        const Vector3f back = axes[2].xyz();
+        const float nearest = orbit.distance / 100.0f; // where a camera in this place begins to see
+        forEachPlace(shot,
+                     [&](const Vector3f& place)
+                     {
+                         const Vector3f seenFrom = place - eye;
+                         const float depth = std::max(-dot(seenFrom, back), nearest);
+                         seen.add(Vector3f(dot(seenFrom, right) / depth, dot(seenFrom, up) / depth, 0.0f));
+                     });
+    }
+    if (m_goesAround && !seen.isEmpty) // what it goes around stays in the middle
+    {
+        seen.highest.x = std::max(seen.highest.x, -seen.lowest.x);
+        seen.lowest.x = -seen.highest.x;
     }
     return seen;
 }
 
-void Framer::lookFrom(const Vector3f& direction, float distance)
+Orbit Framer::frame()
 {
-    const Vector3f eye = m_middle + direction * distance;
-    const float depth = dot(eye - m_bounds.centre(), direction);
-    m_camera->setNear(std::max(depth - m_radius, distance / 100.0f));
-    m_camera->setFar(std::max(depth + m_radius, distance * 1.01f));
-    m_camera->setPosition(eye);
-    orv::point(*m_camera, m_middle);
-}
-
-/// Moves the middle to where the scene is, its depth included, by two parallel projections: in the second one,
-/// turned by 45 degrees about the view's upward axis, depth shows as a shift to the side.
-void Framer::findMiddle()
-{
-    m_camera->setProjectionType(orv::Camera::ProjectionType::ORTHOGRAPHIC);
-    m_camera->setWidth(2.0f * halfWidth(m_radius));
-
-    lookFrom(VIEW_DIRECTION, 2.0f * m_radius);
-    const Coverage straight = findCoverage();
-    const Vector3f right = m_camera->getWorldTransform()[0].xyz();
-    const Vector3f up = m_camera->getWorldTransform()[1].xyz();
-    if (!straight.isEmpty())
-    {
-        m_middle += right * (straight.centreX() * halfWidth(m_radius)) +
-                    up * (straight.centreY() * halfHeight(m_radius));
-        const Vector3f turned = normalize(VIEW_DIRECTION + right);
-        lookFrom(turned, 2.0f * m_radius);
-        const Coverage sideways = findCoverage();
-        const Vector3f turnedRight = m_camera->getWorldTransform()[0].xyz();
-        if (!sideways.isEmpty())
-            m_middle += VIEW_DIRECTION *
-                        (sideways.centreX() * halfWidth(m_radius) / dot(turnedRight, VIEW_DIRECTION));
-    }
-    m_camera->setProjectionType(orv::Camera::ProjectionType::PERSPECTIVE);
-}
-
-void Framer::fillView()
-{
-    const float spread = std::tan(FIELD_OF_VIEW.radians() / 2.0f);
-    float distance = m_radius / std::sin(FIELD_OF_VIEW.radians() / 2.0f);
-    m_camera->setFieldOfView(FIELD_OF_VIEW);
-    lookFrom(VIEW_DIRECTION, distance);
+    m_orbit.distance = m_orbit.radius / std::sin(m_orbit.fieldOfView.radians() / 2.0f);
     for (int round = 0; round < MAX_ROUNDS; ++round)
     {
-        const Coverage seen = findCoverage();
-        const float off = std::abs(seen.centreX()) + std::abs(seen.centreY());
-        if (seen.isEmpty() || off + std::abs(seen.share() - FILLED_SHARE) < GOOD_ENOUGH)
-            return;
-        const orv::Matrix4f& toWorld = m_camera->getWorldTransform();
-        m_middle += toWorld[0].xyz() * (seen.centreX() * halfWidth(distance * spread)) +
-                    toWorld[1].xyz() * (seen.centreY() * halfHeight(distance * spread));
-        distance *= seen.share() / FILLED_SHARE;
-        lookFrom(VIEW_DIRECTION, distance);
+        const Extent seen = findCoverage();
+        const Vector3f off = seen.centre();
+        const float share = std::max(seen.highest.x - seen.lowest.x, seen.highest.y - seen.lowest.y) / 2.0f;
+        if (!(share > 0.0f) ||
+            std::abs(off.x) + std::abs(off.y) + std::abs(share - FILLED_SHARE) < GOOD_ENOUGH)
+            break;
+        const Matrix4f axes = lookAt(m_orbit.getEye(), m_orbit.middle, Vector3f::Y_AXIS);
+        const Vector3f up = m_goesAround ? Vector3f::Y_AXIS : axes[1].xyz();
+        m_orbit.middle += axes[0].xyz() * (off.x * m_halfWidth * m_orbit.distance) +
+                          up * (off.y * m_halfHeight * m_orbit.distance);
+        m_orbit.distance *= share / FILLED_SHARE;
     }
-}
-
-void Framer::frame()
-{
-    findMiddle();
-    fillView();
+    return m_orbit;
 }
 
 } // namespace
 
-void frameScene(Stage& stage, const std::vector<float>& times, int width, int height)
+Orbit frameScene(Stage& stage, Player& player, const std::vector<Shot>& shots, int width, int height)
 {
-    const orv::Colour4f background = stage.getBackground();
-    stage.setBackground(
-        orv::Colour4f(float(EMPTY[0]) / 255.0f, float(EMPTY[1]) / 255.0f, float(EMPTY[2]) / 255.0f, 1.0f));
-    Framer(stage, times, width, height).frame();
-    stage.setBackground(background);
+    return Framer(stage, player, shots, width, height).frame();
 }
+
+} // namespace view

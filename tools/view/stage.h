@@ -1,29 +1,57 @@
 #pragma once
 
-#include "orv/animationcontroller.h"
-#include "orv/assetcachepool.h"
+#include "player.h"
+#include "scenemeshes.h"
+#include "studio.h"
+
 #include "orv/camera.h"
 #include "orv/colour.h"
 #include "orv/glo.h"
 #include "orv/light.h"
 #include "orv/renderblock.h"
-#include "orv/rendercontext.h"
-#include "orv/renderer.h"
 #include "orv/scenenode.h"
 
 #include <memory>
 #include <string>
+#include <vector>
 
-/// A scene file, loaded, with all that it takes to draw it into the current GL context.
+namespace view
+{
+
+/// What the suffix of a file says that it is.
+enum class FileKind
+{
+    SCENE,    ///< .glo
+    MATERIAL, ///< .ap
+    PROGRAM,  ///< .sp
+    MODEL     ///< anything else, to be converted
+};
+
+FileKind getFileKind(const std::string& path);
+
+/// What to show: a scene file, or a material (.ap) or shader program (.sp), which is shown on a ball.
+struct SceneFile
+{
+    struct Dressing
+    {
+        std::string material; ///< of the scene
+        std::string path;     ///< of an appearance file that is put over it
+    };
+
+    std::string path;
+    std::vector<Dressing> dressings;
+};
+
+/// A scene, loaded, with all that it takes to draw it into the current GL context.
 ///
 /// A scene without lights gets two of its own. One with lights is left as it is through its own cameras;
-/// through another one, which those lights may not reach, a weak light comes along with the camera.
+/// through the free one, which those lights may not reach, a weak light comes along with the camera.
 class Stage
 {
 public:
-    /// @param path   a scene file; textures and programs are looked for beside it.
-    /// @param error  set to "path: reason" on failure; the engine's log has the details.
-    static std::unique_ptr<Stage> load(const std::string& path, std::string& error);
+    /// @param studio  has to stay; textures and programs are looked for beside the files.
+    /// @param error   set to "path: reason" on failure; the engine's log has the details.
+    static std::unique_ptr<Stage> load(Studio& studio, const SceneFile& file, std::string& error);
 
     /// Lets go of everything while the GL context is still there.
     ~Stage();
@@ -31,37 +59,63 @@ public:
     Stage(const Stage&) = delete;
     Stage& operator=(const Stage&) = delete;
 
-    /// Looks through a camera of the file.
-    /// @return false, with the cameras that there are in error, if none has that name.
-    bool chooseCamera(const std::string& name, std::string& error);
+    /// The cameras of the file. @param index  0 up to, without, the count.
+    int getCameraCount() const { return m_glo ? m_glo->getCameraCount() : 0; }
+    std::string getCameraName(int index) const { return m_glo->getCamera(index)->getName(); }
+    void useCamera(int index);
+    /// @return its index; -1, with the cameras that there are in error, if none has that name.
+    int findCamera(const std::string& name, std::string& error) const;
 
-    /// Looks through a camera that is not of the file; it becomes part of the scene.
-    void addCamera(const orv::Camera::Ptr& camera);
+    /// The one that is not of the file, to be put anywhere in the world. Looked through at first.
+    orv::Camera& getFreeCamera() { return *m_freeCamera; }
+    void useFreeCamera();
+
+    orv::Camera& getCamera() { return *m_block->getCamera(); } ///< looked through now
 
     /// What shows where the scene does not; a light grey at first.
     const orv::Colour4f& getBackground() const { return m_block->getBackground().getColour(); }
     void setBackground(const orv::Colour4f& colour) { m_block->setBackgroundColour(colour); }
 
-    /// Puts the animation into its state at a time.
-    void setTime(float time);
+    /// All movement of the file.
+    const orv::SharedPtr<orv::Animation>& getAnimation() const { return m_animation; }
 
-    /// Sets the time, clears and draws a viewport of that size, and waits until it is done.
-    void draw(float time, int width, int height);
+    /// The whole time line, by the name of an animation that lasts as long or else "all", and the file's other
+    /// animations.
+    const std::vector<Clip>& getClips() const { return m_clips; }
 
-    float getStart() const { return m_animation->getStart(); } ///< seconds
-    float getEnd() const { return m_animation->getEnd(); }
+    /// Whether shaders may show other things as time goes by.
+    bool usesShaderTime() const { return m_usesShaderTime; }
+
+    /// What TIME is in shaders, in seconds.
+    void setShaderTime(float time) { m_block->update(time); }
+
+    /// Clears and draws a viewport of that size at the lower left.
+    void draw(int width, int height);
+
     orv::SceneNode& getScene() { return *m_scene; }
+    const SceneMeshes& getMeshes() const { return m_meshes; }
 
 private:
-    Stage() = default;
+    explicit Stage(Studio& studio);
+
+    bool loadScene(const std::string& path, const std::string& name);
+    bool loadBall(const std::string& name, FileKind kind);
+    bool dress(const SceneFile::Dressing& dressing, std::string& error);
+    void findClips();
 
     /// Adds a light from far away, on the +z side of parent.
     orv::Light::Ptr addLight(const orv::SceneNode::Ptr& parent, float intensity, float ambientLevel);
 
-    orv::RenderContext::Ptr m_context;
-    orv::SharedPtr<orv::AssetCachePool> m_pool;
+    Studio& m_studio;
     orv::SceneNode::Ptr m_scene;
-    orv::Glo::Ptr m_glo;
+    orv::Glo::Ptr m_glo; ///< empty for a material
+    SceneMeshes m_meshes;
     orv::SharedPtr<orv::RenderBlock> m_block;
-    orv::SharedPtr<orv::AnimationController> m_animation;
+    orv::SharedPtr<orv::Animation> m_animation;
+    std::vector<Clip> m_clips;
+    orv::Camera::Ptr m_freeCamera;
+    orv::Light::Ptr m_cameraLight; ///< the free camera's; empty where the scene needs none
+    bool m_usesShaderTime = false;
 };
+
+} // namespace view

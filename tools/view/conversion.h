@@ -1,0 +1,46 @@
+#pragma once
+
+#include <memory>
+#include <string>
+#include <vector>
+
+namespace view
+{
+
+/// A model that is no scene file, and the scene that orv-convert makes of it in a folder of its own, which goes
+/// away with this object.
+class Conversion
+{
+public:
+    /// Finds the converter: beside this program, where a build puts it, or on the PATH; and makes the folder.
+    /// @param arguments  further ones for the converter.
+    static std::unique_ptr<Conversion> create(const std::string& model, std::vector<std::string> arguments,
+                                              std::string& error);
+    ~Conversion();
+
+    Conversion(const Conversion&) = delete;
+    Conversion& operator=(const Conversion&) = delete;
+
+    /// Converts the model as it is now. The converter's messages go to standard error.
+    /// @return false, with the scene as it was, if it cannot be converted.
+    bool run(std::string& error);
+
+    const std::string& getScenePath() const { return m_scene; }
+
+    /// Whether a path is that of something in the folder.
+    bool isMade(const std::string& path) const
+    {
+        return path.compare(0, m_folder.size() + 1, m_folder + "/") == 0;
+    }
+
+private:
+    Conversion() = default;
+
+    std::string m_program;
+    std::string m_model;
+    std::vector<std::string> m_arguments;
+    std::string m_folder;
+    std::string m_scene;
+};
+
+} // namespace view

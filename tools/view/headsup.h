@@ -1,0 +1,64 @@
+#pragma once
+
+#include "orv/assetcachepool.h"
+#include "orv/background.h"
+#include "orv/font.h"
+#include "orv/rendercontext.h"
+#include "orv/text.h"
+
+#include <memory>
+#include <string>
+#include <vector>
+
+namespace view
+{
+
+/// What is written over the picture: lines at the top, a message at the bottom, and a table over all that.
+class HeadsUp
+{
+public:
+    struct Row
+    {
+        const char* left;
+        const char* right;
+    };
+
+    /// @param context  of the picture; shared.
+    /// @param font     a TrueType file.
+    /// @param size     of the writing in pixels.
+    /// @return empty, after the log has told why, if the font cannot be used.
+    static std::unique_ptr<HeadsUp> create(const orv::RenderContext::Ptr& context, const std::string& font,
+                                           unsigned size);
+
+    ~HeadsUp();
+    HeadsUp(const HeadsUp&) = delete;
+    HeadsUp& operator=(const HeadsUp&) = delete;
+
+    /// @return whether that is something else than before, so that it has to be drawn.
+    bool setLines(const std::string& lines);
+    bool setMessage(const std::string& message);
+    void setTable(const std::vector<Row>& rows); ///< empty for none
+
+    /// Draws over a viewport of that size. Only what has changed since is laid out anew.
+    void draw(int width, int height);
+
+private:
+    HeadsUp() = default;
+    void layOut();
+    void write(const char* text, float x, float y);
+
+    orv::RenderContext::Ptr m_context;
+    orv::SharedPtr<orv::AssetCachePool> m_pool; ///< of its own: that of the scene comes and goes
+    orv::Background m_panel;
+    orv::Font::Ptr m_font;
+    orv::Text::Ptr m_ink;
+    orv::Text::Ptr m_shadow; ///< around it, so that it can be read on anything
+    std::string m_lines;
+    std::string m_message;
+    std::vector<Row> m_rows;
+    int m_width = 0;
+    int m_height = 0;
+    bool m_changed = true;
+};
+
+} // namespace view

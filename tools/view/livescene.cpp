@@ -1,0 +1,89 @@
+#include "livescene.h"
+
+#include "companions.h"
+#include "loadlog.h"
+#include "scenesize.h"
+
+namespace view
+{
+
+LiveScene::LiveScene(const SceneFile& file, Conversion* conversion) : m_file(file), m_conversion(conversion)
+{
+    if (!conversion)
+        return;
+    m_model = file.path;
+    m_file.path = conversion->getScenePath();
+}
+
+bool LiveScene::load(std::string& error)
+{
+    std::unique_ptr<Stage> stage = loadStage(error);
+    if (!stage)
+        return false;
+    takeStage(std::move(stage));
+    watchFiles(true);
+    return true;
+}
+
+std::unique_ptr<Stage> LiveScene::loadStage(std::string& error)
+{
+    m_studio.forgetAssets();
+    loadlog::reset();
+    std::unique_ptr<Stage> stage = Stage::load(m_studio, m_file, error);
+    m_studio.flush(); // what a load that failed has left
+    return stage;
+}
+
+void LiveScene::takeStage(std::unique_ptr<Stage> stage)
+{
+    auto player = std::make_unique<Player>(stage->getAnimation(), stage->getClips());
+    if (m_player)
+    {
+        player->chooseClip(m_player->getClip().name);
+        player->seek(m_player->getTime());
+        player->setPaused(m_player->isPaused());
+        player->setLooping(m_player->isLooping());
+        player->scaleSpeed(m_player->getSpeed());
+        stage->setBackground(m_stage->getBackground());
+    }
+    m_player = std::move(player);
+    m_stage = std::move(stage);
+    m_triangleCount = uint64_t(measureScene(m_stage->getScene()).triangles);
+    m_errorCount = loadlog::getErrorCount();
+}
+
+/// @param isLoaded  all that the scene needs is known; otherwise what was needed before may be needed again.
+void LiveScene::watchFiles(bool isLoaded)
+{
+    std::set<std::string> files = isLoaded ? std::set<std::string>() : m_watched;
+    if (m_conversion)
+        files.merge(findCompanions(m_model));
+    for (const std::string& file : m_studio.getAskedFiles())
+    {
+        if (!m_conversion || !m_conversion->isMade(file))
+            files.insert(file);
+    }
+    m_watched = files;
+    m_watcher.watch(files);
+}
+
+bool LiveScene::reload(std::string& error)
+{
+    std::unique_ptr<Stage> stage;
+    if (!m_conversion || m_conversion->run(error))
+    {
+        stage = loadStage(error);
+        if (loadlog::getErrorCount() > m_errorCount)
+        {
+            error = loadlog::getMessage();
+            stage.reset();
+        }
+    }
+    const bool isLoaded = bool(stage);
+    watchFiles(isLoaded);
+    if (isLoaded)
+        takeStage(std::move(stage));
+    return isLoaded;
+}
+
+} // namespace view

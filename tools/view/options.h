@@ -1,0 +1,48 @@
+#pragma once
+
+#include "compare.h"
+#include "stage.h"
+
+#include "orv/colour.h"
+
+#include <optional>
+#include <string>
+#include <vector>
+
+namespace view
+{
+
+/// What a command line asks for.
+struct Options
+{
+    SceneFile scene; ///< as it was named; a model until it is converted
+    std::vector<std::string> converterArguments;
+
+    int width = 800; ///< of the window, or of a picture, in pixels
+    int height = 600;
+    bool hasSize = false; ///< both were given
+    std::string camera;   ///< "" for the free one
+    std::string clip;     ///< "" for the whole time line
+    std::optional<orv::Colour4f> background;
+
+    std::string out;   ///< "" opens a window
+    float time = 0.0f; ///< seconds from the start of the clip
+    int frames = 0;    ///< pictures over the clip; 0 for one without a number
+    int turntable = 0; ///< pictures around the scene
+    int columns = 0;   ///< of the contact sheet; 0 for none
+    int rows = 0;
+    std::string reference; ///< "" compares with nothing
+    Tolerance tolerance;
+    bool wantsStats = false;
+
+    std::string font; ///< "" for the best there is
+};
+
+/// @param exitCode  of the program, if there is nothing to be done: help was asked for, or the line was wrong.
+/// @return whether there is something to be done.
+bool parseCommandLine(int argumentCount, char** arguments, Options& options, int& exitCode);
+
+/// "#rrggbb", "#rgb", or one of a few names. @return false if it is none of them.
+bool parseColour(const std::string& text, orv::Colour4f& colour);
+
+} // namespace view

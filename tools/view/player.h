@@ -1,0 +1,64 @@
+#pragma once
+
+#include "orv/animationcontroller.h"
+
+#include <string>
+#include <vector>
+
+namespace view
+{
+
+/// A part of the time line that has a name.
+struct Clip
+{
+    std::string name;
+    float start = 0.0f; ///< seconds
+    float end = 0.0f;
+};
+
+/// Plays a time line, or one clip of it. Plays in a loop at first.
+class Player
+{
+public:
+    /// @param clips  the first is the whole time line; there is at least that one.
+    Player(const orv::SharedPtr<orv::Animation>& animation, std::vector<Clip> clips);
+
+    const std::vector<Clip>& getClips() const { return m_clips; }
+    const Clip& getClip() const { return m_clips[m_clip]; }
+
+    /// @return false, with nothing changed, if there is no clip of that name; error then says which there are.
+    bool chooseClip(const std::string& name);
+    bool chooseClip(const std::string& name, std::string& error);
+    /// Goes on to one that is so many further, round and round, and to its start.
+    void stepClip(int count);
+
+    float getTime() const { return m_controller.getProgress(); } ///< seconds
+    float getShare() const;                                      ///< of the clip that is over, 0 to 1
+    bool isPaused() const { return m_controller.isPaused(); }
+    bool isLooping() const { return m_controller.isLooping(); }
+    float getSpeed() const { return m_controller.getSpeed(); }
+    bool isMoving() const; ///< update() will show something else
+
+    void update(float seconds); ///< since the last call
+    void setPaused(bool paused);
+    void setLooping(bool looping) { m_controller.setLooping(looping); }
+    void togglePaused(); ///< at the end of what does not loop: from the start again
+    void scaleSpeed(float factor);
+
+    /// Stops and goes so many frames on, or back, 30 a second; beyond the end at the start while it loops.
+    void step(int frames);
+    /// Goes so many seconds on, or back, without stopping; likewise.
+    void skip(float seconds);
+    void seek(float time);       ///< clamped to the clip
+    void seekShare(float share); ///< 0 to 1
+
+private:
+    void setClip(size_t clip);
+    bool hasLength() const { return m_clips[m_clip].end > m_clips[m_clip].start; }
+
+    orv::AnimationController m_controller;
+    std::vector<Clip> m_clips;
+    size_t m_clip = 0;
+};
+
+} // namespace view

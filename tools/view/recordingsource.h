@@ -1,0 +1,40 @@
+#pragma once
+
+#include "orv/filestreamsource.h"
+#include "orv/streamsource.h"
+
+#include <set>
+#include <string>
+
+namespace view
+{
+
+/// The files below a folder, and which of them were asked for: what a scene depends on, whether it is there or not.
+class RecordingSource : public orv::StreamSource
+{
+public:
+    explicit RecordingSource(const std::string& folder) : m_folder(folder), m_files(folder.c_str()) {}
+
+    bool exists(const char* name) const override
+    {
+        m_asked.insert(m_folder + "/" + (name ? name : ""));
+        return m_files.exists(name);
+    }
+
+    orv::SharedPtr<orv::Stream> open(const char* name, bool writable) override
+    {
+        return m_files.open(name, writable);
+    }
+
+    const char* getName() const override { return m_files.getName(); }
+
+    const std::set<std::string>& getAsked() const { return m_asked; } ///< paths, since the last forget()
+    void forget() { m_asked.clear(); }
+
+private:
+    std::string m_folder;
+    orv::FileStreamSource m_files;
+    mutable std::set<std::string> m_asked;
+};
+
+} // namespace view

@@ -1,0 +1,102 @@
+#pragma once
+
+#include "conversion.h"
+#include "framestats.h"
+#include "headsup.h"
+#include "livescene.h"
+#include "options.h"
+#include "orbit.h"
+
+#include "window/window.h"
+
+#include <chrono>
+#include <memory>
+#include <string>
+
+namespace view
+{
+
+/// The window and what can be done in it.
+///
+/// It draws only while something moves: the scene, a hand, or what is written over the picture.
+class Viewer
+{
+public:
+    /// @param conversion  of the model that is looked at, null for a scene; borrowed.
+    Viewer(const Options& options, Conversion* conversion);
+    ~Viewer();
+
+    Viewer(const Viewer&) = delete;
+    Viewer& operator=(const Viewer&) = delete;
+
+    /// Shows the window until it is closed.
+    /// @return false, with the reason in error, if it cannot be opened or there is nothing to show.
+    bool run(std::string& error);
+
+private:
+    using Clock = std::chrono::steady_clock;
+
+    Stage& getStage() const { return m_scene->getStage(); }
+    Player& getPlayer() const { return m_scene->getPlayer(); }
+
+    bool open(std::string& error);
+    bool chooseBeginning(std::string& error);
+    void openHeadsUp();
+
+    void checkFiles();
+    void reload();
+
+    void handle(const window::Event& event);
+    void handleKey(int32_t key, bool shift);
+    void handlePress(const window::Event& event);
+    void handleMove(const window::Event& event);
+    Orbit findView();
+    void frameAll();
+    void lookCloser(float x, float y);
+    void stepClip(int count);
+    void stepCamera(int count);
+    void leaveFileCamera();
+    void stepBackground();
+    void saveScreenshot(bool withHeadsUp);
+
+    bool isMoving() const;
+    void advance();
+    void drawPicture();
+    void drawFrame();
+    void pick();
+    void say(const std::string& message);
+    void writeHeadsUp();
+    std::string describePlace() const;
+
+    const Options& m_options;
+    Conversion* m_conversion;
+    std::unique_ptr<window::Window> m_window;
+    std::unique_ptr<LiveScene> m_scene;
+    std::unique_ptr<HeadsUp> m_headsUp; ///< null without a font
+    Orbit m_orbit;
+    int m_camera = -1; ///< of the file; -1 for the free one
+    size_t m_background = 0;
+
+    FrameStats m_stats;
+    std::string m_message;
+    std::string m_underPointer;
+    bool m_showsLines = true;
+    bool m_showsKeys = false;
+
+    window::Button m_held = window::Button::NONE;
+    bool m_pans = false;
+    float m_pointerX = 0.0f; ///< pixels
+    float m_pointerY = 0.0f;
+    bool m_isPointerInside = false;
+    bool m_isPickOld = true;
+    float m_shaderTime = 0.0f;
+    Clock::time_point m_lastAdvance = Clock::now();
+    Clock::time_point m_lastWriting;
+    Clock::time_point m_lastLook = Clock::now();
+    Clock::time_point m_messageEnd;
+    bool m_needsFrame = true;
+    bool m_needsWriting = true;
+    bool m_quits = false;
+};
+
+} // namespace view
