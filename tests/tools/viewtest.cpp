@@ -1,6 +1,4 @@
-#include "render/glotest.h"
-#include "support/picture.h"
-#include "support/tempdir.h"
+#include "viewtest.h"
 
 #include <algorithm>
 #include <cstdio>
@@ -8,7 +6,6 @@
 #include <sys/wait.h>
 
 using support::Picture;
-using support::Rgba;
 
 namespace
 {
@@ -19,21 +16,15 @@ struct Outcome
     std::string output; // of both streams
 };
 
-/// Runs orv-view in a folder of its own that holds a few scenes.
-class ViewTest : public testing::Test
+/// Runs orv-view without a window.
+class ViewPictureTest : public ViewTest
 {
 protected:
-    void SetUp() override
-    {
-        std::vector<uint8_t> file = write(makeScene());
-        m_folder.write("scene.glo", file);
-        file.resize(file.size() / 2);
-        m_folder.write("damaged.glo", file);
-    }
-
     Outcome view(const std::string& arguments) const
     {
-        const std::string command = "cd '" + m_folder.path() + "' && " ORV_VIEW " " + arguments + " 2>&1";
+        const std::string command = "cd '" + m_folder.path() +
+                                    "' && env -u DISPLAY -u WAYLAND_DISPLAY TMPDIR='" + m_temporary.path() +
+                                    "' " ORV_VIEW " " + arguments + " 2>&1";
         std::FILE* pipe = popen(command.c_str(), "r");
         std::string output;
         char buffer[1024];
@@ -42,67 +33,13 @@ protected:
         return {WEXITSTATUS(pclose(pipe)), output};
     }
 
-    Picture picture(const std::string& name) const { return support::readPng(m_folder.path(name)); }
-
-    static std::vector<uint8_t> write(const glo::GloScene& scene)
-    {
-        std::vector<uint8_t> file;
-        std::string error;
-        EXPECT_TRUE(glo::writeGlo(scene, file, error)) << error;
-        return file;
-    }
-
-    /// A red square that jumps from the left to the right after half of its 2 seconds, and a camera that looks
-    /// at where it lands. No light.
-    static glo::GloScene makeScene()
-    {
-        glo::GloScene scene;
-        scene.geometries = {makeSquareGeometry("square")};
-        scene.materials = {makeMaterial("red", orv::Vector4f(1, 0, 0, 1))};
-        glo::CameraDefinition lens;
-        lens.name = "lens";
-        scene.cameras.push_back(lens);
-
-        glo::NodeData square = makeNode("square node");
-        square.geometry = glo::GeometryReference{"square", {"red"}};
-        glo::NodeData eye = makeNode("eye");
-        eye.camera = glo::CameraReference{"lens"};
-        moveTo(eye, orv::Vector3f(3.0f, 0.0f, 2.0f));
-        glo::NodeData top = makeNode("top");
-        top.children = {square, eye};
-        scene.scene = glo::SceneData{"scene", top};
-
-        glo::Channel move;
-        move.targetType = "node";
-        move.targetName = "node-square node";
-        move.property = "translation";
-        glo::addKey(move, 0.0f, {-3, 0, 0});
-        glo::addKey(move, 1.0f, {3, 0, 0});
-        glo::addKey(move, 2.0f, {3, 0, 0});
-        glo::AnimationData animation;
-        animation.name = "jump";
-        animation.channels = {move};
-        scene.animations.push_back(animation);
-        return scene;
-    }
-
-    support::TempDir m_folder;
+    support::TempDir m_temporary;
 };
-
-bool isRed(const Rgba& colour)
-{
-    return colour.r > 150 && colour.g < 60 && colour.b < 60 && colour.a == 255;
-}
-
-bool isBackground(const Rgba& colour)
-{
-    return isNear(colour, {214, 219, 227, 255}, 2);
-}
 
 } // namespace
 
 // Fault caught: a failure that exits with 0, says nothing of use, or leaves a file behind.
-TEST_F(ViewTest, failuresSayWhyAndWriteNothing)
+TEST_F(ViewPictureTest, failuresSayWhyAndWriteNothing)
 {
     struct Case
     {
@@ -111,9 +48,10 @@ TEST_F(ViewTest, failuresSayWhyAndWriteNothing)
         const char* message;
     };
     const Case cases[] = {
-        {"--help", 0, "--frames"},
+        {"--help", 0, "orv-view duck.glo --out duck.png"},
         {"", 2, "scene"},
-        {"scene.glo", 2, "--out"},
+        {"scene.glo", 1, "no window: there is no screen; with --out"},
+        {"scene.glo --stats", 2, "--out"},
         {"scene.glo --out a.jpg", 2, "only PNG"},
         {"scene.glo --out a.png --size 0x9", 2, "0x9"},
         {"scene.glo --out a.png --size 10", 2, "WIDTHxHEIGHT"},
@@ -122,23 +60,36 @@ TEST_F(ViewTest, failuresSayWhyAndWriteNothing)
         {"scene.glo --out a.png --frames 0", 2, "--frames"},
         {"scene.glo --out a.png --frames 2 --time 1", 2, "--time"},
         {"scene.glo --out a.png --time nan", 2, "--time"},
+        {"scene.glo --out a.png --turntable 5 --sheet 2x2", 2, "no room for 5"},
+        {"scene.glo --out a.png --sheet 100x1 --size 800x600", 2, "16384"},
+        {"scene.glo --out a.png --tolerance 3", 2, "--compare"},
+        {"scene.glo --out a.png --compare b.png --tolerance many", 2, "many"},
+        {"scene.glo --out a.png --background pink", 2, "pink"},
+        {"scene.glo --out a.png --material paint", 2, "paint"},
+        {"scene.glo --out a.png --material paint=none.ap", 1, "none.ap: No such file"},
+        {"scene.glo --out a.png --material tar=scene.glo", 1, "no material \"tar\"; there are \"paint\""},
         {"missing.glo --out a.png", 1, "missing.glo: No such file"},
         {". --out a.png", 1, ".: not a file"},
         {"damaged.glo --out a.png", 1, "orv-view: damaged.glo: "},
         {"scene.glo --out missing/a.png", 1, "missing/a.png: "},
         {"scene.glo --out a.png --camera nobody", 1, "no camera \"nobody\"; there are \"eye\""},
+        {"scene.glo --out a.png --clip fly", 1, "no clip \"fly\"; there are \"jump\", \"rest\""},
+        {"scene.glo --out a.png -- --up z", 1, "is not converted, so \"--up\""},
+        {"garbage.dae --out a.png", 1, "garbage.dae: cannot be converted"},
     };
+    m_folder.write("garbage.dae", "garbage");
     for (const Case& c : cases)
     {
         const Outcome outcome = view(c.arguments);
         EXPECT_EQ(c.exitCode, outcome.exitCode) << c.arguments << "\n" << outcome.output;
         EXPECT_NE(std::string::npos, outcome.output.find(c.message)) << c.arguments << "\n" << outcome.output;
     }
-    EXPECT_EQ((std::vector<std::string>{"damaged.glo", "scene.glo"}), m_folder.list());
+    EXPECT_EQ((std::vector<std::string>{"damaged.glo", "garbage.dae", "scene.glo"}), m_folder.list());
+    EXPECT_TRUE(m_temporary.list().empty());
 }
 
 // Fault caught: a scene without a camera and a light that comes out black, cut off or out of sight.
-TEST_F(ViewTest, showsTheWholeScene)
+TEST_F(ViewPictureTest, showsTheWholeScene)
 {
     const Outcome outcome = view("scene.glo --out a.png --size 160x120 --stats");
     ASSERT_EQ(0, outcome.exitCode) << outcome.output;
@@ -148,13 +99,12 @@ TEST_F(ViewTest, showsTheWholeScene)
     EXPECT_TRUE(isRed(frame.pixel(80, 60))) << frame.pixel(80, 60);
     for (int i = 0; i < 120; ++i)
         EXPECT_TRUE(isBackground(frame.pixel(0, i)) && isBackground(frame.pixel(159, i))) << "row " << i;
-    EXPECT_NE(std::string::npos, outcome.output.find("solids     1\n")) << outcome.output;
-    EXPECT_NE(std::string::npos, outcome.output.find("draws      1\n")) << outcome.output;
-    EXPECT_NE(std::string::npos, outcome.output.find("triangles  2\n")) << outcome.output;
+    for (const char* line : {"solids     1\n", "draws      1\n", "triangles  2\n"})
+        EXPECT_NE(std::string::npos, outcome.output.find(line)) << outcome.output;
 }
 
 // Fault caught: a view that fits the bounding sphere about a mesh's origin, with the mesh small in a corner.
-TEST_F(ViewTest, fillsTheViewWithWhatIsFarFromItsOrigin)
+TEST_F(ViewPictureTest, fillsTheViewWithWhatIsFarFromItsOrigin)
 {
     glo::GloScene scene = makeScene();
     scene.geometries[0].vertices =
@@ -185,16 +135,20 @@ TEST_F(ViewTest, fillsTheViewWithWhatIsFarFromItsOrigin)
     }
 }
 
-TEST_F(ViewTest, looksThroughACameraOfTheFileAtAMoment)
+TEST_F(ViewPictureTest, looksThroughACameraOfTheFileAtAMoment)
 {
     ASSERT_EQ(0, view("scene.glo --out early.png --size 64x64 --camera eye --time 0.5").exitCode);
     ASSERT_EQ(0, view("scene.glo --out late.png --size 64x64 --camera lens --time 1").exitCode);
+    ASSERT_EQ(0, view("scene.glo --out clip.png --size 64x64 --camera eye --clip rest").exitCode);
+    ASSERT_EQ(0, view("scene.glo --out dark.png --size 64x64 --camera eye --background '#204'").exitCode);
     EXPECT_TRUE(isBackground(picture("early.png").pixel(32, 32)));
     EXPECT_TRUE(isRed(picture("late.png").pixel(32, 32)));
+    EXPECT_TRUE(isRed(picture("clip.png").pixel(32, 32)));
+    EXPECT_TRUE(isNear(picture("dark.png").pixel(32, 32), {0x22, 0, 0x44, 255}, 1));
 }
 
 // Fault caught: pictures that all show the same moment, or a view that jumps along with what moves.
-TEST_F(ViewTest, numbersThePicturesOfAnAnimation)
+TEST_F(ViewPictureTest, numbersThePicturesOfAnAnimation)
 {
     const Outcome outcome = view("scene.glo --out a.png --size 80x60 --frames 4");
     ASSERT_EQ(0, outcome.exitCode) << outcome.output;
@@ -206,15 +160,71 @@ TEST_F(ViewTest, numbersThePicturesOfAnAnimation)
     const Picture last = picture("a-003.png");
     EXPECT_TRUE(support::comparePictures("view-early", first, picture("a-001.png")));
     EXPECT_TRUE(support::comparePictures("view-late", last, picture("a-002.png")));
-    const auto redShare = [](const Picture& frame, int x)
+    EXPECT_LT(10, countRed(first, 0, 40));
+    EXPECT_EQ(0, countRed(first, 40, 80));
+    EXPECT_EQ(0, countRed(last, 0, 40));
+    EXPECT_LT(10, countRed(last, 40, 80));
+}
+
+// Fault caught: pictures in the wrong places of a sheet, and a turntable that shows the same side twice.
+TEST_F(ViewPictureTest, laysPicturesOutOnASheet)
+{
+    ASSERT_EQ(0, view("scene.glo --out a.png --size 80x60 --sheet 1x2").exitCode);
+    const Picture moments = picture("a.png");
+    ASSERT_EQ(80, moments.width);
+    ASSERT_EQ(120, moments.height);
+    EXPECT_TRUE(isBackground(moments.pixel(79, 30)));
+    EXPECT_LT(5, countRed(moments, 0, 40));
+    EXPECT_LT(5, countRed(moments, 40, 80));
+
+    ASSERT_EQ(
+        0, view("scene.glo --out b.png --size 60x60 --sheet 3x1 --turntable 2 --background white").exitCode);
+    const Picture turns = picture("b.png");
+    EXPECT_LT(100, countRed(turns, 0, 60));
+    EXPECT_EQ(0, countRed(turns, 60, 120)) << "its back";
+    EXPECT_EQ((support::Rgba{255, 255, 255, 255}), turns.pixel(150, 30)) << "the place that is left";
+    ASSERT_EQ(0, view("scene.glo --out c.png --size 60x60 --turntable 2").exitCode);
+    EXPECT_LT(100, countRed(picture("c-000.png"), 0, 60));
+    EXPECT_EQ(0, countRed(picture("c-001.png"), 0, 60));
+}
+
+// Fault caught: a regression that passes, or one that fails without a picture to look at.
+TEST_F(ViewPictureTest, comparesWithAReference)
+{
+    const std::string common = " --size 80x60 --camera eye --time 1 --compare good.png";
+    ASSERT_EQ(0, view("scene.glo --out good.png --size 80x60 --camera eye --time 1").exitCode);
+    Outcome outcome = view("scene.glo --out a.png" + common);
+    EXPECT_EQ(0, outcome.exitCode) << outcome.output;
+    EXPECT_NE(std::string::npos, outcome.output.find("same: 0 of 4800 pixels")) << outcome.output;
+
+    m_folder.write("green.glo", write(makeScene(orv::Vector4f(0, 1, 0, 1))));
+    outcome = view("green.glo --out b.png" + common + " --tolerance 8,1");
+    EXPECT_EQ(1, outcome.exitCode) << outcome.output;
+    EXPECT_NE(std::string::npos, outcome.output.find("different: ")) << outcome.output;
+    const support::Rgba off = picture("b-difference.png").pixel(40, 30);
+    EXPECT_TRUE(off.r == 255 && off.g == 255 && off.b == 0) << off;
+    EXPECT_EQ(0, view("green.glo --out b.png" + common + " --tolerance 255").exitCode);
+    outcome = view("scene.glo --out c.png --size 60x60 --compare good.png");
+    EXPECT_EQ(1, outcome.exitCode);
+    EXPECT_NE(std::string::npos, outcome.output.find("has 80 x 60 pixels")) << outcome.output;
+}
+
+// Fault caught: materials on their own, over a scene's, and models that are no scenes, out of sight or uncoloured.
+TEST_F(ViewPictureTest, showsWhatIsNoScene)
+{
+    m_folder.write("red.ap",
+                   "1.0\nshader_program orv#max_pvl.sp$DIFF\nproperty M_DIFFUSE_COLOUR Colour4f 1 0 0 1\n");
+    m_folder.write("green.glo", write(makeScene(orv::Vector4f(0, 1, 0, 1))));
+    m_folder.write("model.mtl", "newmtl red\nKd 1 0 0\n");
+    m_folder.write("model.obj", "mtllib model.mtl\nv 0 0 0\nv 1 0 0\nv 0 1 0\nusemtl red\nf 1 2 3\n");
+    for (const char* scene :
+         {"red.ap", "green.glo --material paint=red.ap", "model.obj", "model.obj -- --fps 10"})
     {
-        int count = 0;
-        for (int i = 0; i < 40 * 60; ++i)
-            count += isRed(frame.pixel(x + i % 40, i / 40));
-        return count;
-    };
-    EXPECT_LT(10, redShare(first, 0));
-    EXPECT_EQ(0, redShare(first, 40));
-    EXPECT_EQ(0, redShare(last, 0));
-    EXPECT_LT(10, redShare(last, 40));
+        const std::string text = scene;
+        const size_t end = std::min(text.find(" -- "), text.size());
+        const Outcome outcome = view(text.substr(0, end) + " --out a.png --size 90x60" + text.substr(end));
+        ASSERT_EQ(0, outcome.exitCode) << scene << "\n" << outcome.output;
+        EXPECT_LT(100, countRed(picture("a.png"), 0, 90)) << scene;
+    }
+    EXPECT_TRUE(m_temporary.list().empty()) << "what a model was converted to";
 }

@@ -7,6 +7,7 @@
 
 #include <algorithm>
 #include <cmath>
+#include <iterator>
 
 namespace convert
 {
@@ -14,8 +15,18 @@ namespace convert
 namespace
 {
 
-constexpr double MOST_SAMPLES = 200000.0; // of one track: almost two hours at 30 a second
-constexpr float TOLERANCE = 1e-6f;        // relative to the value
+constexpr double MOST_SAMPLES = 200000.0;       // of one clip: almost two hours at 30 a second
+constexpr double USUAL_TICKS_PER_SECOND = 25.0; // where the model does not say
+constexpr float TOLERANCE = 1e-6f;              // relative to the value
+
+enum class Property
+{
+    TRANSLATION,
+    ROTATION,
+    SCALE
+};
+
+constexpr const char* PROPERTY_NAMES[] = {"translation", "rotation", "scale"};
 
 aiVector3D interpolate(const aiVectorKey& a, const aiVectorKey& b, float factor)
 {
@@ -31,136 +42,251 @@ aiQuaternion interpolate(const aiQuatKey& a, const aiQuatKey& b, float factor)
 
 /// The first key holds before its time, the last one after its.
 template <class Key>
-auto evaluate(const Key* keys, unsigned count, double time) -> decltype(keys->mValue)
+auto evaluate(const Key* keys, unsigned count, double ticks) -> decltype(keys->mValue)
 {
-    const Key* next = std::upper_bound(keys, keys + count, time,
+    const Key* next = std::upper_bound(keys, keys + count, ticks,
                                        [](double wanted, const Key& key) { return wanted < key.mTime; });
     if (next == keys)
         return keys->mValue;
     const Key* previous = next - 1;
     if (next == keys + count || !(next->mTime > previous->mTime))
         return previous->mValue;
-    return interpolate(*previous, *next, float((time - previous->mTime) / (next->mTime - previous->mTime)));
+    return interpolate(*previous, *next, float((ticks - previous->mTime) / (next->mTime - previous->mTime)));
 }
 
-std::vector<float> toValues(const aiVector3D& v)
+using Values = std::vector<float>;
+
+Values toValues(const orv::Vector3f& v)
 {
-    return {float(v.x), float(v.y), float(v.z)};
+    return {v.x, v.y, v.z};
 }
 
-std::vector<float> toValues(const aiQuaternion& rotation)
+Values toValues(const orv::Vector4f& v)
 {
-    const orv::Vector4f turn = toAxisAngle(rotation);
-    return {turn.x, turn.y, turn.z, turn.w};
+    return {v.x, v.y, v.z, v.w};
 }
 
-bool isSame(const std::vector<float>& a, const std::vector<float>& b)
+/// What the node has in the model as it stands.
+Values getRest(const glo::NodeData& rest, Property property)
 {
-    for (size_t i = 0; i < a.size(); ++i)
+    switch (property)
     {
-        if (!(std::fabs(a[i] - b[i]) <= TOLERANCE * std::max(1.0f, std::fabs(a[i]))))
-            return false;
+    case Property::TRANSLATION: return toValues(rest.translation);
+    case Property::ROTATION: return toValues(rest.rotation);
+    case Property::SCALE: break;
     }
-    return true;
+    return toValues(rest.scale);
 }
 
-/// When to sample: in ticks of the animation.
-struct Sampling
+Values sample(const aiNodeAnim& channel, Property property, double ticks, const glo::NodeData& rest)
 {
-    unsigned count;
-    double ticksPerSample;
-    double ticksPerSecond;
-    double duration;
+    switch (property)
+    {
+    case Property::TRANSLATION:
+        if (channel.mNumPositionKeys > 0)
+            return toValues(toVector(evaluate(channel.mPositionKeys, channel.mNumPositionKeys, ticks)));
+        break;
+    case Property::ROTATION:
+        if (channel.mNumRotationKeys > 0)
+            return toValues(toAxisAngle(evaluate(channel.mRotationKeys, channel.mNumRotationKeys, ticks)));
+        break;
+    case Property::SCALE:
+        if (channel.mNumScalingKeys > 0)
+            return toValues(toVector(evaluate(channel.mScalingKeys, channel.mNumScalingKeys, ticks)));
+        break;
+    }
+    return getRest(rest, property);
+}
 
-    double getTicks(unsigned sample) const { return std::min(duration, double(sample) * ticksPerSample); }
-};
-
-/// A key where the value changes, since values hold until the next key, and one at the end, which tells how long
-/// the animation is. A track that stays as it is has one key.
-template <class Key>
-void addTrack(const Key* keys, unsigned keyCount, const char* property, const std::string& node,
-              const Sampling& sampling, std::vector<glo::Channel>& channels)
+bool isSame(const Values& a, const Values& b)
 {
-    if (keyCount == 0)
-        return;
+    return std::equal(a.begin(), a.end(), b.begin(),
+                      [](float x, float y)
+                      { return std::fabs(x - y) <= TOLERANCE * std::max(1.0f, std::fabs(x)); });
+}
+
+glo::Channel makeChannel(const std::string& node, const char* property)
+{
     glo::Channel channel;
     channel.targetType = "node";
-    channel.targetName = "node-" + node;
+    channel.targetName = "node-" + node; // the prefix is taken off, so a name may begin with it
     channel.property = property;
-    std::vector<float> last = toValues(evaluate(keys, keyCount, 0.0));
-    glo::addKey(channel, 0.0f, last);
-    for (unsigned sample = 1; sample < sampling.count; ++sample)
-    {
-        const double ticks = sampling.getTicks(sample);
-        const std::vector<float> values = toValues(evaluate(keys, keyCount, ticks));
-        const bool ends = sample + 1 == sampling.count && channel.keyCount > 1;
-        if (isSame(values, last) && !ends)
-            continue;
-        glo::addKey(channel, float(ticks / sampling.ticksPerSecond), values);
-        last = values;
-    }
-    channels.push_back(std::move(channel));
+    return channel;
 }
 
-glo::AnimationData convertAnimation(const aiScene& scene, const aiAnimation& source,
-                                    const std::map<const aiNode*, std::string>& nodeNames,
-                                    const Sampling& sampling, Report& report)
+/// An animation of the model and how it is sampled.
+struct Source
 {
-    glo::AnimationData made;
-    made.loopRanges.push_back({0.0f, float(sampling.duration / sampling.ticksPerSecond)});
-    for (unsigned i = 0; i < source.mNumChannels; ++i)
+    Clip clip;
+    unsigned sampleCount;
+    double ticksPerSecond;
+    double duration; ///< in ticks
+    std::map<const aiNode*, const aiNodeAnim*> channels;
+};
+
+class MotionMaker
+{
+public:
+    MotionMaker(const aiScene& scene, const NodeNames& nodeNames, const std::string& clipNode,
+                const Options& options, Report& report)
+        : m_scene(scene)
+        , m_nodeNames(nodeNames)
+        , m_clipNode(clipNode)
+        , m_fps(options.fps)
+        , m_report(report)
     {
-        const aiNodeAnim& channel = *source.mChannels[i];
-        const auto node = nodeNames.find(scene.mRootNode->FindNode(channel.mNodeName));
-        if (node == nodeNames.end())
-        {
-            report.lose("an animation channel of a node that is not there");
-            continue;
-        }
-        addTrack(channel.mPositionKeys, channel.mNumPositionKeys, "translation", node->second, sampling,
-                 made.channels);
-        addTrack(channel.mRotationKeys, channel.mNumRotationKeys, "rotation", node->second, sampling,
-                 made.channels);
-        addTrack(channel.mScalingKeys, channel.mNumScalingKeys, "scale", node->second, sampling,
-                 made.channels);
     }
-    if (source.mNumMeshChannels + source.mNumMorphMeshChannels > 0)
-        report.lose("an animation of a mesh's shape");
-    return made;
-}
+
+    Motion make()
+    {
+        for (unsigned i = 0; i < m_scene.mNumAnimations; ++i)
+            addSource(*m_scene.mAnimations[i]);
+        if (m_sources.empty())
+            return {};
+        m_all.loopRanges.push_back({0.0f, m_sources.back().clip.end});
+        addTracks(*m_scene.mRootNode);
+
+        Motion motion;
+        for (const Source& source : m_sources)
+            motion.clips.push_back(source.clip);
+        if (m_sources.size() > 1)
+        {
+            for (const Clip& clip : motion.clips)
+                motion.animations.push_back(makeMark(clip));
+        }
+        motion.usesClipNode = m_sources.size() > 1 || m_all.channels.empty();
+        m_all.name = m_sources.size() > 1 ? m_names.make("all clips", "") : m_sources[0].clip.name;
+        if (m_all.channels.empty()) // nothing moves, but for so long
+            m_all.channels = makeMark({"", 0.0f, m_sources.back().clip.end}).channels;
+        else
+            extend(m_all.channels.front());
+        motion.animations.push_back(std::move(m_all));
+        return motion;
+    }
+
+private:
+    void addSource(const aiAnimation& animation)
+    {
+        const std::string name = m_names.make(animation.mName.C_Str(), "animation");
+        Source source;
+        source.ticksPerSecond =
+            animation.mTicksPerSecond > 0.0 ? animation.mTicksPerSecond : USUAL_TICKS_PER_SECOND;
+        source.duration = std::max(animation.mDuration, 0.0);
+        const double seconds = source.duration / source.ticksPerSecond;
+        const double samples = std::ceil(seconds * m_fps - 1e-6);
+        if (!(samples >= 0.0 && samples <= MOST_SAMPLES))
+        {
+            m_report.lose("animation", "animation \"" + name + "\", which is too long");
+            return;
+        }
+        source.sampleCount = unsigned(samples) + 1;
+        const double start = m_sources.empty() ? 0.0 : double(m_sources.back().clip.end) + 1.0 / m_fps;
+        source.clip = {name, float(start), float(start + seconds)};
+        if (animation.mNumMeshChannels + animation.mNumMorphMeshChannels > 0)
+            m_report.lose("morph-animation", "how animation \"" + name + "\" changes the shape of meshes");
+        for (unsigned i = 0; i < animation.mNumChannels; ++i)
+            addChannel(*animation.mChannels[i], source);
+        m_sources.push_back(std::move(source));
+    }
+
+    void addChannel(const aiNodeAnim& channel, Source& source)
+    {
+        const std::string what =
+            "of \"" + std::string(channel.mNodeName.C_Str()) + "\" in animation \"" + source.clip.name + "\"";
+        const aiNode* node = m_scene.mRootNode->FindNode(channel.mNodeName);
+        if (!node)
+            m_report.lose("animation-target", "the movement " + what + ": there is no such node");
+        else if (!source.channels.emplace(node, &channel).second)
+            m_report.lose("animation-target", "a second movement " + what);
+        const auto isEndless = [](aiAnimBehaviour behaviour)
+        { return behaviour == aiAnimBehaviour_LINEAR || behaviour == aiAnimBehaviour_REPEAT; };
+        if (isEndless(channel.mPreState) || isEndless(channel.mPostState))
+            m_report.approximate("animation-ends", "how the movement " + what +
+                                                       " goes on before its first and after its last key");
+    }
+
+    void addTracks(const aiNode& node)
+    {
+        const bool isMoved =
+            std::any_of(m_sources.begin(), m_sources.end(),
+                        [&](const Source& source) { return source.channels.count(&node) > 0; });
+        if (isMoved)
+        {
+            glo::NodeData rest;
+            place(rest, node.mTransformation);
+            for (const Property property : {Property::TRANSLATION, Property::ROTATION, Property::SCALE})
+                addTrack(node, property, rest);
+        }
+        for (unsigned i = 0; i < node.mNumChildren; ++i)
+            addTracks(*node.mChildren[i]);
+    }
+
+    /// A key where the value changes, since values hold until the next key. A track that stays as it is has one
+    /// key, and none if it stays as the node is anyway.
+    void addTrack(const aiNode& node, Property property, const glo::NodeData& rest)
+    {
+        glo::Channel track = makeChannel(m_nodeNames.at(&node), PROPERTY_NAMES[size_t(property)]);
+        const Values restValues = getRest(rest, property);
+        Values last;
+        for (const Source& source : m_sources)
+        {
+            const auto channel = source.channels.find(&node);
+            const bool isMoved = channel != source.channels.end();
+            for (unsigned i = 0; i < (isMoved ? source.sampleCount : 1); ++i)
+            {
+                const double seconds = std::min(double(i) / m_fps, source.duration / source.ticksPerSecond);
+                const Values values =
+                    isMoved ? sample(*channel->second, property, seconds * source.ticksPerSecond, rest)
+                            : restValues;
+                if (!last.empty() && isSame(values, last))
+                    continue;
+                glo::addKey(track, float(double(source.clip.start) + seconds), values);
+                last = values;
+            }
+        }
+        if (track.keyCount == 1 && isSame(last, restValues))
+            return;
+        m_lastOfFirst = m_all.channels.empty() ? last : m_lastOfFirst;
+        m_all.channels.push_back(std::move(track));
+    }
+
+    /// Repeats the last key at the end of everything, which tells how long that is.
+    void extend(glo::Channel& track) const
+    {
+        if (m_sources.back().clip.end > 0.0f)
+            glo::addKey(track, m_sources.back().clip.end, m_lastOfFirst);
+    }
+
+    /// An animation that lasts from a clip's start to its end and moves nothing.
+    glo::AnimationData makeMark(const Clip& clip) const
+    {
+        glo::AnimationData mark;
+        mark.name = clip.name;
+        mark.loopRanges.push_back({clip.start, clip.end});
+        glo::Channel& channel = mark.channels.emplace_back(makeChannel(m_clipNode, "translation"));
+        glo::addKey(channel, clip.start, {0.0f, 0.0f, 0.0f});
+        if (clip.end > clip.start)
+            glo::addKey(channel, clip.end, {0.0f, 0.0f, 0.0f});
+        return mark;
+    }
+
+    const aiScene& m_scene;
+    const NodeNames& m_nodeNames;
+    const std::string& m_clipNode;
+    double m_fps;
+    Report& m_report;
+    NameMaker m_names;
+    std::vector<Source> m_sources;
+    glo::AnimationData m_all;
+    Values m_lastOfFirst; ///< the last value of the first channel
+};
 
 } // namespace
 
-std::vector<glo::AnimationData> convertAnimations(const aiScene& scene,
-                                                  const std::map<const aiNode*, std::string>& nodeNames,
-                                                  const Options& options, Report& report)
+Motion convertAnimations(const aiScene& scene, const NodeNames& nodeNames, const std::string& clipNode,
+                         const Options& options, Report& report)
 {
-    constexpr double USUAL_TICKS_PER_SECOND = 25.0; // where the model does not say
-    std::vector<glo::AnimationData> animations;
-    NameMaker names;
-    float end = 0.0f;
-    for (unsigned i = 0; i < scene.mNumAnimations; ++i)
-    {
-        const aiAnimation& source = *scene.mAnimations[i];
-        Sampling sampling;
-        sampling.ticksPerSecond =
-            source.mTicksPerSecond > 0.0 ? source.mTicksPerSecond : USUAL_TICKS_PER_SECOND;
-        sampling.duration = source.mDuration;
-        sampling.ticksPerSample = sampling.ticksPerSecond / options.fps;
-        const double samples = std::ceil(sampling.duration / sampling.ticksPerSample - 1e-6);
-        if (!(samples >= 0.0 && samples <= MOST_SAMPLES))
-        {
-            report.lose("animation \"" + std::string(source.mName.C_Str()) + "\", which is too long");
-            continue;
-        }
-        sampling.count = unsigned(samples) + 1;
-        animations.push_back(convertAnimation(scene, source, nodeNames, sampling, report));
-        animations.back().name = names.make(source.mName.C_Str(), "animation");
-        end = std::max(end, animations.back().loopRanges[0].end);
-    }
-    if (!animations.empty())
-        animations.back().loopRanges[0].end = end; // the last range is the file's
-    return animations;
+    return MotionMaker(scene, nodeNames, clipNode, options, report).make();
 }
 
 } // namespace convert

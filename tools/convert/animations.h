@@ -7,6 +7,7 @@
 
 #include <map>
 #include <string>
+#include <vector>
 
 struct aiNode;
 struct aiScene;
@@ -14,10 +15,32 @@ struct aiScene;
 namespace convert
 {
 
-/// Samples the movement of nodes to stepped keys.
-/// @param nodeNames  what the model's nodes are called in the scene.
-std::vector<glo::AnimationData> convertAnimations(const aiScene& scene,
-                                                  const std::map<const aiNode*, std::string>& nodeNames,
-                                                  const Options& options, Report& report);
+/// One of a model's animations on the scene's time line, in seconds.
+struct Clip
+{
+    std::string name;
+    float start = 0.0f;
+    float end = 0.0f;
+};
+
+/// How a scene moves.
+struct Motion
+{
+    std::vector<Clip> clips;
+    std::vector<glo::AnimationData> animations;
+    bool usesClipNode = false; ///< see convertAnimations
+};
+
+/// What the model's nodes are called in the scene.
+using NodeNames = std::map<const aiNode*, std::string>;
+
+/// Samples the movement of nodes to stepped keys, the clips one after the other with a sample's time between.
+///
+/// A single clip is an animation of its name. Of several, all movement is in one animation "all clips", since of
+/// several channels for one node the last would win at all times; before it comes an animation for each clip, which
+/// has the clip's name and start and end and moves nothing but a node of its own.
+/// @param clipNode  the name of that node, which is to be empty.
+Motion convertAnimations(const aiScene& scene, const NodeNames& nodeNames, const std::string& clipNode,
+                         const Options& options, Report& report);
 
 } // namespace convert

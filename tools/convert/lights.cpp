@@ -1,5 +1,7 @@
 #include "lights.h"
 
+#include "placement.h"
+
 #include <assimp/camera.h>
 #include <assimp/light.h>
 
@@ -46,15 +48,15 @@ bool convertLight(const aiLight& light, bool isGltf, glo::LightDefinition& made,
     case aiLightSource_SPOT: made.type = glo::light::SPOT; break;
     case aiLightSource_AREA:
         made.type = glo::light::POINT;
-        report.lose("the extent of an area light (a point light instead)");
+        report.approximate("area-light", "the extent of an area light (a point light instead)");
         break;
-    default: report.lose("an ambient light (the engine's lights have places)"); return false;
+    default: report.lose("ambient-light", "an ambient light (the engine's lights have places)"); return false;
     }
     const aiColor3D& colour = light.mColorDiffuse;
     const float strength = std::max({float(colour.r), float(colour.g), float(colour.b)});
     if (!(strength > 0.0f) || !std::isfinite(strength))
     {
-        report.lose("a light without any brightness");
+        report.lose("dark-light", "a light without any brightness");
         return false;
     }
     made.colour = orv::Vector3f(colour.r / strength, colour.g / strength, colour.b / strength);
@@ -63,7 +65,7 @@ bool convertLight(const aiLight& light, bool isGltf, glo::LightDefinition& made,
         made.intensity = strength / float(light.mAttenuationConstant);
     if (made.intensity > PHYSICAL)
     {
-        report.lose("the brightness of a light in physical units (1 instead)");
+        report.approximate("light-brightness", "the brightness of a light in physical units (1 instead)");
         made.intensity = 1.0f;
     }
     made.attenuated = 0;
@@ -103,6 +105,16 @@ glo::CameraDefinition convertCamera(const aiCamera& camera, bool isGltf)
     else
         made.fieldOfView = scaled(angle, std::min(1.0f / aspect, 1.0f));
     return made;
+}
+
+aiMatrix4x4 placeCamera(const aiCamera& camera, const aiMatrix4x4& node)
+{
+    // Some importers repeat the node's position, and some leave what a new aiCamera has, though in their formats (ASE,
+    // LWS, OpenGEX) cameras look along -z.
+    const bool isRepeated = camera.mPosition == aiVector3D(node.a4, node.b4, node.c4);
+    const bool isUntouched = camera.mLookAt == aiVector3D(0, 0, 1) && camera.mUp == aiVector3D(0, 1, 0);
+    return lookingAlong(isRepeated ? aiVector3D() : camera.mPosition,
+                        isUntouched ? aiVector3D(0, 0, -1) : camera.mLookAt, camera.mUp);
 }
 
 } // namespace convert

@@ -3,6 +3,8 @@
 #include "glo/glowriter.h"
 #include "report.h"
 
+#include <assimp/types.h>
+
 struct aiCamera;
 struct aiLight;
 
@@ -14,5 +16,9 @@ namespace convert
 bool convertLight(const aiLight& light, bool isGltf, glo::LightDefinition& made, Report& report);
 
 glo::CameraDefinition convertCamera(const aiCamera& camera, bool isGltf);
+
+/// From where it is to be, looking along -z, to its node.
+/// @param node  the node's transform.
+aiMatrix4x4 placeCamera(const aiCamera& camera, const aiMatrix4x4& node);
 
 } // namespace convert

@@ -1,7 +1,8 @@
 // orv-convert: makes a scene file, with its textures beside it, of a model file.
 
-#include "model.h"
-#include "outputfiles.h"
+#include "conversion.h"
+#include "guard.h"
+#include "progress.h"
 
 #include <CLI/CLI.hpp>
 
@@ -14,78 +15,103 @@ namespace
 constexpr int FAILED = 1; // exit codes
 constexpr int MISUSED = 2;
 
-int fail(const std::string& path, const std::string& reason)
+constexpr int LARGEST_TEXTURE = 16384; // pixels, as far as the engine goes
+
+struct Command
 {
-    std::fprintf(stderr, "orv-convert: %s: %s\n", path.c_str(), reason.c_str());
+    std::string model;
+    std::string out;
+    std::string report;
+    bool dryRun = false;
+    bool noAnimation = false;
+    convert::Options options;
+    convert::Limits limits;
+};
+
+const char* const FOOTER =
+    "Textures are written beside the scene, their names beginning with its name. Files of these names are\n"
+    "replaced; on failure nothing is written. Exit code: 0 converted, 1 not, 2 wrong usage.\n\n"
+    "Examples:\n"
+    "  orv-convert duck.dae duck.glo                        duck.glo and duck-duckCM.tga\n"
+    "  orv-convert walk.fbx scenes/walk.glo --fps 60        smoother animations, larger file\n"
+    "  orv-convert part.stl part.glo --up z --scale 0.001   from millimetres with z up\n"
+    "  orv-convert house.gltf house.glo --max-texture-size 1024 --power-of-two\n"
+    "  orv-convert big.ifc big.glo --dry-run                only say what would come of it\n"
+    "  orv-convert a.glb a.glo --report a.json              for a script (docs/convert.md)\n"
+    "  orv-convert city.obj city.glo --time-limit 0 --memory-limit 16384";
+
+int fail(const std::string& message)
+{
+    std::fprintf(stderr, "orv-convert: %s\n", message.c_str());
     return FAILED;
 }
 
-size_t countNodes(const glo::NodeData& node)
+int run(const Command& command)
 {
-    size_t count = 1;
-    for (const glo::NodeData& child : node.children)
-        count += countNodes(child);
-    return count;
-}
-
-void print(const std::string& in, const std::string& out, const convert::ConvertedModel& model, size_t size)
-{
-    const glo::GloScene& scene = model.scene;
-    std::printf("%s: %u nodes, %zu vertices, %zu triangles\n", in.c_str(), model.nodeCount, model.vertexCount,
-                model.triangleCount);
-    std::printf(
-        "%s: %zu bytes, %zu nodes, %zu geometries, %zu materials, %zu lights, %zu cameras, %zu animations\n",
-        out.c_str(), size, countNodes(scene.scene->top), scene.geometries.size(), scene.materials.size(),
-        scene.lights.size(), scene.cameras.size(), scene.animations.size());
-    for (const convert::OutputFile& texture : model.textures)
-        std::printf("  texture %s: %zu bytes\n", texture.name.c_str(), texture.bytes.size());
-    for (const auto& [loss, count] : model.report.getLosses())
-        std::printf("  lost: %s%s\n", loss.c_str(),
-                    count > 1 ? (" (" + std::to_string(count) + " times)").c_str() : "");
-}
-
-int run(const std::string& in, const std::string& out, const convert::Options& options)
-{
-    const std::filesystem::path path(out);
-    convert::ConvertedModel model;
+    convert::Conversion made;
     std::string error;
-    if (!convert::convertModel(in, path.stem().string(), options, model, error))
-        return fail(in, error);
+    const auto work = [&](std::FILE* stream)
+    { return convert::send(convert::convertFile(command.model, command.out, command.options), stream); };
+    const auto accept = [&](std::FILE* stream) { return convert::receive(made, stream); };
+    const bool done = convert::runGuarded(command.limits, work, accept, error);
+    convert::clearProgress();
+    if (!done)
+        return fail(command.model + ": " + error);
+    if (!made.error.empty())
+        return fail(command.model + ": " + made.error);
 
-    convert::OutputFile file{path.filename().string(), {}};
-    if (!glo::writeGlo(model.scene, file.bytes, error))
-        return fail(in, error);
-    std::vector<const convert::OutputFile*> files;
-    for (const convert::OutputFile& texture : model.textures)
-        files.push_back(&texture);
-    files.push_back(&file);
-    if (!convert::writeFiles(path.parent_path().string(), files, error))
-    {
-        std::fprintf(stderr, "orv-convert: %s\n", error.c_str());
-        return FAILED;
-    }
-    print(in, out, model, file.bytes.size());
+    std::vector<convert::OutputFile> files;
+    if (!command.dryRun)
+        files = std::move(made.files);
+    if (!command.report.empty())
+        files.insert(files.begin(), {command.report, {made.json.begin(), made.json.end()}});
+    if (!convert::writeFiles(files, error))
+        return fail(error);
+    std::fputs(made.text.c_str(), stdout);
+    if (command.dryRun)
+        std::puts("Dry run: no scene or texture has been written.");
     return 0;
+}
+
+void addOptions(CLI::App& app, Command& command)
+{
+    convert::Options& options = command.options;
+    app.add_option("MODEL", command.model, "the model file")->required();
+    app.add_option("OUT.glo", command.out, "the scene file to write")->required();
+    app.add_option("--fps", options.fps, "samples per second of animations")
+        ->check(CLI::Range(1.0, 1000.0))
+        ->capture_default_str();
+    app.add_flag("--no-animation", command.noAnimation, "leave animations out");
+    app.add_option("--up", options.up, "the axis that points up in the model, if its file has it wrong")
+        ->check(CLI::IsMember({"x", "y", "z"}));
+    app.add_option("--scale", options.scale, "makes everything larger by this factor")
+        ->check(CLI::Range(1e-6, 1e6))
+        ->capture_default_str();
+    app.add_option("--max-texture-size", options.maxTextureSize, "makes larger textures smaller; in pixels")
+        ->check(CLI::Range(1, LARGEST_TEXTURE));
+    app.add_flag("--power-of-two", options.powerOfTwo,
+                 "gives all textures sizes that can have mipmaps and repeat");
+    app.add_option("--report", command.report, "also write what is reported as JSON to this file");
+    app.add_flag("--dry-run", command.dryRun, "write no scene and no textures");
+    app.add_option("--time-limit", command.limits.seconds, "seconds after which to give up; 0 for never")
+        ->check(CLI::Range(0.0, 1e6))
+        ->capture_default_str();
+    app.add_option("--memory-limit", command.limits.mebibytes,
+                   convert::CAN_LIMIT_MEMORY ? "MiB of memory above which to give up; 0 for no limit"
+                                             : "without effect in this build, which checks addresses")
+        ->check(CLI::Range(0, 1 << 24))
+        ->capture_default_str();
+    app.footer(FOOTER);
 }
 
 } // namespace
 
 int main(int argc, char** argv)
 {
-    CLI::App app("Makes a scene file of a model (glTF, Collada, FBX, OBJ, 3DS, X and many more).");
-    app.footer("Textures are written beside the scene, their names beginning with its name.\n"
-               "Existing files of these names are replaced; on failure nothing is written.\n\n"
-               "Examples:\n"
-               "  orv-convert duck.dae duck.glo\n"
-               "  orv-convert walk.fbx scenes/walk.glo --fps 60");
-    std::string in;
-    std::string out;
-    convert::Options options;
-    app.add_option("MODEL", in, "the model file")->required();
-    app.add_option("OUT.glo", out, "the scene file to write")->required();
-    app.add_option("--fps", options.fps, "samples per second of animations")
-        ->check(CLI::Range(1.0, 1000.0))
-        ->capture_default_str();
+    CLI::App app("Makes a scene file of a model (glTF, Collada, FBX, OBJ, 3DS, PLY and many more).",
+                 "orv-convert");
+    Command command;
+    addOptions(app, command);
     try
     {
         app.parse(argc, argv);
@@ -94,10 +120,11 @@ int main(int argc, char** argv)
     {
         return app.exit(error) == 0 ? 0 : MISUSED;
     }
-    if (std::filesystem::path(out).extension() != ".glo")
+    command.options.animation = !command.noAnimation;
+    if (std::filesystem::path(command.out).extension() != ".glo")
     {
-        std::fprintf(stderr, "orv-convert: %s: the output's name has to end in .glo\n", out.c_str());
+        fail(command.out + ": the output's name has to end in .glo");
         return MISUSED;
     }
-    return run(in, out, options);
+    return run(command);
 }

@@ -1,218 +1,315 @@
 #include "materials.h"
 
+#include "highlights.h"
+#include "materialvalues.h"
+#include "samplers.h"
+
+#include "orv/detail/glomaterialrules.h"
+
 #include <assimp/GltfMaterial.h>
-#include <assimp/material.h>
 
 #include <algorithm>
-#include <cmath>
+
+// docs/convert.md says the same in tables.
 
 namespace convert
 {
 
 using orv::Vector4f;
+using orv::detail::glo::isBlack;
+using Alpha = TextureWish::Alpha;
 
 namespace
 {
 
-constexpr float ALMOST_OPAQUE = 0.999f; // blended, and looks opaque
+constexpr float ALMOST_OPAQUE = 0.999f;     // blended, and looks opaque
+constexpr float ALMOST_BLACK = 1.0f / 4096; // not seen, and yet switches the diffuse picture's alpha on
 
-Vector4f getColour(const aiMaterial& material, const char* key, unsigned type, unsigned index,
-                   const Vector4f& fallback)
+const Vector4f BLACK(0.0f, 0.0f, 0.0f, 1.0f);
+const Vector4f WHITE(1.0f, 1.0f, 1.0f, 1.0f);
+
+const std::initializer_list<aiTextureType> BASE = {aiTextureType_DIFFUSE, aiTextureType_BASE_COLOR};
+const std::initializer_list<aiTextureType> NORMALS = {aiTextureType_NORMALS, aiTextureType_NORMAL_CAMERA};
+const std::initializer_list<aiTextureType> EMISSIVE = {aiTextureType_EMISSIVE, aiTextureType_EMISSION_COLOR};
+
+/// glTF's way to say whether alpha counts; empty for other formats.
+std::string getAlphaMode(const aiMaterial& material)
 {
-    aiColor4D colour;
-    if (material.Get(key, type, index, colour) != aiReturn_SUCCESS)
-        return fallback;
-    return Vector4f(colour.r, colour.g, colour.b, 1.0f);
+    aiString mode;
+    return material.Get(AI_MATKEY_GLTF_ALPHAMODE, mode) == aiReturn_SUCCESS ? mode.C_Str() : "";
 }
 
-float getFloat(const aiMaterial& material, const char* key, unsigned type, unsigned index, float fallback)
-{
-    float value;
-    return material.Get(key, type, index, value) == aiReturn_SUCCESS && std::isfinite(value) ? value
-                                                                                             : fallback;
-}
-
-bool isBlack(const Vector4f& colour)
-{
-    return colour.x == 0.0f && colour.y == 0.0f && colour.z == 0.0f;
-}
-
-uint32_t toWrapMode(aiTextureMapMode mode)
-{
-    switch (mode)
-    {
-    case aiTextureMapMode_Clamp:
-    case aiTextureMapMode_Decal: return 1;
-    case aiTextureMapMode_Mirror: return 2;
-    default: return 0;
-    }
-}
-
-/// Makes samplers of one material's pictures.
-class SamplerMaker
+/// Converts one material, feature by feature.
+class MaterialConverter
 {
 public:
-    SamplerMaker(const aiMaterial& material, bool repeats, TextureStore& textures, Report& report)
-        : m_material(material)
-        , m_repeats(repeats)
+    MaterialConverter(const aiMaterial& source, bool repeats, TextureStore& textures, Report& report)
+        : m_source(source)
+        , m_samplers(source, findUvChannel(source), repeats, textures, report)
         , m_textures(textures)
         , m_report(report)
+        , m_alphaMode(getAlphaMode(source))
+        , m_isGltf(!m_alphaMode.empty())
     {
     }
 
-    /// @param hasAlpha  set if the picture is partly transparent.
-    glo::SamplerField make(aiTextureType type, bool* hasAlpha = nullptr)
+    glo::StandardMaterial convert()
     {
-        aiString path;
-        aiTextureMapMode modes[2] = {aiTextureMapMode_Wrap, aiTextureMapMode_Wrap};
-        unsigned channel = 0;
-        if (m_material.GetTexture(type, 0, &path, nullptr, &channel, nullptr, nullptr, modes) !=
-            aiReturn_SUCCESS)
-            return {};
-        if (m_material.GetTextureCount(type) > 1)
-            m_report.lose("a material's further layers of one kind of texture");
-        if (channel != findUvChannel(m_material))
-            m_report.lose("a second set of texture coordinates");
-
-        glo::Sampler sampler;
-        sampler.minFilter = 5;
-        sampler.wrapHorizontal = toWrapMode(modes[0]);
-        sampler.wrapVertical = toWrapMode(modes[1]);
-        const TextureUse use = m_textures.add(
-            path.C_Str(), m_repeats && (sampler.wrapHorizontal != 1 || sampler.wrapVertical != 1));
-        if (use.name.empty())
-            return {};
-        if (hasAlpha)
-            *hasAlpha = use.hasAlpha;
-        sampler.image = use.name;
-        return sampler;
+        setBase();
+        setEmission();
+        setHighlight();
+        setNormals();
+        m_made.doubleSided = getInt(m_source, AI_MATKEY_TWOSIDED) != 0;
+        if (getInt(m_source, AI_MATKEY_SHADING_MODEL) == aiShadingMode_NoShading)
+            makeUnlit();
+        reportUnused();
+        return m_made;
     }
 
 private:
-    const aiMaterial& m_material;
-    bool m_repeats;
+    void setBase()
+    {
+        const Vector4f usual = m_isGltf ? WHITE : Vector4f(0.6f, 0.6f, 0.6f, 1.0f);
+        Vector4f colour =
+            getColour(m_source, AI_MATKEY_COLOR_DIFFUSE, getColour(m_source, AI_MATKEY_BASE_COLOR, usual));
+        const float opacity = getOpacity(colour.w);
+        const MadeSampler picture = m_samplers.make(BASE, wishBase(colour.w));
+        if (picture.field && !m_isGltf && isBlack(colour))
+            colour = WHITE; // black would hide the picture
+        colour.w = 1.0f;
+        m_made.diffuse = {colour, picture.field};
+        m_made.ambient.colour = colour; // for lights that have an ambient part
+        m_made.opacity = picture.hasAlpha ? std::min(opacity, ALMOST_OPAQUE) : opacity;
+        if (m_alphaMode == "MASK" && picture.hasAlpha)
+            m_report.approximate("alpha-mask", "a cut-out (blended, its picture cut at the threshold)");
+    }
+
+    /// Of the whole surface.
+    /// @param alpha  of the base colour.
+    float getOpacity(float alpha)
+    {
+        if (m_isGltf)
+            return m_alphaMode == "BLEND" ? std::clamp(alpha, 0.0f, ALMOST_OPAQUE) : 1.0f;
+        const float opacity = getFloat(m_source, AI_MATKEY_OPACITY, 1.0f);
+        if (opacity > 0.0f)
+            return std::min(opacity, 1.0f);
+        m_report.approximate("opacity-zero", "an opacity of 0, which some programs write for none (opaque)");
+        return 1.0f;
+    }
+
+    /// How the alpha of the base picture is meant.
+    /// @param alpha  of the base colour.
+    TextureWish wishBase(float alpha)
+    {
+        TextureWish wish;
+        if (m_alphaMode == "MASK")
+        {
+            wish.alpha = Alpha::CUT;
+            wish.threshold = getFloat(m_source, AI_MATKEY_GLTF_ALPHACUTOFF, 0.5f) / std::max(alpha, 1e-3f);
+            return wish;
+        }
+        if (m_isGltf)
+        {
+            wish.alpha = m_alphaMode == "BLEND" ? Alpha::KEEP : Alpha::DROP;
+            return wish;
+        }
+        const int flags = getInt(m_source, AI_MATKEY_TEXFLAGS_DIFFUSE(0));
+        wish.alpha = flags & aiTextureFlags_IgnoreAlpha ? Alpha::DROP
+                     : flags & aiTextureFlags_UseAlpha  ? Alpha::KEEP
+                                                        : Alpha::AUTO;
+        addOpacityMap(wish);
+        return wish;
+    }
+
+    /// A picture whose brightness is the opacity, or which is the base picture with its alpha.
+    void addOpacityMap(TextureWish& wish)
+    {
+        const std::string map = getTexturePath(m_source, aiTextureType_OPACITY);
+        const std::string base = getTexturePath(m_source, findTextureType(m_source, BASE));
+        if (map.empty())
+            return;
+        if (base.empty())
+            m_report.lose("opacity-map", "an opacity map on a surface without another picture");
+        wish.alpha = Alpha::KEEP;
+        if (map != base)
+            wish.opacity = map;
+    }
+
+    void setEmission()
+    {
+        Vector4f colour = getColour(m_source, AI_MATKEY_COLOR_EMISSIVE, BLACK);
+        m_made.emissive.sampler = m_samplers.make(EMISSIVE).field;
+        if (m_made.emissive.sampler && !m_isGltf && isBlack(colour))
+            colour = WHITE;
+        else if (!m_made.emissive.sampler && !m_isGltf && !isBlack(colour))
+            m_made.emissive.sampler = m_made.diffuse.sampler; // which lies over all light there
+        colour.w = 1.0f;
+        m_made.emissive.colour = colour;
+    }
+
+    void setHighlight()
+    {
+        Highlight highlight;
+        if (hasFloat(m_source, AI_MATKEY_GLOSSINESS_FACTOR))
+            highlight = getGlossHighlight();
+        else if (hasFloat(m_source,
+                          AI_MATKEY_METALLIC_FACTOR) || // roughness, FBX materials of Phong have as well
+                 findTextureType(m_source, {aiTextureType_METALNESS, aiTextureType_DIFFUSE_ROUGHNESS}) !=
+                     aiTextureType_NONE)
+            highlight = getMetalHighlight();
+        else
+            highlight = getClassicHighlight();
+        m_made.specular.colour = highlight.colour;
+        m_made.specularLevel = highlight.level;
+        m_made.shininess = highlight.shininess;
+    }
+
+    Highlight getMetalHighlight()
+    {
+        const aiTextureType metal =
+            findTextureType(m_source, {aiTextureType_METALNESS, aiTextureType_UNKNOWN});
+        const aiTextureType rough =
+            findTextureType(m_source, {aiTextureType_DIFFUSE_ROUGHNESS, aiTextureType_UNKNOWN});
+        // Maps are multiplied with the factors in glTF, and take their place elsewhere.
+        float metalness = m_isGltf || metal != aiTextureType_NONE ? 1.0f : 0.0f;
+        float roughness = 1.0f;
+        if (m_isGltf || metal == aiTextureType_NONE)
+            metalness = getFloat(m_source, AI_MATKEY_METALLIC_FACTOR, metalness);
+        if (m_isGltf || rough == aiTextureType_NONE)
+            roughness = getFloat(m_source, AI_MATKEY_ROUGHNESS_FACTOR, roughness);
+        return fromMetalness(m_made.diffuse.colour, metalness * getMapMean(metal).z,
+                             roughness * getMapMean(rough).y);
+    }
+
+    /// Mean colour of a map that the engine has no use for pixel by pixel; white if there is none.
+    Vector4f getMapMean(aiTextureType type)
+    {
+        if (type == aiTextureType_NONE)
+            return WHITE;
+        m_report.approximate("surface-map", "a map of roughness, metalness or gloss (its mean all over)");
+        return m_textures.getMean(getTexturePath(m_source, type)).value_or(WHITE);
+    }
+
+    /// The map's colour stays a picture; its alpha is gloss.
+    Highlight getGlossHighlight()
+    {
+        const Vector4f specular = getColour(m_source, AI_MATKEY_COLOR_SPECULAR, WHITE);
+        const float glossiness = getFloat(m_source, AI_MATKEY_GLOSSINESS_FACTOR, 1.0f);
+        m_made.specular.sampler = m_samplers.make({aiTextureType_SPECULAR}).field;
+        if (!m_made.specular.sampler)
+            return fromGlossiness(specular, glossiness);
+        Highlight highlight = fromGlossiness(WHITE, glossiness * getMapMean(aiTextureType_SPECULAR).w);
+        highlight.colour = specular;
+        return highlight;
+    }
+
+    Highlight getClassicHighlight()
+    {
+        Vector4f colour = getColour(m_source, AI_MATKEY_COLOR_SPECULAR, BLACK);
+        m_made.specular.sampler = m_samplers.make({aiTextureType_SPECULAR}).field;
+        if (m_made.specular.sampler && isBlack(colour))
+            colour = WHITE;
+        colour.w = 1.0f;
+        const int model = getInt(m_source, AI_MATKEY_SHADING_MODEL);
+        if (model == aiShadingMode_Gouraud || model == aiShadingMode_Flat)
+            return {};
+        m_made.gloss = m_samplers.make({aiTextureType_SHININESS}).field;
+        return fromShininess(colour, getFloat(m_source, AI_MATKEY_SHININESS_STRENGTH, 1.0f),
+                             getFloat(m_source, AI_MATKEY_SHININESS, 0.0f));
+    }
+
+    void setNormals()
+    {
+        m_made.bump = m_samplers.make(NORMALS).field;
+        TextureWish heights;
+        heights.isHeight = true;
+        if (!m_made.bump)
+            m_made.bump = m_samplers.make({aiTextureType_HEIGHT}, heights).field;
+        const float strength =
+            getFloat(m_source, AI_MATKEY_GLTF_TEXTURE_SCALE(aiTextureType_NORMALS, 0), 1.0f);
+        if (m_made.bump && strength != 1.0f)
+            m_report.approximate("normal-strength", "the strength of a normal map (1)");
+        if (m_made.gloss && !m_made.bump)
+            m_report.approximate("gloss-map", "a map of gloss (seen only along with a normal map)");
+    }
+
+    /// The base colour becomes light of its own, which no other light changes.
+    void makeUnlit()
+    {
+        const bool hasOwnLight = m_made.emissive.sampler || !isBlack(m_made.emissive.colour);
+        if (m_isGltf || !hasOwnLight)
+            m_made.emissive = m_made.diffuse;
+        const bool blends = orv::detail::glo::isBlended(m_made);
+        const float left = blends && m_made.diffuse.sampler ? ALMOST_BLACK : 0.0f;
+        m_made.diffuse.colour = Vector4f(left, left, left, 1.0f);
+        if (left == 0.0f)
+            m_made.diffuse.sampler.reset();
+        m_made.ambient = {};
+        m_made.specular = {};
+        m_made.specularLevel = 0.0f;
+        m_made.bump.reset();
+        m_made.gloss.reset();
+    }
+
+    void reportUnused()
+    {
+        const struct
+        {
+            aiTextureType type;
+            const char* code;
+            const char* loss;
+        } kinds[] = {
+            {aiTextureType_REFLECTION, "reflection-map", "a map of what a surface reflects"},
+            {aiTextureType_LIGHTMAP, "light-map", "a map of light or of its absence"},
+            {aiTextureType_AMBIENT_OCCLUSION, "light-map", "a map of light or of its absence"},
+            {aiTextureType_DISPLACEMENT, "displacement-map", "a map that moves the surface"},
+            {aiTextureType_SHEEN, "sheen", "a sheen"},
+            {aiTextureType_CLEARCOAT, "clear-coat", "a clear coat"},
+            {aiTextureType_TRANSMISSION, "transmission", "light that comes through a surface"},
+        };
+        const std::string base = getTexturePath(m_source, findTextureType(m_source, BASE));
+        for (const auto& kind : kinds)
+        {
+            const std::string path = getTexturePath(m_source, kind.type);
+            if (!path.empty() && path != base)
+                m_report.lose(kind.code, kind.loss);
+        }
+        if (getFloat(m_source, AI_MATKEY_CLEARCOAT_FACTOR, 0.0f) > 0.0f)
+            m_report.lose("clear-coat", "a clear coat");
+        if (getFloat(m_source, AI_MATKEY_TRANSMISSION_FACTOR, 0.0f) > 0.0f)
+            m_report.lose("transmission", "light that comes through a surface");
+        if (getInt(m_source, AI_MATKEY_BLEND_FUNC) == aiBlendMode_Additive)
+            m_report.approximate("additive-blending", "a surface that adds its light (blended as usual)");
+    }
+
+    const aiMaterial& m_source;
+    SamplerMaker m_samplers;
     TextureStore& m_textures;
     Report& m_report;
+    std::string m_alphaMode;
+    bool m_isGltf;
+    glo::StandardMaterial m_made;
 };
-
-/// The highlight of a surface by its roughness and metalness.
-void setSpecularFromRoughness(const aiMaterial& source, glo::StandardMaterial& made)
-{
-    const float metal = getFloat(source, AI_MATKEY_METALLIC_FACTOR, 1.0f);
-    const float roughness = std::clamp(getFloat(source, AI_MATKEY_ROUGHNESS_FACTOR, 1.0f), 0.15f, 1.0f);
-    made.shininess = std::clamp(2.0f / std::pow(roughness, 4.0f) - 2.0f, 1.0f, 128.0f);
-    made.specularLevel = 0.5f * (1.0f - roughness) * (1.0f - roughness);
-    const Vector4f base = made.diffuse.colour;
-    const auto mix = [metal](float colour) { return 1.0f + (colour - 1.0f) * metal; };
-    made.specular.colour = Vector4f(mix(base.x), mix(base.y), mix(base.z), 1.0f);
-}
-
-void setSpecular(const aiMaterial& source, glo::StandardMaterial& made)
-{
-    float unused;
-    if (source.Get(AI_MATKEY_METALLIC_FACTOR, unused) == aiReturn_SUCCESS)
-        return setSpecularFromRoughness(source, made);
-    made.specular.colour = getColour(source, AI_MATKEY_COLOR_SPECULAR, Vector4f(0, 0, 0, 1));
-    made.shininess = std::min(getFloat(source, AI_MATKEY_SHININESS, 0.0f), 128.0f);
-    made.specularLevel = getFloat(source, AI_MATKEY_SHININESS_STRENGTH, 1.0f);
-    int model = 0;
-    source.Get(AI_MATKEY_SHADING_MODEL, model);
-    const bool isDull =
-        model == aiShadingMode_Gouraud || model == aiShadingMode_Flat || model == aiShadingMode_NoShading;
-    if (isDull || made.shininess <= 0.0f) // an exponent of 0 would be a highlight all over
-    {
-        made.specularLevel = 0.0f;
-        made.shininess = 1.0f;
-    }
-}
-
-/// How the alpha channel of the base picture is meant.
-bool isBlended(const aiMaterial& source, bool hasAlpha, Report& report)
-{
-    aiString mode;
-    if (source.Get(AI_MATKEY_GLTF_ALPHAMODE, mode) == aiReturn_SUCCESS)
-    {
-        if (std::string(mode.C_Str()) == "MASK")
-            report.lose("a cut-out edge (drawn blended)");
-        return std::string(mode.C_Str()) != "OPAQUE";
-    }
-    int flags = 0;
-    source.Get(AI_MATKEY_TEXFLAGS_DIFFUSE(0), flags);
-    return (flags & aiTextureFlags_UseAlpha) || (hasAlpha && !(flags & aiTextureFlags_IgnoreAlpha));
-}
-
-float getOpacity(const aiMaterial& source, bool hasAlpha, Report& report)
-{
-    float opacity = getFloat(source, AI_MATKEY_OPACITY, 1.0f);
-    if (opacity <= 0.0f)
-    {
-        report.lose("an opacity of 0, which some programs write for none (drawn opaque)");
-        opacity = 1.0f;
-    }
-    return isBlended(source, hasAlpha, report) ? std::min(opacity, ALMOST_OPAQUE) : opacity;
-}
-
-void reportUnused(const aiMaterial& source, Report& report)
-{
-    const struct
-    {
-        aiTextureType type;
-        const char* loss;
-    } kinds[] = {
-        {aiTextureType_OPACITY, "an opacity map of its own"},
-        {aiTextureType_REFLECTION, "a reflection map"},
-        {aiTextureType_LIGHTMAP, "a light map"},
-        {aiTextureType_METALNESS, "a metalness map"},
-        {aiTextureType_DIFFUSE_ROUGHNESS, "a roughness map"},
-        {aiTextureType_HEIGHT, "a height map"},
-    };
-    aiString diffuse;
-    aiString path;
-    source.GetTexture(aiTextureType_DIFFUSE, 0, &diffuse);
-    for (const auto& kind : kinds)
-    {
-        if (source.GetTexture(kind.type, 0, &path) == aiReturn_SUCCESS && !(path == diffuse))
-            report.lose(kind.loss);
-    }
-}
 
 } // namespace
 
 unsigned findUvChannel(const aiMaterial& material)
 {
-    for (const aiTextureType type :
-         {aiTextureType_DIFFUSE, aiTextureType_NORMALS, aiTextureType_EMISSIVE, aiTextureType_SPECULAR})
-    {
-        aiString path;
-        unsigned channel = 0;
-        if (material.GetTexture(type, 0, &path, nullptr, &channel) == aiReturn_SUCCESS)
-            return channel;
-    }
-    return 0;
+    const aiTextureType type =
+        findTextureType(material, {aiTextureType_DIFFUSE, aiTextureType_BASE_COLOR, aiTextureType_NORMALS,
+                                   aiTextureType_NORMAL_CAMERA, aiTextureType_HEIGHT, aiTextureType_EMISSIVE,
+                                   aiTextureType_EMISSION_COLOR, aiTextureType_SPECULAR});
+    aiString path;
+    unsigned channel = 0;
+    if (type != aiTextureType_NONE)
+        material.GetTexture(type, 0, &path, nullptr, &channel);
+    return channel;
 }
 
 ConvertedMaterial convertMaterial(const aiMaterial& source, bool repeats, TextureStore& textures,
                                   NameMaker& names, Report& report)
 {
-    SamplerMaker samplers(source, repeats, textures, report);
-    glo::StandardMaterial made;
-    bool hasAlpha = false;
-    made.diffuse.colour = getColour(source, AI_MATKEY_COLOR_DIFFUSE, Vector4f(0.6f, 0.6f, 0.6f, 1.0f));
-    made.diffuse.sampler = samplers.make(aiTextureType_DIFFUSE, &hasAlpha);
-    if (made.diffuse.sampler && isBlack(made.diffuse.colour))
-        made.diffuse.colour = Vector4f(1.0f, 1.0f, 1.0f, 1.0f); // black would hide the picture
-    made.ambient.colour = made.diffuse.colour;                  // for lights that have an ambient part
-    made.emissive.colour = getColour(source, AI_MATKEY_COLOR_EMISSIVE, Vector4f(0, 0, 0, 1));
-    made.emissive.sampler = samplers.make(aiTextureType_EMISSIVE);
-    setSpecular(source, made);
-    made.specular.sampler = samplers.make(aiTextureType_SPECULAR);
-    made.bump = samplers.make(aiTextureType_NORMALS);
-    made.opacity = getOpacity(source, hasAlpha, report);
-    int twoSided = 0;
-    source.Get(AI_MATKEY_TWOSIDED, twoSided);
-    made.doubleSided = twoSided != 0;
-    reportUnused(source, report);
-
+    const glo::StandardMaterial made = MaterialConverter(source, repeats, textures, report).convert();
     ConvertedMaterial converted;
     converted.uvChannel = findUvChannel(source);
     converted.hasNormalMap = made.bump.has_value();

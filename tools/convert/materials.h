@@ -17,7 +17,7 @@ struct ConvertedMaterial
     bool hasNormalMap = false;
 };
 
-/// @param wanted  the channel of texture coordinates that the material's pictures ask for.
+/// @return the channel of texture coordinates that the material's first picture asks for; 0 if it has none.
 unsigned findUvChannel(const aiMaterial& material);
 
 /// @param repeats  texture coordinates leave the pictures.

@@ -3,16 +3,27 @@
 #include "glo/glowriter.h"
 #include "materials.h"
 
+#include <vector>
+
 struct aiMesh;
 
 namespace convert
 {
 
-/// Triangles with positions, normals, and as far as there are such texture coordinates (a_uv0) and, where the
-/// material has a normal map, tangents and binormals.
-/// @param name  of the geometry.
-glo::Geometry convertMesh(const aiMesh& mesh, const ConvertedMaterial& material, const std::string& name,
-                          Report& report);
+/// A geometry and, if a skin moves it, the mesh's bones that its joint numbers count: the number after the last
+/// bone's is the mesh's own node.
+struct MeshPart
+{
+    glo::Geometry geometry; ///< without a name
+    std::vector<uint16_t> bones;
+};
+
+/// Triangles, lines or points with positions and what else the mesh has: normals, two sets of texture coordinates,
+/// a colour, joints and weights; and tangents and binormals if the material has a normal map. Vertices that are the
+/// same all over are joined, faces that have no area are left out.
+/// @param mesh  all of its faces have the same number of corners, 1 to 3.
+/// @return in as many parts as the limits of geometries ask for; none if nothing is left.
+std::vector<MeshPart> convertMesh(const aiMesh& mesh, const ConvertedMaterial& material, Report& report);
 
 /// Whether texture coordinates of the channel lie outside 0 to 1.
 bool leavesPicture(const aiMesh& mesh, unsigned uvChannel);

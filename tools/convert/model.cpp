@@ -1,21 +1,15 @@
 #include "model.h"
 
-#include "animations.h"
+#include "importer.h"
 #include "lights.h"
 #include "materials.h"
 #include "meshes.h"
 #include "names.h"
 #include "placement.h"
-
-#include <assimp/Importer.hpp>
-#include <assimp/config.h>
-#include <assimp/importerdesc.h>
-#include <assimp/postprocess.h>
-#include <assimp/scene.h>
+#include "progress.h"
 
 #include <filesystem>
-#include <limits>
-#include <map>
+#include <set>
 
 namespace convert
 {
@@ -23,52 +17,43 @@ namespace convert
 namespace
 {
 
-constexpr int MOST_VERTICES = 65535; // of one mesh, for 16-bit indices
-constexpr float CREASE_DEGREES = 66.0f;
-
-const aiScene* import(Assimp::Importer& importer, const std::string& path)
-{
-    importer.SetPropertyInteger(AI_CONFIG_PP_SLM_VERTEX_LIMIT, MOST_VERTICES);
-    importer.SetPropertyInteger(AI_CONFIG_PP_SLM_TRIANGLE_LIMIT, std::numeric_limits<int>::max());
-    importer.SetPropertyFloat(AI_CONFIG_PP_GSN_MAX_SMOOTHING_ANGLE, CREASE_DEGREES);
-    return importer.ReadFile(path, aiProcess_Triangulate | aiProcess_GenSmoothNormals |
-                                       aiProcess_CalcTangentSpace | aiProcess_GenUVCoords |
-                                       aiProcess_TransformUVCoords | aiProcess_SortByPType |
-                                       aiProcess_JoinIdenticalVertices | aiProcess_SplitLargeMeshes |
-                                       aiProcess_ImproveCacheLocality | aiProcess_ValidateDataStructure);
-}
-
-bool isGltf(const Assimp::Importer& importer)
-{
-    const int index = importer.GetPropertyInteger("importerIndex", -1); // as the importer leaves it
-    const aiImporterDesc* format = index < 0 ? nullptr : importer.GetImporterInfo(size_t(index));
-    return format && std::string(format->mName).find("glTF") != std::string::npos;
-}
-
 /// Makes the records of a scene, in the order in which they need each other.
 class ModelConverter
 {
 public:
-    ModelConverter(const aiScene& source, const std::string& path, const std::string& stem, bool fromGltf,
-                   ConvertedModel& model)
-        : m_source(source)
+    ModelConverter(const ImportedModel& source, const std::string& path, const std::string& stem,
+                   const Options& options, ConvertedModel& model)
+        : m_source(*source.scene)
+        , m_isGltf(source.isGltf)
+        , m_toScene(source.toScene)
         , m_stem(stem)
-        , m_fromGltf(fromGltf)
+        , m_options(options)
         , m_model(model)
-        , m_textures(source, path, stem, model.report)
+        , m_textures(m_source, path, stem, options, model.report)
     {
     }
 
-    void convert(const Options& options)
+    void convert()
     {
         convertMaterials();
         convertMeshes();
-        glo::NodeData top; // bare: what turns the model upright is the model's own top node, below this one
+        glo::NodeData top; // bare: what turns the model upright is below it
         top.name = top.scopedName = m_nodeNames.make(m_stem, "scene");
+        glo::NodeData upright = makeNode(m_nodeNames.make(m_stem + " upright", ""));
         nameNodes(*m_source.mRootNode);
-        top.children.push_back(convertNode(*m_source.mRootNode));
+        findAnimatedNodes();
+        glo::NodeData root = convertNode(*m_source.mRootNode);
+        if (m_toScene.IsIdentity())
+            top.children.push_back(std::move(root));
+        else
+        {
+            place(upright, m_toScene);
+            upright.children.push_back(std::move(root));
+            top.children.push_back(std::move(upright));
+        }
+        if (m_options.animation)
+            convertMotion(top);
         m_model.scene.scene = glo::SceneData{m_stem, std::move(top)};
-        m_model.scene.animations = convertAnimations(m_source, m_names, options, m_model.report);
         m_model.textures = m_textures.getFiles();
     }
 
@@ -96,25 +81,27 @@ private:
         }
     }
 
+    /// A part of a mesh of the model.
+    struct Part
+    {
+        std::string geometry;
+        std::vector<uint16_t> bones; ///< see MeshPart
+    };
+
     void convertMeshes()
     {
         NameMaker names;
         for (unsigned i = 0; i < m_source.mNumMeshes; ++i)
         {
             const aiMesh& mesh = *m_source.mMeshes[i];
-            m_geometryNames.emplace_back();
-            if (!(mesh.mPrimitiveTypes & aiPrimitiveType_TRIANGLE) ||
-                mesh.mNumVertices > unsigned(MOST_VERTICES))
+            showProgress("meshes", float(i) / float(m_source.mNumMeshes));
+            m_parts.emplace_back();
+            for (MeshPart& part : convertMesh(mesh, m_materials[mesh.mMaterialIndex], m_model.report))
             {
-                m_model.report.lose("a mesh of points or lines");
-                continue;
+                part.geometry.name = names.make(mesh.mName.C_Str(), "mesh");
+                m_parts.back().push_back({part.geometry.name, std::move(part.bones)});
+                m_model.scene.geometries.push_back(std::move(part.geometry));
             }
-            m_geometryNames.back() = names.make(mesh.mName.C_Str(), "mesh");
-            m_model.scene.geometries.push_back(
-                convertMesh(mesh, m_materials[mesh.mMaterialIndex], m_geometryNames.back(), m_model.report));
-            m_model.vertexCount += mesh.mNumVertices;
-            m_model.triangleCount +=
-                m_model.scene.geometries.back().primitiveSets[0].indices->indices.size() / 3;
         }
     }
 
@@ -122,45 +109,127 @@ private:
     void nameNodes(const aiNode& node)
     {
         m_names[&node] = m_nodeNames.make(node.mName.C_Str(), "node");
-        ++m_model.nodeCount;
+        m_nodes.emplace(node.mName.C_Str(), &node);
         for (unsigned i = 0; i < node.mNumChildren; ++i)
             nameNodes(*node.mChildren[i]);
     }
 
-    glo::NodeData convertNode(const aiNode& source)
+    const aiNode* findNode(const aiString& name) const
+    {
+        const auto found = m_nodes.find(name.C_Str());
+        return found != m_nodes.end() ? found->second : nullptr;
+    }
+
+    void findAnimatedNodes()
+    {
+        for (unsigned i = 0; i < (m_options.animation ? m_source.mNumAnimations : 0); ++i)
+        {
+            const aiAnimation& animation = *m_source.mAnimations[i];
+            for (unsigned c = 0; c < animation.mNumChannels; ++c)
+                m_animated.insert(findNode(animation.mChannels[c]->mNodeName));
+        }
+    }
+
+    static glo::NodeData makeNode(const std::string& name)
     {
         glo::NodeData node;
-        node.name = node.scopedName = m_names[&source];
-        if (!place(node, source.mTransformation))
-            m_model.report.lose("the shear of node \"" + node.name + "\"");
+        node.name = node.scopedName = name;
+        return node;
+    }
+
+    glo::NodeData convertNode(const aiNode& source)
+    {
+        glo::NodeData node = makeNode(m_names[&source]);
+        const bool isHeld = place(node, source.mTransformation);
         for (unsigned i = 0; i < source.mNumMeshes; ++i)
-            addMesh(source.mMeshes[i], node);
+            addMesh(source.mMeshes[i], source, node);
         // Lights and cameras belong to the first node of their name.
-        if (m_source.mRootNode->FindNode(source.mName) == &source)
+        if (findNode(source.mName) == &source)
         {
             addLights(source, node);
             addCameras(source, node);
         }
         for (unsigned i = 0; i < source.mNumChildren; ++i)
             node.children.push_back(convertNode(*source.mChildren[i]));
-        return node;
+        return isHeld ? node : addShear(std::move(node), source);
     }
 
-    void addMesh(unsigned index, glo::NodeData& node)
+    /// A node that shears becomes two. One that is animated never shears while it moves, but has to be one.
+    glo::NodeData addShear(glo::NodeData node, const aiNode& source)
     {
-        const std::string& geometry = m_geometryNames[index];
-        if (geometry.empty())
-            return;
-        const std::string& material = m_materials[m_source.mMeshes[index]->mMaterialIndex].material.name;
-        glo::NodeData& holder = node.geometry ? addChild(node, geometry) : node;
-        holder.geometry = glo::GeometryReference{geometry, {material}};
+        if (m_animated.count(&source) > 0)
+        {
+            m_model.report.approximate("animated-shear",
+                                       "the shear of node \"" + node.name + "\" while no animation moves it");
+            return node;
+        }
+        const Nested nested = splitShear(source.mTransformation);
+        glo::NodeData outer = makeNode(m_nodeNames.make(node.name + " shear", ""));
+        place(outer, nested.outer);
+        place(node, nested.inner);
+        outer.children.push_back(std::move(node));
+        m_model.report.count("shear-nodes", 1);
+        return outer;
+    }
+
+    void addMesh(unsigned index, const aiNode& source, glo::NodeData& node)
+    {
+        const aiMesh& mesh = *m_source.mMeshes[index];
+        const std::vector<std::string> materials = {m_materials[mesh.mMaterialIndex].material.name};
+        for (const Part& part : m_parts[index])
+        {
+            const bool isTurned = !part.bones.empty() && isTurnedBySkin(mesh, part, source);
+            const bool isFree = !node.geometry && !node.skin && !isTurned;
+            glo::NodeData& holder = isFree ? node : addChild(node, part.geometry);
+            if (isTurned)
+            {
+                aiMatrix4x4 mirror;
+                place(holder, aiMatrix4x4::Scaling(aiVector3D(-1, 1, 1), mirror));
+            }
+            if (part.bones.empty())
+                holder.geometry = glo::GeometryReference{part.geometry, materials};
+            else
+                holder.skin = glo::SkinReference{addSkin(mesh, part, m_names[&source]), materials, {}};
+        }
+    }
+
+    static aiMatrix4x4 getWorld(const aiNode& node)
+    {
+        return node.mParent ? getWorld(*node.mParent) * node.mTransformation : node.mTransformation;
+    }
+
+    /// Which sides of faces are seen follows from the node of a mesh, where its vertices are from the joints. So
+    /// where only one of them mirrors, the mesh gets a mirrored node.
+    bool isTurnedBySkin(const aiMesh& mesh, const Part& part, const aiNode& source) const
+    {
+        const aiBone* bone = part.bones[0] < mesh.mNumBones ? mesh.mBones[part.bones[0]] : nullptr;
+        const aiNode* joint = bone ? findNode(bone->mName) : nullptr;
+        const float skinned = joint ? (getWorld(*joint) * bone->mOffsetMatrix).Determinant() : 0.0f;
+        return skinned * getWorld(source).Determinant() < 0.0f;
+    }
+
+    /// Joints take vertices from the mesh as it is in the file to where the scene has them: an assimp bone's matrix
+    /// leads from the mesh to the joint in the pose of binding.
+    const std::string& addSkin(const aiMesh& mesh, const Part& part, const std::string& ownName)
+    {
+        glo::Skin& skin = m_model.scene.skins.emplace_back();
+        skin.name = m_skinNames.make(part.geometry, "skin");
+        skin.geometry = part.geometry;
+        for (const uint16_t number : part.bones)
+        {
+            const aiBone* bone = number < mesh.mNumBones ? mesh.mBones[number] : nullptr;
+            const aiNode* joint = bone ? findNode(bone->mName) : nullptr;
+            if (joint)
+                skin.attachments.push_back({m_names[joint], toMatrix(bone->mOffsetMatrix)});
+            else
+                skin.attachments.push_back({ownName, orv::Matrix4f::IDENTITY});
+        }
+        return skin.name;
     }
 
     glo::NodeData& addChild(glo::NodeData& node, const std::string& name)
     {
-        glo::NodeData& child = node.children.emplace_back();
-        child.name = child.scopedName = m_nodeNames.make(name, "part");
-        return child;
+        return node.children.emplace_back(makeNode(m_nodeNames.make(name, "part")));
     }
 
     /// The node itself if the object sits in it as the engine has it, looking along -z; else a child that does.
@@ -180,8 +249,7 @@ private:
         {
             const aiLight& light = *m_source.mLights[i];
             glo::LightDefinition definition;
-            if (!(light.mName == source.mName) ||
-                !convertLight(light, m_fromGltf, definition, m_model.report))
+            if (!(light.mName == source.mName) || !convertLight(light, m_isGltf, definition, m_model.report))
                 continue;
             definition.name = m_lightNames.make(light.mName.C_Str(), "light");
             const bool isDirected = light.mType != aiLightSource_POINT;
@@ -201,28 +269,41 @@ private:
             const aiCamera& camera = *m_source.mCameras[i];
             if (!(camera.mName == source.mName))
                 continue;
-            glo::CameraDefinition definition = convertCamera(camera, m_fromGltf);
+            glo::CameraDefinition definition = convertCamera(camera, m_isGltf);
             definition.name = m_cameraNames.make(camera.mName.C_Str(), "camera");
-            // The glTF importer repeats the node's position in the camera.
-            const aiVector3D position = m_fromGltf ? aiVector3D() : camera.mPosition;
-            const aiMatrix4x4 transform = lookingAlong(position, camera.mLookAt, camera.mUp);
+            const aiMatrix4x4 transform = placeCamera(camera, source.mTransformation);
             addHolder(node, !node.camera, definition.name + " view", transform).camera =
                 glo::CameraReference{definition.name};
             m_model.scene.cameras.push_back(definition);
         }
     }
 
+    void convertMotion(glo::NodeData& top)
+    {
+        const std::string clipNode = m_nodeNames.make("clips", "");
+        Motion motion = convertAnimations(m_source, m_names, clipNode, m_options, m_model.report);
+        if (motion.usesClipNode)
+            top.children.push_back(makeNode(clipNode));
+        m_model.clips = std::move(motion.clips);
+        m_model.scene.animations = std::move(motion.animations);
+    }
+
     const aiScene& m_source;
+    bool m_isGltf;
+    aiMatrix4x4 m_toScene;
     std::string m_stem;
-    bool m_fromGltf;
+    const Options& m_options;
     ConvertedModel& m_model;
     TextureStore m_textures;
     std::vector<ConvertedMaterial> m_materials; ///< by the model's index
-    std::vector<std::string> m_geometryNames;   ///< likewise; empty for a mesh that is left out
+    std::vector<std::vector<Part>> m_parts;     ///< by the model's index of meshes
     NameMaker m_nodeNames;
     NameMaker m_lightNames;
     NameMaker m_cameraNames;
-    std::map<const aiNode*, std::string> m_names;
+    NameMaker m_skinNames;
+    NodeNames m_names;
+    std::map<std::string, const aiNode*> m_nodes; ///< the first of each name
+    std::set<const aiNode*> m_animated;
 };
 
 } // namespace
@@ -236,19 +317,10 @@ bool convertModel(const std::string& path, const std::string& stem, const Option
         error = reason ? reason.message() : "not a file";
         return false;
     }
-    Assimp::Importer importer;
-    const aiScene* source = import(importer, path);
-    if (!source || !source->mRootNode)
-    {
-        error = importer.GetErrorString();
+    ImportedModel source;
+    if (!importModel(path, options, source, model.report, error))
         return false;
-    }
-    if (source->mFlags & AI_SCENE_FLAGS_INCOMPLETE && source->mNumMeshes == 0)
-    {
-        error = "holds nothing that can be drawn";
-        return false;
-    }
-    ModelConverter(*source, path, stem, isGltf(importer), model).convert(options);
+    ModelConverter(source, path, stem, options, model).convert();
     return true;
 }
 

@@ -1,5 +1,6 @@
 #pragma once
 
+#include "animations.h"
 #include "glo/glowriter.h"
 #include "options.h"
 #include "report.h"
@@ -16,10 +17,8 @@ struct ConvertedModel
 {
     glo::GloScene scene;
     std::vector<OutputFile> textures;
+    std::vector<Clip> clips; ///< on the scene's time line, in its order
     Report report;
-    unsigned nodeCount = 0; ///< of the model; the scene has some more
-    size_t vertexCount = 0;
-    size_t triangleCount = 0;
 };
 
 /// Reads a model file and makes a scene of it.

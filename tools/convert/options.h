@@ -8,12 +8,12 @@ namespace convert
 /// What whoever converts may choose.
 struct Options
 {
-    double fps = 30.0;     ///< samples per second of animations
+    double fps = 30.0;     ///< samples per second of animations, above 0
     bool animation = true; ///< false: the model stands as its file places it
     std::string up;     ///< axis that points up in the file: "x", "y", "z", or empty for what the file says
-    double scale = 1.0; ///< of the whole model
-    int maxTextureSize = 0;  ///< pixels of the longer side; 0 for no limit
-    bool powerOfTwo = false; ///< textures get sides that are powers of two
+    double scale = 1.0; ///< of the whole model, above 0
+    int maxTextureSize = 0;  ///< pixels of a picture's longer side; 0 for no limit
+    bool powerOfTwo = false; ///< all pictures get sides that are powers of two
 };
 
 } // namespace convert

@@ -1,6 +1,7 @@
 #include "outputfiles.h"
 
 #include <cerrno>
+#include <csignal>
 #include <cstdio>
 #include <cstring>
 #include <filesystem>
@@ -15,55 +16,103 @@ namespace fs = std::filesystem;
 namespace
 {
 
+/// Ctrl-C, a closed terminal and the like wait until this is gone.
+class Uninterrupted
+{
+public:
+    Uninterrupted()
+    {
+        sigset_t signals;
+        sigemptyset(&signals);
+        for (const int signal : {SIGINT, SIGTERM, SIGHUP, SIGQUIT})
+            sigaddset(&signals, signal);
+        sigprocmask(SIG_BLOCK, &signals, &m_before);
+    }
+    ~Uninterrupted() { sigprocmask(SIG_SETMASK, &m_before, nullptr); }
+    Uninterrupted(const Uninterrupted&) = delete;
+    Uninterrupted& operator=(const Uninterrupted&) = delete;
+
+private:
+    sigset_t m_before;
+};
+
+/// Files that are removed again unless they are kept.
+class TemporaryFiles
+{
+public:
+    TemporaryFiles() = default;
+    ~TemporaryFiles()
+    {
+        std::error_code ignored;
+        for (const fs::path& path : m_paths)
+            fs::remove(path, ignored);
+    }
+    TemporaryFiles(const TemporaryFiles&) = delete;
+    TemporaryFiles& operator=(const TemporaryFiles&) = delete;
+
+    void add(const fs::path& path) { m_paths.push_back(path); }
+    void keep() { m_paths.clear(); }
+
+private:
+    std::vector<fs::path> m_paths;
+};
+
+bool fail(const std::string& path, const std::string& reason, std::string& error)
+{
+    error = path + ": " + reason;
+    return false;
+}
+
 bool writeFile(const fs::path& path, const std::vector<uint8_t>& bytes)
 {
     std::FILE* file = std::fopen(path.c_str(), "wb");
     if (!file)
         return false;
-    const bool written = std::fwrite(bytes.data(), 1, bytes.size(), file) == bytes.size();
+    const bool written = bytes.empty() || std::fwrite(bytes.data(), 1, bytes.size(), file) == bytes.size();
     return std::fclose(file) == 0 && written;
 }
 
-void remove(const std::vector<fs::path>& paths)
+fs::path getTemporaryPath(const fs::path& target)
 {
-    std::error_code ignored;
-    for (const fs::path& path : paths)
-        fs::remove(path, ignored);
+    return target.parent_path() /
+           ("." + target.filename().string() + "." + std::to_string(getpid()) + ".tmp");
+}
+
+bool writeTemporaries(const std::vector<OutputFile>& files, TemporaryFiles& temporaries, std::string& error)
+{
+    for (const OutputFile& file : files)
+    {
+        std::error_code ignored;
+        if (fs::is_directory(file.path, ignored)) // found out before the first file gets its name
+            return fail(file.path, std::strerror(EISDIR), error);
+        const fs::path path = getTemporaryPath(file.path);
+        temporaries.add(path);
+        if (!writeFile(path, file.bytes))
+            return fail(file.path, std::strerror(errno), error);
+    }
+    return true;
 }
 
 } // namespace
 
-bool writeFiles(const std::string& folder, const std::vector<const OutputFile*>& files, std::string& error)
+bool writeFiles(const std::vector<OutputFile>& files, std::string& error)
 {
-    const fs::path base = folder.empty() ? "." : folder;
-    std::vector<fs::path> temporaries;
-    for (const OutputFile* file : files)
+    const Uninterrupted uninterrupted;
+    TemporaryFiles temporaries;
+    TemporaryFiles added;
+    if (!writeTemporaries(files, temporaries, error))
+        return false;
+    for (const OutputFile& file : files)
     {
-        temporaries.push_back(base / ("." + file->name + "." + std::to_string(getpid()) + ".tmp"));
-        if (!writeFile(temporaries.back(), file->bytes))
-        {
-            error = (fs::path(folder) / file->name).string() + ": " + std::strerror(errno);
-            remove(temporaries);
-            return false;
-        }
-    }
-    std::vector<fs::path> added;
-    for (size_t i = 0; i < files.size(); ++i)
-    {
-        const fs::path target = base / files[i]->name;
         std::error_code reason;
-        const bool isNew = !fs::exists(target, reason);
-        fs::rename(temporaries[i], target, reason);
+        const bool isNew = !fs::exists(file.path, reason);
+        fs::rename(getTemporaryPath(file.path), file.path, reason);
         if (reason)
-        {
-            error = (fs::path(folder) / files[i]->name).string() + ": " + reason.message();
-            remove(temporaries);
-            remove(added);
-            return false;
-        }
+            return fail(file.path, reason.message(), error);
         if (isNew)
-            added.push_back(target);
+            added.add(file.path);
     }
+    added.keep();
     return true;
 }
 

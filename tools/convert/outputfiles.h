@@ -1,16 +1,21 @@
 #pragma once
 
-#include "textures.h"
-
+#include <cstdint>
 #include <string>
 #include <vector>
 
 namespace convert
 {
 
-/// Writes files into a folder, all of them or none: to temporary names first, and when all bytes are there under
-/// their own names, the last file of the list last.
+struct OutputFile
+{
+    std::string path;
+    std::vector<uint8_t> bytes;
+};
+
+/// Writes files, all of them or none: to temporary names in their folders first, and when all bytes are there under
+/// their own names, the last file of the list last. What interrupts a program waits meanwhile.
 /// @param error  "path: reason".
-bool writeFiles(const std::string& folder, const std::vector<const OutputFile*>& files, std::string& error);
+bool writeFiles(const std::vector<OutputFile>& files, std::string& error);
 
 } // namespace convert

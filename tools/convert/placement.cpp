@@ -56,13 +56,26 @@ Vector3f toVector(const aiVector3D& v)
     return Vector3f(float(v.x), float(v.y), float(v.z));
 }
 
+Matrix4f toMatrix(const aiMatrix4x4& m)
+{
+    Matrix4f made;
+    for (unsigned row = 0; row < 4; ++row)
+    {
+        for (unsigned column = 0; column < 4; ++column)
+            made[int(column)][int(row)] = float(m[row][column]);
+    }
+    return made;
+}
+
 Vector4f toAxisAngle(const aiQuaternion& rotation)
 {
-    const aiVector3D part(rotation.x, rotation.y, rotation.z);
+    // Of the two quaternions of a rotation the one that turns by no more than half a circle.
+    const float sign = rotation.w < 0.0f ? -1.0f : 1.0f;
+    const aiVector3D part(rotation.x * sign, rotation.y * sign, rotation.z * sign);
     const float length = float(part.Length());
     if (length < 1e-7f)
         return Vector4f(0.0f, 1.0f, 0.0f, 0.0f);
-    return Vector4f(toVector(part / length), 2.0f * std::atan2(length, float(rotation.w)));
+    return Vector4f(toVector(part / length), 2.0f * std::atan2(length, float(rotation.w) * sign));
 }
 
 bool place(glo::NodeData& node, const aiMatrix4x4& transform)
@@ -89,16 +102,50 @@ bool place(glo::NodeData& node, const aiMatrix4x4& transform)
                                columns[2].y, columns[0].z, columns[1].z, columns[2].z);
     node.rotation = toAxisAngle(aiQuaternion(rotation).Normalize());
 
-    // The matrix as the engine makes it of the components.
+    // As the engine makes a matrix of the components.
     const orv::Quaternionf turn =
         orv::quaternionFromAxisAngle(Vector3f(node.rotation.x, node.rotation.y, node.rotation.z),
                                      orv::Anglef::fromRadians(node.rotation.w));
-    node.transform = orv::toMatrix4(turn) * orv::scaleMatrix(scale);
-    node.transform[3] = Vector4f(node.translation, 1.0f);
+    Matrix4f made = orv::toMatrix4(turn) * orv::scaleMatrix(scale);
+    made[3] = Vector4f(node.translation, 1.0f);
 
     float largest = 0.0f;
-    const float difference = largestDifference(node.transform, transform, largest);
-    return difference <= 1e-3f * largest;
+    const float difference = largestDifference(made, transform, largest);
+    const bool isHeld = difference <= 1e-3f * largest;
+    node.transform = isHeld ? toMatrix(transform) : made;
+    return isHeld;
+}
+
+Nested splitShear(const aiMatrix4x4& transform)
+{
+    // Turning the space in front of the transform so that the axes come out at right angles to each other: two at a
+    // time until all do. Then what is left is a turn and a scale.
+    Nested nested{transform, {}};
+    const auto column = [&](unsigned i)
+    {
+        const aiMatrix4x4& m = nested.outer;
+        return aiVector3D(m[0][i], m[1][i], m[2][i]);
+    };
+    constexpr int MOST_ROUNDS = 30;
+    for (int round = 0; round < MOST_ROUNDS; ++round)
+    {
+        for (unsigned i = 0; i < 3; ++i)
+        {
+            const unsigned a = i;
+            const unsigned b = (i + 1) % 3;
+            const float difference = float(column(a).SquareLength() - column(b).SquareLength());
+            const float product = float(column(a) * column(b));
+            const float angle = 0.5f * std::atan2(difference < 0.0f ? -2.0f * product : 2.0f * product,
+                                                  std::fabs(difference)); // at most an eighth of a circle
+            aiMatrix4x4 turn;
+            turn[a][a] = turn[b][b] = std::cos(angle);
+            turn[b][a] = std::sin(angle);
+            turn[a][b] = -turn[b][a];
+            nested.outer *= turn;
+            nested.inner = turn.Transpose() * nested.inner;
+        }
+    }
+    return nested;
 }
 
 aiMatrix4x4 lookingAlong(const aiVector3D& position, const aiVector3D& direction, const aiVector3D& up)

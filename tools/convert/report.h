@@ -3,29 +3,55 @@
 #include <cstdint>
 #include <map>
 #include <string>
+#include <utility>
+#include <vector>
 
 namespace convert
 {
 
 /// What became of a model: figures, and in sentences for a person what could not be carried over as it was.
+///
+/// Codes and names of figures are for programs, stay as they are, and are listed in docs/convert.md: lower case,
+/// words joined by '-'.
 class Report
 {
 public:
-    /// The same again is only counted.
-    void lose(const std::string& what) { ++m_losses[what]; }
-    void approximate(const std::string& what) { ++m_approximations[what]; }
-    /// Adds to a figure, such as "degenerate faces dropped".
-    void count(const std::string& figure, uint64_t number) { m_figures[figure] += number; }
+    /// A code and a sentence, such as "node-shear" and "the shear of node \"arm\"".
+    using Finding = std::pair<std::string, std::string>;
 
-    /// By sentence, how often.
-    const std::map<std::string, int>& getLosses() const { return m_losses; }
-    const std::map<std::string, int>& getApproximations() const { return m_approximations; }
+    /// A name in the plural, such as "vertices".
+    using Figures = std::vector<std::pair<std::string, uint64_t>>;
+
+    /// Something of the model that the scene has not. The same again is only counted.
+    void lose(const std::string& code, const std::string& sentence) { ++m_losses[{code, sentence}]; }
+    /// Something that the scene has in another form, which looks a little different.
+    void approximate(const std::string& code, const std::string& sentence)
+    {
+        ++m_approximations[{code, sentence}];
+    }
+    /// Adds to a figure of the conversion, such as "degenerate-faces"; one that is 0 is reported too.
+    void count(const std::string& figure, uint64_t number) { m_figures[figure] += number; }
+    /// What the model has, and what the scene has, in the order of the calls.
+    void cameIn(const std::string& figure, uint64_t number) { m_in.emplace_back(figure, number); }
+    void wentOut(const std::string& figure, uint64_t number) { m_out.emplace_back(figure, number); }
+    /// What reads files like the model.
+    void setFormat(const std::string& name) { m_format = name; }
+
+    /// How often each.
+    const std::map<Finding, int>& getLosses() const { return m_losses; }
+    const std::map<Finding, int>& getApproximations() const { return m_approximations; }
     const std::map<std::string, uint64_t>& getFigures() const { return m_figures; }
+    const Figures& getIn() const { return m_in; }
+    const Figures& getOut() const { return m_out; }
+    const std::string& getFormat() const { return m_format; }
 
 private:
-    std::map<std::string, int> m_losses;
-    std::map<std::string, int> m_approximations;
+    std::map<Finding, int> m_losses;
+    std::map<Finding, int> m_approximations;
     std::map<std::string, uint64_t> m_figures;
+    Figures m_in;
+    Figures m_out;
+    std::string m_format;
 };
 
 } // namespace convert

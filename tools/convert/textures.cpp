@@ -1,18 +1,10 @@
 #include "textures.h"
 
-#include <assimp/scene.h>
-
-#define STB_IMAGE_IMPLEMENTATION
-#include <stb/stb_image.h>
-#define STB_IMAGE_WRITE_IMPLEMENTATION
-#include <stb/stb_image_write.h>
+#include "lowercase.h"
+#include "progress.h"
 
 #include <algorithm>
 #include <cctype>
-#include <cmath>
-#include <fstream>
-#include <iterator>
-#include <memory>
 
 namespace convert
 {
@@ -22,140 +14,47 @@ namespace fs = std::filesystem;
 namespace
 {
 
-/// Pixels in memory, top row first.
-struct Pixels
-{
-    int width = 0;
-    int height = 0;
-    int channels = 0;
-    std::vector<uint8_t> data;
-};
+using Alpha = TextureWish::Alpha;
 
-bool decode(const std::vector<uint8_t>& bytes, Pixels& pixels)
-{
-    stbi_uc* data = stbi_load_from_memory(bytes.data(), int(bytes.size()), &pixels.width, &pixels.height,
-                                          &pixels.channels, 0);
-    if (!data)
-        return false;
-    pixels.data.assign(data, data + size_t(pixels.width) * size_t(pixels.height) * size_t(pixels.channels));
-    stbi_image_free(data);
-    return true;
-}
-
-std::vector<uint8_t> encodePng(const Pixels& pixels)
-{
-    std::vector<uint8_t> bytes;
-    const auto append = [](void* context, void* data, int size)
-    {
-        auto& target = *static_cast<std::vector<uint8_t>*>(context);
-        target.insert(target.end(), static_cast<uint8_t*>(data), static_cast<uint8_t*>(data) + size);
-    };
-    stbi_write_png_to_func(append, &bytes, pixels.width, pixels.height, pixels.channels, pixels.data.data(),
-                           0);
-    return bytes;
-}
-
-/// Grey to red, green and blue.
-void spread(Pixels& pixels)
-{
-    std::vector<uint8_t> colours;
-    for (const uint8_t grey : pixels.data)
-        colours.insert(colours.end(), 3, grey);
-    pixels.data = std::move(colours);
-    pixels.channels = 3;
-}
+constexpr int LARGEST_POWER = 4096; // of two, that sizes are raised to
 
 bool isPowerOfTwo(int size)
 {
     return (size & (size - 1)) == 0;
 }
 
-int nextPowerOfTwo(int size)
+/// @return the least power of two that is not below size, or the greatest one up to the limit.
+int toPowerOfTwo(int size, int limit)
 {
     int power = 1;
-    while (power < size && power < 4096)
+    while (power < size && power * 2 <= limit)
         power *= 2;
     return power;
 }
 
-/// Between the four nearest pixels, round the edges as a repeating picture goes on.
-void resize(Pixels& pixels, int width, int height)
+/// Does with the alpha channel what is wanted.
+/// @param changed  set if the picture is not what it was.
+/// @return whether some of the picture is transparent now.
+bool applyAlpha(const TextureWish& wish, Picture& pixels, bool& changed)
 {
-    Pixels made{width, height, pixels.channels, {}};
-    made.data.reserve(size_t(width) * size_t(height) * size_t(pixels.channels));
-    const auto wrap = [](int i, int size) { return (i % size + size) % size; };
-    const auto pixel = [&](int x, int y, int channel)
-    {
-        const size_t row = size_t(wrap(y, pixels.height)) * size_t(pixels.width);
-        return float(
-            pixels.data[(row + size_t(wrap(x, pixels.width))) * size_t(pixels.channels) + size_t(channel)]);
-    };
-    for (int y = 0; y < height; ++y)
-    {
-        const float v = (float(y) + 0.5f) * float(pixels.height) / float(height) - 0.5f;
-        const int top = int(std::floor(v));
-        for (int x = 0; x < width; ++x)
-        {
-            const float u = (float(x) + 0.5f) * float(pixels.width) / float(width) - 0.5f;
-            const int left = int(std::floor(u));
-            for (int c = 0; c < pixels.channels; ++c)
-            {
-                const float upper = std::lerp(pixel(left, top, c), pixel(left + 1, top, c), u - float(left));
-                const float lower =
-                    std::lerp(pixel(left, top + 1, c), pixel(left + 1, top + 1, c), u - float(left));
-                made.data.push_back(uint8_t(std::lerp(upper, lower, v - float(top)) + 0.5f));
-            }
-        }
-    }
-    pixels = std::move(made);
-}
-
-/// A picture that is transparent all over is taken for one whose alpha means something else.
-bool isPartlyTransparent(const Pixels& pixels)
-{
-    if (pixels.channels != 2 && pixels.channels != 4)
+    if (!pixels.hasAlphaChannel())
         return false;
-    bool transparent = false;
-    bool opaque = false;
-    for (size_t i = size_t(pixels.channels) - 1; i < pixels.data.size(); i += size_t(pixels.channels))
+    if (wish.alpha == Alpha::CUT)
     {
-        transparent = transparent || pixels.data[i] < 250;
-        opaque = opaque || pixels.data[i] > 5;
+        cutAlpha(pixels, wish.threshold);
+        changed = true;
     }
-    return transparent && opaque;
+    const Transparency transparency = getTransparency(pixels);
+    const bool counts =
+        wish.alpha != Alpha::DROP && !(wish.alpha == Alpha::AUTO && transparency == Transparency::ALL);
+    if (counts || transparency == Transparency::NONE)
+        return transparency != Transparency::NONE;
+    dropAlpha(pixels);
+    changed = true;
+    return false;
 }
 
-std::string lower(std::string text)
-{
-    std::transform(text.begin(), text.end(), text.begin(),
-                   [](unsigned char c) { return char(std::tolower(c)); });
-    return text;
-}
-
-/// Whether the engine's texture loader answers for names with this ending.
-bool isUsual(const std::string& extension)
-{
-    constexpr const char* USUAL[] = {".jpg", ".jpeg", ".png", ".bmp", ".tga"};
-    return std::any_of(std::begin(USUAL), std::end(USUAL),
-                       [&](const char* known) { return extension == known; });
-}
-
-/// "%20" and the like.
-std::string decodeUrl(const std::string& text)
-{
-    std::string decoded;
-    for (size_t i = 0; i < text.size(); ++i)
-    {
-        const bool coded = text[i] == '%' && i + 2 < text.size() &&
-                           std::isxdigit(static_cast<unsigned char>(text[i + 1])) &&
-                           std::isxdigit(static_cast<unsigned char>(text[i + 2]));
-        decoded += coded ? char(std::stoi(text.substr(i + 1, 2), nullptr, 16)) : text[i];
-        i += coded ? 2 : 0;
-    }
-    return decoded;
-}
-
-/// Names with '#', ';' or ':' mean something else to the engine.
+/// Names with '#', ';' or ':' mean something else to the engine, other signs to other systems' files.
 std::string makePlain(std::string name)
 {
     for (char& c : name)
@@ -166,119 +65,164 @@ std::string makePlain(std::string name)
     return name;
 }
 
-std::string lastPart(const std::string& path)
+/// For sentences; a data URI goes on for pages.
+std::string shorten(const std::string& path)
 {
-    return path.substr(path.find_last_of("/\\") + 1);
+    return path.substr(0, 100);
 }
 
 } // namespace
 
 TextureStore::TextureStore(const aiScene& scene, const fs::path& model, const std::string& stem,
-                           Report& report)
-    : m_scene(scene)
-    , m_folder(model.parent_path())
-    , m_stem(stem)
+                           const Options& options, Report& report)
+    : m_finder(scene, model)
+    , m_stem(makePlain(stem.substr(0, 100)))
+    , m_options(options)
     , m_report(report)
 {
 }
 
-TextureUse TextureStore::add(const std::string& path, bool repeats)
+TextureUse TextureStore::add(const TextureWish& wish)
 {
-    const std::pair<std::string, bool> key(path, repeats);
-    const auto known = m_known.find(key);
-    return known != m_known.end() ? known->second : m_known[key] = make(path, repeats);
+    const auto known = m_known.find(wish);
+    return known != m_known.end() ? known->second : m_known[wish] = make(wish);
 }
 
-TextureUse TextureStore::make(const std::string& path, bool repeats)
+std::optional<orv::Vector4f> TextureStore::getMean(const std::string& path)
 {
-    std::vector<uint8_t> bytes;
-    std::string extension = lower(fs::path(lastPart(path)).extension().string());
-    if (const aiTexture* embedded = m_scene.GetEmbeddedTexture(path.c_str()))
-    {
-        if (embedded->mHeight > 0)
-            return makeRaw(path, *embedded);
-        const uint8_t* data = reinterpret_cast<const uint8_t*>(embedded->pcData);
-        bytes.assign(data, data + embedded->mWidth);
-        extension = "." + lower(embedded->achFormatHint);
-    }
-    else if (!readFile(path, bytes))
-    {
-        m_report.lose("texture \"" + path + "\" is not there");
-        return {};
-    }
-
-    Pixels pixels;
-    if (!decode(bytes, pixels))
-    {
-        m_report.lose("texture \"" + path + "\" cannot be read: " + stbi_failure_reason());
-        return {};
-    }
-    const bool resizes = repeats && !(isPowerOfTwo(pixels.width) && isPowerOfTwo(pixels.height));
-    const bool isGrey = pixels.channels == 1;
-    const bool hasAlpha = isPartlyTransparent(pixels);
-    if (resizes || isGrey || !isUsual(extension))
-    {
-        if (isGrey)
-            spread(pixels);
-        if (resizes)
-            resize(pixels, nextPowerOfTwo(pixels.width), nextPowerOfTwo(pixels.height));
-        bytes = encodePng(pixels);
-        extension = ".png";
-    }
-    m_files.push_back({makeName(path, extension), std::move(bytes)});
-    return {m_files.back().name, hasAlpha};
+    const auto known = m_means.find(path);
+    if (known != m_means.end())
+        return known->second;
+    std::optional<orv::Vector4f>& mean = m_means[path];
+    std::optional<Loaded> loaded = load(path);
+    if (!loaded || !decode(*loaded, path))
+        return mean;
+    const Picture& pixels = loaded->pixels;
+    const float alpha = pixels.hasAlphaChannel() ? convert::getMean(pixels, pixels.channels - 1) : 1.0f;
+    mean = orv::Vector4f(convert::getMean(pixels, 0), convert::getMean(pixels, 1),
+                         convert::getMean(pixels, 2), alpha);
+    return mean;
 }
 
-/// A picture that the model holds as bare pixels.
-TextureUse TextureStore::makeRaw(const std::string& path, const aiTexture& texture)
+std::optional<TextureStore::Loaded> TextureStore::load(const std::string& path)
 {
-    Pixels pixels{int(texture.mWidth), int(texture.mHeight), 4, {}};
-    for (size_t i = 0; i < size_t(texture.mWidth) * texture.mHeight; ++i)
-    {
-        const aiTexel& texel = texture.pcData[i];
-        pixels.data.insert(pixels.data.end(), {texel.r, texel.g, texel.b, texel.a});
-    }
-    m_files.push_back({makeName(path, ".png"), encodePng(pixels)});
-    return {m_files.back().name, isPartlyTransparent(pixels)};
+    const std::string shown = shorten(path);
+    showProgress("texture " + shown);
+    Loaded loaded{m_finder.find(path), {}, {}};
+    if (!loaded.file.isThere)
+        m_report.lose("texture-missing", "texture \"" + shown + "\", which is not there");
+    else if (!readHeader(loaded.file.bytes, loaded.header))
+        m_report.lose("texture-unreadable", "texture \"" + shown + "\", which is in no format known here");
+    else
+        return loaded;
+    return {};
 }
 
-/// Where the path leads from the model's folder, or else where its last part does: paths of other machines and
-/// other cases of letters are common.
-bool TextureStore::readFile(const std::string& path, std::vector<uint8_t>& bytes) const
+bool TextureStore::decode(Loaded& loaded, const std::string& path)
 {
-    std::string plain = decodeUrl(path);
-    if (plain.compare(0, 7, "file://") == 0)
-        plain.erase(0, 7);
-    std::replace(plain.begin(), plain.end(), '\\', '/');
-    std::vector<fs::path> candidates = {m_folder / path, m_folder / plain, m_folder / lastPart(plain)};
-    std::error_code ignored;
-    for (const fs::directory_entry& entry :
-         fs::directory_iterator(m_folder.empty() ? "." : m_folder, ignored))
-    {
-        if (lower(entry.path().filename().string()) == lower(lastPart(plain)))
-            candidates.push_back(entry.path());
-    }
-    for (const fs::path& candidate : candidates)
-    {
-        if (!fs::is_regular_file(candidate, ignored))
-            continue;
-        std::ifstream file(candidate, std::ios::binary);
-        bytes.assign(std::istreambuf_iterator<char>(file), {});
-        return file.good() || file.eof();
-    }
+    if (decodePicture(loaded.file.bytes, loaded.header, loaded.pixels))
+        return true;
+    m_report.lose("texture-unreadable", "texture \"" + shorten(path) + "\", which is damaged");
     return false;
 }
 
-std::string TextureStore::makeName(const std::string& path, const std::string& extension)
+TextureUse TextureStore::make(const TextureWish& wish)
 {
-    // Inside a model pictures may have no more than a number: "*0".
-    const bool isNumber = !path.empty() && path[0] == '*';
-    const std::string ownName = isNumber ? "texture" + path.substr(1) : lastPart(decodeUrl(path));
-    const std::string wanted = makePlain(m_stem + "-" + fs::path(ownName).stem().string().substr(0, 100));
-    std::string name = wanted + extension;
-    for (int number = 2; !m_names.insert(lower(name)).second; ++number)
-        name = wanted + "-" + std::to_string(number) + extension;
-    return name;
+    std::optional<Loaded> loaded = load(wish.path);
+    if (!loaded)
+        return {};
+    if (canPassOn(loaded->header, wish))
+        return passOn(*loaded, wish);
+    if (!decode(*loaded, wish.path))
+        return {};
+
+    Picture& pixels = loaded->pixels;
+    bool changed = treat(pixels, wish);
+    const bool hasAlpha = applyAlpha(wish, pixels, changed);
+    const Size size = getFittingSize(pixels.width, pixels.height, wish.repeats);
+    if (size.width != pixels.width || size.height != pixels.height)
+    {
+        resize(pixels, size.width, size.height, wish.repeats);
+        m_report.count("resized-textures", 1);
+        changed = true;
+    }
+    const bool isKept = !changed && !loaded->header.extension.empty();
+    const std::string name = makeName(loaded->file.name, isKept ? loaded->header.extension : ".png");
+    m_files.push_back({name, isKept ? std::move(loaded->file.bytes) : encodePng(pixels)});
+    m_report.count("rewritten-textures", isKept ? 0 : 1);
+    return {name, hasAlpha, isPowerOfTwo(pixels.width) && isPowerOfTwo(pixels.height)};
+}
+
+/// Whether nobody needs to look at the pixels.
+bool TextureStore::canPassOn(const PictureHeader& header, const TextureWish& wish) const
+{
+    if (header.extension == ".pvr")
+        return true;
+    const Size size = getFittingSize(header.width, header.height, wish.repeats);
+    const bool hasRightSize = size.width == header.width && size.height == header.height;
+    const bool hasRightAlpha = header.channels == 3 || (header.channels == 4 && wish.alpha == Alpha::KEEP);
+    return header.isWhole && !header.extension.empty() && hasRightSize && hasRightAlpha &&
+           wish.opacity.empty() && !wish.isHeight;
+}
+
+TextureUse TextureStore::passOn(const Loaded& loaded, const TextureWish& wish)
+{
+    const PictureHeader& header = loaded.header;
+    if (header.width == 0 && (m_options.maxTextureSize > 0 || m_options.powerOfTwo))
+        m_report.approximate("texture-compressed", "a compressed texture (its size is left alone)");
+    const std::string name = makeName(loaded.file.name, header.extension);
+    m_files.push_back({name, loaded.file.bytes});
+    return {name, header.channels == 4 && wish.alpha == Alpha::KEEP,
+            isPowerOfTwo(header.width) && isPowerOfTwo(header.height)};
+}
+
+/// Does everything that has nothing to do with the size or with the picture's own alpha.
+/// @return whether the picture is not what it was.
+bool TextureStore::treat(Picture& pixels, const TextureWish& wish)
+{
+    bool changed = pixels.channels < 3;
+    spreadGrey(pixels);
+    std::optional<Loaded> opacity = wish.opacity.empty() ? std::nullopt : load(wish.opacity);
+    if (opacity && decode(*opacity, wish.opacity))
+    {
+        setAlpha(pixels, std::move(opacity->pixels));
+        changed = true;
+    }
+    if (wish.isHeight && makeNormals(pixels))
+    {
+        m_report.approximate("height-map", "a map of heights (made a map of normals)");
+        changed = true;
+    }
+    return changed;
+}
+
+/// A size that is wanted, and that GL can do with what is wanted.
+TextureStore::Size TextureStore::getFittingSize(int width, int height, bool repeats) const
+{
+    const int longer = std::max(width, height);
+    const int limit = m_options.maxTextureSize;
+    if (limit > 0 && longer > limit)
+    {
+        width = std::max(1, int(int64_t(width) * limit / longer));
+        height = std::max(1, int(int64_t(height) * limit / longer));
+    }
+    if ((repeats || m_options.powerOfTwo) && !(isPowerOfTwo(width) && isPowerOfTwo(height)))
+    {
+        const int most = limit > 0 ? std::min(limit, LARGEST_POWER) : LARGEST_POWER;
+        width = toPowerOfTwo(width, most);
+        height = toPowerOfTwo(height, most);
+    }
+    return {width, height};
+}
+
+std::string TextureStore::makeName(const std::string& name, const std::string& extension)
+{
+    const std::string wanted = m_stem + "-" + makePlain(name.substr(0, 100));
+    std::string made = wanted;
+    // Without the extension: the engine takes a .pvr for any picture of the same name.
+    for (int number = 2; !m_names.insert(toLowerCase(made)).second; ++number)
+        made = wanted + "-" + std::to_string(number);
+    return made + extension;
 }
 
 } // namespace convert

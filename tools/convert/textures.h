@@ -1,63 +1,104 @@
 #pragma once
 
+#include "options.h"
+#include "outputfiles.h"
+#include "picturefinder.h"
+#include "pictures.h"
 #include "report.h"
 
-#include <cstdint>
+#include "orv/vector.h"
+
+#include <array>
 #include <filesystem>
 #include <map>
+#include <optional>
 #include <set>
 #include <string>
-#include <utility>
+#include <tuple>
 #include <vector>
-
-struct aiScene;
-struct aiTexture;
 
 namespace convert
 {
 
-/// A file to be written beside the scene.
-struct OutputFile
+/// What a material wants of a picture.
+struct TextureWish
 {
-    std::string name;
-    std::vector<uint8_t> bytes;
+    enum class Alpha
+    {
+        AUTO, ///< opacity, unless the picture would be invisible all over
+        KEEP, ///< opacity
+        DROP, ///< nothing
+        CUT   ///< opaque from the threshold on, invisible below
+    };
+
+    std::string path;    ///< as the material names it
+    std::string opacity; ///< of a picture whose brightness is the opacity; empty for none
+    Alpha alpha = Alpha::KEEP;
+    float threshold = 0.0f; ///< of CUT; 0 to 1
+    bool repeats = false;   ///< coordinates leave the picture
+    bool isHeight = false;  ///< heights, wanted as normals
+    /// Filters and wrapping, which the engine ties to the picture's name.
+    std::array<uint32_t, 4> sampling = {};
+
+    auto tie() const { return std::tie(path, opacity, alpha, threshold, repeats, isHeight, sampling); }
+    bool operator<(const TextureWish& other) const { return tie() < other.tie(); }
 };
 
 struct TextureUse
 {
-    std::string name;      ///< of the file that the scene is to name; empty if the picture cannot be had
-    bool hasAlpha = false; ///< some of it is transparent, some is not
+    std::string name;         ///< of the file that the scene is to name; empty if the picture cannot be had
+    bool hasAlpha = false;    ///< some of it is transparent
+    bool isPowerOfTwo = true; ///< both sides are
 };
 
-/// Finds the pictures of a model, on disk or inside it, and makes them files that the engine shows right.
+/// Finds the pictures of a model and makes them files that the engine shows right.
 ///
-/// Pictures are passed on as they are where the engine reads them; grey ones, which it would take for opacity,
-/// unusual formats, and sizes that GL cannot repeat become PNG.
+/// Pictures are passed on byte for byte where that will do; what the engine cannot read, grey ones, which it would
+/// take for opacity, unwanted alpha and sizes that GL cannot repeat become PNG.
 class TextureStore
 {
 public:
     /// @param model  the file they belong to.
     /// @param stem   begins every name, so that two conversions into one folder keep apart.
     TextureStore(const aiScene& scene, const std::filesystem::path& model, const std::string& stem,
-                 Report& report);
+                 const Options& options, Report& report);
 
-    /// @param path     as a material names it.
-    /// @param repeats  coordinates leave the picture, so its sizes have to be powers of two.
-    TextureUse add(const std::string& path, bool repeats);
+    TextureUse add(const TextureWish& wish);
+
+    /// The mean red, green, blue and alpha of a picture, 0 to 1; nothing if it cannot be had.
+    std::optional<orv::Vector4f> getMean(const std::string& path);
 
     const std::vector<OutputFile>& getFiles() const { return m_files; }
 
 private:
-    TextureUse make(const std::string& path, bool repeats);
-    TextureUse makeRaw(const std::string& path, const aiTexture& texture);
-    bool readFile(const std::string& path, std::vector<uint8_t>& bytes) const;
-    std::string makeName(const std::string& path, const std::string& extension);
+    /// A picture, as found and, where somebody needs them, its pixels.
+    struct Loaded
+    {
+        FoundPicture file;
+        PictureHeader header;
+        Picture pixels;
+    };
 
-    const aiScene& m_scene;
-    std::filesystem::path m_folder;
+    struct Size
+    {
+        int width, height;
+    };
+
+    std::optional<Loaded> load(const std::string& path);
+    bool decode(Loaded& loaded, const std::string& path);
+    TextureUse make(const TextureWish& wish);
+    bool canPassOn(const PictureHeader& header, const TextureWish& wish) const;
+    TextureUse passOn(const Loaded& loaded, const TextureWish& wish);
+    bool treat(Picture& pixels, const TextureWish& wish);
+    Size getFittingSize(int width, int height, bool repeats) const;
+    std::string makeName(const std::string& name, const std::string& extension);
+
+    PictureFinder m_finder;
     std::string m_stem;
+    Options m_options;
     Report& m_report;
-    std::map<std::pair<std::string, bool>, TextureUse> m_known;
+    std::map<TextureWish, TextureUse> m_known;
+    std::map<std::string, std::optional<orv::Vector4f>> m_means;
     std::set<std::string> m_names;
     std::vector<OutputFile> m_files;
 };

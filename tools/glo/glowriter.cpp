@@ -12,8 +12,8 @@ namespace
 
 void appendWord(std::vector<uint8_t>& bytes, uint32_t word)
 {
-    for (int shift = 0; shift < 32; shift += 8)
-        bytes.push_back(uint8_t(word >> shift));
+    const uint8_t parts[] = {uint8_t(word), uint8_t(word >> 8), uint8_t(word >> 16), uint8_t(word >> 24)};
+    bytes.insert(bytes.end(), parts, parts + 4);
 }
 
 void appendFloat(std::vector<uint8_t>& bytes, float value)
@@ -233,19 +233,27 @@ VertexSet makeVertexSet(const std::vector<FloatAttribute>& attributes)
     int stride = 0;
     for (const FloatAttribute& attribute : attributes)
     {
-        set.attributes.push_back({attribute.name, attribute.componentCount, type::FLOAT, stride, 0, 0});
-        stride += 4 * attribute.componentCount;
+        set.attributes.push_back(
+            {attribute.name, attribute.componentCount, attribute.type, stride, 0, attribute.normalize});
+        stride += int(type::SIZES[attribute.type]) * attribute.componentCount;
         set.vertexCount = uint32_t(attribute.values.size()) / uint32_t(attribute.componentCount);
     }
     for (VertexAttribute& attribute : set.attributes)
         attribute.stride = stride;
-    for (uint32_t vertex = 0; vertex < set.vertexCount; ++vertex)
+    std::vector<uint8_t>& bytes = set.data.bytes;
+    bytes.reserve(size_t(set.vertexCount) * size_t(stride));
+    for (size_t vertex = 0; vertex < set.vertexCount; ++vertex)
     {
         for (const FloatAttribute& attribute : attributes)
         {
-            for (int i = 0; i < attribute.componentCount; ++i)
-                appendFloat(set.data.bytes,
-                            attribute.values[size_t(vertex) * size_t(attribute.componentCount) + size_t(i)]);
+            const size_t first = vertex * size_t(attribute.componentCount);
+            for (size_t i = first; i < first + size_t(attribute.componentCount); ++i)
+            {
+                if (attribute.type == type::UINT8)
+                    bytes.push_back(uint8_t(attribute.values[i] + 0.5f));
+                else
+                    appendFloat(bytes, attribute.values[i]);
+            }
         }
     }
     return set;

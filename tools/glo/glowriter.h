@@ -24,7 +24,9 @@ struct FloatAttribute
 {
     std::string name;
     int componentCount;
-    std::vector<float> values; ///< vertex by vertex
+    std::vector<float> values;   ///< vertex by vertex
+    uint32_t type = type::FLOAT; ///< as which they are kept: this or UINT8, with values from 0 to 255
+    uint32_t normalize = 0;      ///< flag: 255 stands for 1
 };
 
 /// Interleaves attributes in their order.

@@ -1,0 +1,418 @@
+#include "support/tempdir.h"
+#include "view/companions.h"
+#include "view/compare.h"
+#include "view/fontsearch.h"
+#include "view/orbit.h"
+#include "view/picker.h"
+#include "view/player.h"
+#include "view/scenemeshes.h"
+#include "view/watcher.h"
+
+#include "orv/animation.h"
+#include "orv/appearance.h"
+#include "orv/mesh.h"
+
+#include <gtest/gtest.h>
+
+#include <cmath>
+#include <functional>
+
+using orv::makeShared;
+using orv::Vector3f;
+
+namespace
+{
+
+void expectNear(const Vector3f& expected, const Vector3f& actual, const char* name)
+{
+    EXPECT_LT(length(expected - actual), 1e-4f)
+        << name << ": " << actual.x << ' ' << actual.y << ' ' << actual.z;
+}
+
+/// Remembers when it was last applied.
+class FakeAnimation : public orv::Animation
+{
+public:
+    void apply(float progress) override { m_applied = progress; }
+    float getStart() const override { return 0.0f; }
+    float getEnd() const override { return 10.0f; }
+    float m_applied = -1.0f;
+};
+
+/// A square from -0.5 to 0.5 that faces +z.
+view::MeshTriangles makeSquare()
+{
+    const auto vertices = std::make_shared<view::MeshVertices>();
+    vertices->positions = {
+        {-0.5f, -0.5f, 0.0f}, {0.5f, -0.5f, 0.0f}, {0.5f, 0.5f, 0.0f}, {-0.5f, 0.5f, 0.0f}};
+    return {vertices, {0, 1, 2, 0, 2, 3}};
+}
+
+} // namespace
+
+// Fault caught: an axis the wrong way round, an eye that tips over the pole, a drag that slides away from the hand.
+TEST(ViewOrbit, goesWhereTheHandGoes)
+{
+    struct Case
+    {
+        const char* name;
+        std::function<void(view::Orbit&)> move;
+        Vector3f eye;
+        Vector3f middle;
+    };
+    const float halfView = std::tan(orv::Anglef::fromDegrees(20.0f).radians()) * 10.0f;
+    const Case cases[] = {
+        {"at first", [](view::Orbit&) {}, {0, 0, 10}, {0, 0, 0}},
+        {"dragged to the right, the left side comes to the front",
+         [](view::Orbit& o) { o.turn(180, 0); },
+         {-10, 0, 0},
+         {0, 0, 0}},
+        {"dragged down, seen from above",
+         [](view::Orbit& o) { o.turn(0, 90); },
+         {0, 7.0710678f, 7.0710678f},
+         {0, 0, 0}},
+        {"not over the pole", [](view::Orbit& o) { o.turn(0, 9999); }, {0, 10, 0.01f}, {0, 0, 0}},
+        {"moved by half the view",
+         [](view::Orbit& o) { o.pan(50, 0, 100); },
+         {-halfView, 0, 10},
+         {-halfView, 0, 0}},
+        {"moved down", [](view::Orbit& o) { o.pan(0, 50, 100); }, {0, halfView, 10}, {0, halfView, 0}},
+        {"two steps nearer", [](view::Orbit& o) { o.zoom(2); }, {0, 0, 8.1f}, {0, 0, 0}},
+        {"not through the middle", [](view::Orbit& o) { o.zoom(1e6f); }, {0, 0, 1e-6f}, {0, 0, 0}},
+        {"from a camera of the file",
+         [](view::Orbit& o)
+         {
+             orv::Camera camera;
+             camera.setPosition(Vector3f(7, 0, 0));
+             camera.setRotation(quaternionFromAxisAngle(Vector3f(0, 1, 0), orv::Anglef::fromDegrees(90)));
+             o.continueFrom(camera);
+         },
+         {7, 0, 0},
+         {0, 0, 0}},
+    };
+    for (const Case& c : cases)
+    {
+        view::Orbit orbit;
+        orbit.distance = 10.0f;
+        c.move(orbit);
+        expectNear(c.eye, orbit.getEye(), c.name);
+        expectNear(c.middle, orbit.middle, c.name);
+        orv::Camera camera;
+        orbit.apply(camera);
+        expectNear(orbit.getEye(), camera.getWorldTransform()[3].xyz(), c.name);
+        expectNear(orbit.getDirection(), camera.getWorldTransform()[2].xyz(), c.name);
+        EXPECT_LT(0.0f, camera.getNear()) << c.name;
+    }
+}
+
+// Fault caught: a ray that is upside down, or wrong in views that are not square or not in perspective.
+TEST(ViewOrbit, castsRaysThroughPixels)
+{
+    orv::Camera camera;
+    camera.setPosition(Vector3f(0, 0, 5));
+    camera.setFieldOfView(orv::Anglef::fromDegrees(90.0f));
+    expectNear({0, 0, -1}, view::castThrough(camera, 100, 50, 200, 100).direction, "middle");
+    expectNear(normalize(Vector3f(-2, 1, -1)), view::castThrough(camera, 0, 0, 200, 100).direction,
+               "upper left");
+    camera.setProjectionType(orv::Camera::ProjectionType::ORTHOGRAPHIC);
+    camera.setWidth(8.0f);
+    const orv::Ray ray = view::castThrough(camera, 200, 100, 200, 100);
+    expectNear({0, 0, -1}, ray.direction, "orthographic");
+    expectNear({4, -2, 5 - camera.getNear()}, ray.position, "orthographic, lower right");
+}
+
+// Fault caught: a clip that plays into the next one, a step that leaves the loop, a player that cannot be restarted.
+TEST(ViewPlayer, keepsToItsClip)
+{
+    struct Case
+    {
+        const char* name;
+        std::function<void(view::Player&)> use;
+        float time;
+        bool isMoving;
+    };
+    const Case cases[] = {
+        {"at first", [](view::Player&) {}, 0.0f, true},
+        {"plays", [](view::Player& p) { p.update(0.5f); }, 0.5f, true},
+        {"twice as fast",
+         [](view::Player& p)
+         {
+             p.scaleSpeed(2.0f);
+             p.update(0.5f);
+         },
+         1.0f, true},
+        {"round and round", [](view::Player& p) { p.update(10.5f); }, 0.5f, true},
+        {"once",
+         [](view::Player& p)
+         {
+             p.setLooping(false);
+             p.update(11.0f);
+         },
+         10.0f, false},
+        {"once, and once more",
+         [](view::Player& p)
+         {
+             p.setLooping(false);
+             p.update(11.0f);
+             p.togglePaused();
+         },
+         0.0f, true},
+        {"paused",
+         [](view::Player& p)
+         {
+             p.togglePaused();
+             p.update(1.0f);
+         },
+         0.0f, false},
+        {"and on",
+         [](view::Player& p)
+         {
+             p.togglePaused();
+             p.togglePaused();
+             p.update(1.0f);
+         },
+         1.0f, true},
+        {"a frame on stops",
+         [](view::Player& p)
+         {
+             p.step(1);
+             p.update(1.0f);
+         },
+         1.0f / 30.0f, false},
+        {"a frame back from the start", [](view::Player& p) { p.step(-1); }, 10.0f - 1.0f / 30.0f, false},
+        {"a frame back, once",
+         [](view::Player& p)
+         {
+             p.setLooping(false);
+             p.step(-1);
+         },
+         0.0f, false},
+        {"a clip", [](view::Player& p) { EXPECT_TRUE(p.chooseClip("run")); }, 4.0f, true},
+        {"a clip, round and round",
+         [](view::Player& p)
+         {
+             p.chooseClip("run");
+             p.update(2.5f);
+         },
+         4.5f, true},
+        {"a clip, its middle",
+         [](view::Player& p)
+         {
+             p.chooseClip("run");
+             p.seekShare(0.5f);
+         },
+         5.0f, true},
+        {"a clip, skipped over",
+         [](view::Player& p)
+         {
+             p.chooseClip("run");
+             p.skip(-0.5f);
+         },
+         5.5f, true},
+        {"the clip before the first",
+         [](view::Player& p)
+         {
+             p.stepClip(-1);
+             EXPECT_EQ("pose", p.getClip().name);
+         },
+         7.0f, false},
+        {"no such clip",
+         [](view::Player& p)
+         {
+             p.update(1.0f);
+             EXPECT_FALSE(p.chooseClip("fly"));
+         },
+         1.0f, true},
+    };
+    for (const Case& c : cases)
+    {
+        const auto animation = makeShared<FakeAnimation>();
+        view::Player player(animation, {{"all", 0, 10}, {"run", 4, 6}, {"pose", 7, 7}});
+        c.use(player);
+        EXPECT_NEAR(c.time, player.getTime(), 1e-4) << c.name;
+        EXPECT_EQ(player.getTime(), animation->m_applied) << c.name;
+        EXPECT_EQ(c.isMoving, player.isMoving()) << c.name;
+    }
+}
+
+// Fault caught: a name under the pointer that is not that of what is seen there.
+TEST(ViewPicker, meetsWhatIsDrawn)
+{
+    using Culling = orv::CullingMode;
+    struct Case
+    {
+        const char* name;
+        Vector3f scale;
+        Vector3f position;
+        Culling culling;
+        orv::WindingOrder winding;
+        orv::Ray ray;
+        float distance; ///< below 0: not met
+    };
+    const auto CCW = orv::WindingOrder::WINDING_CCW;
+    const auto CW = orv::WindingOrder::WINDING_CW;
+    const orv::Ray ahead = {{0.25f, 0.1f, 5}, {0, 0, -1}};
+    const orv::Ray back = {{0.25f, 0.1f, -5}, {0, 0, 1}};
+    const Vector3f one(1, 1, 1);
+    const Case cases[] = {
+        {"its front", one, {}, Culling::CULL_BACK, CCW, ahead, 5.0f},
+        {"beside it", one, {}, Culling::CULL_BACK, CCW, {{0.6f, 0, 5}, {0, 0, -1}}, -1.0f},
+        {"looking away", one, {}, Culling::CULL_NONE, CCW, {{0, 0, 5}, {0, 0, 1}}, -1.0f},
+        {"its back", one, {}, Culling::CULL_BACK, CCW, back, -1.0f},
+        {"its back, drawn", one, {}, Culling::CULL_NONE, CCW, back, 5.0f},
+        {"its back alone", one, {}, Culling::CULL_FRONT, CCW, back, 5.0f},
+        {"nothing of it", one, {}, Culling::CULL_FRONT_AND_BACK, CCW, ahead, -1.0f},
+        {"wound the other way", one, {}, Culling::CULL_BACK, CW, ahead, -1.0f},
+        {"mirrored, its front is still its front", {-1, 1, 1}, {}, Culling::CULL_BACK, CCW, ahead, 5.0f},
+        {"mirrored, its back alone", {-1, 1, 1}, {}, Culling::CULL_FRONT, CCW, ahead, -1.0f},
+        {"in world units", {20, 20, 20}, {3, 0, -5}, Culling::CULL_BACK, CCW, ahead, 10.0f},
+        {"squeezed flat", {1, 1, 0}, {}, Culling::CULL_NONE, CCW, ahead, 5.0f},
+    };
+    for (const Case& c : cases)
+    {
+        orv::MeshHeader header;
+        header.boundingRadius = std::sqrt(0.5f);
+        const auto mesh = makeShared<orv::Mesh>(header, nullptr, nullptr);
+        const auto solid = makeShared<orv::Solid>(mesh, makeShared<orv::Appearance>());
+        solid->setScale(c.scale);
+        solid->setPosition(c.position);
+        solid->getAppearance()->setCullingMode(c.culling);
+        solid->getAppearance()->setWindingOrder(c.winding);
+        view::SceneMeshes meshes;
+        meshes.add(*mesh, makeSquare());
+        const view::Hit hit = view::pick(meshes, *solid, c.ray);
+        EXPECT_EQ(c.distance >= 0.0f, hit.solid == solid.get()) << c.name;
+        EXPECT_NEAR(std::max(c.distance, 0.0f), hit.distance, 1e-4) << c.name;
+    }
+}
+
+// Fault caught: a figure that is met where it stood when it was bound, or one behind another.
+TEST(ViewPicker, meetsTheNearestWhereItsJointsHoldIt)
+{
+    const auto mesh = makeShared<orv::Mesh>(orv::MeshHeader(), nullptr, nullptr);
+    const auto root = makeShared<orv::SceneNode>();
+    const auto joint = makeShared<orv::SceneNode>();
+    joint->setPosition(Vector3f(10, 0, 2));
+    joint->setParent(root);
+    const auto figure = makeShared<orv::Solid>(mesh, makeShared<orv::Appearance>());
+    figure->attachJoint(joint, orv::Matrix4f::IDENTITY);
+    figure->setParent(root);
+    const auto wallMesh = makeShared<orv::Mesh>(orv::MeshHeader(), nullptr, nullptr);
+    const auto wall = makeShared<orv::Solid>(wallMesh, makeShared<orv::Appearance>());
+    wall->setScale(Vector3f(100, 100, 1));
+    wall->setParent(root);
+
+    view::MeshTriangles skinned = makeSquare();
+    auto vertices = std::make_shared<view::MeshVertices>(*skinned.vertices);
+    vertices->joints.assign(4, orv::Vector4f(0, 7, NAN, 0)); // the others have no weight, but are looked up
+    vertices->weights.assign(4, orv::Vector4f(1, 0, 0, 0));
+    skinned.vertices = vertices;
+    view::SceneMeshes meshes;
+    meshes.add(*mesh, skinned);
+    meshes.add(*wallMesh, makeSquare());
+    EXPECT_EQ(figure.get(), view::pick(meshes, *root, {{10, 0, 5}, {0, 0, -1}}).solid);
+    EXPECT_FLOAT_EQ(3.0f, view::pick(meshes, *root, {{10, 0, 5}, {0, 0, -1}}).distance);
+    EXPECT_EQ(wall.get(), view::pick(meshes, *root, {{0, 0, 5}, {0, 0, -1}}).solid);
+}
+
+// Fault caught: triangles that GL would draw but nobody can point at, and indices beyond the vertices.
+TEST(ViewPicker, readsTrianglesAsTheyAreDrawn)
+{
+    namespace primitive = orv::detail::glo::primitive;
+    struct Case
+    {
+        uint32_t primitive;
+        std::vector<uint16_t> indices; ///< empty: the vertices in their order
+        std::vector<uint16_t> triangles;
+    };
+    const Case cases[] = {{primitive::TRIANGLES, {4, 3, 2, 1, 0}, {4, 3, 2}},
+                          {primitive::TRIANGLE_FAN, {4, 3, 2, 1}, {4, 3, 2, 4, 2, 1}},
+                          {primitive::TRIANGLE_STRIP, {}, {0, 1, 2, 2, 1, 3, 2, 3, 4}},
+                          {primitive::LINES, {0, 1, 2, 3}, {}},
+                          {primitive::TRIANGLES, {0, 1, 5}, {}}};
+    for (const Case& c : cases)
+    {
+        orv::detail::glo::PrimitiveSet set;
+        set.primitive = c.primitive;
+        if (!c.indices.empty())
+            set.indices = orv::detail::glo::IndexData{3, c.indices};
+        EXPECT_EQ(c.triangles, view::readTriangles(set, 5)) << c.primitive;
+    }
+}
+
+// Fault caught: a comparison that passes what a person would see, or fails for what the text allows.
+TEST(ViewCompare, countsWhatDiffers)
+{
+    struct Case
+    {
+        const char* tolerance;
+        bool isTolerable;
+        size_t pixels;
+    };
+    const view::Picture reference{2, 2, std::vector<uint8_t>(16, 100)};
+    view::Picture actual = reference;
+    actual.rgba[9] = 110; // the third pixel's green
+    actual.rgba[15] = 98; // the fourth one's alpha
+    const Case cases[] = {{"0", false, 2},   {"2", false, 1},   {"9,24.9", false, 1},
+                          {"9,25", true, 1}, {"0,50", true, 2}, {"10", true, 0}};
+    for (const Case& c : cases)
+    {
+        view::Tolerance tolerance;
+        ASSERT_TRUE(view::parseTolerance(c.tolerance, tolerance));
+        const view::Difference difference = view::comparePictures(reference, actual, tolerance);
+        EXPECT_EQ(c.isTolerable, difference.isTolerable) << c.tolerance;
+        EXPECT_EQ(c.pixels, difference.pixels) << c.tolerance;
+        EXPECT_EQ(10, difference.largest);
+        EXPECT_EQ(0, difference.x);
+        EXPECT_EQ(1, difference.y);
+        EXPECT_EQ(80, difference.picture.rgba[9]);
+    }
+    view::Tolerance tolerance;
+    for (const char* text : {"", "x", "-1", "256", "1,", "1,x", "1,101", "1,2,3", "nan"})
+        EXPECT_FALSE(view::parseTolerance(text, tolerance)) << text;
+}
+
+// Fault caught: an edit that is missed, taken half, or taken again and again.
+TEST(ViewWatcher, tellsOfEachEditOnceItIsOver)
+{
+    support::TempDir folder;
+    const std::string path = folder.write("a.txt", "one");
+    view::Watcher watcher;
+    watcher.watch({path, folder.path("later.txt")});
+    EXPECT_FALSE(watcher.hasChanged());
+    folder.write("a.txt", "two, still being written");
+    EXPECT_FALSE(watcher.hasChanged());
+    folder.write("a.txt", "two");
+    EXPECT_FALSE(watcher.hasChanged());
+    EXPECT_TRUE(watcher.hasChanged());
+    EXPECT_FALSE(watcher.hasChanged());
+
+    folder.write("later.txt", "made while the files were loaded again");
+    watcher.watch({path, folder.path("later.txt")});
+    EXPECT_FALSE(watcher.hasChanged());
+    EXPECT_TRUE(watcher.hasChanged());
+}
+
+// Fault caught: a picture of a model that can be edited without the model being converted again.
+TEST(ViewCompanions, followNamesFromFileToFile)
+{
+    support::TempDir folder;
+    const std::string model = folder.write("house.obj", "mtllib house.mtl\n");
+    folder.write("house.mtl", "map_Kd pictures\\bricks.png\n");
+    folder.write("pictures/bricks.png", "garden.jpg");
+    folder.write("garden.jpg", "");
+    folder.write("street.mtl", "");
+    const std::set<std::string> expected = {model, folder.path("house.mtl"),
+                                            folder.path("pictures/bricks.png"), folder.path("garden.jpg")};
+    EXPECT_EQ(expected, view::findCompanions(model));
+}
+
+TEST(ViewFonts, takeTheBestKnownOne)
+{
+    support::TempDir folder;
+    EXPECT_EQ("", view::findFont({folder.path(), folder.path("missing")}));
+    folder.write("b/FreeSans.ttf", "");
+    folder.write("b/Unheard.ttf", "");
+    const std::string best = folder.write("a/c/LiberationSans-Regular.ttf", "");
+    EXPECT_EQ(best, view::findFont({folder.path("missing"), folder.path()}));
+}

@@ -1,0 +1,101 @@
+#include "conversion.h"
+
+#include "figures.h"
+#include "model.h"
+#include "reportprint.h"
+
+#include <exception>
+#include <filesystem>
+#include <new>
+
+namespace convert
+{
+
+namespace
+{
+
+bool sendBytes(const void* data, uint64_t size, std::FILE* stream)
+{
+    return std::fwrite(&size, sizeof size, 1, stream) == 1 &&
+           (size == 0 || std::fwrite(data, 1, size, stream) == size); // data may be null then
+}
+
+/// @param bytes  a string or a vector of bytes.
+template <class Bytes>
+bool receiveBytes(Bytes& bytes, std::FILE* stream)
+{
+    uint64_t size = 0;
+    if (std::fread(&size, sizeof size, 1, stream) != 1)
+        return false;
+    bytes.resize(size);
+    return size == 0 || std::fread(bytes.data(), 1, size, stream) == size;
+}
+
+void convertOrThrow(const std::string& path, const std::string& out, const Options& options,
+                    Conversion& conversion)
+{
+    const std::filesystem::path target(out);
+    ConvertedModel model;
+    if (!convertModel(path, target.stem().string(), options, model, conversion.error))
+        return;
+    OutputFile scene{out, {}};
+    if (!glo::writeGlo(model.scene, scene.bytes, conversion.error))
+        return;
+    countScene(model.scene, model.report);
+    for (OutputFile& texture : model.textures)
+        conversion.files.push_back(
+            {(target.parent_path() / texture.path).string(), std::move(texture.bytes)});
+    conversion.files.push_back(std::move(scene));
+    conversion.text = toText(path, conversion.files, model);
+    conversion.json = toJson(path, conversion.files, model);
+}
+
+} // namespace
+
+Conversion convertFile(const std::string& model, const std::string& out, const Options& options)
+{
+    Conversion conversion;
+    try
+    {
+        convertOrThrow(model, out, options, conversion);
+    }
+    catch (const std::bad_alloc&)
+    {
+        conversion.error = "there is not enough memory";
+    }
+    catch (const std::exception& exception)
+    {
+        conversion.error = exception.what();
+    }
+    return conversion;
+}
+
+bool send(const Conversion& conversion, std::FILE* stream)
+{
+    bool sent = true;
+    for (const std::string* text : {&conversion.error, &conversion.text, &conversion.json})
+        sent = sent && sendBytes(text->data(), text->size(), stream);
+    for (const OutputFile& file : conversion.files)
+        sent = sent && sendBytes(file.path.data(), file.path.size(), stream) &&
+               sendBytes(file.bytes.data(), file.bytes.size(), stream);
+    return sent && sendBytes(nullptr, 0, stream);
+}
+
+bool receive(Conversion& conversion, std::FILE* stream)
+{
+    for (std::string* text : {&conversion.error, &conversion.text, &conversion.json})
+    {
+        if (!receiveBytes(*text, stream))
+            return false;
+    }
+    OutputFile file;
+    while (receiveBytes(file.path, stream) && !file.path.empty())
+    {
+        if (!receiveBytes(file.bytes, stream))
+            return false;
+        conversion.files.push_back(std::move(file));
+    }
+    return file.path.empty();
+}
+
+} // namespace convert

@@ -1,0 +1,30 @@
+#pragma once
+
+#include "options.h"
+#include "outputfiles.h"
+
+#include <cstdio>
+#include <string>
+#include <vector>
+
+namespace convert
+{
+
+/// All that comes of converting a model; nothing is written yet.
+struct Conversion
+{
+    std::string error;             ///< why nothing comes of it; empty if something does
+    std::vector<OutputFile> files; ///< textures, then the scene
+    std::string text;              ///< the report for a person
+    std::string json;              ///< the report for a program
+};
+
+/// @param model  path of the model file.
+/// @param out    path of the scene file to be; textures come to lie beside it.
+Conversion convertFile(const std::string& model, const std::string& out, const Options& options);
+
+/// Hands it from process to process.
+bool send(const Conversion& conversion, std::FILE* stream);
+bool receive(Conversion& conversion, std::FILE* stream);
+
+} // namespace convert

@@ -1,0 +1,60 @@
+#include "highlights.h"
+
+#include <algorithm>
+#include <cmath>
+
+// docs/convert.md says the same in a table.
+
+namespace convert
+{
+
+using orv::Vector4f;
+
+namespace
+{
+
+constexpr float SMOOTHEST = 0.15f; // roughness below which a light would be a point on the surface
+constexpr float SHARPEST = 128.0f; // exponent that a mediump float still does well
+constexpr float NOT_METAL = 0.04f; // what surfaces other than metals mirror
+
+float toShininess(float roughness)
+{
+    const float slope = std::pow(std::clamp(roughness, SMOOTHEST, 1.0f), 4.0f);
+    return std::clamp(2.0f / slope - 2.0f, 1.0f, SHARPEST);
+}
+
+float toLevel(float metalness, float roughness)
+{
+    const float smoothness = 1.0f - std::clamp(roughness, SMOOTHEST, 1.0f);
+    return (0.5f + 0.5f * metalness) * smoothness * smoothness;
+}
+
+} // namespace
+
+Highlight fromMetalness(const Vector4f& base, float metalness, float roughness)
+{
+    const float metal = std::clamp(metalness, 0.0f, 1.0f);
+    const auto tint = [metal](float colour) { return std::lerp(1.0f, colour, metal); };
+    return {Vector4f(tint(base.x), tint(base.y), tint(base.z), 1.0f), toLevel(metal, roughness),
+            toShininess(roughness)};
+}
+
+Highlight fromGlossiness(const Vector4f& specular, float glossiness)
+{
+    const float most = std::max({specular.x, specular.y, specular.z});
+    if (!(most > 0.0f))
+        return {};
+    const float metal = std::clamp((most - NOT_METAL) / (1.0f - NOT_METAL), 0.0f, 1.0f);
+    const float level = toLevel(metal, 1.0f - glossiness) * std::min(1.0f, most / NOT_METAL);
+    return {Vector4f(specular.x / most, specular.y / most, specular.z / most, 1.0f), level,
+            toShininess(1.0f - glossiness)};
+}
+
+Highlight fromShininess(const Vector4f& specular, float level, float shininess)
+{
+    if (!(shininess > 0.0f) || !(level > 0.0f)) // an exponent of 0 would be a highlight all over
+        return {};
+    return {specular, level, std::min(shininess, SHARPEST)};
+}
+
+} // namespace convert

@@ -1,0 +1,173 @@
+#include "importer.h"
+
+#include "figures.h"
+#include "gltffile.h"
+#include "halflifefile.h"
+#include "mending.h"
+#include "progress.h"
+
+#include <assimp/config.h>
+#include <assimp/importerdesc.h>
+#include <assimp/postprocess.h>
+
+#include <algorithm>
+
+namespace convert
+{
+
+namespace
+{
+
+std::string getFormatName(const Assimp::Importer& importer)
+{
+    const int index = importer.GetPropertyInteger("importerIndex", -1); // as the importer leaves it
+    const aiImporterDesc* format = index < 0 ? nullptr : importer.GetImporterInfo(size_t(index));
+    return format ? format->mName : "";
+}
+
+bool contains(const std::string& text, const char* part)
+{
+    return text.find(part) != std::string::npos;
+}
+
+int getNumber(const aiScene& scene, const char* key, int fallback)
+{
+    int32_t number = fallback;
+    return scene.mMetaData && scene.mMetaData->Get(key, number) ? number : fallback;
+}
+
+/// A row that takes a coordinate of the file's, with its sign, for one of the scene's.
+void setRow(aiMatrix4x4& matrix, unsigned row, int axis, int sign)
+{
+    for (unsigned column = 0; column < 3; ++column)
+        matrix[row][column] = int(column) == axis ? (sign < 0 ? -1.0f : 1.0f) : 0.0f;
+}
+
+/// The importer only tells which axes and unit an FBX file is in, and passes its numbers on as they are.
+aiMatrix4x4 makeFbxTransform(const aiScene& scene, bool turns)
+{
+    aiMatrix4x4 transform;
+    const int right = getNumber(scene, "CoordAxis", 0);
+    const int up = getNumber(scene, "UpAxis", 1);
+    const int front = getNumber(scene, "FrontAxis", 2);
+    const bool areAxes =
+        std::min({right, up, front}) == 0 && right + up + front == 3 && right != up && up != front;
+    if (turns && areAxes)
+    {
+        setRow(transform, 0, right, getNumber(scene, "CoordAxisSign", 1));
+        setRow(transform, 1, up, getNumber(scene, "UpAxisSign", 1));
+        setRow(transform, 2, front, getNumber(scene, "FrontAxisSign", 1));
+    }
+    double centimetres = 1.0;
+    float single = 1.0f;
+    if (scene.mMetaData && !scene.mMetaData->Get("UnitScaleFactor", centimetres) &&
+        scene.mMetaData->Get("UnitScaleFactor", single))
+        centimetres = double(single);
+    constexpr double CENTIMETRES_PER_METRE = 100.0;
+    const float metres = float(centimetres > 0.0 ? centimetres / CENTIMETRES_PER_METRE : 1.0);
+    aiMatrix4x4 scale;
+    aiMatrix4x4::Scaling(aiVector3D(metres), scale);
+    return scale * transform;
+}
+
+/// Turns the axis to y.
+aiMatrix4x4 makeUpright(const std::string& axis)
+{
+    constexpr float QUARTER = 1.5707964f;
+    aiMatrix4x4 turn;
+    if (axis == "x")
+        aiMatrix4x4::RotationZ(QUARTER, turn);
+    else if (axis == "z")
+        aiMatrix4x4::RotationX(-QUARTER, turn);
+    return turn;
+}
+
+aiMatrix4x4 makeTransform(const aiScene& scene, const std::string& format, const Options& options)
+{
+    const bool isBlender = contains(format, "Blender"); // where z is always up
+    const std::string up = options.up.empty() && isBlender ? "z" : options.up;
+    aiMatrix4x4 scale;
+    aiMatrix4x4::Scaling(aiVector3D(float(options.scale)), scale);
+    const aiMatrix4x4 own =
+        contains(format, "FBX") ? makeFbxTransform(scene, options.up.empty()) : aiMatrix4x4();
+    return scale * makeUpright(up) * own;
+}
+
+/// Vertices go with those of their joints that there are.
+void dropLostJoints(aiScene& scene, Report& report)
+{
+    for (unsigned i = 0; i < scene.mNumMeshes; ++i)
+    {
+        const aiMesh& mesh = *scene.mMeshes[i];
+        for (unsigned b = 0; b < mesh.mNumBones; ++b)
+        {
+            aiBone& bone = *mesh.mBones[b];
+            if (bone.mNumWeights == 0 || scene.mRootNode->FindNode(bone.mName))
+                continue;
+            bone.mNumWeights = 0;
+            report.lose("joint", "joint \"" + std::string(bone.mName.C_Str()) + "\" of mesh \"" +
+                                     mesh.mName.C_Str() + "\", which is no node of the model");
+        }
+    }
+}
+
+/// The importer of 3DS files forgets where cameras look as soon as the file has nodes.
+void reportCameras(const aiScene& scene, Report& report)
+{
+    for (unsigned i = 0; i < scene.mNumCameras; ++i)
+        report.lose("camera-direction", "where camera \"" + std::string(scene.mCameras[i]->mName.C_Str()) +
+                                            "\" looks, which libassimp does not tell of 3DS files");
+}
+
+/// A file of nothing but a skeleton gets a body from the library.
+void reportSkeletonBody(const aiScene& scene, Report& report)
+{
+    aiString name;
+    if (scene.mNumMaterials == 1 && scene.mMaterials[0]->Get(AI_MATKEY_NAME, name) == aiReturn_SUCCESS &&
+        name == aiString("SkeletonMaterial"))
+        report.approximate("skeleton-body", "a file without meshes: its nodes are shown as bones");
+}
+
+bool fail(const std::string& reason, std::string& error)
+{
+    error = reason.empty() ? "libassimp does not say why" : reason;
+    return false;
+}
+
+} // namespace
+
+bool importModel(const std::string& path, const Options& options, ImportedModel& model, Report& report,
+                 std::string& error)
+{
+    Assimp::Importer& importer = model.importer;
+    importer.SetProgressHandler(new ImportProgress); // the importer's from now on
+    importer.SetPropertyBool(AI_CONFIG_IMPORT_COLLADA_IGNORE_UP_DIRECTION, !options.up.empty());
+    model.scene = importer.ReadFile(path, 0);
+    if (!model.scene)
+        return fail(importer.GetErrorString(), error);
+    aiScene& scene = const_cast<aiScene&>(*model.scene); // the importer's own, and nobody else's
+    const std::string format = getFormatName(importer);
+    model.isGltf = contains(format, "glTF");
+    if (scene.mRootNode && model.isGltf)
+        correctGltf(scene, path, !contains(format, "glTF2"), report);
+    if (scene.mRootNode)
+        mend(scene, report);
+    if (!scene.mRootNode || scene.mNumMeshes == 0)
+        return fail("holds nothing that can be drawn", error);
+    if (!importer.ApplyPostProcessing(aiProcess_ValidateDataStructure))
+        return fail(importer.GetErrorString(), error);
+    report.setFormat(format);
+    countModel(scene, report);
+    reportSkeletonBody(scene, report);
+    if (scene.mRootNode->mName == aiString("<MDL_root>"))
+        correctHalfLife(scene, path);
+    if (contains(format, "3DS"))
+        reportCameras(scene, report);
+    dropLostJoints(scene, report);
+    model.toScene = makeTransform(scene, format, options);
+    model.scene = importer.ApplyPostProcessing(aiProcess_Triangulate | aiProcess_GenUVCoords |
+                                               aiProcess_TransformUVCoords | aiProcess_SortByPType);
+    return model.scene || fail(importer.GetErrorString(), error);
+}
+
+} // namespace convert

@@ -1,0 +1,29 @@
+#pragma once
+
+#include "options.h"
+#include "report.h"
+
+#include <assimp/Importer.hpp>
+#include <assimp/scene.h>
+
+#include <string>
+
+namespace convert
+{
+
+/// A model as libassimp reads it, put right where the library is known to hand over something else than the file has.
+/// Faces have one to three corners, those of one mesh all the same number.
+struct ImportedModel
+{
+    Assimp::Importer importer;
+    const aiScene* scene = nullptr; ///< the importer's
+    bool isGltf = false;
+    aiMatrix4x4
+        toScene; ///< from the model's axes and unit to +y up and, where the file tells its unit, metres
+};
+
+/// @param error  why not.
+bool importModel(const std::string& path, const Options& options, ImportedModel& model, Report& report,
+                 std::string& error);
+
+} // namespace convert

@@ -1,0 +1,23 @@
+#pragma once
+
+#include "cacheorder.h"
+#include "skins.h"
+
+#include <cstdint>
+#include <vector>
+
+namespace convert
+{
+
+/// Splits faces into groups that one geometry each can hold: no more vertices than 16-bit indices count, no more
+/// joints than a shader takes. Triangles are ordered so that a GPU finds most of their vertices among the last ones
+/// that it worked out, and so that those of a group lie together. No face is lost and none is split.
+/// @param cornersPerFace  1 to 3.
+/// @param influences      by number of vertex; empty without a skin.
+std::vector<Corners> splitFaces(const Corners& corners, unsigned cornersPerFace,
+                                const std::vector<Influences>& influences);
+
+/// The joints that move the vertices of some faces, in ascending order.
+std::vector<uint16_t> listJoints(const Corners& corners, const std::vector<Influences>& influences);
+
+} // namespace convert

@@ -1,0 +1,72 @@
+#pragma once
+
+#include <cstdint>
+#include <string>
+#include <vector>
+
+namespace convert
+{
+
+/// Pixels in memory: rows from top to bottom, 1 (grey), 2 (grey, alpha), 3 or 4 bytes per pixel.
+struct Picture
+{
+    int width = 0;
+    int height = 0;
+    int channels = 0;
+    std::vector<uint8_t> data;
+
+    bool hasAlphaChannel() const { return channels == 2 || channels == 4; }
+    size_t getPixelCount() const { return size_t(width) * size_t(height); }
+};
+
+/// What a picture's first bytes tell, and its last ones.
+struct PictureHeader
+{
+    int width = 0; ///< 0, as the next two, for a compressed texture, which the engine reads and nobody here
+    int height = 0;
+    int channels = 0;      ///< at least 4 if any pixel can be transparent and the picture is coloured
+    std::string extension; ///< of the engine's format, ".png"; empty where the engine does not read it
+    bool isWhole = false;  ///< the end is there, so that decoding would bring no surprise
+};
+
+/// @return false if nobody can read it.
+bool readHeader(const std::vector<uint8_t>& bytes, PictureHeader& header);
+
+/// @return false if it is damaged.
+bool decodePicture(const std::vector<uint8_t>& bytes, const PictureHeader& header, Picture& picture);
+
+std::vector<uint8_t> encodePng(const Picture& picture);
+
+/// @param width, height  pixels, above 0. Edges take in what lies beyond the opposite edge, if wrapping.
+void resize(Picture& picture, int width, int height, bool wraps);
+
+/// Grey becomes red, green and blue; alpha stays.
+void spreadGrey(Picture& picture);
+
+void dropAlpha(Picture& picture);
+
+/// Alpha from the threshold on (0 to 1) becomes full, below it none.
+void cutAlpha(Picture& picture, float threshold);
+
+/// Brightness becomes alpha of the other picture.
+/// @param opacity  any size.
+void setAlpha(Picture& picture, Picture opacity);
+
+/// A picture of heights becomes one of normals: red along u, green up. A picture that is coloured stays: many
+/// programs write normals where heights belong.
+/// @return whether it was one of heights.
+bool makeNormals(Picture& heights);
+
+/// What the alpha channel amounts to.
+enum class Transparency
+{
+    NONE,
+    SOME, ///< here more, there less
+    ALL   ///< invisible all over, so alpha surely means something else
+};
+Transparency getTransparency(const Picture& picture);
+
+/// Of one channel (0 to 3), 0 to 1; grey is all of the first three.
+float getMean(const Picture& picture, int channel);
+
+} // namespace convert

@@ -1,0 +1,72 @@
+#include "progress.h"
+
+#include <algorithm>
+#include <chrono>
+#include <cstdio>
+
+#include <unistd.h>
+
+namespace convert
+{
+
+namespace
+{
+
+using Clock = std::chrono::steady_clock;
+
+constexpr std::chrono::milliseconds PATIENCE(500);
+constexpr std::chrono::milliseconds BETWEEN(100);
+constexpr size_t LONGEST = 60; // characters, for narrow terminals
+
+const Clock::time_point g_start = Clock::now();
+Clock::time_point g_shown = g_start;
+
+bool isWatched()
+{
+    static const bool isTerminal = isatty(STDERR_FILENO) != 0;
+    return isTerminal;
+}
+
+float getShare(int step, int steps)
+{
+    return steps > 0 ? float(step) / float(steps) : -1.0f;
+}
+
+} // namespace
+
+void showProgress(const std::string& what, float share)
+{
+    const Clock::time_point now = Clock::now();
+    if (!isWatched() || now - g_start < PATIENCE || now - g_shown < BETWEEN)
+        return;
+    g_shown = now;
+    std::string line = what.substr(0, LONGEST);
+    if (share >= 0.0f)
+        line += " " + std::to_string(int(std::min(share, 1.0f) * 100.0f)) + " %";
+    std::fprintf(stderr, "\r\033[K%s", line.c_str()); // to the line's start, and the old line away
+    std::fflush(stderr);
+}
+
+void clearProgress()
+{
+    if (isWatched())
+        std::fputs("\r\033[K", stderr);
+}
+
+bool ImportProgress::Update(float percentage)
+{
+    showProgress("reading the model", percentage);
+    return true; // go on
+}
+
+void ImportProgress::UpdateFileRead(int step, int steps)
+{
+    showProgress("reading the model", getShare(step, steps));
+}
+
+void ImportProgress::UpdatePostProcess(int step, int steps)
+{
+    showProgress("preparing the model", getShare(step, steps));
+}
+
+} // namespace convert

@@ -1,0 +1,50 @@
+#pragma once
+
+#include "glo/glowriter.h"
+#include "textures.h"
+
+#include <initializer_list>
+
+#include <assimp/material.h>
+
+namespace convert
+{
+
+/// What one of a material's pictures becomes.
+struct MadeSampler
+{
+    glo::SamplerField field; ///< empty if there is no picture, or it cannot be had
+    bool hasAlpha = false;
+};
+
+/// Makes samplers of one material's pictures.
+class SamplerMaker
+{
+public:
+    /// @param uvChannel  of the texture coordinates that the scene will have.
+    /// @param repeats    these leave the pictures.
+    SamplerMaker(const aiMaterial& material, unsigned uvChannel, bool repeats, TextureStore& textures,
+                 Report& report);
+
+    /// @param types  kinds of picture of the same meaning; the first that is there counts.
+    /// @param wish   what else to do with it.
+    MadeSampler make(std::initializer_list<aiTextureType> types, TextureWish wish = {});
+
+private:
+    glo::Sampler readSettings(aiTextureType type);
+
+    const aiMaterial& m_material;
+    unsigned m_uvChannel;
+    bool m_repeats;
+    TextureStore& m_textures;
+    Report& m_report;
+};
+
+/// @param types  kinds of picture of the same meaning.
+/// @return the first that the material has; NONE if it has none.
+aiTextureType findTextureType(const aiMaterial& material, std::initializer_list<aiTextureType> types);
+
+/// Path of a material's first picture of a kind; empty if it has none.
+std::string getTexturePath(const aiMaterial& material, aiTextureType type);
+
+} // namespace convert

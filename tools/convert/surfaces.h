@@ -1,0 +1,29 @@
+#pragma once
+
+#include "parts.h"
+
+#include <assimp/vector3.h>
+
+struct aiMesh;
+
+namespace convert
+{
+
+/// Normals for a mesh that has none, one for each corner of its triangles: smooth where faces meet at less than 66
+/// degrees, sharp elsewhere.
+std::vector<aiVector3D> makeNormals(const aiMesh& mesh, const Corners& corners);
+
+/// The directions in which texture coordinates grow, at right angles to the normals, one for each corner. Corners
+/// share them where position, normal and coordinates are the same, but not where the picture is mirrored.
+struct Tangents
+{
+    std::vector<aiVector3D> alongU;
+    std::vector<aiVector3D> alongV;
+};
+
+/// @param normals  of the corners.
+/// @param uvs      of the mesh's vertices.
+Tangents makeTangents(const aiMesh& mesh, const Corners& corners, const std::vector<aiVector3D>& normals,
+                      const aiVector3D* uvs);
+
+} // namespace convert
