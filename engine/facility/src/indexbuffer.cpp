@@ -34,7 +34,7 @@ IndexBuffer::IndexBuffer(Primitive primitive, int count, bool allocate,
     , m_resource(resource)
 {
     if (allocate)
-        m_indices.reset(new (std::nothrow) unsigned short[unsigned(m_count)]());
+        m_indices.reset(new (std::nothrow) unsigned short[unsigned(m_count)]);
 }
 
 IndexBuffer::~IndexBuffer() = default;

@@ -35,6 +35,8 @@ IndexBuffer::Ptr IndexBufferCache::create(IndexBuffer::Primitive primitive, unsi
     }
     if (indices)
         std::copy_n(indices, count, buffer->getIndices());
+    else
+        std::fill_n(buffer->getIndices(), count, 0);
     add(buffer, name);
     return buffer;
 }

@@ -58,7 +58,7 @@ public:
 
     /// Buffers normally come from IndexBufferCache::create(), whose resource cache must know the resource.
     /// @param count     indices, or vertices where there are none; a negative one counts as 0.
-    /// @param allocate  whether there are indices; they start as 0. getIndices() is null if memory lacks.
+    /// @param allocate  whether there are indices, of no particular values yet. getIndices() is null if memory lacks.
     IndexBuffer(Primitive primitive, int count, bool allocate,
                 const SharedPtr<detail::BufferResource>& resource);
     ~IndexBuffer() override;
