@@ -247,10 +247,10 @@ private:
         orv::eatWhite(m_text);
         const char* const start = m_text.start;
         real ? void(orv::readFloat(m_text, 0.0f)) : void(orv::readInt(m_text, 0));
+        const char* const end = m_text.start;
         const bool isNumber =
-            std::any_of(start, const_cast<const char*>(m_text.start),
-                        [](char c) { return std::isdigit(static_cast<unsigned char>(c)) != 0; });
-        m_file.statements.back().words.emplace_back(start, const_cast<const char*>(m_text.start));
+            std::any_of(start, end, [](char c) { return std::isdigit(static_cast<unsigned char>(c)) != 0; });
+        m_file.statements.back().words.emplace_back(start, end);
         if (!isNumber)
             report(Kind::TEXT_ARGUMENT, offset(start), "\"" + what + "\" lacks a number; 0 is taken");
     }

@@ -64,9 +64,11 @@ private:
 /// @return its exit code; 0 to 255, more for a signal that ended it, negative with errno for no program.
 int runProgram(const std::vector<std::string>& words)
 {
+    std::vector<std::string> copies = words; // the function wants them writable
     std::vector<char*> arguments;
-    for (const std::string& word : words)
-        arguments.push_back(const_cast<char*>(word.c_str()));
+    arguments.reserve(copies.size() + 1);
+    for (std::string& word : copies)
+        arguments.push_back(word.data());
     arguments.push_back(nullptr);
 
     posix_spawn_file_actions_t actions;

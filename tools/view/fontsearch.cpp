@@ -36,8 +36,8 @@ std::vector<std::string> getFontFolders()
         folders.push_back(std::string(home) + "/.local/share/fonts");
         folders.push_back(std::string(home) + "/.fonts");
     }
-    folders.push_back("/usr/local/share/fonts");
-    folders.push_back("/usr/share/fonts");
+    folders.emplace_back("/usr/local/share/fonts");
+    folders.emplace_back("/usr/share/fonts");
     return folders;
 }
 

@@ -50,9 +50,11 @@ private:
 std::vector<Shot> chooseShots(const Options& options, const Clip& clip)
 {
     std::vector<Shot> shots;
+    shots.reserve(size_t(options.turntable));
     for (int i = 0; i < options.turntable; ++i)
         shots.push_back({clip.start + options.time, FULL_TURN * float(i) / float(options.turntable)});
     const int moments = options.frames + (shots.empty() ? options.columns * options.rows : 0);
+    shots.reserve(shots.size() + size_t(moments));
     for (int i = 0; i < moments; ++i)
         shots.push_back({clip.start + (clip.end - clip.start) * float(i) / float(moments), 0.0f});
     if (shots.empty())

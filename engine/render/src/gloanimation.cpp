@@ -268,6 +268,7 @@ bool GloBuilder::makeMaterialChannel(const Channel& channel, const std::string& 
     if (!readKeys(channel, m_name, colours))
         return false;
     std::vector<AnimationKey<Vector4f>> keys;
+    keys.reserve(colours.size());
     for (const AnimationKey<Colour4f>& key : colours)
         keys.push_back({key.time, Vector4f(key.value.r, key.value.g, key.value.b, key.value.a)});
     return addMaterialChannels(keys, property, found->second, group);

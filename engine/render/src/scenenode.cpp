@@ -5,6 +5,7 @@
 
 #include <algorithm>
 #include <cmath>
+#include <cstring>
 #include <new>
 #include <utility>
 
@@ -210,13 +211,13 @@ void SceneNode::updateMotionData()
 
     // The caller's pointer may lie in the child list that is about to change, and the old parent's share of
     // this node may be the last one: both are held until the end.
-    const SharedPtr<SceneNode> newParent = parent;
+    const SharedPtr<SceneNode> newParent = parent; // NOLINT(performance-unnecessary-copy-initialization)
     SharedPtr<SceneNode> self;
     const Matrix4f world = getWorldTransform();
     if (m_parent)
         self = m_parent->takeChild(this);
     if (newParent)
-        newParent->m_children.push_back(SharedPtr<SceneNode>(this));
+        newParent->m_children.emplace_back(this);
     m_parent = newParent.get();
 
     const Matrix4f toParent = newParent ? inverse(newParent->getWorldTransform()) : Matrix4f::IDENTITY;
@@ -255,23 +256,28 @@ const SharedPtr<SceneNode>& SceneNode::getChild(unsigned int i) const
     return i < m_children.size() ? m_children[i] : none;
 }
 
+/// @param Node  SceneNode, const or not.
+template <class Node>
+static Node* findBelow(Node& node, const char* name)
+{
+    if (!std::strcmp(node.getName(), name))
+        return &node;
+    for (const SharedPtr<SceneNode>& child : node.getChildren())
+    {
+        if (Node* found = findBelow<Node>(*child, name))
+            return found;
+    }
+    return nullptr;
+}
+
 SceneNode* SceneNode::find(const char* name)
 {
-    return const_cast<SceneNode*>(std::as_const(*this).find(name));
+    return name ? findBelow(*this, name) : nullptr;
 }
 
 const SceneNode* SceneNode::find(const char* name) const
 {
-    if (!name)
-        return nullptr;
-    if (m_name == name)
-        return this;
-    for (const SharedPtr<SceneNode>& child : m_children)
-    {
-        if (const SceneNode* found = std::as_const(*child).find(name))
-            return found;
-    }
-    return nullptr;
+    return name ? findBelow(*this, name) : nullptr;
 }
 
 /// @return the share that the child list held; empty when the node is no child of this one.

@@ -92,7 +92,8 @@ private:
 
 /// Writes element 0 of a named property, which is created when absent. T is float or Vector4f.
 template <class T>
-class AppearancePropertyAnimator : public Animator<T>
+class AppearancePropertyAnimator // NOLINT(cppcoreguidelines-virtual-class-destructor): its base's is virtual
+    : public Animator<T>
 {
 public:
     ORV_CLASS_NAME("AppearancePropertyAnimator")
