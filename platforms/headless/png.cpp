@@ -1,35 +1,13 @@
 #include "headless/png.h"
+#include "headless/pngcompression.h"
 
 #include <cerrno>
 #include <cstdio>
-#include <cstdlib>
 #include <cstring>
 
 #include <unistd.h>
-#include <zlib.h>
 
-namespace
-{
-
-/// In place of stb's own, which takes four times as long and leaves more.
-/// @return null, or to be freed.
-unsigned char* compressForPng(unsigned char* data, int size, int* compressedSize, int)
-{
-    constexpr int LEVEL = 4;
-    uLongf room = compressBound(uLong(size));
-    auto* compressed = static_cast<unsigned char*>(std::malloc(room));
-    if (compressed && compress2(compressed, &room, data, uLong(size), LEVEL) == Z_OK)
-    {
-        *compressedSize = int(room);
-        return compressed;
-    }
-    std::free(compressed);
-    return nullptr;
-}
-
-} // namespace
-
-#define STBIW_ZLIB_COMPRESS compressForPng
+#define STBIW_ZLIB_COMPRESS headless::compressForPng
 #define STB_IMAGE_WRITE_IMPLEMENTATION
 #define STB_IMAGE_WRITE_STATIC
 #pragma GCC diagnostic push

@@ -229,7 +229,8 @@ TEST(ConvertSkins, keepsTheStrongestWeights)
     }
 }
 
-// Fault caught: tangents across a mirrored picture that cancel out, or that lean out of the surface.
+// Fault caught: tangents across a mirrored picture that cancel out, or that lean out of the surface; normals of no
+// length, or of the wrong side, that are taken as they are.
 TEST(ConvertSurfaces, tangentsFollowThePicture)
 {
     // Two squares side by side in a plane; the picture lies on the second one mirrored.
@@ -252,31 +253,38 @@ TEST(ConvertSurfaces, tangentsFollowThePicture)
     convert::ConvertedMaterial material;
     material.hasNormalMap = true;
     convert::Report report;
-    const std::vector<convert::MeshPart> parts = convert::convertMesh(mesh, material, report);
-    ASSERT_EQ(1u, parts.size());
-    const glo::Geometry& geometry = parts[0].geometry;
-    EXPECT_EQ(8u, geometry.vertices.vertexCount); // the two that both squares have are there twice
-    const auto read = [&](const char* name)
+    for (const float z : {1.0f, 0.0f, -1.0f})
     {
-        std::vector<float> values;
-        glo::forEachComponent(*glo::findAttribute(geometry, name), geometry.vertices, false, 3,
-                              [&](uint32_t, float value) { values.push_back(value); });
-        return values;
-    };
-    const std::vector<float> position = read("a_position");
-    const std::vector<float> normal = read("a_normal");
-    const std::vector<float> tangent = read("a_tangent");
-    const std::vector<float> binormal = read("a_binormal");
-    float sum = 0.0f;
-    for (size_t i = 0; i < position.size(); i += 3)
-    {
-        EXPECT_FLOAT_EQ(1.0f, normal[i + 2]);
-        EXPECT_FLOAT_EQ(1.0f, std::fabs(tangent[i]));
-        EXPECT_FLOAT_EQ(1.0f, binormal[i + 1]); // v grows upwards in both
-        EXPECT_TRUE(position[i] == 1.0f || tangent[i] * (1.0f - position[i]) > 0.0f) << position[i];
-        sum += tangent[i];
+        SCOPED_TRACE(z);
+        delete[] mesh.mNormals;
+        mesh.mNormals = new aiVector3D[6];
+        std::fill_n(mesh.mNormals, 6, aiVector3D(0, 0, z));
+        const std::vector<convert::MeshPart> parts = convert::convertMesh(mesh, material, report);
+        ASSERT_EQ(1u, parts.size());
+        const glo::Geometry& geometry = parts[0].geometry;
+        EXPECT_EQ(8u, geometry.vertices.vertexCount); // the two that both squares have are there twice
+        const auto read = [&](const char* name)
+        {
+            std::vector<float> values;
+            glo::forEachComponent(*glo::findAttribute(geometry, name), geometry.vertices, false, 3,
+                                  [&](uint32_t, float value) { values.push_back(value); });
+            return values;
+        };
+        const std::vector<float> position = read("a_position");
+        const std::vector<float> normal = read("a_normal");
+        const std::vector<float> tangent = read("a_tangent");
+        const std::vector<float> binormal = read("a_binormal");
+        float sum = 0.0f;
+        for (size_t i = 0; i < position.size(); i += 3)
+        {
+            EXPECT_FLOAT_EQ(1.0f, normal[i + 2]);
+            EXPECT_FLOAT_EQ(1.0f, std::fabs(tangent[i]));
+            EXPECT_FLOAT_EQ(1.0f, binormal[i + 1]); // v grows upwards in both
+            EXPECT_TRUE(position[i] == 1.0f || tangent[i] * (1.0f - position[i]) > 0.0f) << position[i];
+            sum += tangent[i];
+        }
+        EXPECT_FLOAT_EQ(0.0f, sum);
     }
-    EXPECT_FLOAT_EQ(0.0f, sum);
 }
 
 // Fault caught: transforms that components cannot hold and that helper nodes get wrong.

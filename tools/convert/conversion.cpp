@@ -88,14 +88,17 @@ bool receive(Conversion& conversion, std::FILE* stream)
         if (!receiveBytes(*text, stream))
             return false;
     }
-    OutputFile file;
-    while (receiveBytes(file.path, stream) && !file.path.empty())
+    for (;;)
     {
+        OutputFile file;
+        if (!receiveBytes(file.path, stream))
+            return false;
+        if (file.path.empty())
+            return true;
         if (!receiveBytes(file.bytes, stream))
             return false;
         conversion.files.push_back(std::move(file));
     }
-    return file.path.empty();
 }
 
 } // namespace convert

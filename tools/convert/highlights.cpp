@@ -54,7 +54,8 @@ Highlight fromShininess(const Vector4f& specular, float level, float shininess)
 {
     if (!(shininess > 0.0f) || !(level > 0.0f)) // an exponent of 0 would be a highlight all over
         return {};
-    return {specular, level, std::min(shininess, SHARPEST)};
+    // Below 1 it is no exponent: 3ds Max and others write a share there.
+    return {specular, level, std::min(shininess < 1.0f ? shininess * SHARPEST : shininess, SHARPEST)};
 }
 
 } // namespace convert

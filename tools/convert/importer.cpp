@@ -5,6 +5,7 @@
 #include "halflifefile.h"
 #include "mending.h"
 #include "progress.h"
+#include "uvtransforms.h"
 
 #include <assimp/config.h>
 #include <assimp/importerdesc.h>
@@ -84,8 +85,8 @@ aiMatrix4x4 makeUpright(const std::string& axis)
 
 aiMatrix4x4 makeTransform(const aiScene& scene, const std::string& format, const Options& options)
 {
-    const bool isBlender = contains(format, "Blender"); // where z is always up
-    const std::string up = options.up.empty() && isBlender ? "z" : options.up;
+    const bool isUpright = contains(format, "Blender") || contains(format, "SMD"); // where z is always up
+    const std::string up = options.up.empty() && isUpright ? "z" : options.up;
     aiMatrix4x4 scale;
     aiMatrix4x4::Scaling(aiVector3D(float(options.scale)), scale);
     const aiMatrix4x4 own =
@@ -145,13 +146,16 @@ bool importModel(const std::string& path, const Options& options, ImportedModel&
     model.scene = importer.ReadFile(path, 0);
     if (!model.scene)
         return fail(importer.GetErrorString(), error);
-    aiScene& scene = const_cast<aiScene&>(*model.scene); // the importer's own, and nobody else's
+    // The importer's own, and nobody else's. NOLINTNEXTLINE(cppcoreguidelines-pro-type-const-cast)
+    aiScene& scene = const_cast<aiScene&>(*model.scene);
     const std::string format = getFormatName(importer);
     model.isGltf = contains(format, "glTF");
     if (scene.mRootNode && model.isGltf)
         correctGltf(scene, path, !contains(format, "glTF2"), report);
     if (scene.mRootNode)
         mend(scene, report);
+    if (contains(format, "glTF2"))
+        transformTextureCoordinates(scene, report);
     if (!scene.mRootNode || scene.mNumMeshes == 0)
         return fail("holds nothing that can be drawn", error);
     if (!importer.ApplyPostProcessing(aiProcess_ValidateDataStructure))

@@ -76,6 +76,8 @@ private:
         const MadeSampler picture = m_samplers.make(BASE, wishBase(colour.w));
         if (picture.field && !m_isGltf && isBlack(colour))
             colour = WHITE; // black would hide the picture
+        if (m_isGltf)
+            colour = toScreen(colour);
         colour.w = 1.0f;
         m_made.diffuse = {colour, picture.field};
         m_made.ambient.colour = colour; // for lights that have an ambient part
@@ -138,6 +140,8 @@ private:
     void setEmission()
     {
         Vector4f colour = getColour(m_source, AI_MATKEY_COLOR_EMISSIVE, BLACK);
+        if (m_isGltf)
+            colour = toScreen(colour);
         m_made.emissive.sampler = m_samplers.make(EMISSIVE).field;
         if (m_made.emissive.sampler && !m_isGltf && isBlack(colour))
             colour = WHITE;
@@ -293,12 +297,17 @@ private:
 
 } // namespace
 
+aiTextureType findMainTexture(const aiMaterial& material)
+{
+    return findTextureType(material,
+                           {aiTextureType_DIFFUSE, aiTextureType_BASE_COLOR, aiTextureType_NORMALS,
+                            aiTextureType_NORMAL_CAMERA, aiTextureType_HEIGHT, aiTextureType_EMISSIVE,
+                            aiTextureType_EMISSION_COLOR, aiTextureType_SPECULAR});
+}
+
 unsigned findUvChannel(const aiMaterial& material)
 {
-    const aiTextureType type =
-        findTextureType(material, {aiTextureType_DIFFUSE, aiTextureType_BASE_COLOR, aiTextureType_NORMALS,
-                                   aiTextureType_NORMAL_CAMERA, aiTextureType_HEIGHT, aiTextureType_EMISSIVE,
-                                   aiTextureType_EMISSION_COLOR, aiTextureType_SPECULAR});
+    const aiTextureType type = findMainTexture(material);
     aiString path;
     unsigned channel = 0;
     if (type != aiTextureType_NONE)

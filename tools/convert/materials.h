@@ -4,7 +4,7 @@
 #include "names.h"
 #include "textures.h"
 
-struct aiMaterial;
+#include <assimp/material.h>
 
 namespace convert
 {
@@ -16,6 +16,9 @@ struct ConvertedMaterial
     unsigned uvChannel = 0; ///< of the model's texture coordinates, the one to take
     bool hasNormalMap = false;
 };
+
+/// @return the kind of the material's first picture, whose texture coordinates all of them have; NONE without one.
+aiTextureType findMainTexture(const aiMaterial& material);
 
 /// @return the channel of texture coordinates that the material's first picture asks for; 0 if it has none.
 unsigned findUvChannel(const aiMaterial& material);

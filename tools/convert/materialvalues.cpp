@@ -16,6 +16,13 @@ orv::Vector4f getColour(const aiMaterial& material, const char* key, unsigned ty
     return isFinite ? orv::Vector4f(colour.r, colour.g, colour.b, colour.a) : fallback;
 }
 
+orv::Vector4f toScreen(const orv::Vector4f& light)
+{
+    const auto encode = [](double share)
+    { return float(share <= 0.0031308 ? share * 12.92 : 1.055 * std::pow(share, 1.0 / 2.4) - 0.055); };
+    return {encode(light.x), encode(light.y), encode(light.z), light.w};
+}
+
 float getFloat(const aiMaterial& material, const char* key, unsigned type, unsigned index, float fallback)
 {
     float value = 0.0f;

@@ -13,6 +13,10 @@ namespace convert
 /// A colour of three components has alpha 1.
 orv::Vector4f getColour(const aiMaterial& material, const char* key, unsigned type, unsigned index,
                         const orv::Vector4f& fallback);
+/// From shares of light, in which glTF has its colours, to the values of pictures and screens (sRGB), in which the engine
+/// reckons; alpha stays.
+orv::Vector4f toScreen(const orv::Vector4f& light);
+
 float getFloat(const aiMaterial& material, const char* key, unsigned type, unsigned index, float fallback);
 int getInt(const aiMaterial& material, const char* key, unsigned type, unsigned index, int fallback = 0);
 bool hasFloat(const aiMaterial& material, const char* key, unsigned type, unsigned index);

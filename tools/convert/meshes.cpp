@@ -87,7 +87,7 @@ private:
     {
         m_columns.push_back({"a_position", 3, m_mesh.mVertices, false});
         const bool isSurface = m_cornersPerFace == 3;
-        if (m_mesh.mNormals)
+        if (hasNormals())
             m_columns.push_back({"a_normal", 3, m_mesh.mNormals, false});
         else if (isSurface)
         {
@@ -101,6 +101,19 @@ private:
             addTangents(uvs);
         else
             m_report.lose("normal-map", "the normal map on " + m_name + ", which has no texture coordinates");
+    }
+
+    /// Some programs write normals that are all zero or that all point to the backs of their faces.
+    bool hasNormals() const
+    {
+        if (!m_mesh.mNormals || m_cornersPerFace != 3)
+            return m_mesh.mNormals;
+        for (size_t i = 0; i < m_corners.size(); i += 3)
+        {
+            if (getFaceNormal(m_mesh, m_corners, i) * m_mesh.mNormals[m_corners[i]] > 0.0f)
+                return true;
+        }
+        return false;
     }
 
     /// The material's set, then another one.

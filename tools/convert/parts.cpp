@@ -64,6 +64,7 @@ std::vector<Corners> splitByJoints(const Corners& corners, unsigned cornersPerFa
         best->corners.insert(best->corners.end(), own.begin(), own.end());
     }
     std::vector<Corners> parts;
+    parts.reserve(groups.size());
     for (JointGroup& group : groups)
         parts.push_back(std::move(group.corners));
     return parts;

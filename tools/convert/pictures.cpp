@@ -1,5 +1,7 @@
 #include "pictures.h"
 
+#include "headless/pngcompression.h"
+
 #include "orv/image.h"
 #include "orv/memorystream.h"
 
@@ -22,6 +24,7 @@
 #define STB_IMAGE_RESIZE_IMPLEMENTATION
 #define STB_IMAGE_RESIZE_STATIC
 #include <stb/stb_image_resize.h>
+#define STBIW_ZLIB_COMPRESS headless::compressForPng
 #define STB_IMAGE_WRITE_IMPLEMENTATION
 #define STB_IMAGE_WRITE_STATIC
 #define STBI_WRITE_NO_STDIO

@@ -15,13 +15,6 @@ namespace
 
 constexpr float CREASE_COSINE = 0.4067366f; // of 66 degrees
 
-/// As long as the face is large.
-aiVector3D getFaceNormal(const aiMesh& mesh, const Corners& corners, size_t first)
-{
-    const aiVector3D& a = mesh.mVertices[corners[first]];
-    return (mesh.mVertices[corners[first + 1]] - a) ^ (mesh.mVertices[corners[first + 2]] - a);
-}
-
 /// -1 where the picture lies on the face mirrored, else 1.
 float getSide(const aiVector3D* uvs, const Corners& corners, size_t first)
 {
@@ -41,6 +34,12 @@ aiVector3D across(const aiVector3D& normal, const aiVector3D& v)
 }
 
 } // namespace
+
+aiVector3D getFaceNormal(const aiMesh& mesh, const Corners& corners, size_t first)
+{
+    const aiVector3D& a = mesh.mVertices[corners[first]];
+    return (mesh.mVertices[corners[first + 1]] - a) ^ (mesh.mVertices[corners[first + 2]] - a);
+}
 
 std::vector<aiVector3D> makeNormals(const aiMesh& mesh, const Corners& corners)
 {

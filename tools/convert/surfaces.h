@@ -9,6 +9,9 @@ struct aiMesh;
 namespace convert
 {
 
+/// At right angles to the triangle whose corners start there, towards its front, as long as twice its area.
+aiVector3D getFaceNormal(const aiMesh& mesh, const Corners& corners, size_t first);
+
 /// Normals for a mesh that has none, one for each corner of its triangles: smooth where faces meet at less than 66
 /// degrees, sharp elsewhere.
 std::vector<aiVector3D> makeNormals(const aiMesh& mesh, const Corners& corners);

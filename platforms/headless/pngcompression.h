@@ -1,0 +1,26 @@
+#pragma once
+
+#include <cstdlib>
+
+#include <zlib.h>
+
+namespace headless
+{
+
+/// For STBIW_ZLIB_COMPRESS, in place of stb's own, which takes four times as long and leaves more.
+/// @return null, or to be freed.
+inline unsigned char* compressForPng(unsigned char* data, int size, int* compressedSize, int)
+{
+    constexpr int LEVEL = 4;
+    uLongf room = compressBound(uLong(size));
+    auto* compressed = static_cast<unsigned char*>(std::malloc(room));
+    if (compressed && compress2(compressed, &room, data, uLong(size), LEVEL) == Z_OK)
+    {
+        *compressedSize = int(room);
+        return compressed;
+    }
+    std::free(compressed);
+    return nullptr;
+}
+
+} // namespace headless
