@@ -1,0 +1,345 @@
+#!/usr/bin/python3
+"""Draws models of other people beside the same models as another renderer draws them.
+
+    modelpictures.py CONVERTER VIEWER FOLDER DOCS [NAME...]
+
+FOLDER holds Debian's assimp-testmodels. Writes DOCS/pictures/models/NAME.png, orv-view on the left, the other one on the
+right, and DOCS/modelpictures.md. With names, only those pictures are drawn anew. Exit code 1 if one cannot be drawn.
+
+Needs Debian's blender, python3-numpy (for Blender's readers), f3d, xvfb and python3-pil, and so Debian's own Python.
+"""
+import argparse
+import base64
+import json
+import math
+import os
+import struct
+import subprocess
+import sys
+import tempfile
+import textwrap
+import zipfile
+from collections import namedtuple
+
+from PIL import Image
+
+WIDTH, HEIGHT = 320, 240
+COLOURS = 200  # of a finished picture
+BACKGROUND = (96, 96, 96)
+SECONDS = 120  # for one picture
+HERE = os.path.dirname(os.path.abspath(__file__))
+
+# name: of the picture. file: in the folder. drawer: the other side. moment: seconds, or None for the pose at rest.
+# kind: what the model is there for. remark: what differs, and why; written after looking at the pair.
+Pair = namedtuple("Pair", "name file drawer kind remark moment up other", defaults=(None, "z", None))
+
+PAIRS = (
+    Pair("boxtextured", "glTF2/BoxTextured-glTF/BoxTextured.gltf", "blender", "glTF 2.0, textured",
+         "The same. Cycles softens with 16 samples a pixel, the engine with four along edges."),
+    Pair("engine", "glTF2/2CylinderEngine-glTF-Binary/2CylinderEngine.glb", "blender", "GLB, 83 nodes, 35 materials",
+         "Every part in its place and colour. Parts that face away from the lamps are darker in Blender, where other parts "
+         "shade them."),
+    Pair("clearcoat", "glTF2/ClearCoat-glTF/ClearCoatTest.gltf", "blender", "glTF 2.0, normal maps, a blended material",
+         "Colours and bumps agree. The coats, which the engine has not and the report names, are all that the third column "
+         "shows in Blender: here it is black but for highlights, and the background shows where the second one is clear."),
+    Pair("texturetransform", "glTF2/textureTransform/TextureTransformTest.gltf", "blender", "glTF 2.0, texture transforms",
+         "All arrows end at the green ticks, on either side. Blender is darker as its lamps meet the panes at a slant."),
+    Pair("glass", "(made)", "blender", "glTF 2.0, transparent",
+         "The same order and mixture of colours. Blender's panes throw shadows on each other."),
+    Pair("lines", "glTF2/glTF-Asset-Generator/Mesh_PrimitiveMode/Mesh_PrimitiveMode_02.gltf", "f3d", "glTF 2.0, lines",
+         "The same outline; VTK's line is thinner as its picture is made smaller.", None, "y"),
+    Pair("simpleskin", "glTF2/simple_skin/simple_skin.gltf", "blender", "glTF 2.0, skin, animated, at 1 s",
+         "The same bend at the same moment. Brighter here: the lamp meets the flat sheet head on.", 1.0),
+    Pair("tentacle", "(made)", "blender", "glTF 2.0, skin of 30 joints, animated, at 1 s",
+         "The same curve, in two parts here as shaders have 20 joints, without a seam. The sheen is the engine's highlight "
+         "for a roughness of 0.6, which Cycles spreads farther.", 1.0),
+    Pair("morphcube", "glTF2/glTF-Sample-Models/AnimatedMorphCube-glTF/AnimatedMorphCube.gltf", "blender",
+         "glTF 2.0, morph targets", "The same shape at rest. The other shapes are lost, as the report says."),
+    Pair("skeleton", "FBX/animation_with_skeleton.fbx", "blender", "FBX, skin, animated, at 0.4 s",
+         "The same pose. Where the rod bends it is a little narrower here: up to six joints pull at a vertex, of which the "
+         "engine has four. The file's own lamp, from below, lights it here; Blender's picture has lamps of its own.", 0.4),
+    Pair("huesitos", "FBX/huesitos.fbx", "blender", "FBX, skin of 9 joints, animated, at 0.8 s",
+         "The same pose. The lamp is again the file's. Blender takes the opacity of 0 in the file for nothing to be seen, "
+         "which was overruled for this picture.", 0.8),
+    Pair("spiderfbx", "FBX/spider.fbx", "blender", "FBX, units, a light and a camera, missing pictures",
+         "The same parts in the same places. The pictures are missing: Blender shows that in magenta, the converter says so "
+         "and keeps the colours."),
+    Pair("duck", "Collada/duck.dae", "blender", "Collada, textured, a light and a camera",
+         "The same; the light is the file's here. Blender's highlights are those of a default roughness."),
+    Pair("nested", "Collada/box_nested_animation.dae", "blender", "Collada, animated, at 0.6 s",
+         "The same attitude of the box.", 0.6),
+    Pair("instances", "Collada/teapot_instancenodes.DAE", "blender", "Collada, instances",
+         "The same places. Paler in Blender, which takes a file's colours for shares of light and not for those of a screen."),
+    Pair("cinema", "Collada/Cinema4D.dae", "blender", "Collada of Cinema 4D, three meshes",
+         "The same; Blender adds shadows."),
+    Pair("human", "Collada/human.zae", "blender", "Collada in an archive, 28,796 triangles",
+         "The same shape. Paler in Blender: the file's colours again."),
+    Pair("vertexcolours", "Collada/kwxport_test_vcolors.dae", "blender", "Collada, three materials, vertex colours",
+         "The pictures lie the same way up and round. Brighter here: the file asks for a strong highlight, which Blender "
+         "does not read. The vertex colours are kept and not shown, as the report says."),
+    Pair("spiderobj", "OBJ/spider.obj", "blender", "OBJ, 6 materials, 4 pictures",
+         "The same pictures in the same places."),
+    Pair("manyvertices", "(made)", "blender", "OBJ, 102,400 vertices in one mesh",
+         "The same waves, without a gap where the parts of at most 65,536 vertices meet. Darker here: without a colour in the "
+         "file the converter takes grey of 0.6, Blender of 0.8."),
+    Pair("wusonstl", "STL/Wuson.stl", "blender", "STL, normals of no length",
+         "The same shape. Smooth here as the normals are made anew, in facets in Blender.", None, "y"),
+    Pair("spiderstl", "STL/Spider_binary.stl", "blender", "STL, normals of the wrong side",
+         "The same, smooth and in facets. Before the normals were made anew it was black.", None, "y"),
+    Pair("fels", "3DS/fels.3ds", "f3d", "3DS",
+         "The same rock, with the normals that libassimp hands over; VTK draws its facets."),
+    Pair("alphacubes", "3DS/cubes_with_alpha.3DS", "f3d", "3DS, transparent",
+         "The same cubes, of which the large one in front lets a little through. Other colours: the file has teal, blue, "
+         "green as ambient and dark red, orange, magenta as diffuse colours, and VTK draws the ambient ones."),
+    Pair("monkey", "BLEND/Suzanne_248.blend", "blender", "Blender 2.48",
+         "The same monkey, long face and all, which is how near the eye is. Smooth here at less than 66 degrees; Blender 3.4 "
+         "draws the facets."),
+    Pair("monkeysubdiv", "BLEND/SuzanneSubdiv_252.blend", "blender", "Blender 2.52, a subdivided mesh",
+         "The same outline: it looks upwards, its chin towards the eye, in both. Faces of this mesh do not share their "
+         "vertices: Blender's subdivision leaves gaps between them, libassimp's joins them first and is rounder."),
+    Pair("torus", "BLEND/TorusLightsCams_250_compressed.blend", "blender", "Blender 2.50, five lights, two cameras",
+         "The same shape. Too bright here, and black where no lamp reaches: the file's five lamps fade with distance, which "
+         "libassimp does not hand over, and add up. Blender's picture has lamps of its own."),
+    Pair("wusonsmd", "SMD/WusonSMD.smd", "blender", "SMD, beside the same model as PLY",
+         "The same animal the same way up. Darker: the picture that the SMD file names is missing.", None, "y",
+         "PLY/Wuson.ply"),
+    Pair("wusonx", "X/Testwuson.X", "blender", "X, 37 joints, beside the same model as PLY",
+         "The same animal in another file, which has it look the other way.", None, "y", "PLY/Wuson.ply"),
+)
+
+
+def run(command):
+    """None, or why it failed."""
+    try:
+        done = subprocess.run(command, capture_output=True, timeout=SECONDS)
+    except subprocess.TimeoutExpired:
+        return "took too long"
+    if done.returncode == 0:
+        return None
+    return (done.stderr or done.stdout).decode(errors="replace").strip()[-300:]
+
+
+def write_wavy_torus(path):
+    """A mesh of more vertices than 16-bit indices count; the waves show where a seam or a wrong index would be."""
+    rings, sides = 640, 160
+    with open(path, "w", encoding="ascii") as file:
+        for ring in range(rings):
+            angle = 2 * math.pi * ring / rings
+            for side in range(sides):
+                turn = 2 * math.pi * side / sides
+                thickness = 0.4 + 0.04 * math.sin(8 * turn + 24 * angle)
+                out = 1 + thickness * math.cos(turn)
+                file.write("v %.6f %.6f %.6f\n" % (out * math.cos(angle), thickness * math.sin(turn), -out * math.sin(angle)))
+        file.write("s 1\n")
+        for ring in range(rings):
+            for side in range(sides):
+                corners = [(ring, side), (ring + 1, side), (ring + 1, side + 1), (ring, side + 1)]
+                file.write("f %s\n" % " ".join(str(r % rings * sides + s % sides + 1) for r, s in corners))
+
+
+def write_gltf(path, root, arrays):
+    """Adds a buffer to a file's root, and an accessor for each array of (format of struct, glTF type, rows)."""
+    data = b""
+    root["accessors"], root["bufferViews"] = [], []
+    for kind, shape, rows in arrays:
+        packed = b"".join(struct.pack("<" + kind, *row) for row in rows)
+        root["bufferViews"].append({"buffer": 0, "byteOffset": len(data), "byteLength": len(packed)})
+        component = {"f": 5126, "H": 5123}[kind[-1]]
+        accessor = {"bufferView": len(root["accessors"]), "componentType": component, "type": shape, "count": len(rows)}
+        if kind[-1] == "f":
+            accessor["min"] = [min(column) for column in zip(*rows)]
+            accessor["max"] = [max(column) for column in zip(*rows)]
+        root["accessors"].append(accessor)
+        data += packed + b"\0" * (-len(packed) % 4)
+    uri = "data:application/octet-stream;base64," + base64.b64encode(data).decode()
+    root["buffers"] = [{"uri": uri, "byteLength": len(data)}]
+    root["asset"] = {"version": "2.0"}
+    with open(path, "w", encoding="ascii") as file:
+        json.dump(root, file)
+
+
+def write_tentacle(path):
+    """A tube along 30 joints, each of which turns a little against the one before it."""
+    joints, sides = 30, 12
+    places, normals, owners, weights, faces = [], [], [], [], []
+    for ring in range(joints):
+        radius = 1.5 * (1 - 0.8 * ring / joints)
+        for side in range(sides):
+            out = (math.cos(2 * math.pi * side / sides), 0.0, -math.sin(2 * math.pi * side / sides))
+            places.append((out[0] * radius, float(ring), out[2] * radius))
+            normals.append(out)
+            owners.append((ring, max(ring - 1, 0), 0, 0))
+            weights.append((0.5, 0.5, 0.0, 0.0))
+            if ring + 1 < joints:
+                a, b = ring * sides + side, ring * sides + (side + 1) % sides
+                faces += [(a,), (b,), (b + sides,), (a,), (b + sides,), (a + sides,)]
+    binds = [(1, 0, 0, 0, 0, 1, 0, 0, 0, 0, 1, 0, 0, -joint, 0, 1) for joint in range(joints)]
+    turns = [(0.0, 0.0, 0.0, 1.0), (0.0, 0.0, math.sin(0.13), math.cos(0.13))]
+    arrays = [("3f", "VEC3", places), ("3f", "VEC3", normals), ("4H", "VEC4", owners), ("4f", "VEC4", weights)]
+    arrays += [("H", "SCALAR", faces), ("16f", "MAT4", binds), ("f", "SCALAR", [(0.0,), (2.0,)]), ("4f", "VEC4", turns)]
+    nodes = [{"name": "joint %d" % i, "translation": [0, int(i > 0), 0], "children": [i + 1]} for i in range(joints)]
+    del nodes[-1]["children"]
+    primitive = {"attributes": {"POSITION": 0, "NORMAL": 1, "JOINTS_0": 2, "WEIGHTS_0": 3}, "indices": 4, "material": 0}
+    channels = [{"sampler": 0, "target": {"node": i, "path": "rotation"}} for i in range(1, joints)]
+    root = {
+        "nodes": nodes + [{"name": "tentacle", "mesh": 0, "skin": 0}],
+        "scenes": [{"nodes": [0, joints]}],
+        "scene": 0,
+        "meshes": [{"primitives": [primitive]}],
+        "skins": [{"joints": list(range(joints)), "inverseBindMatrices": 5}],
+        "animations": [{"samplers": [{"input": 6, "output": 7}], "channels": channels}],
+        "materials": [make_gltf_material([0.1, 0.5, 0.2, 1.0])],
+    }
+    write_gltf(path, root, arrays)
+
+
+def make_gltf_material(colour):
+    surface = {"baseColorFactor": colour, "metallicFactor": 0.0, "roughnessFactor": 0.6}
+    return {"pbrMetallicRoughness": surface, "alphaMode": "OPAQUE" if colour[3] == 1 else "BLEND", "doubleSided": True}
+
+
+def write_glass(path):
+    """Three panes, one behind the other, and a solid one at the back."""
+    colours = [[0.8, 0.1, 0.1, 0.4], [0.1, 0.7, 0.1, 0.4], [0.1, 0.1, 0.8, 0.7], [0.9, 0.8, 0.2, 1.0]]
+    places = [(-1.0, -1.0, 0.0), (1.0, -1.0, 0.0), (1.0, 1.0, 0.0), (-1.0, 1.0, 0.0)]
+    arrays = [("3f", "VEC3", places), ("3f", "VEC3", [(0.0, 0.0, 1.0)] * 4)]
+    arrays.append(("H", "SCALAR", [(i,) for i in (0, 1, 2, 0, 2, 3)]))
+    attributes = {"POSITION": 0, "NORMAL": 1}
+    count = range(len(colours))
+    root = {
+        "nodes": [{"mesh": i, "translation": [i * 0.6, i * 0.5, -i * 0.8]} for i in count],
+        "scenes": [{"nodes": list(count)}],
+        "scene": 0,
+        "meshes": [{"primitives": [{"attributes": attributes, "indices": 2, "material": i}]} for i in count],
+        "materials": [make_gltf_material(colour) for colour in colours],
+    }
+    write_gltf(path, root, arrays)
+
+
+MADE = {
+    "manyvertices": ("torus.obj", write_wavy_torus),
+    "tentacle": ("tentacle.gltf", write_tentacle),
+    "glass": ("glass.gltf", write_glass),
+}
+
+
+def find_model(pair, folder, scratch):
+    """What both sides read, unpacked where only one of them can."""
+    if pair.file == "(made)":
+        model = os.path.join(scratch, MADE[pair.name][0])
+        MADE[pair.name][1](model)
+        return model
+    model = os.path.join(folder, pair.file)
+    if not model.endswith(".zae"):
+        return model
+    with zipfile.ZipFile(model) as archive:
+        archive.extractall(scratch)
+        return os.path.join(scratch, next(name for name in archive.namelist() if name.lower().endswith(".dae")))
+
+
+def draw_ours(arguments, pair, model, picture):
+    scene = picture + ".glo"
+    error = run([arguments.converter, model, scene])
+    if error:
+        return error
+    command = [arguments.viewer, scene, "--out", picture, "--size", "%dx%d" % (WIDTH, HEIGHT)]
+    command += ["--background", "#%02x%02x%02x" % BACKGROUND]
+    return run(command + (["--time", str(pair.moment)] if pair.moment is not None else []))
+
+
+def draw_with_blender(pair, model, picture):
+    script = os.path.join(HERE, "drawwithblender.py")
+    moment = "rest" if pair.moment is None else str(pair.moment)
+    command = ["blender", "--background", "--factory-startup", "--python-exit-code", "1", "--python", script, "--"]
+    return run(command + [model, picture, str(WIDTH), str(HEIGHT), moment, pair.up])
+
+
+def draw_with_f3d(pair, model, picture):
+    """Drawn large, since f3d leaves much room, and cut to what is there."""
+    command = ["xvfb-run", "-a", "f3d", model, "--output=" + picture, "--resolution=%d,%d" % (WIDTH * 3, HEIGHT * 3)]
+    command += ["--camera-azimuth-angle=26.6", "--camera-elevation-angle=19.7", "--no-background", "--quiet"]
+    command += ["--depth-peeling", "--fxaa", "--up=+" + pair.up.upper()]
+    error = run(command)
+    if error:
+        return error
+    large = Image.open(picture).convert("RGBA")
+    box = large.getchannel("A").getbbox() or (0, 0, 1, 1)
+    scale = 0.9 * min(WIDTH / (box[2] - box[0]), HEIGHT / (box[3] - box[1]))
+    size = [max(1, round((box[i + 2] - box[i]) * scale)) for i in (0, 1)]
+    small = Image.new("RGBA", (WIDTH, HEIGHT))
+    small.paste(large.crop(box).resize(size, Image.LANCZOS), ((WIDTH - size[0]) // 2, (HEIGHT - size[1]) // 2))
+    small.save(picture)
+    return None
+
+
+DRAWERS = {"blender": draw_with_blender, "f3d": draw_with_f3d}
+
+
+def draw_pair(arguments, pair, target):
+    """None, or why there is no picture."""
+    with tempfile.TemporaryDirectory() as scratch:
+        model = find_model(pair, arguments.folder, scratch)
+        ours, theirs = os.path.join(scratch, "ours.png"), os.path.join(scratch, "theirs.png")
+        other = os.path.join(arguments.folder, pair.other) if pair.other else model
+        error = draw_ours(arguments, pair, model, ours) or DRAWERS[pair.drawer](pair, other, theirs)
+        if error or not os.path.exists(theirs):
+            return error or "no picture came from " + pair.drawer
+        both = Image.new("RGBA", (WIDTH * 2 + 2, HEIGHT), (*BACKGROUND, 255))
+        for picture, left in ((ours, 0), (theirs, WIDTH + 2)):
+            both.alpha_composite(Image.open(picture).convert("RGBA"), (left, 0))
+        both.convert("RGB").quantize(COLOURS).save(target, optimize=True)
+    return None
+
+
+def write_page(page):
+    with open(page, "w", encoding="utf-8") as file:
+        file.write(INTRODUCTION)
+        for pair in PAIRS:
+            file.write("\n## %s\n\n" % pair.kind)
+            source = "Made by the script" if pair.file == "(made)" else "`%s`" % pair.file
+            beside = " from `%s`" % pair.other if pair.other else ""
+            file.write("%s; on the right %s%s\n\n" % (source, pair.drawer, beside))
+            file.write("![%s](pictures/models/%s.png)\n\n%s\n" % (pair.kind, pair.name, textwrap.fill(pair.remark, 118)))
+
+
+INTRODUCTION = """# Other people's models beside another renderer
+
+Made by `./run modelpictures`: models of Debian's `assimp-testmodels`, and some that the script makes where there was none
+of the kind. On the left what `orv-convert` and `orv-view` make of a file, on the right the same file, seen from the same
+place,
+
+- by **Blender** 3.4, its own readers (or those of OpenCOLLADA) and Cycles, with two lamps and a grey sky in place of the
+  file's lights;
+- by **f3d**, VTK's own readers and renderer, for what Blender does not read.
+
+Neither reads any of these files by libassimp. Blender reckons in shares of light and shows sRGB, the engine reckons in what
+is shown; so slopes are brighter in Blender throughout. The texts are written after looking at each pair.
+
+These pairs brought to light, and have seen mended: texture transforms of glTF that turned around another point, colours of
+glTF that were taken for those of a screen, normals of STL files that have no length or point to the back, exponents below 1
+of Collada files that were highlights all over, and SMD files that lay on their backs.
+"""
+
+
+def main():
+    parser = argparse.ArgumentParser(description=__doc__.split("\n")[0])
+    for name in ("converter", "viewer", "folder", "docs"):
+        parser.add_argument(name)
+    parser.add_argument("names", nargs="*")
+    arguments = parser.parse_args()
+    pictures = os.path.join(arguments.docs, "pictures", "models")
+    os.makedirs(pictures, exist_ok=True)
+    failed = 0
+    for pair in PAIRS:
+        if arguments.names and pair.name not in arguments.names:
+            continue
+        error = draw_pair(arguments, pair, os.path.join(pictures, pair.name + ".png"))
+        if error:
+            failed += 1
+            print("%s: %s" % (pair.file, error), file=sys.stderr)
+    write_page(os.path.join(arguments.docs, "modelpictures.md"))
+    return 1 if failed else 0
+
+
+if __name__ == "__main__":
+    sys.exit(main())
