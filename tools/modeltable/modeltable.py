@@ -1,4 +1,4 @@
-#!/usr/bin/env python3
+#!/usr/bin/python3
 """Converts every model of a folder and writes what became of each as a Markdown page.
 
     modeltable.py CONVERTER FOLDER PAGE.md
