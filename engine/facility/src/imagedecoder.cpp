@@ -91,13 +91,11 @@ Density getDensity(const unsigned char* file, std::size_t size)
     return {false, 256};
 }
 
-/// A PNG takes up to four times its final size while it is inflated; a JPEG is decoded in blocks of up to 32 x 32
-/// pixels and two bytes a coefficient.
-std::size_t getLargestBlock(int width, int height, int channels, std::size_t fileSize, bool isJpeg)
+/// What is decoded: pixels, those of a JPEG in blocks of up to 32 x 32.
+std::size_t getDecodedBytes(int width, int height, int channels, bool isJpeg)
 {
     const std::size_t margin = isJpeg ? 31 : 0;
-    const std::size_t pixels = (std::size_t(width) + margin) * (std::size_t(height) + margin);
-    return 4 * pixels * std::size_t(channels) + 2 * fileSize + DECODER_BYTES;
+    return (std::size_t(width) + margin) * (std::size_t(height) + margin) * std::size_t(channels);
 }
 
 } // namespace
@@ -114,11 +112,12 @@ unsigned char* decodeImage(const unsigned char* file, std::size_t size, int& wid
     if (!stbi_info_from_memory(file, int(size), &w, &h, &channels) || w < 1 || h < 1 || channels < 1 ||
         w > STBI_MAX_DIMENSIONS || h > STBI_MAX_DIMENSIONS)
         return nullptr;
-    const std::size_t bytes = std::size_t(w) * std::size_t(h) * std::size_t(channels);
     const Density density = getDensity(file, size);
+    const std::size_t bytes = getDecodedBytes(w, h, channels, density.isJpeg);
     if (bytes > MAX_DECODED_BYTES || bytes / density.bytesPerByte > size)
         return nullptr;
-    t_largestBlock = getLargestBlock(w, h, channels, size, density.isJpeg);
+    // A PNG takes up to four times its final size while it is inflated, a JPEG has two bytes a coefficient.
+    t_largestBlock = 4 * bytes + 2 * size + DECODER_BYTES;
 
     unsigned char* pixels = stbi_load_from_memory(file, int(size), &w, &h, &channels, 0);
     if (!pixels)
