@@ -1,10 +1,10 @@
 // What loading costs: a scene file of 200,000 triangles beside read() and glBufferData() of the same bytes, and the way
 // from a program's start to its first frame beside a bare context that links one program.
 //
-// "ms" are medians of wall time on the real driver, the shader program being there already. "Instructions" are the engine's in one load, without GL calls and
-// without the C library's copying and filling of memory, which callgrind tells apart where valgrind is installed; files
-// of the same number of chunks and a quarter of the triangles show what depends on the size. "Heap peak" is the most
-// that C++ code holds during a load beyond what it held before.
+// "ms" are medians of wall time on the real driver, the shader program being there already. "Instructions" are the
+// engine's in one load, without GL calls and without the C library's copying and filling of memory, which callgrind
+// tells apart where valgrind is installed; files of the same number of chunks and a quarter of the triangles show what
+// depends on the size. "Heap peak" is the most that C++ code holds during a load beyond what it held before.
 
 #include "callgrind.h"
 

@@ -12,8 +12,8 @@ namespace
 
 constexpr uint32_t NONE = std::numeric_limits<uint32_t>::max();
 
-/// Orders triangles for a GPU's cache of vertices: goes from vertex to vertex and takes all triangles round each: fan after fan, the next one about a vertex that
-/// is still in the cache.
+/// Orders triangles for a GPU's cache of vertices: takes all triangles around a vertex, fan after fan, each about a vertex
+/// that is still in the cache.
 class FanOrder
 {
 public:
