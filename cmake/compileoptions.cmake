@@ -23,36 +23,21 @@ target_link_libraries(orv_engine_options INTERFACE orv_options)
 target_compile_options(orv_engine_options INTERFACE
     -fno-exceptions -fvisibility=hidden -fvisibility-inlines-hidden -fno-semantic-interposition)
 
-# The library is to be small. All configurations but Debug compile it for size, what a frame runs through for speed
-# (orv_hot_sources), leave out what nobody calls and, with GCC, optimise it as a whole. The objects hold ordinary code
-# as well: the tests link that, in a fraction of the time.
-#
-# Unwind tables are a sixth of such a library. Without them a debugger needs the debug information, as these builds
-# have it, a crash reporter without it sees the innermost function alone, and an exception that a program lets pass
-# through the engine ends the program. Builds for looking inside keep them.
-if(NOT ORV_SANITIZE AND NOT ORV_BUILD_FUZZ)
-    set(ORV_COMPACT $<NOT:$<CONFIG:Debug>>)
-else()
-    set(ORV_COMPACT 0)
-endif()
-set(ORV_WHOLE $<AND:${ORV_COMPACT},$<STREQUAL:${CMAKE_CXX_COMPILER_ID},GNU>>) # not of a target: tests ask as well
+# All configurations but Debug compile the library for size, save what a frame or a decoder runs through
+# (orv_hot_sources), and with GCC optimise it as a whole when they link it (ORV_LTO). The objects hold ordinary code as
+# well: the tests link that, in a fraction of the time. Unwind tables stay: crash reporters need them, and exceptions
+# that a program lets pass through.
+set(ORV_OPTIMISED $<NOT:$<OR:$<CONFIG:Debug>,$<BOOL:${ORV_SANITIZE}>,$<BOOL:${ORV_BUILD_FUZZ}>>>)
+set(ORV_WHOLE $<AND:${ORV_OPTIMISED},$<BOOL:${ORV_LTO}>,$<STREQUAL:${CMAKE_CXX_COMPILER_ID},GNU>>)
 target_compile_options(orv_engine_options INTERFACE
-    $<${ORV_COMPACT}:-Oz> $<${ORV_COMPACT}:-ffunction-sections> $<${ORV_COMPACT}:-fdata-sections>
-    $<${ORV_WHOLE}:-flto=auto> $<${ORV_WHOLE}:-ffat-lto-objects>)
-if(NOT ORV_UNWIND_TABLES)
-    set(noTables $<${ORV_COMPACT}:-fno-asynchronous-unwind-tables> $<${ORV_COMPACT}:-fno-unwind-tables>)
-    target_compile_options(orv_engine_options INTERFACE ${noTables})
-    target_link_options(orv_engine_options INTERFACE ${noTables}) # where the whole is compiled once more
-endif()
+    $<${ORV_OPTIMISED}:-Os> $<${ORV_WHOLE}:-flto=auto> $<${ORV_WHOLE}:-ffat-lto-objects>
+    -ffunction-sections -fdata-sections -funwind-tables -fstack-protector-strong)
 
-# orv_hot_sources(source...): sources of the current room that run for every frame, solid or pixel. What does not in
-# them is marked [[gnu::cold]], which is as good as being elsewhere.
-# With GCC they are neither padded nor inlined beyond what costs nothing: the library has to stay small.
-set(tight -fno-align-functions -fno-align-loops -fno-align-jumps -fno-inline-functions)
-list(TRANSFORM tight PREPEND "$<${ORV_WHOLE}:")
-list(TRANSFORM tight APPEND ">")
+# orv_hot_sources(source...): sources of the current room that run for every frame, solid or pixel. They are not
+# inlined beyond what costs nothing, nor padded.
 function(orv_hot_sources)
-    set_property(SOURCE ${ARGN} APPEND PROPERTY COMPILE_OPTIONS $<${ORV_COMPACT}:-O2> ${tight})
+    set_property(SOURCE ${ARGN} APPEND PROPERTY COMPILE_OPTIONS
+        $<${ORV_OPTIMISED}:-O2> -fno-inline-functions -fno-align-functions -fno-align-loops -fno-align-jumps)
 endfunction()
 
 # orv_base_sources(source...): sources of the current room that hold the bases of classes which programs make or derive

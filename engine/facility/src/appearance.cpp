@@ -6,15 +6,13 @@
 namespace orv
 {
 
-[[gnu::cold]] Appearance::Appearance()
-    : m_stateRevision(detail::nextRevision())
-    , m_propertyRevision(detail::nextRevision())
+Appearance::Appearance() : m_stateRevision(detail::nextRevision()), m_propertyRevision(detail::nextRevision())
 {
 }
 
-[[gnu::cold]] Appearance::~Appearance() = default;
+Appearance::~Appearance() = default;
 
-[[gnu::cold]] void Appearance::setName(const char* name)
+void Appearance::setName(const char* name)
 {
     m_name = name ? name : "";
 }
@@ -200,7 +198,7 @@ bool Appearance::indexAllowed(const char* name, int index) const
     return true;
 }
 
-[[gnu::cold]] void Appearance::storeProperty(const char* name, const SharedPtr<ShaderUniformBase>& uniform)
+void Appearance::storeProperty(const char* name, const SharedPtr<ShaderUniformBase>& uniform)
 {
     if (!uniform)
         return; // no memory
@@ -230,7 +228,7 @@ void Appearance::collectProperties(PropertyCollector* collector) const
     }
 }
 
-[[gnu::cold]] void Appearance::linkShaderProgram()
+void Appearance::linkShaderProgram()
 {
     if (m_linked)
         return;

@@ -8,18 +8,16 @@ namespace orv::detail
 /// One file compiled into the library.
 struct EmbeddedAsset
 {
-    const char* name; ///< as assets are asked for, namespace and all
-    int size;         ///< in bytes, unpacked
+    const char* name;           ///< as assets are asked for, namespace and all
+    const unsigned char* bytes; ///< read-only, for the life of the process
+    int size;                   ///< in bytes
 };
 
-/// Files that are packed as one deflate stream, one after the other in the order of their list. A few bytes follow it.
+/// The files of one folder, in byte order of their names.
 struct EmbeddedArchive
 {
-    const EmbeddedAsset* assets; ///< in byte order of their names
+    const EmbeddedAsset* assets;
     size_t count;
-    const unsigned char* packed;
-    int packedSize;
-    int size; ///< of all files, in bytes, unpacked
 };
 
 // Defined in sources that the build makes from the folders assets/orv and assets/luvane.

@@ -133,10 +133,4 @@ void freeDecodedImage(unsigned char* pixels)
     stbi_image_free(pixels);
 }
 
-bool inflate(const unsigned char* packed, int packedSize, unsigned char* bytes, int size)
-{
-    return stbi_zlib_decode_noheader_buffer(reinterpret_cast<char*>(bytes), size,
-                                            reinterpret_cast<const char*>(packed), packedSize) == size;
-}
-
 } // namespace orv::detail

@@ -15,9 +15,4 @@ unsigned char* decodeImage(const unsigned char* file, std::size_t size, int& wid
 
 void freeDecodedImage(unsigned char* pixels);
 
-/// Unpacks a deflate stream (RFC 1951), which the PNG decoder can do anyway.
-/// @param packed  with at least two bytes of anything behind the stream.
-/// @return false unless it unpacks to exactly size bytes.
-bool inflate(const unsigned char* packed, int packedSize, unsigned char* bytes, int size);
-
 } // namespace orv::detail

@@ -44,7 +44,7 @@ WindingOrder turned(WindingOrder order)
 
 } // namespace
 
-[[gnu::cold]] RenderContext::RenderContext()
+RenderContext::RenderContext()
     : m_revision(detail::nextRevision())
     , m_propertyRevision(detail::nextRevision())
 {
@@ -333,7 +333,7 @@ void RenderContext::clear()
     glClear(GL_COLOR_BUFFER_BIT | GL_DEPTH_BUFFER_BIT | GL_STENCIL_BUFFER_BIT);
 }
 
-[[gnu::cold]] void RenderContext::addProperty(const SharedPtr<ShaderUniformBase>& property, const char* name)
+void RenderContext::addProperty(const SharedPtr<ShaderUniformBase>& property, const char* name)
 {
     if (!property || !name)
     {
@@ -356,7 +356,7 @@ SharedPtr<ShaderUniformBase> RenderContext::getProperty(const char* name) const
     return property;
 }
 
-[[gnu::cold]] void RenderContext::linkUniform(SharedPtr<ShaderUniformBase>& uniform, const char* name) const
+void RenderContext::linkUniform(SharedPtr<ShaderUniformBase>& uniform, const char* name) const
 {
     const auto found = name ? m_properties.find(std::string_view(name)) : m_properties.end();
     if (found != m_properties.end())

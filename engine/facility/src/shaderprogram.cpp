@@ -46,7 +46,7 @@ const GLfloat MISSING_ATTRIB[4] = {1.0f, 1.0f, 1.0f, 1.0f};
 int g_boundAttribCount = 0;
 
 template <class T>
-[[gnu::cold]] SharedPtr<ShaderUniformBase> makeHolder(int size)
+SharedPtr<ShaderUniformBase> makeHolder(int size)
 {
     return makeShared<ShaderUniform<T>>(size);
 }
@@ -167,7 +167,7 @@ ShaderProgram::ShaderProgram(const SharedPtr<detail::ProgramResource>& resource)
     getAttributes();
 }
 
-[[gnu::cold]] ShaderProgram::~ShaderProgram()
+ShaderProgram::~ShaderProgram()
 {
     if (m_handle)
         m_handle->program = nullptr;
@@ -178,7 +178,7 @@ unsigned ShaderProgram::getId() const
     return m_resource ? m_resource->getId() : 0;
 }
 
-[[gnu::cold]] void ShaderProgram::getUniforms()
+void ShaderProgram::getUniforms()
 {
     const GLuint program = getId();
     GLint nameSize = 0;
@@ -205,8 +205,7 @@ unsigned ShaderProgram::getId() const
         setSamplerUnits();
 }
 
-[[gnu::cold]] void ShaderProgram::addUniform(const char* name, int location, int size, unsigned glType,
-                                             int& nextUnit)
+void ShaderProgram::addUniform(const char* name, int location, int size, unsigned glType, int& nextUnit)
 {
     const auto type = std::find_if(std::begin(UNIFORM_TYPES), std::end(UNIFORM_TYPES),
                                    [glType](const UniformType& entry) { return entry.glType == glType; });
@@ -241,7 +240,7 @@ unsigned ShaderProgram::getId() const
     m_names.push_back({std::string(name, std::strcspn(name, "[")), std::string()});
 }
 
-[[gnu::cold]] void ShaderProgram::setSamplerUnits() const
+void ShaderProgram::setSamplerUnits() const
 {
     GLint previous = 0;
     glGetIntegerv(GL_CURRENT_PROGRAM, &previous);
@@ -256,7 +255,7 @@ unsigned ShaderProgram::getId() const
     detail::bindingsChanged();
 }
 
-[[gnu::cold]] void ShaderProgram::getAttributes()
+void ShaderProgram::getAttributes()
 {
     const GLuint program = getId();
     GLint count = 0;
@@ -291,7 +290,7 @@ const char* ShaderProgram::getUniformPropertyName(int index) const
     return indexInRange(index) ? m_names[std::size_t(index)].property.c_str() : nullptr;
 }
 
-[[gnu::cold]] void ShaderProgram::setUniformPropertyName(int index, const char* name)
+void ShaderProgram::setUniformPropertyName(int index, const char* name)
 {
     if (!indexInRange(index))
         return;
@@ -313,7 +312,7 @@ void ShaderProgram::setUniformPropertyValue(int index, const SharedPtr<ShaderUni
     m_sourcesRevision = detail::nextRevision();
 }
 
-[[gnu::cold]] bool ShaderProgram::uniformExists(const char* propertyName) const
+bool ShaderProgram::uniformExists(const char* propertyName) const
 {
     return propertyName &&
            std::any_of(m_names.begin(), m_names.end(),

@@ -154,16 +154,16 @@ bool writeAll(Stream& stream, const unsigned char* data, unsigned int size)
 
 } // namespace
 
-[[gnu::cold]] VertexBuffer::VertexBuffer(const SharedPtr<detail::BufferResource>& resource)
+VertexBuffer::VertexBuffer(const SharedPtr<detail::BufferResource>& resource)
     : m_resource(resource)
     , m_revision(detail::nextRevision())
 {
 }
 
-[[gnu::cold]] VertexBuffer::~VertexBuffer() = default;
+VertexBuffer::~VertexBuffer() = default;
 
-[[gnu::cold]] bool VertexBuffer::addAttrib(const SharedPtr<VertexArray>& array, const char* name,
-                                           AttribFormat format, AttribUsage usage, bool normalise)
+bool VertexBuffer::addAttrib(const SharedPtr<VertexArray>& array, const char* name, AttribFormat format,
+                             AttribUsage usage, bool normalise)
 {
     const GLenum glType = glAttribFormatConvert(format);
     if (!array || !name || getTypeSize(glType) > array->getTypeSize())
@@ -198,7 +198,7 @@ void VertexBuffer::getSizeAndStride(unsigned int& size, int& stride) const
     }
 }
 
-[[gnu::cold]] bool VertexBuffer::createTempData(unsigned int size, int stride, unsigned char* out)
+bool VertexBuffer::createTempData(unsigned int size, int stride, unsigned char* out)
 {
     for (const AttribRecord& record : m_attribs)
     {
@@ -230,7 +230,7 @@ void VertexBuffer::getSizeAndStride(unsigned int& size, int& stride) const
     return true;
 }
 
-[[gnu::cold]] void VertexBuffer::commit()
+void VertexBuffer::commit()
 {
     unsigned int size = 0;
     int stride = 0;
@@ -249,8 +249,8 @@ void VertexBuffer::getSizeAndStride(unsigned int& size, int& stride) const
     upload(data.get(), size);
 }
 
-[[gnu::cold]] bool VertexBuffer::setAllAttributes(const AttribDescription* descriptions, unsigned int count,
-                                                  const unsigned char* data, unsigned int size)
+bool VertexBuffer::setAllAttributes(const AttribDescription* descriptions, unsigned int count,
+                                    const unsigned char* data, unsigned int size)
 {
     if ((count > 0 && !descriptions) || (size > 0 && !data))
     {
@@ -330,7 +330,7 @@ bool VertexBuffer::isLost() const
     return getId() == 0 && std::any_of(m_attribs.begin(), m_attribs.end(), isStored);
 }
 
-[[gnu::cold]] bool VertexBuffer::save(const SharedPtr<Stream>& stream)
+bool VertexBuffer::save(const SharedPtr<Stream>& stream)
 {
     if (getId() != 0)
     {
@@ -379,7 +379,7 @@ bool VertexBuffer::isLost() const
     return true;
 }
 
-[[gnu::cold]] bool VertexBuffer::load(const SharedPtr<Stream>& stream)
+bool VertexBuffer::load(const SharedPtr<Stream>& stream)
 {
     unsigned char header[HEADER_SIZE];
     if (!stream || !readAll(*stream, header, HEADER_SIZE))

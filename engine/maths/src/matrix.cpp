@@ -210,17 +210,17 @@ Matrix4f lookAt(const Vector3f& eye, const Vector3f& target, const Vector3f& up)
                     Vector4f(eye, 1.0f));
 }
 
-[[gnu::cold]] std::string toString(const Matrix2f& m)
+std::string toString(const Matrix2f& m)
 {
     return columnLines("Matrix2f", m, 2);
 }
 
-[[gnu::cold]] std::string toString(const Matrix3f& m)
+std::string toString(const Matrix3f& m)
 {
     return columnLines("Matrix3f", m, 3);
 }
 
-[[gnu::cold]] std::string toString(const Matrix4f& m)
+std::string toString(const Matrix4f& m)
 {
     return columnLines("Matrix4f", m, 4);
 }

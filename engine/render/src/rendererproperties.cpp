@@ -53,7 +53,7 @@ void publishJoints(const Solid& solid, ShaderUniform<int>& count, ShaderUniform<
         world.set(solid.getJointTransform(i), i);
 }
 
-[[gnu::cold]] RendererProperties::RendererProperties(RenderContext& context, AssetCachePool* pool)
+RendererProperties::RendererProperties(RenderContext& context, AssetCachePool* pool)
     : lightCount(shareProperty<int>(context, "L_COUNT", 1, 0))
     , lightDiffuse(shareProperty(context, "L_DIFFUSE_COLOUR", MAX_LIGHTS, Vector4f()))
     , lightAmbient(shareProperty(context, "L_AMBIENT_COLOUR", MAX_LIGHTS, Vector4f()))
@@ -93,7 +93,7 @@ void publishJoints(const Solid& solid, ShaderUniform<int>& count, ShaderUniform<
         provideTexture(context, pool, texture.name, texture.value);
 }
 
-[[gnu::cold]] RendererProperties::~RendererProperties()
+RendererProperties::~RendererProperties()
 {
     const bool othersRemain = m_sharers && m_sharers->sharedGetCount() > 2;
     if (othersRemain)
@@ -113,8 +113,8 @@ bool RendererProperties::isComplete() const
            modelViewProjection && normalModel && cameraPosition && time;
 }
 
-[[gnu::cold]] void RendererProperties::provideTexture(RenderContext& context, AssetCachePool* pool,
-                                                      const char* name, const char* asset)
+void RendererProperties::provideTexture(RenderContext& context, AssetCachePool* pool, const char* name,
+                                        const char* asset)
 {
     const SharedPtr<ShaderUniformBase> present = context.getProperty(name);
     if (present && !present->holds<SharedPtr<Texture2D>>())

@@ -22,8 +22,8 @@ inline constexpr int MAX_LIGHTS = 5;
 /// of another type or with fewer elements cannot serve (logged): what comes back is then in no context.
 /// @return empty when there is no memory (logged).
 template <class T>
-[[gnu::cold]] SharedPtr<ShaderUniform<T>> shareProperty(RenderContext& context, const char* name, int size,
-                                                        const T& initial)
+SharedPtr<ShaderUniform<T>> shareProperty(RenderContext& context, const char* name, int size,
+                                          const T& initial)
 {
     const SharedPtr<ShaderUniformBase> held = context.getProperty(name);
     if (held && held->holds<T>() && held->getSize() >= size)

@@ -12,12 +12,12 @@
 namespace orv
 {
 
-[[gnu::cold]] SceneNode::SceneNode(const char* name)
+SceneNode::SceneNode(const char* name)
 {
     setName(name);
 }
 
-[[gnu::cold]] SceneNode::~SceneNode()
+SceneNode::~SceneNode()
 {
     // Descendants that die with this node are gathered here and die one by one: a chain of nodes as long as
     // a damaged or generated scene likes must not recurse through as many destructors, nor marks.
@@ -49,7 +49,7 @@ void SceneNode::accept(SceneNodeVisitor& visitor)
     visitor.visit(this);
 }
 
-[[gnu::cold]] void SceneNode::setName(const char* name)
+void SceneNode::setName(const char* name)
 {
     m_name = name ? name : "";
 }
@@ -158,7 +158,7 @@ void SceneNode::buildLocal() const
     m_normalTransformChanged = true;
 }
 
-[[gnu::cold]] void SceneNode::updateAll(const Matrix4f& parentWorld, bool parentMirrored) const
+void SceneNode::updateAll(const Matrix4f& parentWorld, bool parentMirrored) const
 {
     placeBelow(parentWorld, parentMirrored, false);
 }
@@ -176,7 +176,7 @@ void SceneNode::update() const
         updateRoot();
 }
 
-[[gnu::cold]] void SceneNode::updateRoot() const
+void SceneNode::updateRoot() const
 {
     placeBelow(Matrix4f::IDENTITY, false, true);
 }
@@ -204,7 +204,7 @@ void SceneNode::updateMotionData()
         detail::logNoMemory(className());
 }
 
-[[gnu::cold]] void SceneNode::setParent(const SharedPtr<SceneNode>& parent, bool preserveWorldTransform)
+void SceneNode::setParent(const SharedPtr<SceneNode>& parent, bool preserveWorldTransform)
 {
     if (parent && parent->hasAncestor(this))
         return;
@@ -281,7 +281,7 @@ const SceneNode* SceneNode::find(const char* name) const
 }
 
 /// @return the share that the child list held; empty when the node is no child of this one.
-[[gnu::cold]] SharedPtr<SceneNode> SceneNode::takeChild(const SceneNode* child)
+SharedPtr<SceneNode> SceneNode::takeChild(const SceneNode* child)
 {
     const auto found =
         std::find_if(m_children.begin(), m_children.end(),

@@ -52,15 +52,14 @@ Vector4f toVector(const Colour4f& colour)
 
 } // namespace
 
-[[gnu::cold]] SimpleRenderer::SimpleRenderer(const SharedPtr<RenderContext>& context,
-                                             const SharedPtr<AssetCachePool>& pool)
+SimpleRenderer::SimpleRenderer(const SharedPtr<RenderContext>& context, const SharedPtr<AssetCachePool>& pool)
     : m_context(context)
     , m_pool(pool)
     , m_properties(std::make_unique<detail::RendererProperties>(*m_context, m_pool.get()))
 {
 }
 
-[[gnu::cold]] SimpleRenderer::~SimpleRenderer() = default;
+SimpleRenderer::~SimpleRenderer() = default;
 
 void SimpleRenderer::visit(Solid* solid)
 {
@@ -201,7 +200,7 @@ void SimpleRenderer::sortTransparent(const Vector3f& eyeZ)
 }
 
 /// @return false if there is no target to reflect into; tried once only, not frame after frame.
-[[gnu::cold]] bool SimpleRenderer::prepareMirrorTarget()
+bool SimpleRenderer::prepareMirrorTarget()
 {
     const bool empty = m_viewport.width <= 0 || m_viewport.height <= 0;
     if (!m_mirrorTargetTried && m_pool && !empty)
@@ -217,8 +216,8 @@ void SimpleRenderer::sortTransparent(const Vector3f& eyeZ)
 }
 
 /// Draws what the mirror shows into the mirror target; framebuffer and viewport come back.
-[[gnu::cold]] void SimpleRenderer::renderReflection(const Solid& mirror, const detail::Eye& eye,
-                                                    const detail::Viewport& viewport)
+void SimpleRenderer::renderReflection(const Solid& mirror, const detail::Eye& eye,
+                                      const detail::Viewport& viewport)
 {
     const unsigned framebuffer = RenderTarget::getBoundFramebuffer();
     const Texture2D& texture = *m_mirrorTarget->getColourTexture();

@@ -52,7 +52,7 @@ Solid::Skin& Solid::makeSkin()
     return *m_skin;
 }
 
-[[gnu::cold]] void Solid::attachJoint(const SharedPtr<SceneNode>& joint, const Matrix4f& inverseBind)
+void Solid::attachJoint(const SharedPtr<SceneNode>& joint, const Matrix4f& inverseBind)
 {
     JointAttachment attachment;
     attachment.inverseBind = inverseBind;

@@ -14,9 +14,9 @@ namespace detail
 {
 
 // What SharedPtr does when something is wrong, once instead of wherever a pointer is followed.
-[[gnu::cold]] ORV_API void logNullArrow(const char* className);
-[[gnu::cold]] ORV_API void logNullDereference(const char* className);
-[[gnu::cold]] ORV_API void logNoMemory(const char* className);
+ORV_API void logNullArrow(const char* className);
+ORV_API void logNullDereference(const char* className);
+ORV_API void logNoMemory(const char* className);
 
 } // namespace detail
 
