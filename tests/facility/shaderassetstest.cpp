@@ -286,6 +286,18 @@ bool fits(std::vector<Declaration> declarations, size_t rows)
     return true;
 }
 
+/// The numbers that a preprocessed stage is written with, each once: they take room among the uniforms, whatever the
+/// compiler makes of them. Sizes of arrays do not, nor does what a constant is worked out from.
+std::vector<Declaration> readLiterals(std::string source)
+{
+    source = std::regex_replace(source, std::regex(R"((uniform|attribute|varying|const int|#)[^\n]*)"), "");
+    const std::regex number(R"([^\w.](\d+\.?\d*(?:e-?\d+)?))");
+    std::set<float> values;
+    for (std::sregex_iterator i(source.begin(), source.end(), number), end; i != end; ++i)
+        values.insert(std::stof((*i)[1]));
+    return std::vector<Declaration>(values.size(), {"", "float", "literal"});
+}
+
 size_t packedRows(const std::vector<Declaration>& declarations)
 {
     size_t rows = 1;
@@ -314,11 +326,18 @@ TEST(ShaderAssets, fitTheSmallestDevice)
         const auto sources = readSources(request);
         const std::string vertex = run(VALIDATOR + "-E " + folder.write("a.vert", sources[0]));
         const std::string fragment = run(VALIDATOR + "-E " + folder.write("a.frag", sources[1]));
-        const auto vertexUniforms = readDeclarations(vertex, "uniform", 5);
+        auto vertexUniforms = readDeclarations(vertex, "uniform", 5);
         std::smatch lights; // how many the constant comes to on a device with 16 vectors
         std::regex_search(fragment, lights, std::regex(R"(gl_MaxFragmentUniformVectors < 32 \? (\d+) :)"));
-        const auto fragmentUniforms =
+        auto fragmentUniforms =
             readDeclarations(fragment, "uniform", lights.empty() ? 0 : std::stoi(lights[1]));
+        const auto add = [](std::vector<Declaration>& all, const std::vector<Declaration>& more)
+        { all.insert(all.end(), more.begin(), more.end()); };
+        const auto vertexLiterals = readLiterals(vertex);
+        EXPECT_LE(packedRows(vertexUniforms) + vertexLiterals.size(), 128u)
+            << request << ", a vector for each literal";
+        add(vertexUniforms, vertexLiterals);
+        add(fragmentUniforms, readLiterals(fragment));
         const size_t vertexRows = packedRows(vertexUniforms), fragmentRows = packedRows(fragmentUniforms);
         const size_t varyingRows = packedRows(readDeclarations(fragment, "varying", 0));
         const size_t attributes = readDeclarations(vertex, "attribute", 0).size();
@@ -384,9 +403,9 @@ TEST_F(ShaderAssetsGl, everyProgramLinksAndIsFed)
         {
             EXPECT_TRUE(bindings.empty()) << request;
             if (request.find('$') != std::string::npos)
-                for (const char* name :
-                     {"u_t_modelViewProjection", "u_m_uvOffsetScale", "u_m_diffuseTexture",
-                      "u_m_diffuseColour", "u_m_opacity", "u_fogDensity", "u_fogColour", "u_time"})
+                for (const char* name : {"u_t_modelViewProjection", "u_m_uvOffsetScale", "u_m_diffuseTexture",
+                                         "u_m_diffuseColour", "u_m_opacity", "u_fogDensity", "u_fogColour",
+                                         "u_time", "u_t_modelView"})
                     bindings[name] = "";
         }
         GLint count = 0, attributes = 0;
@@ -454,7 +473,8 @@ std::map<std::string, Floats> readValues(const std::string& text)
 const char* const STANDARD = R"(
 a_normal 0 0 1 1; a_tangent 1 0 0 1; a_binormal 0 1 0 1; a_colour 1 1 1 1; a_joints 0 0 0 0; a_weights 1 0 0 0;
 u_t_model scale 1 1 1 0; u_t_view scale 1 1 1 0; u_t_viewProjection scale 1 1 1 0;
-u_t_modelViewProjection scale 1 1 1 0; u_t_oldModelViewProjection scale 1 1 1 0;
+u_t_modelViewProjection scale 1 1 1 0; u_t_oldModelViewProjection scale 1 1 1 0; u_j_weightFilled 0;
+u_t_modelView 1 0 0 0 0 1 0 0 0 0 1 0 0 0 -1 1;
 u_t_normalModel 1 0 0 0 1 0 0 0 1; u_t_cameraPosition 0 0 1 1; u_j_count 0; u_j_world 320* 0;
 u_l_count 1; u_l_position 5* 0 0 1 0; u_l_diffuseColour 20* 1; u_l_ambientColour 20* 0; u_l_attenuationNear 5* 0;
 u_l_attenuationReciprocal 5* 0; u_l_spotInnerCos 5* -1; u_l_spotOuterCos 5* -1; u_l_spotDirection 15* 0;
@@ -519,9 +539,12 @@ model transform ignored without joints | BOTH$DIFF$SKIN | u_t_model scale 1 1 1 
 model transform on top of the joints | BOTH$DIFF$SKIN
   | u_t_model scale 1 1 1 9; u_j_count 1; u_j_world scale 1 1 1 0 | 255 255 255 255
 last weight that GL has filled in | BOTH$DIFF$SKIN orv#gen_velocity$SKIN
-  | u_j_count 2; u_j_world scale 1 1 1 0 scale 1 1 1 9; a_joints 0 1 0 1; a_weights 1 0 0 1 | -1 -1 255 255
+  | u_j_count 2; u_j_world scale 1 1 1 0 scale 1 1 1 9; a_joints 0 1 0 1; a_weights 1 0 0 1; u_j_weightFilled 1
+  | -1 -1 255 255
 last weight that is one | BOTH$DIFF$SKIN orv#gen_velocity$SKIN
   | u_j_count 2; u_j_world scale 1 1 1 9 scale 1 1 1 0; a_joints 0 0 0 1; a_weights 0 0 0 1 | -1 -1 255 255
+last weight that is one beside a tiny one | BOTH$DIFF$SKIN orv#gen_velocity$SKIN
+  | u_j_count 2; u_j_world scale 1 1 1 9 scale 1 1 1 0; a_joints 0 0 0 1; a_weights 1e-9 0 0 1 | -1 -1 255 255
 no weights | BOTH$DIFF$SKIN | u_j_count 1; u_j_world scale 1 1 1 0; a_weights 0 0 0 0 | 255 255 255 255
 joint beyond the last | BOTH$DIFF$SKIN | u_j_count 1; u_j_world scale 1 1 1 0; a_joints 25 0 0 0 | 255 255 255 255
 normals scaled like positions | BOTH$DIFF$SKIN
@@ -537,6 +560,9 @@ no clay | orv#base | | 182 173 160 255
 no fog | orv#fog | | 181 193 204 255
 no waves | orv#ripple | | 61 122 168 255 40
 fog that does not come | luvane#fog | u_fogDensity 9 | 0 255 0 255
+fog that an orthographic camera has not | luvane#fog orv#fog$TRANSFORM$FOG
+  | u_fogDensity .5; u_t_modelView 1 0 0 0 0 1 0 0 0 0 1 0 0 0 -2 1 | 94 255 94 255
+fog lost without a view transform | orv#fog$TRANSFORM$FOG | u_fogDensity .5; u_t_modelView 16* 0 | 199 255 199 255
 colour of text from its picture | luvane#textfadequad
   | u_m_diffuseTexture 0 0 0 .5; u_m_diffuseColour 1 .5 0 1 | 255 128 0 128
 )";

@@ -1,9 +1,14 @@
 #include "scenetest.h"
 
+#include "orv/filetostring.h"
+#include "orv/stream.h"
+
 #include <GLES2/gl2.h>
 
 #include <cmath>
 #include <limits>
+#include <set>
+#include <sstream>
 
 using namespace orv;
 using support::LogCapture;
@@ -20,6 +25,36 @@ protected:
         return light;
     }
 };
+
+// Fault caught: a material that leaves a value out and is drawn with what the last one sent.
+TEST_F(SimpleRendererTest, everyMaterialValueOfTheBuiltInProgramsHasADefault)
+{
+    const std::set<std::string> ofThePass = {"M_SHARP_TEXTURE",
+                                             "M_VELOCITY_TEXTURE"}; // set by the blur renderer itself
+    int count = 0;
+    for (const char* program : {"orv#max_pvl.sp", "orv#max_ppl.sp", "orv#fallback.sp", "orv#error.sp",
+                                "luvane#blur.sp", "luvane#depthoffield.sp", "luvane#fog.sp", "luvane#quad.sp",
+                                "luvane#quad_premultiply.sp", "luvane#ripple.sp", "luvane#textfadequad.sp",
+                                "luvane#vidquad.sp", "luvane#weather.sp", "orv#motionblur.sp"})
+    {
+        const SharedPtr<Stream> stream = pool->getStream(program);
+        ASSERT_TRUE(stream) << program;
+        const FileToString text(*stream);
+        std::istringstream words(text.getStart());
+        for (std::string word, uniform, name; words >> word;)
+        {
+            if (word != "uniform" || !(words >> uniform >> name) || name.rfind("M_", 0) != 0)
+                continue;
+            ++count;
+            EXPECT_TRUE(renderContext->getProperty(name.c_str()) || ofThePass.count(name))
+                << program << ": " << name;
+        }
+    }
+    EXPECT_LT(50, count);
+    EXPECT_EQ(1.0f, property<float>("M_WEATHER_STRETCH"));
+    const SharedPtr<Texture2D> flat = property<SharedPtr<Texture2D>>("M_BUMP_TEXTURE");
+    EXPECT_TRUE(flat && flat->getWidth() == 1);
+}
 
 // Faults caught: directions of the wrong axis or unnormalised, half cones taken for full ones, distances that
 // ignore the light's scale, a fall-off that divides by zero.

@@ -56,6 +56,25 @@ TEST_F(SolidTest, jointsMoveTheMeshIntoTheWorld)
     EXPECT_EQ(20, property<int>("J_COUNT"));
 }
 
+// Fault caught: what GL fills in for a fourth weight taken for one, or a fourth weight of one taken for what GL fills in.
+TEST_F(SolidTest, shadersAreToldWhetherTheLastWeightIsThere)
+{
+    const SharedPtr<Solid> solid = addSquare(Vector3f(0, 0, 0), 1, makePaint(Colour4f::WHITE));
+    solid->attachJoint(scene, Matrix4f::IDENTITY);
+    for (int count = 4; count > 0; --count)
+    {
+        const auto vertices = pool->getVertexBufferCache()->create(nullptr);
+        for (const auto& [name, components] : {std::pair("a_position", 3), std::pair("a_weights", count)})
+            vertices->addAttrib(makeShared<VertexArray>(4, 4, components), name,
+                                VertexBuffer::AttribFormat::FLOAT, VertexBuffer::AttribUsage::GL_BUFFER,
+                                false);
+        vertices->commit();
+        solid->setMesh(makeShared<Mesh>(MeshHeader(), solid->getMesh()->getIndexBuffer(), vertices));
+        render();
+        EXPECT_EQ(count < 4 ? 1.0f : 0.0f, property<float>("J_WEIGHT_FILLED")) << count;
+    }
+}
+
 // Fault caught: a solid below its own joint that keeps both alive for ever, or reads the joint after its end.
 TEST_F(SolidTest, doesNotOwnTheJointsAboveIt)
 {

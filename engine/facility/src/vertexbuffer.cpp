@@ -477,6 +477,8 @@ bool VertexBuffer::upload(const unsigned char* data, unsigned int size)
 void VertexBuffer::attribsChanged()
 {
     m_revision = detail::nextRevision();
+    const detail::AttribRecord* weights = findAttrib("a_weights");
+    m_lacksLastWeight = weights && weights->componentCount < 4;
     for (Plan& plan : m_plans)
         plan.programRevision = 0; // 0 is no program's; the records that it points to may have moved
 }

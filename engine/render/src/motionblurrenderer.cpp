@@ -23,8 +23,7 @@ constexpr float FRAME_SECONDS = 1.0f / 60.0f;
 struct MotionBlurRenderer::Properties
 {
     explicit Properties(RenderContext& context)
-        : jointCount(detail::shareProperty<int>(context, "J_COUNT", 1, 0))
-        , jointWorld(detail::shareProperty(context, "J_WORLD", Solid::MAX_JOINTS, Matrix4f()))
+        : joints(context)
         , viewProjection(shareTransform(context, "T_VIEW_PROJECTION"))
         , oldModelViewProjection(shareTransform(context, "T_OLD_MODEL_VIEW_PROJECTION"))
         , modelViewProjection(shareTransform(context, "T_MODEL_VIEW_PROJECTION"))
@@ -42,12 +41,11 @@ struct MotionBlurRenderer::Properties
     /// Whether there was memory for all that is written each frame.
     bool isComplete() const
     {
-        return jointCount && jointWorld && viewProjection && oldModelViewProjection && modelViewProjection &&
+        return joints.isComplete() && viewProjection && oldModelViewProjection && modelViewProjection &&
                time && deltaTime;
     }
 
-    SharedPtr<ShaderUniform<int>> jointCount;
-    SharedPtr<ShaderUniform<Matrix4f>> jointWorld;
+    detail::JointProperties joints;
     SharedPtr<ShaderUniform<Matrix4f>> viewProjection;
     SharedPtr<ShaderUniform<Matrix4f>> oldModelViewProjection;
     SharedPtr<ShaderUniform<Matrix4f>> modelViewProjection;
@@ -117,7 +115,7 @@ void MotionBlurRenderer::drawEye(const Matrix4f& viewProjection, const Matrix4f&
     {
         properties.oldModelViewProjection->set(lastViewProjection * solid->getLastWorldTransform());
         properties.modelViewProjection->set(viewProjection * solid->getWorldTransform());
-        detail::publishJoints(*solid, *properties.jointCount, *properties.jointWorld);
+        properties.joints.publish(*solid);
         solid->draw(*m_context, solid->getJointsPerVertex() == 0 ? *m_velocity : *m_skinnedVelocity);
     }
 }

@@ -1,6 +1,7 @@
 #include "rendererproperties.h"
 
 #include "orv/assetcachepool.h"
+#include "orv/mesh.h"
 #include "orv/solid.h"
 #include "orv/texture2dcache.h"
 
@@ -28,11 +29,13 @@ constexpr MaterialDefault<Vector4f> VECTOR_DEFAULTS[] = {
     {"M_UV_OFFSET_SCALE", Vector4f(0.0f, 0.0f, 1.0f, 1.0f)},
 };
 
+/// Of the client framework's effects, which say what a value of zero means.
+constexpr const char* ZERO_VECTORS[] = {"M_BLUR_STEP", "M_DEPTH_RANGE", "M_FADE", "M_FOCUS",
+                                        "M_WEATHER_FALL"};
+
 constexpr MaterialDefault<float> FLOAT_DEFAULTS[] = {
-    {"M_SHININESS", 5.0f},
-    {"M_SPECULAR_LEVEL", 1.0f},
-    {"M_OPACITY", 1.0f},
-    {"M_SELF_ILLUMINATION", 0.0f},
+    {"M_SHININESS", 5.0f},         {"M_SPECULAR_LEVEL", 1.0f},  {"M_OPACITY", 1.0f},
+    {"M_SELF_ILLUMINATION", 0.0f}, {"M_WEATHER_STRETCH", 1.0f},
 };
 
 constexpr MaterialDefault<const char*> TEXTURES[] = {
@@ -40,17 +43,37 @@ constexpr MaterialDefault<const char*> TEXTURES[] = {
     {"M_ERROR_TEXTURE", "orv#error.png"},          {"M_DIFFUSE_TEXTURE", "orv#white.png"},
     {"M_SPECULAR_TEXTURE", "orv#white.png"},       {"M_AMBIENT_TEXTURE", "orv#white.png"},
     {"M_EMISSIVE_TEXTURE", "orv#white.png"},       {"M_GLOSS_TEXTURE", "orv#white.png"},
-    {"M_SPECULAR_LEVEL_TEXTURE", "orv#white.png"},
+    {"M_SPECULAR_LEVEL_TEXTURE", "orv#white.png"}, {"M_REFLECTION_TEXTURE", "orv#black.png"},
+    {"M_BLURRED_TEXTURE", "orv#white.png"},        {"M_DEPTH_TEXTURE", "orv#white.png"},
 };
+
+constexpr const char* BUMP_TEXTURE = "M_BUMP_TEXTURE";
+
+/// One texel of a surface without bumps.
+SharedPtr<Texture2D> createFlatTexture(AssetCachePool& pool)
+{
+    const unsigned char pixel[] = {128, 128, 255};
+    return pool.getTexture2DCache()->create(1, 1, Texture::Format::RGB, Texture::Type::UNSIGNED_BYTE, pixel,
+                                            nullptr);
+}
 
 } // namespace
 
-void publishJoints(const Solid& solid, ShaderUniform<int>& count, ShaderUniform<Matrix4f>& world)
+JointProperties::JointProperties(RenderContext& context)
+    : count(shareProperty<int>(context, "J_COUNT", 1, 0))
+    , world(shareProperty(context, "J_WORLD", Solid::MAX_JOINTS, Matrix4f()))
+    , weightFilled(shareProperty(context, "J_WEIGHT_FILLED", 1, 0.0f))
+{
+}
+
+void JointProperties::publish(const Solid& solid) const
 {
     const int jointCount = std::min(solid.getJointCount(), Solid::MAX_JOINTS);
-    count.set(jointCount);
+    count->set(jointCount);
     for (int i = 0; i < jointCount; ++i)
-        world.set(solid.getJointTransform(i), i);
+        world->set(solid.getJointTransform(i), i);
+    const VertexBuffer* vertices = solid.getMesh() ? solid.getMesh()->getVertexBuffer().get() : nullptr;
+    weightFilled->set(vertices && vertices->lacksLastWeight() ? 1.0f : 0.0f);
 }
 
 RendererProperties::RendererProperties(RenderContext& context, AssetCachePool* pool)
@@ -64,8 +87,7 @@ RendererProperties::RendererProperties(RenderContext& context, AssetCachePool* p
     , lightSpotInnerCos(shareProperty(context, "L_SPOT_INNER_COS", MAX_LIGHTS, 0.0f))
     , lightSpotOuterCos(shareProperty(context, "L_SPOT_OUTER_COS", MAX_LIGHTS, 0.0f))
     , lightSpotDirection(shareProperty(context, "L_SPOT_DIRECTION", MAX_LIGHTS, Vector3f()))
-    , jointCount(shareProperty<int>(context, "J_COUNT", 1, 0))
-    , jointWorld(shareProperty(context, "J_WORLD", Solid::MAX_JOINTS, Matrix4f()))
+    , joints(context)
     , model(shareProperty<Matrix4f>(context, "T_MODEL", 1, Matrix4f::IDENTITY))
     , view(shareProperty<Matrix4f>(context, "T_VIEW", 1, Matrix4f::IDENTITY))
     , modelView(shareProperty<Matrix4f>(context, "T_MODEL_VIEW", 1, Matrix4f::IDENTITY))
@@ -84,6 +106,11 @@ RendererProperties::RendererProperties(RenderContext& context, AssetCachePool* p
         if (!context.getProperty(value.name))
             shareProperty(context, value.name, 1, value.value);
     }
+    for (const char* name : ZERO_VECTORS)
+    {
+        if (!context.getProperty(name))
+            shareProperty(context, name, 1, Vector2f(0.0f, 0.0f));
+    }
     for (const MaterialDefault<float>& value : FLOAT_DEFAULTS)
     {
         if (!context.getProperty(value.name))
@@ -91,6 +118,7 @@ RendererProperties::RendererProperties(RenderContext& context, AssetCachePool* p
     }
     for (const MaterialDefault<const char*>& texture : TEXTURES)
         provideTexture(context, pool, texture.name, texture.value);
+    provideTexture(context, pool, BUMP_TEXTURE, nullptr);
 }
 
 RendererProperties::~RendererProperties()
@@ -109,7 +137,7 @@ bool RendererProperties::isComplete() const
 {
     return lightCount && lightDiffuse && lightAmbient && lightSpecular && lightPosition &&
            lightAttenuationNear && lightAttenuationReciprocal && lightSpotInnerCos && lightSpotOuterCos &&
-           lightSpotDirection && jointCount && jointWorld && model && view && modelView && viewProjection &&
+           lightSpotDirection && joints.isComplete() && model && view && modelView && viewProjection &&
            modelViewProjection && normalModel && cameraPosition && time;
 }
 
@@ -124,7 +152,7 @@ void RendererProperties::provideTexture(RenderContext& context, AssetCachePool* 
     if (!property)
         return;
     if (!property->get() && pool)
-        property->set(pool->getTexture2DCache()->get(asset));
+        property->set(asset ? pool->getTexture2DCache()->get(asset) : createFlatTexture(*pool));
     if (property->get())
         m_textures.push_back({property, property->get()});
 }

@@ -42,9 +42,20 @@ SharedPtr<ShaderUniform<T>> shareProperty(RenderContext& context, const char* na
     return property;
 }
 
-/// How many joints reach the shader, and where each takes the solid's mesh.
-/// @param world  of Solid::MAX_JOINTS elements; those beyond the count stay as they are.
-void publishJoints(const Solid& solid, ShaderUniform<int>& count, ShaderUniform<Matrix4f>& world);
+/// What skinning shaders are fed with.
+struct JointProperties
+{
+    explicit JointProperties(RenderContext& context);
+
+    bool isComplete() const { return count && world && weightFilled; }
+
+    /// Sets all to what the solid's joints and mesh say. Elements of world beyond the count stay as they are.
+    void publish(const Solid& solid) const;
+
+    SharedPtr<ShaderUniform<int>> count;
+    SharedPtr<ShaderUniform<Matrix4f>> world; ///< of Solid::MAX_JOINTS elements, mesh space to world space
+    SharedPtr<ShaderUniform<float>> weightFilled;
+};
 
 /// The global properties that SimpleRenderer writes or provides; see there for their meaning.
 struct RendererProperties
@@ -72,8 +83,7 @@ struct RendererProperties
     SharedPtr<ShaderUniform<float>> lightSpotInnerCos;
     SharedPtr<ShaderUniform<float>> lightSpotOuterCos;
     SharedPtr<ShaderUniform<Vector3f>> lightSpotDirection;
-    SharedPtr<ShaderUniform<int>> jointCount;
-    SharedPtr<ShaderUniform<Matrix4f>> jointWorld;
+    JointProperties joints;
     SharedPtr<ShaderUniform<Matrix4f>> model;
     SharedPtr<ShaderUniform<Matrix4f>> view;
     SharedPtr<ShaderUniform<Matrix4f>> modelView;
@@ -92,6 +102,7 @@ private:
         SharedPtr<Texture2D> texture;
     };
 
+    /// @param asset  null for one texel of a surface without bumps.
     void provideTexture(RenderContext& context, AssetCachePool* pool, const char* name, const char* asset);
 
     std::vector<HeldTexture> m_textures;

@@ -253,7 +253,7 @@ void SimpleRenderer::draw(Solid* const* solids, size_t count, const Matrix4f& vi
     ShaderUniform<Matrix4f>& modelView = *properties.modelView;
     ShaderUniform<Matrix4f>& modelViewProjection = *properties.modelViewProjection;
     ShaderUniform<Matrix3f>& normalModel = *properties.normalModel;
-    bool hadJoints = properties.jointCount->get() > 0;
+    bool hadJoints = properties.joints.count->get() > 0;
 
     const Matrix4f viewProjection = projection * view;
     properties.viewProjection->set(viewProjection);
@@ -275,7 +275,7 @@ void SimpleRenderer::draw(Solid* const* solids, size_t count, const Matrix4f& vi
 
         const bool hasJoints = solid.getJointCount() > 0;
         if (hasJoints || hadJoints)
-            detail::publishJoints(solid, *properties.jointCount, *properties.jointWorld);
+            properties.joints.publish(solid);
         hadJoints = hasJoints;
         solid.draw(*m_context);
     }

@@ -139,6 +139,9 @@ public:
     /// In the order of interleaving; valid until the attributes change.
     const std::vector<detail::AttribRecord>& getAttribs() const { return m_attribs; }
 
+    /// Whether "a_weights" has fewer than four components, so that GL makes the last weight 1.
+    bool lacksLastWeight() const { return m_lacksLastWeight; }
+
     /// @return null if there is none of this name.
     const detail::AttribRecord* findAttrib(const char* name) const;
 
@@ -157,6 +160,7 @@ private:
     std::vector<detail::AttribRecord> m_attribs;
     SharedPtr<detail::BufferResource> m_resource;
     uint64_t m_revision;
+    bool m_lacksLastWeight = false;
     std::array<Plan, 8> m_plans;
     unsigned int m_nextPlan = 0; ///< The plan that the next unknown program takes over.
 };

@@ -3,6 +3,7 @@ vertex_source_file luvane#fog.vert
 fragment_source_file luvane#fog.frag
 
 uniform u_t_modelViewProjection T_MODEL_VIEW_PROJECTION
+uniform u_t_modelView T_MODEL_VIEW
 uniform u_m_uvOffsetScale M_UV_OFFSET_SCALE
 uniform u_m_diffuseTexture M_DIFFUSE_TEXTURE
 uniform u_m_diffuseColour M_DIFFUSE_COLOUR

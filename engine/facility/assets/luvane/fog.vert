@@ -13,6 +13,7 @@ attribute vec3 a_position;
 attribute vec2 a_uv0;
 
 uniform mat4 u_t_modelViewProjection;
+uniform mat4 u_t_modelView;
 uniform vec4 u_m_uvOffsetScale;
 
 varying FINE vec2 v_uv;
@@ -25,5 +26,5 @@ void main()
     vec2 uv = a_uv0 * u_m_uvOffsetScale.zw + u_m_uvOffsetScale.xy;
     v_uv = vec2(uv.x, 1.0 - uv.y);
 
-    v_distance = gl_Position.w;
+    v_distance = -(u_t_modelView * vec4(a_position, 1.0)).z;
 }

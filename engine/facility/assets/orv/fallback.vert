@@ -46,14 +46,15 @@ varying mediump vec3 v_highlights; // what comes on top of it
 // A zero vector, as a mesh with damaged normals has it, stays zero.
 vec3 safeNormalize(vec3 v)
 {
-    return v * inversesqrt(max(dot(v, v), 1.0e-30));
+    float square = dot(v, v);
+    return square > 0.0 ? v * inversesqrt(square) : v;
 }
 
 // 1 inside the inner cone, 0 outside the outer one. An inner cosine of -1 means a light that shines everywhere.
 float cone(float cosine, float inner, float outer)
 {
-    float x = clamp((cosine - outer) / max(inner - outer, 0.0001), 0.0, 1.0);
-    return inner <= -0.99999 ? 1.0 : x * x * (3.0 - 2.0 * x);
+    float x = inner > outer ? smoothstep(outer, inner, cosine) : step(outer, cosine);
+    return inner <= -1.0 ? 1.0 : x;
 }
 
 void main()
@@ -83,7 +84,7 @@ void main()
         {
             toLight -= position;
             float range = length(toLight);
-            toLight /= max(range, 1.0e-30);
+            toLight = safeNormalize(toLight);
             strength = 1.0 - clamp((range - u_l_attenuationNear[i]) * u_l_attenuationReciprocal[i], 0.0, 1.0);
         }
         strength *= cone(dot(toLight, u_l_spotDirection[i]), u_l_spotInnerCos[i], u_l_spotOuterCos[i]);

@@ -3,8 +3,9 @@
 // orv#fog.sp feeds nothing to it: the mesh is then seen from its front (+z), filling the view at the size of -1 to 1,
 // white, and its far parts are lost in pale fog. A program file of one's own names these two sources, declares the
 // uniforms below, and is asked for with the features it wants, as in mine.sp$TRANSFORM$FOG:
-//   TRANSFORM  u_t_modelViewProjection (T_MODEL_VIEW_PROJECTION): drawn where the scene has it, and fogged by the
-//              distance in front of the camera
+//   TRANSFORM  u_t_modelViewProjection (T_MODEL_VIEW_PROJECTION) and u_t_modelView (T_MODEL_VIEW): drawn where the
+//              scene has it, and fogged by the distance in front of the camera. A program file without u_t_modelView
+//              gets that distance with perspective cameras alone
 //   TEXTURE    u_m_diffuseTexture (M_DIFFUSE_TEXTURE) and u_m_uvOffsetScale (M_UV_OFFSET_SCALE: offset u, offset v,
 //              scale u, scale v) instead of white
 //   FOG        u_fogDensity (FOG_DENSITY) and u_fogColour (FOG_COLOUR) instead of constants
@@ -20,6 +21,7 @@ attribute vec3 a_position;
 
 #ifdef TRANSFORM
 uniform mat4 u_t_modelViewProjection;
+uniform mat4 u_t_modelView;
 #endif
 
 #ifdef TEXTURE
@@ -36,7 +38,8 @@ void main()
 {
 #ifdef TRANSFORM
     gl_Position = u_t_modelViewProjection * vec4(a_position, 1.0);
-    v_distance = gl_Position.w;
+    bool isPlaced = u_t_modelView[3].w == 1.0; // zeros where nothing feeds it
+    v_distance = isPlaced ? -(u_t_modelView * vec4(a_position, 1.0)).z : gl_Position.w;
 #else
     // Depth counts away from the eye, z towards it.
     gl_Position = vec4(a_position.xy, a_position.z * -0.5, 1.0);

@@ -8,6 +8,7 @@ uniform u_t_modelViewProjection T_MODEL_VIEW_PROJECTION
 
 uniform u_j_count J_COUNT
 uniform u_j_world J_WORLD
+uniform u_j_weightFilled J_WEIGHT_FILLED
 
 uniform u_blurFactor MOTION_BLUR_FACTOR
 uniform u_deltaTime DELTA_TIME

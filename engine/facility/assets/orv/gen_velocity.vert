@@ -22,6 +22,7 @@ attribute vec4 a_weights;
 uniform mat4 u_t_viewProjection;
 uniform int u_j_count;
 uniform mat4 u_j_world[20];
+uniform float u_j_weightFilled; // 1 where GL has filled in the last weight: the mesh has fewer than four
 #endif
 
 // Clip coordinates x, y and w, divided for each pixel: divided here they would not interpolate rightly.
@@ -32,14 +33,12 @@ varying FINE vec3 v_before;
 // The vertex in the world, in the pose of its joints.
 vec4 posedPosition()
 {
-    // Fewer components than four are filled up by GL with 0, 0, 1: then the last weight is no weight.
     vec4 weights = a_weights;
-    if (weights.w == 1.0 && weights.x + weights.y + weights.z > 0.0)
-        weights.w = 0.0;
+    weights.w *= 1.0 - u_j_weightFilled;
     float total = weights.x + weights.y + weights.z + weights.w;
     weights = total > 0.0 ? weights / total : vec4(1.0, 0.0, 0.0, 0.0);
 
-    vec4 joints = clamp(a_joints, 0.0, float(u_j_count - 1)) + 0.5;
+    vec4 joints = clamp(a_joints, 0.0, float(u_j_count) - 1.0) + 0.5;
     mat4 transform = u_j_world[int(joints.x)] * weights.x + u_j_world[int(joints.y)] * weights.y +
                      u_j_world[int(joints.z)] * weights.z + u_j_world[int(joints.w)] * weights.w;
     return transform * vec4(a_position, 1.0);

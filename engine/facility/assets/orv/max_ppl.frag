@@ -26,10 +26,8 @@
 
 #ifdef GL_FRAGMENT_PRECISION_HIGH
 #define FINE highp
-#define TINY 1.0e-30
 #else
 #define FINE mediump
-#define TINY 0.0001
 #endif
 
 precision FINE float;
@@ -107,14 +105,15 @@ varying mediump vec3 v_eyeUp;
 // A zero vector stays zero.
 vec3 safeNormalize(vec3 v)
 {
-    return v * inversesqrt(max(dot(v, v), TINY));
+    float square = dot(v, v);
+    return square > 0.0 ? v * inversesqrt(square) : v;
 }
 
 vec3 surfaceNormal()
 {
     vec3 normal = safeNormalize(v_normal);
 #ifdef BUMP
-    vec3 bump = texture2D(u_m_bumpTexture, v_uv).xyz * 2.0 - 1.0;
+    vec3 bump = texture2D(u_m_bumpTexture, v_uv).xyz - 0.5; // half of a normal
 #ifdef INVY
     bump.y = -bump.y;
 #endif
@@ -130,7 +129,7 @@ float fallOff(float range, float near, float reciprocal)
 {
     float x = 1.0 - clamp((range - near) * reciprocal, 0.0, 1.0);
 #ifdef INVSQROOT
-    x *= inversesqrt(max(x, 0.0001));
+    x = sqrt(x);
 #endif
     return x;
 }
@@ -138,8 +137,8 @@ float fallOff(float range, float near, float reciprocal)
 // 1 inside the inner cone, 0 outside the outer one. An inner cosine of -1 means a light that shines everywhere.
 float cone(float cosine, float inner, float outer)
 {
-    float x = clamp((cosine - outer) / max(inner - outer, 0.0001), 0.0, 1.0);
-    return inner <= -0.99999 ? 1.0 : x * x * (3.0 - 2.0 * x);
+    float x = inner > outer ? smoothstep(outer, inner, cosine) : step(outer, cosine);
+    return inner <= -1.0 ? 1.0 : x;
 }
 #endif
 
@@ -153,8 +152,8 @@ vec3 reflectedColour(vec3 normal, vec3 toEye)
     // The third axis is the one that points from the scene to the eye, in mirror images too.
     vec3 eyeBack = cross(v_eyeRight, v_eyeUp);
     eyeBack *= dot(eyeBack, toEye) < 0.0 ? -1.0 : 1.0;
-    float m = 2.0 * sqrt(2.0 * max(dot(direction, eyeBack) + 1.0, 0.0001));
-    vec2 uv = vec2(0.5 + dot(direction, v_eyeRight) / m, 0.5 - dot(direction, v_eyeUp) / m);
+    vec3 middle = safeNormalize(direction + eyeBack);
+    vec2 uv = vec2(dot(middle, v_eyeRight), -dot(middle, v_eyeUp)) * 0.5 + 0.5;
     return texture2D(u_m_reflectionTexture, uv).rgb;
 #endif
 }
@@ -190,7 +189,7 @@ void main()
         {
             toLight -= v_position;
             float range = length(toLight);
-            toLight /= max(range, TINY);
+            toLight = safeNormalize(toLight);
             strength = fallOff(range, u_l_attenuationNear[i], u_l_attenuationReciprocal[i]);
         }
         strength *= cone(dot(toLight, u_l_spotDirection[i]), u_l_spotInnerCos[i], u_l_spotOuterCos[i]);

@@ -11,6 +11,7 @@ uniform u_t_cameraPosition T_CAMERA_POSITION
 
 uniform u_j_count J_COUNT
 uniform u_j_world J_WORLD
+uniform u_j_weightFilled J_WEIGHT_FILLED
 
 uniform u_l_count L_COUNT
 uniform u_l_position L_POSITION

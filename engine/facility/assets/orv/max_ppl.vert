@@ -43,6 +43,7 @@ attribute vec4 a_weights;
 
 uniform int u_j_count;
 uniform mat4 u_j_world[20];
+uniform float u_j_weightFilled; // 1 where GL has filled in the last weight: the mesh has fewer than four
 uniform mat4 u_t_model;
 uniform mat4 u_t_viewProjection;
 #else
@@ -90,7 +91,8 @@ varying mediump vec3 v_eyeUp;
 // A zero vector, as a mesh with damaged normals has it, stays zero.
 vec3 safeNormalize(vec3 v)
 {
-    return v * inversesqrt(max(dot(v, v), 1.0e-30));
+    float square = dot(v, v);
+    return square > 0.0 ? v * inversesqrt(square) : v;
 }
 #endif
 
@@ -98,17 +100,15 @@ vec3 safeNormalize(vec3 v)
 // Takes the vertex to world space: the weighted joints or, without joints, the model transform.
 mat4 worldTransform()
 {
-    if (u_j_count < 1)
+    if (u_j_count == 0)
         return u_t_model;
 
-    // Fewer components than four are filled up by GL with 0, 0, 1: then the last weight is no weight.
     vec4 weights = a_weights;
-    if (weights.w == 1.0 && weights.x + weights.y + weights.z > 0.0)
-        weights.w = 0.0;
+    weights.w *= 1.0 - u_j_weightFilled;
     float total = weights.x + weights.y + weights.z + weights.w;
     weights = total > 0.0 ? weights / total : vec4(1.0, 0.0, 0.0, 0.0);
 
-    vec4 joints = clamp(a_joints, 0.0, float(u_j_count - 1)) + 0.5;
+    vec4 joints = clamp(a_joints, 0.0, float(u_j_count) - 1.0) + 0.5;
     return u_j_world[int(joints.x)] * weights.x + u_j_world[int(joints.y)] * weights.y +
            u_j_world[int(joints.z)] * weights.z + u_j_world[int(joints.w)] * weights.w;
 }
@@ -117,9 +117,9 @@ mat4 worldTransform()
 // What a normal is multiplied by: the inverse transpose of the transform's upper 3x3, but for a positive factor.
 mat3 normalTransform(mat4 transform)
 {
-    vec3 x = transform[0].xyz;
-    vec3 y = transform[1].xyz;
-    vec3 z = transform[2].xyz;
+    vec3 x = (transform * vec4(1.0, 0.0, 0.0, 0.0)).xyz;
+    vec3 y = (transform * vec4(0.0, 1.0, 0.0, 0.0)).xyz;
+    vec3 z = (transform * vec4(0.0, 0.0, 1.0, 0.0)).xyz;
     vec3 yz = cross(y, z);
     float side = dot(x, yz) < 0.0 ? -1.0 : 1.0;
     return mat3(yz * side, cross(z, x) * side, cross(x, y) * side);

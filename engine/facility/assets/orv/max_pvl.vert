@@ -8,13 +8,14 @@
 //   CUBE       with REFL: the reflection is a cube map, in world directions
 //   EMIS       M_EMISSIVE_COLOUR, whatever the light
 //   SKIN       the vertex follows up to four joints
-//   INVSQROOT  a light's fall-off is x * inversesqrt(x) of the usual straight line x: brighter for longer,
+//   INVSQROOT  a light's fall-off is x * inversesqrt(x), the root, of the usual straight line x: brighter for longer,
 //              then a steep end, as the lamps of some authoring tools have it
 //
 // Lighting is done in world space. The texture is moved and scaled by M_UV_OFFSET_SCALE (offset u, offset v, scale
 // u, scale v); v counts upwards here and downwards in GL, which has a picture's top row at 0, so v is turned.
 //
-// Everything together fits the 128 uniform vectors that every device has.
+// Everything together fits the 128 uniform vectors that every device has, literals included: they may count as one
+// each, so there are few.
 
 #if defined(DIFF) || defined(SPEC)
 #define LIT
@@ -46,6 +47,7 @@ attribute vec4 a_weights;
 
 uniform int u_j_count;
 uniform mat4 u_j_world[20];
+uniform float u_j_weightFilled; // 1 where GL has filled in the last weight: the mesh has fewer than four
 uniform mat4 u_t_model;
 uniform mat4 u_t_viewProjection;
 #else
@@ -115,24 +117,23 @@ varying mediump vec2 v_reflection;
 // A zero vector, as a mesh with damaged normals has it, stays zero.
 vec3 safeNormalize(vec3 v)
 {
-    return v * inversesqrt(max(dot(v, v), 1.0e-30));
+    float square = dot(v, v);
+    return square > 0.0 ? v * inversesqrt(square) : v;
 }
 
 #ifdef SKIN
 // Takes the vertex to world space: the weighted joints or, without joints, the model transform.
 mat4 worldTransform()
 {
-    if (u_j_count < 1)
+    if (u_j_count == 0)
         return u_t_model;
 
-    // Fewer components than four are filled up by GL with 0, 0, 1: then the last weight is no weight.
     vec4 weights = a_weights;
-    if (weights.w == 1.0 && weights.x + weights.y + weights.z > 0.0)
-        weights.w = 0.0;
+    weights.w *= 1.0 - u_j_weightFilled;
     float total = weights.x + weights.y + weights.z + weights.w;
     weights = total > 0.0 ? weights / total : vec4(1.0, 0.0, 0.0, 0.0);
 
-    vec4 joints = clamp(a_joints, 0.0, float(u_j_count - 1)) + 0.5;
+    vec4 joints = clamp(a_joints, 0.0, float(u_j_count) - 1.0) + 0.5;
     return u_j_world[int(joints.x)] * weights.x + u_j_world[int(joints.y)] * weights.y +
            u_j_world[int(joints.z)] * weights.z + u_j_world[int(joints.w)] * weights.w;
 }
@@ -140,9 +141,9 @@ mat4 worldTransform()
 // What a normal is multiplied by: the inverse transpose of the transform's upper 3x3, but for a positive factor.
 mat3 normalTransform(mat4 transform)
 {
-    vec3 x = transform[0].xyz;
-    vec3 y = transform[1].xyz;
-    vec3 z = transform[2].xyz;
+    vec3 x = (transform * vec4(1.0, 0.0, 0.0, 0.0)).xyz;
+    vec3 y = (transform * vec4(0.0, 1.0, 0.0, 0.0)).xyz;
+    vec3 z = (transform * vec4(0.0, 0.0, 1.0, 0.0)).xyz;
     vec3 yz = cross(y, z);
     float side = dot(x, yz) < 0.0 ? -1.0 : 1.0;
     return mat3(yz * side, cross(z, x) * side, cross(x, y) * side);
@@ -155,7 +156,7 @@ float fallOff(float range, float near, float reciprocal)
 {
     float x = 1.0 - clamp((range - near) * reciprocal, 0.0, 1.0);
 #ifdef INVSQROOT
-    x *= inversesqrt(max(x, 0.0001));
+    x = sqrt(x);
 #endif
     return x;
 }
@@ -163,8 +164,8 @@ float fallOff(float range, float near, float reciprocal)
 // 1 inside the inner cone, 0 outside the outer one. An inner cosine of -1 means a light that shines everywhere.
 float cone(float cosine, float inner, float outer)
 {
-    float x = clamp((cosine - outer) / max(inner - outer, 0.0001), 0.0, 1.0);
-    return inner <= -0.99999 ? 1.0 : x * x * (3.0 - 2.0 * x);
+    float x = inner > outer ? smoothstep(outer, inner, cosine) : step(outer, cosine);
+    return inner <= -1.0 ? 1.0 : x;
 }
 #endif
 
@@ -172,8 +173,8 @@ float cone(float cosine, float inner, float outer)
 // Where a sphere map shows what lies in a direction of eye space.
 vec2 sphereMap(vec3 direction)
 {
-    float m = 2.0 * sqrt(2.0 * max(direction.z + 1.0, 0.0001));
-    return vec2(0.5 + direction.x / m, 0.5 - direction.y / m);
+    vec2 middle = safeNormalize(direction + vec3(0.0, 0.0, 1.0)).xy;
+    return vec2(middle.x, -middle.y) * 0.5 + 0.5;
 }
 #endif
 
@@ -218,7 +219,7 @@ void main()
         {
             toLight -= position;
             float range = length(toLight);
-            toLight /= max(range, 1.0e-30);
+            toLight = safeNormalize(toLight);
             strength = fallOff(range, u_l_attenuationNear[i], u_l_attenuationReciprocal[i]);
         }
         strength *= cone(dot(toLight, u_l_spotDirection[i]), u_l_spotInnerCos[i], u_l_spotOuterCos[i]);

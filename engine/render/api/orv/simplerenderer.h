@@ -29,7 +29,8 @@ struct RendererProperties;
 /// - L_COUNT, and five elements each of L_DIFFUSE_COLOUR, L_AMBIENT_COLOUR, L_SPECULAR_COLOUR, L_POSITION
 ///   (w 0: a direction towards the light), L_ATTENUATION_NEAR, L_ATTENUATION_RECIPROCAL, L_SPOT_INNER_COS,
 ///   L_SPOT_OUTER_COS, L_SPOT_DIRECTION (against the light's shine). The first five lights of the walk count.
-/// - J_COUNT and J_WORLD (20 matrices, mesh space to world space).
+/// - J_COUNT and J_WORLD (20 matrices, mesh space to world space); J_WEIGHT_FILLED (1 where the mesh has fewer
+///   than four weights a vertex, so that GL makes the last one 1).
 /// - T_MODEL, T_VIEW, T_MODEL_VIEW, T_VIEW_PROJECTION, T_MODEL_VIEW_PROJECTION, T_NORMAL_MODEL (model space
 ///   normals to world space), T_CAMERA_POSITION.
 /// - TIME, in seconds, wrapping at 60. FOG_DENSITY and FOG_COLOUR are the application's to set.
@@ -37,7 +38,8 @@ struct RendererProperties;
 ///   appearance may leave out: M_DIFFUSE_COLOUR, M_SPECULAR_COLOUR (white), M_AMBIENT_COLOUR,
 ///   M_EMISSIVE_COLOUR (black), M_SHININESS (5), M_SPECULAR_LEVEL (1), M_OPACITY (1), M_SELF_ILLUMINATION
 ///   (0), M_UV_OFFSET_SCALE (0, 0, 1, 1), and white 2D textures M_DIFFUSE_TEXTURE, M_SPECULAR_TEXTURE,
-///   M_AMBIENT_TEXTURE, M_EMISSIVE_TEXTURE, M_GLOSS_TEXTURE, M_SPECULAR_LEVEL_TEXTURE.
+///   M_AMBIENT_TEXTURE, M_EMISSIVE_TEXTURE, M_GLOSS_TEXTURE, M_SPECULAR_LEVEL_TEXTURE; a black
+///   M_REFLECTION_TEXTURE, a M_BUMP_TEXTURE without bumps, and what the built-in effects take (docs/shaders.md).
 ///
 /// Mirrors: a solid whose program takes M_MIRROR_TEXTURE lies in the plane through its position across its
 /// z axis. Before it is drawn the opaque and transparent solids are drawn, reflected, into one texture that
