@@ -237,6 +237,11 @@ TEST_F(ShaderProgramLoaderTest, binaryCache)
     m_cache->setCacheSource(makeShared<FileStreamSource>(cached.path().c_str()));
     m_loader->setBinaryCachingEnabled(true);
 
+    // A program in a folder is kept as well.
+    m_files.write("lit/by/t.sp", std::string("1.0\n") + SOURCES + UNIFORMS);
+    EXPECT_TRUE(m_loader->load(*m_cache, "lit/by/t.sp"));
+    EXPECT_LT(0u, support::readFile(cached.path("lit/by/t.spc")).size());
+
     const auto load = [this]
     {
         glcalls::resetCounts();

@@ -87,7 +87,11 @@ SharedPtr<Stream> AssetCachePool::getStream(const char* name) const
 
 SharedPtr<Stream> AssetCachePool::getCacheStream(const char* name, bool writable) const
 {
-    return m_cacheSource ? m_cacheSource->open(name, writable) : SharedPtr<Stream>();
+    if (!m_cacheSource)
+        return {};
+    if (writable)
+        m_cacheSource->makeFolders(name);
+    return m_cacheSource->open(name, writable);
 }
 
 void AssetCachePool::flush()

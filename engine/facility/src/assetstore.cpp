@@ -109,7 +109,11 @@ SharedPtr<Stream> AssetStore::getStream(const char* name) const
 
 SharedPtr<Stream> AssetStore::getCacheStream(const char* name, bool writable) const
 {
-    return m_cacheSource ? m_cacheSource->open(name, writable) : SharedPtr<Stream>();
+    if (!m_cacheSource)
+        return {};
+    if (writable)
+        m_cacheSource->makeFolders(name);
+    return m_cacheSource->open(name, writable);
 }
 
 } // namespace orv::detail

@@ -52,7 +52,7 @@ bool FileInputStream::valid() const
 
 bool FileInputStream::eof() const
 {
-    return m_file.eof();
+    return m_isAtEnd;
 }
 
 int32_t FileInputStream::size() const
@@ -62,6 +62,7 @@ int32_t FileInputStream::size() const
 
 int32_t FileInputStream::seek(unsigned int position)
 {
+    m_isAtEnd = false;
     m_file.seekg(position, std::ios::beg);
     return tell();
 }
@@ -77,6 +78,9 @@ int32_t FileInputStream::read(void* buffer, unsigned int count)
         return 0;
 
     m_file.read(static_cast<char*>(buffer), std::min(count, LARGEST));
+    m_isAtEnd = m_file.eof();
+    if (m_isAtEnd)
+        m_file.clear(m_file.rdstate() & std::ios::badbit); // a short read is no failure: the stream goes on
     return int32_t(m_file.gcount());
 }
 

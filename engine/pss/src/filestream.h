@@ -7,8 +7,8 @@
 namespace orv::detail
 {
 
-/// Reads a regular file. The state is the standard file stream's: a read past the end sets its end-of-file and
-/// fail flags, after which tell() and seek() give -1.
+/// Reads a regular file. A read past the end sets the end-of-file flag, the next seek() clears it; in between the stream
+/// stays valid and at its end, as a memory stream does.
 class FileInputStream : public Stream
 {
 public:
@@ -26,6 +26,7 @@ public:
 private:
     mutable std::ifstream m_file; ///< asking a standard stream for its position is not const
     int32_t m_size = 0;
+    bool m_isAtEnd = false;
 };
 
 /// Creates or empties a file and writes it, unbuffered: what write() returns is what the system took.

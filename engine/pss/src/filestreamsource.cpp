@@ -4,6 +4,11 @@
 
 #include "filestream.h"
 
+#include <cerrno>
+#include <cstring>
+
+#include <sys/stat.h>
+
 namespace orv
 {
 
@@ -41,6 +46,20 @@ SharedPtr<Stream> FileStreamSource::open(const char* name, bool writable)
 const char* FileStreamSource::getName() const
 {
     return m_root.c_str();
+}
+
+bool FileStreamSource::makeFolders(const char* name)
+{
+    if (!name || std::strstr(name, ".."))
+        return false;
+    const std::string path = getPath(name);
+    for (std::size_t end = path.find('/', m_root.size() + 1); end != std::string::npos;
+         end = path.find('/', end + 1))
+    {
+        if (mkdir(path.substr(0, end).c_str(), 0777) != 0 && errno != EEXIST)
+            return false;
+    }
+    return true;
 }
 
 std::string FileStreamSource::getPath(const char* name) const

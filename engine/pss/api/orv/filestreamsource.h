@@ -21,9 +21,8 @@ public:
 
     bool exists(const char* name) const override;
 
-    /// Reading: empty for a file that is missing or larger than a stream can be. After a read that came to the
-    /// end of the file the stream is failed, as a standard file stream is: eof() is true, valid() false, tell()
-    /// and seek() give -1.
+    /// Reading: empty for a file that is missing or larger than a stream can be. eof() is true
+    /// once a read has asked for more than there was, until the next seek(); the stream stays valid.
     ///
     /// Writing: the file is created or emptied. A file that cannot be created gives a stream all the same, to
     /// which 0 bytes can be written; empty for a null or empty name only. size() and tell() of a stream being
@@ -31,6 +30,10 @@ public:
     SharedPtr<Stream> open(const char* name, bool writable) override;
 
     const char* getName() const override;
+
+    /// Makes the folders of the name below the directory, which must be there itself. A name with a ".." in it makes
+    /// none.
+    bool makeFolders(const char* name) override;
 
 private:
     ORV_LOCAL std::string getPath(const char* name) const;

@@ -30,6 +30,10 @@ public:
 
     /// The source's own name, by which an asset path finds it again.
     virtual const char* getName() const = 0;
+
+    /// Makes the folders in which a stream of this name would be written, where the source has folders.
+    /// @return false if that was not possible; what is written then fails as well.
+    virtual bool makeFolders([[maybe_unused]] const char* name) { return true; }
 };
 
 } // namespace orv
