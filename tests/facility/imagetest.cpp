@@ -68,6 +68,15 @@ TEST(Image, decodesEveryFormatTopRowFirst)
         EXPECT_EQ(pixels, pixelsOf(*image)) << test.suffix << test.channels;
     }
 
+    // A bitmap with its top row first says so by a negative height.
+    Bytes topDown = imagefiles::encode("bmp", 1, 2, 3, {10, 20, 30, 40, 50, 60});
+    for (size_t i = 0; i < 4; ++i)
+        topDown[22 + i] = i == 0 ? 0xFE : 0xFF;
+    const auto flipped = decode(topDown);
+    ASSERT_TRUE(flipped->data());
+    EXPECT_EQ(2, flipped->height());
+    EXPECT_EQ((Bytes{40, 50, 60, 10, 20, 30}), pixelsOf(*flipped));
+
     Bytes split(16 * 16 * 3, 0);
     std::fill(split.begin(), split.begin() + 8 * 16 * 3, uint8_t(255));
     const auto photo = decode(imagefiles::encode("jpg", 16, 16, 3, split));
@@ -98,6 +107,8 @@ TEST(Image, badFilesHaveNoData)
     EXPECT_TRUE(decode(bitmapHeader(20, 20))->data());
     EXPECT_FALSE(decode(bitmapHeader(100, 100))->data());
     EXPECT_FALSE(decode(bitmapHeader(20000, 1))->data());
+    EXPECT_FALSE(decode(bitmapHeader(100, unsigned(-100)))->data());
+    EXPECT_FALSE(decode(bitmapHeader(1, 0x80000000))->data());
 }
 
 TEST(Image, refusesSizesThatCannotBe)

@@ -2,6 +2,7 @@
 
 #include "jpegcheck.h"
 
+#include <algorithm>
 #include <climits>
 #include <cstdlib>
 #include <cstring>
@@ -109,8 +110,9 @@ unsigned char* decodeImage(const unsigned char* file, std::size_t size, int& wid
     int h = 0;
     int channels = 0;
     t_largestBlock = DECODER_BYTES;
-    if (!stbi_info_from_memory(file, int(size), &w, &h, &channels) || w < 1 || h < 1 || channels < 1 ||
-        w > STBI_MAX_DIMENSIONS || h > STBI_MAX_DIMENSIONS)
+    const bool isKnown = stbi_info_from_memory(file, int(size), &w, &h, &channels);
+    h = std::abs(std::max(h, -INT_MAX)); // a BMP with its top row first has a negative height
+    if (!isKnown || w < 1 || h < 1 || channels < 1 || w > STBI_MAX_DIMENSIONS || h > STBI_MAX_DIMENSIONS)
         return nullptr;
     const Density density = getDensity(file, size);
     const std::size_t bytes = getDecodedBytes(w, h, channels, density.isJpeg);
