@@ -135,7 +135,7 @@ TEST_F(FontTest, loadsByFileAndSize)
         {"sans.ttf;12;12", INVALID, "sans.ttf;12;12"},
         {"sans.ttf;4294967308", INVALID, "sans.ttf;4294967308"},
         {"sans.ttf;0", ERROR, "sans.ttf"},
-        {"sans.ttf;-12", ERROR, "sans.ttf"},
+        {"sans.ttf;-12", INVALID, "sans.ttf;-12"},
         {"sans.ttf;650", ERROR, "sans.ttf"}, // glyphs wider than the atlas
         {"sans.ttf;2147483647", ERROR, "sans.ttf"},
         {"missing.ttf;12", ERROR, "missing.ttf"},
@@ -160,6 +160,7 @@ TEST_F(FontTest, loadsByFileAndSize)
     EXPECT_TRUE(exists(*cache, "sans.ttf", 12) && exists(*cache, "orv:mine.ttf", 12));
     EXPECT_FALSE(exists(*cache, "sans.ttf", 13) || exists(*cache, nullptr, 12) || get(*cache, nullptr, 12));
     EXPECT_EQ(get(*cache, "sans.ttf", 12), cache->get("sans.ttf;12"));
+    EXPECT_EQ(get(*cache, "sans.ttf", 12), cache->get("sans.ttf;012")) << "one size, one font";
     EXPECT_EQ(13, get(*cache, "sans.ttf", 13)->getSize());
     EXPECT_EQ(0, log.count('E'));
 

@@ -171,7 +171,11 @@ TEST_F(MeshTest, sphereTooFineIsRefused)
     {
         unsigned int segments, wedges;
         bool isMade;
-    } cases[] = {{254, 256, true}, {255, 255, false}, {0xffffffff, 2, false}, {2, 0xffffffff, false}};
+    } cases[] = {{254, 256, true},
+                 {255, 255, true},
+                 {255, 256, false},
+                 {0xffffffff, 2, false},
+                 {2, 0xffffffff, false}};
     for (const auto& test : cases)
     {
         LogCapture log;

@@ -102,7 +102,9 @@ TEST(Animation, controllerAdvances)
         {"a thousand loops", 2, 4, 1, 3, 2000.5f, 3.5f},
         {"a thousand loops backwards", 2, 4, -1, 3, 2000.5f, 2.5f},
         {"step not a number", 2, 4, 1, 3, NOT_A_NUMBER, 3},
-        {"infinite step", 2, 4, 1, 3, INF, 3},
+        {"infinite step in a loop", 2, 4, 1, 3, INF, 3},
+        {"infinite step", 0, 0, 1, 3, INF, 10},
+        {"infinite step backwards", 0, 0, -1, 3, INF, 0},
         {"progress not a number", 0, 0, 1, NOT_A_NUMBER, 1, 1},
     };
     for (const auto& c : cases)

@@ -5,6 +5,7 @@
 
 #include <algorithm>
 #include <new>
+#include <utility>
 
 namespace orv
 {
@@ -21,6 +22,19 @@ FileToString::FileToString(const char* path)
         return;
     if (const SharedPtr<Stream> stream = source->open(path, false))
         read(*stream);
+}
+
+FileToString::FileToString(FileToString&& other) noexcept
+    : m_text(std::move(other.m_text))
+    , m_end(std::exchange(other.m_end, nullptr))
+{
+}
+
+FileToString& FileToString::operator=(FileToString&& other) noexcept
+{
+    m_text.swap(other.m_text);
+    std::swap(m_end, other.m_end);
+    return *this;
 }
 
 void FileToString::read(Stream& stream)

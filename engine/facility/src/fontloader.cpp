@@ -26,7 +26,7 @@ std::string getFilePart(const std::string& name)
     return name.substr(0, name.find(';'));
 }
 
-/// @return false unless there is a semicolon with a decimal number, and nothing else, behind the first one.
+/// @return false unless there are decimal digits, and nothing else, behind the first semicolon.
 bool readSize(const std::string& name, int& size)
 {
     const std::size_t semicolon = name.find(';');
@@ -34,7 +34,7 @@ bool readSize(const std::string& name, int& size)
         return false;
     const char* const end = name.data() + name.size();
     const auto [rest, error] = std::from_chars(name.data() + semicolon + 1, end, size);
-    return error == std::errc() && rest == end;
+    return error == std::errc() && rest == end && name[semicolon + 1] != '-';
 }
 
 /// @return 0 if not even the atlas's width is allowed.
@@ -65,6 +65,10 @@ Font::Ptr FontLoader::load(AssetCache<Font>& cache, const char* name)
     }
 
     const std::string file = getFilePart(normalized);
+    const std::string plain = file + ';' + std::to_string(size);
+    if (plain != normalized) // leading zeros
+        return cache.get(plain.c_str());
+
     BakedFont baked;
     const char* fault = "there is no such file";
     if (const SharedPtr<Stream> stream = cache.getStream(file.c_str()))

@@ -174,7 +174,7 @@ Mesh::Ptr createSphereMesh(MeshCache& cache, unsigned int segments, unsigned int
     segments = std::max(segments, 2u);
     wedges = std::max(wedges, 2u);
 
-    const uint64_t limit = UINT16_MAX;
+    const uint64_t limit = UINT16_MAX + 1;
     if (segments >= limit || wedges >= limit || uint64_t(segments + 1) * (wedges + 1) > limit)
     {
         ORV_LOG_ERROR("A sphere of %u segments and %u wedges has more than %u vertices", segments, wedges,

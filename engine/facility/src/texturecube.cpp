@@ -42,13 +42,13 @@ void TextureCube::setFace(Face face, const void* pixels)
         return;
 
     enable();
-    if (m_facesSet % FACE_COUNT == 0)
+    if (m_facesSet == 0)
         RenderDevice::getError(false); // an older error is not taken for that of these faces
     glPixelStorei(GL_UNPACK_ALIGNMENT, 1);
     glTexImage2D(detail::GL_CUBE_FACES[faceIndex], 0, GLint(format), GLsizei(m_width), GLsizei(m_height), 0,
                  format, type, pixels);
     ++m_facesSet;
-    if (m_facesSet % FACE_COUNT == 0)
+    if (m_facesSet == FACE_COUNT)
     {
         sendParameters();
         if (detail::reportGLError("engine/facility/src/texturecube", __func__, __LINE__))

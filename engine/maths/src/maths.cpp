@@ -12,7 +12,7 @@ float invSqrt(float x)
     static_assert(sizeof(int32_t) == sizeof(float));
     int32_t bits;
     std::memcpy(&bits, &x, sizeof bits);
-    bits = 0x5F375A86 - bits / 2;
+    bits = int32_t(0x5F375A86u - uint32_t(bits / 2)); // wraps for negative numbers, whose root means nothing
     float y;
     std::memcpy(&y, &bits, sizeof y);
     return y * (1.5f - 0.5f * x * y * y);

@@ -9,7 +9,9 @@ namespace orv
 
 int detail::indexOutOfRange(int index, int last)
 {
-    ORV_LOG_ERROR("Index (%d) out of range [0, %d]", index, last);
+    // Said in the name of the operator that was given the index.
+    pssLogError("engine/maths/src/vector", "operator[]", __LINE__, "Index (%d) out of range [0, %d]", index,
+                last);
     return 0;
 }
 

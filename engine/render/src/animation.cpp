@@ -36,11 +36,17 @@ float wrapBackwards(double next, float loopStart, float loopEnd)
     return wrapped > loopStart ? wrapped : loopEnd;
 }
 
+/// 0 for a range that is reversed or begins and ends at the same infinity.
+float getDistance(float start, float end)
+{
+    return end > start ? end - start : 0.0f;
+}
+
 } // namespace
 
 float getLength(const Animation& animation)
 {
-    return std::max(animation.getEnd() - animation.getStart(), 0.0f);
+    return getDistance(animation.getStart(), animation.getEnd());
 }
 
 AnimationController::AnimationController(const Animation::Ptr& animation)
@@ -56,7 +62,7 @@ void AnimationController::update(float deltaTime)
         return;
     m_progress = clampToRange(m_progress);
     const float step = deltaTime * m_speed;
-    if (!m_paused && std::isfinite(step))
+    if (!m_paused && !std::isnan(step))
         m_progress = clampToRange(advance(step));
     if (m_animation)
         m_animation->apply(m_progress);
@@ -69,12 +75,15 @@ float AnimationController::clampToRange(float progress) const
     return m_end <= progress ? m_end : progress;
 }
 
-/// @return where a finite step leads from the current progress, not yet clamped.
+/// @return where a step leads from the current progress, not yet clamped. An infinite one ends nowhere in a loop, so
+/// nothing moves there.
 float AnimationController::advance(float step) const
 {
     float next = m_progress + step;
     if (!m_looping || !(m_loopStart < m_loopEnd))
         return next;
+    if (!std::isfinite(step))
+        return m_progress;
 
     const float loopSize = m_loopEnd - m_loopStart;
     ORV_ASSERT(loopSize > 0.0f);
@@ -152,12 +161,12 @@ void setLoopRange(AnimationController& controller, float start, float end)
 
 float getLength(const AnimationController& controller)
 {
-    return std::max(controller.getEnd() - controller.getStart(), 0.0f);
+    return getDistance(controller.getStart(), controller.getEnd());
 }
 
 float getLoopLength(const AnimationController& controller)
 {
-    return std::max(controller.getLoopEnd() - controller.getLoopStart(), 0.0f);
+    return getDistance(controller.getLoopStart(), controller.getLoopEnd());
 }
 
 bool hasLoop(const AnimationController& controller)

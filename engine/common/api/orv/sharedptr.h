@@ -5,6 +5,7 @@
 
 #include <cstddef>
 #include <new>
+#include <type_traits>
 #include <utility>
 
 namespace orv
@@ -44,7 +45,7 @@ public:
 
     /// From a pointer to a derived class.
     template <class U>
-    SharedPtr(const SharedPtr<U>& other) : m_ptr(other.get())
+    requires std::is_convertible_v<U*, T*> SharedPtr(const SharedPtr<U>& other) : m_ptr(other.get())
     {
         acquireCopied();
     }

@@ -12,7 +12,7 @@ class Stream;
 
 /// A whole text in memory, followed by one zero byte, ready for the token reader.
 ///
-/// Both pointers are null until something was read: after a missing file, or where there is no memory for it.
+/// It can be moved and not copied. Both pointers are null until something was read: after a missing file, or where there is no memory for it.
 class ORV_API FileToString
 {
 public:
@@ -21,6 +21,9 @@ public:
 
     /// @param path  relative to the working directory.
     explicit FileToString(const char* path);
+
+    FileToString(FileToString&& other) noexcept;
+    FileToString& operator=(FileToString&& other) noexcept;
 
     /// Replaces the text by what is left of the stream. A short read gives a shorter text.
     void read(Stream& stream);

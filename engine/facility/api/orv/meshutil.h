@@ -17,7 +17,7 @@ ORV_API float computeMaximumLength(const SharedPtr<VertexArray>& array);
 
 /// A sphere of radius 0.5 whose poles are on the y axis, in rings of quads. Seen from outside, u grows to the left.
 /// @param segments  rings from pole to pole; @param wedges  quads around. Below 2 either becomes 2, with a
-/// warning. (segments + 1) x (wedges + 1) vertices must fit 16-bit indices: beyond 65,535 the result is empty.
+/// warning. (segments + 1) x (wedges + 1) vertices must fit 16-bit indices: beyond 65,536 the result is empty.
 ORV_API Mesh::Ptr createSphereMesh(MeshCache& cache, unsigned int segments, unsigned int wedges,
                                    const Vector2f& uvScale);
 

@@ -11,8 +11,8 @@ namespace orv
 
 /// A cube map, made by TextureCubeCache and filled face by face.
 ///
-/// Starts with LINEAR magnification, LINEAR_MIPMAP_NEAREST minification and clamped wraps; every sixth face
-/// makes the mipmaps anew and sends these. After its resource was released it binds name 0 and takes no faces.
+/// Starts with LINEAR magnification, LINEAR_MIPMAP_NEAREST minification and clamped wraps; the sixth face
+/// makes the mipmaps and sends these. After faces were replaced, setParameters() makes the mipmaps again. After its resource was released it binds name 0 and takes no faces.
 /// GL thread only. setFace(), setParameters() and enable() leave the cube bound on the active unit.
 class ORV_API TextureCube : public Shared
 {

@@ -98,7 +98,8 @@ public:
     /// @param parent  empty makes the node a root. The node itself or one of its descendants is refused
     /// silently: nothing happens.
     /// @param preserveWorldTransform  true gives the node the local matrix that keeps it where it is in the
-    /// world (position, rotation and scale stay as they were); false keeps its local transform.
+    /// world (position, rotation and scale stay as they were); false makes the local matrix from
+    /// position, rotation and scale again.
     void setParent(const SharedPtr<SceneNode>& parent, bool preserveWorldTransform = false);
 
     /// Makes a child of this node a root and drops this node's share of it; other nodes are left alone.

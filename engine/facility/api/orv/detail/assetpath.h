@@ -17,7 +17,7 @@ namespace detail
 
 /// Turns the deprecated namespace forms "orv:" and "luvane:" at the start of a name into "orv#" and "luvane#",
 /// logging a warning; any other name comes back unchanged, and null as an empty text.
-std::string normalizeAssetName(const char* name);
+ORV_API std::string normalizeAssetName(const char* name);
 
 /// An ordered list of stream sources in which names are looked up, first to last.
 ///
