@@ -568,3 +568,35 @@ TEST_F(GloSceneTest, unknownNames)
     ASSERT_TRUE(rootless);
     EXPECT_FALSE(rootless->getTopNode()->getParent());
 }
+
+// Fault caught: the nodes, buffers, textures and programs of such a file stay for ever.
+TEST_F(GloSceneTest, diesThoughItsSkinsAreBoundAcrossBranches)
+{
+    glo::GloScene scene = makeFullScene();
+    scene.skins.push_back(scene.skins[0]);
+    scene.skins[1].name = "other skin";
+    glo::NodeData& top = scene.scene->top;
+    top.children.clear();
+    for (const int i : {0, 1})
+    {
+        scene.skins[size_t(i)].attachments = {{i == 0 ? "bone 1" : "bone 0", Matrix4f::IDENTITY}};
+        const glo::SkinReference figure = {scene.skins[size_t(i)].name, {}, {}};
+        top.children.push_back(
+            makeNode("bone " + std::to_string(i), {makeNode("figure", &glo::NodeData::skin, figure)}));
+    }
+    scene.animations.clear();
+    Glo::Ptr loaded = load(scene);
+    ASSERT_TRUE(loaded);
+    for (const char* bone : {"bone 0", "bone 1"})
+    {
+        const SceneNode* branch = loaded->getTopNode()->find(bone);
+        const SceneNode* joint = asSolid(*branch->getChild(0)).getJoint(0).joint.get();
+        EXPECT_TRUE(joint && joint != branch && joint->getParent() == branch->getParent());
+    }
+    loaded = nullptr;
+    m_root = nullptr;
+    m_pool->flush();
+    m_pool->flush();
+    m_pool = makeShared<AssetCachePool>(); // for TearDown()
+    EXPECT_EQ("", glcalls::describeLiveNames());
+}

@@ -1,5 +1,7 @@
 #include "orv/scenenode.h"
 
+#include "jointtie.h"
+
 #include "orv/log.h"
 #include "orv/scenenodevisitor.h"
 
@@ -12,6 +14,8 @@
 namespace orv
 {
 
+SceneNode::SceneNode() = default;
+
 SceneNode::SceneNode(const char* name)
 {
     setName(name);
@@ -19,6 +23,9 @@ SceneNode::SceneNode(const char* name)
 
 SceneNode::~SceneNode()
 {
+    if (m_tie)
+        m_tie->nodeDestroyed();
+
     // Descendants that die with this node are gathered here and die one by one: a chain of nodes as long as
     // a damaged or generated scene likes must not recurse through as many destructors, nor marks.
     std::vector<SharedPtr<SceneNode>> orphans = std::move(m_children);
@@ -226,6 +233,8 @@ void SceneNode::setParent(const SharedPtr<SceneNode>& parent, bool preserveWorld
         setLocalTransform(toParent * world);
     else
         setTransformChanged();
+    if (newParent)
+        newParent->countSkinned(m_skinnedCount);
 }
 
 void SceneNode::removeChild(const SharedPtr<SceneNode>& child)
@@ -290,7 +299,32 @@ SharedPtr<SceneNode> SceneNode::takeChild(const SceneNode* child)
         return nullptr;
     SharedPtr<SceneNode> taken = std::move(*found);
     m_children.erase(found);
+    countSkinned(0u - child->m_skinnedCount);
     return taken;
+}
+
+/// For attachJoint(): the attachment that takes it is one more that may keep this node alive.
+SharedPtr<detail::JointTie> SceneNode::tie()
+{
+    if (!m_tie)
+        m_tie = makeShared<detail::JointTie>(*this);
+    if (m_tie)
+        m_tie->keep(m_skinnedCount == 0);
+    return m_tie;
+}
+
+/// This node and those above it have so many more solids with joints, or by wrapping round fewer.
+void SceneNode::countSkinned(uint32_t more)
+{
+    for (SceneNode* node = more != 0 ? this : nullptr; node;)
+    {
+        // A node that its tie alone has kept is a root, and may go here.
+        SceneNode* const parent = node->m_parent;
+        node->m_skinnedCount += more;
+        if (node->m_tie && node->m_tie->sharedGetCount() > 1)
+            node->m_tie->keep(node->m_skinnedCount == 0);
+        node = parent;
+    }
 }
 
 } // namespace orv

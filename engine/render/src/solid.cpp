@@ -1,5 +1,7 @@
 #include "orv/solid.h"
 
+#include "jointtie.h"
+
 #include "orv/appearance.h"
 #include "orv/log.h"
 #include "orv/mesh.h"
@@ -20,7 +22,13 @@ Solid::Solid(const SharedPtr<Mesh>& mesh, const SharedPtr<Appearance>& appearanc
 {
 }
 
-Solid::~Solid() = default;
+Solid::~Solid()
+{
+    if (!m_skin)
+        return;
+    for (Joint& joint : m_skin->joints)
+        detail::JointTie::leave(joint.tie);
+}
 
 void Solid::accept(SceneNodeVisitor& visitor)
 {
@@ -54,27 +62,36 @@ Solid::Skin& Solid::makeSkin()
 
 void Solid::attachJoint(const SharedPtr<SceneNode>& joint, const Matrix4f& inverseBind)
 {
-    JointAttachment attachment;
-    attachment.inverseBind = inverseBind;
-    if (joint && hasAncestor(joint.get()))
-        attachment.above = joint.get();
-    else
-        attachment.joint = joint;
-    makeSkin().joints.push_back(attachment);
-
+    makeSkin().joints.push_back({joint ? joint->tie() : SharedPtr<detail::JointTie>(), inverseBind});
     if (getJointCount() == MAX_JOINTS + 1)
         ORV_LOG_ERROR("Solid \"%s\" has more than %d joints; the others have no effect.", getName(),
                       MAX_JOINTS);
+    if (getJointCount() == 1)
+        countSkinned(1); // last: a joint above that nobody else keeps goes now, and with it this solid perhaps
+}
+
+Solid::JointAttachment Solid::getJoint(int i) const
+{
+    const Joint& joint = m_skin->joints[static_cast<size_t>(i)];
+    return {joint.tie ? joint.tie->getNode() : nullptr, joint.inverseBind};
+}
+
+Matrix4f Solid::getJointTransform(int i) const
+{
+    const Joint& joint = m_skin->joints[static_cast<size_t>(i)];
+    return calculateJointTransform(joint.tie ? joint.tie->getNode() : nullptr, joint.inverseBind);
 }
 
 Matrix4f Solid::calculateJointTransform(const JointAttachment& attachment) const
 {
-    const SceneNode* joint = attachment.joint.get();
-    if (!joint && attachment.above && hasAncestor(attachment.above))
-        joint = attachment.above;
+    return calculateJointTransform(attachment.joint.get(), attachment.inverseBind);
+}
+
+Matrix4f Solid::calculateJointTransform(const SceneNode* joint, const Matrix4f& inverseBind) const
+{
     if (!joint)
         return getWorldTransform() * getBindShapeTransform();
-    return joint->getWorldTransform() * attachment.inverseBind * getBindShapeTransform();
+    return joint->getWorldTransform() * inverseBind * getBindShapeTransform();
 }
 
 void Solid::draw(RenderContext& context)

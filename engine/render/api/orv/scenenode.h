@@ -16,6 +16,11 @@ namespace orv
 
 class SceneNodeVisitor;
 
+namespace detail
+{
+class JointTie;
+}
+
 /// A place in the scene tree: a local transform, a lazily kept world transform, flags, a name and children.
 ///
 /// Ownership: a node owns its children; the parent is a plain back-pointer that the parent clears when it is
@@ -35,7 +40,7 @@ public:
     using NodeType = uint32_t;
     static constexpr NodeType NODE_TYPE = 0;
 
-    SceneNode() = default;
+    SceneNode();
     explicit SceneNode(const char* name);
     ~SceneNode() override;
 
@@ -123,6 +128,10 @@ public:
     const SceneNode* find(const char* name) const;
 
 private:
+    friend class Solid;
+
+    ORV_LOCAL SharedPtr<detail::JointTie> tie();
+    ORV_LOCAL void countSkinned(uint32_t more);
     ORV_LOCAL SharedPtr<SceneNode> takeChild(const SceneNode* child);
     ORV_LOCAL void buildLocal() const;
     ORV_LOCAL void updateRoot() const;
@@ -139,6 +148,8 @@ private:
     mutable bool m_worldRigid = true;
     bool m_scaled = false; ///< m_scale is not all 1
     uint32_t m_flags = 0;
+    uint32_t m_skinnedCount = 0;       ///< solids with joints in this subtree, itself included
+    SharedPtr<detail::JointTie> m_tie; ///< once it is a joint of a solid
     std::string m_name;
     Vector3f m_scale{1.0f, 1.0f, 1.0f};
     Quaternionf m_rotation;

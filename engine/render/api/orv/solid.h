@@ -14,6 +14,11 @@ class Appearance;
 class Mesh;
 class RenderContext;
 
+namespace detail
+{
+class JointTie;
+}
+
 /// A mesh in the scene, drawn with an appearance, perhaps skinned by joints.
 class ORV_API Solid : public SceneNode
 {
@@ -26,12 +31,10 @@ public:
     /// The joint matrices that reach a shader; further joints are kept but have no effect.
     static constexpr int MAX_JOINTS = 20;
 
-    /// A node that moves vertices. A joint at or above the solid in the tree is borrowed, since a share of it
-    /// would keep both alive for ever, and counts as unbound once it is no longer above.
+    /// A node that moves vertices.
     struct JointAttachment
     {
-        SharedPtr<SceneNode> joint;       ///< empty when unbound or borrowed
-        const SceneNode* above = nullptr; ///< the borrowed joint; looked at only while it is an ancestor
+        SharedPtr<SceneNode> joint;                ///< empty when unbound
         Matrix4f inverseBind = Matrix4f::IDENTITY; ///< mesh space, after the bind shape, to joint space
     };
 
@@ -56,18 +59,23 @@ public:
     void setBindShapeTransform(const Matrix4f& transform) { makeSkin().bindShape = transform; }
 
     /// Adds the next joint (index 0 first, as the vertices' joint numbers count).
-    /// @param joint  shared, or borrowed if it is this node or above it; empty leaves the joint unbound.
+    ///
+    /// The solid stays bound to the joint for as long as the joint lives, wherever the two are moved. It keeps
+    /// the joint alive, unless this or another solid with joints is at or below the joint: those could keep each
+    /// other alive for ever, so such a joint is its tree's alone. That may change with every move.
+    /// @param joint  empty leaves the joint unbound.
     /// @param inverseBind  inverse of the joint's world transform in the pose of binding.
     /// One error is logged when the count first exceeds MAX_JOINTS.
     void attachJoint(const SharedPtr<SceneNode>& joint, const Matrix4f& inverseBind);
     int getJointCount() const { return m_skin ? static_cast<int>(m_skin->joints.size()) : 0; }
     /// @param i  0 to getJointCount() - 1.
-    const JointAttachment& getJoint(int i) const { return m_skin->joints[static_cast<size_t>(i)]; }
+    /// @return with the joint empty when none was given or it is destroyed.
+    JointAttachment getJoint(int i) const;
 
     /// Mesh space to world space for one joint: its world transform * inverse bind * bind shape. An unbound
     /// joint is in its rest pose: this solid's world transform * bind shape.
     Matrix4f calculateJointTransform(const JointAttachment& attachment) const;
-    Matrix4f getJointTransform(int i) const { return calculateJointTransform(getJoint(i)); }
+    Matrix4f getJointTransform(int i) const;
 
     /// Draws the mesh with the solid's own appearance; nothing without one. GL thread only.
     void draw(RenderContext& context);
@@ -79,14 +87,21 @@ public:
     void draw(RenderContext& context, Appearance& appearance);
 
 private:
+    struct Joint
+    {
+        SharedPtr<detail::JointTie> tie; ///< empty when no joint was given
+        Matrix4f inverseBind;
+    };
+
     struct Skin
     {
         int jointsPerVertex = 0;
         Matrix4f bindShape = Matrix4f::IDENTITY;
-        std::vector<JointAttachment> joints;
+        std::vector<Joint> joints;
     };
 
     Skin& makeSkin();
+    ORV_LOCAL Matrix4f calculateJointTransform(const SceneNode* joint, const Matrix4f& inverseBind) const;
 
     SharedPtr<Mesh> m_mesh;
     SharedPtr<Appearance> m_appearance;
