@@ -6,6 +6,8 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
+#include <functional>
 #include <string>
 
 using namespace orv;
@@ -147,4 +149,112 @@ TEST(SceneWalk, pointsAtAPlaceInTheWorld)
     SceneNode root;
     point(root, Vector3f(5, 0, 0), Vector3f(0, 0, 1));
     EXPECT_GT(root.getWorldTransform().columns[1].z, 0.99999f);
+}
+
+namespace
+{
+
+/// Does something at each node, and writes down the names and the end of each node that dies.
+class Changer : public SceneNodeVisitor
+{
+public:
+    using Change = std::function<void(SceneNode& node)>;
+    explicit Changer(Change change) : m_change(std::move(change)) {}
+
+    using SceneNodeVisitor::visit;
+    void visit(SceneNode* node) override
+    {
+        text += node->getName();
+        m_change(*node);
+    }
+
+    std::string text;
+
+private:
+    Change m_change;
+};
+
+class Mourned : public SceneNode
+{
+public:
+    Mourned(const char* name, std::string& text) : SceneNode(name), m_text(text) {}
+    ~Mourned() override { m_text += std::string("-") + getName(); }
+
+private:
+    std::string& m_text;
+};
+
+} // namespace
+
+// Fault caught: a visitor that removes or moves what it visits, or what is beside or above it, reads nodes that are
+// gone, misses others, or never ends. The tree is r with a, b (with x, y), c.
+TEST(SceneWalk, survivesWhatItsVisitorDoes)
+{
+    const auto remove = [](SceneNode& parent, unsigned child) { parent.removeChild(parent.getChild(child)); };
+    const auto is = [](const SceneNode& node, char name) { return node.getName()[0] == name; };
+    using Root = SharedPtr<SceneNode>;
+    const struct
+    {
+        const char* name;
+        std::function<void(SceneNode& node, Root& root)> change;
+        const char* text; ///< what is met, "|", what then dies in some order
+    } cases[] = {
+        {"nothing", [](SceneNode&, Root&) {}, "rabxyc|"},
+        {"each removes itself", [](SceneNode& node, Root&) { node.setParent(nullptr); }, "rabxyc|abcxy"},
+        {"b removes the ones before and after it",
+         [&](SceneNode& node, Root& root)
+         {
+             if (is(node, 'b'))
+             {
+                 remove(*root, 2);
+                 remove(*root, 0);
+             }
+         },
+         "rabxy|ac"},
+        {"c removes all children",
+         [&](SceneNode& node, Root& root)
+         {
+             while (is(node, 'c') && root->getChildCount() > 0)
+                 remove(*root, 0);
+         },
+         "rabxyc|abcxy"},
+        {"x removes its parent and all beside that",
+         [&](SceneNode& node, Root& root)
+         {
+             while (is(node, 'x') && root->getChildCount() > 0)
+                 remove(*root, 0);
+         },
+         "rabxy|abcxy"},
+        {"each child moves behind the others",
+         [](SceneNode& node, Root&) { node.setParent(SharedPtr<SceneNode>(node.getParent())); }, "rabxyc|"},
+        {"a drops the whole tree", [](SceneNode&, Root& root) { root = nullptr; }, "rabxyc|abcrxy"},
+        {"a walk within a walk",
+         [](SceneNode& node, Root&)
+         {
+             Changer inner([](SceneNode& each) { each.setParent(nullptr); });
+             visitScene(inner, node);
+         },
+         "r|abcxy"},
+    };
+    for (const FlagMask& flags : {FlagMask(), FlagMask(1, 1)})
+    {
+        for (const auto& test : cases)
+        {
+            std::string dead;
+            Root root = makeShared<Mourned>("r", dead);
+            for (const char* name : {"a", "b", "c"})
+                makeShared<Mourned>(name, dead)->setParent(root);
+            for (const char* name : {"x", "y"})
+                makeShared<Mourned>(name, dead)->setParent(root->getChild(1));
+            Changer changer(
+                [&](SceneNode& node)
+                {
+                    test.change(node, root);
+                    EXPECT_EQ("", dead) << test.name;
+                });
+            visitScene(changer, *root, flags, flags);
+            std::sort(dead.begin(), dead.end());
+            EXPECT_EQ(test.text, changer.text + "|" + dead.substr(dead.find_last_of('-') + 1)) << test.name;
+        }
+    }
 }

@@ -1,6 +1,7 @@
 #include "orv/scenenode.h"
 
 #include "jointtie.h"
+#include "scenewalk.h"
 
 #include "orv/log.h"
 #include "orv/scenenodevisitor.h"
@@ -292,13 +293,15 @@ const SceneNode* SceneNode::find(const char* name) const
 /// @return the share that the child list held; empty when the node is no child of this one.
 SharedPtr<SceneNode> SceneNode::takeChild(const SceneNode* child)
 {
-    const auto found =
-        std::find_if(m_children.begin(), m_children.end(),
-                     [child](const SharedPtr<SceneNode>& held) { return held.get() == child; });
+    auto found = std::find_if(m_children.begin(), m_children.end(),
+                              [child](const SharedPtr<SceneNode>& held) { return held.get() == child; });
     if (found == m_children.end())
         return nullptr;
     SharedPtr<SceneNode> taken = std::move(*found);
-    m_children.erase(found);
+    for (auto next = found + 1; next != m_children.end(); ++next, ++found)
+        found->swap(*next); // erase() would ask of each whether it drops something
+    m_children.pop_back();
+    detail::SceneWalk::keep(taken);
     countSkinned(0u - child->m_skinnedCount);
     return taken;
 }

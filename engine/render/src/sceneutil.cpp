@@ -1,5 +1,7 @@
 #include "orv/sceneutil.h"
 
+#include "scenewalk.h"
+
 #include "orv/appearance.h"
 #include "orv/assetcachepool.h"
 #include "orv/meshutil.h"
@@ -31,6 +33,12 @@ struct Walk
     bool plainFlags; ///< no recursive flag is on by default: once the condition holds, it holds below
 };
 
+void visitAll(SceneNodeVisitor& visitor, SceneNode& node)
+{
+    node.accept(visitor);
+    detail::visitChildren(node, [&visitor](SceneNode& child) { visitAll(visitor, child); });
+}
+
 void visitRestricted(const Walk& walk, SceneNode& node, WalkState state)
 {
     const FlagMask& render = walk.renderFlags;
@@ -41,7 +49,7 @@ void visitRestricted(const Walk& walk, SceneNode& node, WalkState state)
     state.satisfied = nowSatisfied;
     if (stop && nowSatisfied)
     {
-        visitScene(walk.visitor, node);
+        visitAll(walk.visitor, node);
         return;
     }
 
@@ -50,8 +58,7 @@ void visitRestricted(const Walk& walk, SceneNode& node, WalkState state)
         node.accept(walk.visitor);
     if (stop)
         return; // the condition was lost here and cannot come back further down
-    for (const SharedPtr<SceneNode>& child : node.getChildren())
-        visitRestricted(walk, *child, state);
+    detail::visitChildren(node, [&](SceneNode& child) { visitRestricted(walk, child, state); });
 }
 
 class AppearanceSetter : public SceneNodeVisitor
@@ -134,9 +141,8 @@ bool getDerivedFlags(const SceneNode& node, const FlagMask& flags)
 
 void visitScene(SceneNodeVisitor& visitor, SceneNode& node)
 {
-    node.accept(visitor);
-    for (const SharedPtr<SceneNode>& child : node.getChildren())
-        visitScene(visitor, *child);
+    const detail::SceneWalk walk(node);
+    visitAll(visitor, node);
 }
 
 void visitScene(SceneNodeVisitor& visitor, SceneNode& node, const FlagMask& renderFlags,
@@ -147,6 +153,7 @@ void visitScene(SceneNodeVisitor& visitor, SceneNode& node, const FlagMask& rend
         visitScene(visitor, node);
         return;
     }
+    const detail::SceneWalk walk(node);
     const bool plainFlags = (recursiveFlags.mask & recursiveFlags.inverted) == 0;
     visitRestricted({visitor, renderFlags, recursiveFlags, plainFlags}, node, WalkState());
 }
