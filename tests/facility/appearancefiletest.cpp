@@ -76,7 +76,10 @@ TEST_F(AppearanceFileTest, statements)
         {"winding_order CW winding_order left", "winding 0", "winding mode left"},
         {"polygon_mode NONE WINDING_CW 3.5", "culling 3 winding 1 width 3.5", nullptr},
         {"line_width 2 line_width", "width 1", nullptr},
-        {"line_width wide", "width 0", "tag wide"},
+        {"line_width 2 line_width 0", "width 2", "line width 0"},
+        {"line_width 2 line_width -1.5", "width 2", "line width -1.5"},
+        {"polygon_mode NONE CW -1e9", "culling 3 winding 1 width 1", "line width -1e+09"},
+        {"depth_offset 1 wide", "offset 1 0", "tag wide"},
         {"depth_offset 1.5 -2", "offset 1.5 -2", nullptr},
         {"depth_test 0", "test 0", nullptr},
         {"depth_function MORE", "function 7", "depth function MORE"},
@@ -160,7 +163,9 @@ TEST_F(AppearanceFileTest, properties)
         "property M_OPACITY float 0.5 property \"two words\" int 9 property T Texture2D none.png\n"
         "property K TextureCube none.png property C float 8\n";
     apply(*appearance, text);
-    EXPECT_FALSE(log.contains("Appearance file")) << log.text(); // the caches report missing textures
+    EXPECT_EQ(1, log.countMessage(
+                     "Appearance file: t.ap names 2 assets that cannot be loaded; the first is none.png"))
+        << log.text();
 
     const auto expect = [&](const char* name, auto expected, auto value)
     {

@@ -41,20 +41,20 @@ namespace detail
 
 void logNullArrow(const char* className)
 {
-    pssLogError("sharedptr", "operator->", __LINE__, "Error: pointer operator on null. class: %s", className);
-    pssLogError("sharedptr", "operator->", __LINE__, "%s", "ORV_ASSERT: m_ptr");
+    logError("sharedptr", "operator->", __LINE__, "Error: pointer operator on null. class: %s", className);
+    logError("sharedptr", "operator->", __LINE__, "%s", "ORV_ASSERT: m_ptr");
 }
 
 void logNullDereference(const char* className)
 {
-    pssLogError("sharedptr", "operator*", __LINE__, "Error: null shared pointer dereference. class: %s",
-                className);
-    pssLogError("sharedptr", "operator*", __LINE__, "%s", "ORV_ASSERT: m_ptr");
+    logError("sharedptr", "operator*", __LINE__, "Error: null shared pointer dereference. class: %s",
+             className);
+    logError("sharedptr", "operator*", __LINE__, "%s", "ORV_ASSERT: m_ptr");
 }
 
 void logNoMemory(const char* className)
 {
-    pssLogError("sharedptr", "makeShared", __LINE__, "No memory for an object. class: %s", className);
+    logError("sharedptr", "makeShared", __LINE__, "No memory for an object. class: %s", className);
 }
 
 } // namespace detail

@@ -3,6 +3,7 @@
 #include "orv/appearance.h"
 #include "orv/assetcachepool.h"
 #include "orv/detail/assetpath.h"
+#include "orv/detail/loadscope.h"
 #include "orv/filetostring.h"
 #include "orv/shaderprogramcache.h"
 #include "orv/texture2dcache.h"
@@ -44,12 +45,11 @@ public:
             return;
         }
         detail::Statement statement;
-        while (detail::readStatement(m_text, statement))
-        {
-            if (!readArguments(statement.tag))
-                return;
+        while (detail::readStatement(m_text, statement) && readArguments(statement.tag))
             eatWhite(m_text);
-        }
+        if (m_missingCount > 0)
+            ORV_LOG_ERROR("Appearance file: %s names %u assets that cannot be loaded; the first is %s",
+                          m_name, m_missingCount, m_firstMissing);
     }
 
 private:
@@ -105,10 +105,18 @@ private:
     // Braces, here and below, because they read the arguments in the order of the file.
     Vector4f readVector4() { return Vector4f{readNumber(), readNumber(), readNumber(), readNumber()}; }
 
-    void readShaderProgram()
+    /// Most caches say nothing of files that are not there.
+    template <class Cache>
+    auto readAsset(Cache& cache)
     {
-        m_appearance.setShaderProgram(m_pool.getShaderProgramCache()->get(readToken(m_text).start));
+        const CharRange name = readToken(m_text);
+        auto asset = cache.get(name.start);
+        if (!asset && m_missingCount++ == 0)
+            m_firstMissing = name.start;
+        return asset;
     }
+
+    void readShaderProgram() { m_appearance.setShaderProgram(readAsset(*m_pool.getShaderProgramCache())); }
 
     void readPolygonMode()
     {
@@ -119,7 +127,15 @@ private:
 
     void readCullingMode() { m_appearance.setCullingMode(readCulling()); }
     void readWindingOrder() { m_appearance.setWindingOrder(readWinding()); }
-    void readLineWidth() { m_appearance.setLineWidth(readFloat(m_text, 1.0f)); }
+
+    void readLineWidth()
+    {
+        const float width = readFloat(m_text, 1.0f);
+        if (width > 0.0f)
+            m_appearance.setLineWidth(width);
+        else
+            ORV_LOG_ERROR("Appearance file: %s unexpected line width %g", m_name, double(width));
+    }
 
     void readDepthOffset()
     {
@@ -185,12 +201,12 @@ private:
 
     void readTexture2D(const char* property)
     {
-        m_appearance.setProperty(property, m_pool.getTexture2DCache()->get(readToken(m_text).start));
+        m_appearance.setProperty(property, readAsset(*m_pool.getTexture2DCache()));
     }
 
     void readTextureCube(const char* property)
     {
-        m_appearance.setProperty(property, m_pool.getTextureCubeCache()->get(readToken(m_text).start));
+        m_appearance.setProperty(property, readAsset(*m_pool.getTextureCubeCache()));
     }
 
     void readVector4f(const char* property) { m_appearance.setProperty(property, readVector4()); }
@@ -213,6 +229,8 @@ private:
     Appearance& m_appearance;
     const char* m_name;
     CharRange m_text;
+    unsigned m_missingCount = 0;
+    const char* m_firstMissing = nullptr; ///< in the text
 };
 
 const AppearanceFileReader::StatementKind AppearanceFileReader::STATEMENTS[] = {
@@ -282,6 +300,7 @@ bool AppearanceFileReader::readProperty()
 
 void Appearance::apply(AssetCachePool& pool, const char* name)
 {
+    const detail::LoadScope scope(name);
     const std::string normalized = detail::normalizeAssetName(name);
     const SharedPtr<Stream> stream = pool.getStream(normalized.c_str());
     if (!stream)

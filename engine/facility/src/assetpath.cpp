@@ -1,5 +1,7 @@
 #include "orv/detail/assetpath.h"
 
+#include "orv/detail/loadscope.h"
+
 #include <string_view>
 
 namespace orv::detail
@@ -33,6 +35,7 @@ bool AssetPath::add(const char* path, bool archive)
 bool AssetPath::add(const SharedPtr<StreamSource>& source)
 {
     m_sources.push_back(source);
+    LoadScope::forgetFailures(); // made by a source or loader of the program while it is asked
     return true;
 }
 
@@ -40,12 +43,12 @@ bool AssetPath::remove(const char* name)
 {
     if (!name)
         return false;
-    for (auto i = m_sources.begin(); i != m_sources.end(); ++i)
+    for (std::size_t i = 0; i < m_sources.size(); ++i)
     {
-        const StreamSource* source = i->operator->(); // logs an empty one
+        const StreamSource* source = m_sources[i].operator->(); // logs an empty one
         if (!source || std::string_view(source->getName()) != name)
             continue;
-        m_sources.erase(i);
+        m_sources.erase(m_sources.begin() + std::ptrdiff_t(i));
         return true;
     }
     return false;
@@ -53,10 +56,12 @@ bool AssetPath::remove(const char* name)
 
 SharedPtr<Stream> AssetPath::find(const char* name) const
 {
-    if (!name)
+    if (!name || !LoadScope::mayRead())
         return {};
-    for (const SharedPtr<StreamSource>& entry : m_sources)
+    // By number and with a share of its own: a source that is asked may add and remove sources.
+    for (std::size_t i = 0; i < m_sources.size(); ++i)
     {
+        const SharedPtr<StreamSource> entry = m_sources[i];
         StreamSource* source = entry.operator->(); // logs an empty one
         if (source && source->exists(name))
             return source->open(name, false);

@@ -1,5 +1,7 @@
 #include "orv/detail/assetstore.h"
 
+#include "orv/detail/loadscope.h"
+
 #include <list>
 #include <map>
 
@@ -21,12 +23,18 @@ SharedPtr<Shared> AssetStore::getAsset(const char* name)
     if (held != m_named.end())
         return held->second;
 
+    const LoadScope scope(normalized.c_str());
+    if (LoadScope::hasFailed(this, normalized))
+        return {};
     SharedPtr<Shared> asset = load(normalized.c_str());
     if (asset)
+    {
         m_named[normalized] = asset;
-    else
-        m_named.erase(normalized); // what a loader created under the name before it failed
-    return asset;
+        return asset;
+    }
+    m_named.erase(normalized); // what a loader created under the name before it failed
+    LoadScope::addFailure(this, normalized);
+    return {};
 }
 
 SharedPtr<Shared> AssetStore::load(const char* name)

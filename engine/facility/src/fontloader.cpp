@@ -1,6 +1,7 @@
 #include "orv/fontloader.h"
 
 #include "fontbaker.h"
+#include "orv/detail/loadscope.h"
 #include "orv/filetostring.h"
 #include "orv/fontcache.h"
 #include "orv/log.h"
@@ -56,6 +57,7 @@ bool FontLoader::isKnown(const char* name)
 
 Font::Ptr FontLoader::load(AssetCache<Font>& cache, const char* name)
 {
+    const detail::LoadScope scope(name);
     const std::string normalized = detail::normalizeAssetName(name);
     int size = 0;
     if (!readSize(normalized, size))

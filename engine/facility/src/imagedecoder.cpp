@@ -1,6 +1,7 @@
 #include "imagedecoder.h"
 
 #include "jpegcheck.h"
+#include "orv/detail/loadscope.h"
 
 #include <algorithm>
 #include <climits>
@@ -63,8 +64,6 @@ namespace orv::detail
 namespace
 {
 
-const std::size_t MAX_DECODED_BYTES = std::size_t(256) << 20;
-
 const std::size_t DECODER_BYTES = 1 << 15; ///< what the decoder needs for its own records
 
 /// A format, and how many decoded bytes one byte of such a file can stand for. A file that claims more is damaged or
@@ -116,7 +115,8 @@ unsigned char* decodeImage(const unsigned char* file, std::size_t size, int& wid
         return nullptr;
     const Density density = getDensity(file, size);
     const std::size_t bytes = getDecodedBytes(w, h, channels, density.isJpeg);
-    if (bytes > MAX_DECODED_BYTES || bytes / density.bytesPerByte > size)
+    if (bytes / density.bytesPerByte > size ||
+        !LoadScope::takePicture(uint64_t(w) * uint64_t(h) * uint64_t(channels), size))
         return nullptr;
     // A PNG takes up to four times its final size while it is inflated, a JPEG has two bytes a coefficient.
     t_largestBlock = 4 * bytes + 2 * size + DECODER_BYTES;

@@ -1,6 +1,7 @@
 #include "pvrtexture.h"
 
 #include "orv/detail/bindingepoch.h"
+#include "orv/detail/loadscope.h"
 #include "orv/renderdevice.h"
 #include "orv/texture.h"
 #include "pvr/pvrpixels.h"
@@ -8,6 +9,7 @@
 #include <GLES2/gl2.h>
 #include <GLES2/gl2ext.h>
 
+#include <cstdint>
 #include <memory>
 #include <new>
 
@@ -16,9 +18,6 @@ namespace orv::detail
 
 namespace
 {
-
-/// The largest level in bytes that is brought into another form in memory, as for images.
-constexpr uint64_t MAX_UNPACKED_BYTES = uint64_t(256) << 20;
 
 /// What GL takes the pixels of a format as.
 struct GlPixels
@@ -80,7 +79,7 @@ bool uploadUnpacked(const pvr::PvrFile& file, const uint8_t* data, size_t levelC
 {
     const uint64_t bytes = pvr::getUnpackedSize(file, file.levels.front());
     std::unique_ptr<uint8_t[]> pixels;
-    if (bytes <= MAX_UNPACKED_BYTES)
+    if (bytes <= PTRDIFF_MAX)
         pixels.reset(new (std::nothrow) uint8_t[size_t(bytes)]);
     if (!pixels)
     {
@@ -113,12 +112,32 @@ void setParameters(bool isPowerOfTwoSized, bool hasMipmaps)
     glTexParameteri(GL_TEXTURE_2D, GL_TEXTURE_WRAP_T, wrap);
 }
 
+/// Asks for what GL is to be given.
+bool takeLevels(const pvr::PvrFile& file, size_t fileSize, size_t levelCount, bool isUnpacked)
+{
+    for (size_t i = 0; i < levelCount; ++i)
+    {
+        const pvr::Level& level = file.levels[i];
+        const uint64_t bytes = isUnpacked ? pvr::getUnpackedSize(file, level) : level.size;
+        if (i == 0 ? !LoadScope::takePicture(bytes, fileSize) : !LoadScope::takeTexture(bytes))
+            return false;
+    }
+    return true;
+}
+
 /// @return false if GL had an error in any of it.
-bool fillTexture(const pvr::PvrFile& file, const uint8_t* data, PvrTexture& texture, std::string& error)
+bool fillTexture(const pvr::PvrFile& file, const uint8_t* data, size_t size, PvrTexture& texture,
+                 std::string& error)
 {
     const bool isPowerOfTwoSized = isPowerOfTwo(file.width(), file.height());
     const size_t levelCount = isPowerOfTwoSized && file.isComplete() ? file.levels.size() : 1;
     const GLenum compressedFormat = getGlCompressedFormat(file);
+    const bool isUnpacked = compressedFormat == GL_NONE;
+    if (!takeLevels(file, size, levelCount, isUnpacked))
+    {
+        error = "it is more than this load may have";
+        return false;
+    }
 
     RenderDevice::getError(false); // an older error stays remembered and is not taken for the upload's
     glBindTexture(GL_TEXTURE_2D, texture.glName);
@@ -136,7 +155,6 @@ bool fillTexture(const pvr::PvrFile& file, const uint8_t* data, PvrTexture& text
         return false;
     }
 
-    const bool isUnpacked = compressedFormat == GL_NONE;
     texture.width = file.width();
     texture.height = file.height();
     texture.bitsPerPixel =
@@ -170,7 +188,7 @@ bool uploadPvr(const uint8_t* data, size_t size, PvrTexture& texture, std::strin
         error = "Failed to create OpenGL texture";
         return false;
     }
-    if (!fillTexture(file, data, made, error))
+    if (!fillTexture(file, data, size, made, error))
     {
         glDeleteTextures(1, &made.glName);
         bindingsChanged();

@@ -1,5 +1,6 @@
 #include "orv/pvrtextureloader.h"
 
+#include "orv/detail/loadscope.h"
 #include "orv/filetostring.h"
 #include "orv/log.h"
 #include "orv/stream.h"
@@ -20,6 +21,7 @@ bool PvrTextureLoader::isKnown(const char* name)
 
 SharedPtr<Texture2D> PvrTextureLoader::load(AssetCache<Texture2D>& cache, const char* name)
 {
+    const detail::LoadScope scope(name);
     const std::string normalized = detail::normalizeAssetName(name);
     const SharedPtr<Stream> stream = cache.getStream(normalized.c_str());
     if (!stream)

@@ -143,7 +143,7 @@ bool detail::reportGLError(const char* file, const char* function, int line)
     const RenderDevice::ErrorCode error = RenderDevice::getError(false);
     if (error == RenderDevice::ErrorCode::NO_ERROR)
         return false;
-    pssLogError(file, function, line, "OpenGL error %d: %s", int(error), RenderDevice::getErrorString(error));
+    logError(file, function, line, "OpenGL error %d: %s", int(error), RenderDevice::getErrorString(error));
     return true;
 }
 

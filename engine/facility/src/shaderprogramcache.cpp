@@ -72,6 +72,7 @@ SharedPtr<ShaderResource> makeShader(detail::ResourceCache& resources, ShaderRes
     if (compiled)
         return shader;
     logShaderError(shader->getId());
+    shader->deallocate();
     return {};
 }
 
@@ -80,6 +81,18 @@ bool isLinked(GLuint program)
     GLint linked = GL_FALSE;
     glGetProgramiv(program, GL_LINK_STATUS, &linked);
     return linked;
+}
+
+/// @return false, after a message, if they do not go together.
+bool link(const ProgramResource& program, const ShaderResource& vertex, const ShaderResource& fragment)
+{
+    glAttachShader(program.getId(), vertex.getId());
+    glAttachShader(program.getId(), fragment.getId());
+    glLinkProgram(program.getId());
+    if (isLinked(program.getId()))
+        return true;
+    logProgramError(program.getId());
+    return false;
 }
 
 } // namespace
@@ -107,19 +120,17 @@ SharedPtr<ShaderProgram> ShaderProgramCache::create(const char* vertexSource, co
         return {};
     const SharedPtr<ShaderResource> vertex =
         makeShader(resources, ShaderResource::Kind::VERTEX, vertexSource);
-    if (!vertex)
-        return {};
-    const SharedPtr<ShaderResource> fragment =
-        makeShader(resources, ShaderResource::Kind::FRAGMENT, fragmentSource);
-    if (!fragment)
-        return {};
-
-    glAttachShader(program->getId(), vertex->getId());
-    glAttachShader(program->getId(), fragment->getId());
-    glLinkProgram(program->getId());
-    if (!isLinked(program->getId()))
+    SharedPtr<ShaderResource> fragment;
+    if (vertex)
+        fragment = makeShader(resources, ShaderResource::Kind::FRAGMENT, fragmentSource);
+    if (!fragment || !link(*program, *vertex, *fragment))
     {
-        logProgramError(program->getId());
+        // What is left of a program that failed; what a linked one leaves goes with the next flush().
+        program->deallocate();
+        if (vertex)
+            vertex->deallocate();
+        if (fragment)
+            fragment->deallocate();
         return {};
     }
 
@@ -148,6 +159,7 @@ SharedPtr<ShaderProgram> ShaderProgramCache::create(unsigned int length, unsigne
     {
         RenderDevice::getError(false); // the driver's complaint, which this message stands for
         ORV_LOG_ERROR("ShaderProgram binary load failed");
+        program->deallocate();
         return {};
     }
 

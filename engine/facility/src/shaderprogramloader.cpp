@@ -3,6 +3,7 @@
 #include "shaderprogramfile.h"
 
 #include "orv/detail/digestmaker.h"
+#include "orv/detail/loadscope.h"
 #include "orv/filetostring.h"
 #include "orv/shaderprogramcache.h"
 #include "orv/textsuffix.h"
@@ -23,6 +24,7 @@ using detail::DigestMaker;
 
 const char* const ERROR_PROGRAM = "orv#error.sp";
 const uint32_t BINARY_VERSION = 1;
+const std::size_t PROGRAM_BYTES = 4096; ///< of source that even an empty program counts as
 
 bool readWord(Stream& stream, uint32_t& word)
 {
@@ -66,7 +68,7 @@ public:
     {
     }
 
-    /// @return null for a missing or wrong file (logged).
+    /// @return false for a missing or wrong file, or one program too many for one load (logged).
     bool readSources()
     {
         const std::size_t fileNameSize = std::min(m_name.find('$'), m_name.size());
@@ -80,7 +82,10 @@ public:
 
         m_vertex = makeDefines(std::string_view(m_name).substr(fileNameSize));
         m_fragment = m_vertex;
-        return appendSource(m_vertex, m_file.vertexSource) && appendSource(m_fragment, m_file.fragmentSource);
+        if (!appendSource(m_vertex, m_file.vertexSource) || !appendSource(m_fragment, m_file.fragmentSource))
+            return false;
+        const auto fileSize = std::size_t(text.getEnd() - text.getStart());
+        return detail::LoadScope::takeProgram(PROGRAM_BYTES + fileSize + m_vertex.size() + m_fragment.size());
     }
 
     void openBinary()
@@ -164,14 +169,14 @@ private:
             return {};
         }
         const bool hasFormat = readWord(stream, format);
-        const int32_t size = std::max(stream.size() - stream.tell(), 0);
+        const int32_t size = std::max(std::max(stream.size(), 0) - std::max(stream.tell(), 0), 0);
         const std::unique_ptr<char[]> bytes(new (std::nothrow) char[std::size_t(size) + 1]);
         if (!hasFormat || !bytes)
         {
             ORV_LOG_WARN("Failed to load cached shader \"%s\"", m_binaryName.c_str());
             return {};
         }
-        const int32_t length = std::max(stream.read(bytes.get(), unsigned(size)), 0);
+        const int32_t length = std::clamp(stream.read(bytes.get(), unsigned(size)), 0, size);
         SharedPtr<ShaderProgram> program =
             m_cache.create(unsigned(length), format, bytes.get(), m_name.c_str());
         if (program)
@@ -252,6 +257,7 @@ void ShaderProgramLoader::setBinaryCachingEnabled(bool enabled)
 
 SharedPtr<ShaderProgram> ShaderProgramLoader::load(AssetCache<ShaderProgram>& cache, const char* name)
 {
+    const detail::LoadScope scope(name);
     ShaderProgramCache& programs = static_cast<ShaderProgramCache&>(cache);
     const std::string requested = detail::normalizeAssetName(name);
     ProgramReader reader(programs, requested, m_binaryCaching);

@@ -1,6 +1,7 @@
 #include "orv/texture2dloader.h"
 
 #include "imagesuffix.h"
+#include "orv/detail/loadscope.h"
 #include "orv/image.h"
 #include "orv/log.h"
 #include "orv/stream.h"
@@ -19,6 +20,7 @@ bool Texture2DLoader::isKnown(const char* name)
 
 SharedPtr<Texture2D> Texture2DLoader::load(AssetCache<Texture2D>& cache, const char* name)
 {
+    const detail::LoadScope scope(name);
     const std::string normalized = detail::normalizeAssetName(name);
     const SharedPtr<Stream> stream = cache.getStream(normalized.c_str());
     if (!stream)

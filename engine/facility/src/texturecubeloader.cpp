@@ -1,6 +1,7 @@
 #include "orv/texturecubeloader.h"
 
 #include "imagesuffix.h"
+#include "orv/detail/loadscope.h"
 #include "orv/image.h"
 #include "orv/log.h"
 #include "orv/stream.h"
@@ -142,6 +143,7 @@ bool TextureCubeLoader::isKnown(const char* name)
 
 SharedPtr<TextureCube> TextureCubeLoader::load(AssetCache<TextureCube>& cache, const char* name)
 {
+    const detail::LoadScope scope(name);
     const std::string normalized = detail::normalizeAssetName(name);
     const bool isGrid = normalized.find(';') == std::string::npos;
     Faces faces;

@@ -5,6 +5,7 @@
 #include "gloreader.h"
 
 #include "orv/assetcachepool.h"
+#include "orv/detail/loadscope.h"
 
 #include <algorithm>
 #include <bit>
@@ -441,12 +442,14 @@ bool GloReader::keys(Channel& channel)
 SharedPtr<Glo> loadGloFile(AssetCachePool& pool, const SharedPtr<SceneNode>& parent, const char* name,
                            bool measuresMeshes)
 {
+    const detail::LoadScope scope(name);
     const SharedPtr<Stream> stream = name ? pool.getStream(name) : SharedPtr<Stream>();
     if (!stream)
     {
         ORV_GLO_ERROR("GLO file %s cannot be opened", name ? name : "(null)");
         return {};
     }
+    detail::LoadScope::addRead(uint64_t(std::max(stream->size(), 0)));
     detail::GloReader reader(stream, name);
     if (!reader.read())
         return {};

@@ -43,6 +43,16 @@ extern "C"
 namespace orv::detail
 {
 
+// What the macros below call: the entry points above, as far as a LogBudget allows.
+ORV_API void logError(const char* file, const char* function, int line, const char* format, ...)
+    ORV_PRINTF(4, 5);
+ORV_API void logWarn(const char* file, const char* function, int line, const char* format, ...)
+    ORV_PRINTF(4, 5);
+ORV_API void logInfo(const char* file, const char* function, int line, const char* format, ...)
+    ORV_PRINTF(4, 5);
+ORV_API void logDebug(const char* file, const char* function, int line, const char* format, ...)
+    ORV_PRINTF(4, 5);
+
 /// A source path without its extension, cut at compile time: "engine/facility/src/assetpath".
 template <std::size_t N>
 struct SourcePath
@@ -67,13 +77,15 @@ inline constexpr const char* sourcePathText = PATH.text;
 
 } // namespace orv::detail
 
+/// One record. While the engine loads something, records of one place in the sources beyond the first few are counted
+/// instead, and one record tells how many they were (detail::LogBudget).
 #define ORV_LOG(entryPoint, ...)                                                                             \
     entryPoint(::orv::detail::sourcePathText<__FILE__>, __func__, __LINE__, __VA_ARGS__)
 
-#define ORV_LOG_ERROR(...) ORV_LOG(pssLogError, __VA_ARGS__)
-#define ORV_LOG_WARN(...) ORV_LOG(pssLogWarn, __VA_ARGS__)
-#define ORV_LOG_INFO(...) ORV_LOG(pssLogInfo, __VA_ARGS__)
-#define ORV_LOG_DEBUG(...) ORV_LOG(pssLogDebug, __VA_ARGS__)
+#define ORV_LOG_ERROR(...) ORV_LOG(::orv::detail::logError, __VA_ARGS__)
+#define ORV_LOG_WARN(...) ORV_LOG(::orv::detail::logWarn, __VA_ARGS__)
+#define ORV_LOG_INFO(...) ORV_LOG(::orv::detail::logInfo, __VA_ARGS__)
+#define ORV_LOG_DEBUG(...) ORV_LOG(::orv::detail::logDebug, __VA_ARGS__)
 
 /// A broken promise inside the engine: logged as an error with the condition's text, and execution goes on.
 #define ORV_ASSERT(condition)                                                                                \

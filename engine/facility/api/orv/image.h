@@ -23,7 +23,7 @@ public:
 
     /// Decodes a whole JPEG, PNG, BMP or TGA file, keeping its channel count; 16-bit channels become 8-bit.
     /// An image that cannot be decoded has no data, and neither has one wider or higher than 16384 pixels,
-    /// one of more than 256 MiB, or one that is larger than its file could possibly hold.
+    /// one beyond LoadLimits, or one that is larger than its file could possibly hold.
     explicit Image(Stream& stream);
 
     ~Image() override;

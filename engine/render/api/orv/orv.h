@@ -32,6 +32,7 @@
 #include "orv/indexbuffer.h"
 #include "orv/indexbuffercache.h"
 #include "orv/light.h"
+#include "orv/loadlimits.h"
 #include "orv/log.h"
 #include "orv/maths.h"
 #include "orv/matrix.h"

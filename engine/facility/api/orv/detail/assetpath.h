@@ -22,6 +22,8 @@ ORV_API std::string normalizeAssetName(const char* name);
 /// An ordered list of stream sources in which names are looked up, first to last.
 ///
 /// An empty source may be in the list: each search that passes it logs the null pointer and goes on to the next.
+/// A source may add sources while it is asked: they come last in that very search. One that removes sources makes the
+/// search pass over one of those behind.
 class ORV_API AssetPath : public Shared
 {
 public:
