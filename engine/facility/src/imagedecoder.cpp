@@ -103,7 +103,7 @@ std::size_t getDecodedBytes(int width, int height, int channels, bool isJpeg)
 unsigned char* decodeImage(const unsigned char* file, std::size_t size, int& width, int& height,
                            int& channelCount)
 {
-    if (!file || size == 0 || size > INT_MAX || !hasSoundHuffmanTables(file, size))
+    if (!file || size == 0 || size > INT_MAX || !isSoundJpeg(file, size))
         return nullptr;
     int w = 0;
     int h = 0;

@@ -1,5 +1,8 @@
 #include "jpegcheck.h"
 
+#include <algorithm>
+#include <cstdint>
+
 namespace orv::detail
 {
 
@@ -7,6 +10,12 @@ namespace
 {
 
 const int END_OF_FILE = -1;
+
+// A scan takes as many steps for each of its blocks as it has coefficients, and a few more. The usual ten scans of a
+// progressive file come to some 200 for each block of the picture; what is coded more finely has the bytes to show.
+const uint64_t STEPS_PER_VISIT = 4;
+const uint64_t MOST_STEPS_PER_BLOCK = 224;
+const uint64_t MOST_STEPS_PER_BYTE = 128;
 
 class JpegChecker
 {
@@ -27,6 +36,8 @@ public:
     }
 
 private:
+    static constexpr int MOST_COMPONENTS = 4;
+
     /// Also passes over the coded data after a scan's header: markers within it stand alone.
     int findMarker()
     {
@@ -47,7 +58,7 @@ private:
         else if (marker == 0xDA)
             isSound = checkScan();
         else if (marker >= 0xC0 && marker <= 0xC2)
-            m_isProgressive = marker == 0xC2;
+            readFrame(marker == 0xC2);
         m_position = start + std::size_t(length < 2 ? 2 : length);
         return isSound;
     }
@@ -70,19 +81,70 @@ private:
         return true;
     }
 
+    struct Component
+    {
+        int id = -1;
+        uint64_t blocksOfUnit = 0; ///< in each of the picture's units, which hold blocks of all components
+        uint64_t blocks = 0;       ///< of the component alone
+    };
+
+    /// The decoder refuses sizes, counts and samplings that are 0, and a second frame.
+    void readFrame(bool isProgressive)
+    {
+        m_isProgressive = isProgressive;
+        readByte(); // bits of a sample
+        const uint64_t height = uint64_t(readByte()) << 8 | uint64_t(readByte());
+        const uint64_t width = uint64_t(readByte()) << 8 | uint64_t(readByte());
+        const int count = std::min(readByte(), MOST_COMPONENTS);
+        uint64_t across[MOST_COMPONENTS] = {};
+        uint64_t down[MOST_COMPONENTS] = {};
+        uint64_t most[2] = {1, 1};
+        for (int i = 0; i < count; ++i)
+        {
+            m_components[i].id = readByte();
+            const auto sampling = unsigned(readByte());
+            readByte(); // quantisation table
+            across[i] = sampling >> 4;
+            down[i] = sampling & 15;
+            most[0] = std::max(most[0], across[i]);
+            most[1] = std::max(most[1], down[i]);
+        }
+        m_units = divide(width, 8 * most[0]) * divide(height, 8 * most[1]);
+        m_mostSteps = MOST_STEPS_PER_BYTE * m_size;
+        for (int i = 0; i < count; ++i)
+        {
+            Component& component = m_components[i];
+            component.blocksOfUnit = across[i] * down[i];
+            component.blocks =
+                divide(divide(width * across[i], most[0]), 8) * divide(divide(height * down[i], most[1]), 8);
+            m_mostSteps += MOST_STEPS_PER_BLOCK * m_units * component.blocksOfUnit;
+        }
+    }
+
+    static uint64_t divide(uint64_t count, uint64_t size) { return (count + size - 1) / size; }
+
     bool checkScan()
     {
         unsigned used[2] = {0, 0}; // DC and AC tables
         const int components = readByte();
+        uint64_t blocks = 0;
         for (int i = 0; i < components; ++i)
         {
-            readByte(); // which component
+            const int id = readByte();
+            const auto found = std::find_if(m_components, m_components + MOST_COMPONENTS,
+                                            [id](const Component& component) { return component.id == id; });
+            if (found != m_components + MOST_COMPONENTS)
+                blocks += components == 1 ? found->blocks : m_units * found->blocksOfUnit;
             const int tables = readByte();
             used[0] |= 1u << (tables >> 4);
             used[1] |= 1u << (tables & 15);
         }
         const int first = readByte();
-        readByte(); // last coefficient
+        const int last = readByte();
+        const int coefficients = m_isProgressive ? (first == 0 ? 1 : last - first + 1) : 64;
+        m_steps += blocks * (STEPS_PER_VISIT + uint64_t(std::max(coefficients, 0)));
+        if (m_steps > m_mostSteps)
+            return false;
         const bool isRefinement = readByte() >> 4 != 0;
         const bool needsDc = !m_isProgressive || (first == 0 && !isRefinement);
         const bool needsAc = !m_isProgressive || first != 0;
@@ -97,11 +159,15 @@ private:
     std::size_t m_position = 0;
     bool m_isProgressive = false;
     unsigned m_defined[2] = {0, 0}; ///< bits: DC and AC tables seen so far
+    Component m_components[MOST_COMPONENTS];
+    uint64_t m_units = 0;
+    uint64_t m_steps = 0;
+    uint64_t m_mostSteps = 0;
 };
 
 } // namespace
 
-bool hasSoundHuffmanTables(const unsigned char* file, std::size_t size)
+bool isSoundJpeg(const unsigned char* file, std::size_t size)
 {
     return JpegChecker(file, size).check();
 }
