@@ -262,6 +262,20 @@ TEST_F(LoadTest, sameContentIsNotReadWithoutEnd)
     EXPECT_TRUE(log.contains("lines.ap reads the same files over and over")) << log.text();
 }
 
+// Faults caught: six copies of one picture at once; a GL name left by a cube that did not come to be.
+TEST_F(LoadTest, cubesTakeTheirPicturesOneByOne)
+{
+    files->add("face.png", imagefiles::encodeFlat("png", 64, 64, 3));
+    files->add("other.png", imagefiles::encodeFlat("png", 32, 32, 3));
+    files->opened = 0;
+    EXPECT_TRUE(pool->getTextureCubeCache()->get("face.png;face.png;face.png;face.png;face.png;face.png"));
+    EXPECT_EQ(1, files->opened);
+    const std::string before = glcalls::describeLiveNames();
+    EXPECT_FALSE(pool->getTextureCubeCache()->get("face.png;face.png;face.png;face.png;face.png;other.png"));
+    EXPECT_FALSE(pool->getShaderProgramCache()->get("face.png"));
+    EXPECT_EQ(before, glcalls::describeLiveNames());
+}
+
 // Faults caught: the list of sources used after it has moved, a source after it is gone; a failure kept although there
 // is one more place to look.
 TEST_F(LoadTest, sourcesThatChangeTheListOfSources)

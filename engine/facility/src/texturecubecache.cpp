@@ -30,14 +30,20 @@ SharedPtr<TextureCube> TextureCubeCache::create(unsigned width, unsigned height,
                                                 Texture::Type type, const char* name)
 {
     const auto resource = makeShared<detail::TextureResource>();
-    getResourceCache()->add(resource);
-    if (!resource || !resource->allocate())
-        return {};
-
-    auto cube = makeShared<TextureCube>(width, height, format, type, resource);
+    auto cube = detail::makeTextureCube(*this, width, height, format, type, resource);
     if (cube)
         add(cube, name);
     return cube;
+}
+
+SharedPtr<TextureCube> detail::makeTextureCube(TextureCubeCache& cache, unsigned width, unsigned height,
+                                               Texture::Format format, Texture::Type type,
+                                               const SharedPtr<TextureResource>& resource)
+{
+    cache.getResourceCache()->add(resource);
+    if (!resource || !resource->allocate())
+        return {};
+    return makeShared<TextureCube>(width, height, format, type, resource);
 }
 
 bool exists(TextureCubeCache& cache, const char* positiveX, const char* negativeX, const char* positiveY,

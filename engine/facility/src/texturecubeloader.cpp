@@ -25,8 +25,72 @@ const TextureCube::Face GRID_FACES[TextureCube::FACE_COUNT] = {
     TextureCube::Face::NEGATIVE_X, TextureCube::Face::NEGATIVE_Z, TextureCube::Face::POSITIVE_X,
     TextureCube::Face::NEGATIVE_Y, TextureCube::Face::POSITIVE_Y, TextureCube::Face::POSITIVE_Z};
 
-/// Indexed by TextureCube::Face.
-using Faces = std::array<SharedPtr<Image>, TextureCube::FACE_COUNT>;
+/// Takes a cube's faces one after the other, so that no more than one picture has to be in memory.
+class CubeMaker
+{
+public:
+    explicit CubeMaker(TextureCubeCache& cache) : m_cache(cache) {}
+
+    /// A cube that did not come to be leaves no name in GL.
+    ~CubeMaker()
+    {
+        if (m_resource && !m_isFinished)
+            m_resource->deallocate();
+    }
+
+    /// @param name  of the picture, for messages.
+    bool addFace(TextureCube::Face face, const Image& image, const char* name)
+    {
+        if (!m_cube && !begin(image))
+            return false;
+        if (image.width() != m_width || image.height() != m_height)
+        {
+            ORV_LOG_ERROR("TextureCube images must have matching dimensions.");
+            return false;
+        }
+        // GL wants one format for all faces, or the cube is incomplete and black.
+        if (image.channelCount() != m_channels)
+        {
+            ORV_LOG_ERROR("TextureCube image \"%s\" has %d channels, the first one %d.", name,
+                          image.channelCount(), m_channels);
+            return false;
+        }
+        m_cube->setFace(face, image.data());
+        return true;
+    }
+
+    SharedPtr<TextureCube> finish(const char* name)
+    {
+        if (!m_cube || !m_cube->isComplete())
+            return {};
+        m_isFinished = true;
+        m_cache.add(m_cube, name);
+        return m_cube;
+    }
+
+private:
+    bool begin(const Image& image)
+    {
+        m_width = image.width();
+        m_height = image.height();
+        m_channels = image.channelCount();
+        if (!detail::requireSquareFaces(unsigned(m_width), unsigned(m_height)))
+            return false;
+        m_resource = makeShared<detail::TextureResource>();
+        m_cube =
+            detail::makeTextureCube(m_cache, unsigned(m_width), unsigned(m_height),
+                                    Texture::getFormat(m_channels), Texture::Type::UNSIGNED_BYTE, m_resource);
+        return bool(m_cube);
+    }
+
+    TextureCubeCache& m_cache;
+    SharedPtr<detail::TextureResource> m_resource;
+    SharedPtr<TextureCube> m_cube;
+    int m_width = 0;
+    int m_height = 0;
+    int m_channels = 0;
+    bool m_isFinished = false;
+};
 
 SharedPtr<Image> loadImage(AssetCache<TextureCube>& cache, const char* name)
 {
@@ -45,7 +109,12 @@ SharedPtr<Image> loadImage(AssetCache<TextureCube>& cache, const char* name)
     return image;
 }
 
-bool loadGrid(AssetCache<TextureCube>& cache, const char* name, Faces& faces)
+uint64_t countBytes(const Image& image)
+{
+    return uint64_t(image.width()) * uint64_t(image.height()) * uint64_t(image.channelCount());
+}
+
+bool loadGrid(AssetCache<TextureCube>& cache, const char* name, CubeMaker& maker)
 {
     const SharedPtr<Image> image = loadImage(cache, name);
     if (!image)
@@ -67,9 +136,8 @@ bool loadGrid(AssetCache<TextureCube>& cache, const char* name, Faces& faces)
     {
         const int x = cell % GRID_COLUMNS * width;
         const int y = cell / GRID_COLUMNS * height;
-        SharedPtr<Image>& face = faces[std::size_t(GRID_FACES[cell])];
-        face = Image::crop(*image, x, y, width, height);
-        if (!face)
+        const SharedPtr<Image> face = Image::crop(*image, x, y, width, height);
+        if (!face || !maker.addFace(GRID_FACES[cell], *face, name))
             return false;
     }
     return true;
@@ -103,7 +171,7 @@ bool splitNames(const std::string& name, std::array<std::string, TextureCube::FA
     return true;
 }
 
-bool loadSix(AssetCache<TextureCube>& cache, const std::string& name, Faces& faces)
+bool loadSix(AssetCache<TextureCube>& cache, const std::string& name, CubeMaker& maker)
 {
     std::array<std::string, TextureCube::FACE_COUNT> names;
     if (!splitNames(name, names))
@@ -111,23 +179,21 @@ bool loadSix(AssetCache<TextureCube>& cache, const std::string& name, Faces& fac
         ORV_LOG_ERROR("TextureCube name is invalid: %s", name.c_str());
         return false;
     }
+    SharedPtr<Image> image;
     for (std::size_t i = 0; i < names.size(); ++i)
     {
-        faces[i] = loadImage(cache, detail::normalizeAssetName(names[i].c_str()).c_str());
-        if (!faces[i])
-            return false;
-        if (faces[i]->width() != faces[0]->width() || faces[i]->height() != faces[0]->height())
+        const bool isSame = i > 0 && names[i] == names[i - 1];
+        if (!isSame)
         {
-            ORV_LOG_ERROR("TextureCube images must have matching dimensions.");
+            image.reset(); // before there is another
+            image = loadImage(cache, detail::normalizeAssetName(names[i].c_str()).c_str());
+        }
+        else if (!detail::LoadScope::takeTexture(countBytes(*image))) // GL has each face by itself
+        {
             return false;
         }
-        // GL wants one format for all faces, or the cube is incomplete and black.
-        if (faces[i]->channelCount() != faces[0]->channelCount())
-        {
-            ORV_LOG_ERROR("TextureCube image \"%s\" has %d channels, the first one %d.", names[i].c_str(),
-                          faces[i]->channelCount(), faces[0]->channelCount());
+        if (!image || !maker.addFace(TextureCube::Face(i), *image, names[i].c_str()))
             return false;
-        }
     }
     return true;
 }
@@ -146,22 +212,10 @@ SharedPtr<TextureCube> TextureCubeLoader::load(AssetCache<TextureCube>& cache, c
     const detail::LoadScope scope(name);
     const std::string normalized = detail::normalizeAssetName(name);
     const bool isGrid = normalized.find(';') == std::string::npos;
-    Faces faces;
-    if (!(isGrid ? loadGrid(cache, normalized.c_str(), faces) : loadSix(cache, normalized, faces)))
+    CubeMaker maker(static_cast<TextureCubeCache&>(cache));
+    if (!(isGrid ? loadGrid(cache, normalized.c_str(), maker) : loadSix(cache, normalized, maker)))
         return {};
-
-    const auto width = unsigned(faces[0]->width());
-    const auto height = unsigned(faces[0]->height());
-    if (!detail::requireSquareFaces(width, height))
-        return {};
-    const SharedPtr<TextureCube> cube = static_cast<TextureCubeCache&>(cache).create(
-        width, height, Texture::getFormat(faces[0]->channelCount()), Texture::Type::UNSIGNED_BYTE,
-        normalized.c_str());
-    if (!cube)
-        return {};
-    for (std::size_t i = 0; i < faces.size(); ++i)
-        cube->setFace(TextureCube::Face(i), faces[i]->data());
-    return cube->isComplete() ? cube : SharedPtr<TextureCube>();
+    return maker.finish(normalized.c_str());
 }
 
 } // namespace orv

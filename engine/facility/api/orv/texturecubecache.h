@@ -23,6 +23,16 @@ public:
                                   const char* name);
 };
 
+namespace detail
+{
+
+/// As TextureCubeCache::create(), but the cache holds the resource alone; its owner may deallocate it.
+SharedPtr<TextureCube> makeTextureCube(TextureCubeCache& cache, unsigned width, unsigned height,
+                                       Texture::Format format, Texture::Type type,
+                                       const SharedPtr<TextureResource>& resource);
+
+} // namespace detail
+
 /// Whether the cube made of these six images is held.
 ORV_API bool exists(TextureCubeCache& cache, const char* positiveX, const char* negativeX,
                     const char* positiveY, const char* negativeY, const char* positiveZ,

@@ -11,8 +11,8 @@ namespace orv
 ///
 /// A name without ";" is one image, a grid of 3 columns and 2 rows: -x, -z, +x above -y, +y, +z. Otherwise
 /// the name is six image names separated by ";", in the order +x, -x, +y, -y, +z, -z; white space around each
-/// is cut off. All images of one cube have the same size and channel count, and faces are square. Nothing is
-/// created unless everything fits (each refusal is logged).
+/// is cut off. All images of one cube have the same size and channel count, and faces are square. Nothing is left
+/// in GL unless everything fits (each refusal is logged).
 class ORV_API TextureCubeLoader : public AssetLoader<TextureCube>
 {
 public:
