@@ -11,6 +11,8 @@
 #include <array>
 #include <cmath>
 #include <cstdio>
+#include <cstdlib>
+#include <cstring>
 #include <filesystem>
 #include <fstream>
 #include <map>
@@ -161,6 +163,25 @@ TEST(BuiltInAssets, areTheFilesOfTheirFolders)
     const SharedPtr<MemoryStreamSource> source = create_memfilesource_orv();
     for (const char* wrong : {"orv#White.png", "white.png", "luvane#white.png", "orv#"})
         EXPECT_FALSE(source->exists(wrong)) << wrong;
+}
+
+// Fault caught: bytes that exit handlers free before the program's last object has read them.
+TEST(BuiltInAssets, lastUntilTheProcessEnds)
+{
+    static SharedPtr<Stream>* picture; // as a global of the program would hold it
+    const auto readLate = []
+    {
+        unsigned char start[4] = {};
+        (*picture)->read(start, sizeof(start));
+        std::_Exit(std::memcmp(start, "\x89PNG", 4) == 0 ? 0 : 1);
+    };
+    EXPECT_EXIT(
+        {
+            std::atexit(readLate); // runs after what the engine registers from now on
+            picture = new SharedPtr<Stream>(create_memfilesource_orv()->open("orv#white.png", false));
+            std::exit(2);
+        },
+        testing::ExitedWithCode(0), "");
 }
 
 // Fault caught: a picture that other programs do not take for what it should be.

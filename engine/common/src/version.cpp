@@ -65,8 +65,7 @@ const Version& getVersion()
 
 const char* getBuildInfo()
 {
-    static const std::string text = std::string("   Change: ") + CHANGE_ID + "\n";
-    return text.c_str();
+    return "   Change: " ORV_CHANGE_ID "\n";
 }
 
 } // namespace orv

@@ -33,7 +33,8 @@ static_assert(sizeof(Matrix2<float>) == 16 && sizeof(Matrix3<float>) == 36 && si
 /// The integers 0, 1, 2, ..., one for each texture unit that the GL has. A GL that does not answer is asked again.
 const std::vector<GLint>& getUnits()
 {
-    static std::vector<GLint> units;
+    static std::vector<GLint>& units =
+        *new std::vector<GLint>(); // never destroyed: programs may draw until they end
     if (units.empty())
     {
         GLint count = 0;
