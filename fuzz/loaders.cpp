@@ -15,6 +15,7 @@
 #include "orv/fontcache.h"
 #include "orv/glo.h"
 #include "orv/light.h"
+#include "orv/loadlimits.h"
 #include "orv/memorystream.h"
 #include "orv/shaderprogramcache.h"
 #include "orv/solid.h"
@@ -26,6 +27,7 @@
 #include <cmath>
 #include <cstring>
 #include <map>
+#include <set>
 
 namespace hostile
 {
@@ -39,26 +41,37 @@ namespace
 class CountedStream : public MemoryStream
 {
 public:
-    CountedStream(const Bytes& file, size_t& reads)
+    CountedStream(const Bytes& file, size_t& reads, size_t& bytesRead)
         : MemoryStream(file.data(), int(file.size()))
         , m_reads(reads)
+        , m_bytesRead(bytesRead)
     {
     }
 
     int32_t read(void* buffer, unsigned int count) override
     {
         ++m_reads;
-        return MemoryStream::read(buffer, count);
+        const int32_t size = MemoryStream::read(buffer, count);
+        m_bytesRead += size_t(std::max(size, 0));
+        return size;
     }
 
 private:
     size_t& m_reads;
+    size_t& m_bytesRead;
 };
+
+/// What a load may ask for while files are attacked: little, so that small files reach the limits.
+constexpr LoadLimits LIMITS = {1 << 20, 1 << 20, 1 << 18};
+
+constexpr size_t LOADS = 2; ///< in one attack, as a picture and as a cube
+constexpr int MOST_RECORDS = 100;
+constexpr size_t BUILT_IN_BYTES = 49500; ///< of all built-in files, which are read as well
 
 } // namespace
 
 /// The file under attack, under every name that begins with "file." and as the stored binary of "sound.sp$", and
-/// sound ones for it to name.
+/// sound ones for it to name. Names may be spelled with any number of "./" before them.
 class Files : public StreamSource
 {
 public:
@@ -69,7 +82,8 @@ public:
         const Bytes* file = find(name);
         if (!file || writable)
             return {};
-        return makeShared<CountedStream>(*file, m_reads);
+        m_opened.insert(file);
+        return makeShared<CountedStream>(*file, m_reads, m_bytesRead);
     }
 
     const char* getName() const override { return "hostile"; }
@@ -78,13 +92,26 @@ public:
     {
         m_attacker = Bytes(file.begin(), file.end()); // no spare room, so that reading beyond it is found
         m_reads = 0;
+        m_bytesRead = 0;
+        m_opened.clear();
     }
 
     size_t reads() const { return m_reads; }
+    size_t bytesRead() const { return m_bytesRead; }
+
+    /// The bytes of all files that were opened, each once.
+    size_t size() const
+    {
+        size_t bytes = 0;
+        for (const Bytes* file : m_opened)
+            bytes += file->size();
+        return bytes;
+    }
 
 private:
-    const Bytes* find(const std::string& name) const
+    const Bytes* find(std::string name) const
     {
+        name.erase(0, name.find_first_not_of("./"));
         if (name.rfind("file.", 0) == 0 || name == "sound.sp$c")
             return &m_attacker;
         const auto found = m_sound.find(name);
@@ -94,6 +121,8 @@ private:
     const std::map<std::string, Bytes> m_sound = makeSoundFiles();
     Bytes m_attacker;
     size_t m_reads = 0;
+    size_t m_bytesRead = 0;
+    std::set<const Bytes*> m_opened;
 };
 
 namespace
@@ -245,14 +274,16 @@ bool loadDigest(Session& session, const Bytes& file, std::string& fault)
     return loaded;
 }
 
-/// Pixels packed as densely as the format allows, and up to four times them while they are unpacked.
+/// Pixels packed as densely as the format and the limits allow, and up to four times them while they are unpacked.
 size_t getImageHeap(const Bytes& file)
 {
     const auto startsWith = [&file](const char* start)
     { return file.size() >= 4 && std::memcmp(file.data(), start, std::strlen(start)) == 0; };
+    size_t density = startsWith("\xff\xd8") ? 1400 : startsWith("BM") ? 32 : 256;
     if (startsWith("\x89PNG"))
-        return (file.size() > 24 && file[24] >= 8 ? 1032 * 4 : 1032 * 32) * 4;
-    return startsWith("\xff\xd8") ? 1400 * 4 : startsWith("BM") ? 32 * 4 : 256 * 4;
+        density = file.size() > 24 && file[24] >= 8 ? 1032 * 4 : 1032 * 32;
+    const size_t allowed = std::max<size_t>(64, LIMITS.pictureBytes / std::max<size_t>(1, file.size()) + 1);
+    return std::min(density, allowed) * 4;
 }
 
 /// Two bits a pixel become four bytes. What is no PVR file is tried as another image, TGA being the most patient.
@@ -272,10 +303,11 @@ size_t heapOf(const Bytes&)
 
 const std::vector<Loader> LOADERS = {
     {"image", loadImage, getImageHeap, 1 << 17, false},
-    {"cubename", loadCubeName, heapOf<64>, 1 << 17, false},
+    // And a picture of 256 KB, four times over while it is unpacked.
+    {"cubename", loadCubeName, heapOf<64>, 5 << 18, false},
     {"program", loadShaderProgram, heapOf<64>, 1 << 16, false},
     // "property a int 0" takes 16 bytes and makes a uniform, its name and its place in two tables.
-    {"appearance", loadAppearanceFile, heapOf<64>, 1 << 18, false},
+    {"appearance", loadAppearanceFile, heapOf<64>, 5 << 18, false},
     // A solid, of which a file may have as many as bytes.
     {"scene", loadScene, heapOf<600>, 1 << 20, false},
     // The atlas is as large as the size asked for makes it, at most 512 x 4096 here. A point takes three bytes.
@@ -303,6 +335,7 @@ Session::Session()
     , m_pool(makeShared<AssetCachePool>())
     , m_context(makeShared<RenderContext>())
 {
+    setLoadLimits(LIMITS);
     m_pool->registerSource(m_files);
     m_renderer = makeShared<SimpleRenderer>(m_context, m_pool);
 }
@@ -312,6 +345,7 @@ Session::~Session()
     m_renderer.reset();
     m_pool->flush();
     m_pool->flush();
+    setLoadLimits({});
 }
 
 SharedPtr<Stream> Session::openFile()
@@ -324,6 +358,7 @@ std::string Session::attack(const Loader& loader, const Bytes& file)
     const std::string namesBefore = glcalls::describeLiveNames();
     m_files->attackWith(file);
     messages().clear();
+    nulldriver::given() = {};
     heap().start();
     const size_t liveBefore = heap().live;
 
@@ -349,9 +384,39 @@ std::string Session::findFault(const Loader& loader, const Bytes& file, size_t p
     if (m_files->reads() > 64 + 2 * fileSize)
         return std::to_string(m_files->reads()) + " reads of a file of " + std::to_string(fileSize) +
                " bytes";
+    std::string fault = findCost();
+    if (!fault.empty())
+        return fault;
     if (heap().isReported && std::max(peak, heap().largest) > most)
         return "took " + std::to_string(peak) + " bytes, " + std::to_string(heap().largest) +
                " at once, for a file of " + std::to_string(fileSize) + " bytes";
+    return {};
+}
+
+/// What holds for every loader: the work, counted instead of timed, follows from the bytes that were read.
+std::string Session::findCost() const
+{
+    const size_t size = m_files->size();
+    const nulldriver::Given& given = nulldriver::given();
+    const struct
+    {
+        const char* what;
+        size_t count;
+        size_t most;
+    } costs[] = {
+        {"records", size_t(messages().all), LOADS * MOST_RECORDS},
+        {"bytes read", m_files->bytesRead(), LOADS * ((size_t(2) << 20) + 10 * size)},
+        {"bytes of pixels", given.pixels, LOADS * (LIMITS.textureBytes + 63 * size)},
+        {"bytes of vertices", given.vertices, LOADS * size},
+        {"bytes of sources", given.sources, LOADS * (LIMITS.programBytes + size + BUILT_IN_BYTES)},
+        {"blocks of memory", heap().blocks, LOADS * (20000 + size)},
+    };
+    for (const auto& cost : costs)
+    {
+        if (cost.count > cost.most)
+            return std::to_string(cost.count) + " " + cost.what + ", more than " + std::to_string(cost.most) +
+                   ", for files of " + std::to_string(size) + " bytes";
+    }
     return {};
 }
 

@@ -26,7 +26,7 @@ public:
     /// Gives a loader a file, uses what it makes of it and drops that again.
     /// @return what rule was broken, empty for none: a refusal says why (at least one error) and leaves nothing
     /// behind, an asset is sound, every message can be read, no GL name is left when the caches are flushed,
-    /// the heap and the reads are bounded by the file's size.
+    /// the heap, the reads, the log and what GL is given are bounded by the size of the files read.
     std::string attack(const struct Loader& loader, const Bytes& file);
 
     bool wasLoaded() const { return m_loaded; } ///< the file of the last attack
@@ -38,6 +38,7 @@ public:
 
 private:
     std::string findFault(const struct Loader& loader, const Bytes& file, size_t peak) const;
+    std::string findCost() const;
 
     orv::SharedPtr<Files> m_files;
     orv::SharedPtr<orv::AssetCachePool> m_pool;

@@ -41,6 +41,34 @@ void setFailed(GLuint name, bool failed)
         g_failed.erase(name);
 }
 
+Given g_given;
+
+size_t countPixelBytes(GLsizei width, GLsizei height, GLenum format, GLenum type)
+{
+    const size_t channels = format == GL_RGBA              ? 4
+                            : format == GL_RGB             ? 3
+                            : format == GL_LUMINANCE_ALPHA ? 2
+                                                           : 1;
+    return size_t(width) * size_t(height) * (type == GL_UNSIGNED_BYTE ? channels : 2);
+}
+
+void countGiven()
+{
+    glcalls::replace(glTexImage2D, [](GLenum, GLint, GLint, GLsizei width, GLsizei height, GLint,
+                                      GLenum format, GLenum type, const void* pixels)
+                     { g_given.pixels += pixels ? countPixelBytes(width, height, format, type) : 0; });
+    glcalls::replace(glCompressedTexImage2D, [](GLenum, GLint, GLenum, GLsizei, GLsizei, GLint, GLsizei size,
+                                                const void*) { g_given.pixels += size_t(size); });
+    glcalls::replace(glBufferData,
+                     [](GLenum, GLsizeiptr size, const void*, GLenum) { g_given.vertices += size_t(size); });
+    glcalls::replace(glShaderSource,
+                     [](GLuint shader, GLsizei, const GLchar* const* text, const GLint*)
+                     {
+                         g_given.sources += std::strlen(*text);
+                         setFailed(shader, std::strstr(*text, "#error"));
+                     });
+}
+
 void giveVariable(const Variable& variable, GLsizei size, GLint* count, GLenum* type, GLchar* name)
 {
     std::snprintf(name, size_t(size), "%s", variable.name);
@@ -60,6 +88,7 @@ void GL_APIENTRY takeBinary(GLuint program, GLenum format, const void* binary, G
 void install()
 {
     g_failed.clear();
+    g_given = {};
     glcalls::replace(glGenBuffers, makeNames);
     glcalls::replace(glGenTextures, makeNames);
     glcalls::replace(glGenFramebuffers, makeNames);
@@ -71,8 +100,7 @@ void install()
     glcalls::setExtensions("GL_OES_get_program_binary GL_OES_packed_depth_stencil GL_OES_depth_texture");
     glcalls::setProcAddress("glProgramBinaryOES", reinterpret_cast<void (*)()>(&takeBinary));
 
-    glcalls::replace(glShaderSource, [](GLuint shader, GLsizei, const GLchar* const* text, const GLint*)
-                     { setFailed(shader, std::strstr(*text, "#error")); });
+    countGiven();
     glcalls::replace(glGetShaderiv, [](GLuint shader, GLenum name, GLint* value)
                      { *value = name == GL_COMPILE_STATUS && !g_failed.count(shader); });
     glcalls::replace(glGetProgramiv,
@@ -108,6 +136,11 @@ void install()
                          default: *value = 0;
                          }
                      });
+}
+
+Given& given()
+{
+    return g_given;
 }
 
 } // namespace nulldriver

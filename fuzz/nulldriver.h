@@ -1,5 +1,7 @@
 #pragma once
 
+#include <cstddef>
+
 /// A GL that accepts everything and draws nothing, for loading without a context, many thousand times a second.
 namespace nulldriver
 {
@@ -11,5 +13,16 @@ namespace nulldriver
 /// link and have three uniforms, u_float, u_texture and u_cube, and one attribute, a_position. A program binary
 /// is taken if its format is 1 and it starts with "binary".
 void install();
+
+/// What was handed to it, in bytes.
+struct Given
+{
+    size_t pixels = 0;   ///< of textures
+    size_t vertices = 0; ///< and indices
+    size_t sources = 0;  ///< of shaders
+};
+
+/// Since install(), or since whoever last set it to nothing.
+Given& given();
 
 } // namespace nulldriver

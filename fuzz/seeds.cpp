@@ -553,7 +553,100 @@ void addOthers(std::vector<Seed>& seeds)
         seeds.push_back({"digest", std::to_string(size), counting(size, 7), "", size >= 16});
 }
 
+// --- Files that cost ------------------------------------------------------------------------------------------
+
+/// Scans that each go over the whole picture and hold no data, so that the decoder makes it up.
+Bytes makeJpegOfScans(bool isProgressive, int side, int scans)
+{
+    const int last = isProgressive ? 0 : 63;
+    Bytes file =
+        join({{0xff, 0xd8},
+              jpegSegment(0xdb, join({{0}, Bytes(64, 1)})),
+              jpegSegment(isProgressive ? 0xc2 : 0xc0,
+                          join({{8}, big(uint32_t(side), 2), big(uint32_t(side), 2), {1, 1, 0x11, 0}})),
+              jpegCodes(0x00, {0, 0}),
+              jpegCodes(0x10, {1, 1}),
+              jpegScan({1}, 0, last, 0, {})});
+    const Bytes scan = jpegScan({1}, isProgressive ? 1 : 0, 63, 0, {});
+    for (int i = 0; i < scans; ++i)
+        file = join({file, scan});
+    return join({file, {0xff, 0xd9}});
+}
+
+/// A text that says a line over and over, with another number in the place of each "%".
+Bytes repeatLine(const std::string& start, const std::string& line, int count)
+{
+    std::string text = start;
+    for (int i = 0; i < count; ++i)
+    {
+        for (const char c : line)
+            text += c == '%' ? std::to_string(i) : std::string(1, c);
+        text += '\n';
+    }
+    return toBytes(text);
+}
+
+/// A name spelled with more and more "./" before it.
+Bytes repeatSpelling(const std::string& line, const std::string& name, int count)
+{
+    std::string text = "1.0\n";
+    std::string path;
+    for (int i = 0; i < count; ++i, path += "./")
+        text += line + path + name + '\n';
+    return toBytes(text);
+}
+
 } // namespace
+
+std::vector<Seed> makeCostlyFiles()
+{
+    std::vector<Seed> files;
+    const auto add = [&](const char* loader, const char* name, bool loads, const char* error,
+                         const Bytes& file) {
+        files.push_back({loader, name, file, error, loads});
+    };
+    const char* const failed = "Image failed to load texture \"file.png\"";
+    const char* const beyond = "A file of";
+    add("image", "flat", true, "", imagefiles::encodeFlat("png", 512, 512, 4));
+    add("image", "flat, above the limit", false, beyond, imagefiles::encodeFlat("png", 514, 512, 4));
+    add("image", "one bit a pixel", false, beyond,
+        join({{0x89, 'P', 'N', 'G', 13, 10, 26, 10},
+              pngChunk("IHDR", join({big(4096), big(4096), {1, 0, 0, 0, 0}})),
+              pngChunk("IDAT", Bytes(2500)),
+              pngChunk("IEND", {})}));
+    add("image", "progressive scans", false, failed, makeJpegOfScans(true, 512, 400));
+    add("image", "sequential scans", false, failed, makeJpegOfScans(false, 512, 400));
+    add("image", "few scans", true, "", makeJpegOfScans(true, 256, 3));
+
+    add("cubename", "one picture", false,
+        "wide.png;wide.png;wide.png;wide.png;wide.png;wide.png asks for textures",
+        toBytes("wide.png;wide.png;wide.png;wide.png;wide.png;wide.png"));
+    add("cubename", "spellings", false, "wide.png;./wide.png",
+        toBytes("wide.png;./wide.png;././wide.png;./././wide.png;././././wide.png;./././././wide.png"));
+    add("program", "uniforms", true, "ShaderProgram file: file.sp uniform declaration incomplete",
+        repeatLine("1.0\nvertex_source_file sound.vert\nfragment_source_file sound.frag\n", "uniform", 2000));
+
+    const auto addAppearance = [&](const char* name, const char* error, const std::string& line)
+    { add("appearance", name, true, error, repeatLine("1.0\n", line, 2000)); };
+    addAppearance("words", "Appearance file: file.ap unexpected culling mode X", "culling_mode X");
+    addAppearance("line widths", "Appearance file: file.ap unexpected line width 0", "line_width 0");
+    addAppearance("deprecated names", "", "property a Texture2D orv:white.png");
+    addAppearance("missing pictures", "Appearance file: file.ap names 2000 assets",
+                  "property a Texture2D none%.png");
+    addAppearance("itself as a picture", "Image failed to load texture \"file.ap\"",
+                  "property a Texture2D file.ap");
+    addAppearance("itself as a cube", "TextureCube image \"file.ap\" failed",
+                  "property a TextureCube file.ap");
+    addAppearance("itself as a program", "ShaderProgram file: file.ap", "shader_program file.ap");
+    addAppearance("programs", "file.ap asks for shader programs", "shader_program orv#max_pvl.sp$A%");
+    addAppearance("programs that fail", "file.ap asks for shader programs", "shader_program wrong.sp$A%");
+    addAppearance("properties", "", "property a% bool 1");
+    add("appearance", "spellings", true, "file.ap asks for textures of",
+        repeatSpelling("property a Texture2D ", "wide.png", 100));
+    add("appearance", "spellings of itself", true, "Image failed to load texture",
+        repeatSpelling("property a Texture2D ", "file.ap", 300));
+    return files;
+}
 
 std::vector<Seed> makeSeeds()
 {
@@ -575,7 +668,9 @@ std::map<std::string, Bytes> makeSoundFiles()
         {"sound.vert",
          toBytes("attribute vec3 a_position; void main() { gl_Position = vec4(a_position, 1.0); }")},
         {"sound.frag", toBytes("void main() { gl_FragColor = vec4(1.0); }")},
+        {"wide.png", imagefiles::encodeFlat("png", 256, 256, 4)},
         {"wrong.vert", toBytes("#error\n")},
+        {"wrong.sp", toBytes("1.0 vertex_source_file wrong.vert fragment_source_file sound.frag")},
         {"sound.sp", toBytes("1.0 vertex_source_file sound.vert fragment_source_file sound.frag "
                              "uniform u_float TIME uniform u_texture M_A uniform u_cube M_B")},
     };

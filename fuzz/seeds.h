@@ -19,6 +19,9 @@ struct Seed
 /// Small files of every kind, at most 4 KB each, made by the project's own writers.
 std::vector<Seed> makeSeeds();
 
+/// Larger ones that ask for as much as they can: pictures, programs, time, records.
+std::vector<Seed> makeCostlyFiles();
+
 /// Files by name that seeds may refer to.
 std::map<std::string, Bytes> makeSoundFiles();
 

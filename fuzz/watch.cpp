@@ -25,11 +25,13 @@ void Heap::start()
 {
     peak = live;
     largest = 0;
+    blocks = 0;
 }
 
 void Heap::note(const void* block, size_t asked)
 {
     largest = std::max(largest, asked);
+    ++blocks;
     live += block ? malloc_usable_size(const_cast<void*>(block)) : 0;
     peak = std::max(peak, live);
 }
@@ -51,6 +53,7 @@ void Heap::noteGone(const void* block)
         va_start(arguments, format);                                                                         \
         std::vsnprintf(text, sizeof(text), format, arguments);                                               \
         va_end(arguments);                                                                                   \
+        ++hostile::messages().all;                                                                           \
         count(text);                                                                                         \
     }
 

@@ -13,6 +13,7 @@ struct Messages
 {
     int errors = 0;
     int warnings = 0;
+    int all = 0;            ///< of any level
     std::string firstError; ///< its text alone
 
     void clear() { *this = Messages(); }
@@ -27,6 +28,7 @@ struct Heap
     size_t live = 0;
     size_t peak = 0;    ///< of live, since start()
     size_t largest = 0; ///< block asked for since start(), had or not
+    size_t blocks = 0;  ///< asked for since start()
 
     void start();
     void note(const void* block, size_t asked);

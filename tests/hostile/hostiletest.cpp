@@ -10,6 +10,7 @@
 #include "orv/appearance.h"
 #include "orv/filestreamsource.h"
 #include "orv/glo.h"
+#include "orv/log.h"
 #include "orv/scenenode.h"
 #include "orv/shaderprogramcache.h"
 #include "orv/texture2dcache.h"
@@ -110,6 +111,22 @@ TEST_P(HostileTest, seeds)
     EXPECT_LT(0, count);
 }
 
+// Faults caught: costs that do not follow from the size of what is read, see Session::attack().
+TEST_P(HostileTest, costly)
+{
+    Session session;
+    Attack attack(session);
+    for (const Seed& seed : makeCostlyFiles())
+    {
+        if (seed.loader != loader.name)
+            continue;
+        attack(loader, seed.name, seed.file);
+        EXPECT_EQ(seed.loads, session.wasLoaded()) << seed.name << ": " << messages().firstError;
+        EXPECT_EQ(seed.error.empty(), messages().errors == 0) << seed.name << ": " << messages().firstError;
+        EXPECT_EQ(0u, messages().firstError.find(seed.error)) << seed.name << ": " << messages().firstError;
+    }
+}
+
 // Faults caught: whatever a damaged file can do, see Session::attack().
 TEST_P(HostileTest, damage)
 {
@@ -172,6 +189,19 @@ TEST(HostileRules, areNoticedWhenBroken)
              const auto stream = session.openFile();
              for (int i = 0; i < 1000; ++i)
                  stream->read(&i, 0);
+             return true;
+         }},
+        {"201 records, more than 200",
+         [](Session&, const Bytes&, std::string&)
+         {
+             for (int i = 0; i <= 200; ++i)
+                 ORV_LOG_INFO("a record");
+             return true;
+         }},
+        {"4000000 bytes of pixels",
+         [](Session&, const Bytes&, std::string&)
+         {
+             glTexImage2D(GL_TEXTURE_2D, 0, GL_RGBA, 1000, 1000, 0, GL_RGBA, GL_UNSIGNED_BYTE, "");
              return true;
          }},
         {"took 10", [](Session&, const Bytes&, std::string&) { return Bytes(1000000).size() > 0; }},
