@@ -12,7 +12,8 @@ namespace
 const int END_OF_FILE = -1;
 
 // A scan takes as many steps for each of its blocks as it has coefficients, and a few more. The usual ten scans of a
-// progressive file come to some 200 for each block of the picture; what is coded more finely has the bytes to show.
+// progressive file come to some 200 for each block of the picture; what is coded more finely has the bytes to show. A
+// whole file has a bit for each block at the least.
 const uint64_t STEPS_PER_VISIT = 4;
 const uint64_t MOST_STEPS_PER_BLOCK = 224;
 const uint64_t MOST_STEPS_PER_BYTE = 128;
@@ -110,15 +111,17 @@ private:
             most[1] = std::max(most[1], down[i]);
         }
         m_units = divide(width, 8 * most[0]) * divide(height, 8 * most[1]);
-        m_mostSteps = MOST_STEPS_PER_BYTE * m_size;
+        uint64_t blocks = 0;
         for (int i = 0; i < count; ++i)
         {
             Component& component = m_components[i];
             component.blocksOfUnit = across[i] * down[i];
             component.blocks =
                 divide(divide(width * across[i], most[0]), 8) * divide(divide(height * down[i], most[1]), 8);
-            m_mostSteps += MOST_STEPS_PER_BLOCK * m_units * component.blocksOfUnit;
+            blocks += m_units * component.blocksOfUnit;
         }
+        m_mostSteps =
+            MOST_STEPS_PER_BLOCK * std::min(blocks, 8 * uint64_t(m_size)) + MOST_STEPS_PER_BYTE * m_size;
     }
 
     static uint64_t divide(uint64_t count, uint64_t size) { return (count + size - 1) / size; }
