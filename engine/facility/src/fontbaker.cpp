@@ -75,6 +75,8 @@ struct Box
 class Cost
 {
 public:
+    explicit Cost(std::size_t fileSize) : m_mostSteps(FEW_STEPS + STEPS_PER_BYTE * float(fileSize)) {}
+
     /// @return null, or why the glyph must not be drawn.
     const char* add(const stbtt_fontinfo& font, int glyph, const Box& box, float scale)
     {
@@ -106,7 +108,7 @@ public:
         m_edges += edges;
         if (!isNear)
             return "a glyph reaches far out of its box";
-        return edges > MAX_EDGES || m_edges > MAX_ALL_EDGES || m_steps > MAX_STEPS
+        return edges > MAX_EDGES || m_edges > MAX_ALL_EDGES || m_steps > std::min(m_mostSteps, MAX_STEPS)
                    ? "its outlines are too complicated"
                    : nullptr;
     }
@@ -116,6 +118,8 @@ private:
     static constexpr float MAX_EDGES = 16384.0f; ///< of one glyph; the sorting is quadratic at its worst
     static constexpr float MAX_ALL_EDGES = 262144.0f;
     static constexpr float MAX_STEPS = 5.0e7f;
+    static constexpr float FEW_STEPS = 1.0e7f; ///< that any file may take
+    static constexpr float STEPS_PER_BYTE = 100.0f;
 
     /// A curve is halved, which quarters its distance from the straight line, until that is below FLATNESS.
     static float countHalves(const stbtt_vertex& from, const stbtt_vertex& to, float scale)
@@ -125,17 +129,19 @@ private:
         return 2.0f * std::sqrt(std::hypot(dx, dy) * 0.25f * scale / FLATNESS);
     }
 
+    const float m_mostSteps;
     float m_edges = 0.0f;
     float m_steps = 0.0f;
 };
 
 /// Finds the bitmap's height by packing all glyphs, and that they can be drawn at a bearable price.
 /// @return null, or why not.
-const char* findHeight(const stbtt_fontinfo& font, float scale, int maxHeight, int& height)
+const char* findHeight(const stbtt_fontinfo& font, std::size_t fileSize, float scale, int maxHeight,
+                       int& height)
 {
     Packing described(2);
     Packing rasterisers(1); // closer, which can make rows higher
-    Cost cost;
+    Cost cost(fileSize);
     int needed = 0;
     for (int i = 0; i < BakedFont::CHAR_COUNT; ++i)
     {
@@ -179,7 +185,7 @@ const char* bakeFont(const unsigned char* file, std::size_t size, int pixelSize,
 
     const float scale = stbtt_ScaleForPixelHeight(&info, float(pixelSize));
     int height = 0;
-    if (const char* reason = findHeight(info, scale, std::min(maxHeight, MAX_HEIGHT), height))
+    if (const char* reason = findHeight(info, size, scale, std::min(maxHeight, MAX_HEIGHT), height))
         return reason;
     std::unique_ptr<unsigned char[]> bitmap(
         new (std::nothrow) unsigned char[std::size_t(BakedFont::WIDTH) * std::size_t(height)]());
