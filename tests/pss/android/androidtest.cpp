@@ -1,6 +1,7 @@
 // Runs against the real Android log and asset libraries.
 
 #include "orv/assetmgrstreamsource.h"
+#include "orv/detail/logbudget.h"
 #include "orv/log.h"
 
 #include "storedzip.h"
@@ -123,6 +124,18 @@ TEST_F(AssetMgrStreamSourceTest, whatIsMissingIsReportedUnderItsOwnTag)
     ASSERT_EQ(2u, g_records.size());
     EXPECT_EQ(0u, g_records[1].find("6 ORV: "));
     EXPECT_NE(std::string::npos, g_records[1].find("; Cannot open a ZIP stream for writing"));
+}
+
+// Fault caught: a record for each asset that a file names and the package lacks.
+TEST_F(AssetMgrStreamSourceTest, fewRecordsOfOneLoad)
+{
+    {
+        const detail::LogBudget budget("a.ap");
+        for (int i = 0; i < 1000; ++i)
+            EXPECT_FALSE(m_source.exists("outside"));
+    }
+    ASSERT_EQ(9u, g_records.size());
+    EXPECT_NE(std::string::npos, g_records[8].find("992 more records like this while loading a.ap"));
 }
 
 // Fault caught: an asset that stays open with its mapping when its stream goes.

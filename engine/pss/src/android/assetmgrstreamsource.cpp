@@ -1,5 +1,6 @@
 #include "orv/assetmgrstreamsource.h"
 
+#include "orv/detail/logbudget.h"
 #include "orv/log.h"
 
 #include <android/asset_manager.h>
@@ -66,8 +67,10 @@ bool AssetMgrStreamSource::exists(const char* name) const
     AAsset* asset = AAssetManager_open(m_manager, name, AASSET_MODE_UNKNOWN);
     if (!asset)
     {
-        __android_log_print(ANDROID_LOG_INFO, LOG_TAG_ASSETS,
-                            "AssetMgrStreamSource %s  could not load from apk/assets folder", name);
+        // A file may name as many assets that are not there as it has room for.
+        if (detail::LogBudget::mayWrite(pssLogInfo, "assetmgrstreamsource", __func__, __LINE__))
+            __android_log_print(ANDROID_LOG_INFO, LOG_TAG_ASSETS,
+                                "AssetMgrStreamSource %s  could not load from apk/assets folder", name);
         return false;
     }
     AAsset_close(asset);
