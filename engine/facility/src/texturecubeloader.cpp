@@ -4,6 +4,7 @@
 #include "orv/detail/loadscope.h"
 #include "orv/image.h"
 #include "orv/log.h"
+#include "orv/renderdevice.h"
 #include "orv/stream.h"
 #include "orv/texturecubecache.h"
 
@@ -34,8 +35,10 @@ public:
     /// A cube that did not come to be leaves no name in GL.
     ~CubeMaker()
     {
-        if (m_resource && !m_isFinished)
-            m_resource->deallocate();
+        if (!m_resource || m_isFinished)
+            return;
+        m_resource->deallocate();
+        RenderDevice::getError(false); // of a face that GL refused before another was found not to fit
     }
 
     /// @param name  of the picture, for messages.
