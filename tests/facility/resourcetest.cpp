@@ -104,6 +104,30 @@ TEST_F(ResourceTest, flushDeletesWhatOnlyTheCacheHolds)
     glDeleteProgram(lostName);
 }
 
+// Fault caught: a program that fails to start, whose log is full of assertions about what it left behind.
+TEST_F(ResourceTest, droppingACacheTellsOnceWhatIsLeft)
+{
+    auto cache = makeShared<detail::ResourceCache>();
+    const auto held = makeShared<TextureResource>();
+    cache->add(held);
+    for (int i = 0; i < 30; ++i)
+    {
+        const auto texture = makeShared<TextureResource>();
+        cache->add(texture);
+        texture->allocate();
+    }
+    held->allocate();
+    LogCapture log;
+    cache = nullptr;
+    EXPECT_EQ(1, log.countMessage("ORV_ASSERT: m_state != Resource::ALLOCATED"));
+    EXPECT_TRUE(log.contains("left behind: 30;")) << log.text();
+    EXPECT_EQ(2, log.count('E'));
+    EXPECT_EQ(31u, glcalls::liveNames(glcalls::Kind::TEXTURE).size());
+    held->deallocate();
+    for (const GLuint name : glcalls::liveNames(glcalls::Kind::TEXTURE))
+        glDeleteTextures(1, &name);
+}
+
 TEST_F(ResourceTest, droppingALiveObjectIsLogged)
 {
     GLuint name = 0;

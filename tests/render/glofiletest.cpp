@@ -211,6 +211,7 @@ TEST_F(GloFileTest, filesInDirectories)
     EXPECT_FALSE(loadGloFile(*m_pool, m_root, "spare.glo"));
     EXPECT_FALSE(loadGloFile(*m_pool, m_root, "missing.glo"));
     EXPECT_EQ(1, log.countMessage("GLO file missing.glo cannot be opened"));
+    EXPECT_TRUE(log.contains(", GloTestSource")) << log.text();
 
     for (size_t length = 0; length < whole.size(); length += 7)
     {

@@ -85,6 +85,11 @@ SharedPtr<Stream> AssetCachePool::getStream(const char* name) const
     return m_assetPath->find(name);
 }
 
+std::string AssetCachePool::describePath() const
+{
+    return m_assetPath->describe();
+}
+
 SharedPtr<Stream> AssetCachePool::getCacheStream(const char* name, bool writable) const
 {
     if (!m_cacheSource)

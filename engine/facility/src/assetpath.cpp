@@ -69,6 +69,17 @@ SharedPtr<Stream> AssetPath::find(const char* name) const
     return {};
 }
 
+std::string AssetPath::describe() const
+{
+    std::string names;
+    for (const SharedPtr<StreamSource>& source : m_sources)
+    {
+        if (source)
+            names.append(names.empty() ? "" : ", ").append(source->getName());
+    }
+    return names;
+}
+
 void AssetPath::setCacheDirectory(const char* directory)
 {
     m_cacheDirectory = directory ? directory : "";

@@ -123,7 +123,21 @@ void TextureResource::doDeallocate(unsigned int name)
     glDeleteTextures(1, &name);
 }
 
-ResourceCache::~ResourceCache() = default;
+ResourceCache::~ResourceCache()
+{
+    // Each resource that dies with its GL object asserts. One record will do; of the others it is said how many.
+    int lost = 0;
+    for (const SharedPtr<Resource>& resource : m_resources)
+    {
+        const bool isLost = resource->sharedGetCount() == 1 && resource->getState() == Resource::ALLOCATED;
+        if (isLost && ++lost > 1)
+            resource->release();
+    }
+    m_resources.clear();
+    if (lost > 0)
+        ORV_LOG_ERROR("OpenGL objects of one cache left behind: %d; flush() the pool before dropping it",
+                      lost);
+}
 
 void ResourceCache::add(const SharedPtr<Resource>& resource)
 {

@@ -4,6 +4,8 @@
 #include "orv/export.h"
 #include "orv/sharedptr.h"
 
+#include <string>
+
 namespace orv
 {
 
@@ -42,7 +44,11 @@ public:
     /// Opens a file by its exact name. @return empty if no source has it.
     SharedPtr<Stream> getStream(const char* name) const;
 
-    /// Opens a file of derived data; for writing, the source makes the folders of its name. @return empty without a cache source or where it cannot be opened.
+    /// The names of the sources in the order in which getStream() asks them, for messages.
+    std::string describePath() const;
+
+    /// Opens a file of derived data; for writing, the source makes the folders of its name.
+    /// @return empty without a cache source or where it cannot be opened.
     SharedPtr<Stream> getCacheStream(const char* name, bool writable) const;
 
     /// Drops the assets that only the caches hold and deletes GL objects that nobody uses.

@@ -43,6 +43,9 @@ public:
     /// @return empty if no source has it, or if that first source then fails to open it.
     SharedPtr<Stream> find(const char* name) const;
 
+    /// The names of the sources in order, with ", " between them, for messages.
+    std::string describe() const;
+
     /// Stored for the application; the engine does not use it.
     void setCacheDirectory(const char* directory);
     const char* getCacheDirectory() const { return m_cacheDirectory.c_str(); }

@@ -43,7 +43,8 @@ public:
     /// Opens a file on the cache's path. @return empty if it is nowhere on it.
     SharedPtr<Stream> getStream(const char* name) const;
 
-    /// Opens a file of derived data; for writing, the source makes the folders of its name. @return empty without a cache source or where the source cannot open it.
+    /// Opens a file of derived data; for writing, the source makes the folders of its name.
+    /// @return empty without a cache source or where the source cannot open it.
     SharedPtr<Stream> getCacheStream(const char* name, bool writable) const;
 
     const SharedPtr<ResourceCache>& getResourceCache() const { return m_resourceCache; }

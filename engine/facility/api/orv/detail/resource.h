@@ -128,7 +128,7 @@ protected:
 /// The GL objects of one asset cache, in the order added.
 ///
 /// A resource is added before it is allocated, so that it is tracked even where that fails. Dropping the cache
-/// makes no GL calls.
+/// makes no GL calls; the first of the GL objects that are left behind by that is logged, and the number of the others.
 class ResourceCache : public Shared
 {
 public:
