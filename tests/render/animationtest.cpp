@@ -78,6 +78,24 @@ TEST(Animation, groupSpansItsMembers)
     EXPECT_EQ(1, log.countMessage("Index 2 exceeds animation count 2."));
 }
 
+// Fault caught: a group within itself, which is applied until the stack ends and never dies.
+TEST(Animation, groupDoesNotTakeItself)
+{
+    const auto outer = makeShared<AnimationGroup>();
+    const auto middle = makeShared<AnimationGroup>();
+    const auto inner = makeShared<AnimationGroup>();
+    outer->addAnimation(middle);
+    outer->addAnimation(inner);
+    middle->addAnimation(inner);
+    support::LogCapture log;
+    for (const auto& [group, added] :
+         {std::pair(outer, outer), std::pair(inner, outer), std::pair(inner, middle)})
+        group->addAnimation(added);
+    EXPECT_EQ(3, log.count('E')) << log.text();
+    EXPECT_EQ(2, outer->getAnimationCount());
+    EXPECT_EQ(0, inner->getAnimationCount());
+}
+
 // Fault caught: the loop's ends, its entry, or its direction off by one case; an endless loop over huge steps.
 TEST(Animation, controllerAdvances)
 {

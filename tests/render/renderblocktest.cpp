@@ -54,6 +54,19 @@ TEST_F(RenderBlockTest, keepsBuffersThatItIsNotToClear)
     EXPECT_EQ(9.0f, camera->getStereoFocalDistance());
 }
 
+// Fault caught: a group within itself, which is drawn until the stack ends and never dies.
+TEST_F(RenderBlockTest, groupDoesNotTakeItself)
+{
+    const auto outer = makeShared<RenderBlockGroup>();
+    const auto inner = makeShared<RenderBlockGroup>();
+    outer->addBlock(inner);
+    support::LogCapture log;
+    outer->addBlock(outer);
+    inner->addBlock(outer);
+    EXPECT_EQ(2, log.count('E')) << log.text();
+    outer->render();
+}
+
 // Fault caught: a block that draws nothing, or into a corner, because nobody gave it a viewport.
 TEST_F(RenderBlockTest, drawsToTheWholeTargetUnlessTold)
 {

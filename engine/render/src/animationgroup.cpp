@@ -14,7 +14,19 @@ void AnimationGroup::addAnimation(const Animation::Ptr& animation)
         ORV_LOG_ERROR("Cannot add an empty animation to a group.");
         return;
     }
+    if (animation->contains(*this))
+    {
+        ORV_LOG_ERROR("Cannot add an animation to a group that it contains.");
+        return;
+    }
     m_animations.push_back(animation);
+}
+
+bool AnimationGroup::contains(const Animation& other) const
+{
+    return this == &other ||
+           std::any_of(m_animations.begin(), m_animations.end(),
+                       [&other](const Animation::Ptr& animation) { return animation->contains(other); });
 }
 
 Animation::Ptr AnimationGroup::getAnimation(int index) const

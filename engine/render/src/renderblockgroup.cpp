@@ -14,7 +14,19 @@ void RenderBlockGroup::addBlock(const SharedPtr<RenderBlockBase>& block)
         ORV_LOG_ERROR("Cannot add an empty render block to a group.");
         return;
     }
+    if (block->contains(*this))
+    {
+        ORV_LOG_ERROR("Cannot add a render block to a group that it contains.");
+        return;
+    }
     m_blocks.push_back(block);
+}
+
+bool RenderBlockGroup::contains(const RenderBlockBase& other) const
+{
+    return this == &other ||
+           std::any_of(m_blocks.begin(), m_blocks.end(),
+                       [&other](const SharedPtr<RenderBlockBase>& block) { return block->contains(other); });
 }
 
 void RenderBlockGroup::removeBlock(const SharedPtr<RenderBlockBase>& block)

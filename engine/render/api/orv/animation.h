@@ -16,6 +16,10 @@ public:
     virtual void apply(float progress) = 0;
     virtual float getStart() const = 0;
     virtual float getEnd() const = 0;
+
+    /// Whether applying this applies other: true for itself, for a group also for its members' members. A class that
+    /// holds further animations asks them.
+    virtual bool contains(const Animation& other) const { return this == &other; }
 };
 
 /// End minus start, never below 0.

@@ -14,7 +14,8 @@ public:
     ORV_CLASS_NAME("AnimationGroup")
     using Ptr = SharedPtr<AnimationGroup>;
 
-    void addAnimation(const Animation::Ptr& animation); ///< an empty one is refused with an error
+    /// Appends. Refused with an error is an empty one and one that contains this group, which would never be done.
+    void addAnimation(const Animation::Ptr& animation);
     int getAnimationCount() const { return static_cast<int>(m_animations.size()); }
     /// @param index  not negative (unchecked).
     /// @return empty, after logging an error, for an index that is not below the count.
@@ -23,6 +24,7 @@ public:
     void apply(float progress) override;
     float getStart() const override; ///< the earliest of the members', 0 without members
     float getEnd() const override;   ///< the latest of the members', 0 without members
+    bool contains(const Animation& other) const override;
 
 private:
     std::vector<Animation::Ptr> m_animations;

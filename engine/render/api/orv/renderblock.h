@@ -25,6 +25,10 @@ public:
     /// @param time  absolute, in seconds.
     virtual void update(float time) = 0;
     virtual void setStereo(float focalDistance, float eyeSeparation) = 0;
+
+    /// Whether rendering this renders other: true for itself, for a group also for its members' members. A class
+    /// that holds further blocks asks them.
+    virtual bool contains(const RenderBlockBase& other) const { return this == &other; }
 };
 
 /// One view of a scene: a renderer, the scene, a camera, where to draw, and what to clear first.

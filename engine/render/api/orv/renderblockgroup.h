@@ -14,13 +14,14 @@ public:
     ORV_CLASS_NAME("RenderBlockGroup")
     using Ptr = SharedPtr<RenderBlockGroup>;
 
-    void
-    addBlock(const SharedPtr<RenderBlockBase>& block); ///< appends; an empty one is refused with an error
+    /// Appends. Refused with an error is an empty one and one that contains this group, which would never be done.
+    void addBlock(const SharedPtr<RenderBlockBase>& block);
     void removeBlock(const SharedPtr<RenderBlockBase>& block); ///< every occurrence; unknown ones are ignored
 
     void render() override;
     void update(float time) override;
     void setStereo(float focalDistance, float eyeSeparation) override;
+    bool contains(const RenderBlockBase& other) const override;
 
 private:
     std::vector<SharedPtr<RenderBlockBase>> m_blocks;
