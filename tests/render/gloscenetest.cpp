@@ -527,6 +527,10 @@ TEST_F(GloSceneTest, skins)
     EXPECT_TRUE(hasProgram(skinned, "orv#max_pvl.sp$DIFF$SKIN"));
     EXPECT_TRUE(
         hasProgram(asSolid(*node->getChild(0)).getAppearance(), "orv#max_pvl.sp$DIFF$SPEC$AMBI$EMIS$SKIN"));
+    EXPECT_EQ(plain, loaded->getAppearance("red", false));
+    EXPECT_EQ(skinned, loaded->getAppearance("red", true));
+    EXPECT_FALSE(loaded->getAppearance("blue", true));
+    EXPECT_TRUE(loaded->getAppearance("blue", false));
     EXPECT_EQ(getFloat(*plain, "M_SHININESS"), getFloat(*skinned, "M_SHININESS"));
     loaded->getAnimationGroup()->apply(0.0f);
     plain->setProperty<float>("M_OPACITY", 0.0f);

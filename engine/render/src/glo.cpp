@@ -77,10 +77,20 @@ SharedPtr<Light> Glo::getLight(const char* name) const
     return find(m_lights, name);
 }
 
+SharedPtr<Appearance> Glo::find(const Appearances& all, const char* name)
+{
+    const auto found = name ? all.find(name) : all.end();
+    return found != all.end() ? found->second : SharedPtr<Appearance>();
+}
+
 SharedPtr<Appearance> Glo::getAppearance(const char* name) const
 {
-    const auto found = name ? m_appearances.find(name) : m_appearances.end();
-    return found != m_appearances.end() ? found->second : SharedPtr<Appearance>();
+    return find(m_appearances, name);
+}
+
+SharedPtr<Appearance> Glo::getAppearance(const char* name, bool skinned) const
+{
+    return find(m_kinds[skinned ? 1 : 0], name);
 }
 
 } // namespace orv

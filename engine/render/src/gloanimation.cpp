@@ -162,7 +162,7 @@ bool addMaterialChannels(const std::vector<AnimationKey<T>>& keys, const Materia
         material.reach(property.name, key.value);
     const SharedPtr<AnimatedValue<T>> value = makeShared<AnimationKeySequence<T>>(keys);
     material.forEachAppearance(
-        [&](const SharedPtr<Appearance>& appearance)
+        [&](const SharedPtr<Appearance>& appearance, bool)
         {
             const auto animator = makeShared<AppearancePropertyAnimator<T>>(appearance, property.property);
             group.addAnimation(createAnimationChannel<T>(value, animator));

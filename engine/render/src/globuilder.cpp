@@ -92,6 +92,9 @@ SharedPtr<Glo> GloBuilder::build(const SharedPtr<SceneNode>& parent, bool measur
     {
         material.choosePrograms();
         m_glo->m_appearances[name] = material.getAppearance();
+        const std::string& key = name;
+        material.forEachAppearance([&](const SharedPtr<Appearance>& appearance, bool skinned)
+                                   { m_glo->m_kinds[skinned ? 1 : 0][key] = appearance; });
     }
 
     if (top)

@@ -112,10 +112,11 @@ SharedPtr<Appearance> GloMaterial::use(bool skinned)
     return m_uses.emplace_back(Use{skinned, copy}).appearance;
 }
 
-void GloMaterial::forEachAppearance(const std::function<void(const SharedPtr<Appearance>&)>& use) const
+void GloMaterial::forEachAppearance(
+    const std::function<void(const SharedPtr<Appearance>&, bool skinned)>& use) const
 {
     for (const Use& known : m_uses)
-        use(known.appearance);
+        use(known.appearance, known.skinned);
 }
 
 void GloMaterial::setValues(Appearance& appearance) const

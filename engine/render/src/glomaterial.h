@@ -33,8 +33,8 @@ public:
     /// The one that goes by the material's name; empty when there was no memory for it.
     const SharedPtr<Appearance>& getAppearance() const { return m_uses.front().appearance; }
 
-    /// Calls use with each appearance that there is.
-    void forEachAppearance(const std::function<void(const SharedPtr<Appearance>&)>& use) const;
+    /// Calls use with each appearance that there is, and whether it is for skinned geometry.
+    void forEachAppearance(const std::function<void(const SharedPtr<Appearance>&, bool skinned)>& use) const;
 
     /// A key of an animation: the programs and the blending are chosen for all that the material comes to.
     /// @param property  of the channel, "diffuse" or "opacity".

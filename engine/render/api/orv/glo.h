@@ -72,10 +72,15 @@ public:
     SharedPtr<Camera> getCamera(const char* name) const;
     SharedPtr<Light> getLight(const char* name) const;
 
-    /// The appearance of the material of that name.
+    /// The appearance of the material of that name. A material that plain and skinned geometry share has two, since
+    /// these need different programs; this is the one of the geometry that comes first in the tree.
     SharedPtr<Appearance> getAppearance(const char* name) const;
 
-    /// All appearances, by material name.
+    /// The one of the two for skinned or for plain geometry. Empty if the material is on no such geometry; one that is
+    /// on none at all counts as plain.
+    SharedPtr<Appearance> getAppearance(const char* name, bool skinned) const;
+
+    /// What getAppearance(name) finds, for all materials.
     const std::map<std::string, SharedPtr<Appearance>, std::less<>>& getAppearances() const
     {
         return m_appearances;
@@ -112,13 +117,19 @@ private:
     float m_loopEnd = 0.0f;
     std::vector<Placed<Camera>> m_cameras;
     std::vector<Placed<Light>> m_lights;
-    std::map<std::string, SharedPtr<Appearance>, std::less<>> m_appearances;
+    using Appearances = std::map<std::string, SharedPtr<Appearance>, std::less<>>;
+
+    static SharedPtr<Appearance> find(const Appearances& all, const char* name);
+
+    Appearances m_appearances;
+    Appearances m_kinds[2]; ///< for plain, for skinned geometry
 };
 
 /// Loads a scene file and hangs its tree under a node.
 ///
 /// Textures and shader programs come from the pool by name; buffers, meshes and appearances are made anew by
-/// every load. Where a name in the file is borne by several nodes, the first in the order of the tree is meant.
+/// every load. Where a name in the file is borne by several nodes, the first in the order of the tree is meant; of
+/// geometries, skins, lights and cameras the first in the file; of materials the last.
 /// GL thread only.
 ///
 /// @param parent  gets the top node as its last child; empty: the tree is a root that only the result holds.
