@@ -244,6 +244,8 @@ TEST_F(AppearanceTest, feedsTheProgram)
     EXPECT_EQ(8.0f, getSent(*m_appearance->getShaderProgram(), "u_b"));
     EXPECT_EQ((Values{3, 4, 3}), draw(*other));
 
+    const RenderContext::DrawScope scope(*m_context);
+    other->enable(*m_context);
     EXPECT_EQ(Calls{}, callsOf([&] { other->enable(*m_context); }));
     program->enable(*m_context); // nothing of the appearance stays behind
     EXPECT_EQ(9.0f, getSent(*program, "u_b"));

@@ -88,6 +88,7 @@ TEST_F(IndexBufferTest, drawsFromMemoryThenFromGl)
 TEST_F(IndexBufferTest, drawPathBindsOnChangeOnly)
 {
     const auto context = makeShared<RenderContext>();
+    const RenderContext::DrawScope scope(*context);
     const IndexBuffer::Ptr committed = cache->create(Primitive::TRIANGLES, 6, INDICES, nullptr);
     committed->commit();
     const IndexBuffer::Ptr inMemory = cache->create(Primitive::LINES, 6, INDICES, nullptr);

@@ -3,6 +3,7 @@
 #include "facilitytest.h"
 
 #include <functional>
+#include <memory>
 
 using namespace orv;
 using support::LogCapture;
@@ -208,6 +209,7 @@ TEST_F(RenderContextTest, bindingsAreSentOnceUntilTheyChangeElsewhere)
     const std::string bindTexture = "glBindTexture(0x0de1, " + std::to_string(texture) + ")";
     const std::string bufferText = std::to_string(buffer);
     auto target = makeShared<RenderContext>();
+    auto scope = std::make_unique<RenderContext::DrawScope>(*target);
     const Step steps[] = {
         {[&](auto& c) { c.bindTexture(1, GL_TEXTURE_2D, texture); },
          {"glActiveTexture(0x84c1)", bindTexture}},
@@ -233,6 +235,16 @@ TEST_F(RenderContextTest, bindingsAreSentOnceUntilTheyChangeElsewhere)
               callsOf([&] { target->bindTexture(1, GL_TEXTURE_2D, texture); }));
     EXPECT_EQ(Calls{"glUseProgram(0)"}, callsOf([&] { target->useProgram(0); }));
 
+    target->forgetBindings();
+    EXPECT_EQ(Calls{"glUseProgram(0)"}, callsOf([&] { target->useProgram(0); }));
+    scope = nullptr;
+    for (int i = 0; i < 2; ++i) // outside nothing is trusted
+    {
+        EXPECT_EQ(Calls{"glUseProgram(0)"}, callsOf([&] { target->useProgram(0); }));
+        target->setVertexInputBound(5, 6);
+        EXPECT_FALSE(target->isVertexInputBound(5, 6));
+    }
+
     target = makeShared<RenderContext>();
     EXPECT_EQ(Calls{"glUseProgram(0)"}, callsOf([&] { target->useProgram(0); }));
     glDeleteTextures(1, &texture);
@@ -243,6 +255,7 @@ TEST_F(RenderContextTest, bindingsAreSentOnceUntilTheyChangeElsewhere)
 TEST_F(RenderContextTest, attributeArraysAreSwitchedByDifference)
 {
     RenderContext target;
+    const RenderContext::DrawScope scope(target);
     glEnableVertexAttribArray(7);
     target.setAttribArrays(0b0111u);
     for (GLuint i = 0; i < 8; ++i)

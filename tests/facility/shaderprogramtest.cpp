@@ -129,6 +129,7 @@ TEST_F(ShaderProgramTest, learnsUniformsAndGivesSamplersTheirUnits)
 // Fault caught: a type of the table sent by the wrong call, with the wrong count, or not at all.
 TEST_F(ShaderProgramTest, sendsEveryTypeOnce)
 {
+    const RenderContext::DrawScope scope(*m_renderContext);
     using M2 = Matrix2<float>;
     const Vector3f one(1, 2, 3), two(4, 5, 6), three(7, 8, 9);
     const Vector4f row(1, 2, 3, 4);
@@ -226,6 +227,7 @@ TEST_F(ShaderProgramTest, linksAgainWhenTheContextChanges)
 // Fault caught: a remembered texture binding that something else has taken.
 TEST_F(ShaderProgramTest, programsInTurnShowTheirOwnTextures)
 {
+    const RenderContext::DrawScope scope(*m_renderContext);
     const SharedPtr<ShaderProgram> programs[] = {makeProgram(TEXTURED, "T"), makeProgram(TEXTURED, "T")};
     const Rgba colours[] = {{255, 0, 0}, {0, 255, 0}};
     const SharedPtr<Texture2D> textures[] = {makeTexture(colours[0]), makeTexture(colours[1])};
@@ -327,6 +329,15 @@ TEST_F(ShaderProgramTest, plainBindDisablesWhatIsLeftOver)
     const Calls calls = callsOf([&] { programs[1]->bind(*m_square); });
     for (const char* call : {"glDisableVertexAttribArray(3)", "glDisableVertexAttribArray(4)"})
         EXPECT_EQ(1, std::count(calls.begin(), calls.end(), call)) << call;
+
+    programs[0]->bind(*m_renderContext, *m_square); // the draw path counts as well
+    programs[1]->bind(*m_square);
+    for (const GLuint location : {3u, 4u})
+    {
+        GLint enabled = 1;
+        glGetVertexAttribiv(location, GL_VERTEX_ATTRIB_ARRAY_ENABLED, &enabled);
+        EXPECT_EQ(0, enabled) << location;
+    }
 }
 
 // Fault caught: GL calls with names of a context that is lost.

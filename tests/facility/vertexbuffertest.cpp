@@ -144,6 +144,7 @@ TEST_F(VertexBufferTest, drawPathSetsUpOnlyWhatChanged)
     other->addAttrib(makeFloats(3, {0, 0, 0}), "a_position", Format::FLOAT, Usage::GL_BUFFER, false);
     other->commit();
     const auto context = makeShared<RenderContext>();
+    const RenderContext::DrawScope scope(*context);
     const detail::ProgramAttrib attribs[] = {{"a_position", 0}, {"a_uv0", 1}, {"a_colour", 2}};
     const auto callsOfBind = [&](VertexBuffer& bound, uint64_t program)
     { return callsOf([&] { bound.bindAttribs(*context, program, attribs, 3); }).size(); };

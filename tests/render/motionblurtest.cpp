@@ -198,7 +198,7 @@ TEST_F(MotionBlurTest, skinnedSolidsTakeTheCurrentProgram)
     glcalls::startRecording();
     const Picture picture = drawVelocities();
     glcalls::stopRecording();
-    EXPECT_TRUE(glcalls::recorded("glUseProgram").empty());
+    EXPECT_EQ(1u, glcalls::recorded("glUseProgram").size()) << "that of the square";
     EXPECT_EQ((std::vector<std::string>{"glDrawElements(0x0004, 6, 0x1403, 0)",
                                         "glDrawElements(0x0004, 36, 0x1403, 0)"}),
               glcalls::recorded("glDrawElements"));

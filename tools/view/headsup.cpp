@@ -112,6 +112,7 @@ void HeadsUp::draw(int width, int height)
     m_context->setViewport(0, 0, width, height);
     if (m_changed)
         layOut();
+    const orv::RenderContext::DrawScope scope(*m_context);
     if (!m_rows.empty())
         m_panel.enable(*m_context); // the table is read, not looked through
     m_shadow->draw(*m_context);

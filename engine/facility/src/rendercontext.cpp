@@ -2,6 +2,7 @@
 
 #include "orv/detail/revision.h"
 #include "orv/log.h"
+#include "orv/renderdevice.h"
 #include "orv/shaderuniform.h"
 
 #include <GLES2/gl2.h>
@@ -43,6 +44,19 @@ WindingOrder turned(WindingOrder order)
 }
 
 } // namespace
+
+RenderContext::DrawScope::DrawScope(RenderContext& context) : m_context(context)
+{
+    ++m_context.m_drawScopes;
+    m_context.forgetBindings();
+}
+
+RenderContext::DrawScope::~DrawScope()
+{
+    m_context.tidyBindings();
+    if (--m_context.m_drawScopes == 0)
+        m_context.forgetBindings();
+}
 
 RenderContext::RenderContext()
     : m_revision(detail::nextRevision())
@@ -400,10 +414,13 @@ void RenderContext::applyChanged(const RenderState& state, uint64_t stateRevisio
 
 unsigned RenderContext::getProgramInUse() const
 {
-    if (m_epoch == detail::g_bindingEpoch && m_program != UNKNOWN)
+    const bool isKnown = m_epoch == detail::g_bindingEpoch;
+    if (isKnown && m_program != UNKNOWN)
         return m_program;
     GLint program = 0;
     glGetIntegerv(GL_CURRENT_PROGRAM, &program);
+    if (isKnown)
+        m_program = unsigned(program);
     return unsigned(program);
 }
 
@@ -420,7 +437,7 @@ void RenderContext::setAttribOnes(unsigned location)
 
 void RenderContext::forgetBindings()
 {
-    m_epoch = detail::g_bindingEpoch;
+    m_epoch = m_drawScopes != 0 ? detail::g_bindingEpoch : NO_EPOCH;
     m_attribArraysKnown = false;
     m_attribOnes = 0;
     m_inputProgram = 0;
@@ -433,6 +450,19 @@ void RenderContext::forgetBindings()
     std::fill(std::begin(m_textures), std::end(m_textures), UNKNOWN);
 }
 
+/// What is left on would be read by the application's own draws, from buffers that may be gone by then.
+void RenderContext::tidyBindings()
+{
+    if (!m_bindingsUsed)
+        return;
+    setAttribArrays(0);
+    bindArrayBuffer(0);
+    bindElementBuffer(0);
+    if (m_activeUnit != 0)
+        selectUnit(0);
+    m_bindingsUsed = false;
+}
+
 void RenderContext::sendProgram(unsigned name)
 {
     glUseProgram(name);
@@ -443,36 +473,42 @@ void RenderContext::sendProgram(unsigned name)
 void RenderContext::sendTexture(int unit, unsigned target, unsigned name, int slot)
 {
     if (m_activeUnit != unsigned(unit))
-    {
-        glActiveTexture(GL_TEXTURE0 + unsigned(unit));
-        m_activeUnit = unsigned(unit);
-    }
+        selectUnit(unsigned(unit));
     glBindTexture(target, name);
     if (slot >= 0)
         m_textures[slot] = name;
 }
 
+void RenderContext::selectUnit(unsigned unit)
+{
+    glActiveTexture(GL_TEXTURE0 + unit);
+    m_activeUnit = unit;
+    m_bindingsUsed = true;
+}
+
 void RenderContext::sendArrayBuffer(unsigned name)
 {
+    m_bindingsUsed = true;
     glBindBuffer(GL_ARRAY_BUFFER, name);
     m_arrayBuffer = name;
 }
 
 void RenderContext::sendElementBuffer(unsigned name)
 {
+    m_bindingsUsed = true;
     glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, name);
     m_elementBuffer = name;
 }
 
 void RenderContext::sendAttribArrays(uint32_t enabledMask)
 {
-    uint32_t different = enabledMask ^ m_attribArrays;
-    if (!m_attribArraysKnown)
+    m_bindingsUsed = true;
+    if (m_allAttribArrays == 0)
     {
-        GLint count = 0;
-        glGetIntegerv(GL_MAX_VERTEX_ATTRIBS, &count);
-        different = count < 32 ? (1u << count) - 1u : ~0u;
+        const int count = RenderDevice::getMaxVertexAttributeVectors();
+        m_allAttribArrays = count < 32 ? (1u << count) - 1u : ~0u;
     }
+    uint32_t different = m_attribArraysKnown ? enabledMask ^ m_attribArrays : m_allAttribArrays | enabledMask;
     for (; different != 0; different &= different - 1u)
     {
         const auto location = unsigned(std::countr_zero(different));

@@ -85,7 +85,13 @@ int RenderDevice::getMaxVaryingVectors()
 
 void RenderDevice::getPixels(int x, int y, unsigned width, unsigned height, unsigned char* pixels)
 {
+    const int alignment = getInteger(GL_PACK_ALIGNMENT);
+    const bool wouldPad = alignment > 4; // rows beyond the caller's memory; only an application sets it
+    if (wouldPad)
+        glPixelStorei(GL_PACK_ALIGNMENT, 4);
     glReadPixels(x, y, GLsizei(width), GLsizei(height), GL_RGBA, GL_UNSIGNED_BYTE, pixels);
+    if (wouldPad)
+        glPixelStorei(GL_PACK_ALIGNMENT, alignment);
 }
 
 RenderDevice::ErrorCode RenderDevice::getError(bool clear)

@@ -42,7 +42,7 @@ constexpr NamedDrawProperty DRAW_PROPERTIES[] = {
 
 const GLfloat MISSING_ATTRIB[4] = {1.0f, 1.0f, 1.0f, 1.0f};
 
-/// The attribute count of the last plain bind() of any program.
+/// The attribute count of the last bind() of any program.
 int g_boundAttribCount = 0;
 
 template <class T>
@@ -425,8 +425,10 @@ void ShaderProgram::bind(VertexBuffer& buffer)
 
 void ShaderProgram::bind(RenderContext& context, VertexBuffer& buffer)
 {
-    if (getId())
-        buffer.bindAttribs(context, m_revision, m_attribs.data(), int(m_attribs.size()));
+    if (!getId())
+        return;
+    buffer.bindAttribs(context, m_revision, m_attribs.data(), int(m_attribs.size()));
+    g_boundAttribCount = int(m_attribs.size());
 }
 
 bool ShaderProgram::isValid() const

@@ -85,6 +85,7 @@ void MotionBlurRenderer::render(Camera* camera, SceneNode& scene, const FlagMask
         return; // the log said so when they were made
     visitScene(*this, scene, renderFlags, recursiveFlags);
 
+    const RenderContext::DrawScope scope(*m_context);
     const detail::Viewport full = detail::getViewport(*m_context);
     detail::Eye eyes[2];
     const int eyeCount = detail::findEyes(camera, detail::getAspect(full), eyes);

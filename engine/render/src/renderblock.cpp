@@ -81,7 +81,10 @@ void RenderBlock::render()
     context.setViewport(viewport.x, viewport.y, viewport.width, viewport.height);
     m_background.enable(context);
     if (m_scene)
+    {
+        const RenderContext::DrawScope scope(context); // for renderers of the application's own
         m_renderer->render(m_camera.get(), *m_scene, m_renderFlags, m_recursiveFlags);
+    }
     if (m_renderTarget)
         m_renderTarget->disable();
 }

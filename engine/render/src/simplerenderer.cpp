@@ -96,6 +96,7 @@ void SimpleRenderer::render(Camera* camera, SceneNode& scene, const FlagMask& re
         return; // the log said so when they were made
     visitScene(*this, scene, renderFlags, recursiveFlags);
 
+    const RenderContext::DrawScope scope(*m_context);
     m_viewport = detail::getViewport(*m_context);
     detail::Eye eyes[2];
     const int eyeCount = detail::findEyes(camera, detail::getAspect(m_viewport), eyes);

@@ -14,6 +14,14 @@
 namespace orv
 {
 
+/// Outside of frames. A function of its own, so that draw() needs no stack for it.
+[[gnu::noinline, gnu::cold]] static void drawAlone(Solid& solid, RenderContext& context,
+                                                   Appearance& appearance)
+{
+    const RenderContext::DrawScope scope(context);
+    solid.draw(context, appearance);
+}
+
 Solid::Solid() = default;
 
 Solid::Solid(const SharedPtr<Mesh>& mesh, const SharedPtr<Appearance>& appearance)
@@ -104,6 +112,8 @@ void Solid::draw(RenderContext& context, Appearance& appearance)
 {
     if (!m_mesh)
         return;
+    if (!context.isDrawScopeOpen()) [[unlikely]]
+        return drawAlone(*this, context, appearance);
     appearance.enable(context, getWorldMirrored());
 
     ShaderProgram* program = appearance.getShaderProgram().get();

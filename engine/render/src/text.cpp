@@ -191,6 +191,7 @@ void Text::draw(RenderContext& context)
     projection[1].y = -2.0f / height;
     projection[3] = Vector4f(-1.0f, 1.0f, 0.0f, 1.0f);
     m_projection->set(projection);
+    const RenderContext::DrawScope scope(context);
     for (const SharedPtr<Solid>& solid : m_solids)
         solid->draw(context);
 }

@@ -31,6 +31,28 @@ public:
 
     ORV_CLASS_NAME("RenderContext")
 
+    /// The time in which the context remembers from draw to draw what is bound and binds what differs alone.
+    ///
+    /// Where none is open every draw binds all it needs, whatever the application has bound. Renderers and
+    /// render blocks open one for each frame; open one around direct draws (Solid::draw(), Text::draw()) where
+    /// there are many. GL calls of your own inside are to be followed by forgetBindings().
+    ///
+    /// Scopes may be nested; what is bound counts as unknown at each beginning. At each end, if anything was
+    /// drawn, no vertex array is enabled, no vertex or index buffer is bound and texture unit 0 is the active
+    /// one; the program stays current and textures stay bound.
+    class ORV_API DrawScope
+    {
+    public:
+        /// @param context  borrowed until the end.
+        explicit DrawScope(RenderContext& context);
+        ~DrawScope();
+        DrawScope(const DrawScope&) = delete;
+        DrawScope& operator=(const DrawScope&) = delete;
+
+    private:
+        RenderContext& m_context;
+    };
+
     /// Reads the scissor box and the viewport from GL and changes nothing there.
     RenderContext();
     ~RenderContext() override;
@@ -112,8 +134,14 @@ public:
         return m_appliedRevision;
     }
 
+    /// To be called inside a DrawScope after GL calls of your own that bound or unbound a program, a buffer or a
+    /// texture, or that concerned the active texture unit or vertex attributes. Makes no GL call.
+    void forgetBindings();
+
+    bool isDrawScopeOpen() const { return m_drawScopes != 0; }
+
     // Draw path: bindings. Each operation does nothing when GL is known to hold what it asks for; what was
-    // remembered is forgotten first if bindings were changed elsewhere.
+    // remembered is forgotten first if bindings were changed elsewhere, or if no DrawScope is open.
 
     void useProgram(unsigned name)
     {
@@ -192,7 +220,8 @@ private:
     static constexpr int TEXTURE_TARGETS = 3;
     static constexpr uint32_t APPLY_BLEND = 1; ///< bits of m_appliedFlags
     static constexpr uint32_t APPLY_TURNED = 2;
-    static constexpr unsigned UNKNOWN = 0xFFFFFFFFu; ///< no GL object has this name
+    static constexpr unsigned UNKNOWN = 0xFFFFFFFFu;   ///< no GL object has this name
+    static constexpr uint64_t NO_EPOCH = ~uint64_t(0); ///< outside of scopes nothing is known
 
     /// @return index into m_textures, -1 for what is not remembered.
     static int getTextureSlot(int unit, unsigned target)
@@ -214,9 +243,10 @@ private:
             forgetBindings();
     }
 
-    void forgetBindings();
+    ORV_LOCAL void tidyBindings();
     void sendProgram(unsigned name);
     void sendTexture(int unit, unsigned target, unsigned name, int slot);
+    ORV_LOCAL void selectUnit(unsigned unit);
     void sendArrayBuffer(unsigned name);
     void sendElementBuffer(unsigned name);
     void sendAttribArrays(uint32_t enabledMask);
@@ -249,14 +279,17 @@ private:
     uint32_t m_appliedFlags = 0;
     RenderState m_appliedState; ///< as it was given, before masks and winding order were chosen
 
+    unsigned m_drawScopes = 0;
+    bool m_bindingsUsed = false; ///< so there is something to tidy
     bool m_attribArraysKnown = false;
     uint32_t m_attribArrays = 0;
-    uint32_t m_attribOnes = 0; ///< locations known to hold the constant (1, 1, 1, 1)
-    uint64_t m_epoch = 0;
+    uint32_t m_allAttribArrays = 0; ///< those that the GL has; 0 before it was asked
+    uint32_t m_attribOnes = 0;      ///< locations known to hold the constant (1, 1, 1, 1)
+    uint64_t m_epoch = NO_EPOCH;
     uint64_t m_inputProgram = 0;
     uint64_t m_inputBuffer = 0;
     uint64_t m_readyProgram = 0;
-    unsigned m_program = UNKNOWN;
+    mutable unsigned m_program = UNKNOWN;
     unsigned m_arrayBuffer = UNKNOWN;
     unsigned m_elementBuffer = UNKNOWN;
     unsigned m_activeUnit = UNKNOWN;

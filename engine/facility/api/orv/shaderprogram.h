@@ -134,7 +134,7 @@ public:
     /// (1, 1, 1, 1).
     void bind(VertexBuffer& buffer);
 
-    /// The same through the context's memory of bindings. Draw path.
+    /// The same through the context's memory of bindings. Draw path; see RenderContext::DrawScope.
     void bind(RenderContext& context, VertexBuffer& buffer);
 
     /// Asks GL whether the program can run in the current GL state; the GL's reason is logged when it cannot.

@@ -11,7 +11,8 @@ namespace orv::detail
 extern ORV_API uint64_t g_bindingEpoch;
 
 /// To be called after every glBind*, glUseProgram, glDelete* or vertex array call that does not go through a
-/// RenderContext. Each context then forgets what it remembers about bindings before its next draw.
+/// RenderContext. Each context then forgets what it remembers about bindings before its next draw. (Applications
+/// call RenderContext::forgetBindings().)
 inline void bindingsChanged()
 {
     ++g_bindingEpoch;
