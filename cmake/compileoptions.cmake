@@ -46,6 +46,14 @@ function(orv_base_sources)
     set_property(SOURCE ${ARGN} APPEND PROPERTY COMPILE_OPTIONS -frtti)
 endfunction()
 
+# orv_stb_image_sources(source...): sources of the current folder that stb_image is compiled in. Its JPEG decoder shifts
+# by too much where the data end early: zeros, so that nothing comes of it but the message.
+function(orv_stb_image_sources)
+    if(ORV_SANITIZE)
+        set_property(SOURCE ${ARGN} APPEND PROPERTY COMPILE_OPTIONS -fno-sanitize=shift-exponent)
+    endif()
+endfunction()
+
 # orv_link_options_if_known(target option...): those of the options that the linker takes.
 include(CheckLinkerFlag)
 function(orv_link_options_if_known target)
