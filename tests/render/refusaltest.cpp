@@ -436,20 +436,6 @@ protected:
         return support::countLiveAllocations();
     }
 
-    /// Refuses the first thing, then the first and step more, until there are no more; fewer after the first show, where
-    /// everything comes once again.
-    void sweep(const Refusal& refusal, Size size, uint64_t step)
-    {
-        const Picture expected = showFirst(size);
-        refuse(refusal, ~0ull, size, expected); // nothing; what is made once is made now
-        const int64_t live = countLiveAllocations();
-        uint64_t number = 1;
-        for (Hit hit; (hit = refuse(refusal, number, size, expected)) != Hit::NOTHING && !HasFailure();)
-            number += std::getenv("ORV_SWEEP_ALL") ? 1 : (hit == Hit::FIRST_SHOW ? step : 23 * step);
-        EXPECT_GT(live + 16, countLiveAllocations()) << "the driver keeps a few";
-        RecordProperty(size == Size::SMALL ? "small" : "full", int(number));
-    }
-
     /// One of each kind of asset, and a target.
     static void loadSome(AssetCachePool& pool)
     {
@@ -464,22 +450,48 @@ protected:
     support::TempDir m_folder;
 };
 
+/// Sweeps come in parts, each a test of its own, since a whole one takes minutes.
+constexpr uint64_t PARTS = 8;
+
+class RefusalSweep : public RefusalTest, public testing::WithParamInterface<uint64_t>
+{
+protected:
+    /// Refuses the first thing, then the first and step more, until there are no more; fewer after the first show, where
+    /// everything comes once again. Of all these, every one in PARTS. With ORV_SWEEP_ALL in the environment, every step
+    /// is 1.
+    void sweep(const Refusal& refusal, Size size, uint64_t step)
+    {
+        const Picture expected = showFirst(size);
+        refuse(refusal, ~0ull, size, expected); // nothing; what is made once is made now
+        const int64_t live = countLiveAllocations();
+        const bool isWhole = std::getenv("ORV_SWEEP_ALL");
+        const uint64_t usual = isWhole ? PARTS : PARTS * step;
+        uint64_t number = 1 + GetParam() * (isWhole ? 1 : step);
+        for (Hit hit; (hit = refuse(refusal, number, size, expected)) != Hit::NOTHING && !HasFailure();)
+            number += hit == Hit::FIRST_SHOW || isWhole ? usual : 23 * usual;
+        EXPECT_GT(live + 16, countLiveAllocations()) << "the driver keeps a few";
+        RecordProperty(size == Size::SMALL ? "small" : "full", int(number));
+    }
+};
+
 } // namespace
 
-// Fault caught by the first three: a refusal that crashes, leaks, goes unsaid, or spoils what is loaded after it.
-TEST_F(RefusalTest, everyGlCall)
+INSTANTIATE_TEST_SUITE_P(, RefusalSweep, testing::Range<uint64_t>(0, PARTS));
+
+// Fault caught by the three: a refusal that crashes, leaks, goes unsaid, or spoils what is loaded after it.
+TEST_P(RefusalSweep, everyGlCall)
 {
     sweep(GL_CALLS, Size::SMALL, 1);
     sweep(GL_CALLS, Size::FULL, 331);
 }
 
-TEST_F(RefusalTest, everyFileAccess)
+TEST_P(RefusalSweep, everyFileAccess)
 {
     sweep(FILE_ACCESS, Size::SMALL, 1);
     sweep(FILE_ACCESS, Size::FULL, 149);
 }
 
-TEST_F(RefusalTest, everyAllocation)
+TEST_P(RefusalSweep, everyAllocation)
 {
     sweep(ALLOCATIONS, Size::SMALL, 9);
     sweep(ALLOCATIONS, Size::FULL, 197);
