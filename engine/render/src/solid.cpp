@@ -14,13 +14,17 @@
 namespace orv
 {
 
+namespace
+{
+
 /// Outside of frames. A function of its own, so that draw() needs no stack for it.
-[[gnu::noinline, gnu::cold]] static void drawAlone(Solid& solid, RenderContext& context,
-                                                   Appearance& appearance)
+[[gnu::noinline]] void drawAlone(Solid& solid, RenderContext& context, Appearance& appearance)
 {
     const RenderContext::DrawScope scope(context);
     solid.draw(context, appearance);
 }
+
+} // namespace
 
 Solid::Solid() = default;
 
