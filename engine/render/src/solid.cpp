@@ -79,7 +79,8 @@ void Solid::attachJoint(const SharedPtr<SceneNode>& joint, const Matrix4f& inver
         ORV_LOG_ERROR("Solid \"%s\" has more than %d joints; the others have no effect.", getName(),
                       MAX_JOINTS);
     if (getJointCount() == 1)
-        countSkinned(1); // last: a joint above that nobody else keeps goes now, and with it this solid perhaps
+        countSkinned(
+            1); // last: a joint above that nobody else keeps goes now, and with it this solid perhaps
 }
 
 Solid::JointAttachment Solid::getJoint(int i) const
