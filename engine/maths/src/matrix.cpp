@@ -1,6 +1,7 @@
 #include "orv/matrix.h"
 
 #include <cmath>
+#include <initializer_list>
 
 namespace orv
 {
@@ -56,12 +57,15 @@ bool divideInto(float* results, const double* values, int count, double divisor)
     return true;
 }
 
-template <class Matrix>
-std::string columnLines(const char* name, const Matrix& m, int count)
+std::string columnLines(const char* name, std::initializer_list<std::string> columns)
 {
     std::string text = std::string(name) + "(";
-    for (int i = 0; i < count; ++i)
-        text += (i > 0 ? ", \n  " : "\n  ") + toString(m[i]);
+    const char* separator = "\n  ";
+    for (const std::string& column : columns)
+    {
+        text.append(separator).append(column);
+        separator = ", \n  ";
+    }
     return text + "\n)";
 }
 
@@ -212,17 +216,17 @@ Matrix4f lookAt(const Vector3f& eye, const Vector3f& target, const Vector3f& up)
 
 std::string toString(const Matrix2f& m)
 {
-    return columnLines("Matrix2f", m, 2);
+    return columnLines("Matrix2f", {toString(m[0]), toString(m[1])});
 }
 
 std::string toString(const Matrix3f& m)
 {
-    return columnLines("Matrix3f", m, 3);
+    return columnLines("Matrix3f", {toString(m[0]), toString(m[1]), toString(m[2])});
 }
 
 std::string toString(const Matrix4f& m)
 {
-    return columnLines("Matrix4f", m, 4);
+    return columnLines("Matrix4f", {toString(m[0]), toString(m[1]), toString(m[2]), toString(m[3])});
 }
 
 } // namespace orv

@@ -14,7 +14,7 @@ std::string toString(const Quaternionf& q)
     const bool turns = std::fabs(a) != 1.0f;
     const Vector3f axis = turns ? Vector3f(q.x, q.y, q.z) / std::sqrt(1.0f - a * a) : Vector3f::Y_AXIS;
     const Anglef angle = Anglef::fromRadians(2.0f * std::acos(a));
-    return detail::textForm("Quaternionf", q.a, q.x, q.y, q.z) + " (\n  " + toString(axis) + "\n  " +
+    return detail::textForm("Quaternionf", {q.a, q.x, q.y, q.z}) + " (\n  " + toString(axis) + "\n  " +
            toString(angle) + "\n)";
 }
 

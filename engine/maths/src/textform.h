@@ -1,22 +1,13 @@
 #pragma once
 
-#include <locale>
-#include <sstream>
+#include <initializer_list>
 #include <string>
 
 namespace orv::detail
 {
 
 /// "name(first, second, ...)", numbers as a default stream prints them, whatever locale the program has set.
-template <class First, class... Others>
-std::string textForm(const char* name, const First& first, const Others&... others)
-{
-    std::ostringstream text;
-    text.imbue(std::locale::classic());
-    text << name << '(' << first;
-    ((text << ", " << others), ...);
-    text << ')';
-    return text.str();
-}
+std::string textForm(const char* name, std::initializer_list<float> values);
+std::string textForm(const char* name, std::initializer_list<int> values);
 
 } // namespace orv::detail

@@ -1,7 +1,5 @@
 #pragma once
 
-#include "orv/export.h"
-
 #include <cstddef>
 #include <cstdint>
 #include <memory>
@@ -17,7 +15,7 @@ struct LoadLedger;
 /// The outermost holds what the load has read and made so far, which files could not be loaded (asked for again, they
 /// fail again at once), and the LogBudget; it all goes with it. Without a scope nothing is counted or refused.
 /// Threads: each has loads of its own.
-class ORV_API LoadScope
+class LoadScope
 {
 public:
     /// @param name  of what is loaded, for messages; borrowed. Null counts as an empty text.

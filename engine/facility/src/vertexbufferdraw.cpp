@@ -1,0 +1,108 @@
+// What a vertex buffer does for each draw; the rest of the class is in vertexbuffer.cpp.
+
+#include "orv/vertexbuffer.h"
+
+#include "attribformat.h"
+
+#include "orv/detail/bindingepoch.h"
+#include "orv/detail/programattrib.h"
+#include "orv/rendercontext.h"
+
+#include <algorithm>
+
+namespace orv
+{
+
+namespace
+{
+
+using detail::AttribRecord;
+using detail::hasValidFormat;
+using detail::STORED;
+
+/// Whether GL can be given this attribute: it has values somewhere, and GL would take the description.
+bool isDrawable(const AttribRecord& record, GLuint buffer)
+{
+    if (!record.array && (buffer == 0 || record.usage != STORED))
+        return false;
+    return hasValidFormat(record);
+}
+
+/// The buffer to bind for it: values that are still in memory are drawn from there.
+GLuint getSourceBuffer(const AttribRecord& record, GLuint buffer)
+{
+    return record.array ? 0 : buffer;
+}
+
+void setPointer(GLuint location, const AttribRecord& record)
+{
+    const void* pointer = record.array ? static_cast<const void*>(record.array->getBytes())
+                                       : reinterpret_cast<const void*>(uintptr_t(record.offset));
+    glVertexAttribPointer(location, record.componentCount, record.glType,
+                          record.normalised ? GL_TRUE : GL_FALSE, record.stride, pointer);
+}
+
+} // namespace
+
+bool VertexBuffer::enableAttrib(unsigned int location, const char* name)
+{
+    const AttribRecord* record = findAttrib(name);
+    const GLuint buffer = getId();
+    detail::bindingsChanged();
+    if (!record || !isDrawable(*record, buffer))
+    {
+        glDisableVertexAttribArray(location);
+        return false;
+    }
+    glBindBuffer(GL_ARRAY_BUFFER, getSourceBuffer(*record, buffer));
+    glEnableVertexAttribArray(location);
+    setPointer(location, *record);
+    return true;
+}
+
+void VertexBuffer::bindAttribs(RenderContext& context, uint64_t programRevision,
+                               const detail::ProgramAttrib* attribs, int count)
+{
+    if (context.isVertexInputBound(programRevision, m_revision))
+        return;
+    const Plan& plan = getPlan(programRevision, attribs, count);
+    const GLuint buffer = getId();
+    uint32_t enabled = 0;
+    for (int i = 0; i < count; ++i)
+    {
+        const GLuint location = unsigned(attribs[i].location);
+        const AttribRecord* record = plan.sources[unsigned(i)];
+        if (!record || !isDrawable(*record, buffer))
+        {
+            context.setAttribOnes(location);
+            continue;
+        }
+        context.bindArrayBuffer(getSourceBuffer(*record, buffer));
+        setPointer(location, *record);
+        enabled |= 1u << location;
+    }
+    context.setAttribArrays(enabled);
+    context.setVertexInputBound(programRevision, m_revision);
+}
+
+const VertexBuffer::Plan& VertexBuffer::getPlan(uint64_t programRevision,
+                                                const detail::ProgramAttrib* attribs, int count)
+{
+    for (const Plan& plan : m_plans)
+    {
+        if (plan.programRevision == programRevision)
+            return plan;
+    }
+    Plan& plan = m_plans[m_nextPlan];
+    m_nextPlan = (m_nextPlan + 1) % unsigned(m_plans.size());
+    plan.programRevision = programRevision;
+    plan.sources.clear();
+    for (int i = 0; i < count; ++i)
+        plan.sources.push_back(findAttrib(attribs[i].name.c_str()));
+    return plan;
+}
+
+/// @return false if GL has no memory for it: a draw from a buffer without data would read from anywhere, so the
+/// buffer is lost.
+
+} // namespace orv
