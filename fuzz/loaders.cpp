@@ -274,7 +274,8 @@ bool loadDigest(Session& session, const Bytes& file, std::string& fault)
     return loaded;
 }
 
-/// Pixels packed as densely as the format and the limits allow, and up to four times them while they are unpacked.
+/// Pixels packed as densely as the format and the limits allow, and up to seven times them while they are unpacked (from
+/// an interlaced PNG of 16 bits).
 size_t getImageHeap(const Bytes& file)
 {
     const auto startsWith = [&file](const char* start)
@@ -283,7 +284,7 @@ size_t getImageHeap(const Bytes& file)
     if (startsWith("\x89PNG"))
         density = file.size() > 24 && file[24] >= 8 ? 1032 * 4 : 1032 * 32;
     const size_t allowed = std::max<size_t>(64, LIMITS.pictureBytes / std::max<size_t>(1, file.size()) + 1);
-    return std::min(density, allowed) * 4;
+    return std::min(density, allowed) * 7;
 }
 
 /// Two bits a pixel become four bytes. What is no PVR file is tried as another image, TGA being the most patient.

@@ -5,15 +5,18 @@
 #include "orv/appearance.h"
 #include "orv/assetcachepool.h"
 #include "orv/detail/assetpath.h"
+#include "orv/fontcache.h"
 #include "orv/memorystreamsource.h"
 #include "orv/shaderprogramcache.h"
 #include "orv/texture2dcache.h"
 #include "orv/texturecubecache.h"
+#include "orv/vertexbuffercache.h"
 
 #include "facilitytest.h"
 #include "imagefiles.h"
 
 #include <functional>
+#include <limits>
 
 using namespace orv;
 using detail::LoadScope;
@@ -96,6 +99,40 @@ protected:
 
     SharedPtr<AssetCachePool> pool;
     SharedPtr<SpelledSource> files;
+};
+
+/// Says what it likes of its size, its place and what it read.
+class LyingStream : public Stream
+{
+public:
+    LyingStream(int32_t size, int32_t place, int32_t count) : m_size(size), m_place(place), m_count(count) {}
+
+    bool valid() const override { return true; }
+    bool eof() const override { return false; }
+    int32_t size() const override { return m_size; }
+    int32_t seek(unsigned int) override { return m_place; }
+    int32_t tell() const override { return m_place; }
+    int32_t read(void* buffer, unsigned int count) override
+    {
+        std::fill_n(static_cast<char*>(buffer), count, '\0');
+        return m_count;
+    }
+    int32_t write(const void*, unsigned int) override { return m_count; }
+
+private:
+    int32_t m_size;
+    int32_t m_place;
+    int32_t m_count;
+};
+
+class LyingSource : public StreamSource
+{
+public:
+    bool exists(const char*) const override { return true; }
+    SharedPtr<Stream> open(const char*, bool) override { return stream; }
+    const char* getName() const override { return "lying"; }
+
+    SharedPtr<Stream> stream;
 };
 
 } // namespace
@@ -298,4 +335,32 @@ TEST_F(LoadTest, sourcesThatChangeTheListOfSources)
     vanishing.reset();
     EXPECT_TRUE(path.find("a"));
     EXPECT_FALSE(path.find("a"));
+}
+
+// Faults caught, under the undefined-behaviour and address checks: sizes that overflow, and bytes used that no stream gave.
+TEST_F(LoadTest, streamsThatLie)
+{
+    constexpr int32_t LEAST = std::numeric_limits<int32_t>::min();
+    constexpr int32_t MOST = std::numeric_limits<int32_t>::max();
+    const auto source = makeShared<LyingSource>();
+    pool->registerSource(source);
+    for (const int32_t size : {LEAST, -1, 0, 100, 100000})
+    {
+        for (const int32_t place : {LEAST, -1, 0, 99, MOST})
+        {
+            for (const int32_t count : {LEAST, -1, 0, 1, 16, MOST})
+            {
+                LogCapture log;
+                source->stream = makeShared<LyingStream>(size, place, count);
+                EXPECT_FALSE(pool->getTexture2DCache()->get("file.png"));
+                EXPECT_FALSE(pool->getTexture2DCache()->get("file.pvr"));
+                EXPECT_FALSE(pool->getTextureCubeCache()->get("file.png"));
+                EXPECT_FALSE(pool->getShaderProgramCache()->get("file.sp"));
+                EXPECT_FALSE(pool->getFontCache()->get("file.ttf;16"));
+                EXPECT_TRUE(loadAppearance(*pool, "file.ap"));
+                EXPECT_FALSE(pool->getVertexBufferCache()->create(nullptr)->load(source->stream));
+                EXPECT_LE(5, log.count('E'));
+            }
+        }
+    }
 }

@@ -17,7 +17,7 @@ class AssetCache : public detail::AssetStore
 {
 public:
     /// The asset of this name, loaded if it is not held.
-    /// @return empty if no loader can make it; that is not remembered, so the next call asks the loaders again.
+    /// @return empty if no loader can make it. The next call asks the loaders again, unless it is of the same load.
     SharedPtr<T> get(const char* name) { return typed(getAsset(name)); }
 
     /// Takes an asset in under a name, or unnamed if the name is null.
