@@ -309,8 +309,8 @@ const std::vector<Loader> LOADERS = {
     {"program", loadShaderProgram, heapOf<64>, 1 << 16, false},
     // "property a int 0" takes 16 bytes and makes a uniform, its name and its place in two tables.
     {"appearance", loadAppearanceFile, heapOf<64>, 5 << 18, false},
-    // A solid, of which a file may have as many as bytes.
-    {"scene", loadScene, heapOf<600>, 1 << 20, false},
+    // What references make has the same bounds in any file, see GloCredit.
+    {"scene", loadScene, heapOf<64>, 6 << 20, false},
     // The atlas is as large as the size asked for makes it, at most 512 x 4096 here. A point takes three bytes.
     {"font", loadFont, heapOf<200>, 4 << 20, false},
     {"pvr", loadPvr, getPvrHeap, 1 << 17, false},

@@ -645,6 +645,7 @@ std::vector<Seed> makeCostlyFiles()
         repeatSpelling("property a Texture2D ", "wide.png", 100));
     add("appearance", "spellings of itself", true, "Image failed to load texture",
         repeatSpelling("property a Texture2D ", "file.ap", 300));
+    addCostlyScenes(files);
     return files;
 }
 

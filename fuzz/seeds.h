@@ -21,6 +21,7 @@ std::vector<Seed> makeSeeds();
 
 /// Larger ones that ask for as much as they can: pictures, programs, time, records.
 std::vector<Seed> makeCostlyFiles();
+void addCostlyScenes(std::vector<Seed>& files); ///< for makeCostlyFiles()
 
 /// Files by name that seeds may refer to.
 std::map<std::string, Bytes> makeSoundFiles();

@@ -187,9 +187,11 @@ bool GloBuilder::makeAnimation(const AnimationData& data, AnimationGroup& group)
     for (const AnimationData& inner : data.animations)
     {
         const SharedPtr<AnimationGroup> innerGroup = makeShared<AnimationGroup>();
-        if (!innerGroup || !makeAnimation(inner, *innerGroup))
+        if (!innerGroup)
             return false;
         group.addAnimation(innerGroup);
+        if (!makeAnimation(inner, *innerGroup))
+            return false;
     }
     return true;
 }
@@ -226,10 +228,10 @@ bool GloBuilder::makeChannel(const Channel& channel, AnimationGroup& group)
 
 bool GloBuilder::makeNodeChannel(const Channel& channel, const std::string& target, AnimationGroup& group)
 {
-    const auto found = m_nodes.lower_bound(target); // the first of that name
-    if (found == m_nodes.end() || found->first != target)
+    const NameRange nodes = findName(m_names, target);
+    if (nodes.begin == nodes.end)
         return fail("Animation node not present in %s");
-    const SharedPtr<SceneNode>& node = found->second;
+    const SharedPtr<SceneNode> node(m_places[nodes.begin->place].node);
     if (channel.property == "translation")
         return addChannel<Vector3f>(channel, m_name, makeShared<SceneNodePositionAnimator>(node), group);
     if (channel.property == "rotation")
@@ -246,7 +248,7 @@ bool GloBuilder::makeLightChannel(const Channel& channel, const std::string& tar
     std::vector<SharedPtr<Light>> lights;
     for (auto light = begin; light != end; ++light)
         lights.push_back(light->second);
-    if (!spend(THING * lights.size()))
+    if (!spend(GloCredit::lightChannels(lights.size())))
         return false;
     if (channel.property == "colour")
         return addLightChannels<Colour4f, LightColourAnimator>(channel, m_name, lights, group);

@@ -45,7 +45,7 @@ GloBuilder::GloBuilder(AssetCachePool& pool, GloScene& scene, FileVersion versio
     , m_version(version)
     , m_tool(tool)
     , m_name(name)
-    , m_credit(THING * (uint64_t(fileSize) + SPARE_THINGS))
+    , m_credit(fileSize)
     , m_skins(makeIndex(scene.skins))
     , m_lightDefinitions(makeIndex(scene.lights))
     , m_cameraDefinitions(makeIndex(scene.cameras))
@@ -72,22 +72,24 @@ SharedPtr<Glo> GloBuilder::build(const SharedPtr<SceneNode>& parent, bool measur
         if (!top)
             return {};
     }
+    sort(m_names);
+    sort(m_scopedNames);
     m_glo->m_animationGroup = makeShared<AnimationGroup>();
     if (!m_glo->m_animationGroup)
         return {};
     for (const AnimationData& animation : m_scene.animations)
     {
+        // Each is added while it is empty: adding looks through what is added.
         const SharedPtr<AnimationGroup> group = makeShared<AnimationGroup>();
-        if (!group || !makeAnimation(animation, *group))
+        if (!group)
             return {};
         m_glo->m_animations.push_back({animation.name, group});
         m_glo->m_animationGroup->addAnimation(group);
-    }
-    for (const SkinnedSolids& skinned : m_skinnedSolids)
-    {
-        if (!linkSkin(skinned))
+        if (!makeAnimation(animation, *group))
             return {};
     }
+    if (!linkSkins())
+        return {};
     for (auto& [name, material] : m_materials)
     {
         material.choosePrograms();
@@ -121,14 +123,9 @@ bool GloBuilder::failUnknown(const char* kind, const std::string& name) const
     return false;
 }
 
-/// References multiply: a geometry of a thousand sets that a thousand nodes refer to is a million solids. Whatever is
-/// made by reference is paid for here, so that a small file cannot ask for more than memory or patience can give.
-bool GloBuilder::spend(uint64_t work)
+bool GloBuilder::spend(uint64_t bytes)
 {
-    if (work > m_credit)
-        return fail("References in %s ask for more than a file of its size may have");
-    m_credit -= work;
-    return true;
+    return m_credit.spend(bytes) || fail("References in %s ask for more than a file of its size may have");
 }
 
 bool GloBuilder::makeGeometries(bool measuresMeshes)
@@ -170,8 +167,10 @@ SharedPtr<SceneNode> GloBuilder::makeNode(const NodeData& data, const SharedPtr<
     if (!node)
         return {};
     node->setName(data.name.c_str());
-    m_nodes.emplace(data.name, node);
-    m_scopedNodes.emplace(data.scopedName, node);
+    const uint32_t place = uint32_t(m_places.size());
+    m_places.push_back({node.get(), 0});
+    m_names.push_back({data.name, place});
+    m_scopedNames.push_back({data.scopedName, place});
     if (parent)
         node->setParent(parent, false);
     setTransform(*node, data, !parent);
@@ -182,6 +181,7 @@ SharedPtr<SceneNode> GloBuilder::makeNode(const NodeData& data, const SharedPtr<
         if (!makeNode(child, node))
             return {};
     }
+    m_places[place].end = uint32_t(m_places.size());
     return node;
 }
 
@@ -225,7 +225,7 @@ bool GloBuilder::makeSolids(const std::string& geometry, const std::vector<std::
         return failUnknown("geometry", geometry);
     bool missing = false;
     const std::vector<SharedPtr<Mesh>>& meshes = found->second.meshes;
-    if (!spend(THING * meshes.size()))
+    if (!spend(GloCredit::solids(meshes.size())))
         return false;
     for (size_t i = 0; i < meshes.size(); ++i)
     {
@@ -285,59 +285,86 @@ bool GloBuilder::makeSkinnedSolids(const SkinReference& reference, std::vector<S
     return true;
 }
 
-bool GloBuilder::linkSkin(const SkinnedSolids& skinned)
+void GloBuilder::sort(Names& names)
 {
-    std::set<const SceneNode*> skeletons;
+    std::sort(names.begin(), names.end(),
+              [](const NamedPlace& a, const NamedPlace& b)
+              {
+                  const int order = a.name.compare(b.name);
+                  return order != 0 ? order < 0 : a.place < b.place;
+              });
+}
+
+/// @param names  sorted.
+GloBuilder::NameRange GloBuilder::findName(const Names& names, std::string_view name)
+{
+    const auto begin = std::lower_bound(names.begin(), names.end(), name,
+                                        [](const NamedPlace& a, std::string_view b) { return a.name < b; });
+    const auto end = std::upper_bound(begin, names.end(), name,
+                                      [](std::string_view a, const NamedPlace& b) { return a < b.name; });
+    return {names.data() + (begin - names.begin()), names.data() + (end - names.begin())};
+}
+
+/// What a skin's joint names may mean is looked up once, however many nodes refer to the skin.
+bool GloBuilder::linkSkins()
+{
+    std::map<const Skin*, std::vector<JointNodes>> known;
+    for (const SkinnedSolids& skinned : m_skinnedSolids)
+    {
+        const std::vector<Attachment>& attachments = skinned.skin->attachments;
+        std::vector<JointNodes>& joints = known[skinned.skin];
+        for (size_t i = joints.size(); i < attachments.size(); ++i)
+            joints.push_back(
+                {findName(m_scopedNames, attachments[i].joint), findName(m_names, attachments[i].joint)});
+        if (!spend(GloCredit::links(*skinned.reference, *skinned.skin, skinned.solids.size())))
+            return false;
+        linkSkin(skinned, joints);
+    }
+    return true;
+}
+
+void GloBuilder::linkSkin(const SkinnedSolids& skinned, const std::vector<JointNodes>& joints)
+{
+    std::vector<uint32_t> skeletons;
     for (const std::string& name : skinned.reference->skeletons)
     {
-        const auto root = m_nodes.find(name);
-        if (root != m_nodes.end())
-            skeletons.insert(root->second.get());
+        const NameRange roots = findName(m_names, name);
+        if (roots.begin != roots.end)
+            skeletons.push_back(roots.begin->place);
     }
-    for (const Attachment& attachment : skinned.skin->attachments)
+    for (size_t i = 0; i < joints.size(); ++i)
     {
-        SharedPtr<SceneNode> joint;
-        if (!spend(THING * skinned.solids.size()) || !findJoint(attachment.joint, skeletons, joint))
-            return false;
+        const Attachment& attachment = skinned.skin->attachments[i];
+        const SharedPtr<SceneNode> joint(findJoint(joints[i], skeletons));
         if (!joint)
             ORV_GLO_ERROR("Joint node \"%s\" not found.", attachment.joint.c_str());
         for (const SharedPtr<Solid>& solid : skinned.solids)
             solid->attachJoint(joint, attachment.inverseBindPose);
     }
-    return true;
 }
 
 /// By scoped name, then by name; of several nodes, the first below one of the reference's skeletons, since two
 /// figures of the same build have the same joint names.
-/// @param joint  stays empty if there is none.
-/// @return false when the search is not worth the file's size.
-bool GloBuilder::findJoint(const std::string& name, const std::set<const SceneNode*>& skeletons,
-                           SharedPtr<SceneNode>& joint)
+/// @return null if there is none.
+SceneNode* GloBuilder::findJoint(const JointNodes& nodes, const std::vector<uint32_t>& skeletons) const
 {
-    for (const NodesByName* nodes : {&m_scopedNodes, &m_nodes})
+    for (const NameRange& range : {nodes.byScopedName, nodes.byName})
     {
-        const auto [begin, end] = nodes->equal_range(name);
-        for (auto node = begin; node != end; ++node)
+        const NamedPlace* found = range.end;
+        for (const uint32_t root : skeletons)
         {
-            uint64_t steps = 1;
-            const SceneNode* above = node->second.get();
-            for (; above && skeletons.count(above) == 0; above = above->getParent())
-                ++steps;
-            if (above)
-            {
-                joint = node->second;
-                return true;
-            }
-            if (!spend(steps))
-                return false;
+            const NamedPlace* below =
+                std::lower_bound(range.begin, range.end, root,
+                                 [](const NamedPlace& named, uint32_t place) { return named.place < place; });
+            if (below < found && below->place < m_places[root].end)
+                found = below;
         }
-        if (begin != end)
-        {
-            joint = begin->second;
-            return true;
-        }
+        if (found == range.end)
+            found = range.begin;
+        if (found != range.end)
+            return m_places[found->place].node;
     }
-    return true;
+    return nullptr;
 }
 
 bool GloBuilder::makeLight(const LightReference& reference, Objects& objects)

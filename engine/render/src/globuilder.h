@@ -3,13 +3,13 @@
 #include "glogeometry.h"
 #include "glomaterial.h"
 
+#include "orv/detail/glocredit.h"
 #include "orv/detail/glorecords.h"
 #include "orv/glo.h"
 #include "orv/solid.h"
 
 #include <cstdint>
 #include <map>
-#include <set>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -35,8 +35,33 @@ private:
     using Objects = std::vector<SharedPtr<SceneNode>>;
     template <class Record>
     using RecordsByName = std::map<std::string_view, const Record*>; ///< the first of each name
-    using NodesByName =
-        std::multimap<std::string, SharedPtr<SceneNode>, std::less<>>; ///< in the tree's order
+
+    /// A node that stands for one of the file's; kept alive by its tree.
+    struct Place
+    {
+        SceneNode* node;
+        uint32_t end; ///< the place behind its last descendant; places are in the tree's order
+    };
+
+    struct NamedPlace
+    {
+        std::string_view name;
+        uint32_t place;
+    };
+
+    using Names = std::vector<NamedPlace>; ///< by name, and of one name by place
+    struct NameRange
+    {
+        const NamedPlace* begin;
+        const NamedPlace* end;
+    };
+
+    /// The nodes that a joint's name may mean.
+    struct JointNodes
+    {
+        NameRange byScopedName;
+        NameRange byName;
+    };
 
     /// The solids of one skin reference, which find their joints when all nodes are there.
     struct SkinnedSolids
@@ -46,10 +71,7 @@ private:
         std::vector<SharedPtr<Solid>> solids;
     };
 
-    /// Work is counted in steps of a search. For each byte of a file one thing may be made, and so many more.
-    static constexpr uint64_t THING = 64;
-    static constexpr uint64_t SPARE_THINGS = 256;
-    bool spend(uint64_t work);
+    bool spend(uint64_t bytes);
 
     bool makeGeometries(bool measuresMeshes);
     bool makeMaterials();
@@ -64,9 +86,11 @@ private:
     bool makeSkinnedSolids(const glo::SkinReference& reference, std::vector<SharedPtr<Solid>>& solids);
     bool makeLight(const glo::LightReference& reference, Objects& objects);
     bool makeCamera(const glo::CameraReference& reference, Objects& objects);
-    bool linkSkin(const SkinnedSolids& skinned);
-    bool findJoint(const std::string& name, const std::set<const SceneNode*>& skeletons,
-                   SharedPtr<SceneNode>& joint);
+    static void sort(Names& names);
+    static NameRange findName(const Names& names, std::string_view name);
+    bool linkSkins();
+    void linkSkin(const SkinnedSolids& skinned, const std::vector<JointNodes>& joints);
+    SceneNode* findJoint(const JointNodes& nodes, const std::vector<uint32_t>& skeletons) const;
     bool fail(const char* format) const;
     bool failUnknown(const char* kind, const std::string& name) const;
 
@@ -81,7 +105,7 @@ private:
     glo::FileVersion m_version;
     glo::AuthoringTool m_tool;
     const char* m_name;
-    uint64_t m_credit; ///< work that may still be done
+    glo::GloCredit m_credit;
     RecordsByName<glo::Skin> m_skins;
     RecordsByName<glo::LightDefinition> m_lightDefinitions;
     RecordsByName<glo::CameraDefinition> m_cameraDefinitions;
@@ -89,8 +113,9 @@ private:
     std::map<std::string, GloGeometry, std::less<>> m_geometries;
     std::map<std::string, GloMaterial, std::less<>> m_materials;
     SharedPtr<Appearance> m_defaultAppearances[2]; ///< plain, skinned
-    NodesByName m_nodes;
-    NodesByName m_scopedNodes;
+    std::vector<Place> m_places;
+    Names m_names;
+    Names m_scopedNames;
     std::multimap<std::string_view, SharedPtr<Light>> m_lights; ///< by their definition's name
     std::vector<SkinnedSolids> m_skinnedSolids;
 };

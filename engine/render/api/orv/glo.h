@@ -134,6 +134,8 @@ private:
 ///
 /// @param parent  gets the top node as its last child; empty: the tree is a root that only the result holds.
 /// @param name    looked for on the pool's path.
+/// What is made by reference (solids, joints of skins, channels of lights) is bounded by 4 MiB and 32 bytes of memory
+/// for each byte of the file; a file that asks for more is refused.
 /// @param measuresMeshes  looks at every vertex to find the bounding radius of each mesh, which is unknown otherwise.
 /// @return empty, after logging why, if the file is missing, damaged, newer than the loader, or names something
 /// that it does not hold; parent is unchanged then. Missing textures, materials and joints and unknown animated
