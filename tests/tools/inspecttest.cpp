@@ -4,6 +4,7 @@
 
 #include "inspect/forecast.h"
 #include "inspect/glochecks.h"
+#include "inspect/print.h"
 
 #include "inspect/textfiles.h"
 
@@ -148,6 +149,12 @@ const SceneFault SCENE_FAULTS[] = {
     {"loop-range",
      [](GloScene& s) {
          s.animations[0].loopRanges = {{2, 1}};
+     }},
+    {"references",
+     [](GloScene& s)
+     {
+         s.geometries[0].primitiveSets.resize(3000);
+         s.scene->top.children.resize(22, s.scene->top.children[0]);
      }},
 };
 
@@ -328,6 +335,57 @@ TEST_F(InspectTest, agreesWithTheEngine)
                                refused += loaded ? 0 : 1;
                            });
     EXPECT_GT(refused, 1000);
+}
+
+// Fault caught: a limit of references that is not the engine's.
+TEST_F(InspectTest, agreesWithTheEngineAboutReferences)
+{
+    int refused = 0;
+    int accepted = 0;
+    for (const size_t sets : {1000, 1700, 1800, 1850, 1900, 2500, 3000, 3100, 3500})
+    {
+        for (const size_t joints : {1, 3})
+        {
+            GloScene scene = makeFullScene();
+            technique(scene).diffuse.sampler.reset();
+            scene.geometries[1].primitiveSets.resize(sets);
+            scene.skins[0].attachments.resize(joints, scene.skins[0].attachments[0]);
+            scene.scene->top.children.resize(7, scene.scene->top.children[1]);
+            const Bytes bytes = write(scene);
+            support::LogCapture log;
+            const bool loaded = bool(load(bytes));
+            EXPECT_NE(loaded, hasErrors(check(bytes))) << sets << " sets, " << joints << " joints";
+            ++(loaded ? accepted : refused);
+        }
+    }
+    EXPECT_LT(2, refused);
+    EXPECT_LT(2, accepted);
+}
+
+// Faults caught: a name in a file that writes lines of its own or moves the cursor, "1 geometries" and "at 0, :".
+TEST_F(InspectTest, printsPlainLines)
+{
+    GloScene scene = makeFullScene();
+    scene.materials.emplace_back().name = "\x1b[2J\nb.glo: error \xc3\xbc \xe2\x80\xae \xc2\x9b \xff";
+    scene.geometries.resize(1);
+    inspect::Report report;
+    report.path = "a.glo";
+    report.kind = "scene";
+    const Bytes bytes = write(scene);
+    report.scene = inspect::scanGlo(bytes, report.findings);
+    inspect::checkGlo(report.scene, m_folder.path(), report.findings);
+    report.findings.add(inspect::Kind::NO_INFO, 0, "", "nothing");
+    testing::internal::CaptureStdout();
+    inspect::printTotals(report);
+    inspect::printFindings(report);
+    const std::string text = testing::internal::GetCapturedStdout();
+    EXPECT_NE(std::string::npos,
+              text.find("\\x1b[2J\\x0ab.glo: error \xc3\xbc \\xe2\\x80\\xae \\xc2\\x9b \\xff"))
+        << text;
+    EXPECT_EQ(std::string::npos, text.find("\nb.glo")) << text;
+    EXPECT_EQ(std::string::npos, text.find('\x1b')) << text;
+    EXPECT_NE(std::string::npos, text.find(", 1 geometry (0 vertices), ")) << text;
+    EXPECT_NE(std::string::npos, text.find(" at 0: nothing\n")) << text;
 }
 
 // Fault caught: figures that are not those of what the engine does.

@@ -4,7 +4,9 @@
 
 #include <nlohmann/json.hpp>
 
+#include <map>
 #include <string>
+#include <utility>
 #include <vector>
 
 namespace inspect
@@ -29,13 +31,23 @@ struct Chunk
     std::string path;
     size_t record = NO_RECORD; ///< its place in the vector of records that it was read into
     std::vector<Field> fields;
-    std::vector<Chunk> children;
+    std::vector<Chunk> children; ///< see add()
 
     /// The first text in it, which is the name of everything that has one; "" if there is none.
     std::string getName() const;
 
+    void add(Chunk&& child);
+
+    /// How many children of that kind it has so far.
+    size_t count(uint32_t childId) const;
+
     /// The child of that kind that was read into that place, or that is the only one; this chunk if there is none.
     const Chunk& find(uint32_t childId, size_t childRecord = NO_RECORD) const;
+
+private:
+    std::map<uint32_t, size_t> m_counts;
+    std::map<std::pair<uint32_t, size_t>, size_t>
+        m_places; ///< of children by ID and record, the first of each
 };
 
 } // namespace inspect

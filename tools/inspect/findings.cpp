@@ -78,6 +78,7 @@ const std::vector<KindInfo> INFO = {
     {Kind::KEY_TIME, "key-time", ERROR, "the time of a key is not a number"},
     {Kind::KEY_ORDER, "key-order", NOTE, "keys are not in the order of their times"},
     {Kind::LOOP_RANGE, "loop-range", WARNING, "a loop range ends before it begins"},
+    {Kind::REFERENCES, "references", ERROR, "references make more than a file of its size may have"},
     {Kind::TEXT_EMPTY, "text-empty", ERROR, "a material or program file is empty"},
     {Kind::TEXT_VERSION, "text-version", ERROR, "a material or program file does not begin with 1.0"},
     {Kind::TEXT_TAG, "text-tag", ERROR, "an unknown statement, which ends the reading"},
@@ -90,6 +91,11 @@ const std::vector<KindInfo> INFO = {
 };
 
 } // namespace
+
+std::string counted(uint64_t count, const char* one, const char* many)
+{
+    return std::to_string(count) + " " + (count == 1 ? one : many);
+}
 
 const KindInfo& getInfo(Kind kind)
 {

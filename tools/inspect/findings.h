@@ -78,6 +78,7 @@ enum class Kind
     KEY_TIME,
     KEY_ORDER,
     LOOP_RANGE,
+    REFERENCES,
     TEXT_EMPTY,
     TEXT_VERSION,
     TEXT_TAG,
@@ -96,6 +97,9 @@ struct KindInfo
     Severity severity;
     const char* meaning; ///< for the list that --codes prints
 };
+
+/// Of a number of things, for sentences: "1 node", "2 nodes".
+std::string counted(uint64_t count, const char* one, const char* many);
 
 const KindInfo& getInfo(Kind kind);
 const std::vector<KindInfo>& getAllInfo();

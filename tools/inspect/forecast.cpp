@@ -1,6 +1,8 @@
 #include "forecast.h"
 
+#include "glocost.h"
 #include "images.h"
+#include "names.h"
 
 #include "orv/detail/glomaterialrules.h"
 #include "orv/detail/glovertices.h"
@@ -45,7 +47,12 @@ float readKey(const Channel& channel, size_t key, uint32_t coefficient)
 class Forecaster
 {
 public:
-    Forecaster(const ScannedFile& file, const std::filesystem::path& folder) : m_file(file), m_images(folder)
+    Forecaster(const ScannedFile& file, const std::filesystem::path& folder)
+        : m_file(file)
+        , m_geometries(firstByName(file.scene.geometries))
+        , m_skins(firstByName(file.scene.skins))
+        , m_isAffordable(isAffordable(file))
+        , m_images(folder)
     {
     }
 
@@ -112,9 +119,8 @@ private:
             addDraws(node.geometry->geometry, node.geometry->materials, false);
         if (node.skin)
         {
-            const auto skin = std::find_if(m_file.scene.skins.begin(), m_file.scene.skins.end(),
-                                           [&](const Skin& other) { return other.name == node.skin->skin; });
-            if (skin != m_file.scene.skins.end())
+            const Skin* skin = find(m_skins, node.skin->skin);
+            if (skin)
                 addDraws(skin->geometry, node.skin->materials, true);
         }
         for (const NodeData& child : node.children)
@@ -123,10 +129,8 @@ private:
 
     void addDraws(const std::string& name, const std::vector<std::string>& materials, bool skinned)
     {
-        const std::vector<Geometry>& geometries = m_file.scene.geometries;
-        const auto geometry = std::find_if(geometries.begin(), geometries.end(),
-                                           [&](const Geometry& other) { return other.name == name; });
-        if (geometry == geometries.end())
+        const Geometry* geometry = find(m_geometries, name);
+        if (!geometry || !m_isAffordable)
             return;
         for (size_t i = 0; i < geometry->primitiveSets.size(); ++i)
         {
@@ -170,6 +174,9 @@ private:
     }
 
     const ScannedFile& m_file;
+    ByName<Geometry> m_geometries;
+    ByName<Skin> m_skins;
+    bool m_isAffordable; ///< or else nothing is drawn
     Images m_images;
     Forecast m_forecast;
     std::map<std::string, StandardMaterial> m_materials; ///< with what animations take them to

@@ -1,6 +1,8 @@
 #include "glochecks.h"
 
+#include "glocost.h"
 #include "images.h"
+#include "names.h"
 
 #include "orv/detail/glomaterialrules.h"
 #include "orv/detail/glovertices.h"
@@ -42,6 +44,12 @@ public:
     GloChecker(const ScannedFile& file, const std::filesystem::path& folder, Findings& findings)
         : m_file(file)
         , m_scene(file.scene)
+        , m_geometries(firstByName(m_scene.geometries))
+        , m_skins(firstByName(m_scene.skins))
+        , m_lights(firstByName(m_scene.lights))
+        , m_cameras(firstByName(m_scene.cameras))
+        , m_isAffordable(isAffordable(file))
+        , m_valuesLeft(VALUES_PER_BYTE * file.size)
         , m_images(folder)
         , m_findings(findings)
     {
@@ -50,6 +58,10 @@ public:
     void check()
     {
         collectNames();
+        if (!m_isAffordable)
+            report(Kind::REFERENCES, m_file.top,
+                   "nodes, skins and channels refer to more than a file of " +
+                       counted(m_file.size, "byte", "bytes") + " may have made");
         for (const Chunk& list : m_file.top.children)
             checkList(list);
         if (!m_scene.scene)
@@ -62,15 +74,6 @@ public:
     }
 
 private:
-    template <class Record>
-    static std::set<std::string> namesOf(const std::vector<Record>& records)
-    {
-        std::set<std::string> names;
-        for (const Record& record : records)
-            names.insert(record.name);
-        return names;
-    }
-
     void collectNames()
     {
         if (m_scene.scene)
@@ -131,8 +134,8 @@ private:
                 checkAttribute(set.find(VertexAttribute::ID, i), vertices.attributes[i], vertices) && inside;
         if (vertices.vertexCount > vertices.data.bytes.size())
             report(Kind::NO_VERTEX_DATA, set.find(VertexData::ID),
-                   number(vertices.vertexCount) + " vertices have only " +
-                       number(vertices.data.bytes.size()) + " bytes");
+                   counted(vertices.vertexCount, "vertex has", "vertices have") + " only " +
+                       counted(vertices.data.bytes.size(), "byte", "bytes"));
         if (inside && vertices.vertexCount > 0)
         {
             for (size_t i = 0; i < vertices.attributes.size(); ++i)
@@ -153,8 +156,9 @@ private:
             report(Kind::ATTRIBUTE_BOUNDS, chunk,
                    quote(attribute.name) + " with " + std::to_string(attribute.componentCount) +
                        " components at offset " + std::to_string(attribute.offset) + ", stride " +
-                       std::to_string(attribute.stride) + ", does not fit " + number(vertices.vertexCount) +
-                       " vertices in " + number(vertices.data.bytes.size()) + " bytes");
+                       std::to_string(attribute.stride) + ", does not fit " +
+                       counted(vertices.vertexCount, "vertex", "vertices") + " in " +
+                       counted(vertices.data.bytes.size(), "byte", "bytes"));
             return false;
         }
         if (attribute.type >= type::COUNT)
@@ -169,12 +173,18 @@ private:
 
     void checkNumbers(const Chunk& chunk, const VertexAttribute& attribute, const VertexSet& vertices)
     {
+        // Attributes that share their bytes would be as much work as all of them times all vertices.
+        const uint64_t values = uint64_t(vertices.vertexCount) * uint32_t(attribute.componentCount);
+        if (values > m_valuesLeft)
+            return;
+        m_valuesLeft -= values;
         uint64_t count = 0;
         forEachComponent(attribute, vertices, false, 4,
                          [&count](uint32_t, float value) { count += std::isfinite(value) ? 0 : 1; });
         if (count > 0)
             report(Kind::BAD_NUMBER, chunk,
-                   number(count) + " values of " + quote(attribute.name) + " are not finite numbers");
+                   quote(attribute.name) + " has " +
+                       counted(count, "value that is no finite number", "values that are no finite numbers"));
     }
 
     void checkWeights(const Chunk& chunk, const Geometry& geometry)
@@ -191,7 +201,7 @@ private:
         // One joint moves vertices whose weights are left out.
         if (count > 0 && weights->componentCount == 4)
             report(Kind::WEIGHT_SUM, chunk,
-                   "the weights of " + number(count) + " vertices do not add up to 1");
+                   "the weights of " + counted(count, "vertex", "vertices") + " do not add up to 1");
     }
 
     void checkPrimitiveSet(const Chunk& chunk, const PrimitiveSet& set, uint32_t vertexCount)
@@ -207,8 +217,8 @@ private:
             beyond += index >= vertexCount ? 1 : 0;
         if (beyond > 0)
             report(Kind::INDEX_BOUNDS, chunk.find(IndexData::ID),
-                   number(beyond) + " indices name vertices beyond the " + number(vertexCount) +
-                       " that there are");
+                   counted(beyond, "index names a vertex", "indices name vertices") + " beyond the last of " +
+                       number(vertexCount));
         uint64_t degenerate = 0;
         for (size_t i = 0; set.primitive == primitive::TRIANGLES && i + 2 < indices.size(); i += 3)
             degenerate += indices[i] == indices[i + 1] || indices[i] == indices[i + 2] ||
@@ -217,7 +227,8 @@ private:
                               : 0;
         if (degenerate > 0)
             report(Kind::DEGENERATE, chunk.find(IndexData::ID),
-                   number(degenerate) + " triangles use a vertex twice and are never seen");
+                   counted(degenerate, "triangle uses a vertex twice and is never seen",
+                           "triangles use a vertex twice and are never seen"));
     }
 
     // --- materials ----------------------------------------------------------------------------------------
@@ -324,17 +335,16 @@ private:
                 report(Kind::JOINT_MISSING, chunk.find(Attachment::ID, i),
                        "the joint " + quote(joint) + " is no node of the scene; its vertices stay at rest");
         }
-        for (const Geometry& geometry : m_scene.geometries)
-        {
-            if (geometry.name != skin.geometry || !areReadable(geometry))
-                continue;
-            const int count = countJoints(geometry);
-            if (size_t(count) > skin.attachments.size())
-                report(Kind::JOINT_NUMBER, chunk,
-                       "geometry " + quote(geometry.name) + " names joint " + std::to_string(count - 1) +
-                           ", the skin has " + number(skin.attachments.size()));
-            break;
-        }
+        const Geometry* geometry = find(m_geometries, skin.geometry);
+        if (!geometry || !areReadable(*geometry))
+            return;
+        const auto [known, isNew] = m_jointCounts.try_emplace(geometry, 0);
+        if (isNew)
+            known->second = countJoints(*geometry);
+        if (size_t(known->second) > skin.attachments.size())
+            report(Kind::JOINT_NUMBER, chunk,
+                   "geometry " + quote(geometry->name) + " names joint " + std::to_string(known->second - 1) +
+                       ", the skin has " + number(skin.attachments.size()));
     }
 
     static bool areReadable(const Geometry& geometry)
@@ -394,14 +404,13 @@ private:
         m_used.insert({Geometry::ID, name});
         for (const std::string& material : materials)
             m_used.insert({Material::ID, material});
-        const auto found = std::find_if(m_scene.geometries.begin(), m_scene.geometries.end(),
-                                        [&name](const Geometry& geometry) { return geometry.name == name; });
-        if (found == m_scene.geometries.end())
+        const Geometry* found = find(m_geometries, name);
+        if (!found)
         {
             report(Kind::UNKNOWN_GEOMETRY, chunk, "there is no geometry " + quote(name));
             return;
         }
-        for (size_t i = 0; i < found->primitiveSets.size(); ++i)
+        for (size_t i = 0; m_isAffordable && i < found->primitiveSets.size(); ++i)
         {
             if (i >= materials.size() || !m_materials.count(materials[i]))
                 report(Kind::NO_MATERIAL, chunk,
@@ -414,9 +423,8 @@ private:
     void checkSkinReference(const Chunk& chunk, const SkinReference& reference)
     {
         m_used.insert({Skin::ID, reference.skin});
-        const auto found = std::find_if(m_scene.skins.begin(), m_scene.skins.end(),
-                                        [&](const Skin& skin) { return skin.name == reference.skin; });
-        if (found == m_scene.skins.end())
+        const Skin* found = find(m_skins, reference.skin);
+        if (!found)
             report(Kind::UNKNOWN_SKIN, chunk, "there is no skin " + quote(reference.skin));
         else
             checkReference(chunk, found->geometry, reference.materials);
@@ -425,35 +433,27 @@ private:
     void checkLightReference(const Chunk& chunk, const LightReference& reference)
     {
         m_used.insert({LightDefinition::ID, reference.light});
-        for (const LightDefinition& light : m_scene.lights)
-        {
-            if (light.name != reference.light)
-                continue;
-            if (light.type > light::SPOT)
-                report(Kind::LIGHT_TYPE, chunk,
-                       "light " + quote(light.name) + " has the unknown type " + number(light.type));
-            else if (light.type == light::AMBIENT)
-                report(Kind::AMBIENT_LIGHT, chunk,
-                       "the ambient light " + quote(light.name) + " becomes a point light");
-            return;
-        }
-        report(Kind::UNKNOWN_LIGHT, chunk, "there is no light " + quote(reference.light));
+        const LightDefinition* light = find(m_lights, reference.light);
+        if (!light)
+            report(Kind::UNKNOWN_LIGHT, chunk, "there is no light " + quote(reference.light));
+        else if (light->type > light::SPOT)
+            report(Kind::LIGHT_TYPE, chunk,
+                   "light " + quote(light->name) + " has the unknown type " + number(light->type));
+        else if (light->type == light::AMBIENT)
+            report(Kind::AMBIENT_LIGHT, chunk,
+                   "the ambient light " + quote(light->name) + " becomes a point light");
     }
 
     void checkCameraReference(const Chunk& chunk, const CameraReference& reference)
     {
         m_used.insert({CameraDefinition::ID, reference.camera});
-        for (const CameraDefinition& camera : m_scene.cameras)
-        {
-            if (camera.name != reference.camera)
-                continue;
-            if (camera.projection > projection::PERSPECTIVE)
-                report(Kind::CAMERA_TYPE, chunk,
-                       "camera " + quote(camera.name) + " has the unknown projection " +
-                           number(camera.projection));
-            return;
-        }
-        report(Kind::UNKNOWN_CAMERA, chunk, "there is no camera " + quote(reference.camera));
+        const CameraDefinition* camera = find(m_cameras, reference.camera);
+        if (!camera)
+            report(Kind::UNKNOWN_CAMERA, chunk, "there is no camera " + quote(reference.camera));
+        else if (camera->projection > projection::PERSPECTIVE)
+            report(Kind::CAMERA_TYPE, chunk,
+                   "camera " + quote(camera->name) + " has the unknown projection " +
+                       number(camera->projection));
     }
 
     // --- animations ---------------------------------------------------------------------------------------
@@ -494,7 +494,7 @@ private:
         }
         const std::string target(getTargetName(channel.targetName));
         const bool known = channel.targetType == "node"    ? m_nodes.count(target) > 0
-                           : channel.targetType == "light" ? namesOf(m_scene.lights).count(target) > 0
+                           : channel.targetType == "light" ? m_lights.count(target) > 0
                                                            : m_materials.count(target) > 0;
         if (!known)
             report(Kind::CHANNEL_TARGET, chunk, "there is no " + channel.targetType + " " + quote(target));
@@ -535,7 +535,16 @@ private:
     }
 
     const ScannedFile& m_file;
+    static constexpr uint64_t VALUES_PER_BYTE = 4; ///< that are looked at; a sound file has one at most
+
     const GloScene& m_scene;
+    ByName<Geometry> m_geometries;
+    ByName<Skin> m_skins;
+    ByName<LightDefinition> m_lights;
+    ByName<CameraDefinition> m_cameras;
+    std::map<const Geometry*, int> m_jointCounts;
+    bool m_isAffordable;
+    uint64_t m_valuesLeft;
     Images m_images;
     Findings& m_findings;
     std::set<std::string> m_nodes;

@@ -20,12 +20,21 @@ std::string Chunk::getName() const
 
 const Chunk& Chunk::find(uint32_t childId, size_t childRecord) const
 {
-    for (const Chunk& child : children)
-    {
-        if (child.id == childId && child.record == childRecord)
-            return child;
-    }
-    return *this;
+    const auto place = m_places.find({childId, childRecord});
+    return place != m_places.end() ? children[place->second] : *this;
+}
+
+void Chunk::add(Chunk&& child)
+{
+    ++m_counts[child.id];
+    m_places.emplace(std::pair(child.id, child.record), children.size());
+    children.push_back(std::move(child));
+}
+
+size_t Chunk::count(uint32_t childId) const
+{
+    const auto found = m_counts.find(childId);
+    return found != m_counts.end() ? found->second : 0;
 }
 
 namespace
@@ -94,7 +103,7 @@ public:
 
     ScannedFile scan()
     {
-        m_end = m_bytes.size();
+        m_file.size = m_end = m_bytes.size();
         m_chunk = &m_outside;
         if (m_bytes.size() < 8 || peekWord() != GloScene::ID)
         {
@@ -105,8 +114,8 @@ public:
         m_file.top = std::move(m_outside.children.front());
         if (m_position < m_bytes.size())
             m_findings.add(Kind::CHUNK_SIZE, m_position, m_file.top.path,
-                           "the GLO3 chunk ends " + number(m_bytes.size() - m_position) +
-                               " bytes before the file");
+                           "the GLO3 chunk ends " + counted(m_bytes.size() - m_position, "byte", "bytes") +
+                               " before the file");
         if (!m_hasInfo)
             report(Kind::NO_INFO, 0, "there is no INFO chunk, so the file is read as one of version 0.0.0");
         return std::move(m_file);
@@ -312,8 +321,8 @@ public:
         if (channel.keyCount > 0 && (keySize > left || channel.keyCount > left / keySize))
         {
             report(Kind::KEYS_CUT, m_position,
-                   number(channel.keyCount) + " keys of " + number(keySize) + " bytes do not fit the " +
-                       number(left) + " bytes that are left");
+                   counted(channel.keyCount, "key", "keys") + " of " + number(keySize) +
+                       " bytes each, where " + counted(left, "byte is", "bytes are") + " left");
             return false;
         }
         const auto start = m_bytes.begin() + ptrdiff_t(m_position);
@@ -383,11 +392,10 @@ private:
         m_position += 4;
         child.size = peekWord();
         m_position += 4;
-        const auto same = std::count_if(m_chunk->children.begin(), m_chunk->children.end(),
-                                        [&](const Chunk& other) { return other.id == child.id; });
+        const size_t same = m_chunk->count(child.id);
         child.path = (m_chunk->path.empty() ? "" : m_chunk->path + "/") + name(child.id);
         if (same > 0 || isListed(child.id))
-            child.path += "[" + number(uint64_t(same)) + "]";
+            child.path += "[" + number(same) + "]";
         return true;
     }
 
@@ -407,8 +415,9 @@ private:
             return m_position + child.size;
         if (!std::exchange(m_cut, true)) // once, at the outermost
             report(Kind::CHUNK_CUT, child.offset,
-                   "the " + name(child.id) + " chunk of " + number(child.size) + " bytes reaches " +
-                       number(child.size - (m_end - m_position)) + " bytes too far");
+                   "the " + name(child.id) + " chunk of " + counted(child.size, "byte", "bytes") +
+                       " reaches " + counted(child.size - (m_end - m_position), "byte", "bytes") +
+                       " too far");
         return m_end;
     }
 
@@ -429,15 +438,15 @@ private:
             ++m_depth;
             if (content() && m_position < end)
                 report(Kind::CHUNK_SIZE, m_position,
-                       "the " + name(child.id) + " chunk says " + number(child.size) + " bytes but holds " +
-                           number(child.size - (end - m_position)));
+                       "the " + name(child.id) + " chunk says " + counted(child.size, "byte", "bytes") +
+                           " but holds " + number(child.size - (end - m_position)));
             --m_depth;
         }
         m_position = end;
         m_cut = outerCut;
         m_end = outerEnd;
         m_chunk = outer;
-        outer->children.push_back(std::move(child));
+        outer->add(std::move(child));
     }
 
     void skipChunk(Chunk& child)
@@ -446,7 +455,7 @@ private:
         const bool outerCut = m_cut;
         m_position = findEnd(child);
         m_cut = outerCut;
-        m_chunk->children.push_back(std::move(child));
+        m_chunk->add(std::move(child));
     }
 
     bool readBody(uint32_t id, GloScene& scene)

@@ -18,6 +18,7 @@ struct ScannedFile
     orv::detail::glo::GloScene scene;
     orv::detail::glo::FileVersion version; ///< what the engine takes it for
     orv::detail::glo::AuthoringTool tool = orv::detail::glo::AuthoringTool::MAX;
+    uint64_t size = 0; ///< of the file in bytes
 };
 
 /// Reads chunk by chunk by the engine's own field lists. Where the engine stops at the first fault, this reports

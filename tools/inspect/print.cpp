@@ -1,5 +1,6 @@
 #include "print.h"
 
+#include <algorithm>
 #include <cstdio>
 
 namespace inspect
@@ -30,6 +31,56 @@ std::string toText(const ordered_json& value)
     if (text.size() > LONGEST_VALUE)
         text = text.substr(0, LONGEST_VALUE) + "...";
     return text;
+}
+
+/// The code point that begins there; its length is 0 if that is no sound UTF-8.
+uint32_t readCodePoint(const std::string& text, size_t at, size_t& length)
+{
+    const auto byte = [&](size_t i) { return i < text.size() ? uint32_t(uint8_t(text[i])) : 0u; };
+    const uint32_t first = byte(at);
+    constexpr uint32_t LEAST[] = {0, 0, 0x80, 0x800, 0x10000};
+    length = first < 0x80 ? 1 : first >> 5 == 6 ? 2 : first >> 4 == 14 ? 3 : first >> 3 == 30 ? 4 : 0;
+    if (length < 2)
+        return first;
+    uint32_t point = first & (0x7fu >> length);
+    for (size_t i = 1; i < length; ++i)
+    {
+        if (byte(at + i) >> 6 != 2)
+            length = 0;
+        point = point << 6 | (byte(at + i) & 0x3f);
+    }
+    if (length > 0 && (point < LEAST[length] || point > 0x10ffff))
+        length = 0;
+    return point;
+}
+
+/// What moves the cursor, colours, begins a line or turns the direction of writing.
+bool isControl(uint32_t point)
+{
+    return point < 0x20 || (point >= 0x7f && point < 0xa0) || point == 0x61c || point == 0x200e ||
+           point == 0x200f || (point >= 0x2028 && point <= 0x202e) || (point >= 0x2066 && point <= 0x2069) ||
+           (point >= 0xd800 && point < 0xe000);
+}
+
+/// Safe for a terminal and for what reads lines: names come from files. Other bytes are written as "\x1b".
+std::string escape(const std::string& text)
+{
+    std::string escaped;
+    for (size_t at = 0; at < text.size();)
+    {
+        size_t length;
+        const uint32_t point = readCodePoint(text, at, length);
+        const bool isPlain = length > 0 && !isControl(point);
+        const size_t size = std::max<size_t>(length, 1);
+        for (size_t i = at; i < at + size; ++i)
+        {
+            char code[8];
+            std::snprintf(code, sizeof(code), "\\x%02x", unsigned(uint8_t(text[i])));
+            escaped += isPlain ? std::string(1, text[i]) : code;
+        }
+        at += size;
+    }
+    return escaped;
 }
 
 void printChunk(const Chunk& chunk, int depth)
@@ -100,27 +151,36 @@ void printTree(const Report& report)
     {
         std::printf("%4d ", statement.line);
         for (const std::string& word : statement.words)
-            std::printf(" %s", word.c_str());
+            std::printf(" %s", escape(word).c_str());
         std::printf("\n");
     }
 }
 
 void printTotals(const Report& report)
 {
-    std::printf("%s: %s, %llu bytes\n", report.path.c_str(), report.kind.c_str(),
-                static_cast<unsigned long long>(report.size));
+    std::printf("%s: %s, %s\n", escape(report.path).c_str(), report.kind.c_str(),
+                counted(report.size, "byte", "bytes").c_str());
     if (report.kind != "scene")
         return;
     const GloScene& scene = report.scene.scene;
     const Forecast& forecast = report.forecast;
-    std::printf(
-        "  holds   %d nodes, %zu geometries (%llu vertices), %zu materials, %zu skins, %zu lights, %zu "
-        "cameras, %zu animations (%llu keys)\n",
-        forecast.nodes, scene.geometries.size(), static_cast<unsigned long long>(forecast.vertices),
-        scene.materials.size(), scene.skins.size(), scene.lights.size(), scene.cameras.size(),
-        scene.animations.size(), static_cast<unsigned long long>(forecast.keys));
-    std::printf("  drawn   %d draws, %llu triangles\n", forecast.draws,
-                static_cast<unsigned long long>(forecast.triangles));
+    const std::string holds[] = {
+        counted(uint64_t(forecast.nodes), "node", "nodes"),
+        counted(scene.geometries.size(), "geometry", "geometries") + " (" +
+            counted(forecast.vertices, "vertex", "vertices") + ")",
+        counted(scene.materials.size(), "material", "materials"),
+        counted(scene.skins.size(), "skin", "skins"),
+        counted(scene.lights.size(), "light", "lights"),
+        counted(scene.cameras.size(), "camera", "cameras"),
+        counted(scene.animations.size(), "animation", "animations") + " (" +
+            counted(forecast.keys, "key", "keys") + ")",
+    };
+    std::string line = "  holds   ";
+    for (const std::string& item : holds)
+        line += (&item == holds ? "" : ", ") + item;
+    std::printf("%s\n  drawn   %s, %s\n", line.c_str(),
+                counted(uint64_t(forecast.draws), "draw", "draws").c_str(),
+                counted(forecast.triangles, "triangle", "triangles").c_str());
     std::printf("  memory  %llu bytes on the GPU: %llu vertices, %llu indices, %llu textures\n",
                 static_cast<unsigned long long>(forecast.vertexBytes) + forecast.indexBytes +
                     forecast.textureBytes,
@@ -128,21 +188,26 @@ void printTotals(const Report& report)
                 static_cast<unsigned long long>(forecast.indexBytes),
                 static_cast<unsigned long long>(forecast.textureBytes));
     for (const Forecast::Program& program : forecast.programs)
-        std::printf("  program %s for %d draws\n", program.name.c_str(), program.draws);
+        std::printf("  program %s for %s\n", program.name.c_str(),
+                    counted(uint64_t(program.draws), "draw", "draws").c_str());
 }
 
 void printFindings(const Report& report)
 {
+    const std::string file = escape(report.path);
     for (const Finding& finding : report.findings.getSorted())
     {
         const KindInfo& info = getInfo(finding.kind);
-        std::printf("%s: %s %s at %llu, %s: %s\n", report.path.c_str(), getName(info.severity), info.code,
-                    static_cast<unsigned long long>(finding.offset), finding.path.c_str(),
-                    finding.sentence.c_str());
+        const std::string place = finding.path.empty() ? "" : ", " + escape(finding.path);
+        std::printf("%s: %s %s at %llu%s: %s\n", file.c_str(), getName(info.severity), info.code,
+                    static_cast<unsigned long long>(finding.offset), place.c_str(),
+                    escape(finding.sentence).c_str());
     }
-    std::printf("%s: %d errors, %d warnings, %d notes\n", report.path.c_str(),
-                report.findings.count(Severity::ERROR), report.findings.count(Severity::WARNING),
-                report.findings.count(Severity::NOTE));
+    const auto count = [&report](Severity severity, const char* one, const char* many)
+    { return counted(uint64_t(report.findings.count(severity)), one, many); };
+    std::printf("%s: %s, %s, %s\n", file.c_str(), count(Severity::ERROR, "error", "errors").c_str(),
+                count(Severity::WARNING, "warning", "warnings").c_str(),
+                count(Severity::NOTE, "note", "notes").c_str());
 }
 
 ordered_json toJson(const Report& report)
