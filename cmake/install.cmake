@@ -69,4 +69,12 @@ set(CPACK_DEBIAN_DEVELOPMENT_PACKAGE_NAME liborv-dev)
 set(CPACK_DEBIAN_DEVELOPMENT_PACKAGE_SECTION libdevel)
 set(CPACK_DEBIAN_DEVELOPMENT_PACKAGE_DEPENDS "liborv${PROJECT_VERSION_MAJOR} (= ${PROJECT_VERSION})")
 set(CPACK_COMPONENT_DEVELOPMENT_DESCRIPTION "Headers, documentation and what CMake and pkg-config need.")
+
+# Whoever packs the same change gets the same bytes: files in a package are as old as the change.
+file(CONFIGURE OUTPUT packagetime.cmake @ONLY CONTENT
+"if(NOT DEFINED ENV{SOURCE_DATE_EPOCH} AND NOT \"@ORV_CHANGE_TIME@\" STREQUAL \"\")
+    set(ENV{SOURCE_DATE_EPOCH} @ORV_CHANGE_TIME@)
+endif()
+")
+set(CPACK_PROJECT_CONFIG_FILE ${CMAKE_CURRENT_BINARY_DIR}/packagetime.cmake)
 include(CPack)
