@@ -2,6 +2,9 @@
 
 #include "facilitytest.h"
 
+#include "orv/appearance.h"
+
+#include <cmath>
 #include <functional>
 #include <memory>
 
@@ -273,6 +276,45 @@ TEST_F(RenderContextTest, attributeArraysAreSwitchedByDifference)
     target.setAttribArrays(0b0100u);
     target.setAttribArrays(0);
     EXPECT_EQ(1u, callsOf([&] { target.setAttribOnes(2); }).size());
+}
+
+// Faults caught: GL errors, or a value sent for ever anew, from numbers that GL does not take.
+TEST_F(RenderContextTest, refusesWhatGlWouldRefuse)
+{
+    const float nan = NAN;
+    RenderContext target;
+    Appearance appearance;
+    RenderState before = target.getState();
+    const Set refused[] = {
+        [](auto& c) { c.setLineWidth(0.0f); },
+        [](auto& c) { c.setLineWidth(-1.0f); },
+        [nan](auto& c) { c.setLineWidth(nan); },
+        [](auto& c) { c.setScissorBox(0, 0, -1, 5); },
+        [](auto& c) { c.setScissorBox(0, 0, 5, -1); },
+        [](auto& c) { c.setViewport(0, 0, -1, 5); },
+        [](auto& c) { c.setViewport(0, 0, 5, -1); },
+        [nan](auto& c) { c.setDepthOffset(nan, 1.0f); },
+        [nan](auto& c) { c.setDepthOffset(1.0f, nan); },
+        [nan](auto& c) { c.setDepthRange(nan, 1.0f); },
+        [nan](auto& c) { c.setDepthRange(0.0f, nan); },
+        [nan](auto& c) { c.setClearDepth(nan); },
+        [&](auto&) { appearance.setLineWidth(nan); },
+        [&](auto&) { appearance.setLineWidth(0.0f); },
+        [&](auto&) { appearance.setScissorBox(1, 1, -1, 1); },
+        [&](auto&) { appearance.setDepthOffset(0.0f, nan); },
+    };
+    for (const Set& set : refused)
+    {
+        LogCapture log;
+        EXPECT_EQ(Calls(), callsOf([&] { set(target); })) << &set - refused;
+        EXPECT_EQ(1, log.count('E')) << &set - refused;
+        EXPECT_EQ(1, log.countMessage("; the old one is kept.")) << log.text();
+    }
+    EXPECT_EQ(before, target.getState());
+    EXPECT_EQ(RenderState(), appearance.getRenderState());
+    EXPECT_EQ(64, target.getViewportWidth());
+    EXPECT_EQ(1.0f, target.getClearDepth());
+    EXPECT_EQ(Calls{"glScissor(0, 0, 0, 0)"}, callsOf([&] { target.setScissorBox(0, 0, 0, 0); }));
 }
 
 // Faults caught: a property overwritten under those who linked it; programs that never learn of a later one.

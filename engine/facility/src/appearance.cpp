@@ -70,6 +70,8 @@ void Appearance::setWindingOrder(WindingOrder order)
 
 void Appearance::setLineWidth(float width)
 {
+    if (!detail::allowLineWidth(width))
+        return;
     m_state.lineWidth = width;
     stateChanged();
 }
@@ -91,6 +93,8 @@ void Appearance::setDepthWriteEnabled(bool enabled)
 
 void Appearance::setDepthOffset(float factor, float units)
 {
+    if (!detail::allowNumbers("Depth offset", factor, units))
+        return;
     m_state.depthOffsetFactor = factor;
     m_state.depthOffsetUnits = units;
     stateChanged();
@@ -116,6 +120,8 @@ void Appearance::setScissorTestEnabled(bool enabled)
 
 void Appearance::setScissorBox(int x, int y, int width, int height)
 {
+    if (!detail::allowSize("Scissor box", width, height))
+        return;
     m_state.scissorX = x;
     m_state.scissorY = y;
     m_state.scissorWidth = width;

@@ -151,7 +151,7 @@ void RenderContext::setWindingOrder(WindingOrder order)
 
 void RenderContext::setLineWidth(float pixels)
 {
-    if (pixels == m_state.lineWidth)
+    if (pixels == m_state.lineWidth || !detail::allowLineWidth(pixels))
         return;
     stateChanged();
     m_state.lineWidth = pixels;
@@ -184,7 +184,8 @@ void RenderContext::setDepthOffset(float factor, float units)
 {
     const float previousFactor = m_state.depthOffsetFactor;
     const float previousUnits = m_state.depthOffsetUnits;
-    if (factor == previousFactor && units == previousUnits)
+    if ((factor == previousFactor && units == previousUnits) ||
+        !detail::allowNumbers("Depth offset", factor, units))
         return;
     stateChanged();
     m_state.depthOffsetFactor = factor;
@@ -232,6 +233,8 @@ void RenderContext::setScissorBox(int x, int y, int width, int height)
 {
     if (x == m_state.scissorX && y == m_state.scissorY && width == m_state.scissorWidth &&
         height == m_state.scissorHeight)
+        return;
+    if (!detail::allowSize("Scissor box", width, height))
         return;
     stateChanged();
     m_state.scissorX = x;
@@ -302,6 +305,8 @@ void RenderContext::setViewport(int x, int y, int width, int height)
 {
     if (x == m_viewport[0] && y == m_viewport[1] && width == m_viewport[2] && height == m_viewport[3])
         return;
+    if (!detail::allowSize("Viewport", width, height))
+        return;
     m_viewport[0] = x;
     m_viewport[1] = y;
     m_viewport[2] = width;
@@ -311,7 +316,8 @@ void RenderContext::setViewport(int x, int y, int width, int height)
 
 void RenderContext::setDepthRange(float zNear, float zFar)
 {
-    if (zNear == m_depthRange[0] && zFar == m_depthRange[1])
+    if ((zNear == m_depthRange[0] && zFar == m_depthRange[1]) ||
+        !detail::allowNumbers("Depth range", zNear, zFar))
         return;
     m_depthRange[0] = zNear;
     m_depthRange[1] = zFar;
@@ -328,7 +334,7 @@ void RenderContext::setClearColour(const Colour4f& colour)
 
 void RenderContext::setClearDepth(float depth)
 {
-    if (depth == m_clearDepth)
+    if (depth == m_clearDepth || !detail::allowNumbers("Clear depth", depth))
         return;
     m_clearDepth = depth;
     glClearDepthf(depth);

@@ -5,6 +5,12 @@
 namespace orv
 {
 
+void Background::setDepth(float depth)
+{
+    if (detail::allowNumbers("Clear depth", depth))
+        m_depth = depth;
+}
+
 void Background::setColourMask(bool red, bool green, bool blue, bool alpha)
 {
     m_colourMask[0] = red;

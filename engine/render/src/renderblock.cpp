@@ -43,6 +43,8 @@ void RenderBlock::setRenderFlags(const FlagMask& renderFlags, const FlagMask& re
 
 void RenderBlock::setViewport(int x, int y, int width, int height)
 {
+    if (!detail::allowSize("Viewport", width, height))
+        return;
     m_viewport = {x, y, width, height};
     m_viewportIsOwn = true;
 }

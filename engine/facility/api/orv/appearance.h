@@ -38,7 +38,9 @@ public:
     const char* getName() const { return m_name.c_str(); }
     void setName(const char* name); ///< copied; null counts as empty
 
-    /// The render state as it was set. Each setter below stores its arguments; the next enable() sends them.
+    /// The render state as it was set. Each setter below stores its arguments; the next enable() sends them. What
+    /// GL would refuse (a line width that is not above 0, a negative width or height, a depth offset of NaN) is
+    /// logged and not stored.
     const RenderState& getRenderState() const { return m_state; }
 
     void setBlendColour(const Colour4f& colour);

@@ -22,7 +22,8 @@ class ShaderUniformBase;
 /// the defaults of a freshly created context, so a RenderContext is made once, on a fresh GL context, and
 /// after a context loss a new one is made for the new context. State changed behind its back stays unnoticed;
 /// bindings (textures, buffers, programs) are the exception, see detail/bindingepoch.h.
-/// An enum value outside its enum is logged, cached, and sent as GL_INVALID_ENUM, which GL refuses.
+/// An enum value outside its enum is logged, cached, and sent as GL_INVALID_ENUM, which GL refuses. A line width
+/// that is not above 0, a negative width or height, and NaN for a depth are logged, and the old value stays.
 /// GL thread only.
 class ORV_API RenderContext : public Shared
 {

@@ -1,6 +1,7 @@
 #pragma once
 
 #include "orv/colour.h"
+#include "orv/export.h"
 
 #include <cstddef>
 #include <cstdint>
@@ -222,5 +223,20 @@ struct RenderState
 
     bool operator==(const RenderState&) const = default;
 };
+
+namespace detail
+{
+
+// What setters ask before they take a value that GL would refuse. The caller keeps the old one after false, which
+// is logged.
+
+/// Above 0.
+ORV_API bool allowLineWidth(float pixels);
+/// @param of  what has the size, for the message; neither side may be negative.
+ORV_API bool allowSize(const char* of, int width, int height);
+/// Neither value may be NaN.
+ORV_API bool allowNumbers(const char* of, float first, float second = 0.0f);
+
+} // namespace detail
 
 } // namespace orv

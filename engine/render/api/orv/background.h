@@ -20,7 +20,7 @@ public:
     const Colour4f& getColour() const { return m_colour; }
     void setColour(const Colour4f& colour) { m_colour = colour; }
     float getDepth() const { return m_depth; }
-    void setDepth(float depth) { m_depth = depth; }
+    void setDepth(float depth); ///< NaN is refused (logged)
     int getStencil() const { return m_stencil; }
     void setStencil(int stencil) { m_stencil = stencil; }
 

@@ -54,7 +54,8 @@ public:
     void setRenderFlags(const FlagMask& renderFlags, const FlagMask& recursiveFlags);
 
     /// In pixels, from the lower left. Until this is called a block draws to the whole of its render target
-    /// or, without one, to the viewport that the render context had when the block was made.
+    /// or, without one, to the viewport that the render context had when the block was made. Negative sizes are
+    /// refused (logged).
     void setViewport(int x, int y, int width, int height);
 
     Background& getBackground() { return m_background; }
