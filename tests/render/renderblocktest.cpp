@@ -4,6 +4,8 @@
 
 #include <GLES2/gl2.h>
 
+#include <limits>
+
 using namespace orv;
 
 using RenderBlockTest = SceneTest;
@@ -65,6 +67,83 @@ TEST_F(RenderBlockTest, groupDoesNotTakeItself)
     inner->addBlock(outer);
     EXPECT_EQ(2, log.count('E')) << log.text();
     outer->render();
+}
+
+// Faults caught: a view that clears the views beside it, or leaves the box that it cleared in for the next draws.
+TEST_F(RenderBlockTest, clearsItsViewportAloneWhenTold)
+{
+    addSquare(Vector3f(), 1.0f, makePaint(Colour4f::RED));
+    RenderBlock whole(renderer, nullptr, camera);
+    whole.setBackgroundColour(Colour4f::BLUE);
+    RenderBlock inset(renderer, scene, camera);
+    inset.setBackgroundColour(Colour4f::GREEN);
+    inset.setViewport(32, 0, 32, 16);
+    for (const bool only : {true, false})
+    {
+        inset.getBackground().setViewportOnly(only);
+        whole.render();
+        inset.render();
+        const support::Picture frame = support::readFrame();
+        EXPECT_EQ(only ? BLUE : GREEN, frame.pixel(10, 10));
+        EXPECT_EQ(only ? BLUE : GREEN, frame.pixel(31, 60));
+        EXPECT_EQ(GREEN, frame.pixel(33, 49));
+        EXPECT_EQ(RED, frame.pixel(48, 56));
+    }
+
+    support::LogCapture log;
+    inset.setViewport(0, 0, -4, 4);
+    whole.getBackground().setDepth(std::numeric_limits<float>::quiet_NaN());
+    EXPECT_EQ(2, log.count('E'));
+    inset.render();
+    EXPECT_EQ(RED, support::readFrame().pixel(48, 56)) << "the old viewport";
+    EXPECT_EQ(1.0f, whole.getBackground().getDepth());
+}
+
+// Faults caught: what is below a hidden node still drawn; a layer that shows what is not in it, or hidden.
+TEST_F(RenderBlockTest, leavesOutWhatIsHiddenAndWhatIsInOtherLayers)
+{
+    const FlagMask layer(1);
+    const auto group = makeShared<SceneNode>();
+    group->setParent(scene);
+    const auto red = addSquare(Vector3f(-1.5f, 0, 0), 1.0f, makePaint(Colour4f::RED));
+    const auto green = addSquare(Vector3f(1.5f, 0, 0), 1.0f, makePaint(Colour4f::GREEN));
+    green->setParent(group);
+    RenderBlock block(renderer, scene, camera);
+    block.setBackgroundColour(Colour4f::BLACK);
+    const struct
+    {
+        FlagMask flags;
+        SceneNode* hidden;
+        SceneNode* inLayer;
+        bool redSeen, greenSeen;
+    } cases[] = {
+        {SceneNode::VISIBLE, nullptr, nullptr, true, true},
+        {SceneNode::VISIBLE, group.get(), nullptr, true, false},
+        {SceneNode::VISIBLE, red.get(), nullptr, false, true},
+        {SceneNode::VISIBLE, scene.get(), nullptr, false, false},
+        {FlagMask(), group.get(), nullptr, true, true},
+        {layer, nullptr, group.get(), false, true},
+        {layer, nullptr, nullptr, false, false},
+        {FlagMask(SceneNode::VISIBLE.mask | 1, SceneNode::VISIBLE.inverted), green.get(), scene.get(), true,
+         false},
+        {FlagMask(SceneNode::VISIBLE.mask | 1, SceneNode::VISIBLE.inverted), group.get(), green.get(), false,
+         false},
+    };
+    for (const auto& c : cases)
+    {
+        for (SceneNode* node : {scene.get(), group.get(), static_cast<SceneNode*>(red.get()),
+                                static_cast<SceneNode*>(green.get())})
+        {
+            node->setVisible(node != c.hidden);
+            EXPECT_EQ(node != c.hidden, node->isVisible());
+            setFlags(*node, layer, node == c.inLayer);
+        }
+        block.setRenderFlags(c.flags);
+        block.render();
+        const support::Picture frame = support::readFrame();
+        EXPECT_EQ(c.redSeen ? RED : BLACK, frame.pixel(16, 32)) << &c - cases;
+        EXPECT_EQ(c.greenSeen ? GREEN : BLACK, frame.pixel(48, 32)) << &c - cases;
+    }
 }
 
 // Fault caught: a block that draws nothing, or into a corner, because nobody gave it a viewport.

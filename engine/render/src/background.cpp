@@ -27,8 +27,12 @@ void Background::enable(RenderContext& context) const
     context.setClearDepth(m_depth);
     context.setClearStencil(m_stencil);
     context.setClearColour(m_colour);
-    context.setScissorTestEnabled(false);
+    if (m_viewportOnly)
+        context.setScissorBox(context.getViewportX(), context.getViewportY(), context.getViewportWidth(),
+                              context.getViewportHeight());
+    context.setScissorTestEnabled(m_viewportOnly);
     context.clear();
+    context.setScissorTestEnabled(false);
 }
 
 } // namespace orv

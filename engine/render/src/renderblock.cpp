@@ -41,6 +41,11 @@ void RenderBlock::setRenderFlags(const FlagMask& renderFlags, const FlagMask& re
     m_recursiveFlags = recursiveFlags;
 }
 
+void RenderBlock::setRenderFlags(const FlagMask& flags)
+{
+    setRenderFlags(flags, flags);
+}
+
 void RenderBlock::setViewport(int x, int y, int width, int height)
 {
     if (!detail::allowSize("Viewport", width, height))

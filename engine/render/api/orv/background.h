@@ -11,6 +11,8 @@ namespace orv
 class RenderContext;
 
 /// What a view is cleared to, and which buffers are: a mask that is off keeps its buffer.
+///
+/// The whole surface or target is cleared, beyond the viewport too, unless setViewportOnly() says otherwise.
 class ORV_API Background
 {
 public:
@@ -28,7 +30,12 @@ public:
     void setDepthMask(bool enabled) { m_depthMask = enabled; }
     void setStencilMask(uint32_t mask) { m_stencilMask = mask; }
 
-    /// Sets masks and clear values, switches the scissor test off and clears. The state stays set.
+    /// true clears the viewport alone, for a view beside or upon others; false, as at first, the whole surface.
+    void setViewportOnly(bool only) { m_viewportOnly = only; }
+    bool isViewportOnly() const { return m_viewportOnly; }
+
+    /// Sets masks and clear values, clears, and leaves the scissor test off. The state stays set; for the viewport
+    /// alone the scissor box is set to it.
     /// GL thread only.
     void enable(RenderContext& context) const;
 
@@ -38,6 +45,7 @@ private:
     int m_stencil = 0;
     bool m_colourMask[4] = {true, true, true, true};
     bool m_depthMask = true;
+    bool m_viewportOnly = false;
     uint32_t m_stencilMask = 0xFFFFFFFF;
 };
 

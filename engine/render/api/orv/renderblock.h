@@ -32,6 +32,9 @@ public:
 };
 
 /// One view of a scene: a renderer, the scene, a camera, where to draw, and what to clear first.
+///
+/// A block clears all of its surface or target, beyond its viewport too. One that shares the surface with others
+/// says so: getBackground().setViewportOnly(true).
 class ORV_API RenderBlock : public RenderBlockBase
 {
 public:
@@ -52,6 +55,9 @@ public:
 
     /// See visitScene(); both mean no flag at first, so that everything is drawn.
     void setRenderFlags(const FlagMask& renderFlags, const FlagMask& recursiveFlags);
+    /// The same mask for both, for flags that a node hands down to all below it: SceneNode::VISIBLE, or the layers
+    /// of docs/guide.md.
+    void setRenderFlags(const FlagMask& flags);
 
     /// In pixels, from the lower left. Until this is called a block draws to the whole of its render target
     /// or, without one, to the viewport that the render context had when the block was made. Negative sizes are

@@ -1,5 +1,6 @@
 #pragma once
 
+#include "orv/flagmask.h"
 #include "orv/matrix.h"
 #include "orv/quaternion.h"
 #include "orv/shared.h"
@@ -56,6 +57,15 @@ public:
     /// Flag bits as stored: wanted state XOR the flag's inverted bit; see FlagMask and setFlags().
     uint32_t getFlags() const { return m_flags; }
     void setFlags(uint32_t storedBits) { m_flags = storedBits; }
+
+    /// The flag that setVisible() is about: bit 31, on by default.
+    static constexpr FlagMask VISIBLE{0x80000000u, 0x80000000u};
+
+    /// Hides this node and all below it from the render blocks that were told setRenderFlags(SceneNode::VISIBLE);
+    /// others draw it all the same. Nothing but a flag: setFlags(node, VISIBLE, visible).
+    void setVisible(bool visible) { m_flags = visible ? m_flags & ~VISIBLE.mask : m_flags | VISIBLE.mask; }
+    /// What was set here; getDerivedFlags(node, VISIBLE) asks the nodes above as well.
+    bool isVisible() const { return (m_flags & VISIBLE.mask) == 0; }
 
     const Vector3f& getPosition() const { return m_position; }
     const Quaternionf& getRotation() const { return m_rotation; }
