@@ -118,6 +118,37 @@ TEST_F(SolidTest, turnsTheWindingOfMirroredSolids)
     }
 }
 
+// Faults caught: the winding of a skinned mesh taken from the solid, which does not move it; that of any other mesh
+// taken from its joints.
+TEST_F(SolidTest, skinsKeepTheirRightSideOut)
+{
+    const auto skinned = makeShared<Appearance>();
+    skinned->setShaderProgram(
+        makeProgram("attribute vec3 a_position; uniform mat4 u_viewProjection, u_joints[20];"
+                    "void main() { gl_Position = u_viewProjection * u_joints[1] * vec4(a_position, 1.0); }",
+                    "void main() { gl_FragColor = vec4(1.0, 0.0, 0.0, 1.0); }",
+                    {{"u_viewProjection", "T_VIEW_PROJECTION"}, {"u_joints", "J_WORLD"}}));
+    const auto plain = makePaint(Colour4f::RED);
+    const auto mirrorIf = [](unsigned bit) { return scaleMatrix(Vector3f(bit ? -1.0f : 1.0f, 1, 1)); };
+    for (unsigned mirrored = 0; mirrored < 64; ++mirrored)
+    {
+        const auto joint = makeShared<SceneNode>();
+        joint->setParent(scene);
+        joint->setScale(Vector3f(mirrored & 1 ? -1.0f : 1.0f, 1, 1));
+        const auto solid = addSquare(Vector3f(), 1.0f, mirrored & 32 ? plain : skinned);
+        solid->setScale(Vector3f(mirrored & 2 ? -1.0f : 1.0f, 1, 1));
+        solid->setBindShapeTransform(mirrorIf(mirrored & 4));
+        const SharedPtr<SceneNode> bound =
+            mirrored & 16 ? nullptr : joint; // an unbound one rests on the solid
+        for (int i = 0; i < 3; ++i)
+            solid->attachJoint(bound, mirrorIf(mirrored & 8));
+        renderFrame();
+        EXPECT_EQ(RED, support::readFrame().pixel(32, 32)) << mirrored;
+        solid->setParent(nullptr);
+        joint->setParent(nullptr);
+    }
+}
+
 // Fault caught: the buffers of a mesh read by a program that was never told about them, or by none.
 TEST_F(SolidTest, drawsWithTheCurrentProgramWhenItHasNone)
 {

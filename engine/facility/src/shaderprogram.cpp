@@ -38,6 +38,7 @@ constexpr NamedDrawProperty DRAW_PROPERTIES[] = {
     {"T_MODEL_VIEW", detail::DRAW_MODEL_VIEW},
     {"T_MODEL_VIEW_PROJECTION", detail::DRAW_MODEL_VIEW_PROJECTION},
     {"T_NORMAL_MODEL", detail::DRAW_NORMAL_MODEL},
+    {"J_WORLD", detail::DRAW_JOINTS},
 };
 
 const GLfloat MISSING_ATTRIB[4] = {1.0f, 1.0f, 1.0f, 1.0f};

@@ -21,6 +21,18 @@ int findEyes(Camera* camera, float aspect, Eye (&eyes)[2])
     return 1;
 }
 
+MirroredView::MirroredView(RenderContext& context, const Camera* camera)
+    : m_context(context)
+    , m_before(context.isViewMirrored())
+{
+    context.setViewMirrored(camera && camera->getWorldMirrored());
+}
+
+MirroredView::~MirroredView()
+{
+    m_context.setViewMirrored(m_before);
+}
+
 Viewport getViewport(const RenderContext& context)
 {
     return {context.getViewportX(), context.getViewportY(), context.getViewportWidth(),

@@ -24,6 +24,21 @@ struct Eye
 /// @return 2 for a camera with an eye separation (left, right), else 1.
 int findEyes(Camera* camera, float aspect, Eye (&eyes)[2]);
 
+/// While it lives, the context turns windings if the camera's world transform mirrors.
+class MirroredView
+{
+public:
+    /// @param camera  may be null, which mirrors nothing.
+    MirroredView(RenderContext& context, const Camera* camera);
+    ~MirroredView();
+    MirroredView(const MirroredView&) = delete;
+    MirroredView& operator=(const MirroredView&) = delete;
+
+private:
+    RenderContext& m_context;
+    bool m_before;
+};
+
 Viewport getViewport(const RenderContext& context);
 void setViewport(RenderContext& context, const Viewport& viewport);
 

@@ -86,6 +86,7 @@ void MotionBlurRenderer::render(Camera* camera, SceneNode& scene, const FlagMask
     visitScene(*this, scene, renderFlags, recursiveFlags);
 
     const RenderContext::DrawScope scope(*m_context);
+    const detail::MirroredView mirroredView(*m_context, camera);
     const detail::Viewport full = detail::getViewport(*m_context);
     detail::Eye eyes[2];
     const int eyeCount = detail::findEyes(camera, detail::getAspect(full), eyes);

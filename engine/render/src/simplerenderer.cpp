@@ -97,6 +97,7 @@ void SimpleRenderer::render(Camera* camera, SceneNode& scene, const FlagMask& re
     visitScene(*this, scene, renderFlags, recursiveFlags);
 
     const RenderContext::DrawScope scope(*m_context);
+    const detail::MirroredView mirroredView(*m_context, camera);
     m_viewport = detail::getViewport(*m_context);
     detail::Eye eyes[2];
     const int eyeCount = detail::findEyes(camera, detail::getAspect(m_viewport), eyes);

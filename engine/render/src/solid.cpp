@@ -24,6 +24,11 @@ namespace
     solid.draw(context, appearance);
 }
 
+bool isMirrored(const Matrix4f& transform)
+{
+    return determinant(upper3x3(transform)) < 0.0f;
+}
+
 } // namespace
 
 Solid::Solid() = default;
@@ -65,6 +70,12 @@ void Solid::setJointsPerVertex(int count)
     makeSkin().jointsPerVertex = std::clamp(count, 0, MAX_JOINTS_PER_VERTEX);
 }
 
+void Solid::setBindShapeTransform(const Matrix4f& transform)
+{
+    makeSkin().bindShape = transform;
+    m_skin->bindShapeMirrored = isMirrored(transform);
+}
+
 Solid::Skin& Solid::makeSkin()
 {
     if (!m_skin)
@@ -74,7 +85,8 @@ Solid::Skin& Solid::makeSkin()
 
 void Solid::attachJoint(const SharedPtr<SceneNode>& joint, const Matrix4f& inverseBind)
 {
-    makeSkin().joints.push_back({joint ? joint->tie() : SharedPtr<detail::JointTie>(), inverseBind});
+    makeSkin().joints.push_back(
+        {joint ? joint->tie() : SharedPtr<detail::JointTie>(), inverseBind, isMirrored(inverseBind)});
     if (getJointCount() == MAX_JOINTS + 1)
         ORV_LOG_ERROR("Solid \"%s\" has more than %d joints; the others have no effect.", getName(),
                       MAX_JOINTS);
@@ -107,6 +119,20 @@ Matrix4f Solid::calculateJointTransform(const SceneNode* joint, const Matrix4f& 
     return joint->getWorldTransform() * inverseBind * getBindShapeTransform();
 }
 
+/// Joints that disagree leave a part of the mesh inside out, so most of them count.
+bool Solid::isSkinMirrored() const
+{
+    const int count = std::min(getJointCount(), MAX_JOINTS);
+    int mirrored = 0;
+    for (int i = 0; i < count; ++i)
+    {
+        const Joint& joint = m_skin->joints[static_cast<size_t>(i)];
+        const SceneNode* node = joint.tie ? joint.tie->getNode() : nullptr;
+        mirrored += (node ? node->getWorldMirrored() != joint.bindMirrored : getWorldMirrored()) ? 1 : 0;
+    }
+    return (2 * mirrored > count) != m_skin->bindShapeMirrored;
+}
+
 void Solid::draw(RenderContext& context)
 {
     if (m_appearance)
@@ -119,11 +145,13 @@ void Solid::draw(RenderContext& context, Appearance& appearance)
         return;
     if (!context.isDrawScopeOpen()) [[unlikely]]
         return drawAlone(*this, context, appearance);
-    appearance.enable(context, getWorldMirrored());
-
     ShaderProgram* program = appearance.getShaderProgram().get();
     if (!program)
         program = ShaderProgram::getCurrent(context);
+    const bool isSkinned = m_skin && !m_skin->joints.empty() && program &&
+                           (program->getDrawProperties() & detail::DRAW_JOINTS) != 0;
+    appearance.enable(context, isSkinned ? isSkinMirrored() : getWorldMirrored());
+
     VertexBuffer* vertices = m_mesh->getVertexBuffer().get();
     IndexBuffer* indices = m_mesh->getIndexBuffer().get();
     if (!program || !vertices || !indices)

@@ -129,7 +129,8 @@ public:
     uint64_t apply(const RenderState& state, uint64_t stateRevision, bool blendEnabled,
                    bool turnWinding = false)
     {
-        const uint32_t flags = (blendEnabled ? APPLY_BLEND : 0u) | (turnWinding ? APPLY_TURNED : 0u);
+        const uint32_t flags =
+            ((blendEnabled ? APPLY_BLEND : 0u) | (turnWinding ? APPLY_TURNED : 0u)) ^ m_viewTurns;
         if (stateRevision != m_appliedRevision || flags != m_appliedFlags)
             applyChanged(state, stateRevision, flags);
         return m_appliedRevision;
@@ -140,6 +141,11 @@ public:
     void forgetBindings();
 
     bool isDrawScopeOpen() const { return m_drawScopes != 0; }
+
+    /// Whether apply() turns every winding order once more, for a view that mirrors everything. Renderers set it
+    /// for cameras whose world transform mirrors, and put it back.
+    bool isViewMirrored() const { return m_viewTurns != 0; }
+    void setViewMirrored(bool mirrored) { m_viewTurns = mirrored ? APPLY_TURNED : 0; }
 
     // Draw path: bindings. Each operation does nothing when GL is known to hold what it asks for; what was
     // remembered is forgotten first if bindings were changed elsewhere, or if no DrawScope is open.
@@ -278,6 +284,7 @@ private:
     uint64_t m_propertyRevision;
     uint64_t m_appliedRevision = 0;
     uint32_t m_appliedFlags = 0;
+    uint32_t m_viewTurns = 0;   ///< APPLY_TURNED, or 0
     RenderState m_appliedState; ///< as it was given, before masks and winding order were chosen
 
     unsigned m_drawScopes = 0;

@@ -58,7 +58,8 @@ enum DrawProperty : uint32_t
     DRAW_MODEL_VIEW = 2,
     DRAW_MODEL_VIEW_PROJECTION = 4,
     DRAW_NORMAL_MODEL = 8,
-    DRAW_ALL = 15
+    DRAW_ALL = 15,   ///< the transforms above
+    DRAW_JOINTS = 16 ///< the program skins
 };
 
 } // namespace detail
@@ -110,8 +111,8 @@ public:
     /// uniformExists("M_MIRROR_TEXTURE"), answered without comparing names.
     bool usesMirrorTexture() const { return m_usesMirrorTexture; }
 
-    /// Those of T_MODEL, T_MODEL_VIEW, T_MODEL_VIEW_PROJECTION and T_NORMAL_MODEL that a uniform takes: bits of
-    /// detail::DrawProperty.
+    /// Those of T_MODEL, T_MODEL_VIEW, T_MODEL_VIEW_PROJECTION, T_NORMAL_MODEL and J_WORLD that a uniform takes:
+    /// bits of detail::DrawProperty.
     uint32_t getDrawProperties() const { return m_drawProperties; }
 
     /// Looks the property names up in the context, unless that was done before and neither the context nor its

@@ -56,7 +56,7 @@ public:
 
     /// The transform of the mesh into the space in which the joints were bound; identity at first.
     const Matrix4f& getBindShapeTransform() const { return m_skin ? m_skin->bindShape : Matrix4f::IDENTITY; }
-    void setBindShapeTransform(const Matrix4f& transform) { makeSkin().bindShape = transform; }
+    void setBindShapeTransform(const Matrix4f& transform);
 
     /// Adds the next joint (index 0 first, as the vertices' joint numbers count).
     ///
@@ -80,8 +80,9 @@ public:
     /// Draws the mesh with the solid's own appearance; nothing without one. GL thread only.
     void draw(RenderContext& context);
 
-    /// Enables the appearance and draws the mesh. The winding sent is the appearance's, turned when the
-    /// world transform is mirrored, so that front faces stay front faces.
+    /// Enables the appearance and draws the mesh. The winding sent is the appearance's, turned when the mesh is
+    /// mirrored on its way to the world, so that front faces stay front faces: by the world transform or, where
+    /// the program takes J_WORLD and there are joints, by most of the joints' transforms.
     /// An appearance without a program draws with the program that is current; with none current, nothing is
     /// drawn. GL thread only.
     void draw(RenderContext& context, Appearance& appearance);
@@ -91,16 +92,19 @@ private:
     {
         SharedPtr<detail::JointTie> tie; ///< empty when no joint was given
         Matrix4f inverseBind;
+        bool bindMirrored; ///< inverseBind flips handedness
     };
 
     struct Skin
     {
         int jointsPerVertex = 0;
         Matrix4f bindShape = Matrix4f::IDENTITY;
+        bool bindShapeMirrored = false;
         std::vector<Joint> joints;
     };
 
     Skin& makeSkin();
+    ORV_LOCAL bool isSkinMirrored() const;
     ORV_LOCAL Matrix4f calculateJointTransform(const SceneNode* joint, const Matrix4f& inverseBind) const;
 
     SharedPtr<Mesh> m_mesh;
