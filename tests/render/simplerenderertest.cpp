@@ -7,6 +7,7 @@
 
 #include <cmath>
 #include <limits>
+#include <random>
 #include <set>
 #include <sstream>
 
@@ -54,6 +55,78 @@ TEST_F(SimpleRendererTest, everyMaterialValueOfTheBuiltInProgramsHasADefault)
     EXPECT_EQ(1.0f, property<float>("M_WEATHER_STRETCH"));
     const SharedPtr<Texture2D> flat = property<SharedPtr<Texture2D>>("M_BUMP_TEXTURE");
     EXPECT_TRUE(flat && flat->getWidth() == 1);
+}
+
+// Faults caught: the products in another order, by which what is far from the origin jumps before a camera beside it;
+// a short cut for projections that are not of its kind.
+TEST_F(SimpleRendererTest, modelViewProjectionIsProjectionTimesModelView)
+{
+    const auto multiply = [](const Matrix4f& a, const Matrix4f& b)
+    {
+        Matrix4f product;
+        for (int column = 0; column < 4; ++column)
+        {
+            for (int row = 0; row < 4; ++row)
+            {
+                float sum = 0.0f;
+                for (int i = 0; i < 4; ++i)
+                    sum += a[i][row] * b[column][i];
+                product[column][row] = sum;
+            }
+        }
+        return product;
+    };
+    std::mt19937 random(1);
+    std::uniform_real_distribution<float> number(-2.0f, 2.0f);
+    const auto vector = [&] { return Vector3f(number(random), number(random), number(random)); };
+    const auto solid = addSquare(Vector3f(), 1.0f, makePaint(Colour4f::RED));
+    for (int i = 0; i < 100; ++i)
+    {
+        const float offset = i % 2 ? 100000.0f : 0.0f;
+        camera->setPosition(vector() + Vector3f(offset, 0, 0));
+        point(*camera, Vector3f(offset, 0, 0));
+        solid->setPosition(vector() + Vector3f(offset, 0, 0));
+        solid->setRotation(quaternionFromAxisAngle(vector(), Anglef(number(random))));
+        solid->setScale(i % 3 ? vector() : Vector3f(1, 1, 1));
+        if (i % 7 == 0)
+            solid->setLocalTransform(Matrix4f(Vector4f(vector(), number(random)), Vector4f(vector(), 0.5f),
+                                              Vector4f(vector(), 0.25f), Vector4f(vector(), 2.0f)));
+        camera->setProjectionType(i % 5 ? Camera::ProjectionType::PERSPECTIVE
+                                        : Camera::ProjectionType::ORTHOGRAPHIC);
+        render();
+        Matrix4f projection;
+        camera->getProjection(&projection, 1.0f);
+        const Matrix4f modelView = multiply(inverse(camera->getWorldTransform()), solid->getWorldTransform());
+        const Matrix4f expected = multiply(projection, modelView);
+        EXPECT_EQ(expected, property<Matrix4f>("T_MODEL_VIEW_PROJECTION")) << i;
+        EXPECT_EQ(modelView, property<Matrix4f>("T_MODEL_VIEW")) << i;
+    }
+
+    // The right eye is the last one drawn.
+    camera->setProjectionType(Camera::ProjectionType::PERSPECTIVE);
+    camera->setStereo(4.0f, 0.5f);
+    render();
+    Matrix4f projections[2], eyes[2];
+    camera->getStereoProjection(&projections[0], &projections[1], 1.0f);
+    camera->getStereoWorldTransform(&eyes[0], &eyes[1]);
+    EXPECT_EQ(multiply(projections[1], multiply(inverse(eyes[1]), solid->getWorldTransform())),
+              property<Matrix4f>("T_MODEL_VIEW_PROJECTION"));
+
+    // At rest before the camera, wherever the two are.
+    camera->setStereo(4.0f, 0.0f);
+    camera->setRotation(Quaternionf());
+    solid->setRotation(Quaternionf());
+    solid->setScale(Vector3f(2, 2, 2));
+    const auto placeAt = [&](float x)
+    {
+        camera->setPosition(Vector3f(x, x, 3));
+        solid->setPosition(Vector3f(x + 0.5f, x + 0.5f, 0));
+        render();
+        return property<Matrix4f>("T_MODEL_VIEW_PROJECTION");
+    };
+    const Matrix4f expected = placeAt(0.0f);
+    for (int i = 0; i < 20; ++i)
+        EXPECT_EQ(expected, placeAt(100000.0f + 0.0625f * float(i)));
 }
 
 // Faults caught: directions of the wrong axis or unnormalised, half cones taken for full ones, distances that

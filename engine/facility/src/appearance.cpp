@@ -277,20 +277,25 @@ void Appearance::resetProperties()
     }
 }
 
-void Appearance::enableShaderProgram(RenderContext& context)
+[[gnu::always_inline]] inline void Appearance::enableProgram(RenderContext& context)
 {
     ShaderProgram* program = m_shaderProgram.get();
     if (!program)
         return;
-    if (!m_linked)
+    if (!m_linked) [[unlikely]]
         linkShaderProgram();
     program->enable(context, m_values.data(), m_sources);
+}
+
+void Appearance::enableShaderProgram(RenderContext& context)
+{
+    enableProgram(context);
 }
 
 void Appearance::enable(RenderContext& context, bool turnWinding)
 {
     m_stateRevision = context.apply(m_state, m_stateRevision, !m_opaque, turnWinding);
-    enableShaderProgram(context);
+    enableProgram(context);
 }
 
 } // namespace orv

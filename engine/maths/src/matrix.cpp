@@ -93,6 +93,48 @@ void detail::multiplyAffine(Matrix4f& result, const Matrix4f& m, const Matrix4f&
                       weigh(n.columns[3]) + left.columns[3]);
 }
 
+detail::ModelProjection::ModelProjection(const Matrix4f& viewMatrix, const Matrix4f& projection)
+    : view(viewMatrix)
+{
+    const Vector4f& x = projection.columns[0];
+    const Vector4f& y = projection.columns[1];
+    const Vector4f& z = projection.columns[2];
+    isUsable = isAffine(view) && x == Vector4f(x.x, 0.0f, 0.0f, 0.0f) && y == Vector4f(0.0f, y.y, 0.0f, 0.0f);
+    for (Vector4f& column : view.columns)
+        column.w = column.z;
+    scale = Vector4f(x.x, y.y, z.z, z.w);
+    skew = Vector4f(z.x, z.y, 0.0f, 0.0f);
+    last = projection.columns[3];
+    isSkewed = !(skew == Vector4f());
+}
+
+template <bool IS_SKEWED>
+static void projectModel(Matrix4f& result, const detail::ModelProjection& projection, const Matrix4f& world)
+{
+    const Matrix4f left = projection.view; // as above
+    const Vector4f scale = projection.scale;
+    const Vector4f skew = projection.skew;
+    const auto weigh = [&left](const Vector4f& v) __attribute__((always_inline))
+    {
+        return left.columns[0] * v.x + left.columns[1] * v.y + left.columns[2] * v.z;
+    };
+    const auto project = [&scale, &skew ](const Vector4f& v) __attribute__((always_inline))
+    {
+        return IS_SKEWED ? v * scale + skew * v.z : v * scale;
+    };
+    result = Matrix4f(project(weigh(world.columns[0])), project(weigh(world.columns[1])),
+                      project(weigh(world.columns[2])),
+                      project(weigh(world.columns[3]) + left.columns[3]) + projection.last);
+}
+
+void detail::multiply(Matrix4f& result, const ModelProjection& projection, const Matrix4f& world)
+{
+    if (projection.isSkewed)
+        projectModel<true>(result, projection, world);
+    else
+        projectModel<false>(result, projection, world);
+}
+
 Matrix2f transpose(const Matrix2f& m)
 {
     return Matrix2f(Vector2f(m.columns[0].x, m.columns[1].x), Vector2f(m.columns[0].y, m.columns[1].y));

@@ -35,6 +35,19 @@ Matrix4f reflectionMatrix(const Matrix4f& world)
                     Vector4f(Vector3f::Z_AXIS - n * (2.0f * n.z), 0.0f), Vector4f(n * (2.0f * d), 1.0f));
 }
 
+/// Projection * (view * the solid's world transform): in this order what is far from the origin and near the eye
+/// keeps its digits.
+[[gnu::always_inline]] inline void project(Matrix4f& result, const detail::ModelProjection& ready,
+                                           const Matrix4f& view, const Matrix4f& projection,
+                                           const Solid& solid)
+{
+    const Matrix4f& world = solid.getWorldTransform();
+    if (ready.isUsable && (solid.isWorldRigid() || detail::isAffine(world)))
+        detail::multiply(result, ready, world);
+    else
+        result = projection * (view * world);
+}
+
 /// Space * the solid's world transform.
 [[gnu::always_inline]] inline void place(Matrix4f& result, const Matrix4f& space, const Solid& solid)
 {
@@ -257,17 +270,18 @@ void SimpleRenderer::draw(Solid* const* solids, size_t count, const Matrix4f& vi
     ShaderUniform<Matrix3f>& normalModel = *properties.normalModel;
     bool hadJoints = properties.joints.count->get() > 0;
 
-    const Matrix4f viewProjection = projection * view;
-    properties.viewProjection->set(viewProjection);
+    const detail::ModelProjection ready(view, projection);
+    properties.viewProjection->set(projection * view);
     for (size_t i = 0; i < count; ++i)
     {
         Solid& solid = *solids[i];
         // What the program does not read is not worked out, but for the last solid, whose values are to stay.
         const bool isLast = i + 1 == count;
-        const ShaderProgram& program = *solid.getAppearance().get()->getShaderProgram().get();
+        Appearance& appearance = *solid.getAppearance().get();
+        const ShaderProgram& program = *appearance.getShaderProgram().get();
         const uint32_t wanted = isLast ? detail::DRAW_ALL : program.getDrawProperties();
         if ((wanted & detail::DRAW_MODEL_VIEW_PROJECTION) != 0)
-            place(modelViewProjection.renew(), viewProjection, solid);
+            project(modelViewProjection.renew(), ready, view, projection, solid);
         if ((wanted & detail::DRAW_MODEL_VIEW) != 0)
             place(modelView.renew(), view, solid);
         if ((wanted & detail::DRAW_MODEL) != 0)
@@ -279,7 +293,7 @@ void SimpleRenderer::draw(Solid* const* solids, size_t count, const Matrix4f& vi
         if (hasJoints || hadJoints)
             properties.joints.publish(solid);
         hadJoints = hasJoints;
-        solid.draw(*m_context);
+        solid.draw(*m_context, appearance);
     }
 }
 

@@ -140,6 +140,7 @@ private:
     static bool sizeAllowed(int size);
     ORV_LOCAL static bool faceAllowed(StencilFace face);
     bool indexAllowed(const char* name, int index) const;
+    ORV_LOCAL void enableProgram(RenderContext& context);
     void storeProperty(const char* name, const SharedPtr<ShaderUniformBase>& uniform);
     void stateChanged();
 

@@ -135,6 +135,36 @@ constexpr Matrix4<T>
     Matrix4<T>::IDENTITY(Vector4<T>(T(1), T(0), T(0), T(0)), Vector4<T>(T(0), T(1), T(0), T(0)),
                          Vector4<T>(T(0), T(0), T(1), T(0)), Vector4<T>(T(0), T(0), T(0), T(1)));
 
+namespace detail
+{
+
+/// A camera's view and projection, ready for many products projection * (view * world). A projection is mostly zeros:
+/// what it does to v is (v.x, v.y, v.z, v.z) * scale + v.z * skew + v.w * last.
+struct ORV_API ModelProjection
+{
+    Matrix4<float> view; ///< its last row is a second third one
+    Vector4<float> scale;
+    Vector4<float> skew; ///< not 0 for an eye of two
+    Vector4<float> last;
+    bool isSkewed;
+    bool isUsable; ///< both are of that kind
+
+    ModelProjection(const Matrix4<float>& viewMatrix, const Matrix4<float>& projection);
+};
+
+/// Each product rounded as operator* rounds it.
+/// @param projection  usable; world must be affine.
+ORV_API void multiply(Matrix4<float>& result, const ModelProjection& projection, const Matrix4<float>& world);
+
+/// Whether the last row is 0 0 0 1.
+inline bool isAffine(const Matrix4<float>& m)
+{
+    return m.columns[0].w == 0.0f && m.columns[1].w == 0.0f && m.columns[2].w == 0.0f &&
+           m.columns[3].w == 1.0f;
+}
+
+} // namespace detail
+
 using Matrix2f = Matrix2<float>;
 using Matrix3f = Matrix3<float>;
 using Matrix4f = Matrix4<float>;
