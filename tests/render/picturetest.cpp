@@ -2,6 +2,8 @@
 
 #include "orv/renderblock.h"
 
+#include <EGL/egl.h>
+
 using namespace orv;
 using support::Picture;
 using support::Rgba;
@@ -205,6 +207,85 @@ TEST_F(MirrorPictureTest, reflectedEyeStandsBehindTheMirror)
     red->setAppearance(appearance);
     renderFrame();
     EXPECT_EQ(GREEN, support::readFrame().pixel(48, 16));
+}
+
+// Fault caught: everything inside out before a camera that mirrors, directly or in a mirror.
+TEST_F(MirrorPictureTest, mirroringCamerasSeeTheRightSide)
+{
+    addSquare(Vector3f(-1.5f, -1.0f, 1.0f), 0.5f, makePaint(Colour4f::GREEN));
+    renderFrame();
+    const Picture expected = support::readFrame();
+    expectReflection(expected);
+    EXPECT_EQ(GREEN, expected.pixel(8, 48));
+    for (const bool isStereo : {false, true})
+    {
+        const auto parent = makeShared<SceneNode>(); // what mirrors may be above the camera
+        parent->setScale(Vector3f(-1, 1, 1));
+        camera->setParent(parent);
+        camera->setStereo(7.0f, isStereo ? 0.001f : 0.0f);
+        renderFrame();
+        const Picture mirrored = support::readFrame();
+        const int halving = isStereo ? 2 : 1;
+        for (int i = 0; i < 32 * 32; ++i)
+        {
+            const int x = 2 * (i % 32) + 1, y = 2 * (i / 32) + 1;
+            const bool isEdge = !(expected.pixel(x, y) == expected.pixel(std::max(0, x - 3), y)) ||
+                                !(expected.pixel(x, y) == expected.pixel(std::min(63, x + 3), y));
+            if (!isEdge)
+                ASSERT_EQ(expected.pixel(x, y), mirrored.pixel((63 - x) / halving, y)) << x << ' ' << y;
+        }
+    }
+    EXPECT_FALSE(renderContext->isViewMirrored());
+}
+
+// Fault caught: a mirror's picture as coarse as the small view that was drawn first, for ever.
+TEST_F(MirrorPictureTest, textureIsAsLargeAsTheSurface)
+{
+    const auto sizeOfTexture = [this]
+    {
+        SharedPtr<Texture2D> texture;
+        mirror->getAppearance()->getPropertyUniform("M_MIRROR_TEXTURE")->getValue(texture, 0);
+        return std::pair(texture->getWidth(), texture->getHeight());
+    };
+    const auto renderTo = [&](int width, int height)
+    {
+        renderContext->setViewport(0, 0, width, height);
+        render();
+        return sizeOfTexture();
+    };
+    const size_t before = glcalls::liveNames(glcalls::Kind::TEXTURE).size();
+    using Size = std::pair<unsigned, unsigned>;
+    EXPECT_EQ(Size(64, 64), renderTo(16, 8));
+    EXPECT_EQ(Size(64, 64), renderTo(64, 64));
+    EXPECT_EQ(Size(64, 128), renderTo(32, 128)) << "a target's viewport may be larger";
+    EXPECT_EQ(Size(64, 128), renderTo(64, 64));
+
+    const EGLDisplay display = eglGetCurrentDisplay();
+    const EGLContext context = eglGetCurrentContext();
+    const EGLSurface first = eglGetCurrentSurface(EGL_DRAW);
+    EGLint id = 0;
+    EGLint count = 0;
+    eglQueryContext(display, context, EGL_CONFIG_ID, &id);
+    const EGLint wanted[] = {EGL_CONFIG_ID, id, EGL_NONE};
+    const EGLint size[] = {EGL_WIDTH, 96, EGL_HEIGHT, 32, EGL_NONE};
+    EGLConfig config = nullptr;
+    ASSERT_TRUE(eglChooseConfig(display, wanted, &config, 1, &count) && count == 1);
+    const EGLSurface second = eglCreatePbufferSurface(display, config, size);
+    ASSERT_TRUE(eglMakeCurrent(display, second, second, context));
+    EXPECT_EQ(Size(96, 32), renderTo(32, 16)) << "another surface";
+    ASSERT_TRUE(eglMakeCurrent(display, first, first, context));
+    eglDestroySurface(display, second);
+    EXPECT_EQ(Size(64, 64), renderTo(64, 64));
+    EXPECT_EQ(before + 1, glcalls::liveNames(glcalls::Kind::TEXTURE).size()) << "old ones are deleted";
+    EXPECT_EQ(1u, glcalls::liveNames(glcalls::Kind::FRAMEBUFFER).size());
+
+    glcalls::setDropped(glCopyTexImage2D);
+    glcalls::queueError(GL_NO_ERROR);
+    glcalls::queueError(GL_OUT_OF_MEMORY);
+    support::LogCapture log;
+    EXPECT_EQ(Size(64, 64), renderTo(100, 100)) << "the one there is goes on";
+    EXPECT_EQ(Size(64, 64), renderTo(100, 100));
+    EXPECT_EQ(1, log.count('E')) << "tried once";
 }
 
 // Fault caught: the rest of a frame that goes to the surface after a mirror was drawn inside a target.

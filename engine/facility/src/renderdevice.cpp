@@ -2,6 +2,7 @@
 
 #include "orv/log.h"
 
+#include <EGL/egl.h>
 #include <GLES2/gl2.h>
 
 #include <cstring>
@@ -81,6 +82,20 @@ int RenderDevice::getMaxVertexAttributeVectors()
 int RenderDevice::getMaxVaryingVectors()
 {
     return getInteger(GL_MAX_VARYING_VECTORS);
+}
+
+bool RenderDevice::getSurfaceSize(int& width, int& height)
+{
+    const EGLDisplay display = eglGetCurrentDisplay();
+    const EGLSurface surface = eglGetCurrentSurface(EGL_DRAW);
+    EGLint size[2] = {0, 0};
+    if (display == EGL_NO_DISPLAY || surface == EGL_NO_SURFACE ||
+        !eglQuerySurface(display, surface, EGL_WIDTH, &size[0]) ||
+        !eglQuerySurface(display, surface, EGL_HEIGHT, &size[1]) || size[0] <= 0 || size[1] <= 0)
+        return false;
+    width = size[0];
+    height = size[1];
+    return true;
 }
 
 void RenderDevice::getPixels(int x, int y, unsigned width, unsigned height, unsigned char* pixels)

@@ -58,6 +58,12 @@ void Texture2D::enable()
     detail::bindingsChanged();
 }
 
+void Texture2D::discard()
+{
+    if (m_resource)
+        m_resource->deallocate();
+}
+
 bool Texture2D::canHaveMipmaps() const
 {
     return !m_external && !m_depth && (!m_compressed || m_hasMipmaps) &&

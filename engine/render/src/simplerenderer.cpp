@@ -9,6 +9,7 @@
 #include "orv/log.h"
 #include "orv/maths.h"
 #include "orv/propertyref.h"
+#include "orv/renderdevice.h"
 #include "orv/rendertarget.h"
 #include "orv/sceneutil.h"
 #include "orv/shaderprogram.h"
@@ -214,20 +215,50 @@ void SimpleRenderer::sortTransparent(const Vector3f& eyeZ)
         m_transparent[i] = m_sortKeys[i].solid;
 }
 
-/// @return false if there is no target to reflect into; tried once only, not frame after frame.
+/// @return false if there is no target to reflect into; each size is tried once only, not frame after frame.
 bool SimpleRenderer::prepareMirrorTarget()
 {
-    const bool empty = m_viewport.width <= 0 || m_viewport.height <= 0;
-    if (!m_mirrorTargetTried && m_pool && !empty)
+    int surface[2] = {0, 0};
+    const bool isKnown = RenderDevice::getSurfaceSize(surface[0], surface[1]);
+    const bool isSame = surface[0] == m_mirrorSurface[0] && surface[1] == m_mirrorSurface[1];
+    const int least[2] = {
+        std::max(m_viewport.width, isKnown ? surface[0] : m_viewport.x + m_viewport.width),
+        std::max(m_viewport.height, isKnown ? surface[1] : m_viewport.y + m_viewport.height)};
+    const bool isEmpty = m_viewport.width <= 0 || m_viewport.height <= 0;
+    const bool isLarge = isSame && least[0] <= m_mirrorSize[0] && least[1] <= m_mirrorSize[1];
+    if (m_pool && !isEmpty && !isLarge)
     {
-        m_mirrorTargetTried = true;
-        detail::setViewport(*m_context, m_viewport); // in stereo as well the texture has the whole size
-        const SharedPtr<Texture2D> texture =
-            m_pool->getTexture2DCache()->createFromBackbuffer(*m_context, Texture::Format::RGB, nullptr);
-        if (texture)
-            m_mirrorTarget = makeShared<RenderTarget>(texture, nullptr, true, false);
+        std::copy_n(surface, 2, m_mirrorSurface);
+        // Blocks of two shapes in turn must not have it made anew in every frame, so it only grows.
+        makeMirrorTarget(std::max(least[0], isSame ? m_mirrorSize[0] : 0),
+                         std::max(least[1], isSame ? m_mirrorSize[1] : 0));
     }
     return m_mirrorTarget && m_mirrorTarget->isComplete();
+}
+
+/// Keeps the target there is if GL has no other.
+void SimpleRenderer::makeMirrorTarget(int width, int height)
+{
+    m_mirrorSize[0] = width;
+    m_mirrorSize[1] = height;
+    const detail::Viewport viewport = detail::getViewport(*m_context);
+    m_context->setViewport(0, 0, width, height); // from which the texture takes its size
+    const SharedPtr<Texture2D> texture =
+        m_pool->getTexture2DCache()->createFromBackbuffer(*m_context, Texture::Format::RGB, nullptr);
+    detail::setViewport(*m_context, viewport);
+    if (!texture)
+        return;
+    SharedPtr<RenderTarget> target = makeShared<RenderTarget>(texture, nullptr, true, false);
+    if (!target || (m_mirrorTarget && !target->isComplete()))
+    {
+        target.reset(); // before its texture, to know that the context is not lost
+        texture->discard();
+        return;
+    }
+    const SharedPtr<Texture2D> old = m_mirrorTarget ? m_mirrorTarget->getColourTexture() : nullptr;
+    m_mirrorTarget = target;
+    if (old)
+        old->discard(); // a window that is drawn larger would leave one behind for each step
 }
 
 /// Draws what the mirror shows into the mirror target; framebuffer and viewport come back.

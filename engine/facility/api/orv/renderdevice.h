@@ -36,6 +36,10 @@ public:
     static int getMaxVertexAttributeVectors();
     static int getMaxVaryingVectors();
 
+    /// The size of the current context's surface in pixels, as EGL tells it.
+    /// @return false, outputs untouched, when it cannot: no surface, or a context that EGL has not made.
+    static bool getSurfaceSize(int& width, int& height);
+
     /// Reads a rectangle of the bound framebuffer as RGBA bytes, bottom row first.
     /// @param pixels  room for width x height x 4 bytes.
     static void getPixels(int x, int y, unsigned width, unsigned height, unsigned char* pixels);

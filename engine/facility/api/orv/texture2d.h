@@ -60,6 +60,8 @@ public:
     unsigned getHeight() const { return m_height; } ///< pixels
     bool hasMipmaps() const { return m_hasMipmaps; }
     bool isExternal() const { return m_external; }
+    /// Deletes the GL texture at once, not at a flush after the last share has gone; it is black from then on.
+    void discard();
     /// Of the largest level alone.
     unsigned getSizeInBytes() const { return m_sizeInBytes; }
 

@@ -46,8 +46,9 @@ struct RendererProperties;
 /// all mirrors share; during that pass T_VIEW and T_CAMERA_POSITION are the reflected eye's. The picture is
 /// upside down: a fragment at normalised device coordinates (x, y) finds its reflection at texture
 /// coordinates (0.5 + 0.5 x, 0.5 - 0.5 y). It is cleared to the clear values last set (the render block's
-/// background). The texture is made at the first mirror, as large as the viewport is then, and keeps that
-/// size; it is RGB. Solids behind the mirror's plane are not cut away. Framebuffer and viewport come back.
+/// background). The texture is made at the first mirror, as large as the surface where EGL knows that, else
+/// as what lies to the left of and below the viewport's upper right corner; larger where the viewport of a render
+/// target is; and anew when the surface has another size, or a viewport has outgrown it. It is RGB. Solids behind the mirror's plane are not cut away. Framebuffer and viewport come back.
 ///
 /// The context is not to outlive its pool with the textures above in it: when the last renderer of a context
 /// goes it takes them out of the context, so drop renderers before the last AssetCachePool::flush().
@@ -87,6 +88,7 @@ private:
     ORV_LOCAL void sortTransparent(const Vector3f& eyeZ);
     ORV_LOCAL void renderEye(const detail::Eye& eye, const detail::Viewport& viewport);
     ORV_LOCAL bool prepareMirrorTarget();
+    ORV_LOCAL void makeMirrorTarget(int width, int height);
     ORV_LOCAL void renderReflection(const Solid& mirror, const detail::Eye& eye,
                                     const detail::Viewport& viewport);
     void draw(Solid* const* solids, size_t count, const Matrix4f& view, const Matrix4f& projection);
@@ -102,7 +104,8 @@ private:
     std::vector<PropertyRef> m_mirrorProperties; // one for each place in m_mirrors
     detail::Viewport m_viewport;                 // of the whole picture
     SharedPtr<RenderTarget> m_mirrorTarget;
-    bool m_mirrorTargetTried = false;
+    int m_mirrorSurface[2] = {0, 0}; // the surface's size when the mirror's texture was made; 0 unknown
+    int m_mirrorSize[2] = {0, 0};    // of the texture, had or refused
     float m_time = 0.0f;
 };
 
