@@ -42,6 +42,8 @@ public:
     SharedPtr<Stream> open(const char* name, bool) override
     {
         ++opened;
+        if (whenOpened)
+            std::function<void()>(std::move(whenOpened))();
         const auto& file = m_files.at(plain(name));
         return makeShared<MemoryStream>(file.data(), int(file.size()));
     }
@@ -55,6 +57,7 @@ public:
     }
 
     mutable std::function<void()> whenAsked; ///< once
+    std::function<void()> whenOpened;
     mutable int asked = 0;
     int opened = 0;
 
@@ -335,6 +338,14 @@ TEST_F(LoadTest, sourcesThatChangeTheListOfSources)
     vanishing.reset();
     EXPECT_TRUE(path.find("a"));
     EXPECT_FALSE(path.find("a"));
+
+    auto cached = makeShared<SpelledSource>();
+    cached->add("a", std::string("text"));
+    cached->whenOpened = [&] { pool->setCacheSource({}); };
+    pool->setCacheSource(cached);
+    cached.reset();
+    EXPECT_TRUE(pool->getCacheStream("a", false));
+    EXPECT_FALSE(pool->getCacheStream("a", false));
 }
 
 // Faults caught, under the undefined-behaviour and address checks: sizes that overflow, and bytes used that no stream gave.

@@ -98,6 +98,5 @@ bool LogBudget::take(const Kind& record)
 ORV_LOG_FUNCTION(logError, pssLogError)
 ORV_LOG_FUNCTION(logWarn, pssLogWarn)
 ORV_LOG_FUNCTION(logInfo, pssLogInfo)
-ORV_LOG_FUNCTION(logDebug, pssLogDebug)
 
 } // namespace orv::detail

@@ -78,10 +78,15 @@ private:
     template <class Enum, std::size_t N>
     Enum readWord(const RenderStateWord (&table)[N], const char* kind, Enum fallback)
     {
+        return Enum(readKeyword(table, N, kind, int(fallback)));
+    }
+
+    int readKeyword(const RenderStateWord* table, std::size_t size, const char* kind, int fallback)
+    {
         const CharRange word = readToken(m_text);
-        const int value = findKeyword(table, toView(word));
+        const int value = findKeyword(table, size, toView(word));
         if (value >= 0)
-            return Enum(value);
+            return value;
         ORV_LOG_ERROR("Appearance file: %s unexpected %s %s", m_name, kind, word.start);
         return fallback;
     }

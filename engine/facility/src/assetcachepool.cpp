@@ -92,11 +92,12 @@ std::string AssetCachePool::describePath() const
 
 SharedPtr<Stream> AssetCachePool::getCacheStream(const char* name, bool writable) const
 {
-    if (!m_cacheSource)
+    const SharedPtr<StreamSource> source = m_cacheSource; // which may be replaced while it is asked
+    if (!source)
         return {};
     if (writable)
-        m_cacheSource->makeFolders(name);
-    return m_cacheSource->open(name, writable);
+        source->makeFolders(name);
+    return source->open(name, writable);
 }
 
 void AssetCachePool::flush()

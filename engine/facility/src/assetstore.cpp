@@ -117,11 +117,12 @@ SharedPtr<Stream> AssetStore::getStream(const char* name) const
 
 SharedPtr<Stream> AssetStore::getCacheStream(const char* name, bool writable) const
 {
-    if (!m_cacheSource)
+    const SharedPtr<StreamSource> source = m_cacheSource; // which may be replaced while it is asked
+    if (!source)
         return {};
     if (writable)
-        m_cacheSource->makeFolders(name);
-    return m_cacheSource->open(name, writable);
+        source->makeFolders(name);
+    return source->open(name, writable);
 }
 
 } // namespace orv::detail

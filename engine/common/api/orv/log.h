@@ -43,14 +43,13 @@ extern "C"
 namespace orv::detail
 {
 
-// What the macros below call: the entry points above, as far as a LogBudget allows.
+// What the macros below call: the entry points above, as far as a LogBudget allows. (The engine logs nothing for
+// debugging.)
 ORV_API void logError(const char* file, const char* function, int line, const char* format, ...)
     ORV_PRINTF(4, 5);
 ORV_API void logWarn(const char* file, const char* function, int line, const char* format, ...)
     ORV_PRINTF(4, 5);
 ORV_API void logInfo(const char* file, const char* function, int line, const char* format, ...)
-    ORV_PRINTF(4, 5);
-ORV_API void logDebug(const char* file, const char* function, int line, const char* format, ...)
     ORV_PRINTF(4, 5);
 
 /// A source path without its extension, cut at compile time: "engine/facility/src/assetpath".
@@ -85,7 +84,7 @@ inline constexpr const char* sourcePathText = PATH.text;
 #define ORV_LOG_ERROR(...) ORV_LOG(::orv::detail::logError, __VA_ARGS__)
 #define ORV_LOG_WARN(...) ORV_LOG(::orv::detail::logWarn, __VA_ARGS__)
 #define ORV_LOG_INFO(...) ORV_LOG(::orv::detail::logInfo, __VA_ARGS__)
-#define ORV_LOG_DEBUG(...) ORV_LOG(::orv::detail::logDebug, __VA_ARGS__)
+#define ORV_LOG_DEBUG(...) ORV_LOG(pssLogDebug, __VA_ARGS__)
 
 /// A broken promise inside the engine: logged as an error with the condition's text, and execution goes on.
 #define ORV_ASSERT(condition)                                                                                \

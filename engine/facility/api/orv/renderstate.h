@@ -21,15 +21,20 @@ struct RenderStateWord
 
 /// The position of a keyword (either spelling, case-sensitive) in one of the tables below, which is the
 /// enum's value; -1 when the table does not have it.
-template <std::size_t N>
-constexpr int findKeyword(const RenderStateWord (&table)[N], std::string_view keyword)
+constexpr int findKeyword(const RenderStateWord* table, std::size_t size, std::string_view keyword)
 {
-    for (std::size_t i = 0; i < N; ++i)
+    for (std::size_t i = 0; i < size; ++i)
     {
         if (keyword == table[i].keyword || (table[i].alternative && keyword == table[i].alternative))
             return int(i);
     }
     return -1;
+}
+
+template <std::size_t N>
+constexpr int findKeyword(const RenderStateWord (&table)[N], std::string_view keyword)
+{
+    return findKeyword(table, N, keyword);
 }
 
 enum class BlendFactor : int32_t
