@@ -24,9 +24,12 @@ void AnimationGroup::addAnimation(const Animation::Ptr& animation)
 
 bool AnimationGroup::contains(const Animation& other) const
 {
-    return this == &other ||
-           std::any_of(m_animations.begin(), m_animations.end(),
-                       [&other](const Animation::Ptr& animation) { return animation->contains(other); });
+    for (const Animation::Ptr& animation : m_animations)
+    {
+        if (animation->contains(other))
+            return true;
+    }
+    return this == &other;
 }
 
 Animation::Ptr AnimationGroup::getAnimation(int index) const

@@ -11,6 +11,7 @@
 #include "orv/shaderprogramcache.h"
 
 #include <algorithm>
+#include <cstdlib>
 
 namespace orv::detail
 {
@@ -71,9 +72,9 @@ SharedPtr<Glo> GloBuilder::build(const SharedPtr<SceneNode>& parent, bool measur
         top = makeNode(m_scene.scene->top, {});
         if (!top)
             return {};
+        std::qsort(m_names.data(), m_names.size(), sizeof(NamedPlace), compare);
+        std::qsort(m_scopedNames.data(), m_scopedNames.size(), sizeof(NamedPlace), compare);
     }
-    sort(m_names);
-    sort(m_scopedNames);
     m_glo->m_animationGroup = makeShared<AnimationGroup>();
     if (!m_glo->m_animationGroup)
         return {};
@@ -285,14 +286,12 @@ bool GloBuilder::makeSkinnedSolids(const SkinReference& reference, std::vector<S
     return true;
 }
 
-void GloBuilder::sort(Names& names)
+int GloBuilder::compare(const void* a, const void* b)
 {
-    std::sort(names.begin(), names.end(),
-              [](const NamedPlace& a, const NamedPlace& b)
-              {
-                  const int order = a.name.compare(b.name);
-                  return order != 0 ? order < 0 : a.place < b.place;
-              });
+    const NamedPlace& left = *static_cast<const NamedPlace*>(a);
+    const NamedPlace& right = *static_cast<const NamedPlace*>(b);
+    const int order = left.name.compare(right.name);
+    return order != 0 ? order : left.place < right.place ? -1 : 1;
 }
 
 /// @param names  sorted.
@@ -308,11 +307,11 @@ GloBuilder::NameRange GloBuilder::findName(const Names& names, std::string_view 
 /// What a skin's joint names may mean is looked up once, however many nodes refer to the skin.
 bool GloBuilder::linkSkins()
 {
-    std::map<const Skin*, std::vector<JointNodes>> known;
+    std::vector<std::vector<JointNodes>> known(m_scene.skins.size());
     for (const SkinnedSolids& skinned : m_skinnedSolids)
     {
         const std::vector<Attachment>& attachments = skinned.skin->attachments;
-        std::vector<JointNodes>& joints = known[skinned.skin];
+        std::vector<JointNodes>& joints = known[size_t(skinned.skin - m_scene.skins.data())];
         for (size_t i = joints.size(); i < attachments.size(); ++i)
             joints.push_back(
                 {findName(m_scopedNames, attachments[i].joint), findName(m_names, attachments[i].joint)});

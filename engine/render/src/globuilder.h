@@ -86,7 +86,7 @@ private:
     bool makeSkinnedSolids(const glo::SkinReference& reference, std::vector<SharedPtr<Solid>>& solids);
     bool makeLight(const glo::LightReference& reference, Objects& objects);
     bool makeCamera(const glo::CameraReference& reference, Objects& objects);
-    static void sort(Names& names);
+    static int compare(const void* a, const void* b);
     static NameRange findName(const Names& names, std::string_view name);
     bool linkSkins();
     void linkSkin(const SkinnedSolids& skinned, const std::vector<JointNodes>& joints);

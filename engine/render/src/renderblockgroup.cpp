@@ -24,9 +24,12 @@ void RenderBlockGroup::addBlock(const SharedPtr<RenderBlockBase>& block)
 
 bool RenderBlockGroup::contains(const RenderBlockBase& other) const
 {
-    return this == &other ||
-           std::any_of(m_blocks.begin(), m_blocks.end(),
-                       [&other](const SharedPtr<RenderBlockBase>& block) { return block->contains(other); });
+    for (const SharedPtr<RenderBlockBase>& block : m_blocks)
+    {
+        if (block->contains(other))
+            return true;
+    }
+    return this == &other;
 }
 
 void RenderBlockGroup::removeBlock(const SharedPtr<RenderBlockBase>& block)
