@@ -86,7 +86,7 @@ TEST_F(SimpleRendererTest, modelViewProjectionIsProjectionTimesModelView)
         camera->setPosition(vector() + Vector3f(offset, 0, 0));
         point(*camera, Vector3f(offset, 0, 0));
         solid->setPosition(vector() + Vector3f(offset, 0, 0));
-        solid->setRotation(quaternionFromAxisAngle(vector(), Anglef(number(random))));
+        solid->setRotation(quaternionFromAxisAngle(vector(), Anglef::fromRadians(number(random))));
         solid->setScale(i % 3 ? vector() : Vector3f(1, 1, 1));
         if (i % 7 == 0)
             solid->setLocalTransform(Matrix4f(Vector4f(vector(), number(random)), Vector4f(vector(), 0.5f),
