@@ -96,16 +96,15 @@ void detail::multiplyAffine(Matrix4f& result, const Matrix4f& m, const Matrix4f&
 detail::ModelProjection::ModelProjection(const Matrix4f& viewMatrix, const Matrix4f& projection)
     : view(viewMatrix)
 {
-    const Vector4f& x = projection.columns[0];
-    const Vector4f& y = projection.columns[1];
-    const Vector4f& z = projection.columns[2];
-    isUsable = isAffine(view) && x == Vector4f(x.x, 0.0f, 0.0f, 0.0f) && y == Vector4f(0.0f, y.y, 0.0f, 0.0f);
+    const float* p = projection.data();
+    isUsable = isAffine(view) && p[1] == 0.0f && p[2] == 0.0f && p[3] == 0.0f && p[4] == 0.0f &&
+               p[6] == 0.0f && p[7] == 0.0f;
     for (Vector4f& column : view.columns)
         column.w = column.z;
-    scale = Vector4f(x.x, y.y, z.z, z.w);
-    skew = Vector4f(z.x, z.y, 0.0f, 0.0f);
+    scale = Vector4f(p[0], p[5], p[10], p[11]);
+    skew = Vector4f(p[8], p[9], 0.0f, 0.0f);
     last = projection.columns[3];
-    isSkewed = !(skew == Vector4f());
+    isSkewed = p[8] != 0.0f || p[9] != 0.0f;
 }
 
 template <bool IS_SKEWED>
