@@ -33,10 +33,21 @@ struct Walk
     bool plainFlags; ///< no recursive flag is on by default: once the condition holds, it holds below
 };
 
+void visitBelow(SceneNodeVisitor& visitor, const SceneNode& node)
+{
+    detail::visitChildren(node,
+                          [&visitor](SceneNode& child)
+                          {
+                              child.accept(visitor);
+                              if (child.getChildCount() != 0) // most have none, and need no call
+                                  visitBelow(visitor, child);
+                          });
+}
+
 void visitAll(SceneNodeVisitor& visitor, SceneNode& node)
 {
     node.accept(visitor);
-    detail::visitChildren(node, [&visitor](SceneNode& child) { visitAll(visitor, child); });
+    visitBelow(visitor, node);
 }
 
 void visitRestricted(const Walk& walk, SceneNode& node, WalkState state)
