@@ -63,7 +63,7 @@ TEST(FileStreamSource, onlyReadableFilesExist)
     ASSERT_EQ(0, mkfifo(dir.path("pipe").c_str(), 0600));
     const int64_t largest = 0x7fffffff;
     ASSERT_EQ(0, truncate(dir.write("largest", std::string()).c_str(), off_t(largest)));
-    ASSERT_EQ(0, truncate(dir.write("huge", std::string()).c_str(), off_t(largest + 1)));
+    ASSERT_EQ(0, truncate64(dir.write("huge", std::string()).c_str(), largest + 1));
     const std::pair<const char*, int64_t> cases[] = {
         {"folder/file", 1}, {"./folder//file", 1}, {"empty", 0},    {"largest", largest},
         {"huge", -1},       {"folder", -1},        {"folder/", -1}, {"pipe", -1},
