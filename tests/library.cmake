@@ -1,10 +1,11 @@
 # Faults caught: a name or a library dependency that leaks out of liborv; a library that devices with large pages
 # cannot load, that attackers would like, or that has grown.
-# Called with -DLIBRARY=path of liborv.so -DSTRIP=strip -DLIMIT=bytes of the stripped library, 0 for any.
+# Called with -DLIBRARY=path of liborv.so -DNM=nm -DREADELF=readelf -DSTRIP=strip -DLIMIT=bytes of the stripped library,
+# 0 for any.
 cmake_minimum_required(VERSION 3.22)
 
-execute_process(COMMAND nm -D --defined-only --format=posix ${LIBRARY} OUTPUT_VARIABLE symbols COMMAND_ERROR_IS_FATAL ANY)
-execute_process(COMMAND nm -D --undefined-only ${LIBRARY} OUTPUT_VARIABLE undefined COMMAND_ERROR_IS_FATAL ANY)
+execute_process(COMMAND ${NM} -D --defined-only --format=posix ${LIBRARY} OUTPUT_VARIABLE symbols COMMAND_ERROR_IS_FATAL ANY)
+execute_process(COMMAND ${NM} -D --undefined-only ${LIBRARY} OUTPUT_VARIABLE undefined COMMAND_ERROR_IS_FATAL ANY)
 string(REGEX MATCHALL "[^\n]+" lines "${symbols}")
 set(count 0)
 set(foreign "")
@@ -28,7 +29,7 @@ if(symbols MATCHES "stbi|md5")
     message(FATAL_ERROR "an inner library shows through")
 endif()
 
-execute_process(COMMAND readelf -d ${LIBRARY} OUTPUT_VARIABLE dynamic COMMAND_ERROR_IS_FATAL ANY)
+execute_process(COMMAND ${READELF} -d ${LIBRARY} OUTPUT_VARIABLE dynamic COMMAND_ERROR_IS_FATAL ANY)
 string(REGEX MATCHALL "NEEDED[^\n]*\\[[^]]*\\]" needed "${dynamic}")
 foreach(entry IN LISTS needed)
     string(REGEX REPLACE ".*\\[(.*)\\]" "\\1" name "${entry}")
@@ -44,7 +45,7 @@ function(require what text pattern)
 endfunction()
 require("versioned name" "${dynamic}" "SONAME[^\n]*\\[liborv\\.so\\.[0-9]+\\]")
 require("all symbols bound at the start" "${dynamic}" "BIND_NOW|FLAGS_1[^\n]*NOW")
-execute_process(COMMAND readelf -lW ${LIBRARY} OUTPUT_VARIABLE segments COMMAND_ERROR_IS_FATAL ANY)
+execute_process(COMMAND ${READELF} -lW ${LIBRARY} OUTPUT_VARIABLE segments COMMAND_ERROR_IS_FATAL ANY)
 require("read-only after the start" "${segments}" "GNU_RELRO")
 require("stack without code" "${segments}" "GNU_STACK +0x0+ 0x0+ 0x0+ 0x0+ 0x0+ RW +0x")
 string(REGEX MATCHALL "  LOAD [^\n]*" loads "${segments}")
@@ -61,8 +62,8 @@ list(LENGTH constants constantsCount)
 if(NOT codeCount EQUAL 1 OR constantsCount LESS 1 OR loads MATCHES "^  LOAD[^;]* R E ")
     message(FATAL_ERROR "constants share a segment with code:\n${segments}")
 endif()
-execute_process(COMMAND readelf -SW ${LIBRARY} OUTPUT_VARIABLE sections COMMAND_ERROR_IS_FATAL ANY)
-require("unwind tables" "${sections}" " \\.eh_frame ")
+execute_process(COMMAND ${READELF} -SW ${LIBRARY} OUTPUT_VARIABLE sections COMMAND_ERROR_IS_FATAL ANY)
+require("unwind tables" "${sections}" " \\.(eh_frame|ARM\\.exidx) ")
 require("stack protector" "${undefined}" "__stack_chk_fail")
 
 if(LIMIT)
