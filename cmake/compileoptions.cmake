@@ -39,9 +39,13 @@ target_compile_options(orv_engine_options INTERFACE
 
 # orv_hot_sources(source...): sources of the current room that run for every frame, solid or pixel. They are not
 # inlined beyond what costs nothing, nor padded.
+set(ORV_UNPADDED "")
+if(CMAKE_CXX_COMPILER_ID STREQUAL GNU)
+    set(ORV_UNPADDED -fno-align-functions -fno-align-loops -fno-align-jumps)
+endif()
 function(orv_hot_sources)
     set_property(SOURCE ${ARGN} APPEND PROPERTY COMPILE_OPTIONS
-        $<${ORV_OPTIMISED}:-O2> -fno-inline-functions -fno-align-functions -fno-align-loops -fno-align-jumps)
+        $<${ORV_OPTIMISED}:-O2> -fno-inline-functions ${ORV_UNPADDED})
 endfunction()
 
 # orv_base_sources(source...): sources of the current room that hold the bases of classes which programs make or derive

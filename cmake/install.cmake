@@ -13,6 +13,8 @@ foreach(room common maths pss facility render)
         FILES_MATCHING PATTERN "*.h"
         PATTERN "detail/glo*" EXCLUDE
         PATTERN "detail/digestmaker.h" EXCLUDE
+        PATTERN "detail/loadscope.h" EXCLUDE
+        PATTERN "detail/logbudget.h" EXCLUDE
         PATTERN "detail/textstatement.h" EXCLUDE)
 endforeach()
 

@@ -410,7 +410,7 @@ std::string Session::findCost() const
         {"bytes of pixels", given.pixels, LOADS * (LIMITS.textureBytes + 63 * size)},
         {"bytes of vertices", given.vertices, LOADS * size},
         {"bytes of sources", given.sources, LOADS * (LIMITS.programBytes + size + BUILT_IN_BYTES)},
-        {"blocks of memory", heap().blocks, LOADS * (20000 + size)},
+        {"blocks of memory", heap().isReported ? heap().blocks : 0, LOADS * (20000 + size)},
     };
     for (const auto& cost : costs)
     {

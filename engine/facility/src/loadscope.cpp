@@ -105,6 +105,8 @@ LoadScope::LoadScope(const char* name)
     if (t_ledger)
         return;
     m_ledger.reset(new (std::nothrow) LoadLedger(name ? name : ""));
+    if (!m_ledger)
+        logNoMemory("LoadScope"); // the load goes on without limits
     t_ledger = m_ledger.get();
 }
 
