@@ -213,7 +213,7 @@ protected:
             {"own element buffer", [this] { glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, ownBuffers[1]); }},
             {"all arrays off", [] { setAllArrays(false); }},
             {"all arrays on, at nothing",
-             [this]
+             []
              {
                  GLuint gone = 0;
                  glGenBuffers(1, &gone);

@@ -86,8 +86,8 @@ int RenderDevice::getMaxVaryingVectors()
 
 bool RenderDevice::getSurfaceSize(int& width, int& height)
 {
-    const EGLDisplay display = eglGetCurrentDisplay();
-    const EGLSurface surface = eglGetCurrentSurface(EGL_DRAW);
+    EGLDisplay display = eglGetCurrentDisplay();
+    EGLSurface surface = eglGetCurrentSurface(EGL_DRAW);
     EGLint size[2] = {0, 0};
     if (display == EGL_NO_DISPLAY || surface == EGL_NO_SURFACE ||
         !eglQuerySurface(display, surface, EGL_WIDTH, &size[0]) ||
