@@ -34,7 +34,7 @@ target_link_options(orv_engine_options INTERFACE ${prefixMaps})
 set(ORV_OPTIMISED $<NOT:$<OR:$<CONFIG:Debug>,$<BOOL:${ORV_SANITIZE}>,$<BOOL:${ORV_BUILD_FUZZ}>>>)
 set(ORV_WHOLE $<AND:${ORV_OPTIMISED},$<BOOL:${ORV_LTO}>,$<STREQUAL:${CMAKE_CXX_COMPILER_ID},GNU>>)
 target_compile_options(orv_engine_options INTERFACE
-    $<${ORV_OPTIMISED}:-Os> $<${ORV_WHOLE}:-flto=auto> $<${ORV_WHOLE}:-ffat-lto-objects>
+    $<${ORV_OPTIMISED}:-Os> $<${ORV_WHOLE}:-flto> $<${ORV_WHOLE}:-ffat-lto-objects>
     -ffunction-sections -fdata-sections -funwind-tables -fstack-protector)
 
 # orv_hot_sources(source...): sources of the current room that run for every frame, solid or pixel. They are not
