@@ -58,7 +58,7 @@ endfunction()
 # by too much where the data end early: zeros, so that nothing comes of it but the message.
 function(orv_stb_image_sources)
     if(ORV_SANITIZE)
-        set_property(SOURCE ${ARGN} APPEND PROPERTY COMPILE_OPTIONS -fno-sanitize=shift-exponent)
+        set_property(SOURCE ${ARGN} APPEND PROPERTY COMPILE_OPTIONS -fno-sanitize=shift)
     endif()
 endfunction()
 
