@@ -180,6 +180,8 @@ const AttribRecord* VertexBuffer::findAttrib(const char* name) const
     return found != m_attribs.end() ? &*found : nullptr;
 }
 
+/// @return false if GL has no memory for it: a draw from a buffer without data would read from anywhere, so the
+/// buffer is lost.
 bool VertexBuffer::upload(const unsigned char* data, unsigned int size)
 {
     RenderDevice::getError(false);

@@ -102,7 +102,4 @@ const VertexBuffer::Plan& VertexBuffer::getPlan(uint64_t programRevision,
     return plan;
 }
 
-/// @return false if GL has no memory for it: a draw from a buffer without data would read from anywhere, so the
-/// buffer is lost.
-
 } // namespace orv
