@@ -232,7 +232,9 @@ TEST_F(MirrorPictureTest, mirroringCamerasSeeTheRightSide)
             const bool isEdge = !(expected.pixel(x, y) == expected.pixel(std::max(0, x - 3), y)) ||
                                 !(expected.pixel(x, y) == expected.pixel(std::min(63, x + 3), y));
             if (!isEdge)
+            {
                 ASSERT_EQ(expected.pixel(x, y), mirrored.pixel((63 - x) / halving, y)) << x << ' ' << y;
+            }
         }
     }
     EXPECT_FALSE(renderContext->isViewMirrored());
