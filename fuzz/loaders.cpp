@@ -311,8 +311,8 @@ const std::vector<Loader> LOADERS = {
     {"appearance", loadAppearanceFile, heapOf<64>, 5 << 18, false},
     // What references make has the same bounds in any file, see GloCredit.
     {"scene", loadScene, heapOf<64>, 6 << 20, false},
-    // The atlas is as large as the size asked for makes it, at most 512 x 4096 here. A point takes three bytes.
-    {"font", loadFont, heapOf<200>, 4 << 20, false},
+    // The atlas is as large as the size asked for makes it, at most 512 x 4096 here.
+    {"font", loadFont, heapOf<64>, 4 << 20, false},
     {"pvr", loadPvr, getPvrHeap, 1 << 17, false},
     {"vertices", loadVertexStream, heapOf<8>, 1 << 12, false},
     {"binary", loadProgramBinary, heapOf<4>, 1 << 17, true},
@@ -407,9 +407,9 @@ std::string Session::findCost() const
     } costs[] = {
         {"records", size_t(messages().all), LOADS * MOST_RECORDS},
         {"bytes read", m_files->bytesRead(), LOADS * ((size_t(2) << 20) + 10 * size)},
-        {"bytes of pixels", given.pixels, LOADS * (LIMITS.textureBytes + 63 * size)},
+        {"bytes of pixels", given.pixels, LOADS * (size_t(LIMITS.textureBytes) + 63 * size)},
         {"bytes of vertices", given.vertices, LOADS * size},
-        {"bytes of sources", given.sources, LOADS * (LIMITS.programBytes + size + BUILT_IN_BYTES)},
+        {"bytes of sources", given.sources, LOADS * (size_t(LIMITS.programBytes) + size + BUILT_IN_BYTES)},
         {"blocks of memory", heap().isReported ? heap().blocks : 0, LOADS * (20000 + size)},
     };
     for (const auto& cost : costs)
