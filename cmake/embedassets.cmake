@@ -34,7 +34,7 @@ endforeach()
 
 string(TOUPPER "${NAMESPACE}_ARCHIVE" archive)
 file(CONFIGURE OUTPUT ${OUTPUT} @ONLY CONTENT "// Made by cmake/embedassets.cmake.
-#include \"embeddedassets.h\"
+#include \"assets/embeddedassets.h\"
 
 namespace orv::detail
 {

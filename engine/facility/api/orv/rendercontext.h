@@ -1,6 +1,7 @@
 #pragma once
 
 #include "orv/detail/bindingepoch.h"
+#include "orv/detail/contextproperties.h"
 #include "orv/detail/programhandle.h"
 #include "orv/export.h"
 #include "orv/renderstate.h"
@@ -8,8 +9,6 @@
 #include "orv/sharedptr.h"
 
 #include <cstdint>
-#include <map>
-#include <string>
 
 namespace orv
 {
@@ -116,7 +115,7 @@ public:
     /// a pointer.
     uint64_t getRevision() const { return m_revision; }
     /// Another number after every addProperty() that stored something.
-    uint64_t getPropertyRevision() const { return m_propertyRevision; }
+    uint64_t getPropertyRevision() const { return m_properties.getRevision(); }
 
     /// Draw path: sends a material's whole state through the setters above, in their order.
     ///
@@ -270,7 +269,7 @@ private:
     ORV_LOCAL static unsigned glStencilFunctionConvert(StencilFunction function);
     ORV_LOCAL static unsigned glStencilOperationConvert(StencilOperation operation);
 
-    std::map<std::string, SharedPtr<ShaderUniformBase>, std::less<>> m_properties;
+    detail::ContextProperties m_properties;
     SharedPtr<detail::ProgramHandle> m_currentProgram;
     bool m_blendEnabled = false;
     RenderState m_state;
@@ -281,7 +280,6 @@ private:
     int m_clearStencil = 0;
 
     uint64_t m_revision;
-    uint64_t m_propertyRevision;
     uint64_t m_appliedRevision = 0;
     uint32_t m_appliedFlags = 0;
     uint32_t m_viewTurns = 0;   ///< APPLY_TURNED, or 0

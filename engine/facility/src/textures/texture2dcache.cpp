@@ -77,7 +77,7 @@ SharedPtr<Texture2D> Texture2DCache::create(unsigned width, unsigned height, Tex
     setGlParameters(GL_TEXTURE_2D, isFullFeatured ? GL_LINEAR_MIPMAP_NEAREST : GL_LINEAR, GL_LINEAR,
                     isFullFeatured ? GL_REPEAT : GL_CLAMP_TO_EDGE);
     // No memory, or no depth textures.
-    if (detail::reportGLError("engine/facility/src/texture2dcache", __func__, __LINE__))
+    if (detail::reportGLError(detail::sourcePathText<__FILE__>, __func__, __LINE__))
     {
         resource->deallocate();
         return {};

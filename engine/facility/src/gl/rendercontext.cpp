@@ -3,7 +3,6 @@
 #include "orv/detail/revision.h"
 #include "orv/log.h"
 #include "orv/renderdevice.h"
-#include "orv/shaderuniform.h"
 
 #include <GLES2/gl2.h>
 
@@ -17,12 +16,17 @@ namespace orv
 namespace
 {
 
-/// The table's entry for an enum value; null outside the enum.
+/// @param what      the enum, for the message.
+/// @param function  the name that the message bears.
+/// @return the table's GL value, or GL_INVALID_ENUM, logged, for what lies outside of the enum.
 template <class Enum, std::size_t N>
-const RenderStateWord* findWord(const RenderStateWord (&table)[N], Enum value)
+unsigned toGL(const RenderStateWord (&table)[N], Enum value, const char* what, const char* function)
 {
     const auto index = uint32_t(value);
-    return index < N ? &table[index] : nullptr;
+    if (index < N)
+        return table[index].glValue;
+    detail::logError(detail::sourcePathText<__FILE__>, function, __LINE__, "Invalid %s %d", what, int(value));
+    return GL_INVALID_ENUM;
 }
 
 void setCapability(GLenum capability, bool enabled)
@@ -58,9 +62,7 @@ RenderContext::DrawScope::~DrawScope()
         m_context.forgetBindings();
 }
 
-RenderContext::RenderContext()
-    : m_revision(detail::nextRevision())
-    , m_propertyRevision(detail::nextRevision())
+RenderContext::RenderContext() : m_revision(detail::nextRevision())
 {
     // Where a new GL context differs from a new material.
     m_state.cullingMode = CullingMode::CULL_NONE;
@@ -353,36 +355,6 @@ void RenderContext::clear()
     glClear(GL_COLOR_BUFFER_BIT | GL_DEPTH_BUFFER_BIT | GL_STENCIL_BUFFER_BIT);
 }
 
-void RenderContext::addProperty(const SharedPtr<ShaderUniformBase>& property, const char* name)
-{
-    if (!property || !name)
-    {
-        ORV_LOG_ERROR("Property \"%s\" not added: %s.", name ? name : "",
-                      name ? "there is no value" : "it has no name");
-        return;
-    }
-    if (!m_properties.try_emplace(name, property).second)
-    {
-        ORV_LOG_ERROR("Property \"%s\" already exists in context.", name);
-        return;
-    }
-    m_propertyRevision = detail::nextRevision();
-}
-
-SharedPtr<ShaderUniformBase> RenderContext::getProperty(const char* name) const
-{
-    SharedPtr<ShaderUniformBase> property;
-    linkUniform(property, name);
-    return property;
-}
-
-void RenderContext::linkUniform(SharedPtr<ShaderUniformBase>& uniform, const char* name) const
-{
-    const auto found = name ? m_properties.find(std::string_view(name)) : m_properties.end();
-    if (found != m_properties.end())
-        uniform = found->second;
-}
-
 void RenderContext::applyChanged(const RenderState& state, uint64_t stateRevision, uint32_t flags)
 {
     const bool isUnchanged = m_appliedRevision != 0 && flags == m_appliedFlags && state == m_appliedState;
@@ -531,66 +503,42 @@ void RenderContext::sendAttribArrays(uint32_t enabledMask)
 
 unsigned RenderContext::glBlendFactorConvert(BlendFactor factor)
 {
-    if (const RenderStateWord* word = findWord(BLEND_FACTORS, factor))
-        return word->glValue;
-    ORV_LOG_ERROR("Invalid blend factor %d", int(factor));
-    return GL_INVALID_ENUM;
+    return toGL(BLEND_FACTORS, factor, "blend factor", __func__);
 }
 
 unsigned RenderContext::glBlendFunctionConvert(BlendFunction function)
 {
-    if (const RenderStateWord* word = findWord(BLEND_FUNCTIONS, function))
-        return word->glValue;
-    ORV_LOG_ERROR("Invalid blend function %d", int(function));
-    return GL_INVALID_ENUM;
+    return toGL(BLEND_FUNCTIONS, function, "blend function", __func__);
 }
 
 unsigned RenderContext::glCullingModeConvert(CullingMode mode)
 {
-    if (const RenderStateWord* word = findWord(CULLING_MODES, mode))
-        return word->glValue;
-    ORV_LOG_ERROR("Invalid culling mode %d", int(mode));
-    return GL_INVALID_ENUM;
+    return toGL(CULLING_MODES, mode, "culling mode", __func__);
 }
 
 unsigned RenderContext::glWindingOrderConvert(WindingOrder order)
 {
-    if (const RenderStateWord* word = findWord(WINDING_ORDERS, order))
-        return word->glValue;
-    ORV_LOG_ERROR("Invalid winding order %d", int(order));
-    return GL_INVALID_ENUM;
+    return toGL(WINDING_ORDERS, order, "winding order", __func__);
 }
 
 unsigned RenderContext::glDepthFunctionConvert(DepthFunction function)
 {
-    if (const RenderStateWord* word = findWord(COMPARISONS, function))
-        return word->glValue;
-    ORV_LOG_ERROR("Invalid depth function %d", int(function));
-    return GL_INVALID_ENUM;
+    return toGL(COMPARISONS, function, "depth function", __func__);
 }
 
 unsigned RenderContext::glStencilFaceConvert(StencilFace face)
 {
-    if (const RenderStateWord* word = findWord(STENCIL_FACES, face))
-        return word->glValue;
-    ORV_LOG_ERROR("Invalid stencil face %d", int(face));
-    return GL_INVALID_ENUM;
+    return toGL(STENCIL_FACES, face, "stencil face", __func__);
 }
 
 unsigned RenderContext::glStencilFunctionConvert(StencilFunction function)
 {
-    if (const RenderStateWord* word = findWord(COMPARISONS, function))
-        return word->glValue;
-    ORV_LOG_ERROR("Invalid stencil function %d", int(function));
-    return GL_INVALID_ENUM;
+    return toGL(COMPARISONS, function, "stencil function", __func__);
 }
 
 unsigned RenderContext::glStencilOperationConvert(StencilOperation operation)
 {
-    if (const RenderStateWord* word = findWord(STENCIL_OPERATIONS, operation))
-        return word->glValue;
-    ORV_LOG_ERROR("Invalid stencil operation %d", int(operation));
-    return GL_INVALID_ENUM;
+    return toGL(STENCIL_OPERATIONS, operation, "stencil operation", __func__);
 }
 
 void setStencilFunction(RenderContext& context, StencilFunction function, int reference, unsigned mask)

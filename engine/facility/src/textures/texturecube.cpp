@@ -51,7 +51,7 @@ void TextureCube::setFace(Face face, const void* pixels)
     if (m_facesSet == FACE_COUNT)
     {
         sendParameters();
-        if (detail::reportGLError("engine/facility/src/texturecube", __func__, __LINE__))
+        if (detail::reportGLError(detail::sourcePathText<__FILE__>, __func__, __LINE__))
             m_facesSet = 0; // no memory for one of the faces, so all six are wanted again
     }
 }

@@ -2,6 +2,7 @@
 
 #include "orv/detail/bindingepoch.h"
 #include "orv/detail/resource.h"
+#include "orv/log.h"
 #include "orv/rendercontext.h"
 #include "orv/renderdevice.h"
 
@@ -46,7 +47,7 @@ void IndexBuffer::commit()
     RenderDevice::getError(false);
     glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, getId());
     glBufferData(GL_ELEMENT_ARRAY_BUFFER, GLsizeiptr(m_count) * 2, m_indices.get(), GL_STATIC_DRAW);
-    const bool isRefused = detail::reportGLError("engine/facility/src/indexbuffer", __func__, __LINE__);
+    const bool isRefused = detail::reportGLError(detail::sourcePathText<__FILE__>, __func__, __LINE__);
     glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, 0);
     detail::bindingsChanged();
     if (isRefused) // no memory: draws go on from the array

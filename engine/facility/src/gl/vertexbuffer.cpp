@@ -187,7 +187,7 @@ bool VertexBuffer::upload(const unsigned char* data, unsigned int size)
     RenderDevice::getError(false);
     glBindBuffer(GL_ARRAY_BUFFER, getId());
     glBufferData(GL_ARRAY_BUFFER, GLsizeiptr(size), data, GL_STATIC_DRAW);
-    const bool isRefused = detail::reportGLError("engine/facility/src/vertexbuffer", __func__, __LINE__);
+    const bool isRefused = detail::reportGLError(detail::sourcePathText<__FILE__>, __func__, __LINE__);
     if (isRefused)
         m_resource->deallocate();
     attribsChanged();

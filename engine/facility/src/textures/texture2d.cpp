@@ -88,7 +88,7 @@ void Texture2D::setMinFilter(FilterMode mode)
         {
             RenderDevice::getError(false);
             glGenerateMipmap(GL_TEXTURE_2D);
-            if (detail::reportGLError("engine/facility/src/texture2d", __func__, __LINE__))
+            if (detail::reportGLError(detail::sourcePathText<__FILE__>, __func__, __LINE__))
                 return; // no memory: without them GL would draw black
             m_hasMipmaps = true;
         }
