@@ -11,7 +11,6 @@ install(TARGETS orv EXPORT orvTargets
 foreach(room common maths pss facility render)
     install(DIRECTORY engine/${room}/api/orv DESTINATION ${CMAKE_INSTALL_INCLUDEDIR} COMPONENT development
         FILES_MATCHING PATTERN "*.h"
-        PATTERN "detail/glo*" EXCLUDE
         PATTERN "detail/digestmaker.h" EXCLUDE
         PATTERN "detail/loadscope.h" EXCLUDE
         PATTERN "detail/logbudget.h" EXCLUDE

@@ -3,7 +3,7 @@
 // cannot be read, has its bytes changed as libFuzzer does it.
 
 #include "glo/glowriter.h"
-#include "gloreader.h"
+#include "orv/detail/gloreader.h"
 
 #include "orv/memorystream.h"
 

@@ -1,6 +1,6 @@
 #include "scenemeshes.h"
 
-#include "gloreader.h"
+#include "orv/detail/gloreader.h"
 
 #include "orv/detail/glovertices.h"
 #include "orv/filestreamsource.h"

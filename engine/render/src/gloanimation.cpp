@@ -1,10 +1,9 @@
 #include "globuilder.h"
 
-#include "glolog.h"
-
 #include "orv/animationchannel.h"
 #include "orv/animationgroup.h"
 #include "orv/animationkeysequence.h"
+#include "orv/detail/glolog.h"
 #include "orv/light.h"
 #include "orv/sceneanimators.h"
 

@@ -1,11 +1,10 @@
 #include "globuilder.h"
 
-#include "glolog.h"
-
 #include "orv/animationgroup.h"
 #include "orv/appearance.h"
 #include "orv/assetcachepool.h"
 #include "orv/camera.h"
+#include "orv/detail/glolog.h"
 #include "orv/light.h"
 #include "orv/mesh.h"
 #include "orv/shaderprogramcache.h"

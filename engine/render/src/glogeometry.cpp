@@ -1,8 +1,7 @@
 #include "glogeometry.h"
 
-#include "glolog.h"
-
 #include "orv/assetcachepool.h"
+#include "orv/detail/glolog.h"
 #include "orv/detail/glovertices.h"
 #include "orv/indexbuffercache.h"
 #include "orv/meshcache.h"

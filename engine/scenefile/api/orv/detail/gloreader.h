@@ -78,7 +78,7 @@ private:
     SharedPtr<Stream> m_stream;
     std::string m_name;
     std::map<uint32_t, ChunkReader> m_chunkReaders;
-    void* m_record = nullptr; ///< what the chunk about to be read is to fill; null once it is at it
+    void* m_record = nullptr; ///< filled by the chunk that is read next; null from then on
     bool m_ended = false;     ///< the stream had no further chunk
     uint32_t m_chunkSize = 0;
     int m_depth = 0;
