@@ -1,0 +1,149 @@
+#!/usr/bin/python3
+"""Holds the includes of all sources against the rooms that docs/house.md lists, and draws the rooms into that page.
+
+    house.py [--check]
+
+A row of the page's first table names a room, a row of the second one a floor of the facility; the last column says what
+it stands on. A room may include what it stands on and what those stand on. Without --check the drawing on the page is
+made anew; with it, a drawing that differs is an error, as is an include that the tables do not allow, a room that they
+do not list, an include of another room's src folder, and a folder of too many sources. Exit code 1 then.
+"""
+import argparse
+import collections
+import pathlib
+import re
+import sys
+
+ROOT = pathlib.Path(__file__).resolve().parents[2]
+PAGE = ROOT / "docs/house.md"
+FACILITY = "engine/facility"
+MOST_SOURCES = 30
+DRAWING = re.compile(r"(<!-- drawn by ./run house -->\n)(.*?)(<!-- end -->)", re.DOTALL)
+
+
+class Room:
+    def __init__(self, cells):
+        self.name = cells[0].strip("`")
+        self.headers = re.findall(r"`(\w+)\.h`", cells[1])  # of a floor: those without a source beside them
+        self.stands_on = re.findall(r"`([^`]+)`", cells[-1])
+
+
+def read_tables(page):
+    """The rooms and the floors of the facility, in the page's order."""
+    tables = []
+    for heading in ("## The rooms", "## The floors of the facility"):
+        part = page.split(heading, 1)[1].split("\n## ", 1)[0]
+        rows = [line.strip("| ").split(" | ") for line in part.splitlines() if line.startswith("| `")]
+        tables.append({room.name: room for room in map(Room, rows)})
+    return tables
+
+
+def find_below(rooms, name):
+    """Everything that a room stands on, whatever is between."""
+    below = set()
+    for lower in rooms[name].stands_on:
+        if lower not in rooms:
+            sys.exit(f"docs/house.md: {name} stands on {lower}, which is no room")
+        below |= {lower} | find_below(rooms, lower)
+    return below
+
+
+class House:
+    def __init__(self, rooms, floors):
+        self.rooms, self.floors = rooms, floors
+        self.files = [path.relative_to(ROOT) for folder in sorted({name.split("/")[0] for name in rooms})
+                      for path in sorted((ROOT / folder).rglob("*")) if path.suffix in (".h", ".cpp")]
+        self.headers = collections.defaultdict(list)
+        for file in self.files:
+            if file.suffix == ".h":
+                self.headers[file.name].append(file)
+
+    def room_of(self, file):
+        """The room with the longest name that the file is in."""
+        parents = [str(parent) for parent in file.parents]
+        return next((parent for parent in parents if parent in self.rooms), None)
+
+    def floor_of(self, file):
+        for name, floor in self.floors.items():
+            if file.stem in floor.headers and file.suffix == ".h":
+                return name
+        source = next((ROOT / FACILITY / "src").rglob(file.stem + ".cpp"), None)
+        folder = (source or ROOT / file).relative_to(ROOT / FACILITY / "src").parts[:-1] if source or "src" in file.parts else None
+        if folder is None:
+            return None
+        return folder[0] if folder else "the pool"
+
+    def find_header(self, file, name):
+        """The file that an include means: one of the same room first."""
+        found = [header for header in self.headers[pathlib.PurePath(name).name] if str(header).endswith("/" + name)]
+        own = [header for header in found if self.room_of(header) == self.room_of(file)]
+        return (own or found or [None])[0]
+
+    def includes(self):
+        for file in self.files:
+            for name in re.findall(r'^#include "([^"]+)"', (ROOT / file).read_text(), re.MULTILINE):
+                header = self.find_header(file, name)
+                if header:
+                    yield file, header
+
+
+def draw(title, arrows):
+    """Mermaid's text for arrows between names; what follows from two others is left out."""
+    def reaches(start, end, without):
+        return any((middle, end) != without and (middle == end or reaches(middle, end, without))
+                   for first, middle in arrows if first == start and (first, middle) != without)
+
+    kept = [arrow for arrow in sorted(arrows) if not reaches(arrow[0], arrow[1], arrow)]
+    label = {name: re.sub(r"\W", "_", name) for arrow in kept for name in arrow}
+    lines = [f'    {label[name]}["{name.replace("engine/", "")}"]' for name in sorted(label)]
+    lines += [f"    {label[upper]} --> {label[lower]}" for upper, lower in kept]
+    return f"{title}\n\n```mermaid\ngraph TD\n" + "\n".join(lines) + "\n```\n"
+
+
+def inspect(house):
+    """@return the faults, and the arrows between rooms and between floors."""
+    faults, arrows, steps = [], set(), set()
+    for file in house.files:
+        if house.room_of(file) is None:
+            faults.append(f"{file}: no room of docs/house.md")
+        elif house.room_of(file) == FACILITY and house.floor_of(file) not in house.floors:
+            faults.append(f"{file}: on no floor of docs/house.md")
+    for file, header in house.includes() if not faults else ():
+        upper, lower = house.room_of(file), house.room_of(header)
+        if upper != lower:
+            arrows.add((upper, lower))
+            if lower not in find_below(house.rooms, upper):
+                faults.append(f"{file}: includes {header}, but {upper} does not stand on {lower}")
+            if "src" in header.parts and "api" in {path.name for path in (ROOT / lower).iterdir()}:
+                faults.append(f"{file}: includes {header} out of another room's src")
+        elif upper == FACILITY and house.floor_of(file) != house.floor_of(header):
+            step = (house.floor_of(file), house.floor_of(header))
+            steps.add(step)
+            if step[1] not in find_below(house.floors, step[0]):
+                faults.append(f"{file}: includes {header}, but {step[0]} does not stand on {step[1]}")
+    counts = collections.Counter(file.parent for file in house.files if file.suffix == ".cpp")
+    faults += [f"{folder}: {count} sources; at most {MOST_SOURCES}" for folder, count in counts.items()
+               if count > MOST_SOURCES]
+    return faults, arrows, steps
+
+
+def main():
+    parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
+    parser.add_argument("--check", action="store_true", help="change nothing")
+    options = parser.parse_args()
+
+    page = PAGE.read_text()
+    faults, arrows, steps = inspect(House(*read_tables(page)))
+    drawing = draw("Rooms:", arrows) + "\n" + draw("Floors of the facility:", steps)
+    drawn = DRAWING.sub(lambda match: match[1] + drawing + match[3], page)
+    if not options.check:
+        PAGE.write_text(drawn)
+    elif drawn != page:
+        faults.append("docs/house.md: the drawing is not that of the sources; ./run house draws it")
+    for fault in faults:
+        print(fault, file=sys.stderr)
+    return 1 if faults else 0
+
+
+if __name__ == "__main__":
+    sys.exit(main())
