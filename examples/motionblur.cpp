@@ -187,6 +187,7 @@ bool draw(const SharedPtr<AssetCachePool>& pool, const Arguments& arguments, con
 
     const auto context = makeShared<RenderContext>();
     const auto renderer = makeShared<SimpleRenderer>(context, pool);
+    renderer->setOpaqueGrouped(true); // fewer changes of program and texture, for the same picture
     const auto velocityRenderer = makeShared<MotionBlurRenderer>(context, pool);
     if (!context->getProperty("MOTION_BLUR_FACTOR")->setValue(arguments.factor, 0))
         return false;

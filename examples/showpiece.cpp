@@ -200,6 +200,7 @@ bool draw(const SharedPtr<AssetCachePool>& pool, const Arguments& arguments)
 {
     const auto context = makeShared<RenderContext>();
     const auto renderer = makeShared<SimpleRenderer>(context, pool);
+    renderer->setOpaqueGrouped(true); // fewer changes of program and texture, for the same picture
 
     const auto scene = makeShared<SceneNode>("scene");
     addLights(scene);

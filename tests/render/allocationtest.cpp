@@ -34,6 +34,7 @@ TEST_F(AllocationTest, framesAllocateNothing)
         {{"u_mirror", "M_MIRROR_TEXTURE"}}));
     addSquare(Vector3f(), 1.0f, mirror);
     camera->setStereo(3.0f, 0.1f);
+    renderer->setOpaqueGrouped(true);
 
     AnimationController controller(loaded->getAnimationGroup());
     RenderBlock block(renderer, scene, camera);

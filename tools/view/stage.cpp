@@ -120,6 +120,7 @@ std::unique_ptr<Stage> Stage::load(Studio& studio, const SceneFile& file, std::s
     forEachSolid(*stage->m_scene, [&](orv::Solid& solid)
                  { stage->m_usesShaderTime = stage->m_usesShaderTime || takesTime(solid); });
     const auto renderer = makeShared<orv::SimpleRenderer>(studio.getContext(), studio.getPool());
+    renderer->setOpaqueGrouped(true); // a model's parts come in any order
     stage->m_block = makeShared<orv::RenderBlock>(renderer, stage->m_scene, stage->m_freeCamera);
     stage->setBackground(BACKGROUND);
     return stage;

@@ -1,5 +1,6 @@
 #include "orv/simplerenderer.h"
 
+#include "drawgroups.h"
 #include "eyes.h"
 #include "rendererproperties.h"
 
@@ -75,6 +76,12 @@ SimpleRenderer::SimpleRenderer(const SharedPtr<RenderContext>& context, const Sh
 
 SimpleRenderer::~SimpleRenderer() = default;
 
+void SimpleRenderer::setOpaqueGrouped(bool grouped)
+{
+    if (grouped != isOpaqueGrouped())
+        m_groups = grouped ? std::make_unique<detail::DrawGroups>() : nullptr;
+}
+
 void SimpleRenderer::visit(Solid* solid)
 {
     const Appearance* appearance = solid->getAppearance().get();
@@ -109,6 +116,8 @@ void SimpleRenderer::render(Camera* camera, SceneNode& scene, const FlagMask& re
     if (!m_properties->isComplete())
         return; // the log said so when they were made
     visitScene(*this, scene, renderFlags, recursiveFlags);
+    if (m_groups)
+        m_groups->order(m_opaque);
 
     const RenderContext::DrawScope scope(*m_context);
     const detail::MirroredView mirroredView(*m_context, camera);

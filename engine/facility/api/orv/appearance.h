@@ -1,6 +1,7 @@
 #pragma once
 
 #include "orv/colour.h"
+#include "orv/detail/drawmark.h"
 #include "orv/export.h"
 #include "orv/renderstate.h"
 #include "orv/shaderprogram.h"
@@ -130,6 +131,8 @@ public:
     /// logged; what was read before one stays. The format is described at loadAppearance().
     void apply(AssetCachePool& pool, const char* name);
 
+    detail::DrawMark& getDrawMark() const { return m_drawMark; } ///< the renderer's
+
 private:
     struct Property
     {
@@ -153,6 +156,7 @@ private:
     RenderState m_state;
     uint64_t m_stateRevision;
     uint64_t m_propertyRevision;
+    mutable detail::DrawMark m_drawMark;
     bool m_linked = false;
     bool m_forceOpaque = false;
     bool m_opaque = true;

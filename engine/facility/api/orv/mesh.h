@@ -1,5 +1,6 @@
 #pragma once
 
+#include "orv/detail/drawmark.h"
 #include "orv/export.h"
 #include "orv/indexbuffer.h"
 #include "orv/matrix.h"
@@ -35,10 +36,13 @@ public:
     const IndexBuffer::Ptr& getIndexBuffer() const { return m_indexBuffer; }
     const VertexBuffer::Ptr& getVertexBuffer() const { return m_vertexBuffer; }
 
+    detail::DrawMark& getDrawMark() const { return m_drawMark; } ///< the renderer's
+
 private:
     MeshHeader m_header;
     IndexBuffer::Ptr m_indexBuffer;
     VertexBuffer::Ptr m_vertexBuffer;
+    mutable detail::DrawMark m_drawMark;
 };
 
 } // namespace orv

@@ -1,5 +1,6 @@
 #pragma once
 
+#include "orv/detail/drawmark.h"
 #include "orv/detail/programattrib.h"
 #include "orv/detail/programhandle.h"
 #include "orv/export.h"
@@ -149,6 +150,8 @@ public:
     /// null. Asks GL, so it is no part of the draw path.
     static ShaderProgram* getCurrent(const RenderContext& context);
 
+    detail::DrawMark& getDrawMark() const { return m_drawMark; } ///< the renderer's
+
 private:
     using Uniform = detail::DrawnUniform;
 
@@ -174,6 +177,7 @@ private:
     std::vector<detail::ProgramAttrib> m_attribs;
     SharedPtr<detail::ProgramHandle> m_handle;
     uint64_t m_revision;
+    mutable detail::DrawMark m_drawMark;
     uint32_t m_drawProperties = 0;
     bool m_usesMirrorTexture = false;
 };

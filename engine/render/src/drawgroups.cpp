@@ -1,0 +1,132 @@
+#include "drawgroups.h"
+
+#include "orv/appearance.h"
+#include "orv/mesh.h"
+#include "orv/shaderprogram.h"
+#include "orv/solid.h"
+
+#include <utility>
+
+namespace orv::detail
+{
+
+namespace
+{
+
+constexpr uint32_t KEEPS_PLACE = 0xFFFFFFFFu; ///< in place of a material's number
+
+/// Whether it matters to the picture what was drawn before. Opaque materials do not blend; an offset depends on the
+/// one before it (see RenderContext::setDepthOffset).
+bool keepsPlace(const RenderState& state)
+{
+    const bool findsNearest =
+        state.depthTestEnabled && state.depthWriteEnabled &&
+        (state.depthFunction == DepthFunction::LESS || state.depthFunction == DepthFunction::LEQUAL);
+    const bool writesAll =
+        state.colourMaskRed && state.colourMaskGreen && state.colourMaskBlue && state.colourMaskAlpha;
+    const bool isOffset = state.depthOffsetFactor != 0.0f || state.depthOffsetUnits != 0.0f;
+    return !findsNearest || !writesAll || isOffset || state.stencilTestEnabled;
+}
+
+/// Makes of the count of each number the place of its first.
+void addUp(std::vector<uint32_t>& counts)
+{
+    uint32_t place = 0;
+    for (uint32_t& count : counts)
+        place += std::exchange(count, place);
+}
+
+} // namespace
+
+void DrawGroups::order(std::vector<Solid*>& solids)
+{
+    begin();
+    size_t first = 0; // of those in m_entries
+    for (size_t i = 0; i < solids.size(); ++i)
+    {
+        Solid* solid = solids[i];
+        const uint32_t material = numberMaterial(*solid->getAppearance().get());
+        if (material != KEEPS_PLACE)
+        {
+            ++m_materialCounts[material];
+            m_entries.push_back({solid, material, numberMesh(solid->getMesh().get())});
+            continue;
+        }
+        writeGroups(solids.data() + first);
+        begin();
+        first = i + 1;
+    }
+    writeGroups(solids.data() + first);
+}
+
+void DrawGroups::begin()
+{
+    m_round = nextRevision();
+    m_programCount = 0;
+    m_meshCount = 1; // number 0 is for want of a mesh
+    m_entries.clear();
+    m_programs.clear();
+    m_materialCounts.clear();
+}
+
+uint32_t DrawGroups::numberMaterial(const Appearance& appearance)
+{
+    DrawMark& mark = appearance.getDrawMark();
+    if (mark.round == m_round) [[likely]]
+        return mark.number;
+    if (keepsPlace(appearance.getRenderState()))
+        return KEEPS_PLACE;
+    mark = {m_round, uint32_t(m_programs.size())};
+    DrawMark& programMark = appearance.getShaderProgram()->getDrawMark();
+    if (programMark.round != m_round)
+        programMark = {m_round, m_programCount++};
+    m_programs.push_back(programMark.number);
+    m_materialCounts.push_back(0);
+    return mark.number;
+}
+
+uint32_t DrawGroups::numberMesh(const Mesh* mesh)
+{
+    if (!mesh)
+        return 0;
+    DrawMark& mark = mesh->getDrawMark();
+    if (mark.round != m_round)
+        mark = {m_round, m_meshCount++};
+    return mark.number;
+}
+
+/// The order by meshes first: that by materials then leaves it as it is within each.
+void DrawGroups::writeGroups(Solid** solids)
+{
+    const std::vector<Entry>* entries = &m_entries;
+    if (m_meshCount > 2)
+    {
+        m_counts.assign(m_meshCount, 0);
+        for (const Entry& entry : m_entries)
+            ++m_counts[entry.mesh];
+        addUp(m_counts);
+        m_byMesh.resize(m_entries.size());
+        for (const Entry& entry : m_entries)
+            m_byMesh[m_counts[entry.mesh]++] = entry;
+        entries = &m_byMesh;
+    }
+    rankMaterials();
+    for (const Entry& entry : *entries)
+        solids[m_materialCounts[entry.material]++] = entry.solid;
+}
+
+/// Makes of the counts the places of each material's first solid, those of a program side by side.
+void DrawGroups::rankMaterials()
+{
+    m_counts.assign(m_programCount, 0);
+    for (size_t i = 0; i < m_programs.size(); ++i)
+        m_counts[m_programs[i]] += m_materialCounts[i];
+    addUp(m_counts);
+    for (size_t i = 0; i < m_programs.size(); ++i)
+    {
+        const uint32_t count = m_materialCounts[i];
+        m_materialCounts[i] = std::exchange(m_counts[m_programs[i]], m_counts[m_programs[i]] + count);
+    }
+}
+
+} // namespace orv::detail
