@@ -1,6 +1,8 @@
 #include "converttest.h"
 #include "support/picture.h"
 
+#include "convert/filegate.h"
+#include "convert/modelfiles.h"
 #include "convert/picturefinder.h"
 #include "convert/pictures.h"
 
@@ -343,8 +345,10 @@ TEST(Pictures, mapsBecomeOthers)
 TEST(PictureFinder, readsDataUris)
 {
     const aiScene none;
+    convert::FileGate gate("model.dae");
+    convert::ModelFiles files("model.dae", gate);
     const convert::FoundPicture found =
-        convert::PictureFinder(none, "model.dae").find("data:image/png;base64,aGVs%0AbG8=");
+        convert::PictureFinder(none, files).find("data:image/png;base64,aGVs%0AbG8=");
     EXPECT_TRUE(found.isThere);
     EXPECT_EQ((std::vector<uint8_t>{'h', 'e', 'l', 'l', 'o'}), found.bytes);
 }

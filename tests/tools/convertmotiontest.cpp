@@ -1,6 +1,8 @@
 #include "converttest.h"
 
+#include "convert/filegate.h"
 #include "convert/model.h"
+#include "convert/modelfiles.h"
 
 #include "orv/animationgroup.h"
 #include "orv/camera.h"
@@ -180,7 +182,10 @@ protected:
         m_model = {};
         m_geometries.clear();
         m_skins.clear();
-        EXPECT_TRUE(convert::convertModel(path, "model", options, m_model, error)) << path << ": " << error;
+        convert::FileGate gate(path);
+        convert::ModelFiles files(path, gate);
+        EXPECT_TRUE(convert::convertModel(path, files, "model", options, m_model, error))
+            << path << ": " << error;
         for (const glo::Geometry& geometry : m_model.scene.geometries)
             m_geometries[geometry.name] = &geometry;
         for (const glo::Skin& skin : m_model.scene.skins)

@@ -8,6 +8,8 @@
 #include <filesystem>
 #include <new>
 
+#include <sys/stat.h>
+
 namespace convert
 {
 
@@ -25,18 +27,28 @@ template <class Bytes>
 bool receiveBytes(Bytes& bytes, std::FILE* stream)
 {
     uint64_t size = 0;
-    if (std::fread(&size, sizeof size, 1, stream) != 1)
+    struct stat whole = {};
+    if (std::fread(&size, sizeof size, 1, stream) != 1 || fstat(fileno(stream), &whole) != 0 ||
+        size > uint64_t(whole.st_size))
         return false;
     bytes.resize(size);
     return size == 0 || std::fread(bytes.data(), 1, size, stream) == size;
 }
 
-void convertOrThrow(const std::string& path, const std::string& out, const Options& options,
-                    Conversion& conversion)
+bool isExpected(const std::filesystem::path& path, const std::string& out)
+{
+    const std::filesystem::path scene(out);
+    const std::string start = getPictureStem(scene.stem().string());
+    return path == scene || (path.parent_path() == scene.parent_path() &&
+                             path.filename().string().compare(0, start.size(), start) == 0);
+}
+
+void convertOrThrow(const std::string& path, ModelFiles& files, const std::string& out,
+                    const Options& options, Conversion& conversion)
 {
     const std::filesystem::path target(out);
     ConvertedModel model;
-    if (!convertModel(path, target.stem().string(), options, model, conversion.error))
+    if (!convertModel(path, files, target.stem().string(), options, model, conversion.error))
         return;
     OutputFile scene{out, {}};
     if (!glo::writeGlo(model.scene, scene.bytes, conversion.error))
@@ -52,12 +64,13 @@ void convertOrThrow(const std::string& path, const std::string& out, const Optio
 
 } // namespace
 
-Conversion convertFile(const std::string& model, const std::string& out, const Options& options)
+Conversion convertFile(const std::string& model, ModelFiles& files, const std::string& out,
+                       const Options& options)
 {
     Conversion conversion;
     try
     {
-        convertOrThrow(model, out, options, conversion);
+        convertOrThrow(model, files, out, options, conversion);
     }
     catch (const std::bad_alloc&)
     {
@@ -81,7 +94,7 @@ bool send(const Conversion& conversion, std::FILE* stream)
     return sent && sendBytes(nullptr, 0, stream);
 }
 
-bool receive(Conversion& conversion, std::FILE* stream)
+bool receive(Conversion& conversion, const std::string& out, std::FILE* stream)
 {
     for (std::string* text : {&conversion.error, &conversion.text, &conversion.json})
     {
@@ -95,7 +108,7 @@ bool receive(Conversion& conversion, std::FILE* stream)
             return false;
         if (file.path.empty())
             return true;
-        if (!receiveBytes(file.bytes, stream))
+        if (!isExpected(file.path, out) || !receiveBytes(file.bytes, stream))
             return false;
         conversion.files.push_back(std::move(file));
     }

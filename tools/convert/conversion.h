@@ -10,6 +10,8 @@
 namespace convert
 {
 
+class ModelFiles;
+
 /// All that comes of converting a model; nothing is written yet.
 struct Conversion
 {
@@ -21,10 +23,15 @@ struct Conversion
 
 /// @param model  path of the model file.
 /// @param out    path of the scene file to be; textures come to lie beside it.
-Conversion convertFile(const std::string& model, const std::string& out, const Options& options);
+Conversion convertFile(const std::string& model, ModelFiles& files, const std::string& out,
+                       const Options& options);
 
-/// Hands it from process to process.
+/// Hands it from process to process, by way of a file.
 bool send(const Conversion& conversion, std::FILE* stream);
-bool receive(Conversion& conversion, std::FILE* stream);
+
+/// The other end, which relies on nothing that the first one says.
+/// @param out  path of the scene file; other files lie beside it, and their names begin with its name.
+/// @return false if not all is there, or if it has files of other names.
+bool receive(Conversion& conversion, const std::string& out, std::FILE* stream);
 
 } // namespace convert

@@ -1,12 +1,12 @@
 #include "gltffile.h"
 
+#include "modelfiles.h"
+
 #include <assimp/scene.h>
 
 #include <nlohmann/json.hpp>
 
 #include <cstdint>
-#include <fstream>
-#include <iterator>
 #include <vector>
 
 namespace convert
@@ -19,10 +19,11 @@ using nlohmann::json;
 
 /// Whole files are JSON; in binary ones it begins after 20 bytes of header, in both versions, and fourth comes its
 /// size.
-json readJson(const std::string& path)
+json readJson(const std::string& path, ModelFiles& files)
 {
-    std::ifstream file(path, std::ios::binary);
-    std::string bytes(std::istreambuf_iterator<char>(file), {});
+    std::vector<uint8_t> file;
+    files.read(path, file);
+    std::string bytes(file.begin(), file.end());
     constexpr size_t HEADER = 20;
     if (bytes.compare(0, 4, "glTF") == 0 && bytes.size() > HEADER)
     {
@@ -183,11 +184,12 @@ void correctSecondVersion(aiScene& scene, const json& file, Report& report)
 
 } // namespace
 
-void correctGltf(aiScene& scene, const std::string& path, bool isFirstVersion, Report& report)
+void correctGltf(aiScene& scene, const std::string& path, bool isFirstVersion, ModelFiles& files,
+                 Report& report)
 {
     if (!isFirstVersion && scene.mNumAnimations == 0)
         return; // what is wrong there is only in animations
-    const json file = readJson(path);
+    const json file = readJson(path, files);
     if (isFirstVersion)
         correctFirstVersion(scene, file, report);
     else

@@ -1,29 +1,27 @@
 #include "guard.h"
 
+#include "confinement.h"
+#include "filegate.h"
+#include "modelfiles.h"
+#include "sanitizers.h"
+
+#include <algorithm>
 #include <cerrno>
 #include <chrono>
 #include <climits>
 #include <csignal>
 #include <cstring>
-#include <memory>
 #include <new>
+#include <vector>
 
+#include <fcntl.h>
 #include <poll.h>
 #include <sys/mman.h>
 #include <sys/prctl.h>
 #include <sys/resource.h>
+#include <sys/socket.h>
 #include <sys/wait.h>
 #include <unistd.h>
-
-// The one place that knows about sanitizers: GCC says so by a macro, Clang by a feature.
-#if defined(__has_feature)
-#if __has_feature(address_sanitizer)
-#define ORV_CHECKS_ADDRESSES
-#endif
-#endif
-#if defined(__SANITIZE_ADDRESS__)
-#define ORV_CHECKS_ADDRESSES
-#endif
 
 namespace convert
 {
@@ -42,11 +40,41 @@ constexpr int OUT_OF_MEMORY = 101;
 
 using Clock = std::chrono::steady_clock;
 
-struct FileCloser
+/// Ends of a connection, of which the parent has the first and the child the second.
+class Connection
 {
-    void operator()(std::FILE* file) const { std::fclose(file); }
+public:
+    ~Connection()
+    {
+        closeEnd(0);
+        closeEnd(1);
+    }
+    Connection() = default;
+    Connection(const Connection&) = delete;
+    Connection& operator=(const Connection&) = delete;
+
+    bool openPipe() { return pipe2(m_ends, O_CLOEXEC) == 0; }
+    bool openSocket() { return socketpair(AF_UNIX, SOCK_SEQPACKET | SOCK_CLOEXEC, 0, m_ends) == 0; }
+    int operator[](int end) const { return m_ends[end]; }
+    void closeEnd(int end)
+    {
+        if (m_ends[end] >= 0)
+            close(m_ends[end]);
+        m_ends[end] = -1;
+    }
+
+private:
+    int m_ends[2] = {-1, -1};
 };
-using File = std::unique_ptr<std::FILE, FileCloser>;
+
+/// What parent and child have in common.
+struct Link
+{
+    File handover;         ///< in memory
+    Connection life;       ///< a pipe that the child closes by ending
+    Connection files;      ///< a socket over which the child asks for files
+    Connection complaints; ///< a pipe that tells why the system does not confine the child, if so
+};
 
 File makeMemoryFile()
 {
@@ -66,8 +94,22 @@ void setLimit(int resource, uint64_t value)
     setrlimit(resource, &limit);
 }
 
-[[noreturn]] void runChild(const Limits& limits, const std::function<bool(std::FILE*)>& work,
-                           std::FILE* handover, pid_t parent)
+/// Closes whatever this process has inherited but the standard streams and what is listed.
+void closeOthers(std::vector<unsigned> kept)
+{
+    std::sort(kept.begin(), kept.end());
+    unsigned first = STDERR_FILENO + 1;
+    for (const unsigned descriptor : kept)
+    {
+        if (descriptor > first)
+            close_range(first, descriptor - 1, 0);
+        first = std::max(first, descriptor + 1);
+    }
+    close_range(first, UINT_MAX, 0);
+}
+
+[[noreturn]] void runChild(const Limits& limits, const Work& work, const std::string& model, Link& link,
+                           pid_t parent)
 {
     prctl(PR_SET_PDEATHSIG, SIGKILL);
     if (getppid() != parent)
@@ -75,16 +117,38 @@ void setLimit(int resource, uint64_t value)
     setLimit(RLIMIT_CORE, 0);
     if (CAN_LIMIT_MEMORY && limits.mebibytes > 0)
         setLimit(RLIMIT_AS, limits.mebibytes << 20);
+    std::FILE* handover = link.handover.get();
+    closeOthers({unsigned(fileno(handover)), unsigned(link.life[1]), unsigned(link.files[1]),
+                 unsigned(link.complaints[1])});
+    ModelFiles files(model, link.files[1]);
+    std::string error;
+    if (!confine(link.files[1], error) &&
+        write(link.complaints[1], error.data(), error.size()) != ssize_t(error.size()))
+        _exit(INCOMPLETE);
+    link.complaints.closeEnd(1);
     // Before anybody catches the exception and makes something else of it.
     std::set_new_handler([] { _exit(OUT_OF_MEMORY); });
-    const bool complete = work(handover) && std::fflush(handover) == 0;
+    const bool complete = work(handover, files) && std::fflush(handover) == 0;
     _exit(complete ? 0 : INCOMPLETE); // without what the parent has registered for its own end
 }
 
-/// Waits until the child has closed its end of the pipe, which it does by ending.
+/// Once for a process, since it is so for every child.
+void complainOnce(int pipe)
+{
+    static bool hasComplained = false;
+    char reason[100] = {};
+    if (read(pipe, reason, sizeof reason - 1) <= 0 || hasComplained)
+        return;
+    hasComplained = true;
+    std::fprintf(stderr,
+                 "orv-convert: this system does not confine processes (%s); the model is read unconfined\n",
+                 reason);
+}
+
+/// Answers the child's questions until it has closed its end of the pipe, which it does by ending.
 /// @param seconds  0: for ever.
 /// @return false if it has not ended in time.
-bool waitForEnd(int pipe, double seconds)
+bool serveUntilEnd(const Link& link, FileGate& gate, double seconds)
 {
     const Clock::time_point start = Clock::now();
     for (;;)
@@ -98,9 +162,13 @@ bool waitForEnd(int pipe, double seconds)
                 return false;
             milliseconds = left < INT_MAX ? int(left) + 1 : INT_MAX;
         }
-        pollfd end = {pipe, POLLIN, 0};
-        if (poll(&end, 1, milliseconds) > 0)
+        pollfd events[] = {{link.life[0], POLLIN, 0}, {link.files[0], POLLIN, 0}};
+        if (poll(events, 2, milliseconds) <= 0)
+            continue;
+        if (events[0].revents != 0)
             return true;
+        if (events[1].revents & POLLIN)
+            answerRequest(gate, link.files[0]);
     }
 }
 
@@ -131,9 +199,10 @@ std::string describeTimeout(double seconds)
 }
 
 /// @return whether the child has done its work.
-bool supervise(pid_t child, int pipe, const Limits& limits, std::string& error)
+bool supervise(pid_t child, const Link& link, FileGate& gate, const Limits& limits, std::string& error)
 {
-    const bool inTime = waitForEnd(pipe, limits.seconds);
+    complainOnce(link.complaints[0]);
+    const bool inTime = serveUntilEnd(link, gate, limits.seconds);
     if (!inTime)
         kill(child, SIGKILL);
     int status = 0;
@@ -148,30 +217,27 @@ bool supervise(pid_t child, int pipe, const Limits& limits, std::string& error)
 
 } // namespace
 
-bool runGuarded(const Limits& limits, const std::function<bool(std::FILE*)>& work,
+bool runGuarded(const Limits& limits, const std::string& model, FileGate& gate, const Work& work,
                 const std::function<bool(std::FILE*)>& accept, std::string& error)
 {
-    const File handover = makeMemoryFile();
-    int ends[2];
-    if (!handover || pipe(ends) != 0)
+    Link link;
+    link.handover = makeMemoryFile();
+    if (!link.handover || !link.life.openPipe() || !link.files.openSocket() || !link.complaints.openPipe())
         return failWithErrno("no handover file", error);
 
     std::fflush(nullptr); // or the child has the same bytes to write again
     const pid_t parent = getpid();
     const pid_t child = fork();
     if (child == 0)
-    {
-        close(ends[0]);
-        runChild(limits, work, handover.get(), parent);
-    }
-    close(ends[1]);
+        runChild(limits, work, model, link, parent);
+    for (Connection* connection : {&link.life, &link.files, &link.complaints})
+        connection->closeEnd(1);
     const bool done =
-        child > 0 ? supervise(child, ends[0], limits, error) : failWithErrno("no child process", error);
-    close(ends[0]);
+        child > 0 ? supervise(child, link, gate, limits, error) : failWithErrno("no child process", error);
     if (!done)
         return false;
-    std::rewind(handover.get());
-    if (accept(handover.get()))
+    std::rewind(link.handover.get());
+    if (accept(link.handover.get()))
         return true;
     error = "the conversion left no result";
     return false;

@@ -1,11 +1,11 @@
 #include "halflifefile.h"
 
+#include "modelfiles.h"
+
 #include <assimp/scene.h>
 
 #include <algorithm>
 #include <cstdint>
-#include <fstream>
-#include <iterator>
 #include <vector>
 
 namespace convert
@@ -15,18 +15,18 @@ namespace
 {
 
 /// The numbers of the bones' parents, -1 for none. Bones come after their parents.
-std::vector<int32_t> readParents(const std::string& path, size_t count)
+std::vector<int32_t> readParents(const std::string& path, ModelFiles& files, size_t count)
 {
     constexpr size_t BONE_COUNT = 140; // where the header has it, and next to it the place of the first bone
     constexpr size_t BONE_SIZE = 112;
     constexpr size_t PARENT = 32; // in a bone
-    std::ifstream file(path, std::ios::binary);
-    const std::vector<char> bytes(std::istreambuf_iterator<char>(file), {});
+    std::vector<uint8_t> bytes;
+    files.read(path, bytes);
     const auto read = [&](size_t at)
     {
         uint32_t number = 0;
         for (size_t i = 0; i < 4 && at + i < bytes.size(); ++i)
-            number |= uint32_t(static_cast<unsigned char>(bytes[at + i])) << (8 * i);
+            number |= uint32_t(bytes[at + i]) << (8 * i);
         return int32_t(number);
     };
     std::vector<int32_t> parents;
@@ -54,10 +54,10 @@ void giveChildren(aiNode& node, const std::vector<aiNode*>& children)
 /// The bones' own transforms are those of the file, from bone to parent, and their offsets lead from the mesh, which
 /// has been put together by the wrong tree too, to where the file has the vertices: in the bones. So skins are right
 /// as soon as the tree is.
-void hangBones(aiNode& holder, const std::string& path)
+void hangBones(aiNode& holder, const std::string& path, ModelFiles& files)
 {
     const std::vector<aiNode*> bones(holder.mChildren, holder.mChildren + holder.mNumChildren);
-    const std::vector<int32_t> parents = readParents(path, bones.size());
+    const std::vector<int32_t> parents = readParents(path, files, bones.size());
     if (parents.empty()) // a version of the library that does better would leave fewer here
         return;
     for (int32_t i = -1; i < int32_t(parents.size()); ++i)
@@ -88,13 +88,13 @@ double findLastKey(const aiAnimation& animation)
 
 } // namespace
 
-void correctHalfLife(aiScene& scene, const std::string& path)
+void correctHalfLife(aiScene& scene, const std::string& path, ModelFiles& files)
 {
     for (unsigned i = 0; i < scene.mNumAnimations; ++i)
         scene.mAnimations[i]->mDuration = findLastKey(*scene.mAnimations[i]);
     aiNode* bones = scene.mRootNode->FindNode("<MDL_bones>");
     if (bones && bones->mNumChildren > 0)
-        hangBones(*bones, path);
+        hangBones(*bones, path, files);
 }
 
 } // namespace convert

@@ -4,6 +4,7 @@
 #include "gltffile.h"
 #include "halflifefile.h"
 #include "mending.h"
+#include "modelio.h"
 #include "progress.h"
 #include "uvtransforms.h"
 
@@ -137,11 +138,12 @@ bool fail(const std::string& reason, std::string& error)
 
 } // namespace
 
-bool importModel(const std::string& path, const Options& options, ImportedModel& model, Report& report,
-                 std::string& error)
+bool importModel(const std::string& path, ModelFiles& files, const Options& options, ImportedModel& model,
+                 Report& report, std::string& error)
 {
     Assimp::Importer& importer = model.importer;
-    importer.SetProgressHandler(new ImportProgress); // the importer's from now on
+    importer.SetIOHandler(new ModelIo(files));       // the importer's from now on
+    importer.SetProgressHandler(new ImportProgress); // as well
     importer.SetPropertyBool(AI_CONFIG_IMPORT_COLLADA_IGNORE_UP_DIRECTION, !options.up.empty());
     model.scene = importer.ReadFile(path, 0);
     if (!model.scene)
@@ -151,7 +153,7 @@ bool importModel(const std::string& path, const Options& options, ImportedModel&
     const std::string format = getFormatName(importer);
     model.isGltf = contains(format, "glTF");
     if (scene.mRootNode && model.isGltf)
-        correctGltf(scene, path, !contains(format, "glTF2"), report);
+        correctGltf(scene, path, !contains(format, "glTF2"), files, report);
     if (scene.mRootNode)
         mend(scene, report);
     if (contains(format, "glTF2"))
@@ -164,7 +166,7 @@ bool importModel(const std::string& path, const Options& options, ImportedModel&
     countModel(scene, report);
     reportSkeletonBody(scene, report);
     if (scene.mRootNode->mName == aiString("<MDL_root>"))
-        correctHalfLife(scene, path);
+        correctHalfLife(scene, path, files);
     if (contains(format, "3DS"))
         reportCameras(scene, report);
     dropLostJoints(scene, report);

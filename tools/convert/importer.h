@@ -11,6 +11,8 @@
 namespace convert
 {
 
+class ModelFiles;
+
 /// A model as libassimp reads it, put right where the library is known to hand over something else than the file has.
 /// Faces have one to three corners, those of one mesh all the same number.
 struct ImportedModel
@@ -22,8 +24,9 @@ struct ImportedModel
         toScene; ///< from the model's axes and unit to +y up and, where the file tells its unit, metres
 };
 
+/// @param files  outlives the model.
 /// @param error  why not.
-bool importModel(const std::string& path, const Options& options, ImportedModel& model, Report& report,
-                 std::string& error);
+bool importModel(const std::string& path, ModelFiles& files, const Options& options, ImportedModel& model,
+                 Report& report, std::string& error);
 
 } // namespace convert

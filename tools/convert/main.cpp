@@ -1,11 +1,13 @@
 // orv-convert: makes a scene file, with its textures beside it, of a model file.
 
 #include "conversion.h"
+#include "filegate.h"
 #include "guard.h"
 #include "progress.h"
 
 #include <CLI/CLI.hpp>
 
+#include <algorithm>
 #include <cstdio>
 #include <filesystem>
 
@@ -24,6 +26,7 @@ struct Command
     std::string report;
     bool dryRun = false;
     bool noAnimation = false;
+    std::vector<std::string> allowed;
     convert::Options options;
     convert::Limits limits;
 };
@@ -38,6 +41,7 @@ const char* const FOOTER =
     "  orv-convert house.gltf house.glo --max-texture-size 1024 --power-of-two\n"
     "  orv-convert big.ifc big.glo --dry-run                only say what would come of it\n"
     "  orv-convert a.glb a.glo --report a.json              for a script (docs/convert.md)\n"
+    "  orv-convert source/car.fbx car.glo --allow textures  a model whose pictures lie elsewhere\n"
     "  orv-convert city.obj city.glo --time-limit 0 --memory-limit 16384";
 
 int fail(const std::string& message)
@@ -46,26 +50,60 @@ int fail(const std::string& message)
     return FAILED;
 }
 
-int run(const Command& command)
+/// In a child process.
+bool convertGuarded(const Command& command, convert::FileGate& gate, convert::Conversion& made,
+                    std::string& error)
 {
+    const auto work = [&](std::FILE* stream, convert::ModelFiles& files) {
+        return convert::send(convert::convertFile(command.model, files, command.out, command.options),
+                             stream);
+    };
+    const auto accept = [&](std::FILE* stream)
+    {
+        made = {};
+        return convert::receive(made, command.out, stream);
+    };
+    const bool done = convert::runGuarded(command.limits, command.model, gate, work, accept, error);
+    convert::clearProgress();
+    if (done)
+        error = made.error;
+    return done && error.empty();
+}
+
+/// Whether a texture would get the place of a file that the model was read from.
+bool takesInput(const convert::Conversion& made, const Command& command, const convert::FileGate& gate)
+{
+    return std::any_of(made.files.begin(), made.files.end(),
+                       [&](const convert::OutputFile& file)
+                       { return file.path != command.out && gate.wasOpened(file.path); });
+}
+
+int run(Command command)
+{
+    convert::FileGate gate(command.model, command.allowed);
     convert::Conversion made;
     std::string error;
-    const auto work = [&](std::FILE* stream)
-    { return convert::send(convert::convertFile(command.model, command.out, command.options), stream); };
-    const auto accept = [&](std::FILE* stream) { return convert::receive(made, stream); };
-    const bool done = convert::runGuarded(command.limits, work, accept, error);
-    convert::clearProgress();
+    bool done = convertGuarded(command, gate, made, error);
+    if (done && takesInput(made, command, gate)) // which only shows when all has been read
+    {
+        for (const convert::OutputFile& file : made.files)
+        {
+            if (gate.wasOpened(file.path))
+                command.options.takenNames.insert(std::filesystem::path(file.path).stem().string());
+        }
+        for (const std::filesystem::path& input : gate.getOpened())
+            command.options.takenNames.insert(input.stem().string());
+        done = convertGuarded(command, gate, made, error);
+    }
     if (!done)
         return fail(command.model + ": " + error);
-    if (!made.error.empty())
-        return fail(command.model + ": " + made.error);
 
     std::vector<convert::OutputFile> files;
     if (!command.dryRun)
         files = std::move(made.files);
     if (!command.report.empty())
         files.insert(files.begin(), {command.report, {made.json.begin(), made.json.end()}});
-    if (!convert::writeFiles(files, error))
+    if (!convert::writeFiles(files, gate, error))
         return fail(error);
     std::fputs(made.text.c_str(), stdout);
     if (command.dryRun)
@@ -91,6 +129,11 @@ void addOptions(CLI::App& app, Command& command)
         ->check(CLI::Range(1, LARGEST_TEXTURE));
     app.add_flag("--power-of-two", options.powerOfTwo,
                  "gives all textures sizes that can have mipmaps and repeat");
+    app.add_option("--allow", command.allowed,
+                   "another folder that the model may have files in, with what is below it; may be repeated")
+        ->allow_extra_args(false)
+        ->check(CLI::ExistingDirectory)
+        ->option_text("DIR");
     app.add_option("--report", command.report, "also write what is reported as JSON to this file");
     app.add_flag("--dry-run", command.dryRun, "write no scene and no textures");
     app.add_option("--time-limit", command.limits.seconds, "seconds after which to give up; 0 for never")

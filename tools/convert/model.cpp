@@ -4,11 +4,13 @@
 #include "lights.h"
 #include "materials.h"
 #include "meshes.h"
+#include "modelfiles.h"
 #include "names.h"
 #include "placement.h"
 #include "progress.h"
 
-#include <filesystem>
+#include <cerrno>
+#include <cstring>
 #include <set>
 
 namespace convert
@@ -21,7 +23,7 @@ namespace
 class ModelConverter
 {
 public:
-    ModelConverter(const ImportedModel& source, const std::string& path, const std::string& stem,
+    ModelConverter(const ImportedModel& source, ModelFiles& files, const std::string& stem,
                    const Options& options, ConvertedModel& model)
         : m_source(*source.scene)
         , m_isGltf(source.isGltf)
@@ -29,7 +31,7 @@ public:
         , m_stem(stem)
         , m_options(options)
         , m_model(model)
-        , m_textures(m_source, path, stem, options, model.report)
+        , m_textures(m_source, files, stem, options, model.report)
     {
     }
 
@@ -308,20 +310,27 @@ private:
 
 } // namespace
 
-bool convertModel(const std::string& path, const std::string& stem, const Options& options,
+bool convertModel(const std::string& path, ModelFiles& files, const std::string& stem, const Options& options,
                   ConvertedModel& model, std::string& error)
 {
-    std::error_code reason;
-    if (!std::filesystem::is_regular_file(path, reason))
+    int reason = 0;
+    if (!files.open(path, &reason))
     {
-        error = reason ? reason.message() : "not a file";
+        error = reason == EISDIR ? "not a file" : std::strerror(reason);
         return false;
     }
     ImportedModel source;
-    if (!importModel(path, options, source, model.report, error))
-        return false;
-    ModelConverter(source, path, stem, options, model).convert();
-    return true;
+    const bool isImported = importModel(path, files, options, source, model.report, error);
+    if (isImported)
+        ModelConverter(source, files, stem, options, model).convert();
+    for (const std::string& refused : files.getRefused())
+    {
+        model.report.lose("file-refused",
+                          "file \"" + refused + "\", which is not in the model's folder (see --allow)");
+        if (!isImported)
+            error += "; not in the model's folder, and so not read (see --allow): " + refused;
+    }
+    return isImported;
 }
 
 } // namespace convert

@@ -12,6 +12,8 @@
 namespace convert
 {
 
+class ModelFiles;
+
 /// A model as it is to be written.
 struct ConvertedModel
 {
@@ -24,7 +26,7 @@ struct ConvertedModel
 /// Reads a model file and makes a scene of it.
 /// @param stem   names the scene and begins the names of its pictures.
 /// @param error  why not.
-bool convertModel(const std::string& path, const std::string& stem, const Options& options,
+bool convertModel(const std::string& path, ModelFiles& files, const std::string& stem, const Options& options,
                   ConvertedModel& model, std::string& error);
 
 } // namespace convert

@@ -1,5 +1,7 @@
 #include "outputfiles.h"
 
+#include "filegate.h"
+
 #include <cerrno>
 #include <csignal>
 #include <cstdio>
@@ -65,7 +67,7 @@ bool fail(const std::string& path, const std::string& reason, std::string& error
 
 bool writeFile(const fs::path& path, const std::vector<uint8_t>& bytes)
 {
-    std::FILE* file = std::fopen(path.c_str(), "wb");
+    std::FILE* file = std::fopen(path.c_str(), "wbx");
     if (!file)
         return false;
     const bool written = bytes.empty() || std::fwrite(bytes.data(), 1, bytes.size(), file) == bytes.size();
@@ -78,13 +80,16 @@ fs::path getTemporaryPath(const fs::path& target)
            ("." + target.filename().string() + "." + std::to_string(getpid()) + ".tmp");
 }
 
-bool writeTemporaries(const std::vector<OutputFile>& files, TemporaryFiles& temporaries, std::string& error)
+bool writeTemporaries(const std::vector<OutputFile>& files, const FileGate& inputs,
+                      TemporaryFiles& temporaries, std::string& error)
 {
     for (const OutputFile& file : files)
     {
         std::error_code ignored;
         if (fs::is_directory(file.path, ignored)) // found out before the first file gets its name
             return fail(file.path, std::strerror(EISDIR), error);
+        if (inputs.wasOpened(file.path))
+            return fail(file.path, "the model was read from this file; choose another name", error);
         const fs::path path = getTemporaryPath(file.path);
         temporaries.add(path);
         if (!writeFile(path, file.bytes))
@@ -95,12 +100,12 @@ bool writeTemporaries(const std::vector<OutputFile>& files, TemporaryFiles& temp
 
 } // namespace
 
-bool writeFiles(const std::vector<OutputFile>& files, std::string& error)
+bool writeFiles(const std::vector<OutputFile>& files, const FileGate& inputs, std::string& error)
 {
     const Uninterrupted uninterrupted;
     TemporaryFiles temporaries;
     TemporaryFiles added;
-    if (!writeTemporaries(files, temporaries, error))
+    if (!writeTemporaries(files, inputs, temporaries, error))
         return false;
     for (const OutputFile& file : files)
     {

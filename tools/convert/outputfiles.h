@@ -7,6 +7,8 @@
 namespace convert
 {
 
+class FileGate;
+
 struct OutputFile
 {
     std::string path;
@@ -15,7 +17,8 @@ struct OutputFile
 
 /// Writes files, all of them or none: to temporary names in their folders first, and when all bytes are there under
 /// their own names, the last file of the list last. What interrupts a program waits meanwhile.
-/// @param error  "path: reason".
-bool writeFiles(const std::vector<OutputFile>& files, std::string& error);
+/// @param inputs  a file that was opened there is not written over, by whatever name.
+/// @param error   "path: reason".
+bool writeFiles(const std::vector<OutputFile>& files, const FileGate& inputs, std::string& error);
 
 } // namespace convert

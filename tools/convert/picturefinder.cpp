@@ -1,13 +1,12 @@
 #include "picturefinder.h"
 
 #include "lowercase.h"
+#include "modelfiles.h"
 #include "pictures.h"
 
 #include <assimp/scene.h>
 
-#include <algorithm>
-#include <cctype>
-#include <fstream>
+#include <filesystem>
 
 namespace convert
 {
@@ -17,7 +16,7 @@ namespace fs = std::filesystem;
 namespace
 {
 
-constexpr uintmax_t LARGEST_FILE = 512u << 20;
+constexpr uint64_t LARGEST_FILE = 512u << 20;
 
 bool startsWith(const std::string& text, const char* start)
 {
@@ -27,21 +26,6 @@ bool startsWith(const std::string& text, const char* start)
 std::string lastPart(const std::string& path)
 {
     return path.substr(path.find_last_of("/\\") + 1);
-}
-
-/// "%20" and the like.
-std::string decodeUrl(const std::string& text)
-{
-    std::string decoded;
-    for (size_t i = 0; i < text.size(); ++i)
-    {
-        const bool coded = text[i] == '%' && i + 2 < text.size() &&
-                           std::isxdigit(static_cast<unsigned char>(text[i + 1])) &&
-                           std::isxdigit(static_cast<unsigned char>(text[i + 2]));
-        decoded += coded ? char(std::stoi(text.substr(i + 1, 2), nullptr, 16)) : text[i];
-        i += coded ? 2 : 0;
-    }
-    return decoded;
 }
 
 std::vector<uint8_t> decodeBase64(const std::string& text)
@@ -105,27 +89,9 @@ FoundPicture readEmbedded(const std::string& path, const aiTexture& texture)
     return found;
 }
 
-/// Files in the folder that have the name if one does not look at the case of letters.
-void addOthersCase(const fs::path& folder, const std::string& name, std::vector<fs::path>& candidates)
-{
-    std::error_code ignored;
-    std::vector<fs::path> found;
-    for (const fs::directory_entry& entry : fs::directory_iterator(folder, ignored))
-    {
-        if (toLowerCase(entry.path().filename().string()) == toLowerCase(name))
-            found.push_back(entry.path());
-    }
-    std::sort(found.begin(), found.end()); // a folder has no order of its own
-    candidates.insert(candidates.end(), found.begin(), found.end());
-}
-
 } // namespace
 
-PictureFinder::PictureFinder(const aiScene& scene, const fs::path& model)
-    : m_scene(scene)
-    , m_folder(model.has_parent_path() ? model.parent_path() : ".")
-{
-}
+PictureFinder::PictureFinder(const aiScene& scene, ModelFiles& files) : m_scene(scene), m_files(files) {}
 
 FoundPicture PictureFinder::find(const std::string& path) const
 {
@@ -138,28 +104,29 @@ FoundPicture PictureFinder::find(const std::string& path) const
 /// other cases of letters are common.
 FoundPicture PictureFinder::findOnDisk(const std::string& path) const
 {
-    std::string plain = decodeUrl(path);
-    if (startsWith(plain, "file://"))
-        plain.erase(0, 7);
-    std::replace(plain.begin(), plain.end(), '\\', '/');
-    const std::string name = lastPart(plain);
-    std::vector<fs::path> candidates = {m_folder / path, m_folder / plain, m_folder / name};
-    for (const char* folder : {"", "textures", "../textures"})
-        addOthersCase(m_folder / folder, name, candidates);
-
+    const std::string name = lastPart(toPath(path));
     FoundPicture found{fs::path(name).stem().string(), {}, false};
-    for (const fs::path& candidate : candidates)
+    found.isThere = m_files.readNamed(path, found.bytes, LARGEST_FILE);
+    for (const char* folder : {"", "textures/", "../textures/"})
     {
-        std::error_code ignored;
-        if (!fs::is_regular_file(candidate, ignored) || fs::file_size(candidate, ignored) > LARGEST_FILE)
-            continue;
-        std::ifstream file(candidate, std::ios::binary);
-        found.bytes.resize(fs::file_size(candidate, ignored));
-        file.read(reinterpret_cast<char*>(found.bytes.data()), std::streamsize(found.bytes.size()));
-        found.isThere = file.good();
-        break;
+        const std::string other = m_files.getFolder() + folder;
+        found.isThere = found.isThere || m_files.read(other + name, found.bytes, LARGEST_FILE) ||
+                        readOthersCase(other, found, name);
     }
     return found;
+}
+
+/// A file of the folder that has the name if one does not look at the case of letters.
+bool PictureFinder::readOthersCase(const std::string& folder, FoundPicture& found,
+                                   const std::string& name) const
+{
+    for (const std::string& other : m_files.list(folder.empty() ? "." : folder))
+    {
+        if (toLowerCase(other) == toLowerCase(name) &&
+            m_files.read(folder + other, found.bytes, LARGEST_FILE))
+            return true;
+    }
+    return false;
 }
 
 } // namespace convert

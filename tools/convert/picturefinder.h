@@ -1,7 +1,6 @@
 #pragma once
 
 #include <cstdint>
-#include <filesystem>
 #include <string>
 #include <vector>
 
@@ -9,6 +8,8 @@ struct aiScene;
 
 namespace convert
 {
+
+class ModelFiles;
 
 /// A picture as a model has it.
 struct FoundPicture
@@ -22,17 +23,18 @@ struct FoundPicture
 class PictureFinder
 {
 public:
-    /// @param model  the file they belong to; outlived by scene.
-    PictureFinder(const aiScene& scene, const std::filesystem::path& model);
+    /// @param files  the model's; both outlive this object.
+    PictureFinder(const aiScene& scene, ModelFiles& files);
 
     /// @param path  as a material names it.
     FoundPicture find(const std::string& path) const;
 
 private:
     FoundPicture findOnDisk(const std::string& path) const;
+    bool readOthersCase(const std::string& folder, FoundPicture& found, const std::string& name) const;
 
     const aiScene& m_scene;
-    std::filesystem::path m_folder;
+    ModelFiles& m_files;
 };
 
 } // namespace convert

@@ -9,8 +9,6 @@
 namespace convert
 {
 
-namespace fs = std::filesystem;
-
 namespace
 {
 
@@ -73,13 +71,20 @@ std::string shorten(const std::string& path)
 
 } // namespace
 
-TextureStore::TextureStore(const aiScene& scene, const fs::path& model, const std::string& stem,
+std::string getPictureStem(const std::string& stem)
+{
+    return makePlain(stem.substr(0, 100)) + "-";
+}
+
+TextureStore::TextureStore(const aiScene& scene, ModelFiles& files, const std::string& stem,
                            const Options& options, Report& report)
-    : m_finder(scene, model)
-    , m_stem(makePlain(stem.substr(0, 100)))
+    : m_finder(scene, files)
+    , m_stem(getPictureStem(stem))
     , m_options(options)
     , m_report(report)
 {
+    for (const std::string& name : options.takenNames)
+        m_names.insert(toLowerCase(name));
 }
 
 TextureUse TextureStore::add(const TextureWish& wish)
@@ -217,7 +222,7 @@ TextureStore::Size TextureStore::getFittingSize(int width, int height, bool repe
 
 std::string TextureStore::makeName(const std::string& name, const std::string& extension)
 {
-    const std::string wanted = m_stem + "-" + makePlain(name.substr(0, 100));
+    const std::string wanted = m_stem + makePlain(name.substr(0, 100));
     std::string made = wanted;
     // Without the extension: the engine takes a .pvr for any picture of the same name.
     for (int number = 2; !m_names.insert(toLowerCase(made)).second; ++number)

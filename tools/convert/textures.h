@@ -9,7 +9,6 @@
 #include "orv/vector.h"
 
 #include <array>
-#include <filesystem>
 #include <map>
 #include <optional>
 #include <set>
@@ -51,6 +50,10 @@ struct TextureUse
     bool isPowerOfTwo = true; ///< both sides are
 };
 
+/// What the names of a scene's pictures begin with.
+/// @param stem  the scene file's name without its extension.
+std::string getPictureStem(const std::string& stem);
+
 /// Finds the pictures of a model and makes them files that the engine shows right.
 ///
 /// Pictures are passed on byte for byte where that will do; what the engine cannot read, grey ones, which it would
@@ -58,10 +61,10 @@ struct TextureUse
 class TextureStore
 {
 public:
-    /// @param model  the file they belong to.
+    /// @param files  the model's, as scene for as long as this lives.
     /// @param stem   begins every name, so that two conversions into one folder keep apart.
-    TextureStore(const aiScene& scene, const std::filesystem::path& model, const std::string& stem,
-                 const Options& options, Report& report);
+    TextureStore(const aiScene& scene, ModelFiles& files, const std::string& stem, const Options& options,
+                 Report& report);
 
     TextureUse add(const TextureWish& wish);
 

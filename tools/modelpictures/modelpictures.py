@@ -239,7 +239,7 @@ def find_model(pair, folder, scratch):
 
 def draw_ours(arguments, pair, model, picture):
     scene = picture + ".glo"
-    error = run([arguments.converter, model, scene])
+    error = run([arguments.converter, model, scene, "--allow", arguments.folder])
     if error:
         return error
     command = [arguments.viewer, scene, "--out", picture, "--size", "%dx%d" % (WIDTH, HEIGHT)]

@@ -60,7 +60,8 @@ def convert(converter, folder, model):
     readable = run(["assimp", "info", path])[0] == 0
     with tempfile.TemporaryDirectory() as scratch:
         report = os.path.join(scratch, "report.json")
-        code, _, error = run([converter, path, os.path.join(scratch, "model.glo"), "--report", report])
+        code, _, error = run([converter, path, os.path.join(scratch, "model.glo"), "--report", report,
+                              "--allow", folder])
         if code == 0:
             with open(report, encoding="utf-8") as file:
                 return "converted", describe(json.load(file))

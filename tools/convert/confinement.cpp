@@ -1,0 +1,123 @@
+#include "confinement.h"
+
+#include "sanitizers.h"
+
+#include <cerrno>
+#include <cstring>
+#include <memory>
+
+#include <asm/ioctls.h>
+#include <fcntl.h>
+#include <seccomp.h>
+#include <unistd.h>
+
+namespace convert
+{
+
+#ifdef ORV_CHECKS_ADDRESSES
+const bool CAN_CONFINE = false;
+#else
+const bool CAN_CONFINE = true;
+#endif
+
+namespace
+{
+
+struct FilterReleaser
+{
+    void operator()(void* filter) const { seccomp_release(filter); }
+};
+using Filter = std::unique_ptr<void, FilterReleaser>;
+
+/// What needs no look at its arguments: memory, time, what is open already, this process's own signals and end.
+constexpr int HARMLESS[] = {
+    SCMP_SYS(brk),
+    SCMP_SYS(mmap),
+    SCMP_SYS(mmap2),
+    SCMP_SYS(munmap),
+    SCMP_SYS(mremap),
+    SCMP_SYS(mprotect),
+    SCMP_SYS(madvise),
+    SCMP_SYS(read),
+    SCMP_SYS(readv),
+    SCMP_SYS(pread64),
+    SCMP_SYS(write),
+    SCMP_SYS(writev),
+    SCMP_SYS(pwrite64),
+    SCMP_SYS(lseek),
+    SCMP_SYS(_llseek),
+    SCMP_SYS(fstat),
+    SCMP_SYS(fstat64),
+    SCMP_SYS(close),
+    SCMP_SYS(futex),
+    SCMP_SYS(futex_time64),
+    SCMP_SYS(sched_yield),
+    SCMP_SYS(sched_getaffinity),
+    SCMP_SYS(clock_gettime),
+    SCMP_SYS(clock_gettime64),
+    SCMP_SYS(clock_nanosleep),
+    SCMP_SYS(gettimeofday),
+    SCMP_SYS(getrandom),
+    SCMP_SYS(getrusage),
+    SCMP_SYS(getpid),
+    SCMP_SYS(gettid),
+    SCMP_SYS(rt_sigaction),
+    SCMP_SYS(rt_sigprocmask),
+    SCMP_SYS(rt_sigreturn),
+    SCMP_SYS(sigreturn),
+    SCMP_SYS(sigaltstack),
+    SCMP_SYS(restart_syscall),
+    SCMP_SYS(exit),
+    SCMP_SYS(exit_group),
+};
+
+/// What is harmless with certain arguments alone.
+int allowWithArguments(void* filter, int socket)
+{
+    const scmp_datum_t self = scmp_datum_t(getpid());
+    const struct
+    {
+        int call;
+        scmp_arg_cmp argument;
+    } rules[] = {
+        {SCMP_SYS(sendto), SCMP_A0(SCMP_CMP_EQ, scmp_datum_t(socket))},
+        {SCMP_SYS(send), SCMP_A0(SCMP_CMP_EQ, scmp_datum_t(socket))},
+        {SCMP_SYS(recvmsg), SCMP_A0(SCMP_CMP_EQ, scmp_datum_t(socket))},
+        {SCMP_SYS(ioctl), SCMP_A1(SCMP_CMP_EQ, TCGETS)},  // whether it is a terminal
+        {SCMP_SYS(fcntl), SCMP_A1(SCMP_CMP_EQ, F_GETFL)}, // which fdopen looks at
+        {SCMP_SYS(fcntl64), SCMP_A1(SCMP_CMP_EQ, F_GETFL)},
+        {SCMP_SYS(newfstatat), SCMP_A3(SCMP_CMP_MASKED_EQ, AT_EMPTY_PATH, AT_EMPTY_PATH)}, // of what is open
+        {SCMP_SYS(fstatat64), SCMP_A3(SCMP_CMP_MASKED_EQ, AT_EMPTY_PATH, AT_EMPTY_PATH)},
+        {SCMP_SYS(statx), SCMP_A2(SCMP_CMP_MASKED_EQ, AT_EMPTY_PATH, AT_EMPTY_PATH)},
+        {SCMP_SYS(kill), SCMP_A0(SCMP_CMP_EQ, self)},
+        {SCMP_SYS(tgkill), SCMP_A0(SCMP_CMP_EQ, self)}, // of abort()
+    };
+    int result = 0;
+    for (const auto& rule : rules)
+        result = result < 0 ? result : seccomp_rule_add(filter, SCMP_ACT_ALLOW, rule.call, 1, rule.argument);
+    return result;
+}
+
+int loadFilter(int socket)
+{
+    const Filter filter(seccomp_init(SCMP_ACT_ERRNO(EACCES)));
+    if (!filter)
+        return -ENOMEM;
+    int result = 0;
+    for (const int call : HARMLESS)
+        result = result < 0 ? result : seccomp_rule_add(filter.get(), SCMP_ACT_ALLOW, call, 0);
+    result = result < 0 ? result : allowWithArguments(filter.get(), socket);
+    return result < 0 ? result : seccomp_load(filter.get());
+}
+
+} // namespace
+
+bool confine(int socket, std::string& error)
+{
+    const int result = CAN_CONFINE ? loadFilter(socket) : 0;
+    if (result < 0)
+        error = std::strerror(-result);
+    return result == 0;
+}
+
+} // namespace convert

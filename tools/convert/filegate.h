@@ -1,0 +1,51 @@
+#pragma once
+
+#include <filesystem>
+#include <set>
+#include <string>
+#include <utility>
+#include <vector>
+
+#include <sys/types.h>
+
+namespace convert
+{
+
+/// Decides which files a model may reach, and opens them: those in the model's own folder and below it, or in folders
+/// that the user allows. Symbolic links count by where they lead. Whatever reads a model asks here, in another process
+/// if need be (see runGuarded), so that a file from anywhere cannot have others read.
+class FileGate
+{
+public:
+    /// What open() says of a file that lies elsewhere; everything else is 0 or a value of errno.
+    static constexpr int REFUSED = -1;
+
+    /// @param model    the file that the user named, which may be a link to anywhere.
+    /// @param allowed  further folders.
+    explicit FileGate(const std::string& model, const std::vector<std::string>& allowed = {});
+
+    /// Opens a regular file for reading.
+    /// @param path        absolute or from the current folder.
+    /// @param descriptor  the file's, to be closed by the caller; unchanged unless it is open.
+    /// @return 0, REFUSED, EISDIR for what is there and is no file, or another value of errno.
+    int open(const std::string& path, int& descriptor);
+
+    /// @return the names in a folder, sorted; none if it is elsewhere or is not there.
+    std::vector<std::string> list(const std::string& folder) const;
+
+    /// Whether a path leads to a file that was opened here, by whatever name.
+    bool wasOpened(const std::string& path) const;
+
+    /// Canonical paths of the files that were opened.
+    const std::set<std::filesystem::path>& getOpened() const { return m_opened; }
+
+private:
+    bool isAllowed(const std::filesystem::path& canonical) const;
+
+    std::filesystem::path m_model;                ///< canonical, as the next two
+    std::vector<std::filesystem::path> m_folders; ///< whose contents are allowed
+    std::set<std::filesystem::path> m_opened;
+    std::set<std::pair<dev_t, ino_t>> m_identities; ///< of the files that were opened
+};
+
+} // namespace convert
