@@ -26,30 +26,48 @@ struct Step
 
 } // namespace
 
-// Fault caught: a wrong constant in the tables, or two entries swapped.
-TEST(RenderState, tablesHoldTheGlValuesOfTheirWords)
+// Fault caught: a wrong constant in the tables, or two entries swapped. GL is asked what it has.
+TEST_F(RenderContextTest, everyValueReachesGlAsTheOneOfItsName)
 {
-    const auto valuesOf = [](const auto& table)
+    RenderContext context;
+    const auto expectEach =
+        [](const std::vector<int>& expected, GLenum state, const std::function<void(int)>& set)
     {
-        std::vector<unsigned> values;
-        for (const RenderStateWord& word : table)
-            values.push_back(word.glValue);
-        return values;
+        for (size_t i = 0; i < expected.size(); ++i)
+        {
+            set(int(i));
+            GLint value = -1;
+            glGetIntegerv(state, &value);
+            EXPECT_EQ(expected[i], value) << i;
+        }
     };
-    using Values = std::vector<unsigned>;
-    EXPECT_EQ((Values{GL_CONSTANT_ALPHA, GL_CONSTANT_COLOR, GL_DST_ALPHA, GL_DST_COLOR, GL_ONE,
-                      GL_ONE_MINUS_CONSTANT_ALPHA, GL_ONE_MINUS_CONSTANT_COLOR, GL_ONE_MINUS_DST_ALPHA,
-                      GL_ONE_MINUS_DST_COLOR, GL_ONE_MINUS_SRC_ALPHA, GL_ONE_MINUS_SRC_COLOR, GL_SRC_ALPHA,
-                      GL_SRC_ALPHA_SATURATE, GL_SRC_COLOR, GL_ZERO}),
-              valuesOf(BLEND_FACTORS));
-    EXPECT_EQ((Values{GL_FUNC_ADD, GL_FUNC_REVERSE_SUBTRACT, GL_FUNC_SUBTRACT}), valuesOf(BLEND_FUNCTIONS));
-    EXPECT_EQ((Values{GL_BACK, GL_FRONT, GL_FRONT_AND_BACK, GL_NONE}), valuesOf(CULLING_MODES));
-    EXPECT_EQ((Values{GL_CCW, GL_CW}), valuesOf(WINDING_ORDERS));
-    EXPECT_EQ((Values{GL_NEVER, GL_LESS, GL_EQUAL, GL_LEQUAL, GL_GREATER, GL_NOTEQUAL, GL_GEQUAL, GL_ALWAYS}),
-              valuesOf(COMPARISONS));
-    EXPECT_EQ((Values{GL_ZERO, GL_KEEP, GL_REPLACE, GL_INCR, GL_DECR, GL_INVERT, GL_INCR_WRAP, GL_DECR_WRAP}),
-              valuesOf(STENCIL_OPERATIONS));
-    EXPECT_EQ((Values{GL_BACK, GL_FRONT}), valuesOf(STENCIL_FACES));
+    expectEach({GL_CONSTANT_ALPHA, GL_CONSTANT_COLOR, GL_DST_ALPHA, GL_DST_COLOR, GL_ONE,
+                GL_ONE_MINUS_CONSTANT_ALPHA, GL_ONE_MINUS_CONSTANT_COLOR, GL_ONE_MINUS_DST_ALPHA,
+                GL_ONE_MINUS_DST_COLOR, GL_ONE_MINUS_SRC_ALPHA, GL_ONE_MINUS_SRC_COLOR, GL_SRC_ALPHA,
+                GL_SRC_ALPHA_SATURATE, GL_SRC_COLOR, GL_ZERO},
+               GL_BLEND_SRC_RGB,
+               [&](int i)
+               {
+                   const auto factor = BlendFactor(i);
+                   context.setBlendFactors(factor, BlendFactor::ONE, BlendFactor::ZERO, BlendFactor::ZERO);
+               });
+    expectEach({GL_FUNC_ADD, GL_FUNC_REVERSE_SUBTRACT, GL_FUNC_SUBTRACT}, GL_BLEND_EQUATION_RGB,
+               [&](int i) { context.setBlendFunctions(BlendFunction(i), BlendFunction::ADD); });
+    expectEach({GL_BACK, GL_FRONT, GL_FRONT_AND_BACK}, GL_CULL_FACE_MODE,
+               [&](int i) { context.setCullingMode(CullingMode(i)); });
+    expectEach({GL_CCW, GL_CW}, GL_FRONT_FACE, [&](int i) { context.setWindingOrder(WindingOrder(i)); });
+    const std::vector<int> comparisons = {GL_NEVER,   GL_LESS,     GL_EQUAL,  GL_LEQUAL,
+                                          GL_GREATER, GL_NOTEQUAL, GL_GEQUAL, GL_ALWAYS};
+    expectEach(comparisons, GL_DEPTH_FUNC, [&](int i) { context.setDepthTestFunction(DepthFunction(i)); });
+    expectEach(comparisons, GL_STENCIL_BACK_FUNC,
+               [&](int i) { context.setStencilFunction(StencilFace::BACK, StencilFunction(i), 0, 1); });
+    expectEach({GL_ZERO, GL_KEEP, GL_REPLACE, GL_INCR, GL_DECR, GL_INVERT, GL_INCR_WRAP, GL_DECR_WRAP},
+               GL_STENCIL_FAIL,
+               [&](int i)
+               {
+                   context.setStencilOperations(StencilFace::FRONT, StencilOperation(i),
+                                                StencilOperation::KEEP, StencilOperation::KEEP);
+               });
 }
 
 // Faults caught: a default that is not GL's (the first setting is swallowed), repeated or swapped arguments.

@@ -3,7 +3,6 @@
 #include "orv/export.h"
 #include "orv/sharedptr.h"
 
-#include <array>
 #include <cstdint>
 #include <memory>
 
@@ -29,7 +28,7 @@ public:
     ORV_CLASS_NAME("IndexBuffer")
     using Ptr = SharedPtr<IndexBuffer>;
 
-    /// The order is the engine's own; see PRIMITIVES for GL's.
+    /// The order is the engine's own, not GL's.
     enum class Primitive : int32_t
     {
         POINTS = 0,
@@ -40,21 +39,6 @@ public:
         TRIANGLE_FAN = 5,
         TRIANGLES = 6
     };
-
-    struct PrimitiveInfo
-    {
-        const char* name;
-        unsigned int glMode;
-    };
-
-    /// By Primitive.
-    static constexpr std::array<PrimitiveInfo, 7> PRIMITIVES = {{{"POINTS", 0x0000},
-                                                                 {"LINE_STRIP", 0x0003},
-                                                                 {"LINE_LOOP", 0x0002},
-                                                                 {"LINES", 0x0001},
-                                                                 {"TRIANGLE_STRIP", 0x0005},
-                                                                 {"TRIANGLE_FAN", 0x0006},
-                                                                 {"TRIANGLES", 0x0004}}};
 
     /// Buffers normally come from IndexBufferCache::create(), whose resource cache must know the resource.
     /// @param count     indices, or vertices where there are none; a negative one counts as 0.

@@ -3,6 +3,7 @@
 #include "orv/detail/bindingepoch.h"
 #include "orv/detail/contextproperties.h"
 #include "orv/detail/programhandle.h"
+#include "orv/detail/texturetarget.h"
 #include "orv/export.h"
 #include "orv/renderstate.h"
 #include "orv/shared.h"
@@ -236,9 +237,9 @@ private:
             return -1;
         switch (target)
         {
-        case 0x0DE1: return unit * TEXTURE_TARGETS;     // GL_TEXTURE_2D
-        case 0x8513: return unit * TEXTURE_TARGETS + 1; // GL_TEXTURE_CUBE_MAP
-        case 0x8D65: return unit * TEXTURE_TARGETS + 2; // GL_TEXTURE_EXTERNAL_OES
+        case detail::TEXTURE_TARGET_2D: return unit * TEXTURE_TARGETS;
+        case detail::TEXTURE_TARGET_CUBE_MAP: return unit * TEXTURE_TARGETS + 1;
+        case detail::TEXTURE_TARGET_EXTERNAL: return unit * TEXTURE_TARGETS + 2;
         default: return -1;
         }
     }

@@ -10,13 +10,11 @@
 namespace orv
 {
 
-/// One value of a render-state enum: how it is written in appearance files and what the GL calls it. Tables
-/// of these are indexed by the enum's value.
+/// How one value of a render-state enum is written in appearance files. Tables of these are indexed by the enum's value.
 struct RenderStateWord
 {
     const char* keyword;
-    const char* alternative; ///< second accepted spelling; null where there is none
-    unsigned glValue;
+    const char* alternative = nullptr; ///< second accepted spelling; null where there is none
 };
 
 /// The position of a keyword (either spelling, case-sensitive) in one of the tables below, which is the
@@ -57,21 +55,21 @@ enum class BlendFactor : int32_t
 };
 
 inline constexpr RenderStateWord BLEND_FACTORS[] = {
-    {"CONSTANT_ALPHA", nullptr, 0x8003},
-    {"CONSTANT_COLOUR", nullptr, 0x8001},
-    {"DST_ALPHA", nullptr, 0x0304},
-    {"DST_COLOUR", nullptr, 0x0306},
-    {"ONE", nullptr, 1},
-    {"ONE_MINUS_CONSTANT_ALPHA", nullptr, 0x8004},
-    {"ONE_MINUS_CONSTANT_COLOUR", nullptr, 0x8002},
-    {"ONE_MINUS_DST_ALPHA", nullptr, 0x0305},
-    {"ONE_MINUS_DST_COLOUR", nullptr, 0x0307},
-    {"ONE_MINUS_SRC_ALPHA", nullptr, 0x0303},
-    {"ONE_MINUS_SRC_COLOUR", nullptr, 0x0301},
-    {"SRC_ALPHA", nullptr, 0x0302},
-    {"SRC_ALPHA_SATURATE", nullptr, 0x0308},
-    {"SRC_COLOUR", nullptr, 0x0300},
-    {"ZERO", nullptr, 0},
+    {"CONSTANT_ALPHA"},
+    {"CONSTANT_COLOUR"},
+    {"DST_ALPHA"},
+    {"DST_COLOUR"},
+    {"ONE"},
+    {"ONE_MINUS_CONSTANT_ALPHA"},
+    {"ONE_MINUS_CONSTANT_COLOUR"},
+    {"ONE_MINUS_DST_ALPHA"},
+    {"ONE_MINUS_DST_COLOUR"},
+    {"ONE_MINUS_SRC_ALPHA"},
+    {"ONE_MINUS_SRC_COLOUR"},
+    {"SRC_ALPHA"},
+    {"SRC_ALPHA_SATURATE"},
+    {"SRC_COLOUR"},
+    {"ZERO"},
 };
 
 enum class BlendFunction : int32_t
@@ -82,9 +80,9 @@ enum class BlendFunction : int32_t
 };
 
 inline constexpr RenderStateWord BLEND_FUNCTIONS[] = {
-    {"ADD", nullptr, 0x8006},
-    {"REVERSE_SUBTRACT", nullptr, 0x800B},
-    {"SUBTRACT", nullptr, 0x800A},
+    {"ADD"},
+    {"REVERSE_SUBTRACT"},
+    {"SUBTRACT"},
 };
 
 enum class CullingMode : int32_t
@@ -95,12 +93,11 @@ enum class CullingMode : int32_t
     CULL_NONE = 3
 };
 
-/// CULL_NONE has no face: culling is switched off instead.
 inline constexpr RenderStateWord CULLING_MODES[] = {
-    {"BACK", "CULL_BACK", 0x0405},
-    {"FRONT", "CULL_FRONT", 0x0404},
-    {"FRONT_AND_BACK", "CULL_FRONT_AND_BACK", 0x0408},
-    {"NONE", "CULL_NONE", 0},
+    {"BACK", "CULL_BACK"},
+    {"FRONT", "CULL_FRONT"},
+    {"FRONT_AND_BACK", "CULL_FRONT_AND_BACK"},
+    {"NONE", "CULL_NONE"},
 };
 
 enum class WindingOrder : int32_t
@@ -110,8 +107,8 @@ enum class WindingOrder : int32_t
 };
 
 inline constexpr RenderStateWord WINDING_ORDERS[] = {
-    {"CCW", "WINDING_CCW", 0x0901},
-    {"CW", "WINDING_CW", 0x0900},
+    {"CCW", "WINDING_CCW"},
+    {"CW", "WINDING_CW"},
 };
 
 enum class DepthFunction : int32_t
@@ -141,9 +138,7 @@ enum class StencilFunction : int32_t
 
 /// Of DepthFunction and StencilFunction alike.
 inline constexpr RenderStateWord COMPARISONS[] = {
-    {"NEVER", nullptr, 0x0200},  {"LESS", nullptr, 0x0201},    {"EQUAL", nullptr, 0x0202},
-    {"LEQUAL", nullptr, 0x0203}, {"GREATER", nullptr, 0x0204}, {"NOTEQUAL", nullptr, 0x0205},
-    {"GEQUAL", nullptr, 0x0206}, {"ALWAYS", nullptr, 0x0207},
+    {"NEVER"}, {"LESS"}, {"EQUAL"}, {"LEQUAL"}, {"GREATER"}, {"NOTEQUAL"}, {"GEQUAL"}, {"ALWAYS"},
 };
 
 enum class StencilOperation : int32_t
@@ -159,9 +154,7 @@ enum class StencilOperation : int32_t
 };
 
 inline constexpr RenderStateWord STENCIL_OPERATIONS[] = {
-    {"ZERO", nullptr, 0},           {"KEEP", nullptr, 0x1E00},      {"REPLACE", nullptr, 0x1E01},
-    {"INCR", nullptr, 0x1E02},      {"DECR", nullptr, 0x1E03},      {"INVERT", nullptr, 0x150A},
-    {"INCR_WRAP", nullptr, 0x8507}, {"DECR_WRAP", nullptr, 0x8508},
+    {"ZERO"}, {"KEEP"}, {"REPLACE"}, {"INCR"}, {"DECR"}, {"INVERT"}, {"INCR_WRAP"}, {"DECR_WRAP"},
 };
 
 /// Each face has two names for one value. The back comes first.
@@ -176,8 +169,8 @@ enum class StencilFace : int32_t
 inline constexpr int STENCIL_FACE_COUNT = 2;
 
 inline constexpr RenderStateWord STENCIL_FACES[STENCIL_FACE_COUNT] = {
-    {"BACK", nullptr, 0x0405},
-    {"FRONT", nullptr, 0x0404},
+    {"BACK"},
+    {"FRONT"},
 };
 
 /// The fixed-function state that goes with one material; the defaults are those of a new Appearance.

@@ -78,12 +78,6 @@ struct TextureParameters
 namespace detail
 {
 
-// Engine to GL values, indexed by the enums above.
-inline constexpr unsigned GL_TEXTURE_FORMATS[] = {0x1908, 0x1907, 0x190A, 0x1909, 0x1906, 0x1902};
-inline constexpr unsigned GL_TEXTURE_TYPES[] = {0x1401, 0x1403, 0x8033, 0x8034, 0x8363};
-inline constexpr int GL_FILTER_MODES[] = {0x2600, 0x2601, 0x2700, 0x2702, 0x2701, 0x2703};
-inline constexpr int GL_WRAP_MODES[] = {0x2901, 0x812F, 0x8370};
-
 /// GL_INVALID_ENUM for a value outside the enum.
 unsigned getGlTextureFormat(Texture::Format format);
 unsigned getGlTextureType(Texture::Type type);

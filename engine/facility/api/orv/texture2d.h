@@ -1,6 +1,7 @@
 #pragma once
 
 #include "orv/detail/resource.h"
+#include "orv/detail/texturetarget.h"
 #include "orv/export.h"
 #include "orv/shared.h"
 #include "orv/sharedptr.h"
@@ -55,7 +56,10 @@ public:
     /// The GL name, 0 when there is none.
     unsigned getId() const { return m_resource ? m_resource->getId() : 0; }
     /// GL_TEXTURE_EXTERNAL_OES or GL_TEXTURE_2D.
-    unsigned getTarget() const { return m_external ? 0x8D65u : 0x0DE1u; }
+    unsigned getTarget() const
+    {
+        return m_external ? detail::TEXTURE_TARGET_EXTERNAL : detail::TEXTURE_TARGET_2D;
+    }
     unsigned getWidth() const { return m_width; }   ///< pixels
     unsigned getHeight() const { return m_height; } ///< pixels
     bool hasMipmaps() const { return m_hasMipmaps; }

@@ -1,6 +1,7 @@
 #pragma once
 
 #include "orv/detail/resource.h"
+#include "orv/detail/texturetarget.h"
 #include "orv/export.h"
 #include "orv/shared.h"
 #include "orv/sharedptr.h"
@@ -12,7 +13,8 @@ namespace orv
 /// A cube map, made by TextureCubeCache and filled face by face.
 ///
 /// Starts with LINEAR magnification, LINEAR_MIPMAP_NEAREST minification and clamped wraps; the sixth face
-/// makes the mipmaps and sends these. After faces were replaced, setParameters() makes the mipmaps again. After its resource was released it binds name 0 and takes no faces.
+/// makes the mipmaps and sends these. After faces were replaced, setParameters() makes the mipmaps again. After its
+/// resource was released it binds name 0 and takes no faces.
 /// GL thread only. setFace(), setParameters() and enable() leave the cube bound on the active unit.
 class ORV_API TextureCube : public Shared
 {
@@ -54,7 +56,7 @@ public:
     void setParameters(const TextureParameters& parameters);
 
     unsigned getId() const { return m_resource ? m_resource->getId() : 0; }
-    unsigned getTarget() const { return 0x8513u; }  ///< GL_TEXTURE_CUBE_MAP
+    unsigned getTarget() const { return detail::TEXTURE_TARGET_CUBE_MAP; }
     unsigned getWidth() const { return m_width; }   ///< pixels of a face
     unsigned getHeight() const { return m_height; } ///< pixels of a face
 
@@ -72,10 +74,6 @@ private:
 
 namespace detail
 {
-
-/// Indexed by TextureCube::Face.
-inline constexpr unsigned GL_CUBE_FACES[TextureCube::FACE_COUNT] = {0x8515, 0x8516, 0x8517,
-                                                                    0x8518, 0x8519, 0x851A};
 
 /// Whether faces of this size are square; logs if they are not.
 bool requireSquareFaces(unsigned width, unsigned height);

@@ -9,6 +9,7 @@
 #include <GLES2/gl2.h>
 
 #include <algorithm>
+#include <iterator>
 #include <new>
 
 namespace orv
@@ -17,11 +18,15 @@ namespace orv
 namespace
 {
 
+/// By IndexBuffer::Primitive.
+constexpr GLenum GL_MODES[] = {GL_POINTS,         GL_LINE_STRIP,   GL_LINE_LOOP, GL_LINES,
+                               GL_TRIANGLE_STRIP, GL_TRIANGLE_FAN, GL_TRIANGLES};
+
 GLenum glPrimitiveConvert(IndexBuffer::Primitive primitive)
 {
     constexpr bool ORV_FALSE = false;
-    if (uint32_t(primitive) < IndexBuffer::PRIMITIVES.size())
-        return IndexBuffer::PRIMITIVES[uint32_t(primitive)].glMode;
+    if (uint32_t(primitive) < std::size(GL_MODES))
+        return GL_MODES[uint32_t(primitive)];
     ORV_ASSERT(ORV_FALSE);
     return GL_POINTS;
 }

@@ -5,6 +5,7 @@
 #include "orv/renderdevice.h"
 
 #include <GLES2/gl2.h>
+#include <GLES2/gl2ext.h>
 
 #include <algorithm>
 #include <bit>
@@ -16,15 +17,51 @@ namespace orv
 namespace
 {
 
+static_assert(detail::TEXTURE_TARGET_2D == GL_TEXTURE_2D &&
+              detail::TEXTURE_TARGET_CUBE_MAP == GL_TEXTURE_CUBE_MAP &&
+              detail::TEXTURE_TARGET_EXTERNAL == GL_TEXTURE_EXTERNAL_OES);
+
+// GL's values in the order of the enums, each as long as the table of keywords.
+
+constexpr GLenum GL_BLEND_FACTORS[std::size(BLEND_FACTORS)] = {
+    GL_CONSTANT_ALPHA,
+    GL_CONSTANT_COLOR,
+    GL_DST_ALPHA,
+    GL_DST_COLOR,
+    GL_ONE,
+    GL_ONE_MINUS_CONSTANT_ALPHA,
+    GL_ONE_MINUS_CONSTANT_COLOR,
+    GL_ONE_MINUS_DST_ALPHA,
+    GL_ONE_MINUS_DST_COLOR,
+    GL_ONE_MINUS_SRC_ALPHA,
+    GL_ONE_MINUS_SRC_COLOR,
+    GL_SRC_ALPHA,
+    GL_SRC_ALPHA_SATURATE,
+    GL_SRC_COLOR,
+    GL_ZERO,
+};
+constexpr GLenum GL_BLEND_FUNCTIONS[std::size(BLEND_FUNCTIONS)] = {GL_FUNC_ADD, GL_FUNC_REVERSE_SUBTRACT,
+                                                                   GL_FUNC_SUBTRACT};
+/// CULL_NONE has no face: culling is switched off instead.
+constexpr GLenum GL_CULLED_FACES[std::size(CULLING_MODES)] = {GL_BACK, GL_FRONT, GL_FRONT_AND_BACK, GL_NONE};
+constexpr GLenum GL_WINDING_ORDERS[std::size(WINDING_ORDERS)] = {GL_CCW, GL_CW};
+constexpr GLenum GL_COMPARISONS[std::size(COMPARISONS)] = {
+    GL_NEVER, GL_LESS, GL_EQUAL, GL_LEQUAL, GL_GREATER, GL_NOTEQUAL, GL_GEQUAL, GL_ALWAYS,
+};
+constexpr GLenum GL_STENCIL_OPERATIONS[std::size(STENCIL_OPERATIONS)] = {
+    GL_ZERO, GL_KEEP, GL_REPLACE, GL_INCR, GL_DECR, GL_INVERT, GL_INCR_WRAP, GL_DECR_WRAP,
+};
+constexpr GLenum GL_STENCIL_FACES[std::size(STENCIL_FACES)] = {GL_BACK, GL_FRONT};
+
 /// @param what      the enum, for the message.
 /// @param function  the name that the message bears.
-/// @return the table's GL value, or GL_INVALID_ENUM, logged, for what lies outside of the enum.
+/// @return the table's value, or GL_INVALID_ENUM, logged, for what lies outside of the enum.
 template <class Enum, std::size_t N>
-unsigned toGL(const RenderStateWord (&table)[N], Enum value, const char* what, const char* function)
+GLenum toGL(const GLenum (&table)[N], Enum value, const char* what, const char* function)
 {
     const auto index = uint32_t(value);
     if (index < N)
-        return table[index].glValue;
+        return table[index];
     detail::logError(detail::sourcePathText<__FILE__>, function, __LINE__, "Invalid %s %d", what, int(value));
     return GL_INVALID_ENUM;
 }
@@ -503,42 +540,42 @@ void RenderContext::sendAttribArrays(uint32_t enabledMask)
 
 unsigned RenderContext::glBlendFactorConvert(BlendFactor factor)
 {
-    return toGL(BLEND_FACTORS, factor, "blend factor", __func__);
+    return toGL(GL_BLEND_FACTORS, factor, "blend factor", __func__);
 }
 
 unsigned RenderContext::glBlendFunctionConvert(BlendFunction function)
 {
-    return toGL(BLEND_FUNCTIONS, function, "blend function", __func__);
+    return toGL(GL_BLEND_FUNCTIONS, function, "blend function", __func__);
 }
 
 unsigned RenderContext::glCullingModeConvert(CullingMode mode)
 {
-    return toGL(CULLING_MODES, mode, "culling mode", __func__);
+    return toGL(GL_CULLED_FACES, mode, "culling mode", __func__);
 }
 
 unsigned RenderContext::glWindingOrderConvert(WindingOrder order)
 {
-    return toGL(WINDING_ORDERS, order, "winding order", __func__);
+    return toGL(GL_WINDING_ORDERS, order, "winding order", __func__);
 }
 
 unsigned RenderContext::glDepthFunctionConvert(DepthFunction function)
 {
-    return toGL(COMPARISONS, function, "depth function", __func__);
+    return toGL(GL_COMPARISONS, function, "depth function", __func__);
 }
 
 unsigned RenderContext::glStencilFaceConvert(StencilFace face)
 {
-    return toGL(STENCIL_FACES, face, "stencil face", __func__);
+    return toGL(GL_STENCIL_FACES, face, "stencil face", __func__);
 }
 
 unsigned RenderContext::glStencilFunctionConvert(StencilFunction function)
 {
-    return toGL(COMPARISONS, function, "stencil function", __func__);
+    return toGL(GL_COMPARISONS, function, "stencil function", __func__);
 }
 
 unsigned RenderContext::glStencilOperationConvert(StencilOperation operation)
 {
-    return toGL(STENCIL_OPERATIONS, operation, "stencil operation", __func__);
+    return toGL(GL_STENCIL_OPERATIONS, operation, "stencil operation", __func__);
 }
 
 void setStencilFunction(RenderContext& context, StencilFunction function, int reference, unsigned mask)

@@ -1,6 +1,6 @@
 #include "orv/texture.h"
 
-#include <GLES2/gl2.h>
+#include "gltexture.h"
 
 #include <cstddef>
 

@@ -1,5 +1,7 @@
 #include "orv/texture2d.h"
 
+#include "gltexture.h"
+
 #include "orv/detail/bindingepoch.h"
 #include "orv/log.h"
 #include "orv/renderdevice.h"

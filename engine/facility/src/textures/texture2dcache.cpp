@@ -1,5 +1,7 @@
 #include "orv/texture2dcache.h"
 
+#include "gltexture.h"
+
 #include "orv/detail/bindingepoch.h"
 #include "orv/extensions.h"
 #include "orv/log.h"

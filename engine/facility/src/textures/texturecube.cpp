@@ -1,10 +1,10 @@
 #include "orv/texturecube.h"
 
+#include "gltexture.h"
+
 #include "orv/detail/bindingepoch.h"
 #include "orv/log.h"
 #include "orv/renderdevice.h"
-
-#include <GLES2/gl2.h>
 
 namespace orv
 {
