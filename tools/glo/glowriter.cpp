@@ -1,6 +1,7 @@
 #include "glo/glowriter.h"
 
 #include "orv/detail/glofields.h"
+#include "orv/detail/littleendian.h"
 
 #include <cstring>
 
@@ -12,7 +13,8 @@ namespace
 
 void appendWord(std::vector<uint8_t>& bytes, uint32_t word)
 {
-    const uint8_t parts[] = {uint8_t(word), uint8_t(word >> 8), uint8_t(word >> 16), uint8_t(word >> 24)};
+    uint8_t parts[4];
+    orv::detail::writeLittleEndian(parts, word);
     bytes.insert(bytes.end(), parts, parts + 4);
 }
 

@@ -1,6 +1,7 @@
 #include "gloscan.h"
 
 #include "orv/detail/glofields.h"
+#include "orv/detail/littleendian.h"
 
 #include <algorithm>
 #include <cstring>
@@ -83,8 +84,7 @@ public:
 private:
     uint32_t next()
     {
-        const uint32_t word = uint32_t(m_bytes[0]) | uint32_t(m_bytes[1]) << 8 | uint32_t(m_bytes[2]) << 16 |
-                              uint32_t(m_bytes[3]) << 24;
+        const uint32_t word = orv::detail::readLittleEndian(m_bytes);
         m_bytes += 4;
         return word;
     }
@@ -343,11 +343,7 @@ public:
     }
 
 private:
-    uint32_t peekWord() const
-    {
-        return uint32_t(m_bytes[m_position]) | uint32_t(m_bytes[m_position + 1]) << 8 |
-               uint32_t(m_bytes[m_position + 2]) << 16 | uint32_t(m_bytes[m_position + 3]) << 24;
-    }
+    uint32_t peekWord() const { return orv::detail::readLittleEndian(&m_bytes[m_position]); }
 
     void report(Kind kind, uint64_t offset, const std::string& sentence)
     {

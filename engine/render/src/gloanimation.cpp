@@ -4,6 +4,7 @@
 #include "orv/animationgroup.h"
 #include "orv/animationkeysequence.h"
 #include "orv/detail/glolog.h"
+#include "orv/detail/littleendian.h"
 #include "orv/light.h"
 #include "orv/sceneanimators.h"
 
@@ -49,8 +50,7 @@ struct KeyValue<Colour4f>
 
 float readFloat(const uint8_t* bytes)
 {
-    const uint32_t word =
-        uint32_t(bytes[0]) | uint32_t(bytes[1]) << 8 | uint32_t(bytes[2]) << 16 | uint32_t(bytes[3]) << 24;
+    const uint32_t word = readLittleEndian(bytes);
     float value;
     std::memcpy(&value, &word, sizeof(value));
     return value;

@@ -1,6 +1,7 @@
 #include "orv/detail/gloreader.h"
 
 #include "orv/detail/glolog.h"
+#include "orv/detail/littleendian.h"
 
 #include <algorithm>
 #include <bit>
@@ -16,11 +17,6 @@ using namespace glo;
 namespace
 {
 
-uint32_t readWord(const unsigned char* bytes)
-{
-    return uint32_t(bytes[0]) | uint32_t(bytes[1]) << 8 | uint32_t(bytes[2]) << 16 | uint32_t(bytes[3]) << 24;
-}
-
 /// Takes the fields of a block that has been read in one piece.
 class BlockReader
 {
@@ -29,7 +25,7 @@ public:
 
     void u32(uint32_t& value)
     {
-        value = readWord(m_bytes);
+        value = readLittleEndian(m_bytes);
         m_bytes += 4;
     }
 
@@ -112,13 +108,13 @@ bool GloReader::readChunk(const uint32_t ids[], bool skipUnknown)
             ORV_GLO_ERROR("Failed to read chunk ID");
         return skipUnknown && isEnd;
     }
-    const uint32_t id = readWord(word);
+    const uint32_t id = readLittleEndian(word);
     if (!readExactly(word, sizeof(word)))
     {
         ORV_GLO_ERROR("Failed to read %s chunk size", ChunkName(id).text);
         return false;
     }
-    const uint32_t size = readWord(word);
+    const uint32_t size = readLittleEndian(word);
 
     const uint32_t* known = ids;
     while (*known != 0 && *known != id)
@@ -222,7 +218,7 @@ bool GloReader::u32(const char* label, uint32_t& value)
     unsigned char word[4];
     if (!readField(label, word, sizeof(word)))
         return false;
-    value = readWord(word);
+    value = readLittleEndian(word);
     return true;
 }
 

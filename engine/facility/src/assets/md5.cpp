@@ -1,5 +1,7 @@
 #include "md5.h"
 
+#include "orv/detail/littleendian.h"
+
 #include <algorithm>
 
 namespace orv::detail
@@ -28,11 +30,6 @@ uint32_t rotateLeft(uint32_t value, int count)
     return (value << count) | (value >> (32 - count));
 }
 
-uint32_t readWord(const unsigned char* bytes)
-{
-    return uint32_t(bytes[0]) | uint32_t(bytes[1]) << 8 | uint32_t(bytes[2]) << 16 | uint32_t(bytes[3]) << 24;
-}
-
 void writeWords(const uint32_t* words, int count, unsigned char* bytes)
 {
     for (int i = 0; i < count * 4; ++i)
@@ -58,7 +55,7 @@ void takeBlock(std::array<uint32_t, 4>& words, const unsigned char* block)
     {
         int wordIndex = 0;
         const uint32_t mixed = mix(step, b, c, d, wordIndex);
-        const uint32_t sum = a + mixed + STEP_CONSTANTS[step] + readWord(block + wordIndex * 4);
+        const uint32_t sum = a + mixed + STEP_CONSTANTS[step] + readLittleEndian(block + wordIndex * 4);
         a = d;
         d = c;
         c = b;

@@ -4,6 +4,7 @@
 
 #include "attribformat.h"
 
+#include "orv/detail/littleendian.h"
 #include "orv/detail/resource.h"
 #include "orv/log.h"
 #include "orv/stream.h"
@@ -21,23 +22,14 @@ namespace
 
 using detail::AttribRecord;
 using detail::fits;
+using detail::readLittleEndian;
 using detail::STORED;
+using detail::writeLittleEndian;
 
 /// The raw form's header and records are sequences of little-endian 32-bit numbers, but for the names.
 const int HEADER_SIZE = 12;
 const int RECORD_SIZE = 56;
 const int NAME_SIZE = 16;
-
-void putNumber(unsigned char* out, uint32_t value)
-{
-    for (int i = 0; i < 4; ++i)
-        out[i] = static_cast<unsigned char>(value >> (8 * i));
-}
-
-uint32_t getNumber(const unsigned char* in)
-{
-    return uint32_t(in[0]) | uint32_t(in[1]) << 8 | uint32_t(in[2]) << 16 | uint32_t(in[3]) << 24;
-}
 
 /// Bytes 0 to 23 are the name: a zero-terminated text of at most 15 characters, its end position and its start
 /// position (always 0). 28 to 31 and 52 to 55 held pointers once and are 0.
@@ -45,13 +37,13 @@ void writeRecord(const AttribRecord& record, unsigned char* out)
 {
     std::memset(out, 0, RECORD_SIZE);
     std::memcpy(out, record.name.data(), record.name.size());
-    putNumber(out + 16, uint32_t(record.name.size()));
-    putNumber(out + 24, record.glType);
+    writeLittleEndian(out + 16, uint32_t(record.name.size()));
+    writeLittleEndian(out + 24, record.glType);
     out[32] = record.normalised ? 1 : 0;
-    putNumber(out + 36, uint32_t(record.offset));
-    putNumber(out + 40, uint32_t(record.componentCount));
-    putNumber(out + 44, uint32_t(record.stride));
-    putNumber(out + 48, record.usage);
+    writeLittleEndian(out + 36, uint32_t(record.offset));
+    writeLittleEndian(out + 40, uint32_t(record.componentCount));
+    writeLittleEndian(out + 44, uint32_t(record.stride));
+    writeLittleEndian(out + 48, record.usage);
 }
 
 /// @return false if it cannot be an attribute of size bytes of data.
@@ -60,12 +52,12 @@ bool readRecord(const unsigned char* in, unsigned int size, AttribRecord& record
     if (!std::memchr(in, 0, NAME_SIZE))
         return false;
     record.name = reinterpret_cast<const char*>(in);
-    record.glType = getNumber(in + 24);
+    record.glType = readLittleEndian(in + 24);
     record.normalised = in[32] != 0;
-    record.offset = int(getNumber(in + 36));
-    record.componentCount = int(getNumber(in + 40));
-    record.stride = int(getNumber(in + 44));
-    record.usage = getNumber(in + 48);
+    record.offset = int(readLittleEndian(in + 36));
+    record.componentCount = int(readLittleEndian(in + 40));
+    record.stride = int(readLittleEndian(in + 44));
+    record.usage = readLittleEndian(in + 48);
     return record.usage != STORED || fits(record, size);
 }
 
@@ -112,9 +104,9 @@ bool VertexBuffer::save(const SharedPtr<Stream>& stream)
         return false;
 
     unsigned char header[HEADER_SIZE];
-    putNumber(header, size);
-    putNumber(header + 4, uint32_t(stride));
-    putNumber(header + 8, uint32_t(m_attribs.size()));
+    writeLittleEndian(header, size);
+    writeLittleEndian(header + 4, uint32_t(stride));
+    writeLittleEndian(header + 8, uint32_t(m_attribs.size()));
     bool isWritten = writeAll(*stream, header, HEADER_SIZE);
     for (const AttribRecord& record : m_attribs)
     {
@@ -138,8 +130,8 @@ bool VertexBuffer::load(const SharedPtr<Stream>& stream)
         ORV_LOG_ERROR("Can't read vertex buffer: no header");
         return false;
     }
-    const uint32_t size = getNumber(header);
-    const uint32_t count = getNumber(header + 8);
+    const uint32_t size = readLittleEndian(header);
+    const uint32_t count = readLittleEndian(header + 8);
     const int64_t rest = int64_t(stream->size()) - stream->tell();
     if (int64_t(size) + int64_t(count) * RECORD_SIZE > rest)
     {

@@ -3,6 +3,7 @@
 #include "shaderprogramfile.h"
 
 #include "orv/detail/digestmaker.h"
+#include "orv/detail/littleendian.h"
 #include "orv/detail/loadscope.h"
 #include "orv/filetostring.h"
 #include "orv/shaderprogramcache.h"
@@ -31,14 +32,14 @@ bool readWord(Stream& stream, uint32_t& word)
     unsigned char bytes[4];
     if (stream.read(bytes, sizeof(bytes)) != int32_t(sizeof(bytes)))
         return false;
-    word = uint32_t(bytes[0]) | uint32_t(bytes[1]) << 8 | uint32_t(bytes[2]) << 16 | uint32_t(bytes[3]) << 24;
+    word = detail::readLittleEndian(bytes);
     return true;
 }
 
 bool writeWord(Stream& stream, uint32_t word)
 {
-    const unsigned char bytes[4] = {(unsigned char)(word), (unsigned char)(word >> 8),
-                                    (unsigned char)(word >> 16), (unsigned char)(word >> 24)};
+    unsigned char bytes[4];
+    detail::writeLittleEndian(bytes, word);
     return stream.write(bytes, sizeof(bytes)) == int32_t(sizeof(bytes));
 }
 
