@@ -12,6 +12,7 @@ foreach(room common maths pss facility render)
     install(DIRECTORY engine/${room}/api/orv DESTINATION ${CMAKE_INSTALL_INCLUDEDIR} COMPONENT development
         FILES_MATCHING PATTERN "*.h"
         PATTERN "detail/digestmaker.h" EXCLUDE
+        PATTERN "detail/formattedtext.h" EXCLUDE
         PATTERN "detail/littleendian.h" EXCLUDE
         PATTERN "detail/loadscope.h" EXCLUDE
         PATTERN "detail/logbudget.h" EXCLUDE

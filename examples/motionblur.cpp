@@ -223,6 +223,7 @@ bool draw(const SharedPtr<AssetCachePool>& pool, const Arguments& arguments, con
 
 int main(int argc, char** argv)
 {
+    orv::setLogLevel(orv::LogLevel::WARNING);
     Arguments arguments;
     if (!parse(argc, argv, arguments))
     {

@@ -153,6 +153,7 @@ bool draw(const SharedPtr<AssetCachePool>& pool, const std::vector<std::string>&
 
 int main(int argc, char** argv)
 {
+    orv::setLogLevel(orv::LogLevel::WARNING);
     const char* out = "pvrsheet.png";
     std::vector<std::string> names;
     for (int i = 1; i < argc; ++i)

@@ -228,6 +228,7 @@ bool draw(const SharedPtr<AssetCachePool>& pool, const Arguments& arguments)
 
 int main(int argc, char** argv)
 {
+    orv::setLogLevel(orv::LogLevel::WARNING);
     Arguments arguments;
     if (!parse(argc, argv, arguments))
     {

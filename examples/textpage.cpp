@@ -136,6 +136,7 @@ bool draw(const SharedPtr<AssetCachePool>& pool, const std::string& file)
 
 int main(int argc, char** argv)
 {
+    orv::setLogLevel(orv::LogLevel::WARNING);
     std::string out = "textpage.png";
     std::string font = "/usr/share/fonts/truetype/dejavu/DejaVuSans.ttf"; // package fonts-dejavu-core
     for (int i = 1; i + 1 < argc; i += 2)

@@ -1,5 +1,7 @@
 #include "orv/log.h"
 
+#include "orv/detail/logbudget.h"
+#include "orv/logsink.h"
 #include "support/logcapture.h"
 
 #include <gtest/gtest.h>
@@ -51,4 +53,40 @@ TEST(Log, assertionsLogTheirConditionAndGoOn)
     EXPECT_EQ("ORV_ASSERT: value % 2 == 0", records[1].message);
     EXPECT_EQ("logtest", records[0].source) << "without directories and extension";
     EXPECT_EQ("assertTwoThings", records[0].function);
+}
+
+// Faults caught: a record that goes both ways or neither, one below the level that uses up a load's budget, text that is
+// cut or taken for a format.
+TEST(Log, goesWhereTheApplicationWants)
+{
+    using orv::LogLevel;
+    std::string received;
+    const orv::LogFunction receive = [](LogLevel level, const char* place, const char* text, void* user) {
+        static_cast<std::string*>(user)->append(std::to_string(int(level)) + "|" + place + "|" + text + "\n");
+    };
+
+    LogCapture log;
+    orv::setLogFunction(receive, &received);
+    pssLogDebug("a/b", "f", 1, "100%% of %s", "it %d");
+    const std::string text(1000, 'x');
+    pssLogError("c", "g", 2, "%s", text.c_str());
+    EXPECT_EQ("0|b; f; 1|100% of it %d\n3|c; g; 2|" + text + "\n", received);
+    EXPECT_EQ("", log.text());
+
+    received.clear();
+    orv::setLogLevel(LogLevel::WARNING);
+    {
+        const orv::detail::LogBudget budget("a file");
+        for (int i = 0; i < 200; ++i)
+            orv::detail::logInfo("c", "g", i, "info");
+        orv::detail::logWarn("c", "g", 1000, "warning");
+    }
+    EXPECT_EQ("2|c; g; 1000|warning\n", received);
+
+    orv::setLogLevel(LogLevel::NONE);
+    pssLogError("c", "g", 3, "silent");
+    orv::setLogLevel(LogLevel::DEBUGGING);
+    orv::setLogFunction(nullptr);
+    pssLogInfo("c", "g", 4, "back");
+    EXPECT_EQ("I/ORV: c; g; 4; back\n", log.text());
 }

@@ -1,6 +1,7 @@
 // orv-view: shows a scene, a material or a model in a window, or draws it into PNG pictures without one.
 
 #include "conversion.h"
+#include "loadlog.h"
 #include "options.h"
 #include "pictures.h"
 #include "viewer.h"
@@ -46,6 +47,7 @@ int main(int argumentCount, char** arguments)
     int exitCode = 0;
     if (!view::parseCommandLine(argumentCount, arguments, options, exitCode))
         return exitCode;
+    view::loadlog::start();
     std::string error;
     if (run(options, error))
         return EXIT_SUCCESS;

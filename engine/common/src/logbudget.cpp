@@ -1,12 +1,10 @@
 #include "orv/detail/logbudget.h"
 
+#include "orv/detail/formattedtext.h"
 #include "orv/log.h"
+#include "orv/logsink.h"
 
 #include <algorithm>
-#include <cstdarg>
-#include <cstdio>
-#include <memory>
-#include <new>
 
 namespace orv::detail
 {
@@ -16,22 +14,11 @@ namespace
 
 thread_local LogBudget* t_budget = nullptr;
 
-void writeRecord(LogEntryPoint entryPoint, const char* file, const char* function, int line,
+void writeRecord(LogLevel level, LogEntryPoint entryPoint, const char* file, const char* function, int line,
                  const char* format, va_list arguments)
 {
-    if (!LogBudget::mayWrite(entryPoint, file, function, line))
-        return;
-    va_list again;
-    va_copy(again, arguments);
-    char text[256];
-    const int size = std::vsnprintf(text, sizeof(text), format, arguments);
-    std::unique_ptr<char[]> whole;
-    if (size >= int(sizeof(text)))
-        whole.reset(new (std::nothrow) char[std::size_t(size) + 1]);
-    if (whole)
-        std::vsnprintf(whole.get(), std::size_t(size) + 1, format, again);
-    va_end(again);
-    entryPoint(file, function, line, "%s", whole ? whole.get() : text);
+    if (level >= getLogSink().lowest && LogBudget::mayWrite(entryPoint, file, function, line))
+        entryPoint(file, function, line, "%s", FormattedText(format, arguments).get());
 }
 
 } // namespace
@@ -86,17 +73,17 @@ bool LogBudget::take(const Kind& record)
     return isWritten;
 }
 
-#define ORV_LOG_FUNCTION(name, entryPoint)                                                                   \
+#define ORV_LOG_FUNCTION(name, level, entryPoint)                                                            \
     void name(const char* file, const char* function, int line, const char* format, ...)                     \
     {                                                                                                        \
         va_list arguments;                                                                                   \
         va_start(arguments, format);                                                                         \
-        writeRecord(entryPoint, file, function, line, format, arguments);                                    \
+        writeRecord(LogLevel::level, entryPoint, file, function, line, format, arguments);                   \
         va_end(arguments);                                                                                   \
     }
 
-ORV_LOG_FUNCTION(logError, pssLogError)
-ORV_LOG_FUNCTION(logWarn, pssLogWarn)
-ORV_LOG_FUNCTION(logInfo, pssLogInfo)
+ORV_LOG_FUNCTION(logError, ERROR, pssLogError)
+ORV_LOG_FUNCTION(logWarn, WARNING, pssLogWarn)
+ORV_LOG_FUNCTION(logInfo, INFO, pssLogInfo)
 
 } // namespace orv::detail

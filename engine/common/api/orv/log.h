@@ -14,7 +14,7 @@
 extern "C"
 {
 
-    /// The platform's log. Every call writes one record, unfiltered:
+    /// The platform's log. Every call writes one record (setLogFunction() and setLogLevel() change that):
     ///
     ///     file name without directories; function; line; formatted message
     ///

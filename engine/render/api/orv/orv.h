@@ -34,6 +34,7 @@
 #include "orv/light.h"
 #include "orv/loadlimits.h"
 #include "orv/log.h"
+#include "orv/logsink.h"
 #include "orv/maths.h"
 #include "orv/matrix.h"
 #include "orv/memfilesource.h"

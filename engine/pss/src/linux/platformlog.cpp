@@ -1,0 +1,17 @@
+#include "platformlog.h"
+
+#include <cstdio>
+#include <string>
+
+namespace orv::detail
+{
+
+/// By one call, so that records from several threads do not mix.
+void writeToPlatform(LogLevel level, const char* format, va_list arguments)
+{
+    static const char LETTERS[] = "DIWE";
+    const std::string record = LETTERS[int(level)] + ("/ORV: " + std::string(format)) + '\n';
+    std::vfprintf(stderr, record.c_str(), arguments);
+}
+
+} // namespace orv::detail
