@@ -2,7 +2,8 @@
 #
 #   cmake -DFOLDER=dir -DNAMESPACE=orv -DOUTPUT=file.cpp -P embedassets.cmake
 #
-# FOLDER     read flat; every file in it becomes the asset "NAMESPACE#file name", byte for byte
+# FOLDER     read flat; every file in it becomes the asset "NAMESPACE#file name", byte for byte, but for shaders, which
+#            keep the comment that opens them and leave other comments and indentation out; their lines stay
 # NAMESPACE  asset namespace; the archive is called NAMESPACE_ARCHIVE, in upper case
 # OUTPUT     replaced when the assets have changed
 cmake_minimum_required(VERSION 3.22)
@@ -25,6 +26,15 @@ set(count 0)
 set(line "................................................") # 24 bytes of two hex digits
 foreach(name IN LISTS names)
     file(READ ${FOLDER}/${name} hex HEX)
+    if(name MATCHES "\\.(vert|frag)$")
+        file(READ ${FOLDER}/${name} text)
+        string(FIND "${text}" "\n\n" end) # of the comment
+        string(SUBSTRING "${text}" 0 ${end} comment)
+        string(SUBSTRING "${text}" ${end} -1 text)
+        string(REGEX REPLACE " *//[^\n]*" "" text "${text}")
+        string(REGEX REPLACE "\n +" "\n" text "${text}")
+        string(HEX "${comment}${text}" hex)
+    endif()
     string(REGEX REPLACE "(${line})" "\\1\n" hex "${hex}")
     string(REGEX REPLACE "([0-9a-f][0-9a-f])" "0x\\1," bytes "${hex}")
     string(APPEND blocks "const unsigned char BYTES_${count}[] = { // ${name}\n${bytes}\n};\n\n")

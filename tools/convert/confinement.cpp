@@ -74,27 +74,29 @@ constexpr int HARMLESS[] = {
 /// What is harmless with certain arguments alone.
 int allowWithArguments(void* filter, int socket)
 {
-    const scmp_datum_t self = scmp_datum_t(getpid());
+    const uint64_t end = uint64_t(socket);
+    const uint64_t self = uint64_t(getpid());
     const struct
     {
         int call;
-        scmp_arg_cmp argument;
+        scmp_arg_cmp argument; // which one, how it is compared, with what; of a mask, the mask first
     } rules[] = {
-        {SCMP_SYS(sendto), SCMP_A0(SCMP_CMP_EQ, scmp_datum_t(socket))},
-        {SCMP_SYS(send), SCMP_A0(SCMP_CMP_EQ, scmp_datum_t(socket))},
-        {SCMP_SYS(recvmsg), SCMP_A0(SCMP_CMP_EQ, scmp_datum_t(socket))},
-        {SCMP_SYS(ioctl), SCMP_A1(SCMP_CMP_EQ, TCGETS)},  // whether it is a terminal
-        {SCMP_SYS(fcntl), SCMP_A1(SCMP_CMP_EQ, F_GETFL)}, // which fdopen looks at
-        {SCMP_SYS(fcntl64), SCMP_A1(SCMP_CMP_EQ, F_GETFL)},
-        {SCMP_SYS(newfstatat), SCMP_A3(SCMP_CMP_MASKED_EQ, AT_EMPTY_PATH, AT_EMPTY_PATH)}, // of what is open
-        {SCMP_SYS(fstatat64), SCMP_A3(SCMP_CMP_MASKED_EQ, AT_EMPTY_PATH, AT_EMPTY_PATH)},
-        {SCMP_SYS(statx), SCMP_A2(SCMP_CMP_MASKED_EQ, AT_EMPTY_PATH, AT_EMPTY_PATH)},
-        {SCMP_SYS(kill), SCMP_A0(SCMP_CMP_EQ, self)},
-        {SCMP_SYS(tgkill), SCMP_A0(SCMP_CMP_EQ, self)}, // of abort()
+        {SCMP_SYS(sendto), {0, SCMP_CMP_EQ, end, 0}},
+        {SCMP_SYS(send), {0, SCMP_CMP_EQ, end, 0}},
+        {SCMP_SYS(recvmsg), {0, SCMP_CMP_EQ, end, 0}},
+        {SCMP_SYS(ioctl), {1, SCMP_CMP_EQ, TCGETS, 0}},  // whether it is a terminal
+        {SCMP_SYS(fcntl), {1, SCMP_CMP_EQ, F_GETFL, 0}}, // which fdopen looks at
+        {SCMP_SYS(fcntl64), {1, SCMP_CMP_EQ, F_GETFL, 0}},
+        {SCMP_SYS(newfstatat), {3, SCMP_CMP_MASKED_EQ, AT_EMPTY_PATH, AT_EMPTY_PATH}}, // of what is open
+        {SCMP_SYS(fstatat64), {3, SCMP_CMP_MASKED_EQ, AT_EMPTY_PATH, AT_EMPTY_PATH}},
+        {SCMP_SYS(statx), {2, SCMP_CMP_MASKED_EQ, AT_EMPTY_PATH, AT_EMPTY_PATH}},
+        {SCMP_SYS(kill), {0, SCMP_CMP_EQ, self, 0}},
+        {SCMP_SYS(tgkill), {0, SCMP_CMP_EQ, self, 0}}, // of abort()
     };
     int result = 0;
     for (const auto& rule : rules)
-        result = result < 0 ? result : seccomp_rule_add(filter, SCMP_ACT_ALLOW, rule.call, 1, rule.argument);
+        result = result < 0 ? result
+                            : seccomp_rule_add_array(filter, SCMP_ACT_ALLOW, rule.call, 1, &rule.argument);
     return result;
 }
 
