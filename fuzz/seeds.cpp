@@ -285,6 +285,7 @@ glo::GloScene makeAnimatedScene()
     data.reflection.sampler->type = glo::sampler::TEXTURE_CUBE;
     data.gloss.emplace().image = "none.png";
     data.refraction.emplace().type = 9;
+    scene.surfaces.list = {{0, 0x1f, 0.25f}, {7, 1, 0.5f}};
     scene.geometries = {makeSquareGeometry("square")};
     scene.geometries[0].primitiveSets[0].indices.reset();
     scene.lights.emplace_back().name = "lamp";

@@ -96,6 +96,17 @@ Words everyProgram()
             requests.push_back(request);
         }
     }
+    // What a scene file's SURF chunk asks for goes with everything.
+    for (const char* base : {"orv#max_pvl", "orv#max_ppl"})
+    {
+        for (const char* usual : {"", "$DIFF", "$SPEC$AMBI", "$DIFF$SPEC$AMBI$REFL$EMIS$SKIN",
+                                  "$BUMP$INVY$DIFF$SPEC$AMBI$REFL$CUBE$EMIS"})
+        {
+            for (const char* more : {"$VCOL", "$CUTOFF", "$BACK", "$UNLIT", "$LINEAR",
+                                     "$VCOL$CUTOFF$BACK$LINEAR", "$VCOL$CUTOFF$BACK$UNLIT$LINEAR"})
+                requests.push_back(std::string(base) + usual + more);
+        }
+    }
     for (const char* name :
          {"base", "base$TRANSFORM$TEXTURE$COLOUR$VERTEX_COLOUR", "error", "fallback", "fog",
           "fog$TRANSFORM$TEXTURE$FOG", "gen_velocity", "gen_velocity$SKIN", "motionblur", "motionblur$STEREO",
@@ -338,11 +349,16 @@ TEST(ShaderAssets, fitTheSmallestDevice)
     EXPECT_EQ(6u, packedRows({{"", "vec3", "b", 5}, {"", "float", "c", 5}, {"", "float", "d"}}));
 
     support::TempDir folder;
-    for (const char* request : {"orv#max_pvl$INVSQROOT$DIFF$SPEC$AMBI$REFL$EMIS$SKIN",
-                                "orv#max_pvl$INVSQROOT$DIFF$SPEC$AMBI$REFL$CUBE$EMIS$SKIN",
-                                "orv#max_ppl$BUMP$INVY$INVSQROOT$DIFF$SPEC$AMBI$REFL$EMIS$SKIN",
-                                "orv#max_ppl$BUMP$INVY$INVSQROOT$DIFF$SPEC$AMBI$REFL$CUBE$EMIS$SKIN",
-                                "orv#fallback", "orv#gen_velocity$SKIN"})
+    for (const char* request :
+         {"orv#max_pvl$INVSQROOT$DIFF$SPEC$AMBI$REFL$EMIS$SKIN",
+          "orv#max_pvl$INVSQROOT$DIFF$SPEC$AMBI$REFL$CUBE$EMIS$SKIN",
+          "orv#max_ppl$BUMP$INVY$INVSQROOT$DIFF$SPEC$AMBI$REFL$EMIS$SKIN",
+          "orv#max_ppl$BUMP$INVY$INVSQROOT$DIFF$SPEC$AMBI$REFL$CUBE$EMIS$SKIN",
+          "orv#max_pvl$INVSQROOT$DIFF$SPEC$AMBI$REFL$CUBE$EMIS$VCOL$CUTOFF$BACK$LINEAR$SKIN",
+          "orv#max_pvl$INVSQROOT$DIFF$SPEC$AMBI$REFL$EMIS$VCOL$CUTOFF$BACK$LINEAR$SKIN",
+          "orv#max_ppl$BUMP$INVY$INVSQROOT$DIFF$SPEC$AMBI$REFL$EMIS$VCOL$CUTOFF$LINEAR$SKIN",
+          "orv#max_ppl$BUMP$INVSQROOT$DIFF$SPEC$AMBI$REFL$CUBE$EMIS$VCOL$CUTOFF$LINEAR$SKIN", "orv#fallback",
+          "orv#gen_velocity$SKIN"})
     {
         const auto sources = readSources(request);
         const std::string vertex = run(VALIDATOR + "-E " + folder.write("a.vert", sources[0]));
@@ -500,7 +516,7 @@ u_t_normalModel 1 0 0 0 1 0 0 0 1; u_t_cameraPosition 0 0 1 1; u_j_count 0; u_j_
 u_l_count 1; u_l_position 5* 0 0 1 0; u_l_diffuseColour 20* 1; u_l_ambientColour 20* 0; u_l_attenuationNear 5* 0;
 u_l_attenuationReciprocal 5* 0; u_l_spotInnerCos 5* -1; u_l_spotOuterCos 5* -1; u_l_spotDirection 15* 0;
 u_m_diffuseColour 1 1 1 1; u_m_specularColour 0 0 0 1; u_m_ambientColour 0 0 0 1; u_m_emissiveColour 0 0 0 1;
-u_m_uvOffsetScale 0 0 1 1; u_m_shininess 5; u_m_specularLevel 1; u_m_opacity 1; u_m_selfIllumination 0;
+u_m_uvOffsetScale 0 0 1 1; u_m_cutoff .5; u_m_shininess 5; u_m_specularLevel 1; u_m_opacity 1; u_m_selfIllumination 0;
 u_blurFactor 1; u_deltaTime 1; u_fogColour 0 1 0 1)";
 
 /// Drawings of a small square that faces the eye: the fault that it catches | programs that all have to give the same |
@@ -555,6 +571,32 @@ bumps on a mesh without tangents | orv#max_ppl$DIFF$BUMP
   | u_m_bumpTexture .9 .6 .8 1; a_tangent 1 1 1 1; a_binormal 1 1 1 1 | 255 255 255 255
 dark back of a sheet | orv#max_ppl$DIFF
   | u_t_modelViewProjection scale -1 1 1 0; u_l_position 0 0 -1 0 | 255 255 255 255
+colours of vertices without effect | BOTH$DIFF$VCOL | a_colour .5 1 0 .5 | 128 255 0 128
+ambient light without them | BOTH$AMBI$VCOL
+  | u_l_count 5; a_colour .5 1 0 1; u_l_ambientColour 20* .2; u_m_ambientColour 1 1 1 1 | 128 255 0 255
+hole that is drawn | BOTH$DIFF$CUTOFF | u_m_diffuseTexture 1 1 1 .4; u_m_cutoff .5 | 0 0 0 0
+rim of a hole that is not opaque | BOTH$DIFF$CUTOFF | u_m_diffuseTexture 1 1 1 .6; u_m_cutoff .5 | 255 255 255 255
+hole by the colours of vertices | BOTH$VCOL$CUTOFF | a_colour 1 1 1 .4; u_m_cutoff .5 | 0 0 0 0
+dark back of a sheet lit at its vertices | orv#max_pvl$DIFF$BACK
+  | u_t_modelViewProjection scale -1 1 1 0; u_l_position 0 0 -1 0 | 255 255 255 255
+back lit like the front | orv#max_pvl$DIFF$BACK | u_t_modelViewProjection scale -1 1 1 0 | 0 0 0 255
+front lit like the back | orv#max_pvl$DIFF$BACK | | 255 255 255 255
+highlights of the front on the back | orv#max_pvl$SPEC$BACK
+  | u_t_modelViewProjection scale -1 1 1 0; u_m_specularColour 1 1 1 1 | 0 0 0 255
+back without highlights | orv#max_pvl$SPEC$BACK | u_t_modelViewProjection scale -1 1 1 0; u_m_specularColour 1 1 1 1;
+  u_l_position 0 0 -1 0; u_t_cameraPosition 0 0 -1 1 | 255 255 255 255
+own colour that needs light | orv#max_pvl$DIFF$SPEC$UNLIT
+  | u_l_count 0; u_m_diffuseColour .5 1 0 1; u_m_specularColour 1 1 1 1 | 128 255 0 255
+own colour that light adds to | orv#max_pvl$DIFF$UNLIT | u_l_count 5; u_m_diffuseColour .5 1 0 1 | 128 255 0 255
+light in the screen's shares | BOTH$DIFF$LINEAR | u_l_diffuseColour 20* .5 | 186 186 186 255
+texture in other shares than the colour | BOTH$DIFF$LINEAR$VCOL
+  | u_m_diffuseTexture .5 1 1 1; u_m_diffuseColour 1 .5 1 1; a_colour 1 1 .5 1 | 128 128 128 255
+emission in other shares | BOTH$DIFF$EMIS$LINEAR
+  | u_m_diffuseTexture .5 .5 .5 1; u_m_emissiveColour .5 .5 .5 1 | 175 175 175 255
+ambient light in other shares | BOTH$AMBI$LINEAR | u_l_ambientColour .5 .5 .5 1; u_m_ambientColour .5 1 .5 1;
+  u_m_ambientTexture 1 1 .5 1 | 93 186 47 255
+highlights in other shares | BOTH$SPEC$LINEAR
+  | u_l_diffuseColour 20* .5; u_m_specularColour .5 1 1 1; u_m_specularTexture 1 .5 1 1 | 93 93 186 255
 nothing drawn without joints | BOTH$DIFF$SKIN | | 255 255 255 255
 model transform ignored without joints | BOTH$DIFF$SKIN | u_t_model scale 1 1 1 9 | 0 0 0 0
 model transform on top of the joints | BOTH$DIFF$SKIN
@@ -591,7 +633,7 @@ colour of text from its picture | luvane#textfadequad
 /// Program names, with what BOTH, LIT and PICTURES stand for.
 Words readPrograms(const std::string& text)
 {
-    std::istringstream words(std::regex_replace(std::regex_replace(text, std::regex("LIT"), LIT),
+    std::istringstream words(std::regex_replace(std::regex_replace(text, std::regex("\\bLIT\\b"), LIT),
                                                 std::regex("PICTURES"), PICTURES));
     Words programs;
     for (std::string word; words >> word;)

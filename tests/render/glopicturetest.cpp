@@ -106,6 +106,38 @@ TEST_F(GloPictureTest, upAxis)
     }
 }
 
+// Fault caught: holes that hide what lies behind them, whichever is drawn first; colours of vertices without effect.
+TEST_F(GloPictureTest, cutOutsShowWhatIsBehind)
+{
+    glo::GloScene scene;
+    scene.materials = {makeMaterial("leaf", Vector4f(1, 1, 1, 1)), makeGlow("wall", Vector4f(0, 0, 1, 1))};
+    scene.materials[0].techniques[0].selfIllumination = 1.0f;
+    scene.surfaces.list = {{0, glo::surface::VERTEX_COLOUR | glo::surface::CUTOFF, 0.5f}};
+    scene.geometries = {makeSquareGeometry("wall"), makeSquareGeometry("leaf")};
+    scene.geometries[1].vertices = glo::makeVertexSet(
+        {{"a_position", 3, {-0.5f, -0.5f, 0, 0.5f, -0.5f, 0, 0.5f, 0.5f, 0, -0.5f, 0.5f, 0}},
+         {"a_colour", 4, {255, 0, 0, 255, 255, 0, 0, 0, 255, 0, 0, 0, 255, 0, 0, 255}, glo::type::UINT8, 1}});
+    scene.scene = glo::SceneData{"scene", makeNode("top")};
+    for (const float depth : {1.0f, -1.0f})
+    {
+        glo::NodeData wall = makeSolidNode("wall", "wall", "wall");
+        glo::NodeData leaf = makeSolidNode("leaf", "leaf", "leaf");
+        moveTo(wall, Vector3f(depth, 0, -1));
+        moveTo(leaf, Vector3f(depth, 0, 0));
+        if (depth > 0) // once before the wall, once behind it in the file
+            scene.scene->top.children.insert(scene.scene->top.children.end(), {wall, leaf});
+        else
+            scene.scene->top.children.insert(scene.scene->top.children.end(), {leaf, wall});
+    }
+    ASSERT_TRUE(load(scene));
+    const Picture picture = draw();
+    for (const float x : {1.0f, -1.0f})
+    {
+        EXPECT_TRUE(at(picture, x - 0.3f, 0) == RED) << x << support::savePicture("cutout", picture);
+        EXPECT_TRUE(at(picture, x + 0.3f, 0) == BLUE) << x;
+    }
+}
+
 // Fault caught: a texture upside down, glass that hides what is behind it.
 TEST_F(GloPictureTest, textureAndOpacity)
 {

@@ -106,6 +106,25 @@ TEST_F(GloSceneTest, programs)
     }
 }
 
+// Fault caught: a feature that reaches another material, that needs its chunk in one place, or that makes a cut-out
+// blend; an entry for a material that is not there which is more than nothing.
+TEST_F(GloSceneTest, surfaces)
+{
+    glo::GloScene scene = makeSquareScene(makeMaterial("m", Vector4f(1, 1, 1, 1)));
+    scene.materials.push_back(makeMaterial("n", Vector4f(1, 1, 1, 1)));
+    scene.materials[0].techniques[0].opacity = 0.5f;
+    scene.materials[1].techniques[0].bump = image("orv#white.png");
+    scene.surfaces.list = {{0, 0x80000003, 0.25f}, {1, 0x1d, 0.5f}, {2, 31, 0.5f}, {~0u, 31, 0.5f}};
+    const Glo::Ptr loaded = load(scene);
+    ASSERT_TRUE(loaded);
+    const SharedPtr<Appearance> cut = loaded->getAppearance("m");
+    EXPECT_TRUE(hasProgram(cut, "orv#max_pvl.sp$DIFF$VCOL$CUTOFF"));
+    EXPECT_EQ(0.25f, getFloat(*cut, "M_CUTOFF"));
+    EXPECT_TRUE(cut->isOpaque());
+    EXPECT_TRUE(hasProgram(loaded->getAppearance("n"), "orv#max_ppl.sp$BUMP$DIFF$VCOL$BACK$UNLIT$LINEAR"));
+    EXPECT_FALSE(loaded->getAppearance("n")->getPropertyUniform("M_CUTOFF"));
+}
+
 // Fault caught: an opaque glass, a one-sided leaf, a missing picture that leaves a hole, sampler settings that turn
 // a texture black or reach the built-in ones.
 TEST_F(GloSceneTest, materials)

@@ -137,7 +137,8 @@ public:
     bool body(const GloScene& scene)
     {
         return chunk(scene.info) && list(scene.geometries) && list(scene.skins) && list(scene.lights) &&
-               list(scene.cameras) && list(scene.materials) && list(scene.animations) &&
+               list(scene.cameras) && list(scene.materials) &&
+               (scene.surfaces.list.empty() || chunk(scene.surfaces)) && list(scene.animations) &&
                (!scene.scene || (fitsVersion(scene.scene->top) && chunk(*scene.scene)));
     }
 

@@ -63,6 +63,7 @@ const std::vector<KindInfo> INFO = {
     {Kind::NO_MATERIAL, "no-material", WARNING, "a geometry is drawn with the default material"},
     {Kind::NO_TECHNIQUE, "no-technique", WARNING, "a material without a technique counts as missing"},
     {Kind::BLACK_TEXTURED, "black-textured", WARNING, "a texture is multiplied with black"},
+    {Kind::SURFACE, "surface", WARNING, "a further feature of a material has no effect"},
     {Kind::SAMPLER_TYPE, "sampler-type", WARNING, "a sampler is neither 2D nor cube"},
     {Kind::IMAGE_MISSING, "image-missing", WARNING, "a texture's file is not found beside the scene"},
     {Kind::IMAGE_UNREADABLE, "image-unreadable", WARNING, "a texture's file cannot be decoded"},

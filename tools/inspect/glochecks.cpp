@@ -118,6 +118,8 @@ private:
             default: break;
             }
         }
+        if (list.id == Surfaces::ID)
+            checkSurfaces(list);
         if (list.id == SceneData::ID && m_scene.scene)
             checkNode(list.find(NodeData::ID), m_scene.scene->top, true);
     }
@@ -279,6 +281,32 @@ private:
                            " will not be seen: its colour is black" +
                            (std::strcmp(slot.what, "specular") == 0 ? " or its level 0" : ""));
             checkImage(place, *slot.field);
+        }
+    }
+
+    void checkSurfaces(const Chunk& chunk)
+    {
+        uint32_t known = 0;
+        for (const surface::Feature& feature : surface::FEATURES)
+            known |= feature.bit;
+        for (const Surface& surface : m_scene.surfaces.list)
+        {
+            const std::string which = "the surface of material " + number(surface.material) + " ";
+            const bool hasMaterial = surface.material < m_scene.materials.size() &&
+                                     !m_scene.materials[surface.material].techniques.empty();
+            if (!hasMaterial)
+                report(Kind::SURFACE, chunk, which + "counts for nothing: there is no such material");
+            if (surface.features & ~known)
+                report(Kind::SURFACE, chunk,
+                       which + "has features that are not known here (" + number(surface.features & ~known) +
+                           ")");
+            if (surface.features & surface::CUTOFF && !(surface.cutoff > 0.0f && surface.cutoff <= 1.0f))
+                report(Kind::SURFACE, chunk,
+                       which + "is cut off nowhere or everywhere: its cutoff is not above 0 and at most 1");
+            if (hasMaterial && surface.features & surface::BACK &&
+                m_scene.materials[surface.material].techniques.back().doubleSided == 0)
+                report(Kind::SURFACE, chunk,
+                       which + "lights backs that are never drawn: it is not double sided");
         }
     }
 

@@ -1,6 +1,7 @@
 #include "gloscan.h"
 
 #include "orv/detail/glofields.h"
+#include "orv/detail/glomaterialrules.h"
 #include "orv/detail/littleendian.h"
 
 #include <algorithm>
@@ -294,6 +295,7 @@ public:
         if (m_position < m_end)
             report(Kind::TRAILING_BYTES, m_position, "bytes follow the last chunk");
         m_position = m_end;
+        applySurfaces(scene);
         return true;
     }
 
@@ -464,6 +466,7 @@ private:
         case LightDefinition::LIST_ID: return listFields(*this, scene.lights);
         case CameraDefinition::LIST_ID: return listFields(*this, scene.cameras);
         case Material::LIST_ID: return listFields(*this, scene.materials);
+        case Surfaces::ID: return fields(*this, scene.surfaces);
         case AnimationData::LIST_ID: return listFields(*this, scene.animations);
         default: break;
         }

@@ -142,6 +142,7 @@ bool GloBuilder::makeGeometries(bool measuresMeshes)
 
 bool GloBuilder::makeMaterials()
 {
+    applySurfaces(m_scene);
     for (const Material& material : m_scene.materials)
     {
         if (material.techniques.empty())

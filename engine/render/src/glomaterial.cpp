@@ -129,6 +129,8 @@ void GloMaterial::setValues(Appearance& appearance) const
     appearance.setProperty<float>("M_SPECULAR_LEVEL", m_data.specularLevel, 0);
     appearance.setProperty<float>("M_OPACITY", m_data.opacity, 0);
     appearance.setProperty<float>("M_SELF_ILLUMINATION", m_data.selfIllumination, 0);
+    if (m_data.features & surface::CUTOFF)
+        appearance.setProperty<float>("M_CUTOFF", m_data.cutoff, 0);
 
     setTexture(appearance, "M_DIFFUSE_TEXTURE", m_data.diffuse.sampler, true);
     setTexture(appearance, "M_SPECULAR_TEXTURE", m_data.specular.sampler, true);

@@ -35,7 +35,7 @@ constexpr const char* ZERO_VECTORS[] = {"M_BLUR_STEP", "M_DEPTH_RANGE", "M_FADE"
 
 constexpr MaterialDefault<float> FLOAT_DEFAULTS[] = {
     {"M_SHININESS", 5.0f},         {"M_SPECULAR_LEVEL", 1.0f},  {"M_OPACITY", 1.0f},
-    {"M_SELF_ILLUMINATION", 0.0f}, {"M_WEATHER_STRETCH", 1.0f},
+    {"M_SELF_ILLUMINATION", 0.0f}, {"M_WEATHER_STRETCH", 1.0f}, {"M_CUTOFF", 0.5f},
 };
 
 constexpr MaterialDefault<const char*> TEXTURES[] = {

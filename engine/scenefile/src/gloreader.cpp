@@ -65,6 +65,7 @@ GloReader::GloReader(const SharedPtr<Stream>& stream, const char* name) : m_stre
     addChunkReader<Material>();
     addChunkReader<StandardMaterial>();
     addChunkReader<Sampler>();
+    m_chunkReaders[Surfaces::ID] = &GloReader::readSurfaces;
     m_chunkReaders[Skin::LIST_ID] = &GloReader::readList<&GloScene::skins>;
     addChunkReader<Skin>();
     addChunkReader<Attachment>();
@@ -323,6 +324,11 @@ bool GloReader::readInfo()
 {
     m_tool = AuthoringTool::MAX;
     return fields(*this, m_scene.info);
+}
+
+bool GloReader::readSurfaces()
+{
+    return fields(*this, m_scene.surfaces);
 }
 
 bool GloReader::readScene()

@@ -32,6 +32,12 @@
 
 precision FINE float;
 
+#ifdef LINEAR
+#define SHARE(colour) pow(colour, vec3(2.2))
+#else
+#define SHARE(colour) (colour)
+#endif
+
 #ifdef TEXTURED
 varying FINE vec2 v_uv;
 #endif
@@ -63,6 +69,17 @@ uniform vec3 u_l_spotDirection[LIGHTS]; // points back, from the lit place towar
 #endif
 
 uniform float u_m_opacity;
+#ifdef CUTOFF
+uniform float u_m_cutoff;
+#endif
+#ifdef VCOL
+#define TINT * vec3(v_redGreen, v_blue)
+varying mediump vec2 v_redGreen;
+varying mediump float v_blue;
+varying mediump float v_opacity;
+#else
+#define TINT
+#endif
 
 #ifdef DIFF
 uniform sampler2D u_m_diffuseTexture;
@@ -170,7 +187,7 @@ void main()
 #endif
 
 #ifdef SPEC
-    vec3 gloss = u_m_specularColour.rgb * texture2D(u_m_specularTexture, v_uv).rgb *
+    vec3 gloss = SHARE(u_m_specularColour.rgb) * SHARE(texture2D(u_m_specularTexture, v_uv).rgb) *
                  (u_m_specularLevel * texture2D(u_m_specularLevelTexture, v_uv).r);
     float shininess = max(u_m_shininess * texture2D(u_m_glossTexture, v_uv).r, 0.0);
 #endif
@@ -210,12 +227,16 @@ void main()
 
 #ifdef DIFF
     vec4 base = texture2D(u_m_diffuseTexture, v_uv);
-    colour += u_m_diffuseColour.rgb * (diffuse + u_m_selfIllumination) * base.rgb;
+    base.rgb = SHARE(base.rgb);
+    colour += SHARE(u_m_diffuseColour.rgb TINT) * (diffuse + u_m_selfIllumination) * base.rgb;
     opacity *= base.a;
+#endif
+#ifdef VCOL
+    opacity *= v_opacity;
 #endif
 
 #ifdef AMBI
-    vec3 ambient = v_ambient * texture2D(u_m_ambientTexture, v_uv).rgb;
+    vec3 ambient = v_ambient * SHARE(texture2D(u_m_ambientTexture, v_uv).rgb);
 #ifdef DIFF
     ambient *= base.rgb;
 #endif
@@ -227,7 +248,7 @@ void main()
 #endif
 
 #ifdef REFL
-    vec3 mirrored = reflectedColour(normal, toEye);
+    vec3 mirrored = SHARE(reflectedColour(normal, toEye));
 #ifdef SPEC
     mirrored *= min(gloss, 1.0);
 #endif
@@ -235,8 +256,16 @@ void main()
 #endif
 
 #ifdef EMIS
-    colour += u_m_emissiveColour.rgb * texture2D(u_m_emissiveTexture, v_uv).rgb;
+    colour += SHARE(u_m_emissiveColour.rgb) * SHARE(texture2D(u_m_emissiveTexture, v_uv).rgb);
 #endif
 
+#ifdef LINEAR
+    colour = pow(max(colour, 0.0), vec3(1.0 / 2.2));
+#endif
+#ifdef CUTOFF
+    if (opacity < u_m_cutoff)
+        discard;
+    opacity = 1.0;
+#endif
     gl_FragColor = vec4(colour, opacity);
 }

@@ -32,6 +32,7 @@ uniform u_m_shininess M_SHININESS
 uniform u_m_specularLevel M_SPECULAR_LEVEL
 uniform u_m_selfIllumination M_SELF_ILLUMINATION
 uniform u_m_opacity M_OPACITY
+uniform u_m_cutoff M_CUTOFF
 
 uniform u_m_diffuseTexture M_DIFFUSE_TEXTURE
 uniform u_m_ambientTexture M_AMBIENT_TEXTURE

@@ -2,7 +2,7 @@
 // for the light.
 //
 // Features are switched on by defines that stand in front of this text:
-//   DIFF SPEC AMBI REFL CUBE EMIS SKIN INVSQROOT  as in max_pvl
+//   DIFF SPEC AMBI REFL CUBE EMIS SKIN INVSQROOT VCOL CUTOFF LINEAR  as in max_pvl; BACK is always so, UNLIT not here
 //   BUMP  normals from M_BUMP_TEXTURE, in the space of a_tangent (along u), a_binormal (along v) and a_normal
 //   INVY  with BUMP: green points down in the picture, not up
 //
@@ -26,6 +26,20 @@
 #endif
 
 attribute vec3 a_position;
+#ifdef LINEAR
+#define SHARE(colour) pow(colour, vec3(2.2))
+#else
+#define SHARE(colour) (colour)
+#endif
+#ifdef VCOL
+#define OWN(colour) SHARE(colour * a_colour.rgb)
+attribute vec4 a_colour;
+varying mediump vec2 v_redGreen; // in halves, so that eight varyings hold everything
+varying mediump float v_blue;
+varying mediump float v_opacity;
+#else
+#define OWN(colour) SHARE(colour)
+#endif
 #ifdef SURFACE
 attribute vec3 a_normal;
 #ifdef BUMP
@@ -129,6 +143,11 @@ mat3 normalTransform(mat4 transform)
 
 void main()
 {
+#ifdef VCOL
+    v_redGreen = a_colour.rg;
+    v_blue = a_colour.b;
+    v_opacity = a_colour.a;
+#endif
 #ifdef SKIN
     mat4 transform = worldTransform();
     vec4 world = transform * vec4(a_position, 1.0);
@@ -168,7 +187,7 @@ void main()
             break;
         ambient += u_l_ambientColour[i].rgb;
     }
-    v_ambient = u_m_ambientColour.rgb * ambient;
+    v_ambient = OWN(u_m_ambientColour.rgb) * ambient;
 #endif
 
 #if defined(REFL) && !defined(CUBE)

@@ -12,6 +12,21 @@
 
 precision mediump float;
 
+#ifdef UNLIT
+#undef SPEC
+#undef BACK
+#endif
+#ifdef BACK
+#define SIDE(front, back) (gl_FrontFacing ? front : back)
+#else
+#define SIDE(front, back) front
+#endif
+#ifdef LINEAR
+#define SHARE(colour) pow(colour, vec3(2.2))
+#else
+#define SHARE(colour) (colour)
+#endif
+
 #if defined(DIFF) || defined(SPEC) || defined(AMBI) || defined(EMIS)
 #ifdef GL_FRAGMENT_PRECISION_HIGH
 varying highp vec2 v_uv;
@@ -21,11 +36,20 @@ varying mediump vec2 v_uv;
 #endif
 
 uniform float u_m_opacity;
+#ifdef CUTOFF
+uniform float u_m_cutoff;
+#endif
+#ifdef VCOL
+varying mediump float v_opacity;
+#endif
 
 #ifdef DIFF
 uniform sampler2D u_m_diffuseTexture;
 
 varying mediump vec3 v_diffuse;
+#ifdef BACK
+varying mediump vec3 v_diffuseBack;
+#endif
 #endif
 
 #ifdef SPEC
@@ -34,6 +58,9 @@ uniform vec4 u_m_specularColour;
 uniform float u_m_specularLevel;
 
 varying mediump vec3 v_specular;
+#ifdef BACK
+varying mediump vec3 v_specularBack;
+#endif
 #endif
 
 #ifdef AMBI
@@ -66,12 +93,16 @@ void main()
 
 #ifdef DIFF
     vec4 base = texture2D(u_m_diffuseTexture, v_uv);
-    colour += v_diffuse * base.rgb;
+    base.rgb = SHARE(base.rgb);
+    colour += SIDE(v_diffuse, v_diffuseBack) * base.rgb;
     opacity *= base.a;
+#endif
+#ifdef VCOL
+    opacity *= v_opacity;
 #endif
 
 #ifdef AMBI
-    vec3 ambient = v_ambient * texture2D(u_m_ambientTexture, v_uv).rgb;
+    vec3 ambient = v_ambient * SHARE(texture2D(u_m_ambientTexture, v_uv).rgb);
 #ifdef DIFF
     ambient *= base.rgb;
 #endif
@@ -79,8 +110,9 @@ void main()
 #endif
 
 #ifdef SPEC
-    vec3 gloss = u_m_specularColour.rgb * u_m_specularLevel * texture2D(u_m_specularTexture, v_uv).rgb;
-    colour += v_specular * gloss;
+    vec3 gloss = SHARE(u_m_specularColour.rgb) * u_m_specularLevel *
+                 SHARE(texture2D(u_m_specularTexture, v_uv).rgb);
+    colour += SIDE(v_specular, v_specularBack) * gloss;
 #endif
 
 #ifdef REFL
@@ -89,6 +121,7 @@ void main()
 #else
     vec3 mirrored = texture2D(u_m_reflectionTexture, v_reflection).rgb;
 #endif
+    mirrored = SHARE(mirrored);
 #ifdef SPEC
     mirrored *= min(gloss, 1.0);
 #endif
@@ -96,8 +129,16 @@ void main()
 #endif
 
 #ifdef EMIS
-    colour += u_m_emissiveColour.rgb * texture2D(u_m_emissiveTexture, v_uv).rgb;
+    colour += SHARE(u_m_emissiveColour.rgb) * SHARE(texture2D(u_m_emissiveTexture, v_uv).rgb);
 #endif
 
+#ifdef LINEAR
+    colour = pow(max(colour, 0.0), vec3(1.0 / 2.2));
+#endif
+#ifdef CUTOFF
+    if (opacity < u_m_cutoff)
+        discard;
+    opacity = 1.0;
+#endif
     gl_FragColor = vec4(colour, opacity);
 }

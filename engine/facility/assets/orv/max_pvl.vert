@@ -8,6 +8,11 @@
 //   CUBE       with REFL: the reflection is a cube map, in world directions
 //   EMIS       M_EMISSIVE_COLOUR, whatever the light
 //   SKIN       the vertex follows up to four joints
+//   VCOL       a_colour multiplies the diffuse and ambient colours, and its alpha the opacity
+//   CUTOFF     pixels whose opacity is below M_CUTOFF are left out, all others are opaque
+//   BACK       back faces are lit from their own side
+//   UNLIT      diffuse light is 1, whatever the lights; no highlights
+//   LINEAR     colours and textures are taken from sRGB (2.2) before they are lit, and the sum is given back to it
 //   INVSQROOT  a light's fall-off is x * inversesqrt(x), the root, of the usual straight line x: brighter for longer,
 //              then a steep end, as the lamps of some authoring tools have it
 //
@@ -17,7 +22,10 @@
 // Everything together fits the 128 uniform vectors that every device has, literals included: they may count as one
 // each, so there are few.
 
-#if defined(DIFF) || defined(SPEC)
+#ifdef UNLIT
+#undef SPEC
+#undef BACK
+#elif defined(DIFF) || defined(SPEC)
 #define LIT
 #endif
 #if defined(LIT) || defined(REFL)
@@ -31,6 +39,19 @@
 #define FINE highp
 #else
 #define FINE mediump
+#endif
+
+#ifdef LINEAR
+#define SHARE(colour) pow(colour, vec3(2.2))
+#else
+#define SHARE(colour) (colour)
+#endif
+#ifdef VCOL
+#define OWN(colour) SHARE(colour * a_colour.rgb)
+attribute vec4 a_colour;
+varying mediump float v_opacity;
+#else
+#define OWN(colour) SHARE(colour)
 #endif
 
 attribute vec3 a_position;
@@ -89,12 +110,18 @@ uniform vec4 u_m_diffuseColour;
 uniform float u_m_selfIllumination;
 
 varying mediump vec3 v_diffuse;
+#ifdef BACK
+varying mediump vec3 v_diffuseBack;
+#endif
 #endif
 
 #ifdef SPEC
 uniform float u_m_shininess;
 
 varying mediump vec3 v_specular;
+#ifdef BACK
+varying mediump vec3 v_specularBack;
+#endif
 #endif
 
 #ifdef AMBI
@@ -208,6 +235,10 @@ void main()
 #ifdef LIT
     vec3 diffuse = vec3(0.0);
     vec3 specular = vec3(0.0);
+#ifdef BACK
+    vec3 diffuseBack = vec3(0.0);
+    vec3 specularBack = vec3(0.0);
+#endif
     for (int i = 0; i < LIGHTS; i++)
     {
         if (i >= u_l_count)
@@ -225,24 +256,51 @@ void main()
         strength *= cone(dot(toLight, u_l_spotDirection[i]), u_l_spotInnerCos[i], u_l_spotOuterCos[i]);
 
         float facing = dot(normal, toLight);
+        vec3 light = u_l_diffuseColour[i].rgb * strength;
+#ifdef SPEC
+        float shine = dot(normal, safeNormalize(toLight + toEye));
+        float shininess = max(u_m_shininess, 0.0);
+#endif
         if (facing > 0.0)
         {
-            vec3 light = u_l_diffuseColour[i].rgb * strength;
             diffuse += light * facing;
 #ifdef SPEC
-            float shine = dot(normal, safeNormalize(toLight + toEye));
             if (shine > 0.0)
-                specular += light * pow(shine, max(u_m_shininess, 0.0));
+                specular += light * pow(shine, shininess);
 #endif
         }
+#ifdef BACK
+        if (facing < 0.0)
+        {
+            diffuseBack -= light * facing;
+#ifdef SPEC
+            if (shine < 0.0)
+                specularBack += light * pow(-shine, shininess);
+#endif
+        }
+#endif
     }
 #endif
 
 #ifdef DIFF
-    v_diffuse = u_m_diffuseColour.rgb * (diffuse + u_m_selfIllumination);
+    vec3 own = OWN(u_m_diffuseColour.rgb);
+#ifdef UNLIT
+    v_diffuse = own;
+#else
+    v_diffuse = own * (diffuse + u_m_selfIllumination);
+#ifdef BACK
+    v_diffuseBack = own * (diffuseBack + u_m_selfIllumination);
+#endif
+#endif
 #endif
 #ifdef SPEC
     v_specular = specular;
+#ifdef BACK
+    v_specularBack = specularBack;
+#endif
+#endif
+#ifdef VCOL
+    v_opacity = a_colour.a;
 #endif
 
 #ifdef AMBI
@@ -253,7 +311,7 @@ void main()
             break;
         ambient += u_l_ambientColour[i].rgb;
     }
-    v_ambient = u_m_ambientColour.rgb * ambient;
+    v_ambient = OWN(u_m_ambientColour.rgb) * ambient;
 #endif
 
 #ifdef REFL

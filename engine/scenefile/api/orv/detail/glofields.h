@@ -39,6 +39,7 @@ constexpr uint32_t BODY_CHUNKS[] = {
     LightDefinition::LIST_ID,
     CameraDefinition::LIST_ID,
     Material::LIST_ID,
+    Surfaces::ID,
     AnimationData::LIST_ID,
     SceneData::ID,
     0,
@@ -166,6 +167,18 @@ bool fields(Io& io, Of<Material> auto& r)
     uint32_t count = uint32_t(r.techniques.size());
     return io.text("material name ", r.name) && io.u32("material technique count ", count) &&
            io.chunks(count, r.techniques, false);
+}
+
+template <class Io>
+bool fields(Io& io, Of<Surfaces> auto& r)
+{
+    uint32_t count = uint32_t(r.list.size());
+    const auto surface = [&io](auto& s)
+    {
+        return io.u32("surface material ", s.material) && io.u32("surface features ", s.features) &&
+               io.f32("surface cutoff ", s.cutoff);
+    };
+    return io.u32("surface count ", count) && io.each(count, r.list, surface);
 }
 
 template <class Io>

@@ -43,6 +43,7 @@ constexpr ChunkKind CHUNKS[] = {
     {chunkId("MATL"), "material"},
     {chunkId("SMAT"), "standard material"},
     {chunkId("SMPL"), "texture sampler"},
+    {chunkId("SURF"), "further features of materials"},
     {chunkId("LCTL"), "list of controllers"},
     {chunkId("SKIN"), "skin"},
     {chunkId("ATCH"), "joint attachment"},
@@ -219,6 +220,27 @@ namespace sampler
 constexpr uint32_t TEXTURE_2D = 0;
 constexpr uint32_t TEXTURE_CUBE = 1;
 } // namespace sampler
+
+/// What a material may have besides, bit by bit; each is a feature of the lit programs. Unknown bits count for nothing.
+namespace surface
+{
+constexpr uint32_t VERTEX_COLOUR = 1;
+constexpr uint32_t CUTOFF = 2;
+constexpr uint32_t BACK = 4;
+constexpr uint32_t UNLIT = 8;
+constexpr uint32_t LINEAR = 16;
+
+struct Feature
+{
+    uint32_t bit;
+    const char* define; ///< in a program's name
+};
+
+/// In the order in which names have them.
+constexpr Feature FEATURES[] = {
+    {VERTEX_COLOUR, "$VCOL"}, {CUTOFF, "$CUTOFF"}, {BACK, "$BACK"}, {UNLIT, "$UNLIT"}, {LINEAR, "$LINEAR"},
+};
+} // namespace surface
 
 /// Light types. From 4 on a definition is refused when a node refers to it.
 namespace light

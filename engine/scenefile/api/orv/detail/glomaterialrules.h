@@ -23,7 +23,20 @@ inline bool isBlack(const Vector4f& colour)
 
 inline bool isBlended(const StandardMaterial& material)
 {
-    return material.opacity < 1.0f;
+    return material.opacity < 1.0f && !(material.features & surface::CUTOFF);
+}
+
+/// Hands what the surfaces say to their materials.
+inline void applySurfaces(GloScene& scene)
+{
+    for (const Surface& surface : scene.surfaces.list)
+    {
+        if (surface.material >= scene.materials.size() || scene.materials[surface.material].techniques.empty())
+            continue;
+        StandardMaterial& material = scene.materials[surface.material].techniques.back();
+        material.features = surface.features;
+        material.cutoff = surface.cutoff;
+    }
 }
 
 /// What an animated colour or level comes to: shader features and blending follow all that it reaches, not only
@@ -76,6 +89,8 @@ inline std::string getProgramName(FileVersion version, AuthoringTool tool, const
     feature(reflection, "$REFL");
     feature(reflection && material.reflection.sampler->type == sampler::TEXTURE_CUBE, "$CUBE");
     feature(!isBlack(material.emissive.colour), "$EMIS");
+    for (const surface::Feature& further : surface::FEATURES)
+        feature(material.features & further.bit, further.define);
     feature(skinned, "$SKIN");
     return name;
 }

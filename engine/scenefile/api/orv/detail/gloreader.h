@@ -61,6 +61,7 @@ private:
     template <auto LIST>
     bool readList();
     bool readInfo();
+    bool readSurfaces();
     bool readScene();
 
     bool readChunk(const uint32_t ids[], bool skipUnknown);

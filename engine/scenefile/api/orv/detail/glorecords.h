@@ -132,6 +132,8 @@ struct StandardMaterial
     SamplerField specularLevelMap;
     float specularLevel = 0.0f;
     float selfIllumination = 0.0f;
+    uint32_t features = 0; ///< bits of namespace surface; this and the next from the SURF chunk
+    float cutoff = 0.5f;
 };
 
 struct Material
@@ -143,6 +145,21 @@ struct Material
 
     std::string name;
     std::vector<StandardMaterial> techniques; ///< the last one counts
+};
+
+/// What a material of the list has besides; readers that do not know the chunk pass over it.
+struct Surface
+{
+    uint32_t material = 0; ///< its place in the list of materials
+    uint32_t features = 0; ///< bits of namespace surface
+    float cutoff = 0.5f;   ///< opacity below which CUTOFF leaves a pixel out
+};
+
+struct Surfaces
+{
+    static constexpr uint32_t ID = chunkId("SURF");
+
+    std::vector<Surface> list;
 };
 
 // --------------------------------------------------------------------------------- skins, lights, cameras
@@ -312,6 +329,7 @@ struct GloScene
     std::vector<LightDefinition> lights;
     std::vector<CameraDefinition> cameras;
     std::vector<Material> materials;
+    Surfaces surfaces;
     std::vector<AnimationData> animations;
     std::optional<SceneData> scene;
 };
