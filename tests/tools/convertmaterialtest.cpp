@@ -13,6 +13,7 @@
 
 #include <assimp/scene.h>
 #include <nlohmann/json.hpp>
+#include <webp/encode.h>
 
 #include <cstdlib>
 #include <filesystem>
@@ -204,6 +205,14 @@ TEST_F(ConvertMaterialTest, physicalMaterials)
          {},
          0.25f,
          30.0f},
+        {R"({"name":"dull","pbrMetallicRoughness":{"metallicFactor":0,"roughnessFactor":0.5},
+             "extensions":{"KHR_materials_specular":{"specularFactor":0}}})",
+         "pvl.sp$DIFF$AMBI",
+         true,
+         {},
+         {},
+         0.125f,
+         30.0f},
         {R"({"name":"gloss","extensions":{"KHR_materials_pbrSpecularGlossiness":
              {"specularFactor":[0.04,0.04,0.04],"glossinessFactor":0.5}}})",
          "pvl.sp$DIFF$SPEC$AMBI",
@@ -322,6 +331,31 @@ TEST_F(ConvertMaterialTest, samplersKeepTheirSettings)
     EXPECT_EQ(Filter::NEAREST, own->getMagFilter());
     EXPECT_EQ(Wrap::CLAMP, own->getHorizontalWrap());
     EXPECT_EQ(Wrap::MIRRORED_REPEAT, own->getVerticalWrap());
+}
+
+// Fault caught: WebP pictures that nobody reads, or whose alpha is lost.
+TEST(Pictures, readsWebp)
+{
+    std::vector<uint8_t> pixels;
+    for (uint8_t i = 0; i < 6; ++i)
+        pixels.insert(pixels.end(), {uint8_t(40 * i), 7, uint8_t(255 - i), uint8_t(i % 2 ? 255 : 90)});
+    for (const bool hasAlpha : {true, false})
+    {
+        uint8_t* encoded = nullptr;
+        const size_t size = hasAlpha ? WebPEncodeLosslessRGBA(pixels.data(), 3, 2, 12, &encoded)
+                                     : WebPEncodeLosslessRGB(pixels.data(), 4, 2, 12, &encoded);
+        std::vector<uint8_t> bytes(encoded, encoded + size);
+        WebPFree(encoded);
+        convert::PictureHeader header;
+        convert::Picture picture;
+        ASSERT_TRUE(convert::readHeader(bytes, header));
+        EXPECT_EQ("", header.extension); // the engine reads none
+        ASSERT_TRUE(convert::decodePicture(bytes, header, picture));
+        EXPECT_EQ(hasAlpha ? 3 : 4, picture.width);
+        EXPECT_EQ(pixels, picture.data);
+        bytes.resize(size / 2);
+        EXPECT_FALSE(convert::decodePicture(bytes, header, picture));
+    }
 }
 
 // Fault caught: slopes that lean the wrong way; opacity from a map that lands in another pixel or channel.

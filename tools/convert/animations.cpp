@@ -98,6 +98,31 @@ Values sample(const aiNodeAnim& channel, Property property, double ticks, const 
     return getRest(rest, property);
 }
 
+/// Times of keys that follow another one of the same time.
+template <class Key>
+std::vector<double> findJumps(const Key* keys, unsigned count)
+{
+    std::vector<double> times;
+    for (unsigned i = 1; i < count; ++i)
+    {
+        if (keys[i].mTime == keys[i - 1].mTime)
+            times.push_back(keys[i].mTime);
+    }
+    return times;
+}
+
+/// In ticks.
+std::vector<double> listJumps(const aiNodeAnim& channel, Property property)
+{
+    switch (property)
+    {
+    case Property::TRANSLATION: return findJumps(channel.mPositionKeys, channel.mNumPositionKeys);
+    case Property::ROTATION: return findJumps(channel.mRotationKeys, channel.mNumRotationKeys);
+    case Property::SCALE: break;
+    }
+    return findJumps(channel.mScalingKeys, channel.mNumScalingKeys);
+}
+
 bool isSame(const Values& a, const Values& b)
 {
     return std::equal(a.begin(), a.end(), b.begin(),
@@ -232,9 +257,9 @@ private:
         {
             const auto channel = source.channels.find(&node);
             const bool isMoved = channel != source.channels.end();
-            for (unsigned i = 0; i < (isMoved ? source.sampleCount : 1); ++i)
+            for (const double seconds :
+                 isMoved ? listTimes(source, *channel->second, property) : std::vector<double>{0.0})
             {
-                const double seconds = std::min(double(i) / m_fps, source.duration / source.ticksPerSecond);
                 const Values values =
                     isMoved ? sample(*channel->second, property, seconds * source.ticksPerSecond, rest)
                             : restValues;
@@ -248,6 +273,19 @@ private:
             return;
         m_lastOfFirst = m_all.channels.empty() ? last : m_lastOfFirst;
         m_all.channels.push_back(std::move(track));
+    }
+
+    /// Seconds at which a value is taken: so many a second, the end, and where the value jumps.
+    std::vector<double> listTimes(const Source& source, const aiNodeAnim& channel, Property property) const
+    {
+        const double end = source.duration / source.ticksPerSecond;
+        std::vector<double> times = listJumps(channel, property);
+        for (double& time : times)
+            time = std::clamp(time / source.ticksPerSecond, 0.0, end);
+        for (unsigned i = 0; i < source.sampleCount; ++i)
+            times.push_back(std::min(double(i) / m_fps, end));
+        std::sort(times.begin(), times.end());
+        return times;
     }
 
     /// Repeats the last key at the end of everything, which tells how long that is.

@@ -31,12 +31,12 @@ float toLevel(float metalness, float roughness)
 
 } // namespace
 
-Highlight fromMetalness(const Vector4f& base, float metalness, float roughness)
+Highlight fromMetalness(const Vector4f& base, float metalness, float roughness, const Vector4f& mirrored)
 {
     const float metal = std::clamp(metalness, 0.0f, 1.0f);
-    const auto tint = [metal](float colour) { return std::lerp(1.0f, colour, metal); };
-    return {Vector4f(tint(base.x), tint(base.y), tint(base.z), 1.0f), toLevel(metal, roughness),
-            toShininess(roughness)};
+    const auto tint = [metal](float other, float colour) { return std::lerp(other, colour, metal); };
+    return {Vector4f(tint(mirrored.x, base.x), tint(mirrored.y, base.y), tint(mirrored.z, base.z), 1.0f),
+            toLevel(metal, roughness), toShininess(roughness)};
 }
 
 Highlight fromGlossiness(const Vector4f& specular, float glossiness)

@@ -15,7 +15,9 @@ struct Highlight
 
 /// @param base  colour of the surface.
 /// @param metalness, roughness  0 to 1.
-Highlight fromMetalness(const orv::Vector4f& base, float metalness, float roughness);
+/// @param mirrored  what the surface would mirror if it were no metal, as a share of the usual.
+Highlight fromMetalness(const orv::Vector4f& base, float metalness, float roughness,
+                        const orv::Vector4f& mirrored = {1.0f, 1.0f, 1.0f, 1.0f});
 
 /// @param specular    what the surface mirrors head on, by colour.
 /// @param glossiness  0 to 1.

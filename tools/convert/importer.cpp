@@ -1,24 +1,28 @@
 #include "importer.h"
 
 #include "figures.h"
-#include "gltffile.h"
+#include "gltf/firstversion.h"
+#include "gltf/reader.h"
 #include "halflifefile.h"
 #include "mending.h"
+#include "modelfiles.h"
 #include "modelio.h"
 #include "progress.h"
-#include "uvtransforms.h"
 
 #include <assimp/config.h>
 #include <assimp/importerdesc.h>
 #include <assimp/postprocess.h>
 
 #include <algorithm>
+#include <filesystem>
 
 namespace convert
 {
 
 namespace
 {
+
+const char* const NOTHING = "holds nothing that can be drawn";
 
 std::string getFormatName(const Assimp::Importer& importer)
 {
@@ -136,10 +140,20 @@ bool fail(const std::string& reason, std::string& error)
     return false;
 }
 
-} // namespace
+/// Opens a glTF file; anything else comes back as another kind.
+gltf::Opened openGltf(const std::string& path, ModelFiles& files, const Assimp::Importer& importer)
+{
+    gltf::Bytes bytes(64);
+    const File file = files.open(path);
+    bytes.resize(file ? std::fread(bytes.data(), 1, bytes.size(), file.get()) : 0);
+    const bool isOthers = importer.IsExtensionSupported(std::filesystem::path(path).extension().string());
+    if (!gltf::mayBeGltf(bytes, path, isOthers) || !files.read(path, bytes))
+        return {};
+    return gltf::openGltf(std::move(bytes), path);
+}
 
-bool importModel(const std::string& path, ModelFiles& files, const Options& options, ImportedModel& model,
-                 Report& report, std::string& error)
+bool importOther(const std::string& path, ModelFiles& files, const Options& options,
+                 const gltf::Opened& opened, ImportedModel& model, Report& report, std::string& error)
 {
     Assimp::Importer& importer = model.importer;
     importer.SetIOHandler(new ModelIo(files));       // the importer's from now on
@@ -151,15 +165,12 @@ bool importModel(const std::string& path, ModelFiles& files, const Options& opti
     // The importer's own, and nobody else's. NOLINTNEXTLINE(cppcoreguidelines-pro-type-const-cast)
     aiScene& scene = const_cast<aiScene&>(*model.scene);
     const std::string format = getFormatName(importer);
-    model.isGltf = contains(format, "glTF");
-    if (scene.mRootNode && model.isGltf)
-        correctGltf(scene, path, !contains(format, "glTF2"), files, report);
+    if (scene.mRootNode && opened.kind == gltf::Opened::Kind::FIRST)
+        gltf::correctFirstVersion(scene, opened.document.get(), report);
     if (scene.mRootNode)
         mend(scene, report);
-    if (contains(format, "glTF2"))
-        transformTextureCoordinates(scene, report);
     if (!scene.mRootNode || scene.mNumMeshes == 0)
-        return fail("holds nothing that can be drawn", error);
+        return fail(NOTHING, error);
     if (!importer.ApplyPostProcessing(aiProcess_ValidateDataStructure))
         return fail(importer.GetErrorString(), error);
     report.setFormat(format);
@@ -174,6 +185,40 @@ bool importModel(const std::string& path, ModelFiles& files, const Options& opti
     model.scene = importer.ApplyPostProcessing(aiProcess_Triangulate | aiProcess_GenUVCoords |
                                                aiProcess_TransformUVCoords | aiProcess_SortByPType);
     return model.scene || fail(importer.GetErrorString(), error);
+}
+
+bool importGltf(gltf::Opened&& opened, ModelFiles& files, const Options& options, ImportedModel& model,
+                Report& report, std::string& error)
+{
+    const auto open = [&](const std::string& uri, gltf::Bytes& bytes) { return files.readNamed(uri, bytes); };
+    model.own = gltf::readGltf(std::move(opened.document), open, options, report);
+    model.scene = model.own.get();
+    mend(*model.own, report);
+    if (model.own->mNumMeshes == 0)
+        return fail(NOTHING, error);
+    report.setFormat("glTF2");
+    countModel(*model.own, report);
+    dropLostJoints(*model.own, report);
+    model.toScene = makeTransform(*model.own, "glTF2", options);
+    return true;
+}
+
+} // namespace
+
+bool importModel(const std::string& path, ModelFiles& files, const Options& options, ImportedModel& model,
+                 Report& report, std::string& error)
+{
+    try
+    {
+        gltf::Opened opened = openGltf(path, files, model.importer);
+        if (opened.kind == gltf::Opened::Kind::SECOND)
+            return importGltf(std::move(opened), files, options, model, report, error);
+        return importOther(path, files, options, opened, model, report, error);
+    }
+    catch (const gltf::Fault& fault)
+    {
+        return fail(fault.what(), error);
+    }
 }
 
 } // namespace convert

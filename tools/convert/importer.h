@@ -6,6 +6,7 @@
 #include <assimp/Importer.hpp>
 #include <assimp/scene.h>
 
+#include <memory>
 #include <string>
 
 namespace convert
@@ -13,13 +14,13 @@ namespace convert
 
 class ModelFiles;
 
-/// A model as libassimp reads it, put right where the library is known to hand over something else than the file has.
+/// A model in libassimp's terms, put right where the library is known to hand over something else than the file has.
 /// Faces have one to three corners, those of one mesh all the same number.
 struct ImportedModel
 {
     Assimp::Importer importer;
-    const aiScene* scene = nullptr; ///< the importer's
-    bool isGltf = false;
+    std::unique_ptr<aiScene> own;   ///< of a format that is read without the importer
+    const aiScene* scene = nullptr; ///< the importer's, or own
     aiMatrix4x4
         toScene; ///< from the model's axes and unit to +y up and, where the file tells its unit, metres
 };

@@ -15,14 +15,19 @@ namespace
 {
 
 constexpr float PHYSICAL = 4.0f; ///< a light that is brighter is in physical units, which the engine has not
-constexpr float SPENT = 0.02f;   ///< of a light's strength: where it ends
 
-/// What comes through at a distance, by the model's three factors.
-float attenuate(const aiLight& light, float distance)
+/// Where a light of this strength has gone, by the model's three factors: k + l d + q d^2 = strength / SPENT.
+float findEnd(const aiLight& light, float strength)
 {
-    const float divisor = float(light.mAttenuationConstant + light.mAttenuationLinear * distance +
-                                light.mAttenuationQuadratic * distance * distance);
-    return divisor > 0.0f ? 1.0f / divisor : 1.0f;
+    constexpr double NEAREST = 1e-3;
+    constexpr double FARTHEST = 1e6;
+    const double k = double(light.mAttenuationConstant) - double(strength) / double(SPENT);
+    const double l = std::max(0.0, double(light.mAttenuationLinear));
+    const double q = std::max(0.0, double(light.mAttenuationQuadratic));
+    if (k >= 0.0)
+        return float(NEAREST);
+    const double end = -2.0 * k / (l + std::sqrt(l * l - 4.0 * q * k)); // which holds for q = 0, too
+    return float(std::clamp(end, NEAREST, FARTHEST));
 }
 
 void setAttenuation(const aiLight& light, float strength, glo::LightDefinition& made)
@@ -31,15 +36,12 @@ void setAttenuation(const aiLight& light, float strength, glo::LightDefinition& 
     if (made.attenuated == 0)
         return;
     made.attenuationNear = 0.0f;
-    float distance = 1e-3f;
-    while (distance < 1e6f && strength * attenuate(light, distance) > SPENT)
-        distance *= 1.1f;
-    made.attenuationFar = distance;
+    made.attenuationFar = findEnd(light, strength);
 }
 
 } // namespace
 
-bool convertLight(const aiLight& light, bool isGltf, glo::LightDefinition& made, Report& report)
+bool convertLight(const aiLight& light, glo::LightDefinition& made, Report& report)
 {
     switch (light.mType)
     {
@@ -73,14 +75,13 @@ bool convertLight(const aiLight& light, bool isGltf, glo::LightDefinition& made,
         setAttenuation(light, strength, made);
     if (light.mType == aiLightSource_SPOT)
     {
-        const float factor = isGltf ? 2.0f : 1.0f;
-        made.spotInner = float(light.mAngleInnerCone) * factor;
-        made.spotOuter = std::max(made.spotInner, float(light.mAngleOuterCone) * factor);
+        made.spotInner = float(light.mAngleInnerCone);
+        made.spotOuter = std::max(made.spotInner, float(light.mAngleOuterCone));
     }
     return true;
 }
 
-glo::CameraDefinition convertCamera(const aiCamera& camera, bool isGltf)
+glo::CameraDefinition convertCamera(const aiCamera& camera)
 {
     glo::CameraDefinition made;
     made.farDistance = camera.mClipPlaneFar > 0.0f ? float(camera.mClipPlaneFar) : 1000.0f;
@@ -98,12 +99,7 @@ glo::CameraDefinition convertCamera(const aiCamera& camera, bool isGltf)
     if (!(angle > 0.0f && angle < 3.1f))
         return made;
     const float aspect = camera.mAspect > 0.0f ? float(camera.mAspect) : 1.0f;
-    const auto scaled = [](float whole, float factor)
-    { return 2.0f * std::atan(std::tan(whole * 0.5f) * factor); };
-    if (isGltf) // the importer stretches the upright angle to this one
-        made.fieldOfView = scaled(angle / aspect, std::min(aspect, 1.0f));
-    else
-        made.fieldOfView = scaled(angle, std::min(1.0f / aspect, 1.0f));
+    made.fieldOfView = 2.0f * std::atan(std::tan(angle * 0.5f) * std::min(1.0f / aspect, 1.0f));
     return made;
 }
 

@@ -11,11 +11,12 @@ struct aiLight;
 namespace convert
 {
 
-/// @param isGltf  whose cone angles are taken from the axis, not from edge to edge.
-/// @return false, with the loss reported, for a kind of light that the engine does not have.
-bool convertLight(const aiLight& light, bool isGltf, glo::LightDefinition& made, Report& report);
+constexpr float SPENT = 0.02f; ///< of a light's strength: where it ends
 
-glo::CameraDefinition convertCamera(const aiCamera& camera, bool isGltf);
+/// @return false, with the loss reported, for a kind of light that the engine does not have.
+bool convertLight(const aiLight& light, glo::LightDefinition& made, Report& report);
+
+glo::CameraDefinition convertCamera(const aiCamera& camera);
 
 /// From where it is to be, looking along -z, to its node.
 /// @param node  the node's transform.

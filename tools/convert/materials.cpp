@@ -182,7 +182,18 @@ private:
         if (m_isGltf || rough == aiTextureType_NONE)
             roughness = getFloat(m_source, AI_MATKEY_ROUGHNESS_FACTOR, roughness);
         return fromMetalness(m_made.diffuse.colour, metalness * getMapMean(metal).z,
-                             roughness * getMapMean(rough).y);
+                             roughness * getMapMean(rough).y, getMirrored());
+    }
+
+    /// What a surface other than metal mirrors, as a share of the usual.
+    Vector4f getMirrored() const
+    {
+        if (!m_isGltf || !hasFloat(m_source, AI_MATKEY_SPECULAR_FACTOR))
+            return WHITE;
+        const float strength = getFloat(m_source, AI_MATKEY_SPECULAR_FACTOR, 1.0f);
+        const Vector4f colour = getColour(m_source, AI_MATKEY_COLOR_SPECULAR, WHITE);
+        const auto limit = [strength](float share) { return std::clamp(share * strength, 0.0f, 1.0f); };
+        return toScreen(Vector4f(limit(colour.x), limit(colour.y), limit(colour.z), 1.0f));
     }
 
     /// Mean colour of a map that the engine has no use for pixel by pixel; white if there is none.

@@ -26,7 +26,6 @@ public:
     ModelConverter(const ImportedModel& source, ModelFiles& files, const std::string& stem,
                    const Options& options, ConvertedModel& model)
         : m_source(*source.scene)
-        , m_isGltf(source.isGltf)
         , m_toScene(source.toScene)
         , m_stem(stem)
         , m_options(options)
@@ -251,7 +250,7 @@ private:
         {
             const aiLight& light = *m_source.mLights[i];
             glo::LightDefinition definition;
-            if (!(light.mName == source.mName) || !convertLight(light, m_isGltf, definition, m_model.report))
+            if (!(light.mName == source.mName) || !convertLight(light, definition, m_model.report))
                 continue;
             definition.name = m_lightNames.make(light.mName.C_Str(), "light");
             const bool isDirected = light.mType != aiLightSource_POINT;
@@ -271,7 +270,7 @@ private:
             const aiCamera& camera = *m_source.mCameras[i];
             if (!(camera.mName == source.mName))
                 continue;
-            glo::CameraDefinition definition = convertCamera(camera, m_isGltf);
+            glo::CameraDefinition definition = convertCamera(camera);
             definition.name = m_cameraNames.make(camera.mName.C_Str(), "camera");
             const aiMatrix4x4 transform = placeCamera(camera, source.mTransformation);
             addHolder(node, !node.camera, definition.name + " view", transform).camera =
@@ -291,7 +290,6 @@ private:
     }
 
     const aiScene& m_source;
-    bool m_isGltf;
     aiMatrix4x4 m_toScene;
     std::string m_stem;
     const Options& m_options;

@@ -1,5 +1,6 @@
 #include "picturefinder.h"
 
+#include "datauri.h"
 #include "lowercase.h"
 #include "modelfiles.h"
 #include "pictures.h"
@@ -26,41 +27,6 @@ bool startsWith(const std::string& text, const char* start)
 std::string lastPart(const std::string& path)
 {
     return path.substr(path.find_last_of("/\\") + 1);
-}
-
-std::vector<uint8_t> decodeBase64(const std::string& text)
-{
-    const std::string digits = "ABCDEFGHIJKLMNOPQRSTUVWXYZabcdefghijklmnopqrstuvwxyz0123456789+/";
-    std::vector<uint8_t> bytes;
-    uint32_t bits = 0;
-    int count = 0;
-    for (const char c : text)
-    {
-        const size_t digit = digits.find(c);
-        if (digit == std::string::npos)
-            continue; // padding, line ends
-        bits = bits << 6 | uint32_t(digit);
-        count += 6;
-        if (count >= 8)
-        {
-            count -= 8;
-            bytes.push_back(uint8_t(bits >> count));
-        }
-    }
-    return bytes;
-}
-
-/// Such as "data:image/png;base64,iVBOR...".
-FoundPicture readDataUri(const std::string& uri)
-{
-    const size_t comma = uri.find(',');
-    const std::string head = toLowerCase(uri.substr(0, comma));
-    FoundPicture found{"texture", {}, false};
-    if (comma == std::string::npos || head.find(";base64") == std::string::npos)
-        return found;
-    found.bytes = decodeBase64(decodeUrl(uri.substr(comma + 1)));
-    found.isThere = true;
-    return found;
 }
 
 /// The model holds it as a file, or as bare pixels.
@@ -97,7 +63,10 @@ FoundPicture PictureFinder::find(const std::string& path) const
 {
     if (const aiTexture* embedded = m_scene.GetEmbeddedTexture(path.c_str()))
         return readEmbedded(path, *embedded);
-    return startsWith(path, "data:") ? readDataUri(path) : findOnDisk(path);
+    if (!isDataUri(path))
+        return findOnDisk(path);
+    std::optional<std::vector<uint8_t>> bytes = readDataUri(path);
+    return {"texture", bytes ? std::move(*bytes) : std::vector<uint8_t>(), bytes.has_value()};
 }
 
 /// Where the path leads from the model's folder, or else where its last part does: paths of other machines and

@@ -1,5 +1,7 @@
 #include "pictures.h"
 
+#include "webp.h"
+
 #include "headless/pngcompression.h"
 
 #include "orv/image.h"
@@ -150,6 +152,8 @@ bool readHeader(const std::vector<uint8_t>& bytes, PictureHeader& header)
         header.isWhole = true;
         return true;
     }
+    if (isWebp(bytes))
+        return readWebpHeader(bytes, header);
     if (bytes.empty() || bytes.size() > INT_MAX ||
         !stbi_info_from_memory(bytes.data(), int(bytes.size()), &header.width, &header.height,
                                &header.channels))
@@ -167,6 +171,8 @@ bool readHeader(const std::vector<uint8_t>& bytes, PictureHeader& header)
 
 bool decodePicture(const std::vector<uint8_t>& bytes, const PictureHeader& header, Picture& picture)
 {
+    if (isWebp(bytes))
+        return decodeWebp(bytes, picture);
     return header.extension.empty() ? decodeOther(bytes, picture) : decodeAsEngine(bytes, picture);
 }
 

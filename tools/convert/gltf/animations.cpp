@@ -1,0 +1,263 @@
+#include "animations.h"
+
+#include <assimp/anim.h>
+
+#include <algorithm>
+#include <cmath>
+#include <cstring>
+
+namespace convert::gltf
+{
+
+namespace
+{
+
+constexpr double MOST_SAMPLES = 200000.0; // as many as the conversion takes; a longer animation it leaves out
+
+/// Values over time.
+struct Track
+{
+    enum class Way
+    {
+        LINE,
+        STEP,
+        SPLINE
+    };
+    Way way = Way::LINE;
+    std::vector<float> times;
+    Column values; ///< a SPLINE has three for each time: the tangent before, the value, the tangent after
+};
+
+Track::Way toWay(const std::string& interpolation)
+{
+    return interpolation == "STEP"          ? Track::Way::STEP
+           : interpolation == "CUBICSPLINE" ? Track::Way::SPLINE
+                                            : Track::Way::LINE;
+}
+
+using Value = std::array<float, 4>;
+
+Value getValue(const Column& column, size_t element)
+{
+    Value value{};
+    std::copy(column[element], column[element] + column.components, value.begin());
+    return value;
+}
+
+/// @param key  the time is between this one's and the next one's.
+Value evaluateSpline(const Track& track, size_t key, double time)
+{
+    const float span = track.times[key + 1] - track.times[key];
+    const float t = span > 0.0f ? float((time - double(track.times[key])) / double(span)) : 0.0f;
+    const Value from = getValue(track.values, key * 3 + 1);
+    const Value leaving = getValue(track.values, key * 3 + 2);
+    const Value arriving = getValue(track.values, key * 3 + 3);
+    const Value to = getValue(track.values, key * 3 + 4);
+    const float squared = t * t;
+    const float cubed = squared * t;
+    Value made{};
+    for (unsigned c = 0; c < track.values.components; ++c)
+        made[c] = (2.0f * cubed - 3.0f * squared + 1.0f) * from[c] +
+                  span * (cubed - 2.0f * squared + t) * leaving[c] +
+                  (-2.0f * cubed + 3.0f * squared) * to[c] + span * (cubed - squared) * arriving[c];
+    return made;
+}
+
+struct Key
+{
+    double time;
+    Value value;
+};
+
+/// Keys to move between in straight lines.
+class KeyMaker
+{
+public:
+    KeyMaker(const Track& track, double fps) : m_track(track), m_fps(fps) {}
+
+    std::vector<Key> make()
+    {
+        for (size_t i = 0; i < m_track.times.size(); ++i)
+        {
+            const double time = double(m_track.times[i]);
+            if (i > 0 && m_track.way == Track::Way::STEP)
+                m_keys.push_back({time, m_keys.back().value});
+            if (i > 0 && m_track.way == Track::Way::SPLINE)
+                sample(i - 1);
+            const size_t element = m_track.way == Track::Way::SPLINE ? 3 * i + 1 : i;
+            m_keys.push_back({time, getValue(m_track.values, element)});
+        }
+        return std::move(m_keys);
+    }
+
+private:
+    void sample(size_t key)
+    {
+        const double start = double(m_track.times[key]);
+        const double end = double(m_track.times[key + 1]);
+        if (double(m_track.times.back()) * m_fps > MOST_SAMPLES)
+            return;
+        for (double i = std::floor(start * m_fps) + 1.0; i / m_fps < end; i += 1.0)
+        {
+            if (i / m_fps > start)
+                m_keys.push_back({i / m_fps, evaluateSpline(m_track, key, i / m_fps)});
+        }
+    }
+
+    const Track& m_track;
+    double m_fps;
+    std::vector<Key> m_keys;
+};
+
+/// A node's keys while they are collected.
+struct Movement
+{
+    std::vector<Key> translation, rotation, scale;
+    std::vector<Key>* find(const std::string& path)
+    {
+        return path == "translation" ? &translation
+               : path == "rotation"  ? &rotation
+               : path == "scale"     ? &scale
+                                     : nullptr;
+    }
+};
+
+aiVectorKey* toVectorKeys(const std::vector<Key>& keys)
+{
+    aiVectorKey* made = new aiVectorKey[keys.size()];
+    for (size_t i = 0; i < keys.size(); ++i)
+        made[i] = aiVectorKey(keys[i].time, aiVector3D(keys[i].value[0], keys[i].value[1], keys[i].value[2]));
+    return made;
+}
+
+aiQuatKey* toQuatKeys(const std::vector<Key>& keys)
+{
+    aiQuatKey* made = new aiQuatKey[keys.size()];
+    for (size_t i = 0; i < keys.size(); ++i)
+    {
+        const Value& v = keys[i].value;
+        made[i] = aiQuatKey(keys[i].time, aiQuaternion(v[3], v[0], v[1], v[2]));
+        if (v[0] * v[0] + v[1] * v[1] + v[2] * v[2] + v[3] * v[3] > 0.0f)
+            made[i].mValue.Normalize();
+        else
+            made[i].mValue = aiQuaternion();
+    }
+    return made;
+}
+
+aiNodeAnim* toChannel(const std::string& node, const Movement& movement)
+{
+    aiNodeAnim* made = new aiNodeAnim;
+    made->mNodeName = aiString(node);
+    made->mNumPositionKeys = unsigned(movement.translation.size());
+    made->mPositionKeys = toVectorKeys(movement.translation);
+    made->mNumRotationKeys = unsigned(movement.rotation.size());
+    made->mRotationKeys = toQuatKeys(movement.rotation);
+    made->mNumScalingKeys = unsigned(movement.scale.size());
+    made->mScalingKeys = toVectorKeys(movement.scale);
+    return made;
+}
+
+class AnimationReader
+{
+public:
+    AnimationReader(Source& source, const Object& animation, const std::vector<std::string>& nodeNames)
+        : m_source(source)
+        , m_animation(animation)
+        , m_nodeNames(nodeNames)
+        , m_made(std::make_unique<aiAnimation>())
+    {
+    }
+
+    std::unique_ptr<aiAnimation> read()
+    {
+        m_made->mName = aiString(m_animation.has("name") ? getName(m_animation) : "");
+        m_made->mTicksPerSecond = 1.0;
+        for (size_t i = 0; i < m_animation.length("channels"); ++i)
+            readChannel(m_animation.at("channels", i));
+        std::vector<aiNodeAnim*> channels;
+        for (const auto& [node, movement] : m_movements)
+            channels.push_back(toChannel(m_nodeNames[node], movement));
+        m_made->mNumChannels = unsigned(channels.size());
+        m_made->mChannels = new aiNodeAnim*[channels.size()];
+        std::copy(channels.begin(), channels.end(), m_made->mChannels);
+        return std::move(m_made);
+    }
+
+private:
+    void readChannel(const Object& channel)
+    {
+        const Object target = channel.object("target");
+        const std::optional<size_t> node = target.index("node");
+        const std::string path = target.text("path");
+        if (path == "weights")
+            return noteMorph(channel);
+        if (!node || *node >= m_nodeNames.size() || !Movement().find(path))
+            return loseTarget("a movement of what is no node's");
+        if (m_nodeNames[*node].empty())
+            return; // of another scene
+        std::vector<Key>& keys = *m_movements[*node].find(path);
+        if (!keys.empty())
+            return loseTarget("a second " + path + " of \"" + m_nodeNames[*node] + "\"");
+        keys = KeyMaker(readTrack(channel, path == "rotation" ? 4 : 3), m_source.options.fps).make();
+        if (!keys.empty())
+            m_made->mDuration = std::max(m_made->mDuration, keys.back().time);
+    }
+
+    void loseTarget(const std::string& what)
+    {
+        m_source.report.lose("animation-target",
+                             what + " in animation \"" + std::string(m_made->mName.C_Str()) + "\"");
+    }
+
+    /// A channel without keys, for the report.
+    void noteMorph(const Object& channel)
+    {
+        const Object sampler = m_animation.at("samplers", channel.size("sampler", 0));
+        const Column times = m_source.accessors.read(sampler.size("input", 0), sampler, 1);
+        if (!times.values.empty() && std::isfinite(times.values.back()))
+            m_made->mDuration = std::max(m_made->mDuration, double(times.values.back()));
+        if (m_made->mNumMorphMeshChannels > 0)
+            return;
+        m_made->mNumMorphMeshChannels = 1;
+        m_made->mMorphMeshChannels = new aiMeshMorphAnim* [1] { new aiMeshMorphAnim };
+    }
+
+    Track readTrack(const Object& channel, unsigned components)
+    {
+        if (!channel.has("sampler"))
+            channel.fail("has no sampler");
+        const Object sampler = m_animation.at("samplers", channel.size("sampler", 0));
+        if (!sampler.has("input") || !sampler.has("output"))
+            sampler.fail("has no input or no output");
+        Track track;
+        track.way = toWay(sampler.text("interpolation"));
+        track.times = m_source.accessors.read(sampler.size("input", 0), sampler, 1).values;
+        track.values = m_source.accessors.read(sampler.size("output", 0), sampler, components);
+        const size_t perTime = track.way == Track::Way::SPLINE ? 3 : 1;
+        if (track.values.count() / perTime < track.times.size())
+            sampler.fail("output", "has fewer elements than its times ask for");
+        for (size_t i = 0; i < track.times.size(); ++i)
+        {
+            if (!std::isfinite(track.times[i]) || (i > 0 && track.times[i] < track.times[i - 1]))
+                sampler.fail("input", "has times that do not ascend");
+        }
+        return track;
+    }
+
+    Source& m_source;
+    const Object& m_animation;
+    const std::vector<std::string>& m_nodeNames;
+    std::unique_ptr<aiAnimation> m_made;
+    std::map<size_t, Movement> m_movements; ///< by number of node
+};
+
+} // namespace
+
+std::unique_ptr<aiAnimation> readAnimation(Source& source, const Object& animation,
+                                           const std::vector<std::string>& nodeNames)
+{
+    return AnimationReader(source, animation, nodeNames).read();
+}
+
+} // namespace convert::gltf

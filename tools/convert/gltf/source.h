@@ -1,0 +1,43 @@
+#pragma once
+
+#include "accessors.h"
+
+#include "../options.h"
+#include "../report.h"
+
+#include <memory>
+
+namespace convert::gltf
+{
+
+/// A file that is being read, for all who read a part of it.
+struct Source
+{
+    Source(std::unique_ptr<Document> file, FileOpener open, const Options& choices, Report& findings)
+        : owned(std::move(file))
+        , document(*owned)
+        , buffers(document, std::move(open))
+        , accessors(document, buffers)
+        , options(choices)
+        , report(findings)
+    {
+    }
+
+    const std::unique_ptr<Document> owned;
+    const Document& document;
+    Buffers buffers;
+    Accessors accessors;
+    const Options& options;
+    Report& report;
+};
+
+/// What an object is called, or else such as "meshes[3]". No text of libassimp's holds more, nor a zero.
+inline std::string getName(const Object& object)
+{
+    constexpr size_t LONGEST = 1000;
+    const std::string name = object.text("name");
+    const std::string kept = name.substr(0, std::min(name.find('\0'), LONGEST));
+    return kept.empty() ? object.place() : kept;
+}
+
+} // namespace convert::gltf

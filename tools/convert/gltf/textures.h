@@ -1,0 +1,41 @@
+#pragma once
+
+#include "source.h"
+
+#include <memory>
+
+struct aiTexture;
+
+namespace convert::gltf
+{
+
+/// The pictures of a file, as far as its materials use them.
+class Textures
+{
+public:
+    explicit Textures(Source& source);
+    ~Textures();
+    Textures(const Textures&) = delete;
+    Textures& operator=(const Textures&) = delete;
+
+    /// @param texture  an element of "textures".
+    /// @return the picture's path for a material: a file's, or "*" and a number of those that the file holds; empty if
+    ///         there is no picture that can be had (reported).
+    std::string getPath(const Object& texture);
+
+    /// The pictures that the file holds, by number.
+    std::vector<std::unique_ptr<aiTexture>> take();
+
+private:
+    std::optional<size_t> chooseImage(const Object& texture);
+    std::string addImage(const Object& image);
+    std::string addFile(const Object& image, const std::string& uri);
+    std::string embed(const Object& image, Span bytes);
+
+    Source& m_source;
+    std::vector<std::unique_ptr<aiTexture>> m_embedded;
+    std::map<size_t, std::string> m_paths; ///< by number of image
+    std::vector<std::string> m_fileNames;  ///< of pictures on disk, without folders
+};
+
+} // namespace convert::gltf
