@@ -145,7 +145,7 @@ TEST_F(ConvertTest, geometryIsKept)
          Primitive::TRIANGLES,
          36,
          {"a_position", "a_normal", "a_colour"},
-         "vertex colours (kept as a_colour"},
+         "24 vertices"},
         {models + "glTF2/glTF-Sample-Models/AnimatedMorphCube-glTF/AnimatedMorphCube.gltf",
          Primitive::TRIANGLES, 36, plain, "the morph targets of mesh \"Cube\" (2)"},
     };

@@ -144,7 +144,9 @@ TEST_F(ConvertTest, classicMaterials)
     EXPECT_FALSE(loaded->getAppearance("glass")->isOpaque());
 
     const SharedPtr<Appearance> holes = loaded->getAppearance("holes");
-    EXPECT_FALSE(holes->isOpaque());
+    EXPECT_TRUE(holes->isOpaque());
+    EXPECT_EQ(m_pool->getShaderProgramCache()->get("orv#max_pvl.sp$DIFF$AMBI$CUTOFF"),
+              holes->getShaderProgram());
     EXPECT_EQ(8u, getTexture(holes)->getWidth()); // repeated, so the size has to be a power of two
     EXPECT_EQ(TextureParameters::WrapMode::REPEAT, getTexture(holes)->getHorizontalWrap());
     EXPECT_EQ(m_pool->getTexture2DCache()->get("orv#white.png"), getTexture(loaded->getAppearance("lost")));
@@ -180,11 +182,17 @@ TEST_F(ConvertMaterialTest, physicalMaterials)
          {124, 128, 0}},
         {R"({"name":"mask","alphaMode":"MASK","pbrMetallicRoughness":{"baseColorTexture":{"index":0}},
              "extensions":{"KHR_materials_unlit":{}}})",
-         "pvl.sp$DIFF$EMIS", false, ORANGE, SEEN_THROUGH},
+         "pvl.sp$DIFF$CUTOFF$UNLIT", true, ORANGE, SEEN_THROUGH},
+        {R"({"name":"lit mask","alphaMode":"MASK","pbrMetallicRoughness":{"baseColorTexture":{"index":0},
+             "baseColorFactor":[1,1,1,0.9],"metallicFactor":0},"alphaCutoff":0.36})",
+         "pvl.sp$DIFF$AMBI$CUTOFF",
+         true,
+         {},
+         SEEN_THROUGH},
         {R"({"name":"turned","alphaMode":"MASK","extensions":{"KHR_materials_unlit":{}},"pbrMetallicRoughness":
              {"baseColorTexture":{"index":0,"extensions":{"KHR_texture_transform":
              {"rotation":-1.5707963,"scale":[0.4,0.4],"offset":[0.45,0.1]}}}}})",
-         "pvl.sp$DIFF$EMIS", false, ORANGE, ORANGE}, // u = 0.45 - 0.4 v
+         "pvl.sp$DIFF$CUTOFF$UNLIT", true, ORANGE, ORANGE}, // u = 0.45 - 0.4 v
         {R"({"name":"low cutoff","alphaMode":"MASK","alphaCutoff":0.3,
              "pbrMetallicRoughness":{"baseColorTexture":{"index":0}},"extensions":{"KHR_materials_unlit":{}}})",
          "pvl.sp$EMIS", true, ORANGE, ORANGE},
@@ -199,7 +207,7 @@ TEST_F(ConvertMaterialTest, physicalMaterials)
         {R"({"name":"bump","normalTexture":{"index":1}})", "ppl.sp$BUMP$DIFF$AMBI", true, {}, {}},
         {R"({"name":"metal","doubleSided":true,"pbrMetallicRoughness":{"metallicFactor":1,"roughnessFactor":0.5,
              "baseColorFactor":[1,0.5,0,1]}})",
-         "pvl.sp$DIFF$SPEC$AMBI",
+         "pvl.sp$DIFF$SPEC$AMBI$BACK",
          true,
          {},
          {},
@@ -257,6 +265,69 @@ TEST_F(ConvertMaterialTest, physicalMaterials)
     }
     const Vector4f metal = getValue<Vector4f>(loaded->getAppearance("metal"), "M_SPECULAR_COLOUR");
     EXPECT_LT(length(metal - Vector4f(1, 0.73536f, 0, 1)), 1e-4f) << metal.y; // half of the light
+}
+
+// Fault caught: colours of vertices that are not shown, in other shares than the rest, or whose alpha counts where it
+// should not.
+TEST_F(ConvertMaterialTest, coloursOfVertices)
+{
+    const Rgba GREEN{124, 255, 0}, SEEN_THROUGH{214, 219, 227}, MIXED{169, 237, 114};
+    const struct
+    {
+        const char* alpha;
+        const char* features;
+        bool opaque;
+        Rgba seen;
+    } cases[] = {
+        {R"("alphaMode":"OPAQUE")", "$VCOL$UNLIT", true, GREEN},
+        {R"("alphaMode":"BLEND")", "$VCOL$UNLIT", false, MIXED},
+        {R"("alphaMode":"MASK","alphaCutoff":0.4)", "$VCOL$CUTOFF$UNLIT", true, GREEN},
+        {R"("alphaMode":"MASK","alphaCutoff":0.6)", "$VCOL$CUTOFF$UNLIT", true, SEEN_THROUGH},
+    };
+    std::vector<std::string> materials;
+    for (const auto& item : cases)
+        materials.push_back(R"({"name":"m)" + std::to_string(materials.size()) +
+                            R"(","extensions":{"KHR_materials_unlit":{}},)" + item.alpha + "}");
+    json model = makeModel(materials);
+    std::vector<float> colours;
+    for (int i = 0; i < 4; ++i)
+        colours.insert(colours.end(), {0.2f, 1.0f, 0.0f, 0.5f}); // 0.2 of the light
+    const uint8_t* bytes = reinterpret_cast<const uint8_t*>(colours.data());
+    m_folder.write("colours.bin", std::vector<uint8_t>(bytes, bytes + 64));
+    model["buffers"].push_back({{"byteLength", 64}, {"uri", "colours.bin"}});
+    model["bufferViews"].push_back({{"buffer", 1}, {"byteLength", 64}});
+    model["accessors"].push_back(
+        {{"bufferView", 3}, {"componentType", 5126}, {"count", 4}, {"type", "VEC4"}});
+    for (json& mesh : model["meshes"])
+        mesh["primitives"][0]["attributes"]["COLOR_0"] = 3;
+    m_folder.write("model.gltf", model.dump());
+    const Glo::Ptr loaded = convertAndLoad("model.gltf out.glo", "out.glo");
+    ASSERT_TRUE(loaded);
+    const std::string view = "cd '" + m_folder.path() +
+                             "' && " ORV_VIEW " out.glo --camera eye --size 80x20 --out out.png 2> view.log";
+    ASSERT_EQ(0, std::system(view.c_str()));
+    const Picture picture = support::readPng(m_folder.path("out.png"));
+    for (size_t i = 0; i < materials.size(); ++i)
+    {
+        const SharedPtr<Appearance> appearance = loaded->getAppearance(("m" + std::to_string(i)).c_str());
+        ASSERT_TRUE(appearance);
+        const std::string program = std::string("orv#max_pvl.sp$DIFF") + cases[i].features;
+        EXPECT_EQ(m_pool->getShaderProgramCache()->get(program.c_str()), appearance->getShaderProgram()) << i;
+        EXPECT_EQ(cases[i].opaque, appearance->isOpaque()) << i;
+        const Rgba seen = picture.pixel(int(20 * i + 10), 10);
+        EXPECT_TRUE(support::isNear(cases[i].seen, seen, 3)) << i << " " << seen;
+    }
+
+    m_folder.write(
+        "c.off",
+        std::string("COFF\n3 1 0\n0 0 0 255 0 0 255\n1 0 0 0 255 0 255\n0 1 0 0 0 255 255\n3 0 1 2\n"));
+    const Glo::Ptr plain = convertAndLoad("c.off off.glo", "off.glo");
+    ASSERT_TRUE(plain);
+    const SharedPtr<Appearance> appearance = plain->getAppearances().begin()->second;
+    EXPECT_EQ(Vector4f(1, 1, 1, 1),
+              getValue<Vector4f>(appearance, "M_DIFFUSE_COLOUR")); // and not the library's grey
+    EXPECT_EQ(m_pool->getShaderProgramCache()->get("orv#max_pvl.sp$DIFF$AMBI$VCOL$BACK"),
+              appearance->getShaderProgram());
 }
 
 // Fault caught: pictures in another format, size or place than the engine can do with, or that are written anew

@@ -127,10 +127,22 @@ const SceneFault SCENE_FAULTS[] = {
      [](GloScene& s) {
          technique(s).diffuse.colour = {0, 0, 0, 1};
      }},
-    {"surface", [](GloScene& s) { s.surfaces.list = {{9, glo::surface::LINEAR, 0.5f}}; }},
-    {"surface", [](GloScene& s) { s.surfaces.list = {{0, glo::surface::CUTOFF, 0.0f}}; }},
-    {"surface", [](GloScene& s) { s.surfaces.list = {{0, glo::surface::BACK, 0.5f}}; }},
-    {"surface", [](GloScene& s) { s.surfaces.list = {{0, 1u << 31, 0.5f}}; }},
+    {"surface",
+     [](GloScene& s) {
+         s.surfaces.list = {{9, glo::surface::LINEAR, 0.5f}};
+     }},
+    {"surface",
+     [](GloScene& s) {
+         s.surfaces.list = {{0, glo::surface::CUTOFF, 0.0f}};
+     }},
+    {"surface",
+     [](GloScene& s) {
+         s.surfaces.list = {{0, glo::surface::BACK, 0.5f}};
+     }},
+    {"surface",
+     [](GloScene& s) {
+         s.surfaces.list = {{0, 1u << 31, 0.5f}};
+     }},
     {"sampler-type", [](GloScene& s) { technique(s).diffuse.sampler->type = 2; }},
     {"image-missing", [](GloScene& s) { technique(s).diffuse.sampler->image = "gone.png"; }},
     {"image-unreadable", [](GloScene& s) { technique(s).diffuse.sampler->image = "bad.png"; }},

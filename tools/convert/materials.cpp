@@ -17,6 +17,7 @@ namespace convert
 
 using orv::Vector4f;
 using orv::detail::glo::isBlack;
+namespace surface = glo::surface;
 using Alpha = TextureWish::Alpha;
 
 namespace
@@ -43,9 +44,11 @@ std::string getAlphaMode(const aiMaterial& material)
 class MaterialConverter
 {
 public:
-    MaterialConverter(const aiMaterial& source, bool repeats, TextureStore& textures, Report& report)
+    MaterialConverter(const aiMaterial& source, const MaterialUse& use, TextureStore& textures,
+                      Report& report)
         : m_source(source)
-        , m_samplers(source, findUvChannel(source), repeats, textures, report)
+        , m_use(use)
+        , m_samplers(source, findUvChannel(source), use.repeats, textures, report)
         , m_textures(textures)
         , m_report(report)
         , m_alphaMode(getAlphaMode(source))
@@ -60,13 +63,19 @@ public:
         setHighlight();
         setNormals();
         m_made.doubleSided = getInt(m_source, AI_MATKEY_TWOSIDED) != 0;
-        if (getInt(m_source, AI_MATKEY_SHADING_MODEL) == aiShadingMode_NoShading)
+        addFeature(m_use.hasColours, surface::VERTEX_COLOUR);
+        const bool isUnlit = getInt(m_source, AI_MATKEY_SHADING_MODEL) == aiShadingMode_NoShading;
+        if (isUnlit || (m_use.hasColours && !m_use.isSurface))
             makeUnlit();
+        else
+            addFeature(m_made.doubleSided && !m_made.bump, surface::BACK); // which bumps have anyway
         reportUnused();
         return m_made;
     }
 
 private:
+    void addFeature(bool isWanted, uint32_t feature) { m_made.features |= isWanted ? feature : 0; }
+
     void setBase()
     {
         const Vector4f usual = m_isGltf ? WHITE : Vector4f(0.6f, 0.6f, 0.6f, 1.0f);
@@ -76,15 +85,28 @@ private:
         const MadeSampler picture = m_samplers.make(BASE, wishBase(colour.w));
         if (picture.field && !m_isGltf && isBlack(colour))
             colour = WHITE; // black would hide the picture
+        if (m_use.hasColours && isMadeUp())
+            colour = WHITE; // and not the library's grey
         if (m_isGltf)
             colour = toScreen(colour);
         colour.w = 1.0f;
         m_made.diffuse = {colour, picture.field};
         m_made.ambient.colour = colour; // for lights that have an ambient part
-        m_made.opacity = picture.hasAlpha ? std::min(opacity, ALMOST_OPAQUE) : opacity;
-        if (m_alphaMode == "MASK" && picture.hasAlpha)
-            m_report.approximate("alpha-mask", "a cut-out (blended, its picture cut at the threshold)");
+        const bool isCutOut = isMask() ? picture.hasAlpha || m_use.hasColours || m_threshold > 1.0f
+                                       : picture.isAllOrNothing && opacity == 1.0f;
+        addFeature(isCutOut, surface::CUTOFF);
+        m_made.cutoff = isMask() ? m_threshold : 0.5f;
+        m_made.opacity = picture.hasAlpha && !isCutOut ? std::min(opacity, ALMOST_OPAQUE) : opacity;
     }
+
+    /// The library makes a material for a file that has none.
+    bool isMadeUp() const
+    {
+        const aiString name = m_source.GetName();
+        return !m_isGltf && (name.length == 0 || name == aiString(AI_DEFAULT_MATERIAL_NAME));
+    }
+
+    bool isMask() const { return m_alphaMode == "MASK"; }
 
     /// Of the whole surface.
     /// @param alpha  of the base colour.
@@ -104,10 +126,11 @@ private:
     TextureWish wishBase(float alpha)
     {
         TextureWish wish;
-        if (m_alphaMode == "MASK")
+        if (isMask())
         {
+            m_threshold = getFloat(m_source, AI_MATKEY_GLTF_ALPHACUTOFF, 0.5f) / std::max(alpha, 1e-3f);
             wish.alpha = Alpha::CUT;
-            wish.threshold = getFloat(m_source, AI_MATKEY_GLTF_ALPHACUTOFF, 0.5f) / std::max(alpha, 1e-3f);
+            wish.threshold = m_use.hasColours ? 1.0f : m_threshold; // their alpha comes on top
             return wish;
         }
         if (m_isGltf)
@@ -252,6 +275,23 @@ private:
     void makeUnlit()
     {
         const bool hasOwnLight = m_made.emissive.sampler || !isBlack(m_made.emissive.colour);
+        if (m_made.features != 0 && (m_isGltf || !hasOwnLight))
+        {
+            m_made.features |= surface::UNLIT; // which colours of vertices and holes go with
+            m_made.emissive = {};
+        }
+        else
+            makeGlow(hasOwnLight);
+        m_made.ambient = {};
+        m_made.specular = {};
+        m_made.specularLevel = 0.0f;
+        m_made.bump.reset();
+        m_made.gloss.reset();
+    }
+
+    /// What readers without further features of materials show as well.
+    void makeGlow(bool hasOwnLight)
+    {
         if (m_isGltf || !hasOwnLight)
             m_made.emissive = m_made.diffuse;
         const bool blends = orv::detail::glo::isBlended(m_made);
@@ -259,11 +299,6 @@ private:
         m_made.diffuse.colour = Vector4f(left, left, left, 1.0f);
         if (left == 0.0f)
             m_made.diffuse.sampler.reset();
-        m_made.ambient = {};
-        m_made.specular = {};
-        m_made.specularLevel = 0.0f;
-        m_made.bump.reset();
-        m_made.gloss.reset();
     }
 
     void reportUnused()
@@ -298,11 +333,13 @@ private:
     }
 
     const aiMaterial& m_source;
+    const MaterialUse& m_use;
     SamplerMaker m_samplers;
     TextureStore& m_textures;
     Report& m_report;
     std::string m_alphaMode;
     bool m_isGltf;
+    float m_threshold = 0.5f; ///< of MASK, for the picture's alpha
     glo::StandardMaterial m_made;
 };
 
@@ -326,11 +363,14 @@ unsigned findUvChannel(const aiMaterial& material)
     return channel;
 }
 
-ConvertedMaterial convertMaterial(const aiMaterial& source, bool repeats, TextureStore& textures,
+ConvertedMaterial convertMaterial(const aiMaterial& source, const MaterialUse& use, TextureStore& textures,
                                   NameMaker& names, Report& report)
 {
-    const glo::StandardMaterial made = MaterialConverter(source, repeats, textures, report).convert();
+    const glo::StandardMaterial made = MaterialConverter(source, use, textures, report).convert();
+    const std::string alphaMode = getAlphaMode(source);
     ConvertedMaterial converted;
+    converted.hasLightColours = !alphaMode.empty();
+    converted.usesVertexAlpha = alphaMode == "BLEND" || alphaMode == "MASK";
     converted.uvChannel = findUvChannel(source);
     converted.hasNormalMap = made.bump.has_value();
     converted.material = {names.make(source.GetName().C_Str(), "material"), {made}};

@@ -9,10 +9,20 @@
 namespace convert
 {
 
+/// What the meshes of a material tell of it.
+struct MaterialUse
+{
+    bool repeats = false;    ///< texture coordinates leave the pictures
+    bool hasColours = false; ///< some vertices have colours of their own
+    bool isSurface = false;  ///< some meshes have triangles or normals, so that light counts
+};
+
 /// A material, and what its meshes need to know of it.
 struct ConvertedMaterial
 {
     glo::Material material;
+    bool hasLightColours = false; ///< colours of vertices are shares of light
+    bool usesVertexAlpha = false;
     unsigned uvChannel = 0; ///< of the model's texture coordinates, the one to take
     bool hasNormalMap = false;
 };
@@ -23,8 +33,7 @@ aiTextureType findMainTexture(const aiMaterial& material);
 /// @return the channel of texture coordinates that the material's first picture asks for; 0 if it has none.
 unsigned findUvChannel(const aiMaterial& material);
 
-/// @param repeats  texture coordinates leave the pictures.
-ConvertedMaterial convertMaterial(const aiMaterial& source, bool repeats, TextureStore& textures,
+ConvertedMaterial convertMaterial(const aiMaterial& source, const MaterialUse& use, TextureStore& textures,
                                   NameMaker& names, Report& report);
 
 } // namespace convert

@@ -1,5 +1,6 @@
 #include "meshes.h"
 
+#include "materialvalues.h"
 #include "parts.h"
 #include "rowtable.h"
 #include "surfaces.h"
@@ -75,16 +76,14 @@ private:
         if (m_mesh.mNumAnimMeshes > 0)
             m_report.lose("morph-targets", "the morph targets of " + m_name + " (" +
                                                std::to_string(m_mesh.mNumAnimMeshes) + ")");
-        if (m_mesh.mColors[0])
-            m_report.approximate(
-                "vertex-colours",
-                "vertex colours (kept as a_colour, which the scene's materials do not show)");
         if (m_mesh.mColors[1])
             m_report.lose("second-vertex-colours", "further vertex colours of " + m_name);
     }
 
     void chooseColumns()
     {
+        if (getStrongestColour() > 2.0f) // bytes, as some files have them
+            m_colourScale = 1.0f / 255.0f;
         m_columns.push_back({"a_position", 3, m_mesh.mVertices, false});
         const bool isSurface = m_cornersPerFace == 3;
         if (hasNormals())
@@ -101,6 +100,18 @@ private:
             addTangents(uvs);
         else
             m_report.lose("normal-map", "the normal map on " + m_name + ", which has no texture coordinates");
+    }
+
+    float getStrongestColour() const
+    {
+        float strongest = 0.0f;
+        for (unsigned i = 0; m_mesh.mColors[0] && i < m_mesh.mNumVertices; ++i)
+        {
+            const aiColor4D& colour = m_mesh.mColors[0][i];
+            strongest =
+                std::max({strongest, colour.r, colour.g, colour.b}); // what is no number is passed over
+        }
+        return strongest;
     }
 
     /// Some programs write normals that are all zero or that all point to the backs of their faces.
@@ -202,9 +213,14 @@ private:
         }
         if (const aiColor4D* colours = m_mesh.mColors[0])
         {
-            const aiColor4D& colour = colours[vertex];
-            for (const float value : {colour.r, colour.g, colour.b, colour.a})
-                row.push_back(std::round(255.0f * std::clamp(makeFinite(value), 0.0f, 1.0f)));
+            const aiColor4D& own = colours[vertex];
+            orv::Vector4f colour(makeFinite(own.r) * m_colourScale, makeFinite(own.g) * m_colourScale,
+                                 makeFinite(own.b) * m_colourScale,
+                                 m_material.usesVertexAlpha ? makeFinite(own.a) : 1.0f);
+            if (m_material.hasLightColours)
+                colour = toScreen(colour);
+            for (const float value : {colour.x, colour.y, colour.z, colour.w})
+                row.push_back(std::round(255.0f * std::clamp(value, 0.0f, 1.0f)));
         }
         if (!m_influences.empty())
         {
@@ -319,6 +335,7 @@ private:
     Report& m_report;
     std::string m_name; ///< for reports
     bool m_hasBadValues = false;
+    float m_colourScale = 1.0f;
     unsigned m_cornersPerFace = 0;
     Corners m_corners; ///< vertices of the mesh, face by face
     std::vector<Influences> m_influences;
@@ -335,6 +352,13 @@ private:
 std::vector<MeshPart> convertMesh(const aiMesh& mesh, const ConvertedMaterial& material, Report& report)
 {
     return MeshConverter(mesh, material, report).convert();
+}
+
+bool isColoured(const aiMesh& mesh)
+{
+    const aiColor4D* colours = mesh.mColors[0];
+    return colours && std::any_of(colours, colours + mesh.mNumVertices,
+                                  [](const aiColor4D& colour) { return colour != aiColor4D(1, 1, 1, 1); });
 }
 
 bool leavesPicture(const aiMesh& mesh, unsigned uvChannel)

@@ -25,6 +25,9 @@ struct MeshPart
 /// @return in as many parts as the limits of geometries ask for; none if nothing is left.
 std::vector<MeshPart> convertMesh(const aiMesh& mesh, const ConvertedMaterial& material, Report& report);
 
+/// Whether some vertex has a colour other than white.
+bool isColoured(const aiMesh& mesh);
+
 /// Whether texture coordinates of the channel lie outside 0 to 1.
 bool leavesPicture(const aiMesh& mesh, unsigned uvChannel);
 

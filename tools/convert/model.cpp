@@ -65,7 +65,7 @@ private:
         for (unsigned i = 0; i < m_source.mNumMaterials; ++i)
         {
             const aiMaterial& material = *m_source.mMaterials[i];
-            bool repeats = false;
+            MaterialUse use;
             bool used = false;
             for (unsigned m = 0; m < m_source.mNumMeshes; ++m)
             {
@@ -73,13 +73,25 @@ private:
                 if (mesh.mMaterialIndex != i)
                     continue;
                 used = true;
-                repeats = repeats || leavesPicture(mesh, findUvChannel(material));
+                use.repeats = use.repeats || leavesPicture(mesh, findUvChannel(material));
+                use.hasColours = use.hasColours || isColoured(mesh);
+                use.isSurface =
+                    use.isSurface || mesh.mNormals || mesh.mPrimitiveTypes & aiPrimitiveType_TRIANGLE;
             }
-            m_materials.push_back(used ? convertMaterial(material, repeats, m_textures, names, m_model.report)
+            m_materials.push_back(used ? convertMaterial(material, use, m_textures, names, m_model.report)
                                        : ConvertedMaterial());
             if (used)
-                m_model.scene.materials.push_back(m_materials.back().material);
+                addMaterial(m_materials.back().material);
         }
+    }
+
+    void addMaterial(const glo::Material& material)
+    {
+        glo::GloScene& scene = m_model.scene;
+        const glo::StandardMaterial& made = material.techniques.back();
+        if (made.features != 0)
+            scene.surfaces.list.push_back({uint32_t(scene.materials.size()), made.features, made.cutoff});
+        scene.materials.push_back(material);
     }
 
     /// A part of a mesh of the model.

@@ -219,15 +219,6 @@ void dropAlpha(Picture& picture)
         setChannels(picture, 3, [](int channel) { return channel; });
 }
 
-void cutAlpha(Picture& picture, float threshold)
-{
-    if (!picture.hasAlphaChannel())
-        return;
-    const size_t step = size_t(picture.channels);
-    for (size_t i = step - 1; i < picture.data.size(); i += step)
-        picture.data[i] = float(picture.data[i]) >= threshold * 255.0f ? 255 : 0;
-}
-
 void setAlpha(Picture& picture, Picture opacity)
 {
     dropAlpha(picture);
@@ -283,6 +274,27 @@ Transparency getTransparency(const Picture& picture)
         visible = visible || picture.data[i] > LEAST;
     }
     return !visible ? Transparency::ALL : transparent ? Transparency::SOME : Transparency::NONE;
+}
+
+bool hasHoles(const Picture& picture, float threshold)
+{
+    const size_t step = size_t(picture.channels);
+    bool found = false;
+    for (size_t i = step - 1; picture.hasAlphaChannel() && i < picture.data.size(); i += step)
+        found = found || float(picture.data[i]) < threshold * 255.0f;
+    return found;
+}
+
+bool isAllOrNothing(const Picture& picture)
+{
+    constexpr uint8_t FULL = 224;
+    constexpr uint8_t NONE = 32;
+    constexpr size_t RARE = 20;
+    const size_t step = size_t(picture.channels);
+    size_t between = 0;
+    for (size_t i = step - 1; picture.hasAlphaChannel() && i < picture.data.size(); i += step)
+        between += picture.data[i] > NONE && picture.data[i] < FULL ? 1 : 0;
+    return between <= picture.getPixelCount() / RARE;
 }
 
 float getMean(const Picture& picture, int channel)

@@ -45,9 +45,6 @@ void spreadGrey(Picture& picture);
 
 void dropAlpha(Picture& picture);
 
-/// Alpha from the threshold on (0 to 1) becomes full, below it none.
-void cutAlpha(Picture& picture, float threshold);
-
 /// Brightness becomes alpha of the other picture.
 /// @param opacity  any size.
 void setAlpha(Picture& picture, Picture opacity);
@@ -65,6 +62,12 @@ enum class Transparency
     ALL   ///< invisible all over, so alpha surely means something else
 };
 Transparency getTransparency(const Picture& picture);
+
+/// Whether some alpha is below the threshold (0 to 1).
+bool hasHoles(const Picture& picture, float threshold);
+
+/// Whether alpha is nearly full or nearly none, but for a few pixels along the edges (one of twenty).
+bool isAllOrNothing(const Picture& picture);
 
 /// Of one channel (0 to 3), 0 to 1; grey is all of the first three.
 float getMean(const Picture& picture, int channel);

@@ -73,7 +73,7 @@ MadeSampler SamplerMaker::make(std::initializer_list<aiTextureType> types, Textu
         m_report.approximate("mipmaps", "mipmaps of a texture whose sides are not powers of two (none; "
                                         "--power-of-two would help)");
     sampler.image = use.name;
-    return {sampler, use.hasAlpha};
+    return {sampler, use.hasAlpha, use.isAllOrNothing};
 }
 
 /// Filters and wrapping; reports what there is besides.

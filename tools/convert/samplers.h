@@ -15,6 +15,7 @@ struct MadeSampler
 {
     glo::SamplerField field; ///< empty if there is no picture, or it cannot be had
     bool hasAlpha = false;
+    bool isAllOrNothing = false; ///< see TextureUse
 };
 
 /// Makes samplers of one material's pictures.

@@ -37,12 +37,16 @@ bool applyAlpha(const TextureWish& wish, Picture& pixels, bool& changed)
 {
     if (!pixels.hasAlphaChannel())
         return false;
-    if (wish.alpha == Alpha::CUT)
+    const Transparency transparency =
+        wish.alpha == Alpha::CUT
+            ? (hasHoles(pixels, wish.threshold) ? Transparency::SOME : Transparency::NONE)
+            : getTransparency(pixels);
+    if (wish.alpha == Alpha::CUT && transparency == Transparency::NONE)
     {
-        cutAlpha(pixels, wish.threshold);
+        dropAlpha(pixels);
         changed = true;
+        return false;
     }
-    const Transparency transparency = getTransparency(pixels);
     const bool counts =
         wish.alpha != Alpha::DROP && !(wish.alpha == Alpha::AUTO && transparency == Transparency::ALL);
     if (counts || transparency == Transparency::NONE)
@@ -144,6 +148,7 @@ TextureUse TextureStore::make(const TextureWish& wish)
     Picture& pixels = loaded->pixels;
     bool changed = treat(pixels, wish);
     const bool hasAlpha = applyAlpha(wish, pixels, changed);
+    const bool allOrNothing = hasAlpha && isAllOrNothing(pixels); // which another size would blur
     const Size size = getFittingSize(pixels.width, pixels.height, wish.repeats);
     if (size.width != pixels.width || size.height != pixels.height)
     {
@@ -155,7 +160,7 @@ TextureUse TextureStore::make(const TextureWish& wish)
     const std::string name = makeName(loaded->file.name, isKept ? loaded->header.extension : ".png");
     m_files.push_back({name, isKept ? std::move(loaded->file.bytes) : encodePng(pixels)});
     m_report.count("rewritten-textures", isKept ? 0 : 1);
-    return {name, hasAlpha, isPowerOfTwo(pixels.width) && isPowerOfTwo(pixels.height)};
+    return {name, hasAlpha, allOrNothing, isPowerOfTwo(pixels.width) && isPowerOfTwo(pixels.height)};
 }
 
 /// Whether nobody needs to look at the pixels.
@@ -177,7 +182,7 @@ TextureUse TextureStore::passOn(const Loaded& loaded, const TextureWish& wish)
         m_report.approximate("texture-compressed", "a compressed texture (its size is left alone)");
     const std::string name = makeName(loaded.file.name, header.extension);
     m_files.push_back({name, loaded.file.bytes});
-    return {name, header.channels == 4 && wish.alpha == Alpha::KEEP,
+    return {name, header.channels == 4 && wish.alpha == Alpha::KEEP, false,
             isPowerOfTwo(header.width) && isPowerOfTwo(header.height)};
 }
 

@@ -27,7 +27,7 @@ struct TextureWish
         AUTO, ///< opacity, unless the picture would be invisible all over
         KEEP, ///< opacity
         DROP, ///< nothing
-        CUT   ///< opaque from the threshold on, invisible below
+        CUT   ///< opaque from the threshold on, invisible below; where all is opaque, nothing
     };
 
     std::string path;    ///< as the material names it
@@ -45,9 +45,10 @@ struct TextureWish
 
 struct TextureUse
 {
-    std::string name;         ///< of the file that the scene is to name; empty if the picture cannot be had
-    bool hasAlpha = false;    ///< some of it is transparent
-    bool isPowerOfTwo = true; ///< both sides are
+    std::string name;      ///< of the file that the scene is to name; empty if the picture cannot be had
+    bool hasAlpha = false; ///< some of it is transparent
+    bool isAllOrNothing = false; ///< and hardly any of it in part; not known of what nobody decodes
+    bool isPowerOfTwo = true;    ///< both sides are
 };
 
 /// What the names of a scene's pictures begin with.
