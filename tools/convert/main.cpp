@@ -134,6 +134,9 @@ void addOptions(CLI::App& app, Command& command)
         ->allow_extra_args(false)
         ->check(CLI::ExistingDirectory)
         ->option_text("DIR");
+    app.add_option("--linear", options.linear,
+                   "whether materials reckon in shares of light; by default those of glTF do")
+        ->check(CLI::IsMember({"on", "off"}));
     app.add_option("--report", command.report, "also write what is reported as JSON to this file");
     app.add_flag("--dry-run", command.dryRun, "write no scene and no textures");
     app.add_option("--time-limit", command.limits.seconds, "seconds after which to give up; 0 for never")

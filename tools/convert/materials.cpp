@@ -53,6 +53,7 @@ public:
         , m_report(report)
         , m_alphaMode(getAlphaMode(source))
         , m_isGltf(!m_alphaMode.empty())
+        , m_isLinear(use.linear.empty() ? m_isGltf : use.linear == "on")
     {
     }
 
@@ -64,11 +65,13 @@ public:
         setNormals();
         m_made.doubleSided = getInt(m_source, AI_MATKEY_TWOSIDED) != 0;
         addFeature(m_use.hasColours, surface::VERTEX_COLOUR);
-        const bool isUnlit = getInt(m_source, AI_MATKEY_SHADING_MODEL) == aiShadingMode_NoShading;
-        if (isUnlit || (m_use.hasColours && !m_use.isSurface))
+        if (isUnlit())
             makeUnlit();
         else
+        {
             addFeature(m_made.doubleSided && !m_made.bump, surface::BACK); // which bumps have anyway
+            addFeature(m_isLinear && isLit(), surface::LINEAR);
+        }
         reportUnused();
         return m_made;
     }
@@ -104,6 +107,12 @@ private:
     {
         const aiString name = m_source.GetName();
         return !m_isGltf && (name.length == 0 || name == aiString(AI_DEFAULT_MATERIAL_NAME));
+    }
+
+    bool isUnlit() const
+    {
+        return getInt(m_source, AI_MATKEY_SHADING_MODEL) == aiShadingMode_NoShading ||
+               (m_use.hasColours && !m_use.isSurface);
     }
 
     bool isMask() const { return m_alphaMode == "MASK"; }
@@ -204,8 +213,11 @@ private:
             metalness = getFloat(m_source, AI_MATKEY_METALLIC_FACTOR, metalness);
         if (m_isGltf || rough == aiTextureType_NONE)
             roughness = getFloat(m_source, AI_MATKEY_ROUGHNESS_FACTOR, roughness);
-        return fromMetalness(m_made.diffuse.colour, metalness * getMapMean(metal).z,
-                             roughness * getMapMean(rough).y, getMirrored());
+        metalness *= getMapMean(metal).z;
+        const Vector4f base = m_made.diffuse.colour;
+        if (m_isLinear && !isUnlit())
+            dimMetal(metalness);
+        return fromMetalness(base, metalness, roughness * getMapMean(rough).y, getMirrored());
     }
 
     /// What a surface other than metal mirrors, as a share of the usual.
@@ -217,6 +229,22 @@ private:
         const Vector4f colour = getColour(m_source, AI_MATKEY_COLOR_SPECULAR, WHITE);
         const auto limit = [strength](float share) { return std::clamp(share * strength, 0.0f, 1.0f); };
         return toScreen(Vector4f(limit(colour.x), limit(colour.y), limit(colour.z), 1.0f));
+    }
+
+    bool isLit() const
+    {
+        return !isBlack(m_made.diffuse.colour) ||
+               (m_made.specularLevel > 0.0f && !isBlack(m_made.specular.colour));
+    }
+
+    /// What metals show instead of what is around them. Half of the light is as bright, on the whole of a ball, as all
+    /// of it where light is reckoned in the screen's values.
+    void dimMetal(float metalness)
+    {
+        const float share = 1.0f - 0.5f * std::clamp(metalness, 0.0f, 1.0f);
+        const float shown = toScreen(Vector4f(share, share, share, 1.0f)).x;
+        for (Vector4f* colour : {&m_made.diffuse.colour, &m_made.ambient.colour})
+            *colour = Vector4f(colour->x * shown, colour->y * shown, colour->z * shown, 1.0f);
     }
 
     /// Mean colour of a map that the engine has no use for pixel by pixel; white if there is none.
@@ -339,6 +367,7 @@ private:
     Report& m_report;
     std::string m_alphaMode;
     bool m_isGltf;
+    bool m_isLinear;
     float m_threshold = 0.5f; ///< of MASK, for the picture's alpha
     glo::StandardMaterial m_made;
 };

@@ -9,9 +9,10 @@
 namespace convert
 {
 
-/// What the meshes of a material tell of it.
+/// What a material has to know besides.
 struct MaterialUse
 {
+    std::string linear;      ///< see Options
     bool repeats = false;    ///< texture coordinates leave the pictures
     bool hasColours = false; ///< some vertices have colours of their own
     bool isSurface = false;  ///< some meshes have triangles or normals, so that light counts

@@ -66,6 +66,7 @@ private:
         {
             const aiMaterial& material = *m_source.mMaterials[i];
             MaterialUse use;
+            use.linear = m_options.linear;
             bool used = false;
             for (unsigned m = 0; m < m_source.mNumMeshes; ++m)
             {

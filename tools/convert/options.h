@@ -13,8 +13,9 @@ struct Options
     bool animation = true; ///< false: the model stands as its file places it
     std::string up;     ///< axis that points up in the file: "x", "y", "z", or empty for what the file says
     double scale = 1.0; ///< of the whole model, above 0
-    int maxTextureSize = 0;           ///< pixels of a picture's longer side; 0 for no limit
-    bool powerOfTwo = false;          ///< all pictures get sides that are powers of two
+    int maxTextureSize = 0;  ///< pixels of a picture's longer side; 0 for no limit
+    bool powerOfTwo = false; ///< all pictures get sides that are powers of two
+    std::string linear; ///< "on", "off": materials reckon in shares of light; empty for what fits the format
     std::set<std::string> takenNames; ///< file names without extension that no picture may get
 };
 
