@@ -3,7 +3,7 @@
 #include <unistd.h>
 #if __has_include(<valgrind/callgrind.h>)
 #include <valgrind/callgrind.h>
-#else // built where valgrind is not: nobody will count
+#else // built without valgrind: nothing is counted
 #define CALLGRIND_START_INSTRUMENTATION
 #define CALLGRIND_STOP_INSTRUMENTATION
 #endif

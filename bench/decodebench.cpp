@@ -1,7 +1,7 @@
 // What decoding compressed textures in software costs: millions of texels a second of each decoder, ETC1's beside
 // that of Android's libETC1 where it was found when this was built.
 //
-// "Noise" is random blocks, the worst case for whoever branches; "picture" is what libETC1's encoder made of a
+// "Noise" is random blocks, the worst case for code with branches; "picture" is what libETC1's encoder made of a
 // smooth picture. libETC1 writes three bytes a texel, these decoders four. The best of several runs counts: what
 // else the machine does can only add.
 

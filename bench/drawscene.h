@@ -38,7 +38,7 @@ struct DrawScene
     /// The place in the table of turns of a cube in a frame; in the first it differs from cube to cube.
     int findTurn(size_t cube, int frame) const { return (int(cube) * 7 + frame) % TURNS; }
 
-    /// Every so many cubes turns; 0 for none.
+    /// One cube of this many turns; 0 for none.
     size_t getTurningStep() const;
 
     /// RGB, TEXTURE_SIZE by TEXTURE_SIZE, of one colour, so that filters make no difference.

@@ -1,4 +1,4 @@
-// What text costs: glyphs a second laid out, and laid out and drawn anew each time, with GL's calls dropped so that
+// What text costs: glyphs a second laid out, and laid out and drawn again each time, with GL's calls dropped so that
 // the engine's part alone counts; and what drawing an unchanged page takes. The best of several runs counts: what
 // else the machine does can only add.
 

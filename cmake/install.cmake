@@ -73,7 +73,7 @@ set(CPACK_DEBIAN_DEVELOPMENT_PACKAGE_SECTION libdevel)
 set(CPACK_DEBIAN_DEVELOPMENT_PACKAGE_DEPENDS "liborv${PROJECT_VERSION_MAJOR} (= ${PROJECT_VERSION})")
 set(CPACK_COMPONENT_DEVELOPMENT_DESCRIPTION "Headers, documentation and what CMake and pkg-config need.")
 
-# Whoever packs the same change gets the same bytes: files in a package are as old as the change.
+# Packing the same change gives the same bytes: files in a package are as old as the change.
 file(CONFIGURE OUTPUT packagetime.cmake @ONLY CONTENT
 "if(NOT DEFINED ENV{SOURCE_DATE_EPOCH} AND NOT \"@ORV_CHANGE_TIME@\" STREQUAL \"\")
     set(ENV{SOURCE_DATE_EPOCH} @ORV_CHANGE_TIME@)

@@ -31,7 +31,7 @@ glo::NodeData makeFigure(const std::string& skin, const std::vector<std::string>
     return makeNode("figure", &glo::NodeData::skin, glo::SkinReference{skin, {}, skeletons});
 }
 
-/// @param sets  of the one geometry, "square", that the one skin, "skin", moves by so many joints of one name.
+/// @param sets  of the one geometry, "square", that the one skin, "skin", moves by this many joints of one name.
 void addSkin(glo::GloScene& scene, size_t sets, size_t joints, const std::string& joint)
 {
     scene.geometries = {makeSquareGeometry("square")};
@@ -42,7 +42,7 @@ void addSkin(glo::GloScene& scene, size_t sets, size_t joints, const std::string
     scene.skins[0].attachments.resize(joints, {joint, {}});
 }
 
-/// So many things made by so many others each.
+/// A number of things, each made by a number of others.
 glo::GloScene makeSolids(size_t nodes, size_t sets)
 {
     glo::GloScene scene =

@@ -199,7 +199,7 @@ void pointAttrib(GLuint index, GLint size, GLenum type, GLboolean, GLsizei strid
     attrib.stride = stride ? size_t(stride) : attrib.size;
 }
 
-/// Whether every array that is switched on holds so many vertices.
+/// Whether every array that is switched on holds this many vertices.
 void checkArrays(size_t vertexCount)
 {
     for (const Attrib& attrib : g_state.attribs)

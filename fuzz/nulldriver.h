@@ -22,7 +22,7 @@ struct Given
     size_t sources = 0;  ///< of shaders
 };
 
-/// Since install(), or since whoever last set it to nothing.
+/// Since install(), or since it was last set to {}.
 Given& given();
 
 } // namespace nulldriver

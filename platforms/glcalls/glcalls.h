@@ -168,7 +168,7 @@ void failLinking(const std::string& log);
 /// (glBindBuffer, glVertexAttribPointer, glDisableVertexAttribArray).
 void refuseCall(uint64_t number);
 
-/// The entry point that refuseCall() has hit; "" if there were not so many calls.
+/// The entry point that refuseCall() has hit; "" if there were fewer calls.
 const std::string& refusedCall();
 
 /// glCheckFramebufferStatus answers status.

@@ -13,7 +13,7 @@ struct Options
 {
     int width = 64; ///< pixels, above 0
     int height = 64;
-    int depthBits = 24; ///< at least so many, 0 for none
+    int depthBits = 24; ///< at least this many, 0 for none
     int stencilBits = 8;
     int samples = 0; ///< per pixel, for smooth edges; where the driver has none, there are none
 };
@@ -62,7 +62,7 @@ private:
     int m_height = 0;
 };
 
-/// Reads the lower left of the current context's surface, whoever made it; see Context::readPixels().
+/// Reads the lower left of the current context's surface, wherever that was made; see Context::readPixels().
 std::vector<uint8_t> readSurface(int width, int height);
 
 /// Reads from the bound framebuffer of the current context.

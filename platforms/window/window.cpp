@@ -52,7 +52,7 @@ struct Window::Native
 namespace
 {
 
-/// Where there is no screen, SDL falls back on windows that nobody sees.
+/// Where there is no screen, SDL falls back on windows that are not shown.
 bool isVisible()
 {
     const char* driver = SDL_GetCurrentVideoDriver();

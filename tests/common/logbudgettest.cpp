@@ -12,7 +12,7 @@ using support::LogCapture;
 namespace
 {
 
-/// So many records of each of so many places in some source.
+/// A number of records from each of a number of places in a source.
 void write(int places, int records)
 {
     for (int record = 0; record < records; ++record)

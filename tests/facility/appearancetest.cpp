@@ -63,7 +63,7 @@ protected:
     SharedPtr<Appearance> m_appearance = makeShared<Appearance>();
 };
 
-/// Writes down what it is shown; stops after so many.
+/// Writes down what it is shown; stops after a number of them.
 class Notes : public PropertyCollector
 {
 public:

@@ -167,7 +167,7 @@ TEST(LoadLimits, pictures)
     setLoadLimits({});
 }
 
-// Faults caught: a budget that nested loads begin anew, that is kept for the next load, or that the same content
+// Faults caught: a budget that nested loads begin again, that is kept for the next load, or that the same content
 // raises as often as it is read.
 TEST(LoadLimits, oneBudgetForOneLoad)
 {

@@ -187,7 +187,7 @@ TEST_F(PvrTextureLoaderTest, pvrtcStaysCompressedWhereTheDriverTakesIt)
     }
 }
 
-// Faults caught: a texture that GL takes for incomplete and shows black, mipmaps made anew, sizes miscounted.
+// Faults caught: a texture that GL takes for incomplete and shows black, mipmaps made again, sizes miscounted.
 TEST_F(PvrTextureLoaderTest, mipmapsAreUsedAsTheyAreOrNotAtAll)
 {
     const support::Rgba large{255, 0, 0, 255}, small{0, 0, 255, 255};

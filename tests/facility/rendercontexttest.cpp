@@ -296,7 +296,7 @@ TEST_F(RenderContextTest, attributeArraysAreSwitchedByDifference)
     EXPECT_EQ(1u, callsOf([&] { target.setAttribOnes(2); }).size());
 }
 
-// Faults caught: GL errors, or a value sent for ever anew, from numbers that GL does not take.
+// Faults caught: GL errors, or a value sent again and again, from numbers that GL does not take.
 TEST_F(RenderContextTest, refusesWhatGlWouldRefuse)
 {
     const float nan = NAN;

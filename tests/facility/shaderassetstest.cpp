@@ -267,7 +267,7 @@ std::vector<Declaration> readDeclarations(const std::string& source, const std::
     return found;
 }
 
-/// Whether the declarations can be packed into so many vectors of four, by the rules of the language's appendix A.7: wide
+/// Whether the declarations can be packed into this many vectors of four, by the rules of the language's appendix A.7: wide
 /// types first, from the top; pairs in the left columns from the top, then in the right ones from the bottom; single
 /// components, the longest first, where they leave the smallest gap. Samplers count as single ones, to be safe.
 bool fits(std::vector<Declaration> declarations, size_t rows)

@@ -85,7 +85,7 @@ TEST(Picture, comparisonHoldsItsTolerance)
     }
 }
 
-// Fault caught: a kind of damage that is never done, or one that nobody can repeat.
+// Fault caught: a kind of damage that is never done, or one that cannot be repeated.
 TEST(Damage, coversEveryPlaceAndRepeatsItself)
 {
     support::Bytes file(100);

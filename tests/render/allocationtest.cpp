@@ -12,7 +12,7 @@ using namespace orv;
 
 using AllocationTest = SceneTest;
 
-// Fault caught: a frame that makes texts, lists or nodes anew, be it animated, skinned, mirrored, in stereo or of
+// Fault caught: a frame that makes texts, lists or nodes again, be it animated, skinned, mirrored, in stereo or of
 // velocities.
 TEST_F(AllocationTest, framesAllocateNothing)
 {

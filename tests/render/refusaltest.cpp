@@ -226,7 +226,7 @@ private:
             16, 16, Texture::Format::RGB, Texture::Type::UNSIGNED_BYTE, nullptr, nullptr);
         if (!texture)
             return {};
-        texture->setMinFilter(TextureParameters::FilterMode::LINEAR); // nobody draws its mipmaps
+        texture->setMinFilter(TextureParameters::FilterMode::LINEAR); // its mipmaps are never drawn
         const auto target = makeShared<RenderTarget>(texture, nullptr, true, hasStencil);
         if (!target || !target->isComplete())
             return {};

@@ -146,7 +146,7 @@ TEST_F(RenderBlockTest, leavesOutWhatIsHiddenAndWhatIsInOtherLayers)
     }
 }
 
-// Fault caught: a block that draws nothing, or into a corner, because nobody gave it a viewport.
+// Fault caught: a block that draws nothing, or into a corner, because it was given no viewport.
 TEST_F(RenderBlockTest, drawsToTheWholeTargetUnlessTold)
 {
     addSquare(Vector3f(), 100.0f, makePaint(Colour4f::RED));

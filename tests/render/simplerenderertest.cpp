@@ -211,7 +211,7 @@ TEST_F(SimpleRendererTest, publishesTransforms)
     EXPECT_EQ(square->getWorldTransform(), property<Matrix4f>("T_MODEL_VIEW_PROJECTION")) << "no camera";
 }
 
-// Faults caught: a second renderer that logs an error for every name and writes where nobody reads; one whose
+// Faults caught: a second renderer that logs an error for every name and writes what is never read; one whose
 // end takes the textures from the other.
 TEST_F(SimpleRendererTest, renderersShareTheContextsProperties)
 {

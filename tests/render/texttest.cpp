@@ -162,7 +162,7 @@ TEST_F(TextTest, glyphsFallOnPixels)
     }
 }
 
-// Faults caught: a draw for each string, buffers made anew each frame, a frame spoilt by the text before it.
+// Faults caught: a draw for each string, buffers made again each frame, a frame spoilt by the text before it.
 TEST_F(TextTest, drawsAllAtOnceAndLeavesTheSceneAlone)
 {
     addSquare(Vector3f(), 3.0f, makePaint(Colour4f::GREEN));

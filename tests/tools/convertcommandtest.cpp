@@ -138,7 +138,7 @@ TEST_F(ConvertTest, options)
     EXPECT_EQ(0, convertAndLoad(moving + " --no-animation", "out.glo")->getAnimationCount());
 }
 
-// Fault caught: codes and figures that scripts are to rely on and that nobody has written down.
+// Fault caught: codes and figures that scripts rely on and that are written down nowhere.
 TEST(ConvertReport, documentsEveryCode)
 {
     const std::filesystem::path source(ORV_SOURCE_FOLDER);

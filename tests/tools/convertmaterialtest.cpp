@@ -330,7 +330,7 @@ TEST_F(ConvertMaterialTest, coloursOfVertices)
               appearance->getShaderProgram());
 }
 
-// Fault caught: pictures in another format, size or place than the engine can do with, or that are written anew
+// Fault caught: pictures in another format, size or place than the engine can do with, or that are written again
 // without need.
 TEST_F(ConvertMaterialTest, pictures)
 {
@@ -404,7 +404,7 @@ TEST_F(ConvertMaterialTest, samplersKeepTheirSettings)
     EXPECT_EQ(Wrap::MIRRORED_REPEAT, own->getVerticalWrap());
 }
 
-// Fault caught: WebP pictures that nobody reads, or whose alpha is lost.
+// Fault caught: WebP pictures that are not read, or whose alpha is lost.
 TEST(Pictures, readsWebp)
 {
     std::vector<uint8_t> pixels;

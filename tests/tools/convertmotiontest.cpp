@@ -339,7 +339,7 @@ TEST_F(ConvertMotionTest, posesAreThoseOfTheSource)
 }
 
 // Fault caught: of two clips the second one also moves what only the first one does; values that step and are read as
-// lines; ranges that nobody can find; bytes that differ from run to run.
+// lines; ranges that cannot be found; bytes that differ from run to run.
 TEST_F(ConvertMotionTest, clipsLieEndToEnd)
 {
     m_folder.write("model.gltf",

@@ -195,7 +195,7 @@ Bytes append(Bytes bytes, const std::string& text, bool counted)
     return bytes;
 }
 
-/// Sets a word that lies so many bytes behind a text.
+/// Sets a word that lies this many bytes behind a text.
 Bytes setWord(Bytes bytes, const std::string& behind, size_t distance, uint8_t value)
 {
     const auto at = std::search(bytes.begin(), bytes.end(), behind.begin(), behind.end());

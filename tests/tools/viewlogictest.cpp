@@ -315,7 +315,7 @@ TEST(ViewPicker, meetsTheNearestWhereItsJointsHoldIt)
     EXPECT_EQ(wall.get(), view::pick(meshes, *root, {{0, 0, 5}, {0, 0, -1}}).solid);
 }
 
-// Fault caught: triangles that GL would draw but nobody can point at, and indices beyond the vertices.
+// Fault caught: triangles that GL draws but that cannot be pointed at, and indices beyond the vertices.
 TEST(ViewPicker, readsTrianglesAsTheyAreDrawn)
 {
     namespace primitive = orv::detail::glo::primitive;

@@ -275,7 +275,7 @@ private:
         m_all.channels.push_back(std::move(track));
     }
 
-    /// Seconds at which a value is taken: so many a second, the end, and where the value jumps.
+    /// Seconds at which a value is taken: evenly through each second, the end, and where the value jumps.
     std::vector<double> listTimes(const Source& source, const aiNodeAnim& channel, Property property) const
     {
         const double end = source.duration / source.ticksPerSecond;

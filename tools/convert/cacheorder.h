@@ -6,7 +6,7 @@
 namespace convert
 {
 
-/// Faces of a mesh as numbers of vertices, so many for each face.
+/// Faces of a mesh as numbers of vertices, the same count for each face.
 using Corners = std::vector<uint32_t>;
 
 /// One more than the highest number.

@@ -162,7 +162,7 @@ bool importOther(const std::string& path, ModelFiles& files, const Options& opti
     model.scene = importer.ReadFile(path, 0);
     if (!model.scene)
         return fail(importer.GetErrorString(), error);
-    // The importer's own, and nobody else's. NOLINTNEXTLINE(cppcoreguidelines-pro-type-const-cast)
+    // The importer's own, held nowhere else. NOLINTNEXTLINE(cppcoreguidelines-pro-type-const-cast)
     aiScene& scene = const_cast<aiScene&>(*model.scene);
     const std::string format = getFormatName(importer);
     if (scene.mRootNode && opened.kind == gltf::Opened::Kind::FIRST)

@@ -6,7 +6,7 @@
 namespace convert
 {
 
-/// What whoever converts may choose.
+/// What the command line may choose.
 struct Options
 {
     double fps = 30.0;     ///< samples per second of animations, above 0

@@ -22,14 +22,15 @@ struct Picture
 /// What a picture's first bytes tell, and its last ones.
 struct PictureHeader
 {
-    int width = 0; ///< 0, as the next two, for a compressed texture, which the engine reads and nobody here
+    int width =
+        0; ///< 0, as the next two, for a compressed texture, which the engine reads and the converter does not
     int height = 0;
     int channels = 0;      ///< at least 4 if any pixel can be transparent and the picture is coloured
     std::string extension; ///< of the engine's format, ".png"; empty where the engine does not read it
     bool isWhole = false;  ///< the end is there, so that decoding would bring no surprise
 };
 
-/// @return false if nobody can read it.
+/// @return false if it cannot be read.
 bool readHeader(const std::vector<uint8_t>& bytes, PictureHeader& header);
 
 /// @return false if it is damaged.

@@ -8,7 +8,7 @@ namespace convert
 {
 
 /// Says on one line of standard error what goes on, if that is a terminal and it has taken a while.
-/// @param share  0 to 1; below 0 if nobody knows.
+/// @param share  0 to 1; below 0 if unknown.
 void showProgress(const std::string& what, float share = -1.0f);
 
 /// Takes the line away.

@@ -12,7 +12,7 @@ class RowTable
 {
 public:
     /// @param width     floats of a row.
-    /// @param expected  so many rows are likely to come.
+    /// @param expected  number of rows that are likely to come.
     RowTable(size_t width, size_t expected);
 
     /// @return the number of the row; of an equal one if there is.

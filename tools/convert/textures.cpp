@@ -163,7 +163,7 @@ TextureUse TextureStore::make(const TextureWish& wish)
     return {name, hasAlpha, allOrNothing, isPowerOfTwo(pixels.width) && isPowerOfTwo(pixels.height)};
 }
 
-/// Whether nobody needs to look at the pixels.
+/// Whether the pixels need not be looked at.
 bool TextureStore::canPassOn(const PictureHeader& header, const TextureWish& wish) const
 {
     if (header.extension == ".pvr")

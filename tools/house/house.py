@@ -5,7 +5,7 @@
 
 A row of the page's first table names a room, a row of the second one a floor of the facility; the last column says what
 it stands on. A room may include what it stands on and what those stand on. Without --check the drawing on the page is
-made anew; with it, a drawing that differs is an error, as is an include that the tables do not allow, a room that they
+made again; with it, a drawing that differs is an error, as is an include that the tables do not allow, a room that they
 do not list, an include of another room's src folder, and a folder of too many sources. Exit code 1 then.
 """
 import argparse

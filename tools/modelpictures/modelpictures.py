@@ -4,7 +4,7 @@
     modelpictures.py CONVERTER VIEWER FOLDER DOCS [NAME...]
 
 FOLDER holds Debian's assimp-testmodels. Writes DOCS/pictures/models/NAME.png, orv-view on the left, the other one on the
-right, and DOCS/modelpictures.md. With names, only those pictures are drawn anew. Exit code 1 if one cannot be drawn.
+right, and DOCS/modelpictures.md. With names, only those pictures are drawn again. Exit code 1 if one cannot be drawn.
 
 Needs Debian's blender, python3-numpy (for Blender's readers), f3d, xvfb and python3-pil, and so Debian's own Python.
 """
@@ -83,9 +83,9 @@ PAIRS = (
          "The same waves, without a gap where the parts of at most 65,536 vertices meet. Darker here: without a colour in the "
          "file the converter takes grey of 0.6, Blender of 0.8."),
     Pair("wusonstl", "STL/Wuson.stl", "blender", "STL, normals of no length",
-         "The same shape. Smooth here as the normals are made anew, in facets in Blender.", None, "y"),
+         "The same shape. Smooth here as the normals are made again, in facets in Blender.", None, "y"),
     Pair("spiderstl", "STL/Spider_binary.stl", "blender", "STL, normals of the wrong side",
-         "The same, smooth and in facets. Before the normals were made anew it was black.", None, "y"),
+         "The same, smooth and in facets. Before the normals were made again it was black.", None, "y"),
     Pair("fels", "3DS/fels.3ds", "f3d", "3DS",
          "The same rock, with the normals that libassimp hands over; VTK draws its facets."),
     Pair("alphacubes", "3DS/cubes_with_alpha.3DS", "f3d", "3DS, transparent",

@@ -39,7 +39,7 @@ public:
     bool setMessage(const std::string& message);
     void setTable(const std::vector<Row>& rows); ///< empty for none
 
-    /// Draws over a viewport of that size. Only what has changed since is laid out anew.
+    /// Draws over a viewport of that size. Only what has changed since is laid out again.
     void draw(int width, int height);
 
 private:

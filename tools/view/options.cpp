@@ -25,7 +25,7 @@ Examples:
   orv-view duck.glo                              open a window and turn the duck with the mouse
   orv-view walk.fbx                              convert a model on the fly, and again when it is saved
   orv-view walk.fbx -- --up z --fps 60           the same; what follows -- is for orv-convert
-  orv-view chrome.ap                             a material on a ball, drawn anew while you edit it
+  orv-view chrome.ap                             a material on a ball, drawn again as you edit it
   orv-view duck.glo --material body=chrome.ap    try a material on a scene
 
   orv-view duck.glo --out duck.png               draw a picture, without a window

@@ -27,7 +27,7 @@ struct Orbit
     orv::Vector3f getEye() const { return middle + getDirection() * distance; }
     void setDirection(const orv::Vector3f& towardsEye); ///< of any length but 0
 
-    /// Drags what is seen so many pixels to the right and down, half a degree for each.
+    /// Turns what is seen as if dragged by pixels to the right and down, half a degree for each.
     void turn(float right, float down);
 
     /// Moves what is at the middle's depth along with the pointer.

@@ -29,7 +29,7 @@ public:
     /// @return false, with nothing changed, if there is no clip of that name; error then says which there are.
     bool chooseClip(const std::string& name);
     bool chooseClip(const std::string& name, std::string& error);
-    /// Goes on to one that is so many further, round and round, and to its start.
+    /// Goes on by a number of clips, round and round, and to the start of that one.
     void stepClip(int count);
 
     float getTime() const { return m_controller.getProgress(); } ///< seconds
@@ -45,9 +45,9 @@ public:
     void togglePaused(); ///< at the end of what does not loop: from the start again
     void scaleSpeed(float factor);
 
-    /// Stops and goes so many frames on, or back, 30 a second; beyond the end at the start while it loops.
+    /// Stops and goes a number of frames on, or back, 30 a second; beyond the end at the start while it loops.
     void step(int frames);
-    /// Goes so many seconds on, or back, without stopping; likewise.
+    /// Goes a number of seconds on, or back, without stopping; likewise.
     void skip(float seconds);
     void seek(float time);       ///< clamped to the clip
     void seekShare(float share); ///< 0 to 1

@@ -34,7 +34,7 @@ public:
     /// What is asked for from now on is read from its file again. Assets that a stage holds stay with it.
     void forgetAssets();
 
-    /// Deletes the GL objects of what nobody holds any more.
+    /// Deletes the GL objects of what is no longer held.
     void flush();
 
     /// The files that were asked for since forgetAssets(), those that do not exist as well.

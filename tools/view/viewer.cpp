@@ -49,7 +49,7 @@ const std::vector<HeadsUp::Row> KEYS = {
     {"space", "play and pause"},
     {". ,", "one frame on and back"},
     {"right, left", "some way on and back"},
-    {"home, end, 0 to 9", "start, end, so many tenths"},
+    {"home, end, 0 to 9", "start, end, that tenth of it"},
     {"+ -", "faster and slower"},
     {"l", "loop or stop at the end"},
     {"n, shift + n", "next and previous clip"},

@@ -316,7 +316,7 @@ SharedPtr<detail::JointTie> SceneNode::tie()
     return m_tie;
 }
 
-/// This node and those above it have so many more solids with joints, or by wrapping round fewer.
+/// Adds to the number of solids with joints at or below this node and those above it; less by wrapping round.
 void SceneNode::countSkinned(uint32_t more)
 {
     for (SceneNode* node = more != 0 ? this : nullptr; node;)

@@ -238,7 +238,7 @@ bool SimpleRenderer::prepareMirrorTarget()
     if (m_pool && !isEmpty && !isLarge)
     {
         std::copy_n(surface, 2, m_mirrorSurface);
-        // Blocks of two shapes in turn must not have it made anew in every frame, so it only grows.
+        // Blocks of two shapes in turn must not have it made again in every frame, so it only grows.
         makeMirrorTarget(std::max(least[0], isSame ? m_mirrorSize[0] : 0),
                          std::max(least[1], isSame ? m_mirrorSize[1] : 0));
     }

@@ -92,7 +92,7 @@ void Solid::attachJoint(const SharedPtr<SceneNode>& joint, const Matrix4f& inver
                       MAX_JOINTS);
     if (getJointCount() == 1)
         countSkinned(
-            1); // last: a joint above that nobody else keeps goes now, and with it this solid perhaps
+            1); // last: a joint above that nothing else holds dies now, and perhaps this solid with it
 }
 
 Solid::JointAttachment Solid::getJoint(int i) const

@@ -24,7 +24,7 @@ __attribute__((format(printf, 2, 3))) bool refuse(std::string& error, const char
     return false;
 }
 
-/// The words of a header. Whoever reads knows that they are there.
+/// The words of a header. The caller has made sure that they are there.
 class Words
 {
 public:

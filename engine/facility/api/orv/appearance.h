@@ -76,7 +76,7 @@ public:
     const SharedPtr<ShaderProgram>& getShaderProgram() const { return m_shaderProgram; }
     void setShaderProgram(const SharedPtr<ShaderProgram>& program);
 
-    /// Creates a property of zeroed elements, or replaces the one of that name; whoever holds the old one keeps
+    /// Creates a property of zeroed elements, or replaces the one of that name; those that hold the old one keep
     /// it, detached. T is normally one of bool, int, float, Vector2f, Vector3f, Vector4f, SharedPtr<Texture2D>
     /// and SharedPtr<TextureCube>; colours are Vector4f.
     /// @param size  count of elements; below 1 is an error and changes nothing.

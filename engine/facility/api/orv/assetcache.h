@@ -8,7 +8,7 @@ namespace orv
 
 /// Assets of one type, held by name, with the loaders that make them.
 ///
-/// An asset stays until a flush() that finds nobody else holding it; there is no limit by size or age. Names are
+/// An asset stays until a flush() finds that only the cache holds it; there is no limit by size or age. Names are
 /// compared exactly, after detail::normalizeAssetName(). Creating an asset under a name that is held replaces it.
 /// What does not depend on the type (flush(), sources, streams) is inherited.
 /// Threads: the GL thread only. Loading and flush() make GL calls.

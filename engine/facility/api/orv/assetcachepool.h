@@ -51,11 +51,11 @@ public:
     /// @return empty without a cache source or where it cannot be opened.
     SharedPtr<Stream> getCacheStream(const char* name, bool writable) const;
 
-    /// Drops the assets that only the caches hold and deletes GL objects that nobody uses.
+    /// Drops the assets that only the caches hold and deletes GL objects that are no longer used.
     void flush();
 
     /// After the GL context was lost: forgets every GL object without a GL call. The assets stay, under their
-    /// names, but draw nothing: drop them and call flush(), then load or make anew what is needed.
+    /// names, but draw nothing: drop them and call flush(), then load or make what is needed again.
     void release();
 
     /// The same in one call for a program that loads everything again: release(), and the caches let go of every

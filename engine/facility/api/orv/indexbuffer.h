@@ -20,7 +20,7 @@ class BufferResource;
 /// indices that pick them.
 ///
 /// The indices start in memory; commit() moves them into a GL buffer. After the context was lost
-/// (AssetCachePool::release()) a committed buffer draws nothing; it is to be made anew.
+/// (AssetCachePool::release()) a committed buffer draws nothing; it has to be made again.
 /// Threads: the GL thread only.
 class ORV_API IndexBuffer : public Shared
 {

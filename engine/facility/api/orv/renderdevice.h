@@ -61,7 +61,7 @@ ORV_API void checkGLError(const char* file, const char* function, int line);
 namespace detail
 {
 
-/// The same for those who have to give something up then. Whoever uses it calls RenderDevice::getError(false)
+/// The same for those who have to give something up then. Its caller calls RenderDevice::getError(false)
 /// first, so that an older error is not taken for its own.
 /// @return whether there was an error.
 bool reportGLError(const char* file, const char* function, int line);

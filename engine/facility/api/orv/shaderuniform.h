@@ -154,7 +154,7 @@ private:
 
 /// The value holder for one of the 21 types of detail::UniformTypes. Values start zeroed (null for textures).
 ///
-/// set() and get() are the short way for whoever holds the typed pointer; they take no virtual call.
+/// set() and get() are the short way for code that has the typed pointer; they take no virtual call.
 ///
 /// All of it stands here, so that a program makes the few types that it uses itself and the library need not offer
 /// every member of all 21.
@@ -215,7 +215,7 @@ public:
     /// @param index  in [0, getSize()); not checked.
     const T& get(int index = 0) const { return m_values[index]; }
 
-    /// The first value, to be written: for what is new nearly every time, so that comparing would be in vain.
+    /// The first value, to be written: for values that nearly always change, where comparing first would only cost time.
     T& renew()
     {
         touch();

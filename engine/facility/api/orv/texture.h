@@ -36,7 +36,7 @@ struct ORV_API Texture
     /// 0 for a format or type outside its enum.
     static unsigned getBytesPerPixel(Format format, Type type);
 
-    /// The format that an image of so many 8-bit channels is uploaded as; one channel is ALPHA.
+    /// The format that an image with this number of 8-bit channels is uploaded as; one channel is ALPHA.
     /// @param channelCount  1 to 4.
     static Format getFormat(int channelCount);
 };

@@ -42,7 +42,7 @@ struct AttribRecord
 /// Attributes are added as arrays; commit() interleaves them into one GL buffer and drops the arrays. The order
 /// of interleaving and of saving is the reverse of that of adding. Until commit(), and always for attributes
 /// meant for client memory, GL reads the arrays directly. After the context was lost (AssetCachePool::release())
-/// committed attributes are missing; the buffer is to be made anew.
+/// committed attributes are missing; the buffer has to be made again.
 /// Threads: the GL thread only.
 class ORV_API VertexBuffer : public Shared
 {

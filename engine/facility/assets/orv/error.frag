@@ -1,4 +1,4 @@
-// Stands in for a program that could not be built: fragment stage. Unlit, so that nobody overlooks it in the dark, and
+// Stands in for a program that could not be built: fragment stage. Unlit, so that it is seen in the dark too, and
 // opaque, whatever the material wanted.
 
 precision mediump float;

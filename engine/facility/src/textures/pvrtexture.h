@@ -7,7 +7,7 @@
 namespace orv::detail
 {
 
-/// A GL texture made from a PVR file. Whoever holds the record owns the texture.
+/// A GL texture made from a PVR file. The holder of the record owns the texture.
 struct PvrTexture
 {
     unsigned glName = 0;

@@ -127,7 +127,7 @@ private:
 
 /// Loads a scene file and hangs its tree under a node.
 ///
-/// Textures and shader programs come from the pool by name; buffers, meshes and appearances are made anew by
+/// Textures and shader programs come from the pool by name; buffers, meshes and appearances are made again by
 /// every load. Where a name in the file is borne by several nodes, the first in the order of the tree is meant; of
 /// geometries, skins, lights and cameras the first in the file; of materials the last.
 /// GL thread only.

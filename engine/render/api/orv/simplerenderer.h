@@ -49,7 +49,8 @@ struct RendererProperties;
 /// coordinates (0.5 + 0.5 x, 0.5 - 0.5 y). It is cleared to the clear values last set (the render block's
 /// background). The texture is made at the first mirror, as large as the surface where EGL knows that, else
 /// as what lies to the left of and below the viewport's upper right corner; larger where the viewport of a render
-/// target is; and anew when the surface has another size, or a viewport has outgrown it. It is RGB. Solids behind the mirror's plane are not cut away. Framebuffer and viewport come back.
+/// target is; and again when the surface has another size, or a viewport has outgrown it. It is RGB. Solids behind the
+/// mirror's plane are not cut away. Framebuffer and viewport come back.
 ///
 /// The context is not to outlive its pool with the textures above in it: when the last renderer of a context
 /// goes it takes them out of the context, so drop renderers before the last AssetCachePool::flush().
@@ -114,8 +115,8 @@ private:
     std::vector<Light*> m_lights;
     std::vector<SortKey> m_sortKeys;
     std::unique_ptr<detail::DrawGroups> m_groups; // null where the walk's order counts
-    std::vector<PropertyRef> m_mirrorProperties; // one for each place in m_mirrors
-    detail::Viewport m_viewport;                 // of the whole picture
+    std::vector<PropertyRef> m_mirrorProperties;  // one for each place in m_mirrors
+    detail::Viewport m_viewport;                  // of the whole picture
     SharedPtr<RenderTarget> m_mirrorTarget;
     int m_mirrorSurface[2] = {0, 0}; // the surface's size when the mirror's texture was made; 0 unknown
     int m_mirrorSize[2] = {0, 0};    // of the texture, had or refused

@@ -75,7 +75,7 @@ public:
     /// Draws over what the viewport shows, blended, whatever the depth buffer holds; nothing is written there.
     ///
     /// One GL draw for up to MAX_GLYPHS glyphs, one more for each further lot. Without a change since the last
-    /// time nothing is made anew. The strings are kept in client memory, so there is nothing to be flushed here.
+    /// time nothing is made again. The strings are kept in client memory, so there is nothing to be flushed here.
     void draw(RenderContext& context);
 
     /// A copy of the strings as they are, to be put into a scene.

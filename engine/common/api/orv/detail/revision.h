@@ -13,7 +13,7 @@ extern ORV_API uint64_t g_lastRevision;
 /// A number that no other call in this process returns, and never 0.
 ///
 /// Objects stamp themselves with one whenever they change. Two equal stamps therefore mean the same object in
-/// the same state, so whoever remembers a stamp needs neither a pointer (which might dangle) nor a comparison
+/// the same state, so code that remembers a stamp needs neither a pointer (which might dangle) nor a comparison
 /// of values. GL thread only, like everything that is stamped.
 inline uint64_t nextRevision()
 {

@@ -25,13 +25,13 @@ public:
     /// Whether the cache holds the name; loaders are not asked.
     bool exists(const char* name) const;
 
-    /// Drops every asset that only this cache holds, then deletes the GL objects that nobody uses any more.
+    /// Drops every asset that only this cache holds, then deletes the GL objects that are no longer used.
     void flush();
 
     /// Whether there was memory for its parts and loaders.
     bool isComplete() const { return m_resourceCache && m_assetPath && !m_lacksLoader; }
 
-    /// Lets go of every asset, whoever else holds it; makes no GL call.
+    /// Releases every asset, even those held elsewhere; makes no GL call.
     void clear();
 
     /// Appends a source to the cache's path.

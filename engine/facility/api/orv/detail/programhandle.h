@@ -10,7 +10,7 @@ class ShaderProgram;
 namespace detail
 {
 
-/// Outlives its program, so that whoever remembers the program can see that it is gone.
+/// Outlives its program, so that code that remembers the program can see that it is gone.
 class ProgramHandle : public Shared
 {
 public:

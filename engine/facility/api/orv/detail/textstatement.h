@@ -16,7 +16,7 @@ struct Statement
 };
 
 /// Reads the beginning of the next statement, skipping comments: "//" where a statement could begin, to the end of
-/// that line. Whoever reads the statement's arguments skips the white space after them.
+/// that line. The code that reads the statement's arguments skips the white space after them.
 /// @param statement  the one before it, to begin with an empty one.
 /// @return false at the end of the text. White space alone is no end: it yields one statement with an empty tag.
 bool readStatement(CharRange& text, Statement& statement);

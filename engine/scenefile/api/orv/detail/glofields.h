@@ -17,8 +17,8 @@
 ///                                   and f32(value)
 ///     chunk(record)                 the record's chunk, required
 ///     optionalChunk(optional)       a chunk that is there, required
-///     chunks(count, vector, skip)   so many chunks; if skip, others among them count but are passed over
-///     each(count, vector, fields)   fields is called for each of so many elements
+///     chunks(count, vector, skip)   count chunks; if skip, others among them count but are passed over
+///     each(count, vector, fields)   fields is called for each of count elements
 ///     body(scene)                   the chunks of BODY_CHUNKS
 ///     bytes(VertexData), indices(IndexData), keys(Channel)   the rest of their chunks
 ///     fail(format)                  reports, with the file's name for %s; false

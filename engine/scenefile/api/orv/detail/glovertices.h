@@ -81,7 +81,7 @@ inline float readComponent(const uint8_t* bytes, AttribFormat format, bool norma
     return value;
 }
 
-/// Calls use(vertex, value) with the first components of an attribute, at most so many of each vertex.
+/// Calls use(vertex, value) with the first components of an attribute, at most COUNT of each vertex.
 template <class Use>
 void forEachComponent(const VertexAttribute& attribute, const VertexSet& vertices, bool normalised,
                       int32_t most, Use&& use)
