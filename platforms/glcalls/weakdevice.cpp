@@ -13,17 +13,24 @@
 namespace glcalls
 {
 
-// name, vertex uniform vectors, texture units, NPOT, ETC1, packed depth and stencil, depth textures, binaries, highp
 const Device WEAK_DEVICES[9] = {
-    {"128 vertex uniform vectors", 128, 0, true, true, true, true, true, true},
-    {"8 texture units", 0, 8, true, true, true, true, true, true},
-    {"no NPOT textures", 0, 0, false, true, true, true, true, true},
-    {"no ETC1", 0, 0, true, false, true, true, true, true},
-    {"no packed depth and stencil", 0, 0, true, true, false, true, true, true},
-    {"no depth textures", 0, 0, true, true, true, false, true, true},
-    {"no program binaries", 0, 0, true, true, true, true, false, true},
-    {"no highp in fragments", 0, 0, true, true, true, true, true, false},
-    {"none of these", 128, 8, false, false, false, false, false, false},
+    {.name = "128 vertex uniform vectors", .vertexUniformVectors = 128},
+    {.name = "8 texture units", .textureUnits = 8},
+    {.name = "no NPOT textures", .hasNpotTextures = false},
+    {.name = "no ETC1", .hasEtc1 = false},
+    {.name = "no packed depth and stencil", .hasPackedDepthStencil = false},
+    {.name = "no depth textures", .hasDepthTextures = false},
+    {.name = "no program binaries", .hasProgramBinaries = false},
+    {.name = "no highp in fragments", .hasFragmentHighp = false},
+    {.name = "none of these",
+     .vertexUniformVectors = 128,
+     .textureUnits = 8,
+     .hasNpotTextures = false,
+     .hasEtc1 = false,
+     .hasPackedDepthStencil = false,
+     .hasDepthTextures = false,
+     .hasProgramBinaries = false,
+     .hasFragmentHighp = false},
 };
 
 namespace

@@ -16,7 +16,7 @@ SceneNodePositionAnimator::~SceneNodePositionAnimator() = default;
 
 void SceneNodePositionAnimator::apply(const Vector3f& position)
 {
-    if (SceneNode* node = m_node.operator->())
+    if (SceneNode* node = m_node.getLogged())
         node->setPosition(position);
 }
 
@@ -26,7 +26,7 @@ SceneNodeRotationAnimator::~SceneNodeRotationAnimator() = default;
 
 void SceneNodeRotationAnimator::apply(const Vector4f& axisAngle)
 {
-    if (SceneNode* node = m_node.operator->())
+    if (SceneNode* node = m_node.getLogged())
         node->setRotation(quaternionFromAxisAngle(axisAngle.xyz(), Anglef::fromRadians(axisAngle.w)));
 }
 
@@ -42,7 +42,7 @@ void SceneNodeScaleAnimator::apply(const Vector3f& scale)
 {
     if (scale == m_lastScale)
         return;
-    SceneNode* node = m_node.operator->();
+    SceneNode* node = m_node.getLogged();
     if (!node)
         return;
     node->setScale(scale);
@@ -55,7 +55,7 @@ LightColourAnimator::~LightColourAnimator() = default;
 
 void LightColourAnimator::apply(const Colour4f& colour)
 {
-    if (Light* light = m_light.operator->())
+    if (Light* light = m_light.getLogged())
         light->setColour(colour);
 }
 
@@ -65,7 +65,7 @@ LightIntensityAnimator::~LightIntensityAnimator() = default;
 
 void LightIntensityAnimator::apply(const float& intensity)
 {
-    if (Light* light = m_light.operator->())
+    if (Light* light = m_light.getLogged())
         light->setIntensity(intensity);
 }
 

@@ -75,6 +75,8 @@ public:
     void swap(SharedPtr& other) noexcept { std::swap(m_ptr, other.m_ptr); }
 
     T* get() const { return m_ptr; }
+    /// The same; null is logged, as by the operators.
+    T* getLogged() const { return operator->(); }
     explicit operator bool() const { return m_ptr != nullptr; }
 
     T* operator->() const

@@ -45,7 +45,7 @@ bool AssetPath::remove(const char* name)
         return false;
     for (std::size_t i = 0; i < m_sources.size(); ++i)
     {
-        const StreamSource* source = m_sources[i].operator->(); // logs an empty one
+        const StreamSource* source = m_sources[i].getLogged();
         if (!source || std::string_view(source->getName()) != name)
             continue;
         m_sources.erase(m_sources.begin() + std::ptrdiff_t(i));
@@ -62,7 +62,7 @@ SharedPtr<Stream> AssetPath::find(const char* name) const
     for (std::size_t i = 0; i < m_sources.size(); ++i)
     {
         const SharedPtr<StreamSource> entry = m_sources[i];
-        StreamSource* source = entry.operator->(); // logs an empty one
+        StreamSource* source = entry.getLogged();
         if (source && source->exists(name))
             return source->open(name, false);
     }

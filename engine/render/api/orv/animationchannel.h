@@ -25,21 +25,21 @@ public:
 
     void apply(float progress) override
     {
-        Animator<T>* animator = m_animator.operator->(); // logs when there is none
-        const AnimatedValue<T>* value = m_value.operator->();
+        Animator<T>* animator = m_animator.getLogged();
+        const AnimatedValue<T>* value = m_value.getLogged();
         if (animator && value)
             animator->apply(value->getValue(progress));
     }
 
     float getStart() const override
     {
-        const AnimatedValue<T>* value = m_value.operator->();
+        const AnimatedValue<T>* value = m_value.getLogged();
         return value ? value->getStart() : 0.0f;
     }
 
     float getEnd() const override
     {
-        const AnimatedValue<T>* value = m_value.operator->();
+        const AnimatedValue<T>* value = m_value.getLogged();
         return value ? value->getEnd() : 0.0f;
     }
 
