@@ -2,11 +2,13 @@
 #include "view/companions.h"
 #include "view/compare.h"
 #include "view/fontsearch.h"
+#include "view/keys.h"
 #include "view/orbit.h"
 #include "view/picker.h"
 #include "view/player.h"
 #include "view/scenemeshes.h"
 #include "view/watcher.h"
+#include "window/window.h"
 
 #include "orv/animation.h"
 #include "orv/appearance.h"
@@ -14,8 +16,11 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <cmath>
+#include <fstream>
 #include <functional>
+#include <iterator>
 
 using orv::makeShared;
 using orv::Vector3f;
@@ -415,4 +420,19 @@ TEST(ViewFonts, takeTheBestKnownOne)
     folder.write("b/Unheard.ttf", "");
     const std::string best = folder.write("a/c/LiberationSans-Regular.ttf", "");
     EXPECT_EQ(best, view::findFont({folder.path("missing"), folder.path()}));
+}
+
+// Faults caught: a key that the page or the window tells about and that does nothing, or that neither tells about.
+TEST(ViewKeys, thePageListsWhatTheWindowShows)
+{
+    std::ifstream file(ORV_SOURCE_FOLDER "/docs/view.md");
+    std::string page((std::istreambuf_iterator<char>(file)), {});
+    page.erase(std::remove(page.begin(), page.end(), '`'), page.end());
+    for (const view::HeadsUp::Row& row : view::listKeys())
+        EXPECT_NE(std::string::npos, page.find(std::string("| ") + row.left + " | " + row.right + " |"))
+            << row.left;
+
+    EXPECT_EQ(view::Command::SEEK_TENTH, view::findCommand('7'));
+    EXPECT_EQ(view::Command::QUIT, view::findCommand(window::key::ESCAPE));
+    EXPECT_EQ(view::Command::NONE, view::findCommand('x'));
 }

@@ -1,11 +1,11 @@
 #pragma once
 
 #include "conversion.h"
+#include "eyecontrol.h"
 #include "framestats.h"
 #include "headsup.h"
 #include "livescene.h"
 #include "options.h"
-#include "orbit.h"
 
 #include "window/window.h"
 
@@ -50,14 +50,12 @@ private:
     void handleKey(int32_t key, bool shift);
     void handlePress(const window::Event& event);
     void handleMove(const window::Event& event);
-    Orbit findView();
+    void toggleKeys();
     void frameAll();
-    void lookCloser(float x, float y);
     void stepClip(int count);
     void stepCamera(int count);
-    void leaveFileCamera();
     void stepBackground();
-    void saveScreenshot(bool withHeadsUp);
+    void savePicture(bool withHeadsUp);
 
     bool isMoving() const;
     void advance();
@@ -66,15 +64,13 @@ private:
     void pick();
     void say(const std::string& message);
     void writeHeadsUp();
-    std::string describePlace() const;
 
     const Options& m_options;
     Conversion* m_conversion;
     std::unique_ptr<window::Window> m_window;
     std::unique_ptr<LiveScene> m_scene;
     std::unique_ptr<HeadsUp> m_headsUp; ///< null without a font
-    Orbit m_orbit;
-    int m_camera = -1; ///< of the file; -1 for the free one
+    EyeControl m_eye;
     size_t m_background = 0;
 
     FrameStats m_stats;

@@ -1,0 +1,89 @@
+#include "keys.h"
+
+#include "window/window.h"
+
+#include <algorithm>
+
+namespace view
+{
+
+namespace
+{
+
+using namespace window;
+
+constexpr HeadsUp::Row MOUSE[] = {
+    {"left button", "turn"},
+    {"right or middle button, shift + left", "move"},
+    {"wheel", "nearer and farther"},
+    {"double click", "look at what is there from closer"},
+};
+
+struct Binding
+{
+    Command command;
+    std::vector<int32_t> keys;
+};
+
+/// Keys that are told about in one row.
+struct Group
+{
+    HeadsUp::Row row;
+    std::vector<Binding> bindings;
+};
+
+const std::vector<Group>& getGroups()
+{
+    static const std::vector<Group> GROUPS = {
+        {{"f", "the whole scene"}, {{Command::FRAME_ALL, {'f'}}}},
+        {{"c, shift + c", "next and previous camera of the file, and the free one"},
+         {{Command::STEP_CAMERA, {'c'}}}},
+        {{"space", "play and pause"}, {{Command::TOGGLE_PAUSED, {' '}}}},
+        {{". ,", "one frame (1/30 s) on and back"},
+         {{Command::FRAME_ON, {'.'}}, {Command::FRAME_BACK, {','}}}},
+        {{"right, left", "a twentieth of the clip on and back"},
+         {{Command::SKIP_ON, {key::RIGHT}}, {Command::SKIP_BACK, {key::LEFT}}}},
+        {{"home, end, 0 to 9", "its start, its end, that tenth of it"},
+         {{Command::SEEK_START, {key::HOME}},
+          {Command::SEEK_END, {key::END}},
+          {Command::SEEK_TENTH, {'0', '1', '2', '3', '4', '5', '6', '7', '8', '9'}}}},
+        {{"+ -", "twice and half as fast"},
+         {{Command::FASTER, {'+', '=', key::KEYPAD_PLUS}}, // = where the + is on the same key
+          {Command::SLOWER, {'-', key::KEYPAD_MINUS}}}},
+        {{"l", "loop, or stop at the end"}, {{Command::TOGGLE_LOOPING, {'l'}}}},
+        {{"n, shift + n", "next and previous clip"}, {{Command::STEP_CLIP, {'n'}}}},
+        {{"s, shift + s", "save a picture in the current folder, without and with what is written over it"},
+         {{Command::SAVE_SCREENSHOT, {'s'}}}},
+        {{"b", "next background"}, {{Command::STEP_BACKGROUND, {'b'}}}},
+        {{"i", "the writing on and off"}, {{Command::TOGGLE_LINES, {'i'}}}},
+        {{"r", "load again (happens by itself when a file changes)"}, {{Command::RELOAD, {'r'}}}},
+        {{"h", "these keys"}, {{Command::TOGGLE_KEYS, {'h', key::F1}}}},
+        {{"q, escape", "leave"}, {{Command::QUIT, {'q', key::ESCAPE}}}},
+    };
+    return GROUPS;
+}
+
+} // namespace
+
+Command findCommand(int32_t key)
+{
+    for (const Group& group : getGroups())
+    {
+        for (const Binding& binding : group.bindings)
+        {
+            if (std::find(binding.keys.begin(), binding.keys.end(), key) != binding.keys.end())
+                return binding.command;
+        }
+    }
+    return Command::NONE;
+}
+
+std::vector<HeadsUp::Row> listKeys()
+{
+    std::vector<HeadsUp::Row> rows(std::begin(MOUSE), std::end(MOUSE));
+    for (const Group& group : getGroups())
+        rows.push_back(group.row);
+    return rows;
+}
+
+} // namespace view
