@@ -438,7 +438,11 @@ TEST_F(GltfReader, scenesHoldWhatTheFileHas)
          {"extensions",
           {{"EXT_mesh_gpu_instancing", {{"attributes", {{"TRANSLATION", places}, {"ROTATION", turns}}}}}}}},
         {{"name", "hidden"}, {"mesh", 0}, {"extensions", {{"KHR_node_visibility", {{"visible", false}}}}}},
-        {{"name", "many"}, {"camera", 0}, {"extensions", {{"KHR_lights_punctual", {{"light", 0}}}}}}};
+        {{"name", "many"},
+         {"rotation", {0, 0, 1, 1}},
+         {"scale", {2, 3, 4}},
+         {"camera", 0},
+         {"extensions", {{"KHR_lights_punctual", {{"light", 0}}}}}}};
     writer.file["cameras"] = {
         {{"type", "perspective"}, {"perspective", {{"yfov", 1.0}, {"aspectRatio", 2.0}, {"znear", 0.5}}}}};
     writer.file["extensions"]["KHR_lights_punctual"]["lights"] = {{{"type", "spot"},

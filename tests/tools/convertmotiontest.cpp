@@ -3,6 +3,7 @@
 #include "convert/filegate.h"
 #include "convert/model.h"
 #include "convert/modelfiles.h"
+#include "convert/placement.h"
 
 #include "orv/animationgroup.h"
 #include "orv/camera.h"
@@ -108,9 +109,9 @@ private:
         {
             const aiNodeAnim& channel = *m_clip->mChannels[i];
             if (m_scene->mRootNode->FindNode(channel.mNodeName) == &node)
-                return aiMatrix4x4(evaluate(channel.mScalingKeys, channel.mNumScalingKeys),
-                                   evaluate(channel.mRotationKeys, channel.mNumRotationKeys),
-                                   evaluate(channel.mPositionKeys, channel.mNumPositionKeys));
+                return convert::compose(evaluate(channel.mPositionKeys, channel.mNumPositionKeys),
+                                        evaluate(channel.mRotationKeys, channel.mNumRotationKeys),
+                                        evaluate(channel.mScalingKeys, channel.mNumScalingKeys));
         }
         return node.mTransformation;
     }

@@ -78,6 +78,15 @@ Vector4f toAxisAngle(const aiQuaternion& rotation)
     return Vector4f(toVector(part / length), 2.0f * std::atan2(length, float(rotation.w) * sign));
 }
 
+aiMatrix4x4 compose(const aiVector3D& translation, const aiQuaternion& rotation, const aiVector3D& scale)
+{
+    aiMatrix4x4 move;
+    aiMatrix4x4 stretch;
+    aiMatrix4x4::Translation(translation, move);
+    aiMatrix4x4::Scaling(scale, stretch);
+    return move * aiMatrix4x4(rotation.GetMatrix()) * stretch;
+}
+
 bool place(glo::NodeData& node, const aiMatrix4x4& transform)
 {
     const aiMatrix4x4& m = transform;

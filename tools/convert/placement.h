@@ -14,6 +14,9 @@ orv::Vector3f toVector(const aiVector3D& v);
 
 orv::Matrix4f toMatrix(const aiMatrix4x4& m);
 
+/// Scales, then turns, then moves. (The constructor of libassimp's matrix turns first and scales then.)
+aiMatrix4x4 compose(const aiVector3D& translation, const aiQuaternion& rotation, const aiVector3D& scale);
+
 /// Gives a node the transform, as a matrix and in components, which take over when one of them is set.
 /// @return false if components cannot hold it, but for rounding (it shears); the node gets what is nearest.
 bool place(glo::NodeData& node, const aiMatrix4x4& transform);

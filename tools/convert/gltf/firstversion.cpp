@@ -1,5 +1,7 @@
 #include "firstversion.h"
 
+#include "../placement.h"
+
 #include <assimp/camera.h>
 #include <assimp/light.h>
 #include <assimp/scene.h>
@@ -24,8 +26,8 @@ void composeNode(aiNode& target, const Object& node)
     node.numbers("rotation", r);
     node.numbers("scale", s);
     if (hasTranslation)
-        target.mTransformation = aiMatrix4x4(
-            aiVector3D(s[0], s[1], s[2]), aiQuaternion(r[3], r[0], r[1], r[2]), aiVector3D(t[0], t[1], t[2]));
+        target.mTransformation = compose(aiVector3D(t[0], t[1], t[2]), aiQuaternion(r[3], r[0], r[1], r[2]),
+                                         aiVector3D(s[0], s[1], s[2]));
 }
 
 void correctViews(aiScene& scene)

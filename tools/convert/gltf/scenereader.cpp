@@ -8,6 +8,7 @@
 #include "views.h"
 
 #include "../names.h"
+#include "../placement.h"
 #include "../progress.h"
 
 #include <assimp/scene.h>
@@ -60,7 +61,7 @@ aiMatrix4x4 readTransform(const Object& node)
     aiQuaternion rotation(r[3], r[0], r[1], r[2]);
     if (r[0] != 0.0f || r[1] != 0.0f || r[2] != 0.0f || r[3] != 0.0f)
         rotation.Normalize();
-    return aiMatrix4x4(aiVector3D(s[0], s[1], s[2]), rotation, aiVector3D(t[0], t[1], t[2]));
+    return compose(aiVector3D(t[0], t[1], t[2]), rotation, aiVector3D(s[0], s[1], s[2]));
 }
 
 class SceneReader
@@ -246,7 +247,7 @@ private:
                 r = aiQuaternion(rotations[i][3], rotations[i][0], rotations[i][1], rotations[i][2]);
             if (i < scales.count())
                 s = aiVector3D(scales[i][0], scales[i][1], scales[i][2]);
-            made.emplace_back(s, r.Normalize(), t);
+            made.push_back(compose(t, r.Normalize(), s));
         }
         for (const std::string& name : attributes.keys())
         {
