@@ -1,5 +1,6 @@
 #include "importer.h"
 
+#include "fbxpivots.h"
 #include "figures.h"
 #include "gltf/firstversion.h"
 #include "gltf/reader.h"
@@ -178,6 +179,8 @@ bool importOther(const std::string& path, ModelFiles& files, const Options& opti
     reportSkeletonBody(scene, report);
     if (scene.mRootNode->mName == aiString("<MDL_root>"))
         correctHalfLife(scene, path, files);
+    if (contains(format, "FBX"))
+        correctFbx(scene, report);
     if (contains(format, "3DS"))
         reportCameras(scene, report);
     dropLostJoints(scene, report);
