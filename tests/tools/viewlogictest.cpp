@@ -432,7 +432,7 @@ TEST(ViewKeys, thePageListsWhatTheWindowShows)
         EXPECT_NE(std::string::npos, page.find(std::string("| ") + row.left + " | " + row.right + " |"))
             << row.left;
 
-    EXPECT_EQ(view::Command::SEEK_TENTH, view::findCommand('7'));
+    EXPECT_EQ(view::Command::GO_TO_TENTH, view::findCommand('7'));
     EXPECT_EQ(view::Command::QUIT, view::findCommand(window::key::ESCAPE));
     EXPECT_EQ(view::Command::NONE, view::findCommand('x'));
 }

@@ -44,9 +44,9 @@ const std::vector<Group>& getGroups()
         {{"right, left", "a twentieth of the clip on and back"},
          {{Command::SKIP_ON, {key::RIGHT}}, {Command::SKIP_BACK, {key::LEFT}}}},
         {{"home, end, 0 to 9", "its start, its end, that tenth of it"},
-         {{Command::SEEK_START, {key::HOME}},
-          {Command::SEEK_END, {key::END}},
-          {Command::SEEK_TENTH, {'0', '1', '2', '3', '4', '5', '6', '7', '8', '9'}}}},
+         {{Command::GO_TO_START, {key::HOME}},
+          {Command::GO_TO_END, {key::END}},
+          {Command::GO_TO_TENTH, {'0', '1', '2', '3', '4', '5', '6', '7', '8', '9'}}}},
         {{"+ -", "twice and half as fast"},
          {{Command::FASTER, {'+', '=', key::KEYPAD_PLUS}}, // = where the + is on the same key
           {Command::SLOWER, {'-', key::KEYPAD_MINUS}}}},

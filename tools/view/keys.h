@@ -19,9 +19,9 @@ enum class Command
     FRAME_BACK,
     SKIP_ON,
     SKIP_BACK,
-    SEEK_START,
-    SEEK_END,
-    SEEK_TENTH, ///< by the digit
+    GO_TO_START,
+    GO_TO_END,
+    GO_TO_TENTH, ///< by the digit
     FASTER,
     SLOWER,
     TOGGLE_LOOPING,

@@ -163,9 +163,9 @@ void Viewer::handleKey(int32_t key, bool shift)
     case Command::FRAME_BACK: getPlayer().step(-1); break;
     case Command::SKIP_ON: getPlayer().skip(length * SKIP_SHARE); break;
     case Command::SKIP_BACK: getPlayer().skip(-length * SKIP_SHARE); break;
-    case Command::SEEK_START: getPlayer().seekShare(0.0f); break;
-    case Command::SEEK_END: getPlayer().seekShare(1.0f); break;
-    case Command::SEEK_TENTH: getPlayer().seekShare(float(key - '0') / 10.0f); break;
+    case Command::GO_TO_START: getPlayer().seekShare(0.0f); break;
+    case Command::GO_TO_END: getPlayer().seekShare(1.0f); break;
+    case Command::GO_TO_TENTH: getPlayer().seekShare(float(key - '0') / 10.0f); break;
     case Command::FASTER: getPlayer().scaleSpeed(2.0f); break;
     case Command::SLOWER: getPlayer().scaleSpeed(0.5f); break;
     case Command::TOGGLE_LOOPING: getPlayer().setLooping(!getPlayer().isLooping()); break;
