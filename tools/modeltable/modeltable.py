@@ -16,6 +16,7 @@ import sys
 import tempfile
 
 SECONDS = 120  # for one file; the converter's own limit is lower
+MARKER = "<!-- ./run gltfmodels writes what follows -->"  # and this program leaves it
 GROUPS = ("converted", "refused", "unread", "FAILED")
 MEANINGS = {
     "converted": "converted",
@@ -76,6 +77,10 @@ def write_page(page, rows):
     formats = {}
     for model, (group, remark) in rows:
         formats.setdefault(model.split(os.sep)[0], []).append((model, group, remark))
+    others = ""
+    if os.path.exists(page):
+        with open(page, encoding="utf-8") as file:
+            others = "".join(file.read().partition(MARKER)[1:])
     with open(page, "w", encoding="utf-8") as file:
         out = lambda text="": file.write(text + "\n")
         out("# What becomes of other people's models")
@@ -102,6 +107,8 @@ def write_page(page, rows):
             for model, group, remark in models:
                 cells = (os.path.relpath(model, name), MEANINGS[group], remark)
                 out("| %s | %s | %s |" % tuple(cell.replace("|", "\\|").replace("<", "&lt;") for cell in cells))
+        if others:
+            file.write("\n" + others)
     return totals
 
 
