@@ -420,6 +420,10 @@ TEST_F(GltfReader, animationsMoveAsTheFileHasThem)
     EXPECT_EQ(2.0f, channel.mScalingKeys[2].mValue.x);
     ASSERT_EQ(2u, channel.mNumRotationKeys);
     EXPECT_NEAR(0.70710678f, channel.mRotationKeys[1].mValue.y, 1e-4f);
+
+    writer.file["animations"][0]["samplers"][0]["output"] = steps; // fewer values than a curve needs
+    EXPECT_EQ(0u, read(writer.write()).mAnimations[0]->mChannels[0]->mNumPositionKeys);
+    EXPECT_TRUE(isLost("animation-target"));
 }
 
 // Fault caught: instances, hidden nodes, lights and cameras that get lost, or scenes that get mixed.

@@ -174,7 +174,7 @@ public:
         m_made->mName = aiString(m_animation.has("name") ? getName(m_animation) : "");
         m_made->mTicksPerSecond = 1.0;
         for (size_t i = 0; i < m_animation.length("channels"); ++i)
-            readChannel(m_animation.at("channels", i));
+            readOrLose(m_animation.at("channels", i));
         std::vector<aiNodeAnim*> channels;
         for (const auto& [node, movement] : m_movements)
             channels.push_back(toChannel(m_nodeNames[node], movement));
@@ -185,6 +185,19 @@ public:
     }
 
 private:
+    /// A model that lacks a movement is better than none.
+    void readOrLose(const Object& channel)
+    {
+        try
+        {
+            readChannel(channel);
+        }
+        catch (const Fault& fault)
+        {
+            loseTarget(std::string("a movement that is damaged: ") + fault.what());
+        }
+    }
+
     void readChannel(const Object& channel)
     {
         const Object target = channel.object("target");

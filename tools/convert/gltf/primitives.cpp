@@ -224,8 +224,8 @@ private:
     {
         for (unsigned channel = 0; channel < AI_MAX_NUMBER_OF_TEXTURECOORDS; ++channel)
         {
-            const Column column = readAttribute(numbered("TEXCOORD", channel), 2);
-            if (column.components == 0)
+            const Column column = readAttribute(numbered("TEXCOORD", channel), 0);
+            if (column.components < 2) // some programs write three
                 continue;
             const bool isMoved = channel == m_use.placing.channel && !m_use.placing.movesNothing();
             m_mesh->mNumUVComponents[channel] = 2;
