@@ -1,11 +1,14 @@
 #include "converttest.h"
 
+#include "headless/png.h"
+
 #include "orv/animationgroup.h"
 #include "orv/camera.h"
 #include "orv/light.h"
 #include "orv/mesh.h"
 #include "orv/solid.h"
 
+#include <algorithm>
 #include <cmath>
 
 using namespace orv;
@@ -170,5 +173,90 @@ TEST_F(ConvertTest, realModels)
         EXPECT_EQ(item.cameras, loaded->getCameraCount()) << item.file;
         EXPECT_EQ(item.animations, loaded->getAnimationCount()) << item.file;
         EXPECT_TRUE(reports(item.report)) << m_outcome.output;
+    }
+}
+
+namespace
+{
+
+void append(std::vector<uint8_t>& bytes, const std::vector<uint8_t>& more)
+{
+    bytes.insert(bytes.end(), more.begin(), more.end());
+}
+
+std::vector<uint8_t> words(const std::vector<int32_t>& values)
+{
+    const uint8_t* bytes = reinterpret_cast<const uint8_t*>(values.data());
+    return std::vector<uint8_t>(bytes, bytes + values.size() * sizeof(int32_t));
+}
+
+/// A chunk of a B3D file.
+std::vector<uint8_t> chunk(const char* name, const std::vector<std::vector<uint8_t>>& parts)
+{
+    std::vector<uint8_t> content;
+    for (const std::vector<uint8_t>& part : parts)
+        append(content, part);
+    std::vector<uint8_t> made(name, name + 4);
+    append(made, words({int32_t(content.size())}));
+    append(made, content);
+    return made;
+}
+
+/// A triangle and its bone, which moves from frame 1 to frame 11 of ten: frames count from 1 there.
+std::vector<uint8_t> makeB3d()
+{
+    const std::vector<uint8_t> place = toBytes({0, 0, 0, 1, 1, 1, 1, 0, 0, 0});
+    const auto mesh =
+        chunk("MESH", {words({-1}), chunk("VRTS", {words({0, 0, 0}), toBytes({0, 0, 0, 1, 0, 0, 0, 1, 0})}),
+                       chunk("TRIS", {words({0, 0, 1, 2})})});
+    const auto bone =
+        chunk("BONE", {words({0}), toBytes({1}), words({1}), toBytes({1}), words({2}), toBytes({1})});
+    const auto keys = chunk("KEYS", {words({1, 1}), toBytes({1, 0, 0}), words({11}), toBytes({11, 0, 0})});
+    const auto joint = chunk("NODE", {{'j', 0}, place, bone, keys});
+    const auto anim = chunk("ANIM", {words({0, 10}), toBytes({10.0f})});
+    return chunk("BB3D", {words({1}), chunk("TEXS", {}),
+                          chunk("BRUS", {words({0}), {'m', 0}, toBytes({1, 1, 1, 1, 0}), words({0, 0})}),
+                          chunk("NODE", {{'f', 0}, place, mesh, anim, joint})});
+}
+
+} // namespace
+
+// Fault caught: sound files that are refused because a library finds something to say of them, files that come out empty
+// without a word, and pictures that lie otherwise than their material library has them.
+TEST_F(ConvertTest, otherFormats)
+{
+    m_folder.write("figure.b3d", makeB3d());
+    m_folder.write("mixed.obj", std::string("v 0 0 0\nv 1 0 0\nv 0 1 0\nf 1 2 3\nf 1 2\n"));
+    m_folder.write("flat.obj", std::string("v 0 0 0\nv 1 0 0\nv 2 0 0\nf 1 2 3\nf 2 1 3\n"));
+    std::string error;
+    const std::vector<uint8_t> white(4 * 4 * 4, 255);
+    ASSERT_TRUE(headless::writePng(m_folder.path("a.png"), 4, 4, white.data(), error)) << error;
+    m_folder.write("m.mtl", std::string("newmtl m\nmap_Kd -s 2 3 1 -o 0.5 0.25 a.png\n"));
+    m_folder.write("placed.obj",
+                   std::string("mtllib m.mtl\nv 0 0 0\nv 1 0 0\nv 0 1 0\nvt 0 0\nvt 1 0\nvt 0 1\n"
+                               "usemtl m\nf 1/1 2/2 3/3\n"));
+    const struct
+    {
+        const char* file;
+        int exitCode;
+        const char* said;
+    } cases[] = {
+        {"figure.b3d", 0, "from 0.00 to 1.10 seconds"},
+        {"mixed.obj", 0, "1 triangle, 1 line"},
+        {"flat.obj", 1, "orv-convert: flat.obj: nothing that can be drawn is left: 2 faces without area"},
+        {"placed.obj", 0, "out-a.png"},
+    };
+    for (const auto& item : cases)
+    {
+        const Outcome outcome = convert(item.file + std::string(" out.glo"));
+        EXPECT_EQ(item.exitCode, outcome.exitCode) << outcome.output;
+        EXPECT_NE(std::string::npos, outcome.output.find(item.said)) << outcome.output;
+    }
+    const std::vector<uint8_t> scene = support::readFile(m_folder.path("out.glo"));
+    for (const std::vector<float>& uv : {std::vector<float>{0.5f, 0.25f}, {2.5f, 0.25f}, {0.5f, 3.25f}})
+    {
+        const std::vector<uint8_t> wanted = toBytes(uv);
+        EXPECT_NE(scene.end(), std::search(scene.begin(), scene.end(), wanted.begin(), wanted.end()))
+            << uv[1];
     }
 }

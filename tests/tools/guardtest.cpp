@@ -9,6 +9,7 @@
 #include <gtest/gtest.h>
 
 #include <csignal>
+#include <cstdlib>
 
 #include <fcntl.h>
 #include <sys/socket.h>
@@ -18,6 +19,25 @@
 
 using convert::Limits;
 using convert::ModelFiles;
+
+// Fault caught: what a library says when it dies, beside the one line that this program has for it.
+TEST(Guard, passesOnNothingThatTheChildSays)
+{
+    if (!convert::CAN_LIMIT_MEMORY)
+        GTEST_SKIP() << "checks of addresses are to be heard";
+    convert::FileGate gate("model");
+    const auto dies = [](std::FILE*, ModelFiles&) -> bool
+    {
+        std::fputs("free(): invalid pointer\n", stderr);
+        std::abort();
+    };
+    std::string error;
+    testing::internal::CaptureStderr();
+    EXPECT_FALSE(convert::runGuarded(
+        {60.0, 0}, "model.3mf", gate, dies, [](std::FILE*) { return true; }, error));
+    EXPECT_EQ("", testing::internal::GetCapturedStderr());
+    EXPECT_NE(std::string::npos, error.find("known to crash on some sound 3MF files")) << error;
+}
 
 // Memory is up to the test of the program: this one counts allocations, and does not ask the handler.
 //

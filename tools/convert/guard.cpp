@@ -2,7 +2,9 @@
 
 #include "confinement.h"
 #include "filegate.h"
+#include "lowercase.h"
 #include "modelfiles.h"
+#include "progress.h"
 #include "sanitizers.h"
 
 #include <algorithm>
@@ -108,6 +110,26 @@ void closeOthers(std::vector<unsigned> kept)
     close_range(first, UINT_MAX, 0);
 }
 
+/// Bytes that this process takes up: the program and its libraries, before any work.
+uint64_t getAddressSpace()
+{
+    unsigned long pages = 0;
+    const File file(std::fopen("/proc/self/statm", "r"));
+    return file && std::fscanf(file.get(), "%lu", &pages) == 1 ? pages * uint64_t(sysconf(_SC_PAGESIZE)) : 0;
+}
+
+/// What libraries say when they die is no message for people; this process's parent has one. Checks of addresses, though,
+/// are to be heard.
+/// @return the descriptor by which progress is still shown; -1 for none.
+int silence()
+{
+    const int progress = moveProgress();
+    const int nowhere = CAN_LIMIT_MEMORY ? open("/dev/null", O_WRONLY | O_CLOEXEC) : -1;
+    if (nowhere >= 0)
+        dup2(nowhere, STDERR_FILENO);
+    return progress;
+}
+
 [[noreturn]] void runChild(const Limits& limits, const Work& work, const std::string& model, Link& link,
                            pid_t parent)
 {
@@ -116,10 +138,11 @@ void closeOthers(std::vector<unsigned> kept)
         _exit(INCOMPLETE); // it ended before the line above
     setLimit(RLIMIT_CORE, 0);
     if (CAN_LIMIT_MEMORY && limits.mebibytes > 0)
-        setLimit(RLIMIT_AS, limits.mebibytes << 20);
+        setLimit(RLIMIT_AS, getAddressSpace() + (limits.mebibytes << 20));
+    const int progress = silence();
     std::FILE* handover = link.handover.get();
     closeOthers({unsigned(fileno(handover)), unsigned(link.life[1]), unsigned(link.files[1]),
-                 unsigned(link.complaints[1])});
+                 unsigned(link.complaints[1]), unsigned(progress < 0 ? STDERR_FILENO : progress)});
     ModelFiles files(model, link.files[1]);
     std::string error;
     if (!confine(link.files[1], error) &&
@@ -172,7 +195,14 @@ bool serveUntilEnd(const Link& link, FileGate& gate, double seconds)
     }
 }
 
-std::string describe(int status, const Limits& limits)
+/// What is known of libassimp's reader of a format.
+std::string getKnownFault(const std::string& model)
+{
+    const std::string extension = toLowerCase(model.substr(model.find_last_of('.') + 1));
+    return extension == "3mf" ? "; libassimp 5.2 is known to crash on some sound 3MF files" : "";
+}
+
+std::string describe(int status, const std::string& model, const Limits& limits)
 {
     if (WIFSIGNALED(status) && WTERMSIG(status) == SIGKILL)
         return "the conversion was killed, as systems do that run out of memory";
@@ -181,7 +211,7 @@ std::string describe(int status, const Limits& limits)
         const int signal = WTERMSIG(status);
         const char* name = sigabbrev_np(signal);
         return std::string("the conversion crashed (SIG") + (name ? name : std::to_string(signal).c_str()) +
-               "); the file is damaged, or the importer is at fault";
+               "); the file is damaged, or the importer is at fault" + getKnownFault(model);
     }
     if (WEXITSTATUS(status) != OUT_OF_MEMORY)
         return "the conversion ended early (exit code " + std::to_string(WEXITSTATUS(status)) + ")";
@@ -199,7 +229,8 @@ std::string describeTimeout(double seconds)
 }
 
 /// @return whether the child has done its work.
-bool supervise(pid_t child, const Link& link, FileGate& gate, const Limits& limits, std::string& error)
+bool supervise(pid_t child, const std::string& model, const Link& link, FileGate& gate, const Limits& limits,
+               std::string& error)
 {
     complainOnce(link.complaints[0]);
     const bool inTime = serveUntilEnd(link, gate, limits.seconds);
@@ -211,7 +242,7 @@ bool supervise(pid_t child, const Link& link, FileGate& gate, const Limits& limi
     if (!inTime)
         error = describeTimeout(limits.seconds);
     else if (status != 0)
-        error = describe(status, limits);
+        error = describe(status, model, limits);
     return inTime && status == 0;
 }
 
@@ -232,8 +263,8 @@ bool runGuarded(const Limits& limits, const std::string& model, FileGate& gate, 
         runChild(limits, work, model, link, parent);
     for (Connection* connection : {&link.life, &link.files, &link.complaints})
         connection->closeEnd(1);
-    const bool done =
-        child > 0 ? supervise(child, link, gate, limits, error) : failWithErrno("no child process", error);
+    const bool done = child > 0 ? supervise(child, model, link, gate, limits, error)
+                                : failWithErrno("no child process", error);
     if (!done)
         return false;
     std::rewind(link.handover.get());

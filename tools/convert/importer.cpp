@@ -8,6 +8,7 @@
 #include "mending.h"
 #include "modelfiles.h"
 #include "modelio.h"
+#include "objoptions.h"
 #include "progress.h"
 
 #include <assimp/config.h>
@@ -153,6 +154,42 @@ gltf::Opened openGltf(const std::string& path, ModelFiles& files, const Assimp::
     return gltf::openGltf(std::move(bytes), path);
 }
 
+/// The importer's own scene, held nowhere else.
+aiScene& getOwn(const ImportedModel& model)
+{
+    return const_cast<aiScene&>(*model.scene); // NOLINT(cppcoreguidelines-pro-type-const-cast)
+}
+
+bool readByLibrary(const std::string& path, const gltf::Opened& opened, ImportedModel& model, Report& report,
+                   std::string& error)
+{
+    model.scene = model.importer.ReadFile(path, 0);
+    if (!model.scene)
+        return fail(model.importer.GetErrorString(), error);
+    aiScene& scene = getOwn(model);
+    if (scene.mRootNode && opened.kind == gltf::Opened::Kind::FIRST)
+        gltf::correctFirstVersion(scene, opened.document.get(), report);
+    if (scene.mRootNode)
+        mend(scene, report);
+    return (scene.mRootNode && scene.mNumMeshes > 0) || fail(NOTHING, error);
+}
+
+/// Reads, and looks for faults as far as libassimp can. It finds some with sound files and then throws away what it has
+/// read, so that such a file is read again.
+bool readAndValidate(const std::string& path, const gltf::Opened& opened, ImportedModel& model,
+                     Report& report, std::string& error)
+{
+    const Report before = report;
+    if (!readByLibrary(path, opened, model, report, error))
+        return false;
+    if (model.importer.ApplyPostProcessing(aiProcess_ValidateDataStructure))
+        return true;
+    const std::string finding = model.importer.GetErrorString();
+    report = before;
+    report.approximate("validation", "what libassimp finds fault with: " + finding);
+    return readByLibrary(path, opened, model, report, error);
+}
+
 bool importOther(const std::string& path, ModelFiles& files, const Options& options,
                  const gltf::Opened& opened, ImportedModel& model, Report& report, std::string& error)
 {
@@ -160,20 +197,10 @@ bool importOther(const std::string& path, ModelFiles& files, const Options& opti
     importer.SetIOHandler(new ModelIo(files));       // the importer's from now on
     importer.SetProgressHandler(new ImportProgress); // as well
     importer.SetPropertyBool(AI_CONFIG_IMPORT_COLLADA_IGNORE_UP_DIRECTION, !options.up.empty());
-    model.scene = importer.ReadFile(path, 0);
-    if (!model.scene)
-        return fail(importer.GetErrorString(), error);
-    // The importer's own, held nowhere else. NOLINTNEXTLINE(cppcoreguidelines-pro-type-const-cast)
-    aiScene& scene = const_cast<aiScene&>(*model.scene);
+    if (!readAndValidate(path, opened, model, report, error))
+        return false;
+    aiScene& scene = getOwn(model);
     const std::string format = getFormatName(importer);
-    if (scene.mRootNode && opened.kind == gltf::Opened::Kind::FIRST)
-        gltf::correctFirstVersion(scene, opened.document.get(), report);
-    if (scene.mRootNode)
-        mend(scene, report);
-    if (!scene.mRootNode || scene.mNumMeshes == 0)
-        return fail(NOTHING, error);
-    if (!importer.ApplyPostProcessing(aiProcess_ValidateDataStructure))
-        return fail(importer.GetErrorString(), error);
     report.setFormat(format);
     countModel(scene, report);
     reportSkeletonBody(scene, report);
@@ -181,6 +208,8 @@ bool importOther(const std::string& path, ModelFiles& files, const Options& opti
         correctHalfLife(scene, path, files);
     if (contains(format, "FBX"))
         correctFbx(scene, report);
+    if (contains(format, "Wavefront"))
+        correctObj(scene, path, files, report);
     if (contains(format, "3DS"))
         reportCameras(scene, report);
     dropLostJoints(scene, report);

@@ -72,19 +72,98 @@ void makePoints(aiMesh& mesh)
     mesh.mPrimitiveTypes = aiPrimitiveType_POINT;
 }
 
+/// Drops faces without corners or with corners that the mesh has not.
+/// @return false if no face is left of those that were there.
+bool dropBadFaces(aiMesh& mesh, Report& report)
+{
+    const auto isBad = [&](const aiFace& face)
+    {
+        return face.mNumIndices == 0 || !face.mIndices ||
+               std::any_of(face.mIndices, face.mIndices + face.mNumIndices,
+                           [&](unsigned index) { return index >= mesh.mNumVertices; });
+    };
+    unsigned kept = 0;
+    for (unsigned i = 0; i < mesh.mNumFaces; ++i)
+    {
+        if (isBad(mesh.mFaces[i]))
+            continue;
+        if (kept != i)
+            std::swap(mesh.mFaces[kept], mesh.mFaces[i]);
+        ++kept;
+    }
+    if (kept == mesh.mNumFaces)
+        return true;
+    report.lose("face", "faces of mesh \"" + std::string(mesh.mName.C_Str()) + "\" that are damaged");
+    mesh.mNumFaces = kept;
+    return kept > 0;
+}
+
+/// Some importers forget a kind of face of those that a mesh has.
+void nameKinds(aiMesh& mesh)
+{
+    for (unsigned i = 0; i < mesh.mNumFaces; ++i)
+        mesh.mPrimitiveTypes |= AI_PRIMITIVE_TYPE_FOR_N_INDICES(mesh.mFaces[i].mNumIndices);
+}
+
+/// A material for meshes that name none that there is.
+void giveMaterials(aiScene& scene)
+{
+    const unsigned count = scene.mNumMaterials;
+    for (unsigned i = 0; i < scene.mNumMeshes; ++i)
+    {
+        if (scene.mMeshes[i]->mMaterialIndex < count)
+            continue;
+        if (scene.mNumMaterials == count)
+        {
+            aiMaterial** materials = new aiMaterial*[count + 1];
+            std::copy(scene.mMaterials, scene.mMaterials + count, materials);
+            materials[count] = new aiMaterial;
+            delete[] scene.mMaterials;
+            scene.mMaterials = materials;
+            scene.mNumMaterials = count + 1;
+        }
+        scene.mMeshes[i]->mMaterialIndex = count;
+    }
+}
+
+/// @return the time of the last key.
+template <class Key>
+double sortKeys(Key* keys, unsigned count)
+{
+    const auto isEarlier = [](const Key& a, const Key& b) { return a.mTime < b.mTime; };
+    if (!std::is_sorted(keys, keys + count, isEarlier))
+        std::stable_sort(keys, keys + count, isEarlier);
+    return count > 0 ? keys[count - 1].mTime : 0.0;
+}
+
+/// Some importers hand over keys in the order of the file, or say that an animation ends before its last key.
+void sortKeys(aiAnimation& animation)
+{
+    for (unsigned i = 0; i < animation.mNumChannels; ++i)
+    {
+        aiNodeAnim& channel = *animation.mChannels[i];
+        const double last = std::max({sortKeys(channel.mPositionKeys, channel.mNumPositionKeys),
+                                      sortKeys(channel.mRotationKeys, channel.mNumRotationKeys),
+                                      sortKeys(channel.mScalingKeys, channel.mNumScalingKeys)});
+        animation.mDuration = std::max(animation.mDuration, last);
+    }
+}
+
 } // namespace
 
 void mend(aiScene& scene, Report& report)
 {
     forEachNode(*scene.mRootNode, dropNullChildren);
-    const std::vector<unsigned> numbers =
-        sift(scene.mMeshes, scene.mNumMeshes,
-             [](const aiMesh& mesh) { return mesh.mNumVertices > 0 && mesh.mVertices; });
+    const std::vector<unsigned> numbers = sift(
+        scene.mMeshes, scene.mNumMeshes,
+        [&](aiMesh& mesh) { return mesh.mNumVertices > 0 && mesh.mVertices && dropBadFaces(mesh, report); });
+    giveMaterials(scene);
     forEachNode(*scene.mRootNode, [&](aiNode& node) { renumberMeshes(node, numbers); });
     for (unsigned i = 0; i < scene.mNumMeshes; ++i)
     {
         if (scene.mMeshes[i]->mNumFaces == 0)
             makePoints(*scene.mMeshes[i]);
+        nameKinds(*scene.mMeshes[i]);
     }
     const auto hasNode = [&](const auto& thing)
     {
@@ -106,6 +185,8 @@ void mend(aiScene& scene, Report& report)
         return does;
     };
     sift(scene.mAnimations, scene.mNumAnimations, moves);
+    for (unsigned i = 0; i < scene.mNumAnimations; ++i)
+        sortKeys(*scene.mAnimations[i]);
 }
 
 } // namespace convert

@@ -319,6 +319,34 @@ private:
     std::set<const aiNode*> m_animated;
 };
 
+/// A number as people write it: "4,212".
+std::string group(uint64_t number)
+{
+    std::string text = std::to_string(number);
+    for (size_t at = text.size(); at > 3; at -= 3)
+        text.insert(at - 3, ",");
+    return text;
+}
+
+/// @param error  why there is nothing.
+bool hasSomethingToDraw(const ConvertedModel& model, std::string& error)
+{
+    for (const glo::Geometry& geometry : model.scene.geometries)
+    {
+        for (const glo::PrimitiveSet& set : geometry.primitiveSets)
+        {
+            if (set.indices && !set.indices->indices.empty())
+                return true;
+        }
+    }
+    const auto dropped = model.report.getFigures().find("degenerate-faces");
+    const uint64_t count = dropped != model.report.getFigures().end() ? dropped->second : 0;
+    error = "nothing that can be drawn is left";
+    if (count > 0)
+        error += ": " + group(count) + (count > 1 ? " faces" : " face") + " without area";
+    return false;
+}
+
 } // namespace
 
 bool convertModel(const std::string& path, ModelFiles& files, const std::string& stem, const Options& options,
@@ -331,17 +359,20 @@ bool convertModel(const std::string& path, ModelFiles& files, const std::string&
         return false;
     }
     ImportedModel source;
-    const bool isImported = importModel(path, files, options, source, model.report, error);
-    if (isImported)
+    bool isConverted = importModel(path, files, options, source, model.report, error);
+    if (isConverted)
+    {
         ModelConverter(source, files, stem, options, model).convert();
+        isConverted = hasSomethingToDraw(model, error);
+    }
     for (const std::string& refused : files.getRefused())
     {
         model.report.lose("file-refused",
                           "file \"" + refused + "\", which is not in the model's folder (see --allow)");
-        if (!isImported)
+        if (!isConverted)
             error += "; not in the model's folder, and so not read (see --allow): " + refused;
     }
-    return isImported;
+    return isConverted;
 }
 
 } // namespace convert

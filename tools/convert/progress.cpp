@@ -20,6 +20,7 @@ constexpr size_t LONGEST = 60; // characters, for narrow terminals
 
 const Clock::time_point g_start = Clock::now();
 Clock::time_point g_shown = g_start;
+std::FILE* g_stream = stderr;
 
 bool isWatched()
 {
@@ -43,14 +44,23 @@ void showProgress(const std::string& what, float share)
     std::string line = what.substr(0, LONGEST);
     if (share >= 0.0f)
         line += " " + std::to_string(int(std::min(share, 1.0f) * 100.0f)) + " %";
-    std::fprintf(stderr, "\r\033[K%s", line.c_str()); // to the line's start, and the old line away
-    std::fflush(stderr);
+    std::fprintf(g_stream, "\r\033[K%s", line.c_str()); // to the line's start, and the old line away
+    std::fflush(g_stream);
+}
+
+int moveProgress()
+{
+    const int descriptor = isWatched() ? dup(STDERR_FILENO) : -1;
+    std::FILE* stream = descriptor < 0 ? nullptr : fdopen(descriptor, "w");
+    if (stream)
+        g_stream = stream;
+    return stream ? descriptor : -1;
 }
 
 void clearProgress()
 {
     if (isWatched())
-        std::fputs("\r\033[K", stderr);
+        std::fputs("\r\033[K", g_stream);
 }
 
 bool ImportProgress::Update(float percentage)

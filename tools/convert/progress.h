@@ -11,6 +11,10 @@ namespace convert
 /// @param share  0 to 1; below 0 if unknown.
 void showProgress(const std::string& what, float share = -1.0f);
 
+/// Goes on by another descriptor, so that standard error can be closed.
+/// @return that descriptor; -1 if there is nothing to say anyway.
+int moveProgress();
+
 /// Takes the line away.
 void clearProgress();
 
