@@ -100,10 +100,10 @@ def main():
     models, binaries, out = sys.argv[1:]
     os.makedirs(out, exist_ok=True)
     bases = make_bases(models, out)
-    for path, stem in bases:
+    for path, _ in bases:
         if path.startswith(models):  # beside what they name
-            os.makedirs(os.path.join(out, stem), exist_ok=True)
-            shutil.copytree(os.path.dirname(path), os.path.join(out, stem, "as-it-is"), dirs_exist_ok=True)
+            folder = os.path.dirname(path)
+            shutil.copytree(folder, os.path.join(out, "as-it-is", os.path.relpath(folder, models)), dirs_exist_ok=True)
     with concurrent.futures.ThreadPoolExecutor(os.cpu_count()) as pool:
         jobs = [pool.submit(make_variant, path, stem, name, binaries, out) for path, stem in bases for name in VARIANTS]
         for job in jobs:
