@@ -215,7 +215,7 @@ TEST_F(ConvertMaterialTest, physicalMaterials)
          30.0f},
         {R"({"name":"dull","pbrMetallicRoughness":{"metallicFactor":0,"roughnessFactor":0.5},
              "extensions":{"KHR_materials_specular":{"specularFactor":0}}})",
-         "pvl.sp$DIFF$AMBI",
+         "pvl.sp$DIFF$AMBI$LINEAR",
          true,
          {},
          {},

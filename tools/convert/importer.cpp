@@ -210,6 +210,7 @@ bool importOther(const std::string& path, ModelFiles& files, const Options& opti
         correctFbx(scene, report);
     if (contains(format, "Wavefront"))
         correctObj(scene, path, files, report);
+    model.hidesColours = contains(format, "Blender"); // where a material has to ask for them
     if (contains(format, "3DS"))
         reportCameras(scene, report);
     dropLostJoints(scene, report);

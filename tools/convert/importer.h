@@ -21,6 +21,7 @@ struct ImportedModel
     Assimp::Importer importer;
     std::unique_ptr<aiScene> own;   ///< of a format that is read without the importer
     const aiScene* scene = nullptr; ///< the importer's, or own
+    bool hidesColours = false;      ///< those of vertices are not meant to be seen
     aiMatrix4x4
         toScene; ///< from the model's axes and unit to +y up and, where the file tells its unit, metres
 };

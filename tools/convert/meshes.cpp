@@ -354,11 +354,28 @@ std::vector<MeshPart> convertMesh(const aiMesh& mesh, const ConvertedMaterial& m
     return MeshConverter(mesh, material, report).convert();
 }
 
+namespace
+{
+
+bool hasTransparentColour(const aiMesh& mesh)
+{
+    return std::any_of(mesh.mColors[0], mesh.mColors[0] + mesh.mNumVertices,
+                       [](const aiColor4D& colour) { return colour.a < 1.0f; });
+}
+
+} // namespace
+
 bool isColoured(const aiMesh& mesh)
 {
     const aiColor4D* colours = mesh.mColors[0];
-    return colours && std::any_of(colours, colours + mesh.mNumVertices,
-                                  [](const aiColor4D& colour) { return colour != aiColor4D(1, 1, 1, 1); });
+    const auto hasOther = [&](const aiColor4D& colour)
+    {
+        return std::any_of(colours, colours + mesh.mNumVertices,
+                           [&](const aiColor4D& own)
+                           { return own.r != colour.r || own.g != colour.g || own.b != colour.b; });
+    };
+    return colours && hasOther(aiColor4D(0, 0, 0, 1)) &&
+           (hasOther(aiColor4D(1, 1, 1, 1)) || hasTransparentColour(mesh));
 }
 
 bool leavesPicture(const aiMesh& mesh, unsigned uvChannel)

@@ -25,7 +25,8 @@ struct MeshPart
 /// @return in as many parts as the limits of geometries ask for; none if nothing is left.
 std::vector<MeshPart> convertMesh(const aiMesh& mesh, const ConvertedMaterial& material, Report& report);
 
-/// Whether some vertex has a colour other than white.
+/// Whether the vertices have colours: not all of them white or all of them black, which some importers of the library
+/// put where there are none.
 bool isColoured(const aiMesh& mesh);
 
 /// Whether texture coordinates of the channel lie outside 0 to 1.

@@ -26,6 +26,7 @@ public:
     ModelConverter(const ImportedModel& source, ModelFiles& files, const std::string& stem,
                    const Options& options, ConvertedModel& model)
         : m_source(*source.scene)
+        , m_hidesColours(source.hidesColours)
         , m_toScene(source.toScene)
         , m_stem(stem)
         , m_options(options)
@@ -75,7 +76,11 @@ private:
                     continue;
                 used = true;
                 use.repeats = use.repeats || leavesPicture(mesh, findUvChannel(material));
-                use.hasColours = use.hasColours || isColoured(mesh);
+                if (isColoured(mesh) && m_hidesColours)
+                    m_model.report.approximate("vertex-colours",
+                                               "vertex colours (kept as a_colour and not shown, as "
+                                               "Blender shows them on request alone)");
+                use.hasColours = use.hasColours || (isColoured(mesh) && !m_hidesColours);
                 use.isSurface =
                     use.isSurface || mesh.mNormals || mesh.mPrimitiveTypes & aiPrimitiveType_TRIANGLE;
             }
@@ -303,6 +308,7 @@ private:
     }
 
     const aiScene& m_source;
+    bool m_hidesColours;
     aiMatrix4x4 m_toScene;
     std::string m_stem;
     const Options& m_options;
