@@ -28,8 +28,10 @@ private:
     std::unique_ptr<headless::Context> m_surface;
 };
 
-/// @param scene  borrowed.
-std::unique_ptr<Contender> makeEngineContender(const DrawScene& scene);
+/// The engine; the scene is borrowed by all of these.
+std::unique_ptr<Contender> makeWalkContender(const DrawScene& scene);       ///< in the order of the scene
+std::unique_ptr<Contender> makeByMaterialContender(const DrawScene& scene); ///< whose order is by material
+std::unique_ptr<Contender> makeGroupedContender(const DrawScene& scene);    ///< grouped by the renderer
 
 /// The floor: what a programmer would write who knows this scene and nothing else.
 std::unique_ptr<Contender> makeHandContender(const DrawScene& scene);

@@ -19,6 +19,7 @@
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
+#include <iterator>
 
 namespace
 {
@@ -37,6 +38,10 @@ struct Figures
 };
 
 using MakeContender = std::unique_ptr<Contender> (*)(const DrawScene& scene);
+
+constexpr MakeContender CONTENDERS[] = {makeWalkContender, makeByMaterialContender, makeGroupedContender,
+                                        makeHandContender};
+constexpr size_t CONTENDER_COUNT = std::size(CONTENDERS);
 
 size_t getHeapBytes()
 {
@@ -113,7 +118,7 @@ double measureHeap(MakeContender make)
     return double(bytes[1] - bytes[0]) / (counts[1] - counts[0]);
 }
 
-/// Calls use(scene, make) for every scene, the engine first.
+/// Calls use(scene, make) for every scene and contender, in their order.
 template <class Use>
 void forEachRun(const std::vector<int>& counts, Use use)
 {
@@ -122,8 +127,8 @@ void forEachRun(const std::vector<int>& counts, Use use)
         for (DrawScene::Motion motion : DrawScene::MOTIONS)
         {
             const DrawScene scene(count, motion);
-            use(scene, makeEngineContender);
-            use(scene, makeHandContender);
+            for (MakeContender make : CONTENDERS)
+                use(scene, make);
         }
     }
 }
@@ -149,9 +154,33 @@ void drawForCounting(const std::vector<int>& counts)
                });
 }
 
-void printRatio(const char* format, double engine, double hand)
+void printAll(const char* format, const double (&values)[CONTENDER_COUNT])
 {
-    std::printf(format, engine, hand, engine / hand);
+    std::printf("  ");
+    for (double value : values)
+        std::printf(format, value);
+}
+
+void printScene(const DrawScene& scene, const Figures (&figures)[CONTENDER_COUNT],
+                const uint64_t* instructions)
+{
+    const double draws = double(scene.places.size());
+    double calls[CONTENDER_COUNT], times[CONTENDER_COUNT], counts[CONTENDER_COUNT];
+    for (size_t i = 0; i < CONTENDER_COUNT; ++i)
+    {
+        if (compare(figures[0].picture, figures[i].picture) > 0.005)
+            giveUp("the pictures differ, so the figures would not compare");
+        calls[i] = figures[i].glCalls / draws;
+        times[i] = figures[i].userMs;
+        counts[i] = instructions ? double(instructions[i]) / COUNTED_FRAMES / draws : 0.0;
+    }
+    std::printf("%6d  %-8s", int(scene.places.size()), DrawScene::MOTION_NAMES[int(scene.motion)]);
+    printAll(" %6.2f", calls);
+    printAll(" %7.2f", times);
+    if (instructions)
+        printAll(" %6.1f", counts);
+    std::printf("\n");
+    std::fflush(stdout);
 }
 
 void compareContenders(const std::vector<int>& counts)
@@ -167,38 +196,22 @@ void compareContenders(const std::vector<int>& counts)
     else
         std::printf("valgrind is not installed: instructions are not counted.\n");
 
-    std::printf("%6s  %-8s  %-25s  %-27s  %s\n", "", "", "GL calls per draw", "user ms per frame",
-                "instructions per draw");
-    std::printf("%6s  %-8s  %7s %8s %8s  %8s %8s %8s  %8s %8s %8s\n", "cubes", "turning", "engine", "by hand",
-                "ratio", "engine", "by hand", "ratio", "engine", "by hand", "ratio");
+    std::printf("Each in the order of the scene, of a scene by material, grouped, and by hand.\n\n");
+    std::printf("%6s  %-8s  %-29s  %-33s  %s\n", "cubes", "turning", " GL calls per draw",
+                " user ms per frame", " instructions per draw");
     size_t run = 0;
-    Figures engine;
-    forEachRun(
-        counts,
-        [&](const DrawScene& scene, MakeContender make)
-        {
-            const Figures figures = measure(make, scene);
-            if (++run % 2 == 1)
-            {
-                engine = figures;
-                return;
-            }
-            if (compare(engine.picture, figures.picture) > 0.005)
-                giveUp("the two pictures differ, so the figures would not compare");
-            const double draws = double(scene.places.size());
-            std::printf("%6d  %-8s", int(scene.places.size()), DrawScene::MOTION_NAMES[int(scene.motion)]);
-            printRatio("  %7.2f %8.2f %8.2f", engine.glCalls / draws, figures.glCalls / draws);
-            printRatio("  %8.2f %8.2f %8.2f", engine.userMs, figures.userMs);
-            if (run <= instructions.size())
-                printRatio("  %8.1f %8.1f %8.2f", double(instructions[run - 2]) / COUNTED_FRAMES / draws,
-                           double(instructions[run - 1]) / COUNTED_FRAMES / draws);
-            std::printf("\n");
-            std::fflush(stdout);
-        });
-
-    std::printf("\nHeap bytes a cube: ");
-    printRatio("engine %.0f, by hand %.0f, ratio %.2f\n", measureHeap(makeEngineContender),
-               measureHeap(makeHandContender));
+    Figures figures[CONTENDER_COUNT];
+    forEachRun(counts,
+               [&](const DrawScene& scene, MakeContender make)
+               {
+                   figures[run++ % CONTENDER_COUNT] = measure(make, scene);
+                   if (run % CONTENDER_COUNT == 0)
+                       printScene(scene, figures,
+                                  run <= instructions.size() ? &instructions[run - CONTENDER_COUNT]
+                                                             : nullptr);
+               });
+    std::printf("\nHeap bytes a cube: engine %.0f, by hand %.0f\n", measureHeap(makeWalkContender),
+                measureHeap(makeHandContender));
 }
 
 } // namespace

@@ -33,10 +33,17 @@ constexpr UniformSource UNIFORMS[] = {{"u_modelViewProjection", "T_MODEL_VIEW_PR
                                       {"u_colour", "M_DIFFUSE_COLOUR"},
                                       {"u_texture", "M_DIFFUSE_TEXTURE"}};
 
+enum class Order
+{
+    WALK,
+    BY_MATERIAL,
+    GROUPED
+};
+
 class EngineContender : public Contender
 {
 public:
-    explicit EngineContender(const DrawScene& plan)
+    EngineContender(const DrawScene& plan, Order order)
         : m_plan(plan)
         , m_pool(makeShared<AssetCachePool>())
         , m_scene(makeShared<SceneNode>())
@@ -44,7 +51,7 @@ public:
     {
         m_cubes = makeShared<SceneNode>();
         m_cubes->setParent(m_scene);
-        addCubes();
+        addCubes(order == Order::BY_MATERIAL);
 
         const auto light = makeShared<Light>();
         light->setLightType(Light::LightType::DIRECTIONAL);
@@ -53,6 +60,7 @@ public:
         light->setParent(m_scene);
 
         const auto renderer = makeShared<SimpleRenderer>(makeShared<RenderContext>(), m_pool);
+        renderer->setOpaqueGrouped(order == Order::GROUPED);
         m_block = makeShared<RenderBlock>(renderer, m_scene, m_camera);
         m_block->setBackgroundColour(Colour4f(0.0f, 0.0f, 0.0f, 1.0f));
     }
@@ -118,21 +126,26 @@ private:
         return appearances;
     }
 
-    void addCubes()
+    void addCubes(bool byMaterial)
     {
         const std::vector<Appearance::Ptr> appearances = makeAppearances();
         const Mesh::Ptr mesh = createCubeMesh(*m_pool->getMeshCache(), Vector2f(1.0f, 1.0f));
         if (!mesh)
             giveUp("the engine's cube cannot be made");
         const size_t step = m_plan.getTurningStep();
-        for (size_t i = 0; i < m_plan.places.size(); ++i)
+        m_turning.resize(step > 0 ? (m_plan.places.size() + step - 1) / step : 0);
+        const size_t rounds = byMaterial ? appearances.size() : 1;
+        for (size_t round = 0; round < rounds; ++round)
         {
-            const auto solid = makeShared<Solid>(mesh, appearances[i % appearances.size()]);
-            solid->setPosition(m_plan.places[i]);
-            solid->setRotation(m_plan.turns[m_plan.findTurn(i, 0)]);
-            solid->setParent(m_cubes);
-            if (step > 0 && i % step == 0)
-                m_turning.push_back(solid.get());
+            for (size_t i = round; i < m_plan.places.size(); i += rounds)
+            {
+                const auto solid = makeShared<Solid>(mesh, appearances[i % appearances.size()]);
+                solid->setPosition(m_plan.places[i]);
+                solid->setRotation(m_plan.turns[m_plan.findTurn(i, 0)]);
+                solid->setParent(m_cubes);
+                if (step > 0 && i % step == 0)
+                    m_turning[i / step] = solid.get();
+            }
         }
     }
 
@@ -147,7 +160,17 @@ private:
 
 } // namespace
 
-std::unique_ptr<Contender> makeEngineContender(const DrawScene& scene)
+std::unique_ptr<Contender> makeWalkContender(const DrawScene& scene)
 {
-    return std::make_unique<EngineContender>(scene);
+    return std::make_unique<EngineContender>(scene, Order::WALK);
+}
+
+std::unique_ptr<Contender> makeByMaterialContender(const DrawScene& scene)
+{
+    return std::make_unique<EngineContender>(scene, Order::BY_MATERIAL);
+}
+
+std::unique_ptr<Contender> makeGroupedContender(const DrawScene& scene)
+{
+    return std::make_unique<EngineContender>(scene, Order::GROUPED);
 }

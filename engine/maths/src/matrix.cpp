@@ -107,31 +107,14 @@ detail::ModelProjection::ModelProjection(const Matrix4f& viewMatrix, const Matri
     isSkewed = p[8] != 0.0f || p[9] != 0.0f;
 }
 
-template <bool IS_SKEWED>
-static void projectModel(Matrix4f& result, const detail::ModelProjection& projection, const Matrix4f& world)
+Matrix4f detail::multiplySkewed(const ModelProjection& projection, const Matrix4f& world)
 {
-    const Matrix4f left = projection.view; // as above
-    const Vector4f scale = projection.scale;
-    const Vector4f skew = projection.skew;
-    const auto weigh = [&left](const Vector4f& v) __attribute__((always_inline))
-    {
-        return left.columns[0] * v.x + left.columns[1] * v.y + left.columns[2] * v.z;
-    };
-    const auto project = [&scale, &skew ](const Vector4f& v) __attribute__((always_inline))
-    {
-        return IS_SKEWED ? v * scale + skew * v.z : v * scale;
-    };
-    result = Matrix4f(project(weigh(world.columns[0])), project(weigh(world.columns[1])),
-                      project(weigh(world.columns[2])),
-                      project(weigh(world.columns[3]) + left.columns[3]) + projection.last);
-}
-
-void detail::multiply(Matrix4f& result, const ModelProjection& projection, const Matrix4f& world)
-{
-    if (projection.isSkewed)
-        projectModel<true>(result, projection, world);
-    else
-        projectModel<false>(result, projection, world);
+    Matrix4f result;
+    multiplyAffine(result, projection.view, world);
+    for (Vector4f& column : result.columns)
+        column = column * projection.scale + projection.skew * column.z;
+    result.columns[3] = result.columns[3] + projection.last;
+    return result;
 }
 
 Matrix2f transpose(const Matrix2f& m)

@@ -13,8 +13,6 @@ namespace orv::detail
 namespace
 {
 
-constexpr uint32_t KEEPS_PLACE = 0xFFFFFFFFu; ///< in place of a material's number
-
 /// Whether it matters to the picture what was drawn before. Opaque materials do not blend; an offset depends on the
 /// one before it (see RenderContext::setDepthOffset).
 bool keepsPlace(const RenderState& state)
@@ -38,27 +36,6 @@ void addUp(std::vector<uint32_t>& counts)
 
 } // namespace
 
-void DrawGroups::order(std::vector<Solid*>& solids)
-{
-    begin();
-    size_t first = 0; // of those in m_entries
-    for (size_t i = 0; i < solids.size(); ++i)
-    {
-        Solid* solid = solids[i];
-        const uint32_t material = numberMaterial(*solid->getAppearance().get());
-        if (material != KEEPS_PLACE)
-        {
-            ++m_materialCounts[material];
-            m_entries.push_back({solid, material, numberMesh(solid->getMesh().get())});
-            continue;
-        }
-        writeGroups(solids.data() + first);
-        begin();
-        first = i + 1;
-    }
-    writeGroups(solids.data() + first);
-}
-
 void DrawGroups::begin()
 {
     m_round = nextRevision();
@@ -69,20 +46,32 @@ void DrawGroups::begin()
     m_materialCounts.clear();
 }
 
-uint32_t DrawGroups::numberMaterial(const Appearance& appearance)
+void DrawGroups::add(Solid& solid, const Appearance& appearance)
 {
-    DrawMark& mark = appearance.getDrawMark();
-    if (mark.round == m_round) [[likely]]
-        return mark.number;
+    const DrawMark& mark = appearance.getDrawMark();
+    if (mark.round != m_round && !numberMaterial(appearance)) [[unlikely]]
+    {
+        finish();
+        m_solids.push_back(&solid);
+        begin();
+        return;
+    }
+    ++m_materialCounts[mark.number];
+    m_entries.push_back({&solid, mark.number, numberMesh(solid.getMesh().get())});
+}
+
+/// @return false for a material that keeps the places of its solids.
+bool DrawGroups::numberMaterial(const Appearance& appearance)
+{
     if (keepsPlace(appearance.getRenderState()))
-        return KEEPS_PLACE;
-    mark = {m_round, uint32_t(m_programs.size())};
+        return false;
+    appearance.getDrawMark() = {m_round, uint32_t(m_programs.size())};
     DrawMark& programMark = appearance.getShaderProgram()->getDrawMark();
     if (programMark.round != m_round)
         programMark = {m_round, m_programCount++};
     m_programs.push_back(programMark.number);
     m_materialCounts.push_back(0);
-    return mark.number;
+    return true;
 }
 
 uint32_t DrawGroups::numberMesh(const Mesh* mesh)
@@ -96,23 +85,27 @@ uint32_t DrawGroups::numberMesh(const Mesh* mesh)
 }
 
 /// The order by meshes first: that by materials then leaves it as it is within each.
-void DrawGroups::writeGroups(Solid** solids)
+void DrawGroups::finish()
 {
-    const std::vector<Entry>* entries = &m_entries;
     if (m_meshCount > 2)
-    {
-        m_counts.assign(m_meshCount, 0);
-        for (const Entry& entry : m_entries)
-            ++m_counts[entry.mesh];
-        addUp(m_counts);
-        m_byMesh.resize(m_entries.size());
-        for (const Entry& entry : m_entries)
-            m_byMesh[m_counts[entry.mesh]++] = entry;
-        entries = &m_byMesh;
-    }
+        sortByMesh();
     rankMaterials();
-    for (const Entry& entry : *entries)
-        solids[m_materialCounts[entry.material]++] = entry.solid;
+    const size_t first = m_solids.size();
+    m_solids.resize(first + m_entries.size());
+    for (const Entry& entry : m_entries)
+        m_solids[first + m_materialCounts[entry.material]++] = entry.solid;
+}
+
+void DrawGroups::sortByMesh()
+{
+    m_counts.assign(m_meshCount, 0);
+    for (const Entry& entry : m_entries)
+        ++m_counts[entry.mesh];
+    addUp(m_counts);
+    m_byMesh.resize(m_entries.size());
+    for (const Entry& entry : m_entries)
+        m_byMesh[m_counts[entry.mesh]++] = entry;
+    m_entries.swap(m_byMesh);
 }
 
 /// Makes of the counts the places of each material's first solid, those of a program side by side.

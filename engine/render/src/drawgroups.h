@@ -14,16 +14,20 @@ class Solid;
 namespace detail
 {
 
-/// Puts solids that are drawn with the same things side by side, by counting: no solid is compared with another. Keeps
-/// its memory from frame to frame.
+/// Puts solids that are drawn with the same things side by side, by counting: no solid is compared with another. By
+/// program, then material, then mesh, each in the order in which a solid has it first; solids of equal ones stay as they
+/// came. A solid whose material's state makes the order matter stays where it is, and what came before and after it too.
+/// Keeps its memory from frame to frame.
 class DrawGroups
 {
 public:
-    /// By program, then material, then mesh, each in the order in which the first solid has it; solids of equal ones
-    /// stay as they are. What is drawn with a material that keepsPlace() stays where it is, and what is before and
-    /// after it too.
-    /// @param solids  each with an appearance and a program.
-    void order(std::vector<Solid*>& solids);
+    /// @param solids  borrowed: where the solids go.
+    explicit DrawGroups(std::vector<Solid*>& solids) : m_solids(solids) {}
+
+    void begin();
+    /// @param appearance  the solid's; it has a program.
+    void add(Solid& solid, const Appearance& appearance);
+    void finish();
 
 private:
     struct Entry
@@ -33,12 +37,12 @@ private:
         uint32_t mesh;
     };
 
-    void begin();
-    uint32_t numberMaterial(const Appearance& appearance);
+    bool numberMaterial(const Appearance& appearance);
     uint32_t numberMesh(const Mesh* mesh);
-    void writeGroups(Solid** solids);
+    void sortByMesh();
     void rankMaterials();
 
+    std::vector<Solid*>& m_solids;
     uint64_t m_round = 0; ///< of numbering
     uint32_t m_programCount = 0;
     uint32_t m_meshCount = 0;

@@ -96,9 +96,10 @@ RendererProperties::RendererProperties(RenderContext& context, AssetCachePool* p
     , normalModel(shareProperty<Matrix3f>(context, "T_NORMAL_MODEL", 1, Matrix3f::IDENTITY))
     , cameraPosition(shareProperty(context, "T_CAMERA_POSITION", 1, Vector4f(0.0f, 0.0f, 0.0f, 1.0f)))
     , time(shareProperty(context, "TIME", 1, 0.0f))
-    , m_sharers(shareProperty<int>(context, "SIMPLE_RENDERER", 1, 0))
 {
+    markTransforms();
     shareProperty(context, "FOG_DENSITY", 1, 0.0f);
+    m_sharers = shareProperty<int>(context, "SIMPLE_RENDERER", 1, 0); // later, so that programs see the marks
     shareProperty(context, "FOG_COLOUR", 1, Vector4f(0.0f, 0.0f, 0.0f, 1.0f));
 
     for (const MaterialDefault<Vector4f>& value : VECTOR_DEFAULTS)
@@ -121,6 +122,17 @@ RendererProperties::RendererProperties(RenderContext& context, AssetCachePool* p
     provideTexture(context, pool, BUMP_TEXTURE, nullptr);
 }
 
+/// Not without memory for all: then nothing is drawn.
+void RendererProperties::markTransforms()
+{
+    if (!isComplete())
+        return;
+    model->setDrawTransform(DrawTransform::MODEL);
+    modelView->setDrawTransform(DrawTransform::MODEL_VIEW);
+    modelViewProjection->setDrawTransform(DrawTransform::MODEL_VIEW_PROJECTION);
+    normalModel->setDrawTransform(DrawTransform::NORMAL_MODEL);
+}
+
 RendererProperties::~RendererProperties()
 {
     const bool othersRemain = m_sharers && m_sharers->sharedGetCount() > 2;
@@ -139,6 +151,15 @@ bool RendererProperties::isComplete() const
            lightAttenuationNear && lightAttenuationReciprocal && lightSpotInnerCos && lightSpotOuterCos &&
            lightSpotDirection && joints.isComplete() && model && view && modelView && viewProjection &&
            modelViewProjection && normalModel && cameraPosition && time;
+}
+
+void RendererProperties::publish(const Solid& solid, const Matrix4f& solidView,
+                                 const Matrix4f& solidViewProjection) const
+{
+    model->set(solid.getWorldTransform());
+    modelView->set(solidView);
+    modelViewProjection->set(solidViewProjection);
+    normalModel->set(solid.getNormalTransform());
 }
 
 void RendererProperties::provideTexture(RenderContext& context, AssetCachePool* pool, const char* name,

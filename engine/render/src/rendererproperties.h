@@ -70,6 +70,9 @@ struct RendererProperties
     /// Whether there was memory for all that is written each frame.
     bool isComplete() const;
 
+    /// Sets the transforms to those of one solid.
+    void publish(const Solid& solid, const Matrix4f& solidView, const Matrix4f& solidViewProjection) const;
+
     RendererProperties(const RendererProperties&) = delete;
     RendererProperties& operator=(const RendererProperties&) = delete;
 
@@ -94,6 +97,8 @@ struct RendererProperties
     SharedPtr<ShaderUniform<float>> time;
 
 private:
+    void markTransforms();
+
     using TextureProperty = ShaderUniform<SharedPtr<Texture2D>>;
 
     struct HeldTexture

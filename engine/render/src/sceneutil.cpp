@@ -33,23 +33,6 @@ struct Walk
     bool plainFlags; ///< no recursive flag is on by default: once the condition holds, it holds below
 };
 
-void visitBelow(SceneNodeVisitor& visitor, const SceneNode& node)
-{
-    detail::visitChildren(node,
-                          [&visitor](SceneNode& child)
-                          {
-                              child.accept(visitor);
-                              if (child.getChildCount() != 0) // most have none, and need no call
-                                  visitBelow(visitor, child);
-                          });
-}
-
-void visitAll(SceneNodeVisitor& visitor, SceneNode& node)
-{
-    node.accept(visitor);
-    visitBelow(visitor, node);
-}
-
 void visitRestricted(const Walk& walk, SceneNode& node, WalkState state)
 {
     const FlagMask& render = walk.renderFlags;
@@ -60,7 +43,7 @@ void visitRestricted(const Walk& walk, SceneNode& node, WalkState state)
     state.satisfied = nowSatisfied;
     if (stop && nowSatisfied)
     {
-        visitAll(walk.visitor, node);
+        detail::visitAll(walk.visitor, node);
         return;
     }
 
@@ -153,7 +136,7 @@ bool getDerivedFlags(const SceneNode& node, const FlagMask& flags)
 void visitScene(SceneNodeVisitor& visitor, SceneNode& node)
 {
     const detail::SceneWalk walk(node);
-    visitAll(visitor, node);
+    detail::visitAll(visitor, node);
 }
 
 void visitScene(SceneNodeVisitor& visitor, SceneNode& node, const FlagMask& renderFlags,

@@ -5,7 +5,12 @@
 
 #include <vector>
 
-namespace orv::detail
+namespace orv
+{
+
+class SceneNodeVisitor;
+
+namespace detail
 {
 
 /// A walk through a scene by this thread. Nodes that leave their parents meanwhile, and the top of the walk, live
@@ -27,23 +32,19 @@ private:
     std::vector<SharedPtr<SceneNode>> m_kept;
 };
 
-/// Where to go on among children after visiting the one that was at a place: the next one, whatever was removed.
-size_t findNextChild(const std::vector<SharedPtr<SceneNode>>& children, size_t place,
-                     const SceneNode* visited);
+/// The walk of all nodes without a look at flags.
+void visitAll(SceneNodeVisitor& visitor, SceneNode& node);
 
 /// @param visit  called with each child that is there at first and at its turn; may change the children.
 template <class Visit>
 void visitChildren(const SceneNode& node, const Visit& visit)
 {
-    const std::vector<SharedPtr<SceneNode>>& children = node.getChildren();
-    size_t left = children.size(); // ends the walk of a visitor that moves each child behind the others
-    for (size_t i = 0; left > 0 && i < children.size(); --left)
-    {
-        SceneNode* const child = children[i].get();
+    if (!node.getChildList())
+        return;
+    ChildList::Cursor children(*node.getChildList());
+    while (SceneNode* child = children.next())
         visit(*child);
-        const bool stayed = i < children.size() && children[i].get() == child;
-        i = stayed ? i + 1 : findNextChild(children, i, child);
-    }
 }
 
-} // namespace orv::detail
+} // namespace detail
+} // namespace orv

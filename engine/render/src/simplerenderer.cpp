@@ -3,6 +3,7 @@
 #include "drawgroups.h"
 #include "eyes.h"
 #include "rendererproperties.h"
+#include "solidpainter.h"
 
 #include "orv/appearance.h"
 #include "orv/assetcachepool.h"
@@ -37,27 +38,12 @@ Matrix4f reflectionMatrix(const Matrix4f& world)
                     Vector4f(Vector3f::Z_AXIS - n * (2.0f * n.z), 0.0f), Vector4f(n * (2.0f * d), 1.0f));
 }
 
-/// Projection * (view * the solid's world transform): in this order what is far from the origin and near the eye
-/// keeps its digits.
-[[gnu::always_inline]] inline void project(Matrix4f& result, const detail::ModelProjection& ready,
-                                           const Matrix4f& view, const Matrix4f& projection,
-                                           const Solid& solid)
+/// For a solid that lacks one of the two.
+[[gnu::noinline]] void assertDrawable(const Appearance* appearance, const ShaderProgram* program)
 {
-    const Matrix4f& world = solid.getWorldTransform();
-    if (ready.isUsable && (solid.isWorldRigid() || detail::isAffine(world)))
-        detail::multiply(result, ready, world);
-    else
-        result = projection * (view * world);
-}
-
-/// Space * the solid's world transform.
-[[gnu::always_inline]] inline void place(Matrix4f& result, const Matrix4f& space, const Solid& solid)
-{
-    const Matrix4f& world = solid.getWorldTransform();
-    if (solid.isWorldRigid())
-        detail::multiplyAffine(result, space, world);
-    else
-        result = space * world;
+    ORV_ASSERT(appearance);
+    if (appearance)
+        ORV_ASSERT(program);
 }
 
 Vector4f toVector(const Colour4f& colour)
@@ -79,26 +65,23 @@ SimpleRenderer::~SimpleRenderer() = default;
 void SimpleRenderer::setOpaqueGrouped(bool grouped)
 {
     if (grouped != isOpaqueGrouped())
-        m_groups = grouped ? std::make_unique<detail::DrawGroups>() : nullptr;
+        m_groups = grouped ? std::make_unique<detail::DrawGroups>(m_opaque) : nullptr;
 }
 
 void SimpleRenderer::visit(Solid* solid)
 {
     const Appearance* appearance = solid->getAppearance().get();
-    ORV_ASSERT(appearance);
-    if (!appearance)
-        return;
-    const ShaderProgram* program = appearance->getShaderProgram().get();
-    ORV_ASSERT(program);
-    if (!program)
-        return;
-
-    if (program->usesMirrorTexture())
+    const ShaderProgram* program = appearance ? appearance->getShaderProgram().get() : nullptr;
+    if (!program) [[unlikely]]
+        assertDrawable(appearance, program);
+    else if (program->usesMirrorTexture())
         m_mirrors.push_back(solid);
-    else if (appearance->isOpaque())
-        m_opaque.push_back(solid);
-    else
+    else if (!appearance->isOpaque())
         m_transparent.push_back(solid);
+    else if (m_groups)
+        m_groups->add(*solid, *appearance);
+    else
+        m_opaque.push_back(solid);
 }
 
 void SimpleRenderer::visit(Light* light)
@@ -115,9 +98,11 @@ void SimpleRenderer::render(Camera* camera, SceneNode& scene, const FlagMask& re
     m_lights.clear();
     if (!m_properties->isComplete())
         return; // the log said so when they were made
+    if (m_groups)
+        m_groups->begin();
     visitScene(*this, scene, renderFlags, recursiveFlags);
     if (m_groups)
-        m_groups->order(m_opaque);
+        m_groups->finish();
 
     const RenderContext::DrawScope scope(*m_context);
     const detail::MirroredView mirroredView(*m_context, camera);
@@ -303,38 +288,8 @@ void SimpleRenderer::renderReflection(const Solid& mirror, const detail::Eye& ey
 void SimpleRenderer::draw(Solid* const* solids, size_t count, const Matrix4f& view,
                           const Matrix4f& projection)
 {
-    const detail::RendererProperties& properties = *m_properties;
-    ShaderUniform<Matrix4f>& model = *properties.model;
-    ShaderUniform<Matrix4f>& modelView = *properties.modelView;
-    ShaderUniform<Matrix4f>& modelViewProjection = *properties.modelViewProjection;
-    ShaderUniform<Matrix3f>& normalModel = *properties.normalModel;
-    bool hadJoints = properties.joints.count->get() > 0;
-
-    const detail::ModelProjection ready(view, projection);
-    properties.viewProjection->set(projection * view);
-    for (size_t i = 0; i < count; ++i)
-    {
-        Solid& solid = *solids[i];
-        // What the program does not read is not worked out, but for the last solid, whose values are to stay.
-        const bool isLast = i + 1 == count;
-        Appearance& appearance = *solid.getAppearance().get();
-        const ShaderProgram& program = *appearance.getShaderProgram().get();
-        const uint32_t wanted = isLast ? detail::DRAW_ALL : program.getDrawProperties();
-        if ((wanted & detail::DRAW_MODEL_VIEW_PROJECTION) != 0)
-            project(modelViewProjection.renew(), ready, view, projection, solid);
-        if ((wanted & detail::DRAW_MODEL_VIEW) != 0)
-            place(modelView.renew(), view, solid);
-        if ((wanted & detail::DRAW_MODEL) != 0)
-            model.renew() = solid.getWorldTransform();
-        if ((wanted & detail::DRAW_NORMAL_MODEL) != 0)
-            normalModel.renew() = solid.getNormalTransform();
-
-        const bool hasJoints = solid.getJointCount() > 0;
-        if (hasJoints || hadJoints)
-            properties.joints.publish(solid);
-        hadJoints = hasJoints;
-        solid.draw(*m_context, appearance);
-    }
+    m_properties->viewProjection->set(projection * view);
+    detail::SolidPainter(*m_context, *m_properties, view, projection).draw(solids, count);
 }
 
 } // namespace orv

@@ -119,6 +119,12 @@ Matrix4f Solid::calculateJointTransform(const SceneNode* joint, const Matrix4f& 
     return joint->getWorldTransform() * inverseBind * getBindShapeTransform();
 }
 
+bool Solid::turnsSkinWinding(const ShaderProgram* program) const
+{
+    const bool isSkinned = getJointCount() > 0 && program && program->usesJoints();
+    return isSkinned ? isSkinMirrored() : getWorldMirrored();
+}
+
 /// Joints that disagree leave a part of the mesh inside out, so most of them count.
 bool Solid::isSkinMirrored() const
 {
@@ -148,22 +154,25 @@ void Solid::draw(RenderContext& context, Appearance& appearance)
     ShaderProgram* program = appearance.getShaderProgram().get();
     if (!program)
         program = ShaderProgram::getCurrent(context);
-    const bool isSkinned = m_skin && !m_skin->joints.empty() && program &&
-                           (program->getDrawProperties() & detail::DRAW_JOINTS) != 0;
-    appearance.enable(context, isSkinned ? isSkinMirrored() : getWorldMirrored());
+    appearance.enable(context, turnsWinding(program));
+    if (program)
+        bindMesh(context, *program).issue();
+}
 
-    VertexBuffer* vertices = m_mesh->getVertexBuffer().get();
-    IndexBuffer* indices = m_mesh->getIndexBuffer().get();
-    if (!program || !vertices || !indices)
-        return;
-    if (!context.isVertexInputBound(program->getRevision(), vertices->getRevision()))
+detail::DrawCall Solid::bindMesh(RenderContext& context, ShaderProgram& program) const
+{
+    VertexBuffer* const vertices = m_mesh->getVertexBuffer().get();
+    IndexBuffer* const indices = m_mesh->getIndexBuffer().get();
+    if (!vertices || !indices)
+        return {};
+    if (!context.isVertexInputBound(program.getRevision(), vertices->getRevision()))
     {
         // Whatever a lost context took along, drawing the rest would read garbage.
-        if (!program->getId() || vertices->isLost())
-            return;
-        program->bind(context, *vertices);
+        if (!program.getId() || vertices->isLost())
+            return {};
+        program.bind(context, *vertices);
     }
-    indices->draw(context);
+    return indices->bind(context);
 }
 
 } // namespace orv

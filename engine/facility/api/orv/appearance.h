@@ -127,6 +127,11 @@ public:
     /// @param turnWinding  turns the winding order, for a solid whose world transform mirrors it.
     void enable(RenderContext& context, bool turnWinding = false);
 
+    /// The same without the transforms that a renderer sends for each draw; see ShaderProgram::prepare().
+    /// @return where the program's uniforms take their values from, until the appearance or the program changes; null
+    /// without a live program.
+    const detail::UniformSources* prepare(RenderContext& context, bool turnWinding);
+
     /// Reads an appearance file into this appearance, overriding only what the file mentions. Problems are
     /// logged; what was read before one stays. The format is described at loadAppearance().
     void apply(AssetCachePool& pool, const char* name);
@@ -143,7 +148,6 @@ private:
     static bool sizeAllowed(int size);
     ORV_LOCAL static bool faceAllowed(StencilFace face);
     bool indexAllowed(const char* name, int index) const;
-    ORV_LOCAL void enableProgram(RenderContext& context);
     void storeProperty(const char* name, const SharedPtr<ShaderUniformBase>& uniform);
     void stateChanged();
 

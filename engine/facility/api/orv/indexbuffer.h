@@ -1,5 +1,6 @@
 #pragma once
 
+#include "orv/detail/drawcall.h"
 #include "orv/export.h"
 #include "orv/sharedptr.h"
 
@@ -55,7 +56,10 @@ public:
     void draw();
 
     /// Draw path: the same through what the context remembers; the element buffer stays bound.
-    void draw(RenderContext& context);
+    void draw(RenderContext& context) { bind(context).issue(); }
+
+    /// The same but for the call of GL that draws.
+    detail::DrawCall bind(RenderContext& context);
 
     Primitive getPrimitive() const { return m_primitive; }
     int getCount() const { return m_count; }

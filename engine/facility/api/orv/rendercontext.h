@@ -3,7 +3,6 @@
 #include "orv/detail/bindingepoch.h"
 #include "orv/detail/contextproperties.h"
 #include "orv/detail/programhandle.h"
-#include "orv/detail/texturetarget.h"
 #include "orv/export.h"
 #include "orv/renderstate.h"
 #include "orv/shared.h"
@@ -177,11 +176,19 @@ public:
     ///                targets hold stays.
     void bindTexture(int unit, unsigned target, unsigned name)
     {
+        bindTexture(unit, target, name, getTextureSlot(unit, target));
+    }
+
+    /// @param slot  what getTextureSlot() says of the two before.
+    void bindTexture(int unit, unsigned target, unsigned name, int slot)
+    {
         checkBindings();
-        const int slot = getTextureSlot(unit, target);
         if (slot < 0 || m_textures[slot] != name)
             sendTexture(unit, target, name, slot);
     }
+
+    /// @return where a unit's target is remembered, -1 for what is not.
+    static int getTextureSlot(int unit, unsigned target);
 
     void bindArrayBuffer(unsigned name)
     {
@@ -229,20 +236,6 @@ private:
     static constexpr uint32_t APPLY_TURNED = 2;
     static constexpr unsigned UNKNOWN = 0xFFFFFFFFu;   ///< no GL object has this name
     static constexpr uint64_t NO_EPOCH = ~uint64_t(0); ///< outside of scopes nothing is known
-
-    /// @return index into m_textures, -1 for what is not remembered.
-    static int getTextureSlot(int unit, unsigned target)
-    {
-        if (unsigned(unit) >= unsigned(TEXTURE_UNITS))
-            return -1;
-        switch (target)
-        {
-        case detail::TEXTURE_TARGET_2D: return unit * TEXTURE_TARGETS;
-        case detail::TEXTURE_TARGET_CUBE_MAP: return unit * TEXTURE_TARGETS + 1;
-        case detail::TEXTURE_TARGET_EXTERNAL: return unit * TEXTURE_TARGETS + 2;
-        default: return -1;
-        }
-    }
 
     void checkBindings()
     {

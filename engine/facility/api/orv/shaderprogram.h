@@ -29,12 +29,11 @@ struct DrawnUniform
     SharedPtr<ShaderUniformBase> linked; ///< the context's property, may be null
     SharedPtr<ShaderUniformBase> sent;   ///< the values sent last; null for a sampler
     uint64_t sentRevision = 0;           ///< of the source that was compared last
-    /// Sends the source's value if it differs. @return false, with nothing done, for what needs a longer way.
-    bool (*update)(DrawnUniform& uniform, const ShaderUniformBase& source) = nullptr;
     int location = -1;
     int textureUnit = -1;       ///< first of a sampler's units; -1 for other types
     int size = 1;               ///< array size
     unsigned textureTarget = 0; ///< of a sampler
+    int textureSlot = -1;       ///< of a sampler of size 1: where the context remembers its texture
 };
 
 /// Where the uniforms of a program take their values from, found out once, so that a draw follows pointers and
@@ -47,20 +46,16 @@ struct UniformSources
         DrawnUniform* uniform;
     };
 
-    uint64_t revision = 0; ///< the program's stamp; 0 to have everything found anew
-    std::vector<Value> values;
+    uint64_t revision = 0;     ///< the program's stamp; 0 to have everything found anew
+    std::vector<Value> values; ///< but for samplers and transforms; those that were handed to enable() first
+    std::size_t ownCount = 0;  ///< of values: those handed to enable()
+    uint64_t ownUniforms = 0;  ///< a bit for each uniform of these
     std::vector<Value> samplers;
-};
-
-/// The properties that a renderer would have to work out for each draw.
-enum DrawProperty : uint32_t
-{
-    DRAW_MODEL = 1,
-    DRAW_MODEL_VIEW = 2,
-    DRAW_MODEL_VIEW_PROJECTION = 4,
-    DRAW_NORMAL_MODEL = 8,
-    DRAW_ALL = 15,   ///< the transforms above
-    DRAW_JOINTS = 16 ///< the program skins
+    /// By DrawTransform, single matrices that take a property which has that; null where there is none.
+    DrawnUniform* transforms[DRAW_TRANSFORM_COUNT] = {};
+    const ShaderUniformBase* transformSources[DRAW_TRANSFORM_COUNT] = {};
+    bool readsTransforms =
+        false; ///< one of values is such a property too: an array, or a second one that takes it
 };
 
 } // namespace detail
@@ -112,9 +107,8 @@ public:
     /// uniformExists("M_MIRROR_TEXTURE"), answered without comparing names.
     bool usesMirrorTexture() const { return m_usesMirrorTexture; }
 
-    /// Those of T_MODEL, T_MODEL_VIEW, T_MODEL_VIEW_PROJECTION, T_NORMAL_MODEL and J_WORLD that a uniform takes:
-    /// bits of detail::DrawProperty.
-    uint32_t getDrawProperties() const { return m_drawProperties; }
+    /// uniformExists("J_WORLD"), likewise.
+    bool usesJoints() const { return m_usesJoints; }
 
     /// Looks the property names up in the context, unless that was done before and neither the context nor its
     /// set of properties is another one by now. A name that is not found keeps what it had.
@@ -128,6 +122,16 @@ public:
     ///                 when values changes.
     void enable(RenderContext& context, const ShaderUniformBase* const* values,
                 detail::UniformSources& sources);
+
+    /// The same without the transforms of sources, which the caller sends by sendTransform() for each draw.
+    /// @return sources; null, with nothing done, without a live GL program.
+    const detail::UniformSources* prepare(RenderContext& context, const ShaderUniformBase* const* values,
+                                          detail::UniformSources& sources);
+
+    /// Sends the matrix to the current program, which has this uniform, unless it was sent last.
+    /// @param uniform  of a source with a DrawTransform of this type.
+    static void sendTransform(detail::DrawnUniform& uniform, const Matrix4f& matrix);
+    static void sendTransform(detail::DrawnUniform& uniform, const Matrix3f& matrix);
 
     /// The plain form: sends what changed to the current GL program, which must be this one.
     void enableUniforms();
@@ -166,10 +170,17 @@ private:
     ORV_LOCAL bool indexInRange(int index) const;
     ORV_LOCAL void addUniform(const char* name, int location, int size, unsigned glType, int& nextUnit);
     ORV_LOCAL void setSamplerUnits() const;
+    static void sendIfNew(const detail::UniformSources::Value& value);
+    bool isReady(const RenderContext& context, const detail::UniformSources& sources) const;
+    ORV_LOCAL bool makeReady(RenderContext& context, const ShaderUniformBase* const* values,
+                             detail::UniformSources& sources);
+    ORV_LOCAL void linkAnew(RenderContext& context);
     ORV_LOCAL void resolve(const ShaderUniformBase* const* values, detail::UniformSources& sources);
 
     uint64_t m_linkedRevision = 0; ///< the context's property revision at the last link
     uint64_t m_sourcesRevision;    ///< changes with every linked or set value
+    uint64_t m_readyRevision = 0;  ///< the last of all revisions when all values had been sent
+    uint64_t m_readyUniforms = 0;  ///< UniformSources::ownUniforms of that time
     SharedPtr<detail::ProgramResource> m_resource;
     std::vector<Uniform> m_uniforms;
     std::vector<UniformNames> m_names; ///< of m_uniforms
@@ -178,8 +189,8 @@ private:
     SharedPtr<detail::ProgramHandle> m_handle;
     uint64_t m_revision;
     mutable detail::DrawMark m_drawMark;
-    uint32_t m_drawProperties = 0;
     bool m_usesMirrorTexture = false;
+    bool m_usesJoints = false;
 };
 
 } // namespace orv

@@ -45,6 +45,18 @@ using UniformTypes =
              float, Vector2<float>, Vector3<float>, Vector4<float>, Matrix2<float>, Matrix3<float>,
              Matrix4<float>, SharedPtr<Texture2D>, SharedPtr<TextureCube>>;
 
+/// What a renderer works out anew for each draw, and sends without a look at the property that has it.
+enum class DrawTransform : uint32_t
+{
+    NONE,
+    MODEL,
+    MODEL_VIEW,
+    MODEL_VIEW_PROJECTION,
+    NORMAL_MODEL ///< a Matrix3f; the others are Matrix4f
+};
+
+inline constexpr int DRAW_TRANSFORM_COUNT = 5;
+
 } // namespace detail
 
 /// An array of values of one type that feeds shader uniforms: an appearance's property, a global property of a
@@ -121,6 +133,10 @@ public:
     /// Changes whenever a value changes and is never the same for two holders.
     uint64_t getRevision() const { return m_revision; }
 
+    /// The renderer's: which transform of the solids that it draws this property is to have.
+    detail::DrawTransform getDrawTransform() const { return m_drawTransform; }
+    void setDrawTransform(detail::DrawTransform transform) { m_drawTransform = transform; }
+
     /// Whether this is a ShaderUniform<T>; a static_cast is then safe.
     template <class T>
     bool holds() const
@@ -132,6 +148,8 @@ protected:
     /// @param size  below 1 is an error and counts as 1.
     ShaderUniformBase(int type, int size);
 
+    static void assertSize(const ShaderUniformBase* other, int size);
+
     /// Sends the values, which are of the holder's type, to the current program.
     void sendValues(int location, int textureUnit, const void* values) const;
 
@@ -141,8 +159,9 @@ protected:
 private:
     friend class ShaderProgram;
 
-    /// Takes over the source's values. @return whether any own value changed.
-    virtual bool copyFrom(const ShaderUniformBase& source) = 0;
+    /// Takes over the source's values, without a new revision, and sends all own ones to the current program if any
+    /// changed. @return whether any did.
+    virtual bool update(const ShaderUniformBase& source, int location, int textureUnit) = 0;
 
     /// Sends all own values to the current program.
     virtual void send(int location, int textureUnit) const = 0;
@@ -150,6 +169,7 @@ private:
     uint64_t m_revision = detail::nextRevision();
     int m_type;
     int m_size;
+    detail::DrawTransform m_drawTransform = detail::DrawTransform::NONE;
 };
 
 /// The value holder for one of the 21 types of detail::UniformTypes. Values start zeroed (null for textures).
@@ -215,13 +235,6 @@ public:
     /// @param index  in [0, getSize()); not checked.
     const T& get(int index = 0) const { return m_values[index]; }
 
-    /// The first value, to be written: for values that nearly always change, where comparing first would only cost time.
-    T& renew()
-    {
-        touch();
-        return m_values[0];
-    }
-
     /// Stores the value; an equal one (components compared with ==) changes nothing.
     /// @param index  in [0, getSize()); not checked.
     void set(const T& value, int index = 0)
@@ -233,15 +246,19 @@ public:
     }
 
 private:
-    bool copyFrom(const ShaderUniformBase& source) override
-    {
-        const ShaderUniformBase* other = &source;
-        const int size = getSize();
-        ORV_ASSERT(other->getSize() >= size);
-        if (!other->holds<T>())
-            return false;
+    friend class ShaderProgram;
 
+    bool update(const ShaderUniformBase& source, int location, int textureUnit) override
+    {
+        const int size = getSize();
+        if (!source.holds<T>())
+        {
+            assertSize(&source, size);
+            return false;
+        }
         const ShaderUniform& typed = static_cast<const ShaderUniform&>(source);
+        if (typed.getSize() < size) [[unlikely]]
+            assertSize(&source, size);
         const int count = std::min(size, typed.getSize());
         bool changed = false;
         for (int i = 0; i < count; ++i)
@@ -252,7 +269,7 @@ private:
             changed = true;
         }
         if (changed)
-            touch();
+            sendValues(location, textureUnit, m_values);
         return changed;
     }
 

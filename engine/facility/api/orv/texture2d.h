@@ -54,7 +54,7 @@ public:
     WrapMode getVerticalWrap();
 
     /// The GL name, 0 when there is none.
-    unsigned getId() const { return m_resource ? m_resource->getId() : 0; }
+    unsigned getId() const { return m_resource ? m_resource.get()->getId() : 0; }
     /// GL_TEXTURE_EXTERNAL_OES or GL_TEXTURE_2D.
     unsigned getTarget() const
     {

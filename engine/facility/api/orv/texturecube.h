@@ -55,7 +55,7 @@ public:
     /// and values outside their enums are refused (logged) and nothing changes.
     void setParameters(const TextureParameters& parameters);
 
-    unsigned getId() const { return m_resource ? m_resource->getId() : 0; }
+    unsigned getId() const { return m_resource ? m_resource.get()->getId() : 0; }
     unsigned getTarget() const { return detail::TEXTURE_TARGET_CUBE_MAP; }
     unsigned getWidth() const { return m_width; }   ///< pixels of a face
     unsigned getHeight() const { return m_height; } ///< pixels of a face

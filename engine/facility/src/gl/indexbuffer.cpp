@@ -89,32 +89,25 @@ void IndexBuffer::draw()
         glDrawArrays(mode, 0, m_count);
 }
 
-/// A function of its own, so that committed indices are drawn with fewer registers to save.
-[[gnu::noinline]] static void drawFromMemory(RenderContext& context, GLenum mode, int count,
-                                             const unsigned short* indices)
+detail::DrawCall IndexBuffer::bind(RenderContext& context)
 {
-    if (!indices)
-    {
-        glDrawArrays(mode, 0, count);
-        return;
-    }
-    context.bindElementBuffer(0);
-    glDrawElements(mode, count, GL_UNSIGNED_SHORT, indices);
+    using Kind = detail::DrawCall::Kind;
+    const GLuint buffer = getId();
+    if (!m_enabled || (buffer == 0 && m_committed))
+        return {};
+    const GLenum mode = glPrimitiveConvert(m_primitive);
+    if (buffer == 0 && !m_indices)
+        return {Kind::IN_ORDER, mode, m_count, nullptr};
+    context.bindElementBuffer(buffer);
+    return {Kind::INDEXED, mode, m_count, buffer != 0 ? nullptr : m_indices.get()};
 }
 
-void IndexBuffer::draw(RenderContext& context)
+void detail::DrawCall::issue() const
 {
-    if (!m_enabled)
-        return;
-    const GLuint buffer = getId();
-    if (buffer == 0)
-    {
-        if (!m_committed)
-            drawFromMemory(context, glPrimitiveConvert(m_primitive), m_count, m_indices.get());
-        return;
-    }
-    context.bindElementBuffer(buffer);
-    glDrawElements(glPrimitiveConvert(m_primitive), m_count, GL_UNSIGNED_SHORT, nullptr);
+    if (kind == Kind::INDEXED)
+        glDrawElements(mode, count, GL_UNSIGNED_SHORT, indices);
+    else if (kind == Kind::IN_ORDER)
+        glDrawArrays(mode, 0, count);
 }
 
 unsigned int IndexBuffer::getId() const

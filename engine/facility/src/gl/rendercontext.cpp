@@ -1,6 +1,7 @@
 #include "orv/rendercontext.h"
 
 #include "orv/detail/revision.h"
+#include "orv/detail/texturetarget.h"
 #include "orv/log.h"
 #include "orv/renderdevice.h"
 
@@ -476,6 +477,15 @@ void RenderContext::tidyBindings()
     if (m_activeUnit != 0)
         selectUnit(0);
     m_bindingsUsed = false;
+}
+
+int RenderContext::getTextureSlot(int unit, unsigned target)
+{
+    constexpr GLenum TARGETS[TEXTURE_TARGETS] = {GL_TEXTURE_2D, GL_TEXTURE_CUBE_MAP, GL_TEXTURE_EXTERNAL_OES};
+    const auto found = std::find(std::begin(TARGETS), std::end(TARGETS), target);
+    if (unsigned(unit) >= unsigned(TEXTURE_UNITS) || found == std::end(TARGETS))
+        return -1;
+    return unit * TEXTURE_TARGETS + int(found - std::begin(TARGETS));
 }
 
 void RenderContext::sendProgram(unsigned name)

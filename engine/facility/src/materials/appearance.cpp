@@ -277,25 +277,29 @@ void Appearance::resetProperties()
     }
 }
 
-[[gnu::always_inline]] inline void Appearance::enableProgram(RenderContext& context)
-{
-    ShaderProgram* program = m_shaderProgram.get();
-    if (!program)
-        return;
-    if (!m_linked) [[unlikely]]
-        linkShaderProgram();
-    program->enable(context, m_values.data(), m_sources);
-}
-
 void Appearance::enableShaderProgram(RenderContext& context)
 {
-    enableProgram(context);
+    if (!m_shaderProgram)
+        return;
+    linkShaderProgram();
+    m_shaderProgram->enable(context, m_values.data(), m_sources);
 }
 
 void Appearance::enable(RenderContext& context, bool turnWinding)
 {
     m_stateRevision = context.apply(m_state, m_stateRevision, !m_opaque, turnWinding);
-    enableProgram(context);
+    enableShaderProgram(context);
+}
+
+const detail::UniformSources* Appearance::prepare(RenderContext& context, bool turnWinding)
+{
+    m_stateRevision = context.apply(m_state, m_stateRevision, !m_opaque, turnWinding);
+    ShaderProgram* program = m_shaderProgram.get();
+    if (!program)
+        return nullptr;
+    if (!m_linked) [[unlikely]]
+        linkShaderProgram();
+    return program->prepare(context, m_values.data(), m_sources);
 }
 
 } // namespace orv

@@ -1,5 +1,6 @@
 #include "orv/shaderprogram.h"
 
+#include "shaderprogramdraw.h"
 #include "shaderuniformprivate.h"
 
 #include "orv/detail/bindingepoch.h"
@@ -25,82 +26,12 @@ namespace orv
 namespace
 {
 
-const char* const MIRROR_TEXTURE = "M_MIRROR_TEXTURE";
-
-struct NamedDrawProperty
-{
-    const char* name;
-    uint32_t bit;
-};
-
-constexpr NamedDrawProperty DRAW_PROPERTIES[] = {
-    {"T_MODEL", detail::DRAW_MODEL},
-    {"T_MODEL_VIEW", detail::DRAW_MODEL_VIEW},
-    {"T_MODEL_VIEW_PROJECTION", detail::DRAW_MODEL_VIEW_PROJECTION},
-    {"T_NORMAL_MODEL", detail::DRAW_NORMAL_MODEL},
-    {"J_WORLD", detail::DRAW_JOINTS},
-};
-
 const GLfloat MISSING_ATTRIB[4] = {1.0f, 1.0f, 1.0f, 1.0f};
-
-/// The attribute count of the last bind() of any program.
-int g_boundAttribCount = 0;
 
 template <class T>
 SharedPtr<ShaderUniformBase> makeHolder(int size)
 {
     return makeShared<ShaderUniform<T>>(size);
-}
-
-// One value of each type that most uniforms have.
-void send(GLint location, const float& value)
-{
-    glUniform1fv(location, 1, &value);
-}
-void send(GLint location, const Vector2<float>& value)
-{
-    glUniform2fv(location, 1, value.data());
-}
-void send(GLint location, const Vector3<float>& value)
-{
-    glUniform3fv(location, 1, value.data());
-}
-void send(GLint location, const Vector4<float>& value)
-{
-    glUniform4fv(location, 1, value.data());
-}
-void send(GLint location, const int& value)
-{
-    glUniform1iv(location, 1, &value);
-}
-void send(GLint location, const Matrix3<float>& value)
-{
-    glUniformMatrix3fv(location, 1, GL_FALSE, value.data());
-}
-void send(GLint location, const Matrix4<float>& value)
-{
-    glUniformMatrix4fv(location, 1, GL_FALSE, value.data());
-}
-
-/// The short way for a uniform that takes one value, from a source of its own type: sends it if it differs.
-/// @return false, with nothing done, for other uniforms and sources.
-template <class T>
-bool updateSingle(detail::DrawnUniform& uniform, const ShaderUniformBase& source)
-{
-    auto& sent = static_cast<ShaderUniform<T>&>(*uniform.sent.get());
-    if (sent.getSize() != 1 || !source.holds<T>())
-        return false;
-    const T& value = static_cast<const ShaderUniform<T>&>(source).get();
-    if (sent.get() == value)
-        return true;
-    sent.renew() = value;
-    send(uniform.location, value);
-    return true;
-}
-
-bool updateNothing(detail::DrawnUniform&, const ShaderUniformBase&)
-{
-    return false;
 }
 
 /// How a GL uniform type is held. Samplers have a target in place of a holder: keeping the texture that was sent
@@ -109,47 +40,39 @@ struct UniformType
 {
     GLenum glType;
     SharedPtr<ShaderUniformBase> (*makeHolder)(int size);
-    bool (*update)(detail::DrawnUniform& uniform, const ShaderUniformBase& source);
     GLenum textureTarget;
 };
 
 constexpr UniformType UNIFORM_TYPES[] = {
-    {GL_FLOAT, makeHolder<float>, updateSingle<float>, 0},
-    {GL_FLOAT_VEC2, makeHolder<Vector2<float>>, updateSingle<Vector2<float>>, 0},
-    {GL_FLOAT_VEC3, makeHolder<Vector3<float>>, updateSingle<Vector3<float>>, 0},
-    {GL_FLOAT_VEC4, makeHolder<Vector4<float>>, updateSingle<Vector4<float>>, 0},
-    {GL_INT, makeHolder<int>, updateSingle<int>, 0},
-    {GL_INT_VEC2, makeHolder<Vector2<int>>, updateNothing, 0},
-    {GL_INT_VEC3, makeHolder<Vector3<int>>, updateNothing, 0},
-    {GL_INT_VEC4, makeHolder<Vector4<int>>, updateNothing, 0},
-    {GL_BOOL, makeHolder<bool>, updateNothing, 0},
-    {GL_BOOL_VEC2, makeHolder<Vector2<bool>>, updateNothing, 0},
-    {GL_BOOL_VEC3, makeHolder<Vector3<bool>>, updateNothing, 0},
-    {GL_BOOL_VEC4, makeHolder<Vector4<bool>>, updateNothing, 0},
-    {GL_FLOAT_MAT2, makeHolder<Matrix2<float>>, updateNothing, 0},
-    {GL_FLOAT_MAT3, makeHolder<Matrix3<float>>, updateSingle<Matrix3<float>>, 0},
-    {GL_FLOAT_MAT4, makeHolder<Matrix4<float>>, updateSingle<Matrix4<float>>, 0},
-    {GL_SAMPLER_2D, nullptr, nullptr, GL_TEXTURE_2D},
-    {GL_SAMPLER_CUBE, nullptr, nullptr, GL_TEXTURE_CUBE_MAP},
-    {GL_SAMPLER_EXTERNAL_OES, nullptr, nullptr, GL_TEXTURE_EXTERNAL_OES},
+    {GL_FLOAT, makeHolder<float>, 0},
+    {GL_FLOAT_VEC2, makeHolder<Vector2<float>>, 0},
+    {GL_FLOAT_VEC3, makeHolder<Vector3<float>>, 0},
+    {GL_FLOAT_VEC4, makeHolder<Vector4<float>>, 0},
+    {GL_INT, makeHolder<int>, 0},
+    {GL_INT_VEC2, makeHolder<Vector2<int>>, 0},
+    {GL_INT_VEC3, makeHolder<Vector3<int>>, 0},
+    {GL_INT_VEC4, makeHolder<Vector4<int>>, 0},
+    {GL_BOOL, makeHolder<bool>, 0},
+    {GL_BOOL_VEC2, makeHolder<Vector2<bool>>, 0},
+    {GL_BOOL_VEC3, makeHolder<Vector3<bool>>, 0},
+    {GL_BOOL_VEC4, makeHolder<Vector4<bool>>, 0},
+    {GL_FLOAT_MAT2, makeHolder<Matrix2<float>>, 0},
+    {GL_FLOAT_MAT3, makeHolder<Matrix3<float>>, 0},
+    {GL_FLOAT_MAT4, makeHolder<Matrix4<float>>, 0},
+    {GL_SAMPLER_2D, nullptr, GL_TEXTURE_2D},
+    {GL_SAMPLER_CUBE, nullptr, GL_TEXTURE_CUBE_MAP},
+    {GL_SAMPLER_EXTERNAL_OES, nullptr, GL_TEXTURE_EXTERNAL_OES},
 };
 
-/// The texture that a sampler of this target reads from source; 0 when source holds none that fits.
-inline GLuint getTextureName(const ShaderUniformBase& source, GLenum target)
+/// Whether a renderer can send the source's transform to the uniform without a look at either.
+bool takesTransform(const detail::DrawnUniform& uniform, const ShaderUniformBase& source,
+                    const detail::UniformSources& sources)
 {
-    if (source.holds<SharedPtr<Texture2D>>())
-    {
-        const Texture2D* texture =
-            static_cast<const ShaderUniform<SharedPtr<Texture2D>>&>(source).get().get();
-        return texture && texture->getTarget() == target ? texture->getId() : 0;
-    }
-    if (source.holds<SharedPtr<TextureCube>>())
-    {
-        const TextureCube* texture =
-            static_cast<const ShaderUniform<SharedPtr<TextureCube>>&>(source).get().get();
-        return texture && texture->getTarget() == target ? texture->getId() : 0;
-    }
-    return 0;
+    const detail::DrawTransform transform = source.getDrawTransform();
+    if (transform == detail::DrawTransform::NONE || uniform.size > 1 || sources.transforms[int(transform)])
+        return false;
+    return transform == detail::DrawTransform::NORMAL_MODEL ? uniform.sent->holds<Matrix3f>()
+                                                            : uniform.sent->holds<Matrix4f>();
 }
 
 } // namespace
@@ -224,7 +147,6 @@ void ShaderProgram::addUniform(const char* name, int location, int size, unsigne
     Uniform uniform;
     uniform.location = location;
     uniform.size = size;
-    uniform.update = type->update;
     if (type->makeHolder)
     {
         uniform.sent = type->makeHolder(size);
@@ -235,6 +157,7 @@ void ShaderProgram::addUniform(const char* name, int location, int size, unsigne
     {
         uniform.textureTarget = type->textureTarget;
         uniform.textureUnit = nextUnit;
+        uniform.textureSlot = size == 1 ? RenderContext::getTextureSlot(nextUnit, type->textureTarget) : -1;
         nextUnit += size;
     }
     m_uniforms.push_back(std::move(uniform));
@@ -299,10 +222,8 @@ void ShaderProgram::setUniformPropertyName(int index, const char* name)
     m_uniforms[std::size_t(index)].linked.reset(); // it belonged to the old name
     m_linkedRevision = 0;
     m_sourcesRevision = detail::nextRevision();
-    m_usesMirrorTexture = uniformExists(MIRROR_TEXTURE);
-    m_drawProperties = 0;
-    for (const NamedDrawProperty& property : DRAW_PROPERTIES)
-        m_drawProperties |= uniformExists(property.name) ? property.bit : 0u;
+    m_usesMirrorTexture = uniformExists("M_MIRROR_TEXTURE");
+    m_usesJoints = uniformExists("J_WORLD");
 }
 
 void ShaderProgram::setUniformPropertyValue(int index, const SharedPtr<ShaderUniformBase>& value)
@@ -320,11 +241,8 @@ bool ShaderProgram::uniformExists(const char* propertyName) const
                        [propertyName](const UniformNames& names) { return names.property == propertyName; });
 }
 
-void ShaderProgram::link(RenderContext& context)
+void ShaderProgram::linkAnew(RenderContext& context)
 {
-    // No two contexts ever have the same property revision, so it stands for the context as well.
-    if (m_linkedRevision == context.getPropertyRevision()) [[likely]]
-        return;
     for (std::size_t i = 0; i < m_uniforms.size(); ++i)
         context.linkUniform(m_uniforms[i].linked, m_names[i].property.c_str());
     m_linkedRevision = context.getPropertyRevision();
@@ -333,55 +251,42 @@ void ShaderProgram::link(RenderContext& context)
 
 void ShaderProgram::resolve(const ShaderUniformBase* const* values, detail::UniformSources& sources)
 {
+    // Materials can tell only so many uniforms apart; of more, each is looked at for every material.
+    const bool isLarge = m_uniforms.size() > 64;
+    std::vector<detail::UniformSources::Value> others;
     sources.values.clear();
     sources.samplers.clear();
+    std::fill(std::begin(sources.transforms), std::end(sources.transforms), nullptr);
+    sources.ownUniforms = 0;
+    sources.readsTransforms = false;
     for (std::size_t i = 0; i < m_uniforms.size(); ++i)
     {
         Uniform& uniform = m_uniforms[i];
-        const ShaderUniformBase* source = values ? values[i] : nullptr;
-        if (!source)
-            source = uniform.value ? uniform.value.get() : uniform.linked.get();
+        const ShaderUniformBase* const own = values ? values[i] : nullptr;
+        const ShaderUniformBase* const other = uniform.value ? uniform.value.get() : uniform.linked.get();
+        const ShaderUniformBase* const source = own ? own : other;
         if (uniform.textureUnit >= 0)
             sources.samplers.push_back({source, &uniform});
-        else if (source)
+        else if (source && takesTransform(uniform, *source, sources))
+        {
+            sources.transforms[int(source->getDrawTransform())] = &uniform;
+            sources.transformSources[int(source->getDrawTransform())] = source;
+        }
+        else if (own || (source && isLarge))
+        {
             sources.values.push_back({source, &uniform});
+            sources.ownUniforms |= isLarge ? 0 : uint64_t(1) << i;
+        }
+        else if (source)
+            others.push_back({source, &uniform});
     }
+    sources.ownCount = sources.values.size();
+    sources.values.insert(sources.values.end(), others.begin(), others.end());
+    sources.readsTransforms =
+        std::any_of(sources.values.begin(), sources.values.end(),
+                    [](const detail::UniformSources::Value& value)
+                    { return value.source->getDrawTransform() != detail::DrawTransform::NONE; });
     sources.revision = m_sourcesRevision;
-}
-
-void ShaderProgram::enable(RenderContext& context, const ShaderUniformBase* const* values,
-                           detail::UniformSources& sources)
-{
-    if (!context.isProgramReady(m_revision))
-    {
-        const unsigned program = getId();
-        if (!program)
-            return;
-        context.useProgram(program);
-        context.setCurrentProgram(m_handle);
-        context.setProgramReady(m_revision);
-    }
-    link(context);
-    if (sources.revision != m_sourcesRevision)
-        resolve(values, sources);
-
-    for (const auto& [source, uniform] : sources.values)
-    {
-        if (uniform->sentRevision == source->getRevision())
-            continue;
-        uniform->sentRevision = source->getRevision();
-        if (uniform->update(*uniform, *source))
-            continue;
-        ShaderUniformBase& sent = *uniform->sent.get();
-        if (sent.copyFrom(*source))
-            sent.send(uniform->location, uniform->textureUnit);
-    }
-    for (const auto& [source, sampler] : sources.samplers)
-    {
-        const GLuint name = source ? getTextureName(*source, sampler->textureTarget) : 0;
-        for (int i = 0; i < sampler->size; ++i)
-            context.bindTexture(sampler->textureUnit + i, sampler->textureTarget, name);
-    }
 }
 
 void ShaderProgram::enableUniforms()
@@ -395,7 +300,7 @@ void ShaderProgram::enableUniforms()
             uniform.sentRevision = 0; // the draw path is to compare again
             continue;
         }
-        const GLuint texture = source ? getTextureName(*source, uniform.textureTarget) : 0;
+        const GLuint texture = source ? detail::getTextureName(*source, uniform.textureTarget) : 0;
         for (int i = 0; i < uniform.size; ++i)
         {
             glActiveTexture(GLenum(GL_TEXTURE0 + uniform.textureUnit + i));
@@ -418,18 +323,10 @@ void ShaderProgram::bind(VertexBuffer& buffer)
         glVertexAttrib4fv(GLuint(attrib.location), MISSING_ATTRIB);
     }
     const int count = int(m_attribs.size());
-    for (int i = count; i < g_boundAttribCount; ++i)
+    for (int i = count; i < detail::g_boundAttribCount; ++i)
         glDisableVertexAttribArray(GLuint(i));
-    g_boundAttribCount = count;
+    detail::g_boundAttribCount = count;
     detail::bindingsChanged();
-}
-
-void ShaderProgram::bind(RenderContext& context, VertexBuffer& buffer)
-{
-    if (!getId())
-        return;
-    buffer.bindAttribs(context, m_revision, m_attribs.data(), int(m_attribs.size()));
-    g_boundAttribCount = int(m_attribs.size());
 }
 
 bool ShaderProgram::isValid() const

@@ -229,6 +229,11 @@ ShaderUniformBase::ShaderUniformBase(int type, int size) : m_type(type), m_size(
     }
 }
 
+void ShaderUniformBase::assertSize(const ShaderUniformBase* other, int size)
+{
+    ORV_ASSERT(other->getSize() >= size);
+}
+
 void ShaderUniformBase::sendValues(int location, int textureUnit, const void* values) const
 {
     SENDERS[std::size_t(m_type)](location, textureUnit, m_size, values);
@@ -237,8 +242,9 @@ void ShaderUniformBase::sendValues(int location, int textureUnit, const void* va
 void ShaderUniformBase::enable(const SharedPtr<ShaderUniformBase>& source, int location, int textureUnit,
                                bool force)
 {
-    const bool changed = source && copyFrom(*source);
-    if (changed || force)
+    if (source && update(*source, location, textureUnit))
+        touch();
+    else if (force)
         send(location, textureUnit);
 }
 

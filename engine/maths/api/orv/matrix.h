@@ -152,9 +152,25 @@ struct ORV_API ModelProjection
     ModelProjection(const Matrix4<float>& viewMatrix, const Matrix4<float>& projection);
 };
 
+ORV_API Matrix4<float> multiplySkewed(const ModelProjection& projection, const Matrix4<float>& world);
+
 /// Each product rounded as operator* rounds it.
 /// @param projection  usable; world must be affine.
-ORV_API void multiply(Matrix4<float>& result, const ModelProjection& projection, const Matrix4<float>& world);
+[[gnu::always_inline]] inline Matrix4<float> multiply(const ModelProjection& projection,
+                                                      const Matrix4<float>& world)
+{
+    if (projection.isSkewed)
+        return multiplySkewed(projection, world);
+    const Matrix4<float>& view = projection.view;
+    const auto place = [&view](const Vector4<float>& v) __attribute__((always_inline))
+    {
+        return view.columns[0] * v.x + view.columns[1] * v.y + view.columns[2] * v.z;
+    };
+    return Matrix4<float>(place(world.columns[0]) * projection.scale,
+                          place(world.columns[1]) * projection.scale,
+                          place(world.columns[2]) * projection.scale,
+                          (place(world.columns[3]) + view.columns[3]) * projection.scale + projection.last);
+}
 
 /// Whether the last row is 0 0 0 1.
 inline bool isAffine(const Matrix4<float>& m)

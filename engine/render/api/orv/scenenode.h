@@ -1,5 +1,6 @@
 #pragma once
 
+#include "orv/detail/childlist.h"
 #include "orv/flagmask.h"
 #include "orv/matrix.h"
 #include "orv/quaternion.h"
@@ -9,7 +10,6 @@
 
 #include <cstdint>
 #include <memory>
-#include <string>
 #include <vector>
 
 namespace orv
@@ -50,7 +50,7 @@ public:
     /// Calls the visitor's visit() for this node's own class; children are not walked (see visitScene()).
     virtual void accept(SceneNodeVisitor& visitor);
 
-    const char* getName() const { return m_name.c_str(); }
+    const char* getName() const { return m_name ? m_name.get() : ""; }
     /// @param name  copied; null counts as empty.
     void setName(const char* name);
 
@@ -126,11 +126,13 @@ public:
     /// Called by the parent's destructor on a node that lives on: it becomes a root.
     void onParentDestroyed();
 
-    unsigned int getChildCount() const { return static_cast<unsigned int>(m_children.size()); }
+    unsigned int getChildCount() const { return m_children ? m_children->getCount() : 0; }
     /// @return empty, after logging an assertion, for an index beyond the last child.
     const SharedPtr<SceneNode>& getChild(unsigned int i) const;
-    /// In the order in which they were added.
-    const std::vector<SharedPtr<SceneNode>>& getChildren() const { return m_children; }
+    /// In the order in which they were added; valid until that changes.
+    const std::vector<SharedPtr<SceneNode>>& getChildren() const;
+
+    detail::ChildList* getChildList() const { return m_children.get(); } ///< the walks'; null for most nodes
 
     /// Depth first, this node before its children, children in order; names compare exactly.
     /// @return borrowed; null when no node of this subtree has the name.
@@ -139,36 +141,47 @@ public:
 
 private:
     friend class Solid;
+    friend class detail::ChildList;
+
+    /// What few nodes have.
+    struct Extras
+    {
+        SharedPtr<detail::JointTie> tie; ///< of a joint of solids
+        std::unique_ptr<Matrix4f> lastWorldTransform;
+        Matrix3f normalTransform; ///< unless the world transform is rigid
+        bool isNormalKnown = false;
+    };
 
     ORV_LOCAL SharedPtr<detail::JointTie> tie();
     ORV_LOCAL void countSkinned(uint32_t more);
+    ORV_LOCAL void addChild(SceneNode& child);
     ORV_LOCAL SharedPtr<SceneNode> takeChild(const SceneNode* child);
+    ORV_LOCAL void endChildren();
     ORV_LOCAL void buildLocal() const;
     ORV_LOCAL void updateRoot() const;
     ORV_LOCAL void placeBelow(const Matrix4f& parentWorld, bool parentMirrored, bool parentRigid) const;
-    void updateNormal() const;
+    ORV_LOCAL Extras* makeExtras() const;
+    Matrix3f findNormal() const;
     ORV_LOCAL void markChildren();
 
     mutable bool m_localMirrored = false;
     mutable bool m_worldMirrored = false;
     mutable bool m_localTransformChanged = false;
     mutable bool m_worldTransformChanged = false;
-    mutable bool m_normalTransformChanged = false;
     mutable bool m_localRigid = true; ///< known to be rotation and translation alone
     mutable bool m_worldRigid = true;
     bool m_scaled = false; ///< m_scale is not all 1
     uint32_t m_flags = 0;
-    uint32_t m_skinnedCount = 0;       ///< solids with joints in this subtree, itself included
-    SharedPtr<detail::JointTie> m_tie; ///< once it is a joint of a solid
-    std::string m_name;
+    uint32_t m_skinnedCount = 0; ///< solids with joints in this subtree, itself included
+    uint32_t m_place = 0;        ///< in the parent's list
     Vector3f m_scale{1.0f, 1.0f, 1.0f};
     Quaternionf m_rotation;
     Vector3f m_position;
     mutable Matrix4f m_localTransform = Matrix4f::IDENTITY;
     mutable Matrix4f m_worldTransform = Matrix4f::IDENTITY;
-    mutable Matrix3f m_normalTransform;             ///< unless the world transform is rigid
-    std::unique_ptr<Matrix4f> m_lastWorldTransform; ///< few nodes need one
-    std::vector<SharedPtr<SceneNode>> m_children;
+    std::unique_ptr<char[]> m_name;
+    mutable std::unique_ptr<Extras> m_extras;
+    std::unique_ptr<detail::ChildList> m_children;
     SceneNode* m_parent = nullptr;
 };
 
@@ -191,14 +204,12 @@ inline Matrix3f SceneNode::getNormalTransform() const
     const Matrix4f& world = getWorldTransform();
     if (m_worldRigid)
         return upper3x3(world);
-    if (m_normalTransformChanged)
-        updateNormal();
-    return m_normalTransform;
+    return findNormal();
 }
 
 inline const Matrix4f& SceneNode::getLastWorldTransform() const
 {
-    return m_lastWorldTransform ? *m_lastWorldTransform : Matrix4f::IDENTITY;
+    return m_extras && m_extras->lastWorldTransform ? *m_extras->lastWorldTransform : Matrix4f::IDENTITY;
 }
 
 inline bool SceneNode::getWorldMirrored() const

@@ -1,5 +1,6 @@
 #pragma once
 
+#include "orv/detail/drawcall.h"
 #include "orv/matrix.h"
 #include "orv/scenenode.h"
 #include "orv/sharedptr.h"
@@ -13,6 +14,7 @@ namespace orv
 class Appearance;
 class Mesh;
 class RenderContext;
+class ShaderProgram;
 
 namespace detail
 {
@@ -50,6 +52,8 @@ public:
     const SharedPtr<Appearance>& getAppearance() const { return m_appearance; }
     void setAppearance(const SharedPtr<Appearance>& appearance);
 
+    /// Whether anything about joints was ever set.
+    bool hasSkin() const { return m_skin != nullptr; }
     int getJointsPerVertex() const { return m_skin ? m_skin->jointsPerVertex : 0; }
     /// @param count  0 to 4; larger is clamped with a warning, negative counts as 0.
     void setJointsPerVertex(int count);
@@ -87,6 +91,16 @@ public:
     /// drawn. GL thread only.
     void draw(RenderContext& context, Appearance& appearance);
 
+    /// Draw path: binds the vertices and indices of the mesh, which is there, but for what is bound already.
+    /// @return how to draw the mesh, any number of times until something else is bound.
+    detail::DrawCall bindMesh(RenderContext& context, ShaderProgram& program) const;
+
+    /// Whether draw() turns the winding for this program, which may be null.
+    bool turnsWinding(const ShaderProgram* program) const
+    {
+        return m_skin ? turnsSkinWinding(program) : getWorldMirrored();
+    }
+
 private:
     struct Joint
     {
@@ -104,6 +118,7 @@ private:
     };
 
     Skin& makeSkin();
+    bool turnsSkinWinding(const ShaderProgram* program) const;
     ORV_LOCAL bool isSkinMirrored() const;
     ORV_LOCAL Matrix4f calculateJointTransform(const SceneNode* joint, const Matrix4f& inverseBind) const;
 

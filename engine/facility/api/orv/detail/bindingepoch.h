@@ -1,5 +1,6 @@
 #pragma once
 
+#include "orv/detail/revision.h"
 #include "orv/export.h"
 
 #include <cstdint>
@@ -7,7 +8,7 @@
 namespace orv::detail
 {
 
-/// Moves whenever something outside the draw path has changed a GL binding; bindingsChanged() alone writes it.
+/// A new stamp whenever something outside the draw path has changed a GL binding; bindingsChanged() alone writes it.
 extern ORV_API uint64_t g_bindingEpoch;
 
 /// To be called after every glBind*, glUseProgram, glDelete* or vertex array call that does not go through a
@@ -15,7 +16,7 @@ extern ORV_API uint64_t g_bindingEpoch;
 /// call RenderContext::forgetBindings().)
 inline void bindingsChanged()
 {
-    ++g_bindingEpoch;
+    g_bindingEpoch = nextRevision();
 }
 
 } // namespace orv::detail

@@ -1,0 +1,131 @@
+// What a shader program does for each draw; the rest of the class is in shaderprogram.cpp.
+
+#include "shaderprogramdraw.h"
+
+#include "shaderuniformprivate.h"
+
+#include "orv/rendercontext.h"
+#include "orv/shaderprogram.h"
+#include "orv/vertexbuffer.h"
+
+namespace orv
+{
+
+int detail::g_boundAttribCount = 0;
+
+void ShaderProgram::link(RenderContext& context)
+{
+    // No two contexts ever have the same property revision, so it stands for the context as well.
+    if (m_linkedRevision != context.getPropertyRevision()) [[unlikely]]
+        linkAnew(context);
+}
+
+namespace
+{
+
+void bindSampler(RenderContext& context, const detail::UniformSources::Value& value)
+{
+    const detail::DrawnUniform& sampler = *value.uniform;
+    const unsigned name = value.source ? detail::getTextureName(*value.source, sampler.textureTarget) : 0;
+    context.bindTexture(sampler.textureUnit, sampler.textureTarget, name, sampler.textureSlot);
+    for (int i = 1; i < sampler.size; ++i)
+        context.bindTexture(sampler.textureUnit + i, sampler.textureTarget, name);
+}
+
+} // namespace
+
+inline void ShaderProgram::sendIfNew(const detail::UniformSources::Value& value)
+{
+    detail::DrawnUniform& uniform = *value.uniform;
+    if (uniform.sentRevision == value.source->getRevision())
+        return;
+    uniform.sentRevision = value.source->getRevision();
+    uniform.sent.get()->update(*value.source, uniform.location, uniform.textureUnit);
+}
+
+const detail::UniformSources* ShaderProgram::prepare(RenderContext& context,
+                                                     const ShaderUniformBase* const* values,
+                                                     detail::UniformSources& sources)
+{
+    if (!isReady(context, sources) && !makeReady(context, values, sources))
+        return nullptr;
+    for (std::size_t i = 0; i < sources.ownCount; ++i)
+        sendIfNew(sources.values[i]);
+    for (const detail::UniformSources::Value& sampler : sources.samplers)
+        bindSampler(context, sampler);
+    return &sources;
+}
+
+/// Whether the program is current and nothing has changed since all values were sent, but for what a material has of
+/// its own.
+inline bool ShaderProgram::isReady(const RenderContext& context, const detail::UniformSources& sources) const
+{
+    return context.isProgramReady(m_revision) && m_readyRevision == detail::g_lastRevision &&
+           m_readyUniforms == sources.ownUniforms && sources.revision == m_sourcesRevision;
+}
+
+[[gnu::noinline]] bool ShaderProgram::makeReady(RenderContext& context,
+                                                const ShaderUniformBase* const* values,
+                                                detail::UniformSources& sources)
+{
+    const unsigned program = getId();
+    if (!program)
+        return false;
+    context.useProgram(program);
+    context.setCurrentProgram(m_handle);
+    context.setProgramReady(m_revision);
+    link(context);
+    if (sources.revision != m_sourcesRevision)
+        resolve(values, sources);
+    for (std::size_t i = sources.ownCount; i < sources.values.size(); ++i)
+        sendIfNew(sources.values[i]);
+    m_readyRevision = detail::g_lastRevision;
+    m_readyUniforms = sources.ownUniforms;
+    return true;
+}
+
+void ShaderProgram::enable(RenderContext& context, const ShaderUniformBase* const* values,
+                           detail::UniformSources& sources)
+{
+    if (!prepare(context, values, sources))
+        return;
+    for (int i = 0; i < detail::DRAW_TRANSFORM_COUNT; ++i)
+    {
+        detail::DrawnUniform* uniform = sources.transforms[i];
+        if (!uniform)
+            continue;
+        uniform->sentRevision = 0;
+        uniform->sent.get()->update(*sources.transformSources[i], uniform->location, -1);
+    }
+}
+
+void ShaderProgram::sendTransform(detail::DrawnUniform& uniform, const Matrix4f& matrix)
+{
+    Matrix4f& sent = *static_cast<ShaderUniform<Matrix4f>&>(*uniform.sent.get()).m_values;
+    // The translation first: it differs most.
+    if (sent.columns[3] == matrix.columns[3] && sent == matrix)
+        return;
+    sent = matrix;
+    uniform.sentRevision = 0;
+    ShaderUniformPrivate::setUniform(uniform.location, -1, 1, &sent);
+}
+
+void ShaderProgram::sendTransform(detail::DrawnUniform& uniform, const Matrix3f& matrix)
+{
+    Matrix3f& sent = *static_cast<ShaderUniform<Matrix3f>&>(*uniform.sent.get()).m_values;
+    if (sent == matrix)
+        return;
+    sent = matrix;
+    uniform.sentRevision = 0;
+    ShaderUniformPrivate::setUniform(uniform.location, -1, 1, &sent);
+}
+
+void ShaderProgram::bind(RenderContext& context, VertexBuffer& buffer)
+{
+    if (!getId())
+        return;
+    buffer.bindAttribs(context, m_revision, m_attribs.data(), int(m_attribs.size()));
+    detail::g_boundAttribCount = int(m_attribs.size());
+}
+
+} // namespace orv

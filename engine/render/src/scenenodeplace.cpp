@@ -1,0 +1,139 @@
+// How a node finds its place in the world; the rest of the class is in scenenode.cpp.
+
+#include "orv/scenenode.h"
+
+#include <cmath>
+
+namespace orv
+{
+
+void SceneNode::setPosition(const Vector3f& position)
+{
+    if (position == m_position)
+        return;
+    m_position = position;
+    setTransformChanged();
+}
+
+void SceneNode::setRotation(const Quaternionf& rotation)
+{
+    if (rotation == m_rotation)
+        return;
+    m_rotation = rotation;
+    setTransformChanged();
+}
+
+void SceneNode::setScale(const Vector3f& scale)
+{
+    if (scale == m_scale)
+        return;
+    m_scale = scale;
+    m_scaled = !(scale == Vector3f(1.0f, 1.0f, 1.0f));
+    setTransformChanged();
+}
+
+void SceneNode::setTransformChanged()
+{
+    m_localTransformChanged = true;
+    setWorldTransformChanged();
+}
+
+void SceneNode::setWorldTransformChanged()
+{
+    if (m_worldTransformChanged)
+        return;
+    m_worldTransformChanged = true;
+    if (m_children)
+        markChildren();
+}
+
+[[gnu::noinline]] void SceneNode::markChildren() // most nodes have none
+{
+    detail::ChildList::Cursor children(*m_children);
+    while (SceneNode* child = children.next())
+        child->setWorldTransformChanged();
+}
+
+void SceneNode::updateLocal() const
+{
+    if (m_localTransformChanged)
+        buildLocal();
+}
+
+void SceneNode::buildLocal() const
+{
+    const Matrix3f rotation = toMatrix3(m_rotation);
+    m_localTransform = Matrix4f(Vector4f(rotation.columns[0], 0.0f), Vector4f(rotation.columns[1], 0.0f),
+                                Vector4f(rotation.columns[2], 0.0f), Vector4f(m_position, 1.0f));
+    m_localMirrored = false;
+    m_localRigid = !m_scaled;
+    m_localTransformChanged = false;
+    if (!m_scaled)
+        return;
+    m_localTransform.columns[0] *= m_scale.x;
+    m_localTransform.columns[1] *= m_scale.y;
+    m_localTransform.columns[2] *= m_scale.z;
+    m_localMirrored = (m_scale.x < 0.0f) != ((m_scale.y < 0.0f) != (m_scale.z < 0.0f));
+}
+
+[[gnu::always_inline]] inline void SceneNode::placeBelow(const Matrix4f& parentWorld, bool parentMirrored,
+                                                         bool parentRigid) const
+{
+    if (m_localTransformChanged)
+        buildLocal();
+    if (m_localRigid)
+        detail::multiplyAffine(m_worldTransform, parentWorld, m_localTransform);
+    else
+        m_worldTransform = parentWorld * m_localTransform;
+    m_worldMirrored = parentMirrored != m_localMirrored;
+    m_worldRigid = parentRigid && m_localRigid;
+    m_worldTransformChanged = false;
+    if (m_extras)
+        m_extras->isNormalKnown = false;
+}
+
+void SceneNode::updateAll(const Matrix4f& parentWorld, bool parentMirrored) const
+{
+    placeBelow(parentWorld, parentMirrored, false);
+}
+
+void SceneNode::update() const
+{
+    if (!m_worldTransformChanged)
+        return;
+    const SceneNode* parent = m_parent;
+    if (parent && parent->m_worldTransformChanged)
+        parent->update();
+    if (parent)
+        placeBelow(parent->m_worldTransform, parent->m_worldMirrored, parent->m_worldRigid);
+    else
+        updateRoot();
+}
+
+void SceneNode::updateRoot() const
+{
+    placeBelow(Matrix4f::IDENTITY, false, true);
+}
+
+/// For a world transform that is not rigid; the update is done.
+Matrix3f SceneNode::findNormal() const
+{
+    Extras* const extras = makeExtras();
+    if (extras && extras->isNormalKnown)
+        return extras->normalTransform;
+    const Vector3f x = m_worldTransform.columns[0].xyz();
+    const Vector3f y = m_worldTransform.columns[1].xyz();
+    const Vector3f z = m_worldTransform.columns[2].xyz();
+    const Vector3f yz = cross(y, z);
+    const float reciprocal = 1.0f / dot(x, yz);
+    const float factor = std::isfinite(reciprocal) ? reciprocal : 1.0f;
+    const Matrix3f normal(yz * factor, cross(z, x) * factor, cross(x, y) * factor);
+    if (extras)
+    {
+        extras->normalTransform = normal;
+        extras->isNormalKnown = true;
+    }
+    return normal;
+}
+
+} // namespace orv

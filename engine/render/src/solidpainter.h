@@ -1,0 +1,62 @@
+#pragma once
+
+#include "orv/detail/drawcall.h"
+#include "orv/matrix.h"
+
+#include <cstddef>
+#include <cstdint>
+
+namespace orv
+{
+
+class Appearance;
+class Mesh;
+class RenderContext;
+class Solid;
+
+namespace detail
+{
+
+struct RendererProperties;
+struct UniformSources;
+
+/// Draws a list of solids for one eye. From solid to solid it looks only at what may have changed: a material and a
+/// mesh that the solid before had too are drawn again as they stand.
+class SolidPainter
+{
+public:
+    /// @param context, properties, view  borrowed.
+    SolidPainter(RenderContext& context, const RendererProperties& properties, const Matrix4f& view,
+                 const Matrix4f& projection);
+
+    /// In this order. The transform properties have the values of the last solid afterwards.
+    /// @param solids  each with an appearance and a program.
+    void draw(Solid* const* solids, size_t count);
+
+private:
+    bool takeMaterial(const Solid& solid);
+    void publishJoints(const Solid& solid);
+    bool takeMesh(const Solid& solid);
+    void sendTransforms(const Solid& solid) const;
+    void publishTransforms(const Solid& solid) const;
+    Matrix4f place(const Solid& solid) const;
+    Matrix4f project(const Solid& solid) const;
+
+    RenderContext& m_context;
+    const RendererProperties& m_properties;
+    const Matrix4f& m_view;
+    const Matrix4f m_projection;
+    const ModelProjection m_modelProjection;
+
+    // Of the solid before; null where the next one has to be looked at in any case.
+    const Appearance* m_appearance = nullptr;
+    const Mesh* m_mesh = nullptr;
+    uint64_t m_revision = 0; ///< the last of all revisions when its material was ready
+    bool m_turnsWinding = false;
+    bool m_hadJoints;
+    const UniformSources* m_sources = nullptr;
+    DrawCall m_call; ///< of m_mesh
+};
+
+} // namespace detail
+} // namespace orv
