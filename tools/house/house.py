@@ -3,8 +3,8 @@
 
     house.py [--check]
 
-A row of the page's first table names a room, a row of the second one a floor of the facility; the last column says what
-it stands on. A room may include what it stands on and what those stand on. Without --check the drawing on the page is
+A row of the page's first table names a room, a row of the others a floor of a large room; the last column says what it
+stands on. A room may include what it stands on and what those stand on. Without --check the drawing on the page is
 made again; with it, a drawing that differs is an error, as is an include that the tables do not allow, a room that they
 do not list, an include of another room's src folder, and a folder of too many sources. Exit code 1 then.
 """
@@ -16,7 +16,7 @@ import sys
 
 ROOT = pathlib.Path(__file__).resolve().parents[2]
 PAGE = ROOT / "docs/house.md"
-FACILITY = "engine/facility"
+FLOORED = {"engine/facility": "## The floors of the facility", "engine/render": "## The floors of the scene"}
 MOST_SOURCES = 35
 DRAWING = re.compile(r"(<!-- drawn by ./run house -->\n)(.*?)(<!-- end -->)", re.DOTALL)
 
@@ -28,14 +28,11 @@ class Room:
         self.stands_on = re.findall(r"`([^`]+)`", cells[-1])
 
 
-def read_tables(page):
-    """The rooms and the floors of the facility, in the page's order."""
-    tables = []
-    for heading in ("## The rooms", "## The floors of the facility"):
-        part = page.split(heading, 1)[1].split("\n## ", 1)[0]
-        rows = [line.strip("| ").split(" | ") for line in part.splitlines() if line.startswith("| `")]
-        tables.append({room.name: room for room in map(Room, rows)})
-    return tables
+def read_table(page, heading):
+    """The rooms or floors of the table below a heading, by name."""
+    part = page.split(heading, 1)[1].split("\n## ", 1)[0]
+    rows = [line.strip("| ").split(" | ") for line in part.splitlines() if line.startswith("| `")]
+    return {room.name: room for room in map(Room, rows)}
 
 
 def find_below(rooms, name):
@@ -49,9 +46,10 @@ def find_below(rooms, name):
 
 
 class House:
-    def __init__(self, rooms, floors):
-        self.rooms, self.floors = rooms, floors
-        self.files = [path.relative_to(ROOT) for folder in sorted({name.split("/")[0] for name in rooms})
+    def __init__(self, page):
+        self.rooms = read_table(page, "## The rooms")
+        self.floors = {room: read_table(page, heading) for room, heading in FLOORED.items()}
+        self.files = [path.relative_to(ROOT) for folder in sorted({name.split("/")[0] for name in self.rooms})
                       for path in sorted((ROOT / folder).rglob("*")) if path.suffix in (".h", ".cpp")]
         self.headers = collections.defaultdict(list)
         for file in self.files:
@@ -64,14 +62,16 @@ class House:
         return next((parent for parent in parents if parent in self.rooms), None)
 
     def floor_of(self, file):
-        for name, floor in self.floors.items():
-            if file.stem in floor.headers and file.suffix == ".h":
+        """That of the source with the file's name, unless the page says otherwise. @return None for none."""
+        room = self.room_of(file)
+        for name, floor in self.floors[room].items():
+            if file.suffix == ".h" and file.stem in floor.headers:
                 return name
-        source = next((ROOT / FACILITY / "src").rglob(file.stem + ".cpp"), None)
-        folder = (source or ROOT / file).relative_to(ROOT / FACILITY / "src").parts[:-1] if source or "src" in file.parts else None
-        if folder is None:
-            return None
-        return folder[0] if folder else "the pool"
+        sources = ROOT / room / "src"
+        source = next(sources.rglob(file.stem + ".cpp"), ROOT / file)
+        folders = source.relative_to(sources).parts[:-1] if sources in source.parents else ("",)
+        name = folders[0] if folders else "the pool"
+        return name if name in self.floors[room] else None
 
     def find_header(self, file, name):
         """The file that an include means: one of the same room first."""
@@ -101,12 +101,12 @@ def draw(title, arrows):
 
 
 def inspect(house):
-    """@return the faults, and the arrows between rooms and between floors."""
-    faults, arrows, steps = [], set(), set()
+    """@return the faults, the arrows between rooms, and those between floors by room."""
+    faults, arrows, steps = [], set(), {room: set() for room in FLOORED}
     for file in house.files:
         if house.room_of(file) is None:
             faults.append(f"{file}: no room of docs/house.md")
-        elif house.room_of(file) == FACILITY and house.floor_of(file) not in house.floors:
+        elif house.room_of(file) in FLOORED and not house.floor_of(file):
             faults.append(f"{file}: on no floor of docs/house.md")
     for file, header in house.includes() if not faults else ():
         upper, lower = house.room_of(file), house.room_of(header)
@@ -116,10 +116,10 @@ def inspect(house):
                 faults.append(f"{file}: includes {header}, but {upper} does not stand on {lower}")
             if "src" in header.parts and "api" in {path.name for path in (ROOT / lower).iterdir()}:
                 faults.append(f"{file}: includes {header} out of another room's src")
-        elif upper == FACILITY and house.floor_of(file) != house.floor_of(header):
+        elif upper in FLOORED and house.floor_of(file) != house.floor_of(header):
             step = (house.floor_of(file), house.floor_of(header))
-            steps.add(step)
-            if step[1] not in find_below(house.floors, step[0]):
+            steps[upper].add(step)
+            if step[1] not in find_below(house.floors[upper], step[0]):
                 faults.append(f"{file}: includes {header}, but {step[0]} does not stand on {step[1]}")
     counts = collections.Counter(file.parent for file in house.files if file.suffix == ".cpp")
     faults += [f"{folder}: {count} sources; at most {MOST_SOURCES}" for folder, count in counts.items()
@@ -133,8 +133,10 @@ def main():
     options = parser.parse_args()
 
     page = PAGE.read_text()
-    faults, arrows, steps = inspect(House(*read_tables(page)))
-    drawing = draw("Rooms:", arrows) + "\n" + draw("Floors of the facility:", steps)
+    faults, arrows, steps = inspect(House(page))
+    drawing = draw("Rooms:", arrows)
+    for room, heading in FLOORED.items():
+        drawing += "\n" + draw(heading.replace("## The f", "F") + ":", steps[room])
     drawn = DRAWING.sub(lambda match: match[1] + drawing + match[3], page)
     if not options.check:
         PAGE.write_text(drawn)
