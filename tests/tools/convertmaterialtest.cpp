@@ -279,10 +279,10 @@ TEST_F(ConvertMaterialTest, coloursOfVertices)
         bool opaque;
         Rgba seen;
     } cases[] = {
-        {R"("alphaMode":"OPAQUE")", "$VCOL$UNLIT", true, GREEN},
-        {R"("alphaMode":"BLEND")", "$VCOL$UNLIT", false, MIXED},
-        {R"("alphaMode":"MASK","alphaCutoff":0.4)", "$VCOL$CUTOFF$UNLIT", true, GREEN},
-        {R"("alphaMode":"MASK","alphaCutoff":0.6)", "$VCOL$CUTOFF$UNLIT", true, SEEN_THROUGH},
+        {R"("alphaMode":"OPAQUE")", "$VCOL$UNLIT$LINEAR", true, GREEN},
+        {R"("alphaMode":"BLEND")", "$VCOL$UNLIT$LINEAR", false, MIXED},
+        {R"("alphaMode":"MASK","alphaCutoff":0.4)", "$VCOL$CUTOFF$UNLIT$LINEAR", true, GREEN},
+        {R"("alphaMode":"MASK","alphaCutoff":0.6)", "$VCOL$CUTOFF$UNLIT$LINEAR", true, SEEN_THROUGH},
     };
     std::vector<std::string> materials;
     for (const auto& item : cases)

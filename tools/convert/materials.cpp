@@ -307,6 +307,7 @@ private:
         {
             m_made.features |= surface::UNLIT; // which colours of vertices and holes go with
             m_made.emissive = {};
+            addFeature(m_isLinear && m_use.hasColours, surface::LINEAR); // for what is between the vertices
         }
         else
             makeGlow(hasOwnLight);
