@@ -5,7 +5,8 @@
 // its threads. "Instructions" are those of one frame per draw with every GL call dropped, so that the driver is not
 // counted; callgrind counts them where valgrind is installed. "Heap" is what a cube takes once it was drawn.
 //
-// Arguments: numbers of cubes; 1000 5000 50000 without any.
+// Arguments: numbers of cubes; 1000 5000 50000 without any. "--table" before them prints the engine's instructions alone,
+// a line "name count" each, for ./run bench --check.
 
 #include "callgrind.h"
 #include "contender.h"
@@ -42,6 +43,9 @@ using MakeContender = std::unique_ptr<Contender> (*)(const DrawScene& scene);
 constexpr MakeContender CONTENDERS[] = {makeWalkContender, makeByMaterialContender, makeGroupedContender,
                                         makeHandContender};
 constexpr size_t CONTENDER_COUNT = std::size(CONTENDERS);
+
+/// In the table; what is written by hand is not in it.
+constexpr const char* CONTENDER_NAMES[CONTENDER_COUNT] = {"walk", "by-material", "grouped", nullptr};
 
 size_t getHeapBytes()
 {
@@ -183,17 +187,43 @@ void printScene(const DrawScene& scene, const Figures (&figures)[CONTENDER_COUNT
     std::fflush(stdout);
 }
 
+/// For every scene and contender, in their order; none without valgrind.
+std::vector<uint64_t> countInstructions(const std::vector<int>& counts)
+{
+    if (!callgrind::isAvailable())
+        return {};
+    std::string arguments = FOR_COUNTING;
+    for (int count : counts)
+        arguments += " " + std::to_string(count);
+    return callgrind::count(arguments, {"gl"}); // glDrawElements and glcalls::...
+}
+
+void printTable(const std::vector<int>& counts)
+{
+    const std::vector<uint64_t> instructions = countInstructions(counts);
+    if (instructions.empty())
+        giveUp("instructions cannot be counted; is valgrind installed?");
+    size_t run = 0;
+    for (int count : counts)
+    {
+        for (const char* motion : DrawScene::MOTION_NAMES)
+        {
+            for (const char* name : CONTENDER_NAMES)
+            {
+                const double draws = double(COUNTED_FRAMES) * count;
+                if (name)
+                    std::printf("drawbench/%d/%s/%s %.1f\n", count, motion, name,
+                                double(instructions[run]) / draws);
+                ++run;
+            }
+        }
+    }
+}
+
 void compareContenders(const std::vector<int>& counts)
 {
-    std::vector<uint64_t> instructions;
-    if (callgrind::isAvailable())
-    {
-        std::string arguments = FOR_COUNTING;
-        for (int count : counts)
-            arguments += " " + std::to_string(count);
-        instructions = callgrind::count(arguments, {"gl"}); // glDrawElements and glcalls::...
-    }
-    else
+    const std::vector<uint64_t> instructions = countInstructions(counts);
+    if (instructions.empty())
         std::printf("valgrind is not installed: instructions are not counted.\n");
 
     std::printf("Each in the order of the scene, of a scene by material, grouped, and by hand.\n\n");
@@ -219,14 +249,20 @@ void compareContenders(const std::vector<int>& counts)
 int main(int argc, char** argv)
 {
     const bool isForCounting = argc > 1 && !std::strcmp(argv[1], FOR_COUNTING);
+    const bool isTable = argc > 1 && !std::strcmp(argv[1], "--table");
     std::vector<int> counts;
-    for (int i = isForCounting ? 2 : 1; i < argc; ++i)
+    for (int i = isForCounting || isTable ? 2 : 1; i < argc; ++i)
         counts.push_back(std::max(1, std::atoi(argv[i])));
     if (counts.empty())
         counts = {1000, 5000, 50000};
     if (isForCounting)
     {
         drawForCounting(counts);
+        return EXIT_SUCCESS;
+    }
+    if (isTable)
+    {
+        printTable(counts);
         return EXIT_SUCCESS;
     }
 

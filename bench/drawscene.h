@@ -26,7 +26,7 @@ struct DrawScene
     };
 
     static constexpr Motion MOTIONS[] = {Motion::STILL, Motion::ONE_IN_100, Motion::ALL, Motion::PARENT};
-    static constexpr const char* MOTION_NAMES[] = {"still", "1 in 100", "all", "parent"};
+    static constexpr const char* MOTION_NAMES[] = {"still", "1-in-100", "all", "parent"};
 
     static const char* const VERTEX_SOURCE;
     static const char* const FRAGMENT_SOURCE;

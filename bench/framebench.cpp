@@ -383,8 +383,8 @@ Frame makeMirrorEngine()
         engine->mesh,
         engine->makeMaterial("uniform mat4 u_all;", "u_all * vec4(a_position, 1.0)",
                              {{"u_all", "T_MODEL_VIEW_PROJECTION"}, {"u_mirror", "M_MIRROR_TEXTURE"}},
-                             "uniform sampler2D u_mirror; void main() { gl_FragColor = texture2D(u_mirror, "
-                             "mediump vec2(0.5)); }"));
+                             "precision mediump float; uniform sampler2D u_mirror;"
+                             "void main() { gl_FragColor = texture2D(u_mirror, vec2(0.5)); }"));
     mirror->setParent(engine->scene);
     return [engine](int frame)
     {

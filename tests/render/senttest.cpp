@@ -97,8 +97,13 @@ protected:
 
     const char* pickName(GLenum type)
     {
-        static const char* const MATRICES[] = {"T_MODEL", "T_MODEL_VIEW",          "T_MODEL_VIEW_PROJECTION",
-                                               "T_VIEW",  "MODEL_BY_ANOTHER_NAME", "M_MATRIX",
+        static const char* const MATRICES[] = {"T_MODEL",
+                                               "T_MODEL_VIEW",
+                                               "T_MODEL_VIEW_PROJECTION",
+                                               "T_VIEW",
+                                               "MODEL_BY_ANOTHER_NAME",
+                                               "M_MATRIX",
+                                               "T_OLD_MODEL_VIEW_PROJECTION",
                                                "T_MODEL"};
         static const char* const VECTORS[] = {"M_COLOUR", "M_DIFFUSE_COLOUR", "FOG_COLOUR",
                                               "T_CAMERA_POSITION", "T_MODEL"};

@@ -132,6 +132,8 @@ public:
     /// @param uniform  of a source with a DrawTransform of this type.
     static void sendTransform(detail::DrawnUniform& uniform, const Matrix4f& matrix);
     static void sendTransform(detail::DrawnUniform& uniform, const Matrix3f& matrix);
+    /// Sends what the property holds that has the transform, if a uniform takes it.
+    static void sendHeldTransform(const detail::UniformSources& sources, detail::DrawTransform transform);
 
     /// The plain form: sends what changed to the current GL program, which must be this one.
     void enableUniforms();

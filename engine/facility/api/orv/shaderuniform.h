@@ -52,10 +52,11 @@ enum class DrawTransform : uint32_t
     MODEL,
     MODEL_VIEW,
     MODEL_VIEW_PROJECTION,
+    OLD_MODEL_VIEW_PROJECTION,
     NORMAL_MODEL ///< a Matrix3f; the others are Matrix4f
 };
 
-inline constexpr int DRAW_TRANSFORM_COUNT = 5;
+inline constexpr int DRAW_TRANSFORM_COUNT = 6;
 
 } // namespace detail
 

@@ -1,6 +1,7 @@
 #include "orv/vertexarray.h"
 
 #include <cstdint>
+#include <cstring>
 #include <new>
 
 namespace orv
@@ -30,7 +31,7 @@ VertexArray::VertexArray(int vertexCount, int typeSize, int componentCount)
 {
     const int64_t size = computeSize(vertexCount, typeSize, componentCount);
     if (size >= 0)
-        m_bytes.reset(new (std::nothrow) unsigned char[std::size_t(size)]());
+        m_bytes.reset(new (std::nothrow) unsigned char[std::size_t(size)]);
     if (!m_bytes)
     {
         ORV_LOG_ERROR("Cannot make a vertex array of %d vertices with %d components of %d bytes", vertexCount,
@@ -39,6 +40,7 @@ VertexArray::VertexArray(int vertexCount, int typeSize, int componentCount)
         return;
     }
     m_sizeInBytes = unsigned(size);
+    std::memset(m_bytes.get(), 0, m_sizeInBytes);
 }
 
 VertexArray::~VertexArray() = default;

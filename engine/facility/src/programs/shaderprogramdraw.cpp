@@ -90,13 +90,16 @@ void ShaderProgram::enable(RenderContext& context, const ShaderUniformBase* cons
     if (!prepare(context, values, sources))
         return;
     for (int i = 0; i < detail::DRAW_TRANSFORM_COUNT; ++i)
-    {
-        detail::DrawnUniform* uniform = sources.transforms[i];
-        if (!uniform)
-            continue;
-        uniform->sentRevision = 0;
-        uniform->sent.get()->update(*sources.transformSources[i], uniform->location, -1);
-    }
+        sendHeldTransform(sources, detail::DrawTransform(i));
+}
+
+void ShaderProgram::sendHeldTransform(const detail::UniformSources& sources, detail::DrawTransform transform)
+{
+    detail::DrawnUniform* const uniform = sources.transforms[int(transform)];
+    if (!uniform)
+        return;
+    uniform->sentRevision = 0;
+    uniform->sent.get()->update(*sources.transformSources[int(transform)], uniform->location, -1);
 }
 
 void ShaderProgram::sendTransform(detail::DrawnUniform& uniform, const Matrix4f& matrix)

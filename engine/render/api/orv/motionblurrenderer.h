@@ -12,6 +12,11 @@ namespace orv
 class Appearance;
 class AssetCachePool;
 
+namespace detail
+{
+struct UniformSources;
+}
+
 /// Draws how fast things move over the screen instead of what they look like: the picture that
 /// "orv#motionblur.sp" blurs a sharp one with. docs/motionblur.md says how the two are put together and what
 /// the colours mean.
@@ -56,6 +61,8 @@ private:
     struct Properties;
 
     ORV_LOCAL void drawEye(const Matrix4f& viewProjection, const Matrix4f& lastViewProjection);
+    ORV_LOCAL void drawReady(const Solid& solid, const detail::UniformSources& sources, const Matrix4f& now,
+                             const Matrix4f& before);
 
     SharedPtr<RenderContext> m_context;
     SharedPtr<AssetCachePool> m_pool;

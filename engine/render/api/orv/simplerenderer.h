@@ -1,5 +1,6 @@
 #pragma once
 
+#include "orv/detail/framelist.h"
 #include "orv/detail/viewport.h"
 #include "orv/matrix.h"
 #include "orv/renderer.h"
@@ -109,9 +110,9 @@ private:
     SharedPtr<RenderContext> m_context;
     SharedPtr<AssetCachePool> m_pool;
     std::unique_ptr<detail::RendererProperties> m_properties;
-    std::vector<Solid*> m_opaque; // these four are valid during render() only
-    std::vector<Solid*> m_transparent;
-    std::vector<Solid*> m_mirrors;
+    detail::FrameList<Solid*> m_opaque; // these four are valid during render() only
+    detail::FrameList<Solid*> m_transparent;
+    detail::FrameList<Solid*> m_mirrors;
     std::vector<Light*> m_lights;
     std::vector<SortKey> m_sortKeys;
     std::unique_ptr<detail::DrawGroups> m_groups; // null where the walk's order counts

@@ -5,6 +5,7 @@
 #include "orv/shaderprogram.h"
 #include "orv/solid.h"
 
+#include <algorithm>
 #include <utility>
 
 namespace orv::detail
@@ -52,12 +53,12 @@ void DrawGroups::add(Solid& solid, const Appearance& appearance)
     if (mark.round != m_round && !numberMaterial(appearance)) [[unlikely]]
     {
         finish();
-        m_solids.push_back(&solid);
+        m_solids.add(&solid);
         begin();
         return;
     }
     ++m_materialCounts[mark.number];
-    m_entries.push_back({&solid, mark.number, numberMesh(solid.getMesh().get())});
+    m_entries.add({&solid, mark.number, numberMesh(solid.getMesh().get())});
 }
 
 /// @return false for a material that keeps the places of its solids.
@@ -90,10 +91,9 @@ void DrawGroups::finish()
     if (m_meshCount > 2)
         sortByMesh();
     rankMaterials();
-    const size_t first = m_solids.size();
-    m_solids.resize(first + m_entries.size());
+    Solid** const solids = m_solids.extend(m_entries.size());
     for (const Entry& entry : m_entries)
-        m_solids[first + m_materialCounts[entry.material]++] = entry.solid;
+        solids[m_materialCounts[entry.material]++] = entry.solid;
 }
 
 void DrawGroups::sortByMesh()
@@ -105,7 +105,7 @@ void DrawGroups::sortByMesh()
     m_byMesh.resize(m_entries.size());
     for (const Entry& entry : m_entries)
         m_byMesh[m_counts[entry.mesh]++] = entry;
-    m_entries.swap(m_byMesh);
+    std::copy(m_byMesh.begin(), m_byMesh.end(), m_entries.begin());
 }
 
 /// Makes of the counts the places of each material's first solid, those of a program side by side.

@@ -1,5 +1,7 @@
 #pragma once
 
+#include "orv/detail/framelist.h"
+
 #include <cstddef>
 #include <cstdint>
 #include <vector>
@@ -22,7 +24,7 @@ class DrawGroups
 {
 public:
     /// @param solids  borrowed: where the solids go.
-    explicit DrawGroups(std::vector<Solid*>& solids) : m_solids(solids) {}
+    explicit DrawGroups(FrameList<Solid*>& solids) : m_solids(solids) {}
 
     void begin();
     /// @param appearance  the solid's; it has a program.
@@ -42,11 +44,11 @@ private:
     void sortByMesh();
     void rankMaterials();
 
-    std::vector<Solid*>& m_solids;
+    FrameList<Solid*>& m_solids;
     uint64_t m_round = 0; ///< of numbering
     uint32_t m_programCount = 0;
     uint32_t m_meshCount = 0;
-    std::vector<Entry> m_entries;
+    FrameList<Entry> m_entries;
     std::vector<Entry> m_byMesh;
     std::vector<uint32_t> m_programs;       ///< of each material
     std::vector<uint32_t> m_materialCounts; ///< solids of each material; then where the next one of them goes

@@ -6,7 +6,9 @@
 #include "orv/appearance.h"
 #include "orv/assetcachepool.h"
 #include "orv/maths.h"
+#include "orv/mesh.h"
 #include "orv/sceneutil.h"
+#include "orv/shaderprogram.h"
 #include "orv/shaderprogramcache.h"
 #include "orv/solid.h"
 
@@ -30,6 +32,12 @@ struct MotionBlurRenderer::Properties
         , time(detail::shareProperty(context, "TIME", 1, 0.0f))
         , deltaTime(detail::shareProperty(context, "DELTA_TIME", 1, 0.0f))
     {
+        if (modelViewProjection && oldModelViewProjection)
+        {
+            modelViewProjection->setDrawTransform(detail::DrawTransform::MODEL_VIEW_PROJECTION);
+            oldModelViewProjection->setDrawTransform(detail::DrawTransform::OLD_MODEL_VIEW_PROJECTION);
+        }
+        // Later, so that programs see the marks.
         detail::shareProperty(context, "MOTION_BLUR_FACTOR", 1, 0.0f);
     }
 
@@ -113,13 +121,45 @@ void MotionBlurRenderer::drawEye(const Matrix4f& viewProjection, const Matrix4f&
 {
     Properties& properties = *m_properties;
     properties.viewProjection->set(viewProjection);
+    const detail::UniformSources* sources = nullptr; // of the velocity material, while it is ready
+    uint64_t revision = 0;                           // the last of all when it was
+    bool turnsWinding = false;
     for (Solid* solid : m_solids)
     {
-        properties.oldModelViewProjection->set(lastViewProjection * solid->getLastWorldTransform());
-        properties.modelViewProjection->set(viewProjection * solid->getWorldTransform());
-        properties.joints.publish(*solid);
-        solid->draw(*m_context, solid->getJointsPerVertex() == 0 ? *m_velocity : *m_skinnedVelocity);
+        const Matrix4f now = viewProjection * solid->getWorldTransform();
+        const Matrix4f before = lastViewProjection * solid->getLastWorldTransform();
+        // The last one's values are to stay.
+        if (solid->hasSkin() || !solid->getMesh() || solid == m_solids.back())
+        {
+            properties.oldModelViewProjection->set(before);
+            properties.modelViewProjection->set(now);
+            properties.joints.publish(*solid);
+            solid->draw(*m_context, solid->getJointsPerVertex() == 0 ? *m_velocity : *m_skinnedVelocity);
+            sources = nullptr;
+            continue;
+        }
+        if (!sources || revision != detail::g_lastRevision || turnsWinding != solid->getWorldMirrored())
+        {
+            properties.joints.publish(*solid);
+            turnsWinding = solid->getWorldMirrored();
+            sources = m_velocity->prepare(*m_context, turnsWinding);
+            revision = detail::g_lastRevision;
+        }
+        if (sources)
+            drawReady(*solid, *sources, now, before);
     }
+}
+
+/// With the velocity material, which is ready.
+void MotionBlurRenderer::drawReady(const Solid& solid, const detail::UniformSources& sources,
+                                   const Matrix4f& now, const Matrix4f& before)
+{
+    using detail::DrawTransform;
+    if (detail::DrawnUniform* uniform = sources.transforms[int(DrawTransform::MODEL_VIEW_PROJECTION)])
+        ShaderProgram::sendTransform(*uniform, now);
+    if (detail::DrawnUniform* uniform = sources.transforms[int(DrawTransform::OLD_MODEL_VIEW_PROJECTION)])
+        ShaderProgram::sendTransform(*uniform, before);
+    solid.getMesh()->bind(*m_context, *m_velocity->getShaderProgram()).issue();
 }
 
 } // namespace orv

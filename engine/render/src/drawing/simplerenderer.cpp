@@ -75,13 +75,13 @@ void SimpleRenderer::visit(Solid* solid)
     if (!program) [[unlikely]]
         assertDrawable(appearance, program);
     else if (program->usesMirrorTexture())
-        m_mirrors.push_back(solid);
+        m_mirrors.add(solid);
     else if (!appearance->isOpaque())
-        m_transparent.push_back(solid);
+        m_transparent.add(solid);
     else if (m_groups)
         m_groups->add(*solid, *appearance);
     else
-        m_opaque.push_back(solid);
+        m_opaque.add(solid);
 }
 
 void SimpleRenderer::visit(Light* light)
@@ -170,7 +170,7 @@ void SimpleRenderer::renderEye(const detail::Eye& eye, const detail::Viewport& v
     publishEye(eye.world, view);
     sortTransparent(eye.world.columns[2].xyz());
 
-    draw(m_opaque.data(), m_opaque.size(), view, eye.projection);
+    draw(m_opaque.begin(), m_opaque.size(), view, eye.projection);
     for (size_t i = 0; i < m_mirrors.size(); ++i)
     {
         Solid* mirror = m_mirrors[i];
@@ -184,7 +184,7 @@ void SimpleRenderer::renderEye(const detail::Eye& eye, const detail::Viewport& v
         }
         draw(&mirror, 1, view, eye.projection);
     }
-    draw(m_transparent.data(), m_transparent.size(), view, eye.projection);
+    draw(m_transparent.begin(), m_transparent.size(), view, eye.projection);
 }
 
 void SimpleRenderer::publishEye(const Matrix4f& world, const Matrix4f& view)
@@ -197,7 +197,7 @@ void SimpleRenderer::publishEye(const Matrix4f& world, const Matrix4f& view)
 void SimpleRenderer::sortTransparent(const Vector3f& eyeZ)
 {
     m_sortKeys.clear();
-    for (Solid* solid : m_transparent)
+    for (Solid* const solid : m_transparent)
     {
         const float depth = dot(eyeZ, solid->getWorldTransform().columns[3].xyz());
         // Sorting needs an order; what is nowhere counts as farthest.
@@ -278,8 +278,8 @@ void SimpleRenderer::renderReflection(const Solid& mirror, const detail::Eye& ey
     projection.columns[1] = -projection.columns[1];
 
     publishEye(world, view);
-    draw(m_opaque.data(), m_opaque.size(), view, projection);
-    draw(m_transparent.data(), m_transparent.size(), view, projection);
+    draw(m_opaque.begin(), m_opaque.size(), view, projection);
+    draw(m_transparent.begin(), m_transparent.size(), view, projection);
 
     RenderTarget::bindFramebuffer(framebuffer);
     detail::setViewport(*m_context, viewport);

@@ -14,6 +14,7 @@
 
 #include <algorithm>
 #include <cmath>
+#include <iterator>
 #include <string_view>
 
 namespace orv
@@ -271,15 +272,16 @@ SharedPtr<Mesh> Text::makeMesh(std::size_t firstGlyph, AssetCachePool* pool) con
     for (std::size_t i = 0; i < count; ++i)
     {
         const auto& [x, y, data] = m_glyphs[firstGlyph + i];
-        for (const int corner : {0, 1, 2, 3}) // upper left, upper right, lower left, lower right
-        {
-            const bool isRight = corner & 1;
-            const bool isLower = corner & 2;
-            *position++ = isRight ? x + data->x1 - data->x0 : x;
-            *position++ = ySign * (isLower ? y + data->y1 - data->y0 : y);
-            *uv++ = (isRight ? data->x1 : data->x0) / atlasWidth;
-            *uv++ = 1.0f - (isLower ? data->y1 : data->y0) / atlasHeight;
-        }
+        const float left = x, right = x + data->x1 - data->x0;
+        const float upper = ySign * y, lower = ySign * (y + data->y1 - data->y0);
+        const float corners[] = {left, upper, right, upper, left, lower, right, lower};
+        position = std::copy(std::begin(corners), std::end(corners), position);
+
+        const float u0 = data->x0 / atlasWidth, u1 = data->x1 / atlasWidth;
+        const float v0 = 1.0f - data->y0 / atlasHeight, v1 = 1.0f - data->y1 / atlasHeight;
+        const float places[] = {u0, v0, u1, v0, u0, v1, u1, v1};
+        uv = std::copy(std::begin(places), std::end(places), uv);
+
         for (const std::size_t corner : {0, 2, 1, 1, 2, 3})
             *index++ = static_cast<unsigned short>(4 * i + corner);
     }

@@ -17,44 +17,6 @@ namespace orv
 namespace
 {
 
-/// What the flag-restricted walk hands from a node to its children.
-struct WalkState
-{
-    uint32_t accumulated = 0; ///< the recursive flags met on the way down, in stored polarity
-    bool satisfied = false;   ///< whether the recursive condition held at the parent
-};
-
-/// What stays the same during one walk.
-struct Walk
-{
-    SceneNodeVisitor& visitor;
-    const FlagMask& renderFlags;
-    const FlagMask& recursiveFlags;
-    bool plainFlags; ///< no recursive flag is on by default: once the condition holds, it holds below
-};
-
-void visitRestricted(const Walk& walk, SceneNode& node, WalkState state)
-{
-    const FlagMask& render = walk.renderFlags;
-    const FlagMask& recursive = walk.recursiveFlags;
-    state.accumulated |= node.getFlags() & recursive.mask;
-    const bool nowSatisfied = ((recursive.inverted ^ state.accumulated) & recursive.mask) == recursive.mask;
-    const bool stop = nowSatisfied ? walk.plainFlags : state.satisfied;
-    state.satisfied = nowSatisfied;
-    if (stop && nowSatisfied)
-    {
-        detail::visitAll(walk.visitor, node);
-        return;
-    }
-
-    const uint32_t flags = (node.getFlags() | state.accumulated) ^ render.inverted;
-    if ((flags & render.mask) == render.mask)
-        node.accept(walk.visitor);
-    if (stop)
-        return; // the condition was lost here and cannot come back further down
-    detail::visitChildren(node, [&](SceneNode& child) { visitRestricted(walk, child, state); });
-}
-
 class AppearanceSetter : public SceneNodeVisitor
 {
 public:
@@ -148,8 +110,7 @@ void visitScene(SceneNodeVisitor& visitor, SceneNode& node, const FlagMask& rend
         return;
     }
     const detail::SceneWalk walk(node);
-    const bool plainFlags = (recursiveFlags.mask & recursiveFlags.inverted) == 0;
-    visitRestricted({visitor, renderFlags, recursiveFlags, plainFlags}, node, WalkState());
+    detail::visitRestricted(visitor, node, renderFlags, recursiveFlags);
 }
 
 void setAppearance(SceneNode& node, const SharedPtr<Appearance>& appearance)

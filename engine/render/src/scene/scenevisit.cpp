@@ -5,7 +5,26 @@
 namespace orv::detail
 {
 
-static void visitBelow(SceneNodeVisitor& visitor, ChildList& list)
+namespace
+{
+
+/// What the flag-restricted walk hands from a node to its children.
+struct WalkState
+{
+    uint32_t accumulated = 0; ///< the recursive flags met on the way down, in stored polarity
+    bool satisfied = false;   ///< whether the recursive condition held at the parent
+};
+
+/// What stays the same during one walk.
+struct Walk
+{
+    SceneNodeVisitor& visitor;
+    const FlagMask& renderFlags;
+    const FlagMask& recursiveFlags;
+    bool plainFlags; ///< no recursive flag is on by default: once the condition holds, it holds below
+};
+
+void visitBelow(SceneNodeVisitor& visitor, ChildList& list)
 {
     ChildList::Cursor children(list);
     while (SceneNode* child = children.next())
@@ -16,11 +35,56 @@ static void visitBelow(SceneNodeVisitor& visitor, ChildList& list)
     }
 }
 
+/// Visits the node, if its flags are right.
+/// @return whether those below it are to be looked at, with the state as it is then.
+[[gnu::always_inline]] inline bool visitOne(const Walk& walk, SceneNode& node, WalkState& state)
+{
+    const FlagMask& render = walk.renderFlags;
+    const FlagMask& recursive = walk.recursiveFlags;
+    state.accumulated |= node.getFlags() & recursive.mask;
+    const bool nowSatisfied = ((recursive.inverted ^ state.accumulated) & recursive.mask) == recursive.mask;
+    const bool stop = nowSatisfied ? walk.plainFlags : state.satisfied;
+    state.satisfied = nowSatisfied;
+    if (stop && nowSatisfied)
+    {
+        visitAll(walk.visitor, node);
+        return false;
+    }
+
+    const uint32_t flags = (node.getFlags() | state.accumulated) ^ render.inverted;
+    if ((flags & render.mask) == render.mask)
+        node.accept(walk.visitor);
+    return !stop; // else the condition was lost here and cannot come back further down
+}
+
+void visitRestrictedBelow(const Walk& walk, ChildList& list, const WalkState& state)
+{
+    ChildList::Cursor children(list);
+    while (SceneNode* child = children.next())
+    {
+        WalkState childState = state;
+        if (visitOne(walk, *child, childState) && child->getChildList())
+            visitRestrictedBelow(walk, *child->getChildList(), childState);
+    }
+}
+
+} // namespace
+
 void visitAll(SceneNodeVisitor& visitor, SceneNode& node)
 {
     node.accept(visitor);
     if (node.getChildList())
         visitBelow(visitor, *node.getChildList());
+}
+
+void visitRestricted(SceneNodeVisitor& visitor, SceneNode& node, const FlagMask& renderFlags,
+                     const FlagMask& recursiveFlags)
+{
+    const bool plainFlags = (recursiveFlags.mask & recursiveFlags.inverted) == 0;
+    const Walk walk = {visitor, renderFlags, recursiveFlags, plainFlags};
+    WalkState state;
+    if (visitOne(walk, node, state) && node.getChildList())
+        visitRestrictedBelow(walk, *node.getChildList(), state);
 }
 
 } // namespace orv::detail

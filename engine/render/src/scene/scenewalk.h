@@ -35,16 +35,9 @@ private:
 /// The walk of all nodes without a look at flags.
 void visitAll(SceneNodeVisitor& visitor, SceneNode& node);
 
-/// @param visit  called with each child that is there at first and at its turn; may change the children.
-template <class Visit>
-void visitChildren(const SceneNode& node, const Visit& visit)
-{
-    if (!node.getChildList())
-        return;
-    ChildList::Cursor children(*node.getChildList());
-    while (SceneNode* child = children.next())
-        visit(*child);
-}
+/// That of visitScene() with flags.
+void visitRestricted(SceneNodeVisitor& visitor, SceneNode& node, const FlagMask& renderFlags,
+                     const FlagMask& recursiveFlags);
 
 } // namespace detail
 } // namespace orv
