@@ -99,6 +99,12 @@ const float NOT_A_NUMBER = std::nanf("");
 
 const SceneFault SCENE_FAULTS[] = {
     {"no-scene", [](GloScene& s) { s.scene.reset(), s.animations.clear(); }},
+    {"nothing-drawn",
+     [](GloScene& s)
+     {
+         for (auto& geometry : s.geometries)
+             geometry.primitiveSets.clear();
+     }},
     {"up-axis", [](GloScene& s) { s.upAxis = 3; }},
     {"attribute-bounds", [](GloScene& s) { attribute(s, 1).offset = 1000; }},
     {"attribute-type", [](GloScene& s) { attribute(s, 1).type = 9; }},

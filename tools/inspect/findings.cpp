@@ -33,6 +33,7 @@ const std::vector<KindInfo> INFO = {
     {Kind::UNKNOWN_TOOL, "unknown-tool", ERROR, "the authoring tool is not one that the engine knows"},
     {Kind::SECOND_SCENE, "second-scene", ERROR, "there is more than one scene"},
     {Kind::NO_SCENE, "no-scene", WARNING, "there is no scene, so nothing will be seen"},
+    {Kind::NOTHING_DRAWN, "nothing-drawn", NOTE, "no node of the scene draws anything"},
     {Kind::UP_AXIS, "up-axis", ERROR, "the up-axis option is none of 0, 1, 2"},
     {Kind::INDEX_BUFFERS, "index-buffers", ERROR, "a primitive set has more than one index buffer"},
     {Kind::INDEX_TYPE, "index-type", ERROR, "indices are not unsigned 16-bit numbers"},

@@ -36,6 +36,7 @@ enum class Kind
     UNKNOWN_TOOL,
     SECOND_SCENE,
     NO_SCENE,
+    NOTHING_DRAWN,
     UP_AXIS,
     INDEX_BUFFERS,
     INDEX_TYPE,

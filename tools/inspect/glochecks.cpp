@@ -69,8 +69,20 @@ public:
         else if (m_scene.upAxis > uint32_t(UpAxis::Z))
             report(Kind::UP_AXIS, m_file.top,
                    "the up-axis option " + number(m_scene.upAxis) + " is none of 0, 1, 2");
+        if (m_scene.scene && !m_drawsSomething)
+            report(Kind::NOTHING_DRAWN, m_file.top,
+                   "no node of the scene draws a point, a line or a triangle");
         for (const Chunk& list : m_file.top.children)
             reportUnused(list);
+    }
+
+    static bool hasFaces(const Geometry& geometry)
+    {
+        return std::any_of(geometry.primitiveSets.begin(), geometry.primitiveSets.end(),
+                           [&](const PrimitiveSet& set) {
+                               return set.indices ? !set.indices->indices.empty()
+                                                  : geometry.vertices.vertexCount > 0;
+                           });
     }
 
 private:
@@ -438,6 +450,7 @@ private:
             report(Kind::UNKNOWN_GEOMETRY, chunk, "there is no geometry " + quote(name));
             return;
         }
+        m_drawsSomething = m_drawsSomething || !m_isAffordable || hasFaces(*found);
         for (size_t i = 0; m_isAffordable && i < found->primitiveSets.size(); ++i)
         {
             if (i >= materials.size() || !m_materials.count(materials[i]))
@@ -575,6 +588,7 @@ private:
     uint64_t m_valuesLeft;
     Images m_images;
     Findings& m_findings;
+    bool m_drawsSomething = false;
     std::set<std::string> m_nodes;
     std::set<std::string> m_scopedNodes;
     std::set<std::string> m_materials; ///< those with a technique
