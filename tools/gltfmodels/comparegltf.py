@@ -60,7 +60,7 @@ def read_reference(path):
             end = at + count * corners * 3
             faces[corners] = numbers[at:end].reshape(-1, corners, 3).astype(np.float64)
             at = end
-        poses.append((pose["clip"], pose["time"], faces))
+        poses.append((pose["clip"], pose["time"], faces))  # the time is None in a damaged animation
     return head["clips"], poses
 
 
@@ -138,7 +138,7 @@ def judge(converter, modules, model):
         starts = find_ranges(clips, report)
         largest, compared = 0.0, 0
         for clip, time, faces in poses:
-            if clip >= 0 and ("morph-animation" in codes or starts[clip] is None):
+            if clip >= 0 and (time is None or "morph-animation" in codes or starts[clip] is None):
                 continue
             moment = None if clip < 0 else starts[clip] + time + 0.02 / FPS
             worst, fault = compare(posed.pose(moment), faces)

@@ -34,7 +34,9 @@ const char* const KNOWN[] = {
     "KHR_node_visibility",
     "KHR_texture_basisu",
     "KHR_texture_transform",
-    "KHR_xmp", // notes about the file, nothing to see
+    // Nothing to see: which triangles were one polygon, notes about the file.
+    "FB_ngon_encoding",
+    "KHR_xmp",
     "KHR_xmp_json_ld",
 };
 
