@@ -1,5 +1,7 @@
 #include "gltfwriter.h"
 
+#include "support/tempdir.h"
+
 #include "convert/gltf/reader.h"
 
 #include <assimp/GltfMaterial.h>
@@ -9,6 +11,7 @@
 #include <meshoptimizer.h>
 
 #include <cmath>
+#include <filesystem>
 #include <functional>
 #include <memory>
 
@@ -557,4 +560,40 @@ TEST_F(GltfReader, refusesWithThePlace)
     const GltfWriter::Bytes bytes = whole.write();
     for (size_t size = 0; size + 1 < bytes.size(); ++size)
         EXPECT_NE("", getFault({bytes.begin(), bytes.begin() + std::ptrdiff_t(size)})) << size;
+}
+
+// Fault caught: damage that the reader runs into instead of refusing it or leaving it out. What comes is sound.
+TEST_F(GltfReader, damagedFiles)
+{
+    const std::filesystem::path seeds = std::filesystem::path(ORV_SOURCE_FOLDER) / "fuzz/corpus/gltf";
+    int readCount = 0;
+    int refusedCount = 0;
+    for (const auto& seed : std::filesystem::directory_iterator(seeds))
+    {
+        const GltfWriter::Bytes bytes = support::readFile(seed.path());
+        ASSERT_EQ("", getFault(bytes)) << seed.path();
+        for (size_t at = 0; at < bytes.size(); ++at)
+        {
+            for (const char spoilt : {'0', '9', '-', '}', 'A'})
+            {
+                GltfWriter::Bytes damaged = bytes;
+                damaged[at] = uint8_t(spoilt);
+                m_scene.reset();
+                const bool isRead = getFault(damaged).empty();
+                ++(isRead ? readCount : refusedCount);
+                for (unsigned i = 0; isRead && i < m_scene->mNumMeshes; ++i)
+                {
+                    const aiMesh& mesh = *m_scene->mMeshes[i];
+                    ASSERT_LT(mesh.mMaterialIndex, m_scene->mNumMaterials) << at;
+                    for (unsigned face = 0; face < mesh.mNumFaces; ++face)
+                    {
+                        for (unsigned c = 0; c < mesh.mFaces[face].mNumIndices; ++c)
+                            ASSERT_LT(mesh.mFaces[face].mIndices[c], mesh.mNumVertices) << at;
+                    }
+                }
+            }
+        }
+    }
+    EXPECT_LT(1000, readCount);
+    EXPECT_LT(1000, refusedCount);
 }
