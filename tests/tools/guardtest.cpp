@@ -12,6 +12,8 @@
 #include <cstdlib>
 
 #include <fcntl.h>
+#include <seccomp.h>
+#include <sys/prctl.h>
 #include <sys/socket.h>
 #include <sys/stat.h>
 #include <sys/wait.h>
@@ -104,7 +106,34 @@ bool canConfine()
     return convert::CAN_CONFINE && status == 0;
 }
 
+/// Twice, in a process that may not install filters any more, and ends with 0 if all went well.
+[[noreturn]] void workWithoutConfinement()
+{
+    scmp_filter_ctx filter = seccomp_init(SCMP_ACT_ALLOW);
+    seccomp_rule_add(filter, SCMP_ACT_ERRNO(EPERM), SCMP_SYS(seccomp), 0);
+    const scmp_arg_cmp isFilter = {0, SCMP_CMP_EQ, PR_SET_SECCOMP, 0};
+    seccomp_rule_add_array(filter, SCMP_ACT_ERRNO(EPERM), SCMP_SYS(prctl), 1, &isFilter);
+    seccomp_load(filter);
+    const auto work = [](std::FILE* stream, ModelFiles&) { return std::fputs("whole", stream) >= 0; };
+    const auto accept = [](std::FILE*) { return true; };
+    convert::FileGate gate("model.obj");
+    std::string error;
+    bool done = true;
+    for (int pass = 0; pass < 2; ++pass)
+        done = done && convert::runGuarded({60.0, 0}, "model.obj", gate, work, accept, error);
+    _exit(done ? 0 : 1);
+}
+
 } // namespace
+
+// Fault caught: a system without confinement, as containers are, where nothing can be converted or nobody is told.
+TEST(Guard, saysWhereTheSystemRefuses)
+{
+    if (!convert::CAN_CONFINE)
+        GTEST_SKIP() << "this build does not confine processes";
+    EXPECT_EXIT(workWithoutConfinement(), testing::ExitedWithCode(0),
+                "^orv-convert: this system does not confine processes [^\n]*\n$");
+}
 
 // Fault caught: a reader taken over by a file that reaches more than the model's own files.
 TEST(Guard, childHasTheModelsFilesAndNothingElse)
