@@ -31,7 +31,8 @@ inline void applySurfaces(GloScene& scene)
 {
     for (const Surface& surface : scene.surfaces.list)
     {
-        if (surface.material >= scene.materials.size() || scene.materials[surface.material].techniques.empty())
+        if (surface.material >= scene.materials.size() ||
+            scene.materials[surface.material].techniques.empty())
             continue;
         StandardMaterial& material = scene.materials[surface.material].techniques.back();
         material.features = surface.features;
