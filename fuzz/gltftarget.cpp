@@ -3,8 +3,8 @@
 // that orv-convert has. Pictures and other files are not there but for those inside the file.
 
 #include "convert/conversion.h"
-#include "convert/filegate.h"
-#include "convert/modelfiles.h"
+#include "convert/files/filegate.h"
+#include "convert/files/modelfiles.h"
 
 #include <cstdint>
 #include <cstdio>

@@ -1,8 +1,8 @@
 #include "converttest.h"
 
-#include "convert/meshes.h"
-#include "convert/parts.h"
-#include "convert/placement.h"
+#include "convert/meshes/meshes.h"
+#include "convert/meshes/parts.h"
+#include "convert/scene/placement.h"
 
 #include "orv/detail/glovertices.h"
 #include "orv/indexbuffer.h"

@@ -1,10 +1,10 @@
 #include "converttest.h"
 #include "support/picture.h"
 
-#include "convert/filegate.h"
-#include "convert/modelfiles.h"
-#include "convert/picturefinder.h"
-#include "convert/pictures.h"
+#include "convert/files/filegate.h"
+#include "convert/files/modelfiles.h"
+#include "convert/materials/picturefinder.h"
+#include "convert/materials/pictures.h"
 
 #include "headless/png.h"
 

@@ -1,9 +1,9 @@
 #include "converttest.h"
 
-#include "convert/filegate.h"
+#include "convert/files/filegate.h"
+#include "convert/files/modelfiles.h"
 #include "convert/model.h"
-#include "convert/modelfiles.h"
-#include "convert/placement.h"
+#include "convert/scene/placement.h"
 
 #include "orv/animationgroup.h"
 #include "orv/camera.h"

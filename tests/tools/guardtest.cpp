@@ -1,8 +1,8 @@
 #include "convert/guard.h"
 
 #include "convert/confinement.h"
-#include "convert/filegate.h"
-#include "convert/modelfiles.h"
+#include "convert/files/filegate.h"
+#include "convert/files/modelfiles.h"
 
 #include "support/tempdir.h"
 

@@ -1,9 +1,9 @@
 #include "guard.h"
 
 #include "confinement.h"
-#include "filegate.h"
+#include "convert/files/filegate.h"
+#include "convert/files/modelfiles.h"
 #include "lowercase.h"
-#include "modelfiles.h"
 #include "progress.h"
 #include "sanitizers.h"
 

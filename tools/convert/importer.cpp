@@ -1,14 +1,14 @@
 #include "importer.h"
 
-#include "fbxpivots.h"
+#include "convert/files/modelfiles.h"
+#include "convert/files/modelio.h"
+#include "convert/formats/fbxpivots.h"
+#include "convert/formats/halflifefile.h"
+#include "convert/formats/mending.h"
+#include "convert/formats/objoptions.h"
+#include "convert/gltf/firstversion.h"
+#include "convert/gltf/reader.h"
 #include "figures.h"
-#include "gltf/firstversion.h"
-#include "gltf/reader.h"
-#include "halflifefile.h"
-#include "mending.h"
-#include "modelfiles.h"
-#include "modelio.h"
-#include "objoptions.h"
 #include "progress.h"
 
 #include <assimp/config.h>

@@ -1,7 +1,7 @@
 // orv-convert: makes a scene file, with its textures beside it, of a model file.
 
 #include "conversion.h"
-#include "filegate.h"
+#include "convert/files/filegate.h"
 #include "guard.h"
 #include "progress.h"
 

@@ -1,12 +1,12 @@
 #include "model.h"
 
+#include "convert/files/modelfiles.h"
+#include "convert/materials/materials.h"
+#include "convert/meshes/meshes.h"
+#include "convert/scene/lights.h"
+#include "convert/scene/placement.h"
 #include "importer.h"
-#include "lights.h"
-#include "materials.h"
-#include "meshes.h"
-#include "modelfiles.h"
 #include "names.h"
-#include "placement.h"
 #include "progress.h"
 
 #include <cerrno>

@@ -1,10 +1,10 @@
 #pragma once
 
-#include "animations.h"
+#include "convert/materials/textures.h"
+#include "convert/scene/animations.h"
 #include "glo/glowriter.h"
 #include "options.h"
 #include "report.h"
-#include "textures.h"
 
 #include <string>
 #include <vector>

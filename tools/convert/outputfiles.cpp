@@ -1,6 +1,6 @@
 #include "outputfiles.h"
 
-#include "filegate.h"
+#include "convert/files/filegate.h"
 
 #include <cerrno>
 #include <csignal>

@@ -1,6 +1,6 @@
 #include "buffers.h"
 
-#include "../datauri.h"
+#include "convert/files/datauri.h"
 #include "meshopt.h"
 
 namespace convert::gltf

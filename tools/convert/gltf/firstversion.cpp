@@ -1,6 +1,6 @@
 #include "firstversion.h"
 
-#include "../placement.h"
+#include "convert/scene/placement.h"
 
 #include <assimp/camera.h>
 #include <assimp/light.h>

@@ -2,7 +2,7 @@
 
 #include "document.h"
 
-#include "../report.h"
+#include "convert/report.h"
 
 struct aiScene;
 

@@ -2,7 +2,7 @@
 
 #include "scenereader.h"
 
-#include "../lowercase.h"
+#include "convert/lowercase.h"
 
 #include <assimp/scene.h>
 

@@ -1,7 +1,7 @@
 #pragma once
 
-#include "../options.h"
-#include "../report.h"
+#include "convert/options.h"
+#include "convert/report.h"
 
 #include "buffers.h"
 

@@ -7,9 +7,9 @@
 #include "skins.h"
 #include "views.h"
 
-#include "../names.h"
-#include "../placement.h"
-#include "../progress.h"
+#include "convert/names.h"
+#include "convert/progress.h"
+#include "convert/scene/placement.h"
 
 #include <assimp/scene.h>
 

@@ -2,8 +2,8 @@
 
 #include "accessors.h"
 
-#include "../options.h"
-#include "../report.h"
+#include "convert/options.h"
+#include "convert/report.h"
 
 #include <memory>
 

@@ -1,6 +1,6 @@
 #include "textures.h"
 
-#include "../datauri.h"
+#include "convert/files/datauri.h"
 
 #include <assimp/texture.h>
 

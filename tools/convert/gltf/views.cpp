@@ -1,6 +1,6 @@
 #include "views.h"
 
-#include "../lights.h"
+#include "convert/scene/lights.h"
 
 #include <assimp/camera.h>
 #include <assimp/light.h>

@@ -1,7 +1,7 @@
 #pragma once
 
+#include "convert/names.h"
 #include "glo/glowriter.h"
-#include "names.h"
 #include "textures.h"
 
 #include <assimp/material.h>

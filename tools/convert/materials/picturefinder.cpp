@@ -1,8 +1,8 @@
 #include "picturefinder.h"
 
-#include "datauri.h"
-#include "lowercase.h"
-#include "modelfiles.h"
+#include "convert/files/datauri.h"
+#include "convert/files/modelfiles.h"
+#include "convert/lowercase.h"
 #include "pictures.h"
 
 #include <assimp/scene.h>

@@ -1,7 +1,7 @@
 #pragma once
 
+#include "convert/materials/materials.h"
 #include "glo/glowriter.h"
-#include "materials.h"
 
 #include <vector>
 

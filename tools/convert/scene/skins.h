@@ -1,6 +1,6 @@
 #pragma once
 
-#include "report.h"
+#include "convert/report.h"
 
 #include <array>
 #include <vector>

@@ -1,7 +1,7 @@
 #pragma once
 
 #include "cacheorder.h"
-#include "skins.h"
+#include "convert/scene/skins.h"
 
 #include <cstdint>
 #include <vector>

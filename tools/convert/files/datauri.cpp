@@ -1,6 +1,6 @@
 #include "datauri.h"
 
-#include "lowercase.h"
+#include "convert/lowercase.h"
 #include "modelfiles.h"
 
 #include <array>

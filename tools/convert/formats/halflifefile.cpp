@@ -1,6 +1,6 @@
 #include "halflifefile.h"
 
-#include "modelfiles.h"
+#include "convert/files/modelfiles.h"
 
 #include <assimp/scene.h>
 

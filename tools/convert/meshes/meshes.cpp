@@ -1,9 +1,9 @@
 #include "meshes.h"
 
-#include "materialvalues.h"
+#include "convert/materials/materialvalues.h"
+#include "convert/materials/surfaces.h"
 #include "parts.h"
 #include "rowtable.h"
-#include "surfaces.h"
 
 #include <assimp/mesh.h>
 

@@ -1,6 +1,6 @@
 #include "surfaces.h"
 
-#include "rowtable.h"
+#include "convert/meshes/rowtable.h"
 
 #include <assimp/mesh.h>
 

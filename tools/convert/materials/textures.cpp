@@ -1,7 +1,7 @@
 #include "textures.h"
 
-#include "lowercase.h"
-#include "progress.h"
+#include "convert/lowercase.h"
+#include "convert/progress.h"
 
 #include <algorithm>
 #include <cctype>

@@ -1,9 +1,9 @@
 #include "objoptions.h"
 
-#include "lowercase.h"
-#include "materials.h"
-#include "modelfiles.h"
-#include "report.h"
+#include "convert/files/modelfiles.h"
+#include "convert/lowercase.h"
+#include "convert/materials/materials.h"
+#include "convert/report.h"
 
 #include <assimp/scene.h>
 

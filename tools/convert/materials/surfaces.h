@@ -1,6 +1,6 @@
 #pragma once
 
-#include "parts.h"
+#include "convert/meshes/parts.h"
 
 #include <assimp/vector3.h>
 

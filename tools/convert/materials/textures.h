@@ -1,10 +1,10 @@
 #pragma once
 
-#include "options.h"
-#include "outputfiles.h"
+#include "convert/options.h"
+#include "convert/outputfiles.h"
+#include "convert/report.h"
 #include "picturefinder.h"
 #include "pictures.h"
-#include "report.h"
 
 #include "orv/vector.h"
 

@@ -1,6 +1,6 @@
 #include "fbxpivots.h"
 
-#include "report.h"
+#include "convert/report.h"
 
 #include <assimp/scene.h>
 

@@ -1,7 +1,7 @@
 #pragma once
 
+#include "convert/report.h"
 #include "glo/glowriter.h"
-#include "report.h"
 
 #include <assimp/types.h>
 

@@ -1,9 +1,9 @@
 #pragma once
 
+#include "convert/names.h"
+#include "convert/options.h"
+#include "convert/report.h"
 #include "glo/glowriter.h"
-#include "names.h"
-#include "options.h"
-#include "report.h"
 
 #include <map>
 #include <string>
