@@ -159,7 +159,7 @@ void MotionBlurRenderer::drawReady(const Solid& solid, const detail::UniformSour
         ShaderProgram::sendTransform(*uniform, now);
     if (detail::DrawnUniform* uniform = sources.transforms[int(DrawTransform::OLD_MODEL_VIEW_PROJECTION)])
         ShaderProgram::sendTransform(*uniform, before);
-    solid.getMesh()->bind(*m_context, *m_velocity->getShaderProgram()).issue();
+    solid.bindMesh(*m_context, *m_velocity->getShaderProgram()).issue();
 }
 
 } // namespace orv
