@@ -51,18 +51,21 @@ void DrawGroups::add(Solid& solid, const Appearance& appearance)
 {
     const DrawMark& mark = appearance.getDrawMark();
     if (mark.round != m_round && !numberMaterial(appearance)) [[unlikely]]
-    {
-        finish();
-        m_solids.add(&solid);
-        begin();
-        return;
-    }
+        return addAlone(solid);
     ++m_materialCounts[mark.number];
     m_entries.add({&solid, mark.number, numberMesh(solid.getMesh().get())});
 }
 
+/// What is rare is in functions of its own, so that adding needs few registers.
+[[gnu::noinline]] void DrawGroups::addAlone(Solid& solid)
+{
+    finish();
+    m_solids.add(&solid);
+    begin();
+}
+
 /// @return false for a material that keeps the places of its solids.
-bool DrawGroups::numberMaterial(const Appearance& appearance)
+[[gnu::noinline]] bool DrawGroups::numberMaterial(const Appearance& appearance)
 {
     if (keepsPlace(appearance.getRenderState()))
         return false;

@@ -39,6 +39,7 @@ private:
         uint32_t mesh;
     };
 
+    void addAlone(Solid& solid);
     bool numberMaterial(const Appearance& appearance);
     uint32_t numberMesh(const Mesh* mesh);
     void sortByMesh();
