@@ -534,7 +534,7 @@ constexpr Case CASES[] = {
     {"animation", CHANNELS, "channel", makeAnimationEngine, makeAnimationHand},
     {"text-that-changes", GLYPHS, "glyph", [] { return makeTextEngine(true); },
      [] { return makeTextHand(true); }},
-    {"text-that-stays", GLYPHS, "glyph", [] { return makeTextEngine(false); },
+    {"text-that-stays", 1, "text", [] { return makeTextEngine(false); },
      [] { return makeTextHand(false); }},
     {"transparent", PANES, "solid", makePanesEngine, makePanesHand},
     {"mirror", 2 * CUBES, "draw", makeMirrorEngine, makeTwoPassHand},
