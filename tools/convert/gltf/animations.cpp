@@ -178,6 +178,8 @@ public:
         std::vector<aiNodeAnim*> channels;
         for (const auto& [node, movement] : m_movements)
             channels.push_back(toChannel(m_nodeNames[node], movement));
+        if (channels.empty()) // libassimp would leave an array of none behind
+            return std::move(m_made);
         m_made->mNumChannels = unsigned(channels.size());
         m_made->mChannels = new aiNodeAnim*[channels.size()];
         std::copy(channels.begin(), channels.end(), m_made->mChannels);
