@@ -158,7 +158,9 @@ private:
             m_source.report.lose("attribute", name + " of " + m_what + ", which has too few elements");
             return {};
         }
-        return m_source.accessors.read(accessor, user, components, m_usesAll ? nullptr : &m_used);
+        Column column = m_source.accessors.read(accessor, user, components, m_usesAll ? nullptr : &m_used);
+        column.values.resize(m_used.size() * column.components); // there may be more than there are positions
+        return column;
     }
 
     static aiVector3D* toVectors(const Column& column, size_t count)
