@@ -46,7 +46,7 @@ struct UniformSources
         DrawnUniform* uniform;
     };
 
-    uint64_t revision = 0;     ///< the program's stamp; 0 to have everything found anew
+    uint64_t revision = 0;     ///< the program's stamp; 0 to have everything looked up again
     std::vector<Value> values; ///< but for samplers and transforms; those that were handed to enable() first
     std::size_t ownCount = 0;  ///< of values: those handed to enable()
     uint64_t ownUniforms = 0;  ///< a bit for each uniform of these

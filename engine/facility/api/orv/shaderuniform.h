@@ -45,7 +45,7 @@ using UniformTypes =
              float, Vector2<float>, Vector3<float>, Vector4<float>, Matrix2<float>, Matrix3<float>,
              Matrix4<float>, SharedPtr<Texture2D>, SharedPtr<TextureCube>>;
 
-/// What a renderer works out anew for each draw, and sends without a look at the property that has it.
+/// What a renderer works out for each draw, and sends without a look at the property that has it.
 enum class DrawTransform : uint32_t
 {
     NONE,
