@@ -97,7 +97,8 @@ private:
         const double end = double(m_track.times[key + 1]);
         if (double(m_track.times.back()) * m_fps > MOST_SAMPLES)
             return;
-        for (double i = std::floor(start * m_fps) + 1.0; i / m_fps < end; i += 1.0)
+        // From 0 on, where sampling begins: damaged times may lie as far before it as numbers go.
+        for (double i = std::max(0.0, std::floor(start * m_fps) + 1.0); i / m_fps < end; i += 1.0)
         {
             if (i / m_fps > start)
                 m_keys.push_back({i / m_fps, evaluateSpline(m_track, key, i / m_fps)});
