@@ -17,13 +17,13 @@ constexpr std::array<int8_t, 256> makeDigits()
 {
     std::array<int8_t, 256> digits{};
     digits.fill(NO_DIGIT);
-    for (int i = 0; i < 26; ++i)
+    for (size_t i = 0; i < 26; ++i)
     {
-        digits[size_t('A' + i)] = int8_t(i);
-        digits[size_t('a' + i)] = int8_t(26 + i);
+        digits['A' + i] = int8_t(i);
+        digits['a' + i] = int8_t(26 + i);
     }
-    for (int i = 0; i < 10; ++i)
-        digits[size_t('0' + i)] = int8_t(52 + i);
+    for (size_t i = 0; i < 10; ++i)
+        digits['0' + i] = int8_t(52 + i);
     digits[size_t('+')] = digits[size_t('-')] = 62;
     digits[size_t('/')] = digits[size_t('_')] = 63;
     return digits;

@@ -69,7 +69,7 @@ Opened openGltf(Bytes file, const std::string& path)
     const Object asset = document->root().object("asset");
     if (!asset && !isSure)
         return {};
-    const bool isFirst = asset.word("version").rfind("1", 0) == 0;
+    const bool isFirst = asset.word("version").substr(0, 1) == "1";
     return {isFirst ? Opened::Kind::FIRST : Opened::Kind::SECOND, std::move(document)};
 }
 

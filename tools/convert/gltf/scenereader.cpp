@@ -157,6 +157,7 @@ private:
             return;
         }
         std::vector<std::unique_ptr<aiNode>> children;
+        children.reserve(roots.size());
         for (const size_t root : roots)
             children.push_back(readNode(root, true));
         m_scene->mRootNode = new aiNode(m_nodeNames.make("ROOT", ""));

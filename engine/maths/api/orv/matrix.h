@@ -197,7 +197,7 @@ ORV_API Matrix3f inverse(const Matrix3f& m);
 ORV_API Matrix4f inverse(const Matrix4f& m);
 
 /// The part without translation.
-inline Matrix3f upper3x3(const Matrix4f& m)
+[[gnu::always_inline]] inline Matrix3f upper3x3(const Matrix4f& m)
 {
     return Matrix3f(m.columns[0].xyz(), m.columns[1].xyz(), m.columns[2].xyz());
 }

@@ -185,9 +185,9 @@ private:
     SceneNode* m_parent = nullptr;
 };
 
-inline const Matrix4f& SceneNode::getWorldTransform() const
+[[gnu::always_inline]] inline const Matrix4f& SceneNode::getWorldTransform() const
 {
-    if (m_worldTransformChanged)
+    if (m_worldTransformChanged) [[unlikely]]
         update();
     return m_worldTransform;
 }
