@@ -525,9 +525,9 @@ TEST_F(GltfReader, refusesWithThePlace)
         const char* message;
     } cases[] = {
         {R"({"extensionsRequired":["KHR_mesh_quantization","VENDOR_a","VENDOR_b"]})",
-         "needs extensions that nobody here knows: VENDOR_a, VENDOR_b"},
-        {R"({"asset":{"version":"3.0"}})", "is of glTF 3.0, which nobody here reads"},
-        {R"({"asset":{"minVersion":"2.1"}})", "is of glTF 2.1, which nobody here reads"},
+         "needs extensions that are not known: VENDOR_a, VENDOR_b"},
+        {R"({"asset":{"version":"3.0"}})", "is of glTF 3.0, which is not read"},
+        {R"({"asset":{"minVersion":"2.1"}})", "is of glTF 2.1, which is not read"},
         {R"({"asset":null})", "does not say which version of glTF it is"},
         {R"({"scene":7})", "the file asks for scenes[7], which is not there"},
         {R"({"nodes":[{"children":[0]}]})", "nodes[0] is in itself"},

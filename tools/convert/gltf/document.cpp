@@ -233,7 +233,7 @@ Span Document::splitBinary()
 {
     const uint32_t version = readWord(m_file, 4);
     if (version != 2)
-        throw Fault("is a GLB of version " + std::to_string(version) + ", which nobody here reads");
+        throw Fault("is a GLB of version " + std::to_string(version) + ", which is not read");
     Span text;
     size_t at = GLB_HEADER;
     const size_t end = m_file.size();

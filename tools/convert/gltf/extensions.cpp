@@ -57,12 +57,12 @@ void checkExtensions(Source& source)
             missing += (missing.empty() ? "" : ", ") + name.substr(0, 100);
     }
     if (!missing.empty())
-        throw Fault("needs extensions that nobody here knows: " + missing);
+        throw Fault("needs extensions that are not known: " + missing);
     for (const std::string& name : root.texts("extensionsUsed"))
     {
         if (!isKnown(name))
-            source.report.lose("extension", "what the extension " + name.substr(0, 100) +
-                                                " adds, which nobody here knows");
+            source.report.lose("extension",
+                               "what the extension " + name.substr(0, 100) + " adds, which is not known");
     }
 }
 

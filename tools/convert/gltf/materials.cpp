@@ -130,7 +130,7 @@ private:
         addTexture(normal, {aiTextureType_NORMALS});
         if (normal)
             add(float(normal.number("scale", 1.0)), AI_MATKEY_GLTF_TEXTURE_SCALE(aiTextureType_NORMALS, 0));
-        m_isMean = true; // which nobody draws
+        m_isMean = true; // which is not drawn
         const Object occlusion = m_object.object("occlusionTexture");
         addTexture(occlusion, {aiTextureType_LIGHTMAP});
         if (occlusion)

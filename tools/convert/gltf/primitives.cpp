@@ -285,8 +285,8 @@ private:
                                  kind == "TEXCOORD" || kind == "COLOR" || kind == "JOINTS" ||
                                  kind == "WEIGHTS";
             if (!isKnown)
-                m_source.report.lose("attribute", name.substr(0, 100) + " of " + m_what +
-                                                      ", of which nobody here knows the meaning");
+                m_source.report.lose("attribute",
+                                     name.substr(0, 100) + " of " + m_what + ", whose meaning is not known");
         }
     }
 

@@ -82,7 +82,7 @@ std::unique_ptr<aiScene> readGltf(std::unique_ptr<Document> document, FileOpener
     if (wanted.empty())
         throw Fault("does not say which version of glTF it is");
     if (wanted != "2.0" && wanted != "2")
-        throw Fault("is of glTF " + wanted.substr(0, 20) + ", which nobody here reads");
+        throw Fault("is of glTF " + wanted.substr(0, 20) + ", which is not read");
     return readScene(source);
 }
 

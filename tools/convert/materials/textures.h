@@ -47,7 +47,7 @@ struct TextureUse
 {
     std::string name;      ///< of the file that the scene is to name; empty if the picture cannot be had
     bool hasAlpha = false; ///< some of it is transparent
-    bool isAllOrNothing = false; ///< and hardly any of it in part; not known of what nobody decodes
+    bool isAllOrNothing = false; ///< and hardly any of it in part; not known of what is not decoded
     bool isPowerOfTwo = true;    ///< both sides are
 };
 
