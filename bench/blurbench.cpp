@@ -182,6 +182,7 @@ void report(const char* name, const Wall& wall, RenderBlockBase& frame)
 
 int main(int argc, char** argv)
 {
+    orv::setLogLevel(orv::LogLevel::WARNING);
     const int cubes = argc > 1 ? std::atoi(argv[1]) : 250;
     if (cubes < 1)
         giveUp("usage: blurbench [cubes]");

@@ -9,7 +9,9 @@
 // a line "name count" each, for ./run bench --check.
 
 #include "callgrind.h"
+
 #include "contender.h"
+#include "orv/logsink.h"
 
 #include "glcalls/glcalls.h"
 
@@ -248,6 +250,7 @@ void compareContenders(const std::vector<int>& counts)
 
 int main(int argc, char** argv)
 {
+    orv::setLogLevel(orv::LogLevel::WARNING);
     const bool isForCounting = argc > 1 && !std::strcmp(argv[1], FOR_COUNTING);
     const bool isTable = argc > 1 && !std::strcmp(argv[1], "--table");
     std::vector<int> counts;

@@ -16,6 +16,7 @@
 #include "orv/appearance.h"
 #include "orv/assetcachepool.h"
 #include "orv/fontcache.h"
+#include "orv/logsink.h"
 #include "orv/mesh.h"
 #include "orv/meshutil.h"
 #include "orv/motionblurrenderer.h"
@@ -573,6 +574,7 @@ void drawForCounting()
 
 int main(int argc, char** argv)
 {
+    orv::setLogLevel(orv::LogLevel::WARNING);
     const std::string argument = argc > 1 ? argv[1] : "";
     headless::Options options;
     options.width = 320;

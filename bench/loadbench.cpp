@@ -16,6 +16,7 @@
 #include "orv/camera.h"
 #include "orv/glo.h"
 #include "orv/light.h"
+#include "orv/logsink.h"
 #include "orv/renderblock.h"
 #include "orv/rendercontext.h"
 #include "orv/sceneutil.h"
@@ -325,6 +326,7 @@ void compareLoads(AssetCachePool& pool, const std::string& folder, const File& l
 
 int main(int argc, char** argv)
 {
+    orv::setLogLevel(orv::LogLevel::WARNING);
     std::string error;
     const auto surface = headless::Context::create({}, error);
     if (!surface)

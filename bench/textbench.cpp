@@ -81,6 +81,7 @@ bool run(AssetCachePool& pool)
 
 int main()
 {
+    orv::setLogLevel(orv::LogLevel::WARNING);
     std::string error;
     const auto gl = headless::Context::create({}, error);
     if (!gl)

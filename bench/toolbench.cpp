@@ -16,6 +16,7 @@
 #include "orv/camera.h"
 #include "orv/glo.h"
 #include "orv/light.h"
+#include "orv/logsink.h"
 #include "orv/renderblock.h"
 #include "orv/rendercontext.h"
 #include "orv/simplerenderer.h"
@@ -282,6 +283,7 @@ int drawFirstFrame(const char* folder, const char* file)
 
 int main(int argc, char** argv)
 {
+    orv::setLogLevel(orv::LogLevel::WARNING);
     if (argc == 3 && !std::strcmp(argv[1], READ))
         return readModel(argv[2], 0);
     if (argc == 3 && !std::strcmp(argv[1], READ_FOR_DRAWING))

@@ -1,5 +1,5 @@
 // The fuzzing target for the converter and its reader of glTF: a file of any bytes either gives a scene or a reason, and
-// crashes, hangs and exhausts nobody. It is read and converted in this process, where the checks are, without the limits
+// crashes, hangs and exhausts nothing. It is read and converted in this process, where the checks are, without the limits
 // that orv-convert has. Pictures and other files are not there but for those inside the file.
 
 #include "convert/conversion.h"
