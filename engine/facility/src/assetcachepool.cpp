@@ -92,12 +92,7 @@ std::string AssetCachePool::describePath() const
 
 SharedPtr<Stream> AssetCachePool::getCacheStream(const char* name, bool writable) const
 {
-    const SharedPtr<StreamSource> source = m_cacheSource; // which may be replaced while it is asked
-    if (!source)
-        return {};
-    if (writable)
-        source->makeFolders(name);
-    return source->open(name, writable);
+    return detail::openCacheStream(m_cacheSource, name, writable);
 }
 
 void AssetCachePool::flush()

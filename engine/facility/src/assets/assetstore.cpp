@@ -115,14 +115,20 @@ SharedPtr<Stream> AssetStore::getStream(const char* name) const
     return m_assetPath->find(name);
 }
 
-SharedPtr<Stream> AssetStore::getCacheStream(const char* name, bool writable) const
+SharedPtr<Stream> openCacheStream(const SharedPtr<StreamSource>& cacheSource, const char* name, bool writable)
 {
-    const SharedPtr<StreamSource> source = m_cacheSource; // which may be replaced while it is asked
+    SharedPtr<StreamSource> source; // holds what may be replaced while it is asked
+    source = cacheSource;
     if (!source)
         return {};
     if (writable)
         source->makeFolders(name);
     return source->open(name, writable);
+}
+
+SharedPtr<Stream> AssetStore::getCacheStream(const char* name, bool writable) const
+{
+    return openCacheStream(m_cacheSource, name, writable);
 }
 
 } // namespace orv::detail

@@ -9,7 +9,7 @@ namespace orv::ShaderUniformPrivate
 /// the GL does not have are left out (logged).
 void setSamplerUnits(int location, int unit, int size);
 
-/// Sends so many values to the current program. There is one of these for each type of uniform.
+/// Sends a number of values to the current program. There is one of these for each type of uniform.
 /// @param textureUnit  the first of a sampler's.
 void setUniform(int location, int textureUnit, int size, const Matrix3<float>* values);
 void setUniform(int location, int textureUnit, int size, const Matrix4<float>* values);

@@ -76,4 +76,9 @@ private:
     bool m_lacksLoader = false;
 };
 
+/// Opens a stream of a source that caches are kept in; for writing, its folders are made.
+/// @param cacheSource  may be replaced while it is asked; empty gives an empty stream.
+SharedPtr<Stream> openCacheStream(const SharedPtr<StreamSource>& cacheSource, const char* name,
+                                  bool writable);
+
 } // namespace orv::detail

@@ -5,7 +5,7 @@
 namespace orv::detail
 {
 
-/// Kept by what draws have in common (programs, materials, meshes), for whoever sorts draws: says the number that the
+/// Kept by what draws have in common (programs, materials, meshes), for code that sorts draws: says the number that the
 /// object was given, with nothing to look up. GL thread only.
 struct DrawMark
 {

@@ -21,7 +21,7 @@ public:
         m_items[m_count++] = item;
     }
 
-    /// @return where to write so many more.
+    /// @return where to write count more.
     T* extend(std::size_t count)
     {
         if (m_count + count > m_room)
