@@ -20,8 +20,18 @@ struct Window::Native
         if (context)
             SDL_GL_DeleteContext(context);
         if (window)
-            SDL_DestroyWindow(window);
+            destroyWindow();
         SDL_Quit();
+    }
+
+    void destroyWindow()
+    {
+        // SDL ends its own waiting by an event that it sends to the window on a second connection. The X server takes
+        // that for an error, and SDL ends the program, if the window is gone by the time it gets there.
+        SDL_PumpEvents();
+        SDL_Delay(50);
+        SDL_DestroyWindow(window);
+        window = nullptr;
     }
 
     bool open(const Options& options, int samples)
@@ -43,8 +53,7 @@ struct Window::Native
         if (context)
             return true;
         if (window)
-            SDL_DestroyWindow(window);
-        window = nullptr;
+            destroyWindow();
         return false;
     }
 };
