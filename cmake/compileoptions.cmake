@@ -3,6 +3,7 @@ add_library(orv_options INTERFACE)
 target_compile_features(orv_options INTERFACE cxx_std_20)
 target_compile_options(orv_options INTERFACE
     -Wall -Wextra -Wpedantic -Wshadow -Wnon-virtual-dtor -Woverloaded-virtual
+    -ffp-contract=off # numbers are rounded as written, on processors that multiply and add in one step as well
     -fno-rtti # the library has none, and a class that derives from one of its classes must agree
     "-fmacro-prefix-map=${PROJECT_SOURCE_DIR}/=") # log records name sources relative to the project
 if(ORV_WERROR)
