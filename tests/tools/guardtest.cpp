@@ -37,7 +37,7 @@ TEST(Guard, passesOnNothingThatTheChildSays)
     testing::internal::CaptureStderr();
     EXPECT_FALSE(convert::runGuarded(
         {60.0, 0}, "model.3mf", gate, dies, [](std::FILE*) { return true; }, error));
-    EXPECT_EQ("", testing::internal::GetCapturedStderr());
+    EXPECT_EQ(std::string::npos, testing::internal::GetCapturedStderr().find("free()"));
     EXPECT_NE(std::string::npos, error.find("known to crash on some sound 3MF files")) << error;
 }
 
