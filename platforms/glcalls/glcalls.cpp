@@ -31,6 +31,7 @@ constexpr const char* KIND_NAMES[] = {"buffers",       "textures", "framebuffers
 
 struct State
 {
+    bool isChecking = std::getenv("ORV_GL_CHECK") != nullptr;
     bool isRecording = false;
     bool dropsAll = false;
     std::vector<std::string> recorded;
@@ -315,6 +316,45 @@ void record(const Entry& entry, Arguments... arguments)
     state().recorded.push_back(writer.finish());
 }
 
+// --- Checking ----------------------------------------------------------------------------------------------
+
+int getReal(GLenum name)
+{
+    GLint value = 0;
+    real(glGetIntegerv)(name, &value);
+    return value;
+}
+
+/// What a call can have been wrong about without being wrong in itself.
+std::string describeBindings()
+{
+    char text[200];
+    std::snprintf(
+        text, sizeof text,
+        "program %d, array buffer %d, element buffer %d, framebuffer %d, unit %d with texture %d and cube %d",
+        getReal(GL_CURRENT_PROGRAM), getReal(GL_ARRAY_BUFFER_BINDING),
+        getReal(GL_ELEMENT_ARRAY_BUFFER_BINDING), getReal(GL_FRAMEBUFFER_BINDING),
+        getReal(GL_ACTIVE_TEXTURE) - GL_TEXTURE0, getReal(GL_TEXTURE_BINDING_2D),
+        getReal(GL_TEXTURE_BINDING_CUBE_MAP));
+    return text;
+}
+
+/// Says which call GL has found an error in; the caller's own glGetError still gets it.
+template <class... Arguments>
+void check(const Entry& entry, Arguments... arguments)
+{
+    if (&entry == &entryOf_glGetError() || !eglGetCurrentContext())
+        return;
+    while (const GLenum error = real(glGetError)())
+    {
+        ArgumentWriter writer(entry);
+        (writer.add(arguments), ...);
+        std::fprintf(stderr, "GL error 0x%04x: %s; bound are %s\n", error, writer.finish().c_str(),
+                     describeBindings().c_str());
+        queueError(error);
+    }
+}
+
 // --- Calls -------------------------------------------------------------------------------------------------
 
 /// Dropping goes the fast way, so that the cost of everything around the calls can be measured.
@@ -322,7 +362,7 @@ void updateWay(Entry& entry)
 {
     const bool drops = state().dropsAll || entry.isDropped;
     entry.target = drops ? entry.nothing : entry.untypedReal;
-    entry.isSlow = state().isRecording || state().callsToRefusal > 0 ||
+    entry.isSlow = state().isChecking || state().isRecording || state().callsToRefusal > 0 ||
                    (!drops && (entry.isReplaced || findMaker(entry)));
 }
 
@@ -392,12 +432,16 @@ Result callSlowly(TypedEntry<Result(Arguments...)>& entry, Arguments... argument
         run();
         if (maker && maker->makes)
             noteArguments(*maker, arguments...);
+        if (state().isChecking)
+            check(entry, arguments...);
     }
     else
     {
         const Result result = run();
         if (maker)
             noteResult(*maker, result);
+        if (state().isChecking)
+            check(entry, arguments...);
         return result;
     }
 }

@@ -24,6 +24,9 @@
 ///     });
 ///
 /// Calls made by the test itself count too: read counts before reading pixels.
+///
+/// With ORV_GL_CHECK in the environment, GL is asked for errors after each call, and one is written to standard error with
+/// the call, its arguments and what was bound. It is still there for the program's own glGetError.
 /// Threads: none; everything belongs to the one GL thread.
 namespace glcalls
 {

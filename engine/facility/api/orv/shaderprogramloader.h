@@ -26,7 +26,8 @@ namespace orv
 class ORV_API ShaderProgramLoader : public AssetLoader<ShaderProgram>
 {
 public:
-    /// Binary caching starts switched on where the driver supports it.
+    /// Binary caching starts switched on where the driver supports it, and ORV_NO_PROGRAM_CACHE is not in the
+    /// environment.
     ShaderProgramLoader();
 
     /// @param cache  a ShaderProgramCache, the only kind that makes programs.

@@ -10,6 +10,7 @@
 #include "orv/textsuffix.h"
 
 #include <algorithm>
+#include <cstdlib>
 #include <memory>
 #include <new>
 #include <string>
@@ -235,7 +236,8 @@ private:
 
 } // namespace
 
-ShaderProgramLoader::ShaderProgramLoader() : m_binaryCaching(getShaderProgramBinariesSupported())
+ShaderProgramLoader::ShaderProgramLoader()
+    : m_binaryCaching(getShaderProgramBinariesSupported() && !std::getenv("ORV_NO_PROGRAM_CACHE"))
 {
     ORV_LOG_INFO("Shader program binary caching is %s.", m_binaryCaching ? "enabled" : "disabled");
 }
