@@ -113,18 +113,25 @@ bool isBelow(const uint16_t* indices, size_t count, uint16_t limit)
 {
     typedef uint16_t Lanes __attribute__((vector_size(16)));
     constexpr size_t WIDTH = sizeof(Lanes) / sizeof(uint16_t);
-    Lanes above = {};
-    size_t i = 0;
-    for (; i + WIDTH <= count; i += WIDTH)
+    Lanes largest = {};
+    const uint16_t* next = indices;
+    const auto takeSome = [&largest, &next ]() __attribute__((always_inline))
     {
         Lanes some;
-        std::memcpy(&some, indices + i, sizeof some);
-        above |= Lanes(some >= limit);
+        std::memcpy(&some, next, sizeof some);
+        largest = some > largest ? some : largest;
+        next += WIDTH;
+    };
+    for (size_t steps = count / (8 * WIDTH); steps > 0; --steps)
+    {
+        takeSome(), takeSome(), takeSome(), takeSome();
+        takeSome(), takeSome(), takeSome(), takeSome();
     }
-    bool all = true;
-    for (size_t lane = 0; lane < WIDTH; ++lane)
-        all = all && above[lane] == 0;
-    return all && std::all_of(indices + i, indices + count, [=](uint16_t index) { return index < limit; });
+    const auto isBelowLimit = [limit](uint16_t index) { return index < limit; };
+    uint16_t lanes[WIDTH];
+    std::memcpy(lanes, &largest, sizeof lanes);
+    return std::all_of(lanes, lanes + WIDTH, isBelowLimit) &&
+           std::all_of(next, indices + count, isBelowLimit);
 }
 
 bool isInside(const PrimitiveSet& set, uint32_t vertexCount)
