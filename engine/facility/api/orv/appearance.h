@@ -150,6 +150,7 @@ private:
     bool indexAllowed(const char* name, int index) const;
     void storeProperty(const char* name, const SharedPtr<ShaderUniformBase>& uniform);
     void stateChanged();
+    ORV_LOCAL const detail::UniformSources* applyAndPrepare(RenderContext& context, bool turnWinding);
 
     std::string m_name;
     SharedPtr<ShaderProgram> m_shaderProgram;

@@ -128,11 +128,16 @@ public:
     uint64_t apply(const RenderState& state, uint64_t stateRevision, bool blendEnabled,
                    bool turnWinding = false)
     {
-        const uint32_t flags =
-            ((blendEnabled ? APPLY_BLEND : 0u) | (turnWinding ? APPLY_TURNED : 0u)) ^ m_viewTurns;
-        if (stateRevision != m_appliedRevision || flags != m_appliedFlags)
-            applyChanged(state, stateRevision, flags);
+        if (!isApplied(stateRevision, blendEnabled, turnWinding))
+            applyChanged(state, stateRevision, getApplyFlags(blendEnabled, turnWinding));
         return m_appliedRevision;
+    }
+
+    /// Whether apply() with these has nothing to do.
+    bool isApplied(uint64_t stateRevision, bool blendEnabled, bool turnWinding) const
+    {
+        return stateRevision == m_appliedRevision &&
+               getApplyFlags(blendEnabled, turnWinding) == m_appliedFlags;
     }
 
     /// To be called inside a DrawScope after GL calls of your own that bound or unbound a program, a buffer or a
@@ -156,11 +161,8 @@ public:
             sendProgram(name);
     }
 
-    /// Whether the program of this stamp was made ready and nothing has happened to it or to bindings since.
-    bool isProgramReady(uint64_t programRevision) const
-    {
-        return m_readyProgram == programRevision && m_epoch == detail::g_bindingEpoch;
-    }
+    /// Whether the program of this stamp was made ready and nothing else has been used since by way of this context.
+    bool isProgramReady(uint64_t programRevision) const { return m_readyProgram == programRevision; }
 
     void setProgramReady(uint64_t programRevision) { m_readyProgram = programRevision; }
 
@@ -234,6 +236,11 @@ private:
     static constexpr int TEXTURE_TARGETS = 3;
     static constexpr uint32_t APPLY_BLEND = 1; ///< bits of m_appliedFlags
     static constexpr uint32_t APPLY_TURNED = 2;
+
+    uint32_t getApplyFlags(bool blendEnabled, bool turnWinding) const
+    {
+        return ((blendEnabled ? APPLY_BLEND : 0u) | (turnWinding ? APPLY_TURNED : 0u)) ^ m_viewTurns;
+    }
     static constexpr unsigned UNKNOWN = 0xFFFFFFFFu;   ///< no GL object has this name
     static constexpr uint64_t NO_EPOCH = ~uint64_t(0); ///< outside of scopes nothing is known
 
@@ -246,6 +253,7 @@ private:
     ORV_LOCAL void tidyBindings();
     void sendProgram(unsigned name);
     void sendTexture(int unit, unsigned target, unsigned name, int slot);
+    ORV_LOCAL void sendTextureElsewhere(int unit, unsigned target, unsigned name, int slot);
     ORV_LOCAL void selectUnit(unsigned unit);
     void sendArrayBuffer(unsigned name);
     void sendElementBuffer(unsigned name);

@@ -3,6 +3,7 @@
 #include "orv/detail/drawmark.h"
 #include "orv/detail/programattrib.h"
 #include "orv/detail/programhandle.h"
+#include "orv/detail/uniformsources.h"
 #include "orv/export.h"
 #include "orv/shaderuniform.h"
 #include "orv/sharedptr.h"
@@ -21,43 +22,6 @@ class VertexBuffer;
 namespace detail
 {
 class ProgramResource;
-
-/// What the draw path reads of a uniform.
-struct DrawnUniform
-{
-    SharedPtr<ShaderUniformBase> value;  ///< set from outside, may be null
-    SharedPtr<ShaderUniformBase> linked; ///< the context's property, may be null
-    SharedPtr<ShaderUniformBase> sent;   ///< the values sent last; null for a sampler
-    uint64_t sentRevision = 0;           ///< of the source that was compared last
-    int location = -1;
-    int textureUnit = -1;       ///< first of a sampler's units; -1 for other types
-    int size = 1;               ///< array size
-    unsigned textureTarget = 0; ///< of a sampler
-    int textureSlot = -1;       ///< of a sampler of size 1: where the context remembers its texture
-};
-
-/// Where the uniforms of a program take their values from, found out once, so that a draw follows pointers and
-/// compares no names. The pointers are borrowed; the program renews its own stamp when they no longer hold.
-struct UniformSources
-{
-    struct Value
-    {
-        const ShaderUniformBase* source; ///< null for want of one; a sampler always has an entry
-        DrawnUniform* uniform;
-    };
-
-    uint64_t revision = 0;     ///< the program's stamp; 0 to have everything looked up again
-    std::vector<Value> values; ///< but for samplers and transforms; those that were handed to enable() first
-    std::size_t ownCount = 0;  ///< of values: those handed to enable()
-    uint64_t ownUniforms = 0;  ///< a bit for each uniform of these
-    std::vector<Value> samplers;
-    /// By DrawTransform, single matrices that take a property which has that; null where there is none.
-    DrawnUniform* transforms[DRAW_TRANSFORM_COUNT] = {};
-    const ShaderUniformBase* transformSources[DRAW_TRANSFORM_COUNT] = {};
-    bool readsTransforms =
-        false; ///< one of values is such a property too: an array, or a second one that takes it
-};
-
 } // namespace detail
 
 /// A linked GL program with what was learned about it when it was made: its active uniforms, each with a memory

@@ -159,10 +159,14 @@ protected:
 
 private:
     friend class ShaderProgram;
+    template <class T>
+    friend class ShaderUniform;
 
-    /// Takes over the source's values, without a new revision, and sends all own ones to the current program if any
-    /// changed. @return whether any did.
-    virtual bool update(const ShaderUniformBase& source, int location, int textureUnit) = 0;
+    /// Takes over the source's values, without a new revision. @return whether any of the own ones changed.
+    virtual bool takeOver(const ShaderUniformBase& source) = 0;
+
+    /// The same, and sends all own values to the current program if any changed.
+    virtual void update(const ShaderUniformBase& source, int location, int textureUnit) = 0;
 
     /// Sends all own values to the current program.
     virtual void send(int location, int textureUnit) const = 0;
@@ -249,28 +253,37 @@ public:
 private:
     friend class ShaderProgram;
 
-    bool update(const ShaderUniformBase& source, int location, int textureUnit) override
+    bool takeOver(const ShaderUniformBase& source) override
     {
-        const int size = getSize();
-        if (!source.holds<T>())
-        {
-            assertSize(&source, size);
-            return false;
-        }
-        const ShaderUniform& typed = static_cast<const ShaderUniform&>(source);
-        if (typed.getSize() < size) [[unlikely]]
-            assertSize(&source, size);
-        const int count = std::min(size, typed.getSize());
+        const bool fits = source.holds<T>() && source.m_size >= m_size;
+        return fits ? takeOver(static_cast<const ShaderUniform&>(source), m_size) : takeOverMisfit(source);
+    }
+
+    void update(const ShaderUniformBase& source, int location, int textureUnit) override
+    {
+        const bool fits = source.holds<T>() && source.m_size >= m_size;
+        if (fits ? takeOver(static_cast<const ShaderUniform&>(source), m_size) : takeOverMisfit(source))
+            sendValues(location, textureUnit, m_values);
+    }
+
+    [[gnu::noinline]] bool takeOverMisfit(const ShaderUniformBase& source)
+    {
+        assertSize(&source, m_size);
+        return source.holds<T>() && takeOver(static_cast<const ShaderUniform&>(source), source.m_size);
+    }
+
+    /// @param count  of values, at least 1.
+    [[gnu::always_inline]] bool takeOver(const ShaderUniform& source, int count)
+    {
         bool changed = false;
-        for (int i = 0; i < count; ++i)
+        const T* from = source.m_values;
+        for (T *to = m_values, *const end = to + count; to != end; ++to, ++from)
         {
-            if (m_values[i] == typed.m_values[i])
+            if (*to == *from)
                 continue;
-            m_values[i] = typed.m_values[i];
+            *to = *from;
             changed = true;
         }
-        if (changed)
-            sendValues(location, textureUnit, m_values);
         return changed;
     }
 

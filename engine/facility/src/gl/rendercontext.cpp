@@ -497,11 +497,17 @@ void RenderContext::sendProgram(unsigned name)
 
 void RenderContext::sendTexture(int unit, unsigned target, unsigned name, int slot)
 {
-    if (m_activeUnit != unsigned(unit))
-        selectUnit(unsigned(unit));
-    glBindTexture(target, name);
+    if (m_activeUnit != unsigned(unit)) [[unlikely]]
+        return sendTextureElsewhere(unit, target, name, slot);
     if (slot >= 0)
         m_textures[slot] = name;
+    glBindTexture(target, name);
+}
+
+[[gnu::noinline]] void RenderContext::sendTextureElsewhere(int unit, unsigned target, unsigned name, int slot)
+{
+    selectUnit(unsigned(unit));
+    sendTexture(unit, target, name, slot);
 }
 
 void RenderContext::selectUnit(unsigned unit)

@@ -24,6 +24,7 @@ bool GlResource::allocate()
         return false;
     }
     m_name = doAllocate();
+    bindingsChanged(); // a texture has a name from now on
     m_state = m_name != 0 ? ALLOCATED : RELEASED;
     return m_state == ALLOCATED;
 }

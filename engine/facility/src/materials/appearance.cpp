@@ -293,13 +293,19 @@ void Appearance::enable(RenderContext& context, bool turnWinding)
 
 const detail::UniformSources* Appearance::prepare(RenderContext& context, bool turnWinding)
 {
+    if (!m_linked || !context.isApplied(m_stateRevision, !m_opaque, turnWinding)) [[unlikely]]
+        return applyAndPrepare(context, turnWinding);
+    return m_shaderProgram.get()->prepare(context, m_values.data(), m_sources);
+}
+
+[[gnu::noinline]] const detail::UniformSources* Appearance::applyAndPrepare(RenderContext& context,
+                                                                            bool turnWinding)
+{
     m_stateRevision = context.apply(m_state, m_stateRevision, !m_opaque, turnWinding);
-    ShaderProgram* program = m_shaderProgram.get();
-    if (!program)
+    if (!m_shaderProgram)
         return nullptr;
-    if (!m_linked) [[unlikely]]
-        linkShaderProgram();
-    return program->prepare(context, m_values.data(), m_sources);
+    linkShaderProgram();
+    return m_shaderProgram.get()->prepare(context, m_values.data(), m_sources);
 }
 
 } // namespace orv

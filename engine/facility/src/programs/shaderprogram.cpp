@@ -157,7 +157,6 @@ void ShaderProgram::addUniform(const char* name, int location, int size, unsigne
     {
         uniform.textureTarget = type->textureTarget;
         uniform.textureUnit = nextUnit;
-        uniform.textureSlot = size == 1 ? RenderContext::getTextureSlot(nextUnit, type->textureTarget) : -1;
         nextUnit += size;
     }
     m_uniforms.push_back(std::move(uniform));
@@ -249,13 +248,27 @@ void ShaderProgram::linkAnew(RenderContext& context)
     m_sourcesRevision = detail::nextRevision();
 }
 
+namespace
+{
+
+void addUnits(const detail::DrawnUniform& sampler, const ShaderUniformBase* source,
+              std::vector<detail::UniformSources::Unit>& units)
+{
+    for (int unit = sampler.textureUnit; unit < sampler.textureUnit + sampler.size; ++unit)
+        units.push_back({source, unit, sampler.textureTarget,
+                         RenderContext::getTextureSlot(unit, sampler.textureTarget), 0});
+}
+
+} // namespace
+
 void ShaderProgram::resolve(const ShaderUniformBase* const* values, detail::UniformSources& sources)
 {
     // Materials can tell only so many uniforms apart; of more, each is looked at for every material.
     const bool isLarge = m_uniforms.size() > 64;
     std::vector<detail::UniformSources::Value> others;
     sources.values.clear();
-    sources.samplers.clear();
+    sources.units.clear();
+    sources.readyRevision = 0;
     std::fill(std::begin(sources.transforms), std::end(sources.transforms), nullptr);
     sources.ownUniforms = 0;
     sources.readsTransforms = false;
@@ -266,7 +279,7 @@ void ShaderProgram::resolve(const ShaderUniformBase* const* values, detail::Unif
         const ShaderUniformBase* const other = uniform.value ? uniform.value.get() : uniform.linked.get();
         const ShaderUniformBase* const source = own ? own : other;
         if (uniform.textureUnit >= 0)
-            sources.samplers.push_back({source, &uniform});
+            addUnits(uniform, source, sources.units);
         else if (source && takesTransform(uniform, *source, sources))
         {
             sources.transforms[int(source->getDrawTransform())] = &uniform;

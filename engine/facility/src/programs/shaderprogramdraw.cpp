@@ -23,13 +23,11 @@ void ShaderProgram::link(RenderContext& context)
 namespace
 {
 
-void bindSampler(RenderContext& context, const detail::UniformSources::Value& value)
+void lookUpNames(detail::UniformSources& sources)
 {
-    const detail::DrawnUniform& sampler = *value.uniform;
-    const unsigned name = value.source ? detail::getTextureName(*value.source, sampler.textureTarget) : 0;
-    context.bindTexture(sampler.textureUnit, sampler.textureTarget, name, sampler.textureSlot);
-    for (int i = 1; i < sampler.size; ++i)
-        context.bindTexture(sampler.textureUnit + i, sampler.textureTarget, name);
+    for (detail::UniformSources::Unit& unit : sources.units)
+        unit.name = unit.source ? detail::getTextureName(*unit.source, unit.target) : 0;
+    sources.readyRevision = detail::g_lastRevision;
 }
 
 } // namespace
@@ -49,19 +47,20 @@ const detail::UniformSources* ShaderProgram::prepare(RenderContext& context,
 {
     if (!isReady(context, sources) && !makeReady(context, values, sources))
         return nullptr;
-    for (std::size_t i = 0; i < sources.ownCount; ++i)
-        sendIfNew(sources.values[i]);
-    for (const detail::UniformSources::Value& sampler : sources.samplers)
-        bindSampler(context, sampler);
+    const detail::UniformSources::Value* own = sources.values.data();
+    for (const detail::UniformSources::Value* const end = own + sources.ownCount; own != end; ++own)
+        sendIfNew(*own);
+    for (const detail::UniformSources::Unit& unit : sources.units)
+        context.bindTexture(unit.unit, unit.target, unit.name, unit.slot);
     return &sources;
 }
 
 /// Whether the program is current and nothing has changed since all values were sent, but for what a material has of
-/// its own.
+/// its own. Every change is a new last revision, those of the program's sources and of bindings as well.
 inline bool ShaderProgram::isReady(const RenderContext& context, const detail::UniformSources& sources) const
 {
     return context.isProgramReady(m_revision) && m_readyRevision == detail::g_lastRevision &&
-           m_readyUniforms == sources.ownUniforms && sources.revision == m_sourcesRevision;
+           m_readyUniforms == sources.ownUniforms && sources.readyRevision == detail::g_lastRevision;
 }
 
 [[gnu::noinline]] bool ShaderProgram::makeReady(RenderContext& context,
@@ -79,6 +78,8 @@ inline bool ShaderProgram::isReady(const RenderContext& context, const detail::U
         resolve(values, sources);
     for (std::size_t i = sources.ownCount; i < sources.values.size(); ++i)
         sendIfNew(sources.values[i]);
+    if (sources.readyRevision != detail::g_lastRevision)
+        lookUpNames(sources);
     m_readyRevision = detail::g_lastRevision;
     m_readyUniforms = sources.ownUniforms;
     return true;

@@ -242,10 +242,11 @@ void ShaderUniformBase::sendValues(int location, int textureUnit, const void* va
 void ShaderUniformBase::enable(const SharedPtr<ShaderUniformBase>& source, int location, int textureUnit,
                                bool force)
 {
-    if (source && update(*source, location, textureUnit))
-        touch();
-    else if (force)
+    const bool changed = source && takeOver(*source);
+    if (changed || force)
         send(location, textureUnit);
+    if (changed)
+        touch();
 }
 
 } // namespace orv

@@ -128,7 +128,7 @@ struct ORV_API Vector3
     {
         return Vector3(v.x / divisor, v.y / divisor, v.z / divisor);
     }
-    friend constexpr bool operator==(const Vector3& a, const Vector3& b)
+    [[gnu::always_inline]] friend constexpr bool operator==(const Vector3& a, const Vector3& b)
     {
         return a.x == b.x && a.y == b.y && a.z == b.z;
     }
@@ -166,7 +166,7 @@ struct ORV_API Vector4
     T* data() { return &x; }
     const T* data() const { return &x; }
 
-    constexpr Vector3<T> xyz() const { return Vector3<T>(x, y, z); }
+    [[gnu::always_inline]] constexpr Vector3<T> xyz() const { return Vector3<T>(x, y, z); }
 
     constexpr Vector4 operator-() const { return Vector4(-x, -y, -z, -w); }
 
@@ -200,7 +200,7 @@ struct ORV_API Vector4
     {
         return Vector4(v.x / divisor, v.y / divisor, v.z / divisor, v.w / divisor);
     }
-    friend constexpr bool operator==(const Vector4& a, const Vector4& b)
+    [[gnu::always_inline]] friend constexpr bool operator==(const Vector4& a, const Vector4& b)
     {
         return a.x == b.x && a.y == b.y && a.z == b.z && a.w == b.w;
     }

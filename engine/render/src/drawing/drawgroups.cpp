@@ -47,25 +47,35 @@ void DrawGroups::begin()
     m_materialCounts.clear();
 }
 
-void DrawGroups::add(Solid& solid, const Appearance& appearance)
+[[gnu::noinline]] void DrawGroups::add(Solid& solid, const Appearance& appearance)
 {
-    const DrawMark& mark = appearance.getDrawMark();
-    if (mark.round != m_round && !numberMaterial(appearance)) [[unlikely]]
-        return addAlone(solid);
-    ++m_materialCounts[mark.number];
-    m_entries.add({&solid, mark.number, numberMesh(solid.getMesh().get())});
+    const DrawMark& material = appearance.getDrawMark();
+    const Mesh* const mesh = solid.getMesh().get();
+    if (material.round != m_round || !mesh || mesh->getDrawMark().round != m_round || !m_entries.hasRoom())
+        [[unlikely]]
+        return addNew(solid, appearance);
+    addNumbered(solid, material, mesh->getDrawMark());
 }
 
-/// What is rare is in functions of its own, so that adding needs few registers.
-[[gnu::noinline]] void DrawGroups::addAlone(Solid& solid)
+inline void DrawGroups::addNumbered(Solid& solid, const DrawMark& material, const DrawMark& mesh)
 {
+    ++m_materialCounts.data()[material.number];
+    m_entries.add({&solid, material.number, mesh.number});
+}
+
+/// What is rare is in a function of its own, so that adding needs few registers.
+[[gnu::noinline]] void DrawGroups::addNew(Solid& solid, const Appearance& appearance)
+{
+    const DrawMark& material = appearance.getDrawMark();
+    if (material.round == m_round || numberMaterial(appearance))
+        return addNumbered(solid, material, numberMesh(solid.getMesh().get()));
     finish();
     m_solids.add(&solid);
     begin();
 }
 
 /// @return false for a material that keeps the places of its solids.
-[[gnu::noinline]] bool DrawGroups::numberMaterial(const Appearance& appearance)
+bool DrawGroups::numberMaterial(const Appearance& appearance)
 {
     if (keepsPlace(appearance.getRenderState()))
         return false;
@@ -78,14 +88,14 @@ void DrawGroups::add(Solid& solid, const Appearance& appearance)
     return true;
 }
 
-uint32_t DrawGroups::numberMesh(const Mesh* mesh)
+DrawMark DrawGroups::numberMesh(const Mesh* mesh)
 {
     if (!mesh)
-        return 0;
+        return {m_round, 0};
     DrawMark& mark = mesh->getDrawMark();
     if (mark.round != m_round)
         mark = {m_round, m_meshCount++};
-    return mark.number;
+    return mark;
 }
 
 /// The order by meshes first: that by materials then leaves it as it is within each.

@@ -1,5 +1,6 @@
 #pragma once
 
+#include "orv/detail/drawmark.h"
 #include "orv/detail/framelist.h"
 
 #include <cstddef>
@@ -39,9 +40,10 @@ private:
         uint32_t mesh;
     };
 
-    void addAlone(Solid& solid);
+    void addNumbered(Solid& solid, const DrawMark& material, const DrawMark& mesh);
+    void addNew(Solid& solid, const Appearance& appearance);
     bool numberMaterial(const Appearance& appearance);
-    uint32_t numberMesh(const Mesh* mesh);
+    DrawMark numberMesh(const Mesh* mesh);
     void sortByMesh();
     void rankMaterials();
 

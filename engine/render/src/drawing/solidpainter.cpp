@@ -60,7 +60,7 @@ bool SolidPainter::takeMaterial(const Solid& solid)
         m_sources = appearance.prepare(m_context, m_turnsWinding);
         m_appearance = nullptr;
     }
-    if (m_sources)
+    if (m_sources && m_sources->transforms[int(DrawTransform::OLD_MODEL_VIEW_PROJECTION)])
         ShaderProgram::sendHeldTransform(*m_sources, DrawTransform::OLD_MODEL_VIEW_PROJECTION); // not ours
     m_revision = g_lastRevision;
     return m_sources != nullptr;

@@ -14,12 +14,15 @@ class FrameList
 public:
     void clear() { m_count = 0; }
 
-    void add(const T& item)
+    [[gnu::always_inline]] void add(const T& item)
     {
         if (m_count == m_room) [[unlikely]]
-            grow(m_count + 1);
+            return addGrowing(item);
         m_items[m_count++] = item;
     }
+
+    /// Whether add() has memory for one more.
+    bool hasRoom() const { return m_count != m_room; }
 
     /// @return where to write count more.
     T* extend(std::size_t count)
@@ -36,6 +39,12 @@ public:
     T& operator[](std::size_t i) { return m_items[i]; }
 
 private:
+    [[gnu::noinline]] void addGrowing(T item)
+    {
+        grow(m_count + 1);
+        m_items[m_count++] = item;
+    }
+
     [[gnu::noinline]] void grow(std::size_t needed)
     {
         m_memory.resize(std::max(needed, m_room + m_room / 2));
