@@ -476,7 +476,7 @@ TEST_F(GltfReader, scenesHoldWhatTheFileHas)
     EXPECT_NEAR(2.0 * std::atan(2.0 * std::tan(0.5)), double(scene.mCameras[0]->mHorizontalFOV), 1e-6);
     ASSERT_EQ(1u, scene.mNumLights);
     EXPECT_EQ(1.0f, scene.mLights[0]->mAngleOuterCone);
-    EXPECT_EQ(2.0f / (0.02f * 25.0f), scene.mLights[0]->mAttenuationQuadratic); // spent at its range
+    EXPECT_EQ(1.0f, scene.mLights[0]->mAttenuationQuadratic); // its range of 5 is beyond where it ends
 }
 
 // Fault caught: factors of extensions that are dropped without a word.

@@ -23,7 +23,8 @@ void setAttenuation(aiLight& light, double range)
         return;
     const aiColor3D& colour = light.mColorDiffuse;
     const double strength = double(std::max({colour.r, colour.g, colour.b}));
-    const double limited = range > 0.0 ? strength / (double(SPENT) * range * range) : 1.0;
+    const double limited =
+        range > 0.0 ? strength * double(SQUARE_END) * double(SQUARE_END) / (range * range) : 1.0;
     light.mAttenuationQuadratic = float(std::max(1.0, limited));
 }
 

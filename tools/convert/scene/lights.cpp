@@ -30,6 +30,15 @@ float findEnd(const aiLight& light, float strength)
     return float(std::clamp(end, NEAREST, FARTHEST));
 }
 
+/// 1 at the distance where the light's own strength is 1, and stronger nearer by, where both light in full.
+void setSquare(float strength, float factor, glo::LightDefinition& made)
+{
+    made.intensity = SQUARE_END / (SQUARE_END - 1.0f);
+    made.attenuated = 1;
+    made.attenuationNear = 0.0f;
+    made.attenuationFar = std::clamp(SQUARE_END * std::sqrt(strength / factor), 1e-3f, 1e6f);
+}
+
 void setAttenuation(const aiLight& light, float strength, glo::LightDefinition& made)
 {
     made.attenuated = light.mAttenuationLinear > 0.0f || light.mAttenuationQuadratic > 0.0f;
@@ -63,15 +72,19 @@ bool convertLight(const aiLight& light, glo::LightDefinition& made, Report& repo
     }
     made.colour = orv::Vector3f(colour.r / strength, colour.g / strength, colour.b / strength);
     made.intensity = strength;
+    const bool isSquare = light.mAttenuationConstant == 0.0f && light.mAttenuationLinear == 0.0f &&
+                          light.mAttenuationQuadratic > 0.0f;
     if (light.mAttenuationConstant > 0.0f && light.mType != aiLightSource_DIRECTIONAL)
         made.intensity = strength / float(light.mAttenuationConstant);
-    if (made.intensity > PHYSICAL)
+    if (made.intensity > PHYSICAL && (light.mType == aiLightSource_DIRECTIONAL || !isSquare))
     {
         report.approximate("light-brightness", "the brightness of a light in physical units (1 instead)");
         made.intensity = 1.0f;
     }
     made.attenuated = 0;
-    if (light.mType != aiLightSource_DIRECTIONAL)
+    if (light.mType != aiLightSource_DIRECTIONAL && isSquare)
+        setSquare(strength, float(light.mAttenuationQuadratic), made);
+    else if (light.mType != aiLightSource_DIRECTIONAL)
         setAttenuation(light, strength, made);
     if (light.mType == aiLightSource_SPOT)
     {
