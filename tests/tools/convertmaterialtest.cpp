@@ -267,6 +267,55 @@ TEST_F(ConvertMaterialTest, physicalMaterials)
     EXPECT_LT(length(metal - Vector4f(1, 0.73536f, 0, 1)), 1e-4f) << metal.y; // half of the light
 }
 
+// Fault caught: occlusion that comes from another channel than red, in other shares than the rest or at full strength;
+// one for coordinates of its own drawn with others; metals that lose their colour to the sky, or whose sky is upside down.
+TEST_F(ConvertMaterialTest, occlusionAndSky)
+{
+    std::vector<uint8_t> packed;
+    for (int i = 0; i < 64; ++i)
+        packed.insert(packed.end(), {128, 10, 250, 255});
+    writePng("packed.png", 8, 8, packed);
+    json model = makeModel({R"({"name":"dim","occlusionTexture":{"index":3,"strength":0.5}})",
+                            R"({"name":"apart","occlusionTexture":{"index":3,"texCoord":1}})",
+                            R"({"name":"gold","pbrMetallicRoughness":{"metallicFactor":1,"roughnessFactor":0,
+                                "baseColorTexture":{"index":0}}})"});
+    model["images"].push_back({{"uri", "packed.png"}});
+    model["textures"].push_back({{"source", 2}});
+    m_folder.write("model.gltf", model.dump());
+    for (const auto& [options, light] : {std::pair("", 224), std::pair(" --linear off", 192)}) // 0.75 of it
+    {
+        SCOPED_TRACE(options);
+        ASSERT_EQ(0, convert(std::string("model.gltf out.glo") + options).exitCode);
+        const Rgba pixel = support::readPng(m_folder.path("out-packed.png")).pixel(0, 0);
+        EXPECT_TRUE(support::isNear(Rgba{uint8_t(light), uint8_t(light), uint8_t(light)}, pixel, 1)) << pixel;
+    }
+
+    const Glo::Ptr loaded = convertAndLoad("model.gltf out.glo --sky", "out.glo");
+    ASSERT_TRUE(loaded);
+    EXPECT_TRUE(reports("lost: an occlusion map with coordinates of its own")) << m_outcome.output;
+    const auto getWidth = [&](const char* name, const char* property)
+    { return getValue<SharedPtr<Texture2D>>(loaded->getAppearance(name), property)->getWidth(); };
+    EXPECT_EQ(8u, getWidth("dim", "M_AMBIENT_TEXTURE"));
+    EXPECT_NE(8u, getWidth("apart", "M_AMBIENT_TEXTURE"));
+    const SharedPtr<Appearance> gold = loaded->getAppearance("gold");
+    EXPECT_EQ(m_pool->getShaderProgramCache()->get("orv#max_pvl.sp$SPEC$REFL$CUBE$LINEAR"),
+              gold->getShaderProgram());
+    EXPECT_EQ(8u, getWidth("gold", "M_SPECULAR_TEXTURE"));
+    const Picture sky = support::readPng(m_folder.path("out-sky.png"));
+    const struct
+    {
+        int x, y; // in a grid of 3 x 2 faces of 64 pixels
+        Rgba wanted;
+    } places[] = {{96, 96, {111, 159, 216}},
+                  {32, 96, {92, 84, 76}},
+                  {32, 31, {230, 236, 242}},
+                  {32, 33, {92, 84, 76}},
+                  {96, 0, {157, 187, 224}}};
+    for (const auto& place : places)
+        EXPECT_TRUE(support::isNear(place.wanted, sky.pixel(place.x, place.y), 4))
+            << place.x << " " << place.y << " " << sky.pixel(place.x, place.y);
+}
+
 // Fault caught: colours of vertices that are not shown, in other shares than the rest, or whose alpha counts where it
 // should not.
 TEST_F(ConvertMaterialTest, coloursOfVertices)

@@ -137,6 +137,7 @@ void addOptions(CLI::App& app, Command& command)
     app.add_option("--linear", options.linear,
                    "whether materials reckon in shares of light; by default those of glTF do")
         ->check(CLI::IsMember({"on", "off"}));
+    app.add_flag("--sky", options.sky, "gives metals a plain sky to mirror");
     app.add_option("--report", command.report, "also write what is reported as JSON to this file");
     app.add_flag("--dry-run", command.dryRun, "write no scene and no textures");
     app.add_option("--time-limit", command.limits.seconds, "seconds after which to give up; 0 for never")

@@ -27,6 +27,7 @@ public:
                    const Options& options, ConvertedModel& model)
         : m_source(*source.scene)
         , m_hidesColours(source.hidesColours)
+        , m_isGltf(source.own != nullptr)
         , m_toScene(source.toScene)
         , m_stem(stem)
         , m_options(options)
@@ -68,6 +69,7 @@ private:
             const aiMaterial& material = *m_source.mMaterials[i];
             MaterialUse use;
             use.linear = m_options.linear;
+            use.sky = m_options.sky;
             bool used = false;
             for (unsigned m = 0; m < m_source.mNumMeshes; ++m)
             {
@@ -76,16 +78,18 @@ private:
                     continue;
                 used = true;
                 use.repeats = use.repeats || leavesPicture(mesh, findUvChannel(material));
-                if (isColoured(mesh) && m_hidesColours)
+                const bool hasColours = isColoured(mesh, m_isGltf);
+                if (hasColours && m_hidesColours)
                     m_model.report.approximate("vertex-colours",
                                                "vertex colours (kept as a_colour and not shown, as "
                                                "Blender shows them on request alone)");
-                use.hasColours = use.hasColours || (isColoured(mesh) && !m_hidesColours);
+                use.hasColours = use.hasColours || (hasColours && !m_hidesColours);
                 use.isSurface =
                     use.isSurface || mesh.mNormals || mesh.mPrimitiveTypes & aiPrimitiveType_TRIANGLE;
             }
             m_materials.push_back(used ? convertMaterial(material, use, m_textures, names, m_model.report)
                                        : ConvertedMaterial());
+            m_materials.back().isFlat = m_isGltf;
             if (used)
                 addMaterial(m_materials.back().material);
         }
@@ -309,6 +313,7 @@ private:
 
     const aiScene& m_source;
     bool m_hidesColours;
+    bool m_isGltf; ///< 2.0, whose word is taken for all that it says
     aiMatrix4x4 m_toScene;
     std::string m_stem;
     const Options& m_options;

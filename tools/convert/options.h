@@ -16,6 +16,7 @@ struct Options
     int maxTextureSize = 0;  ///< pixels of a picture's longer side; 0 for no limit
     bool powerOfTwo = false; ///< all pictures get sides that are powers of two
     std::string linear; ///< "on", "off": materials reckon in shares of light; empty for what fits the format
+    bool sky = false;   ///< metals mirror a plain sky
     std::set<std::string> takenNames; ///< file names without extension that no picture may get
 };
 

@@ -130,21 +130,27 @@ private:
         addTexture(normal, {aiTextureType_NORMALS});
         if (normal)
             add(float(normal.number("scale", 1.0)), AI_MATKEY_GLTF_TEXTURE_SCALE(aiTextureType_NORMALS, 0));
-        m_isMean = true; // which is not drawn
-        const Object occlusion = m_object.object("occlusionTexture");
-        addTexture(occlusion, {aiTextureType_LIGHTMAP});
-        if (occlusion)
-            add(float(occlusion.number("strength", 1.0)),
-                AI_MATKEY_GLTF_TEXTURE_STRENGTH(aiTextureType_LIGHTMAP, 0));
-        m_isMean = false;
         const double strength =
             m_object.extension("KHR_materials_emissive_strength").number("emissiveStrength", 1.0);
         add(readColour3(m_object, "emissiveFactor", 0.0f) * float(strength), AI_MATKEY_COLOR_EMISSIVE);
         addTexture(m_object.object("emissiveTexture"), {aiTextureType_EMISSIVE});
+        addOcclusion(m_object.object("occlusionTexture"));
         add(int(m_object.flag("doubleSided")), AI_MATKEY_TWOSIDED);
         const std::string mode = m_object.text("alphaMode");
         add(aiString(mode == "MASK" || mode == "BLEND" ? mode : "OPAQUE"), AI_MATKEY_GLTF_ALPHAMODE);
         add(float(m_object.number("alphaCutoff", 0.5)), AI_MATKEY_GLTF_ALPHACUTOFF);
+    }
+
+    /// Often made for coordinates of its own, with which it would be wrong on those of the other pictures.
+    void addOcclusion(const Object& occlusion)
+    {
+        if (!occlusion)
+            return;
+        if (!(readPlacing(occlusion) == m_main.value_or(UvPlacing())))
+            return m_source.report.lose("light-map", "an occlusion map with coordinates of its own");
+        addTexture(occlusion, {aiTextureType_LIGHTMAP});
+        add(float(occlusion.number("strength", 1.0)),
+            AI_MATKEY_GLTF_TEXTURE_STRENGTH(aiTextureType_LIGHTMAP, 0));
     }
 
     /// What surfaces other than metals mirror: its strength, with the refraction's, and its colour.

@@ -3,12 +3,15 @@
 #include "highlights.h"
 #include "materialvalues.h"
 #include "samplers.h"
+#include "sky.h"
 
 #include "orv/detail/glomaterialrules.h"
+#include "orv/texture.h"
 
 #include <assimp/GltfMaterial.h>
 
 #include <algorithm>
+#include <cmath>
 
 // docs/convert.md says the same in tables.
 
@@ -63,6 +66,7 @@ public:
         setEmission();
         setHighlight();
         setNormals();
+        setOcclusion();
         m_made.doubleSided = getInt(m_source, AI_MATKEY_TWOSIDED) != 0;
         addFeature(m_use.hasColours, surface::VERTEX_COLOUR);
         if (isUnlit())
@@ -215,9 +219,28 @@ private:
             roughness = getFloat(m_source, AI_MATKEY_ROUGHNESS_FACTOR, roughness);
         metalness *= getMapMean(metal).z;
         const Vector4f base = m_made.diffuse.colour;
-        if (m_isLinear && !isUnlit())
-            dimMetal(metalness);
-        return fromMetalness(base, metalness, roughness * getMapMean(rough).y, getMirrored());
+        roughness *= getMapMean(rough).y;
+        const bool hasSky = m_use.sky && metalness >= 0.5f && !isUnlit();
+        if ((m_isLinear || hasSky) && !isUnlit())
+            dimMetal(metalness, roughness, hasSky ? 1.0f : 0.5f);
+        Highlight highlight = fromMetalness(base, metalness, roughness, getMirrored());
+        if (hasSky)
+            mirrorSky(metalness, roughness, highlight);
+        return highlight;
+    }
+
+    /// A metal mirrors what of the light it does not spread, see dimMetal().
+    void mirrorSky(float metalness, float roughness, Highlight& highlight)
+    {
+        using orv::TextureParameters;
+        glo::Sampler sampler;
+        sampler.type = orv::detail::glo::sampler::TEXTURE_CUBE;
+        sampler.minFilter = sampler.magFilter = uint32_t(TextureParameters::FilterMode::LINEAR);
+        sampler.wrapHorizontal = sampler.wrapVertical = uint32_t(TextureParameters::WrapMode::CLAMP);
+        sampler.image = m_textures.addMade("sky", makeSky);
+        m_made.reflection.sampler = sampler;
+        m_made.specular.sampler = m_made.diffuse.sampler; // which tints what a metal mirrors
+        highlight.level = std::lerp(highlight.level, getSmoothness(roughness), std::min(metalness, 1.0f));
     }
 
     /// What a surface other than metal mirrors, as a share of the usual.
@@ -237,11 +260,18 @@ private:
                (m_made.specularLevel > 0.0f && !isBlack(m_made.specular.colour));
     }
 
-    /// What metals show instead of what is around them. Half of the light is as bright, on the whole of a ball, as all
-    /// of it where light is reckoned in the screen's values.
-    void dimMetal(float metalness)
+    static float getSmoothness(float roughness)
     {
-        const float share = 1.0f - 0.5f * std::clamp(metalness, 0.0f, 1.0f);
+        return 1.0f - std::clamp(roughness * roughness, 0.0f, 1.0f);
+    }
+
+    /// What metals show instead of what is around them. Half of the light is as bright, on the whole of a ball, as all
+    /// of it where light is reckoned in the screen's values. The rougher they are, the more they spread light as other
+    /// surfaces do.
+    /// @param most  of the light: what a smooth one loses.
+    void dimMetal(float metalness, float roughness, float most)
+    {
+        const float share = 1.0f - most * getSmoothness(roughness) * std::clamp(metalness, 0.0f, 1.0f);
         const float shown = toScreen(Vector4f(share, share, share, 1.0f)).x;
         for (Vector4f* colour : {&m_made.diffuse.colour, &m_made.ambient.colour})
             *colour = Vector4f(colour->x * shown, colour->y * shown, colour->z * shown, 1.0f);
@@ -299,6 +329,20 @@ private:
             m_report.approximate("gloss-map", "a map of gloss (seen only along with a normal map)");
     }
 
+    /// Where light from all around does not reach. Other formats do not say whether such a map is one of light.
+    void setOcclusion()
+    {
+        if (!m_isGltf || isUnlit())
+            return;
+        const float strength =
+            getFloat(m_source, AI_MATKEY_GLTF_TEXTURE_STRENGTH(aiTextureType_LIGHTMAP, 0), 1.0f);
+        TextureWish wish;
+        wish.alpha = Alpha::DROP;
+        wish.occlusion = std::clamp(strength, 0.0f, 1.0f);
+        wish.isShare = m_isLinear;
+        m_made.ambient.sampler = m_samplers.make({aiTextureType_LIGHTMAP}, wish).field;
+    }
+
     /// The base colour becomes light of its own, which no other light changes.
     void makeUnlit()
     {
@@ -350,7 +394,8 @@ private:
         for (const auto& kind : kinds)
         {
             const std::string path = getTexturePath(m_source, kind.type);
-            if (!path.empty() && path != base)
+            const bool isUsed = kind.type == aiTextureType_LIGHTMAP && m_isGltf;
+            if (!path.empty() && path != base && !isUsed)
                 m_report.lose(kind.code, kind.loss);
         }
         if (getFloat(m_source, AI_MATKEY_CLEARCOAT_FACTOR, 0.0f) > 0.0f)

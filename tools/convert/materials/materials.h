@@ -13,6 +13,7 @@ namespace convert
 struct MaterialUse
 {
     std::string linear;      ///< see Options
+    bool sky = false;        ///< the same
     bool repeats = false;    ///< texture coordinates leave the pictures
     bool hasColours = false; ///< some vertices have colours of their own
     bool isSurface = false;  ///< some meshes have triangles or normals, so that light counts
@@ -26,6 +27,7 @@ struct ConvertedMaterial
     bool usesVertexAlpha = false;
     unsigned uvChannel = 0; ///< of the model's texture coordinates, the one to take
     bool hasNormalMap = false;
+    bool isFlat = false; ///< where a mesh has no normals; of most formats such meshes are smooth
 };
 
 /// @return the kind of the material's first picture, whose texture coordinates all of them have; NONE without one.

@@ -8,6 +8,7 @@
 #include "orv/memorystream.h"
 
 #include <algorithm>
+#include <array>
 #include <climits>
 #include <cmath>
 #include <cstdlib>
@@ -257,6 +258,21 @@ bool makeNormals(Picture& heights)
     }
     heights = std::move(made);
     return true;
+}
+
+void makeOcclusion(Picture& picture, float strength, bool isShare)
+{
+    constexpr float GAMMA = 2.2f; // the engine's own
+    std::array<uint8_t, 256> table{};
+    for (size_t i = 0; i < table.size(); ++i)
+    {
+        const float light = 1.0f + strength * (float(i) / 255.0f - 1.0f);
+        table[i] = uint8_t(std::lround(255.0f * (isShare ? std::pow(light, 1.0f / GAMMA) : light)));
+    }
+    spreadGrey(picture);
+    const size_t channels = size_t(picture.channels);
+    for (size_t at = 0; at < picture.data.size(); at += channels)
+        std::fill_n(&picture.data[at], 3, table[picture.data[at]]);
 }
 
 Transparency getTransparency(const Picture& picture)

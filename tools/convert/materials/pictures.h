@@ -55,6 +55,11 @@ void setAlpha(Picture& picture, Picture opacity);
 /// @return whether it was one of heights.
 bool makeNormals(Picture& heights);
 
+/// Red, which says how much light reaches a place from all around, becomes grey.
+/// @param strength  0 to 1; 0 is light everywhere.
+/// @param isShare   the light is wanted in the screen's values, of which half of it is 0.74.
+void makeOcclusion(Picture& picture, float strength, bool isShare);
+
 /// What the alpha channel amounts to.
 enum class Transparency
 {

@@ -84,6 +84,14 @@ std::vector<aiVector3D> makeNormals(const aiMesh& mesh, const Corners& corners)
     return normals;
 }
 
+std::vector<aiVector3D> makeFlatNormals(const aiMesh& mesh, const Corners& corners)
+{
+    std::vector<aiVector3D> normals;
+    for (size_t i = 0; i < corners.size(); i += 3)
+        normals.insert(normals.end(), 3, getFaceNormal(mesh, corners, i).NormalizeSafe());
+    return normals;
+}
+
 Tangents makeTangents(const aiMesh& mesh, const Corners& corners, const std::vector<aiVector3D>& normals,
                       const aiVector3D* uvs)
 {

@@ -16,6 +16,9 @@ aiVector3D getFaceNormal(const aiMesh& mesh, const Corners& corners, size_t firs
 /// degrees, sharp elsewhere.
 std::vector<aiVector3D> makeNormals(const aiMesh& mesh, const Corners& corners);
 
+/// The same with all edges sharp.
+std::vector<aiVector3D> makeFlatNormals(const aiMesh& mesh, const Corners& corners);
+
 /// The directions in which texture coordinates grow, at right angles to the normals, one for each corner. Corners
 /// share them where position, normal and coordinates are the same, but not where the picture is mirrored.
 struct Tangents

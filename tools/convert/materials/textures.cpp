@@ -97,6 +97,17 @@ TextureUse TextureStore::add(const TextureWish& wish)
     return known != m_known.end() ? known->second : m_known[wish] = make(wish);
 }
 
+std::string TextureStore::addMade(const std::string& name, Picture (*paint)())
+{
+    std::string& made = m_made[name];
+    if (made.empty())
+    {
+        made = makeName(name, ".png");
+        m_files.push_back({made, encodePng(paint())});
+    }
+    return made;
+}
+
 std::optional<orv::Vector4f> TextureStore::getMean(const std::string& path)
 {
     const auto known = m_means.find(path);
@@ -172,7 +183,7 @@ bool TextureStore::canPassOn(const PictureHeader& header, const TextureWish& wis
     const bool hasRightSize = size.width == header.width && size.height == header.height;
     const bool hasRightAlpha = header.channels == 3 || (header.channels == 4 && wish.alpha == Alpha::KEEP);
     return header.isWhole && !header.extension.empty() && hasRightSize && hasRightAlpha &&
-           wish.opacity.empty() && !wish.isHeight;
+           wish.opacity.empty() && !wish.isHeight && !wish.occlusion;
 }
 
 TextureUse TextureStore::passOn(const Loaded& loaded, const TextureWish& wish)
@@ -196,6 +207,11 @@ bool TextureStore::treat(Picture& pixels, const TextureWish& wish)
     if (opacity && decode(*opacity, wish.opacity))
     {
         setAlpha(pixels, std::move(opacity->pixels));
+        changed = true;
+    }
+    if (wish.occlusion)
+    {
+        makeOcclusion(pixels, *wish.occlusion, wish.isShare);
         changed = true;
     }
     if (wish.isHeight && makeNormals(pixels))

@@ -33,13 +33,18 @@ struct TextureWish
     std::string path;    ///< as the material names it
     std::string opacity; ///< of a picture whose brightness is the opacity; empty for none
     Alpha alpha = Alpha::KEEP;
-    float threshold = 0.0f; ///< of CUT; 0 to 1
-    bool repeats = false;   ///< coordinates leave the picture
-    bool isHeight = false;  ///< heights, wanted as normals
+    float threshold = 0.0f;         ///< of CUT; 0 to 1
+    bool repeats = false;           ///< coordinates leave the picture
+    bool isHeight = false;          ///< heights, wanted as normals
+    std::optional<float> occlusion; ///< its strength: see makeOcclusion()
+    bool isShare = false;           ///< of an occlusion: likewise
     /// Filters and wrapping, which the engine ties to the picture's name.
     std::array<uint32_t, 4> sampling = {};
 
-    auto tie() const { return std::tie(path, opacity, alpha, threshold, repeats, isHeight, sampling); }
+    auto tie() const
+    {
+        return std::tie(path, opacity, alpha, threshold, repeats, isHeight, occlusion, isShare, sampling);
+    }
     bool operator<(const TextureWish& other) const { return tie() < other.tie(); }
 };
 
@@ -68,6 +73,10 @@ public:
                  Report& report);
 
     TextureUse add(const TextureWish& wish);
+
+    /// A picture that the model does not have.
+    /// @return the name of its file, the same for the same name.
+    std::string addMade(const std::string& name, Picture (*paint)());
 
     /// The mean red, green, blue and alpha of a picture, 0 to 1; nothing if it cannot be had.
     std::optional<orv::Vector4f> getMean(const std::string& path);
@@ -102,6 +111,7 @@ private:
     Options m_options;
     Report& m_report;
     std::map<TextureWish, TextureUse> m_known;
+    std::map<std::string, std::string> m_made; ///< files by name, see addMade()
     std::map<std::string, std::optional<orv::Vector4f>> m_means;
     std::set<std::string> m_names;
     std::vector<OutputFile> m_files;

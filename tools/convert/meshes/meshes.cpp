@@ -90,7 +90,8 @@ private:
             m_columns.push_back({"a_normal", 3, m_mesh.mNormals, false});
         else if (isSurface)
         {
-            m_normals = makeNormals(m_mesh, m_corners);
+            m_normals = m_material.isFlat && !m_mesh.mNormals ? makeFlatNormals(m_mesh, m_corners)
+                                                              : makeNormals(m_mesh, m_corners);
             m_columns.push_back({"a_normal", 3, m_normals.data(), true});
         }
         const aiVector3D* uvs = chooseTextureCoordinates();
@@ -365,7 +366,7 @@ bool hasTransparentColour(const aiMesh& mesh)
 
 } // namespace
 
-bool isColoured(const aiMesh& mesh)
+bool isColoured(const aiMesh& mesh, bool mayBeBlack)
 {
     const aiColor4D* colours = mesh.mColors[0];
     const auto hasOther = [&](const aiColor4D& colour)
@@ -374,7 +375,7 @@ bool isColoured(const aiMesh& mesh)
                            [&](const aiColor4D& own)
                            { return own.r != colour.r || own.g != colour.g || own.b != colour.b; });
     };
-    return colours && hasOther(aiColor4D(0, 0, 0, 1)) &&
+    return colours && (mayBeBlack || hasOther(aiColor4D(0, 0, 0, 1))) &&
            (hasOther(aiColor4D(1, 1, 1, 1)) || hasTransparentColour(mesh));
 }
 

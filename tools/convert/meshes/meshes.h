@@ -27,7 +27,8 @@ std::vector<MeshPart> convertMesh(const aiMesh& mesh, const ConvertedMaterial& m
 
 /// Whether the vertices have colours: not all of them white or all of them black, which some importers of the library
 /// put where there are none.
-bool isColoured(const aiMesh& mesh);
+/// @param mayBeBlack  black is a colour as any other.
+bool isColoured(const aiMesh& mesh, bool mayBeBlack);
 
 /// Whether texture coordinates of the channel lie outside 0 to 1.
 bool leavesPicture(const aiMesh& mesh, unsigned uvChannel);

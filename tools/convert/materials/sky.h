@@ -1,0 +1,11 @@
+#pragma once
+
+#include "pictures.h"
+
+namespace convert
+{
+
+/// A plain sky for metals to mirror, as the engine takes cube maps: pale at the horizon, blue above, with a dark ground.
+Picture makeSky();
+
+} // namespace convert
