@@ -2,6 +2,7 @@
 
 #include "convert/meshes/meshes.h"
 #include "convert/meshes/parts.h"
+#include "convert/scene/lights.h"
 #include "convert/scene/placement.h"
 
 #include "orv/detail/glovertices.h"
@@ -10,8 +11,10 @@
 #include "orv/solid.h"
 #include "orv/vertexbuffer.h"
 
+#include <assimp/light.h>
 #include <assimp/mesh.h>
 
+#include <algorithm>
 #include <cmath>
 #include <deque>
 #include <random>
@@ -147,7 +150,7 @@ TEST_F(ConvertTest, geometryIsKept)
          {"a_position", "a_normal", "a_colour"},
          "24 vertices"},
         {models + "glTF2/glTF-Sample-Models/AnimatedMorphCube-glTF/AnimatedMorphCube.gltf",
-         Primitive::TRIANGLES, 36, plain, "the morph targets of mesh \"Cube\" (2)"},
+         Primitive::TRIANGLES, 36 * 64, plain, "64 moving shapes"},
     };
     for (const auto& item : cases)
     {
@@ -284,6 +287,61 @@ TEST(ConvertSurfaces, tangentsFollowThePicture)
             sum += tangent[i];
         }
         EXPECT_FLOAT_EQ(0.0f, sum);
+    }
+}
+
+// Fault caught: rounded edges on a glTF mesh without normals, which the format has flat; and flat ones in formats where
+// such meshes are meant to be smooth.
+TEST(ConvertMesh, missingNormals)
+{
+    aiMesh mesh; // two triangles that meet at 45 degrees
+    const aiVector3D places[] = {{0, 0, 0}, {0, 1, 0}, {-1, 0, 0}, {1, 0, -1}};
+    const unsigned faces[][3] = {{0, 1, 2}, {0, 3, 1}};
+    mesh.mNumVertices = 4;
+    mesh.mVertices = new aiVector3D[4];
+    std::copy(places, places + 4, mesh.mVertices);
+    mesh.mNumFaces = 2;
+    mesh.mFaces = new aiFace[2];
+    for (size_t i = 0; i < 2; ++i)
+    {
+        mesh.mFaces[i].mNumIndices = 3;
+        mesh.mFaces[i].mIndices = new unsigned[3]{faces[i][0], faces[i][1], faces[i][2]};
+    }
+    convert::ConvertedMaterial material;
+    convert::Report report;
+    for (const bool isFlat : {false, true})
+    {
+        material.isFlat = isFlat;
+        const std::vector<convert::MeshPart> parts = convert::convertMesh(mesh, material, report);
+        ASSERT_EQ(1u, parts.size());
+        EXPECT_EQ(isFlat ? 6u : 4u, parts[0].geometry.vertices.vertexCount);
+    }
+    mesh.mColors[0] = new aiColor4D[4]; // black
+    EXPECT_FALSE(convert::isColoured(mesh, false));
+    EXPECT_TRUE(convert::isColoured(mesh, true));
+}
+
+// Fault caught: lights by the square of the distance that light far things as if they were near.
+TEST(ConvertLights, followTheSquareOfTheDistance)
+{
+    aiLight source;
+    source.mType = aiLightSource_POINT;
+    source.mAttenuationConstant = source.mAttenuationLinear = 0.0f;
+    source.mAttenuationQuadratic = 1.0f;
+    for (const float strength : {0.5f, 3.0f, 200.0f})
+    {
+        source.mColorDiffuse = aiColor3D(strength, strength, strength);
+        glo::LightDefinition made;
+        convert::Report report;
+        ASSERT_TRUE(convert::convertLight(source, made, report));
+        for (float share = 0.1f; share < 4.0f; share += 0.1f) // of the distance where it lights in full
+        {
+            const float distance = share * std::sqrt(strength);
+            const float line = made.intensity * std::clamp(1.0f - distance / made.attenuationFar, 0.0f, 1.0f);
+            const float square = strength / (distance * distance);
+            EXPECT_NEAR(std::min(square, 1.0f), std::min(line, 1.0f), 0.26f)
+                << strength << " at " << distance;
+        }
     }
 }
 

@@ -1,4 +1,5 @@
 #include "converttest.h"
+#include "gltfwriter.h"
 
 #include "convert/files/filegate.h"
 #include "convert/files/modelfiles.h"
@@ -8,6 +9,7 @@
 #include "orv/animationgroup.h"
 #include "orv/camera.h"
 #include "orv/detail/glovertices.h"
+#include "orv/mesh.h"
 #include "orv/solid.h"
 
 #include <assimp/Importer.hpp>
@@ -485,4 +487,106 @@ TEST_F(ConvertMotionTest, nodesAreWhereTheFileHasThem)
                                              : Vector3f(0.0f, 2.0f, 0.0f);
         EXPECT_LT(length(posed.find({0, 1, 0})->second - upwards), 1e-5f) << up;
     }
+}
+
+namespace
+{
+
+/// A file of one triangle, and one second in which a channel goes from one value to another.
+GltfWriter writeMove(const char* path, const std::vector<float>& values, const char* type)
+{
+    GltfWriter writer;
+    writer.setAttribute("POSITION", writer.add(std::vector<float>{0, 0, 0, 1, 0, 0, 0, 1, 0}, "VEC3"));
+    const size_t times = writer.add(std::vector<float>{0, 1}, "SCALAR");
+    const size_t output = writer.add(values, type);
+    writer.file["animations"] = {
+        {{"name", "move"},
+         {"samplers", {{{"input", times}, {"output", output}}}},
+         {"channels", {{{"sampler", 0}, {"target", {{"node", 0}, {"path", path}}}}}}}};
+    return writer;
+}
+
+/// The far corner of the triangle whose area can be seen; there is to be one.
+Vector3f findSeen(SceneNode& node)
+{
+    Vector3f corner(NOT_THERE, NOT_THERE, NOT_THERE);
+    int seen = 0;
+    for (const SceneNode::Ptr& child : node.getChildren())
+    {
+        const Matrix4f world = child->getWorldTransform();
+        if (child->getNodeType() != Solid::NODE_TYPE || length(world[0]) == 0.0f)
+            continue;
+        const SharedPtr<Mesh> mesh = static_cast<Solid&>(*child).getMesh();
+        corner = Vector3f(world[3].x, world[3].y, mesh->getHeader().boundingRadius);
+        ++seen;
+    }
+    EXPECT_EQ(1, seen);
+    return corner;
+}
+
+} // namespace
+
+// Fault caught: nodes that mirror or have no size at rest and turn another way while they move, since a matrix does not
+// tell which axis is turned round, and tells no rotation where there is no size.
+TEST_F(ConvertTest, nodesThatMatricesDoNotTell)
+{
+    const std::vector<float> half = {0, 1, 0, 0}; // a turn by half a circle around y
+    const struct
+    {
+        const char* path;
+        std::vector<float> values; ///< at 0 and 1 s
+        const char* type;
+        std::vector<float> rotation, scale; ///< of the node
+        Vector3f x, y;                      ///< where the axes are at 1 s
+    } cases[] = {
+        {"rotation", {0, 0, 0, 1, 0, 1, 0, 0}, "VEC4", half, {-1, 1, 1}, {1, 0, 0}, {0, 1, 0}},
+        {"scale", {-1, 1, 1, -2, 1, 1}, "VEC3", half, {-1, 1, 1}, {2, 0, 0}, {0, 1, 0}},
+        {"scale", {0, 0, 0, 2, 2, 2}, "VEC3", half, {0, 0, 0}, {-2, 0, 0}, {0, 2, 0}},
+        {"scale", {0, 0, 0, 2, 2, 2}, "VEC3", {0, 0, 0, 1}, {0, 0, 0}, {2, 0, 0}, {0, 2, 0}},
+    };
+    for (size_t i = 0; i < std::size(cases); ++i)
+    {
+        SCOPED_TRACE(i);
+        GltfWriter writer = writeMove(cases[i].path, cases[i].values, cases[i].type);
+        writer.file["nodes"][0]["rotation"] = cases[i].rotation;
+        writer.file["nodes"][0]["scale"] = cases[i].scale;
+        m_folder.write("model.glb", writer.write());
+        const Glo::Ptr loaded = convertAndLoad("model.glb out.glo", "out.glo");
+        ASSERT_TRUE(loaded);
+        loaded->getAnimation("move")->apply(1.0f);
+        const Matrix4f world = loaded->getTopNode()->find("node")->getWorldTransform();
+        EXPECT_LT(length(world[0] - Vector4f(cases[i].x, 0.0f)), 1e-5f);
+        EXPECT_LT(length(world[1] - Vector4f(cases[i].y, 0.0f)), 1e-5f);
+    }
+}
+
+// Fault caught: shapes that do not move, two of them seen at once, none, or another than the weights of the moment make.
+TEST_F(ConvertTest, weightsThatMoveBecomeMeshes)
+{
+    GltfWriter writer = writeMove("weights", {0.5f, 2.5f}, "SCALAR");
+    const size_t target = writer.add(std::vector<float>{0, 0, 0, 0, 0, 0, 0, 4, 0}, "VEC3");
+    writer.primitive()["targets"] = {{{"POSITION", target}}};
+    for (const float rest : {0.0f, 0.5f}) // one of which no moment has
+    {
+        writer.file["nodes"][0]["weights"] = {rest};
+        m_folder.write("model.glb", GltfWriter(writer).write());
+        const Glo::Ptr loaded = convertAndLoad("model.glb out.glo --fps 20", "out.glo");
+        ASSERT_TRUE(loaded);
+        EXPECT_FALSE(reports("lost")) << m_outcome.output;
+        EXPECT_TRUE(reports(rest == 0.0f ? "22 moving shapes" : "21 moving shapes")) << m_outcome.output;
+        SceneNode* node = loaded->getTopNode()->find("node");
+        EXPECT_NEAR(1.0f + 4.0f * rest, findSeen(*node).z, 1e-5f);
+        for (const float time : {0.0f, 0.26f, 0.5f, 1.0f})
+        {
+            loaded->getAnimation("move")->apply(time);
+            const float weight = 0.5f + 2.0f * std::floor(time * 20.0f + 0.001f) / 20.0f;
+            EXPECT_NEAR(1.0f + 4.0f * weight, findSeen(*node).z, 1e-5f) << time;
+        }
+    }
+    EXPECT_NE(std::string::npos, convert("model.glb many.glo --fps 200").output.find("50 times a second"));
+
+    writer.file["skins"] = {{{"joints", {0}}}}; // joints take no account of the scale of a mesh's node
+    writer.file["nodes"][0]["skin"] = 0;
+    m_folder.write("model.glb", writer.write());
+    EXPECT_NE(std::string::npos, convert("model.glb skin.glo").output.find("changes the shape of meshes"));
 }

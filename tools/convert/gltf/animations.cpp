@@ -1,5 +1,7 @@
 #include "animations.h"
 
+#include "tracks.h"
+
 #include <assimp/anim.h>
 
 #include <algorithm>
@@ -14,27 +16,6 @@ namespace
 
 constexpr double MOST_SAMPLES = 200000.0; // as many as the conversion takes; a longer animation it leaves out
 
-/// Values over time.
-struct Track
-{
-    enum class Way
-    {
-        LINE,
-        STEP,
-        SPLINE
-    };
-    Way way = Way::LINE;
-    std::vector<float> times;
-    Column values; ///< a SPLINE has three for each time: the tangent before, the value, the tangent after
-};
-
-Track::Way toWay(const std::string& interpolation)
-{
-    return interpolation == "STEP"          ? Track::Way::STEP
-           : interpolation == "CUBICSPLINE" ? Track::Way::SPLINE
-                                            : Track::Way::LINE;
-}
-
 using Value = std::array<float, 4>;
 
 Value getValue(const Column& column, size_t element)
@@ -42,25 +23,6 @@ Value getValue(const Column& column, size_t element)
     Value value{};
     std::copy(column[element], column[element] + column.components, value.begin());
     return value;
-}
-
-/// @param key  the time is between this one's and the next one's.
-Value evaluateSpline(const Track& track, size_t key, double time)
-{
-    const float span = track.times[key + 1] - track.times[key];
-    const float t = span > 0.0f ? float((time - double(track.times[key])) / double(span)) : 0.0f;
-    const Value from = getValue(track.values, key * 3 + 1);
-    const Value leaving = getValue(track.values, key * 3 + 2);
-    const Value arriving = getValue(track.values, key * 3 + 3);
-    const Value to = getValue(track.values, key * 3 + 4);
-    const float squared = t * t;
-    const float cubed = squared * t;
-    Value made{};
-    for (unsigned c = 0; c < track.values.components; ++c)
-        made[c] = (2.0f * cubed - 3.0f * squared + 1.0f) * from[c] +
-                  span * (cubed - 2.0f * squared + t) * leaving[c] +
-                  (-2.0f * cubed + 3.0f * squared) * to[c] + span * (cubed - squared) * arriving[c];
-    return made;
 }
 
 struct Key
@@ -84,8 +46,7 @@ public:
                 m_keys.push_back({time, m_keys.back().value});
             if (i > 0 && m_track.way == Track::Way::SPLINE)
                 sample(i - 1);
-            const size_t element = m_track.way == Track::Way::SPLINE ? 3 * i + 1 : i;
-            m_keys.push_back({time, getValue(m_track.values, element)});
+            m_keys.push_back({time, getValue(m_track.values, m_track.getElement(i))});
         }
         return std::move(m_keys);
     }
@@ -100,8 +61,10 @@ private:
         // From 0 on, where sampling begins: damaged times may lie as far before it as numbers go.
         for (double i = std::max(0.0, std::floor(start * m_fps) + 1.0); i / m_fps < end; i += 1.0)
         {
-            if (i / m_fps > start)
-                m_keys.push_back({i / m_fps, evaluateSpline(m_track, key, i / m_fps)});
+            if (i / m_fps <= start)
+                continue;
+            m_keys.push_back({i / m_fps, {}});
+            evaluateSpline(m_track, key, i / m_fps, m_keys.back().value.data());
         }
     }
 
@@ -162,10 +125,13 @@ aiNodeAnim* toChannel(const std::string& node, const Movement& movement)
 class AnimationReader
 {
 public:
-    AnimationReader(Source& source, const Object& animation, const std::vector<std::string>& nodeNames)
+    AnimationReader(Source& source, size_t number, const std::vector<std::string>& nodeNames,
+                    const std::map<size_t, MovingShapes>& shapes)
         : m_source(source)
-        , m_animation(animation)
+        , m_number(number)
+        , m_animation(source.document.root().at("animations", number))
         , m_nodeNames(nodeNames)
+        , m_shapes(shapes)
         , m_made(std::make_unique<aiAnimation>())
     {
     }
@@ -177,8 +143,16 @@ public:
         for (size_t i = 0; i < m_animation.length("channels"); ++i)
             readOrLose(m_animation.at("channels", i));
         std::vector<aiNodeAnim*> channels;
-        for (const auto& [node, movement] : m_movements)
+        for (auto& [node, movement] : m_movements)
+        {
+            fillRest(m_source.document.root().at("nodes", node), movement);
             channels.push_back(toChannel(m_nodeNames[node], movement));
+        }
+        for (const auto& [node, shapes] : m_shapes)
+        {
+            const std::vector<aiNodeAnim*> shown = showShapes(shapes, m_number);
+            channels.insert(channels.end(), shown.begin(), shown.end());
+        }
         if (channels.empty()) // libassimp would leave an array of none behind
             return std::move(m_made);
         m_made->mNumChannels = unsigned(channels.size());
@@ -207,7 +181,7 @@ private:
         const std::optional<size_t> node = target.index("node");
         const std::string path = target.text("path");
         if (path == "weights")
-            return noteMorph(channel);
+            return noteMorph(channel, node && m_shapes.count(*node) > 0);
         if (!node || *node >= m_nodeNames.size() || !Movement().find(path))
             return loseTarget("a movement of what is no node's");
         if (m_nodeNames[*node].empty())
@@ -215,7 +189,9 @@ private:
         std::vector<Key>& keys = *m_movements[*node].find(path);
         if (!keys.empty())
             return loseTarget("a second " + path + " of \"" + m_nodeNames[*node] + "\"");
-        keys = KeyMaker(readTrack(channel, path == "rotation" ? 4 : 3), m_source.options.fps).make();
+        keys = KeyMaker(readTrack(m_source, m_animation, channel, path == "rotation" ? 4 : 3),
+                        m_source.options.fps)
+                   .make();
         if (!keys.empty())
             m_made->mDuration = std::max(m_made->mDuration, keys.back().time);
     }
@@ -226,54 +202,52 @@ private:
                              what + " in animation \"" + std::string(m_made->mName.C_Str()) + "\"");
     }
 
+    /// A matrix does not tell the rotation of a node without size, nor which of its axes a mirroring one turns round. So
+    /// what such a node keeps while it moves comes from the file.
+    static void fillRest(const Object& node, Movement& movement)
+    {
+        Value rotation = {0.0f, 0.0f, 0.0f, 1.0f};
+        Value scale = {1.0f, 1.0f, 1.0f};
+        node.numbers("rotation", rotation);
+        node.numbers("scale", std::span(scale).first(3));
+        if (node.has("matrix") || *std::min_element(scale.begin(), scale.begin() + 3) > 0.0f)
+            return;
+        if (movement.rotation.empty())
+            movement.rotation.push_back({0.0, rotation});
+        if (movement.scale.empty())
+            movement.scale.push_back({0.0, scale});
+    }
+
     /// A channel without keys, for the report.
-    void noteMorph(const Object& channel)
+    /// @param isShown  by meshes.
+    void noteMorph(const Object& channel, bool isShown)
     {
         const Object sampler = m_animation.at("samplers", channel.size("sampler", 0));
         const Column times = m_source.accessors.read(sampler.size("input", 0), sampler, 1);
         if (!times.values.empty() && std::isfinite(times.values.back()))
             m_made->mDuration = std::max(m_made->mDuration, double(times.values.back()));
-        if (m_made->mNumMorphMeshChannels > 0)
+        if (isShown || m_made->mNumMorphMeshChannels > 0)
             return;
         m_made->mNumMorphMeshChannels = 1;
         m_made->mMorphMeshChannels = new aiMeshMorphAnim* [1] { new aiMeshMorphAnim };
     }
 
-    Track readTrack(const Object& channel, unsigned components)
-    {
-        if (!channel.has("sampler"))
-            channel.fail("has no sampler");
-        const Object sampler = m_animation.at("samplers", channel.size("sampler", 0));
-        if (!sampler.has("input") || !sampler.has("output"))
-            sampler.fail("has no input or no output");
-        Track track;
-        track.way = toWay(sampler.text("interpolation"));
-        track.times = m_source.accessors.read(sampler.size("input", 0), sampler, 1).values;
-        track.values = m_source.accessors.read(sampler.size("output", 0), sampler, components);
-        const size_t perTime = track.way == Track::Way::SPLINE ? 3 : 1;
-        if (track.values.count() / perTime < track.times.size())
-            sampler.fail("output", "has fewer elements than its times ask for");
-        for (size_t i = 0; i < track.times.size(); ++i)
-        {
-            if (!std::isfinite(track.times[i]) || (i > 0 && track.times[i] < track.times[i - 1]))
-                sampler.fail("input", "has times that do not ascend");
-        }
-        return track;
-    }
-
     Source& m_source;
-    const Object& m_animation;
+    size_t m_number;
+    Object m_animation;
     const std::vector<std::string>& m_nodeNames;
+    const std::map<size_t, MovingShapes>& m_shapes; ///< by number of node
     std::unique_ptr<aiAnimation> m_made;
     std::map<size_t, Movement> m_movements; ///< by number of node
 };
 
 } // namespace
 
-std::unique_ptr<aiAnimation> readAnimation(Source& source, const Object& animation,
-                                           const std::vector<std::string>& nodeNames)
+std::unique_ptr<aiAnimation> readAnimation(Source& source, size_t number,
+                                           const std::vector<std::string>& nodeNames,
+                                           const std::map<size_t, MovingShapes>& shapes)
 {
-    return AnimationReader(source, animation, nodeNames).read();
+    return AnimationReader(source, number, nodeNames, shapes).read();
 }
 
 } // namespace convert::gltf

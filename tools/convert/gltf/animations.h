@@ -1,6 +1,6 @@
 #pragma once
 
-#include "source.h"
+#include "shapes.h"
 
 #include <memory>
 
@@ -13,8 +13,11 @@ namespace convert::gltf
 ///
 /// Values that step get a key for their old value and one for the new at the same time; cubic splines a key wherever
 /// the conversion takes a sample.
+/// @param number     of the animation in the file.
 /// @param nodeNames  by number of node; empty for nodes that the scene has not.
-std::unique_ptr<aiAnimation> readAnimation(Source& source, const Object& animation,
-                                           const std::vector<std::string>& nodeNames);
+/// @param shapes     by number of node, their nodes made. Weights of other nodes are noted as a channel without keys.
+std::unique_ptr<aiAnimation> readAnimation(Source& source, size_t number,
+                                           const std::vector<std::string>& nodeNames,
+                                           const std::map<size_t, MovingShapes>& shapes);
 
 } // namespace convert::gltf

@@ -309,7 +309,7 @@ private:
     /// Nothing but how many there are, for figures and for what is reported as lost.
     void noteTargets()
     {
-        const size_t count = m_primitive.length("targets");
+        const size_t count = m_use.isMoving ? 0 : m_primitive.length("targets");
         if (count == 0)
             return;
         m_mesh->mNumAnimMeshes = unsigned(count);

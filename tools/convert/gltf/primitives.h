@@ -19,6 +19,7 @@ struct PrimitiveUse
     std::vector<float> weights; ///< of the morph targets; those that are missing are 0
     UvPlacing placing;          ///< of the material's pictures
     const Skin* skin = nullptr; ///< null: none
+    bool isMoving = false;      ///< other shapes are other meshes, so that none are lost
 };
 
 /// Reads one primitive of a mesh: only vertices that it uses, in the shape that the weights of its morph targets give.

@@ -4,6 +4,7 @@
 #include "extensions.h"
 #include "materials.h"
 #include "primitives.h"
+#include "shapes.h"
 #include "skins.h"
 #include "views.h"
 
@@ -29,11 +30,10 @@ struct MeshUse
     size_t mesh = 0;
     std::optional<size_t> skin;
     std::vector<float> weights;
+    bool isMoving = false; ///< see PrimitiveUse
 
-    bool operator<(const MeshUse& other) const
-    {
-        return std::tie(mesh, skin, weights) < std::tie(other.mesh, other.skin, other.weights);
-    }
+    auto tie() const { return std::tie(mesh, skin, weights, isMoving); }
+    bool operator<(const MeshUse& other) const { return tie() < other.tie(); }
 };
 
 /// Hands over what is in a vector to an array of libassimp's.
@@ -84,6 +84,7 @@ public:
         for (const size_t root : roots)
             nameNodes(root, 0);
         readMaterials();
+        m_shapes = findMovingShapes(m_source, m_names);
         makeRoot(roots);
         readAnimations();
         hand(m_textures.take(), m_scene->mTextures, m_scene->mNumTextures);
@@ -181,7 +182,7 @@ private:
         addViews(node, m_names[index]);
         std::vector<std::unique_ptr<aiNode>> children;
         if (node.has("mesh") && isVisible)
-            addMesh(node, *made, children);
+            addMesh(index, *made, children);
         for (const size_t child : node.indices("children"))
             children.push_back(readNode(child, isVisible));
         adopt(*made, std::move(children));
@@ -200,12 +201,16 @@ private:
         m_lights.push_back(readLight(lights.at("lights", user.size("light", 0)), name));
     }
 
-    void addMesh(const Object& node, aiNode& made, std::vector<std::unique_ptr<aiNode>>& children)
+    void addMesh(size_t index, aiNode& made, std::vector<std::unique_ptr<aiNode>>& children)
     {
-        MeshUse use{node.size("mesh", 0), node.index("skin"), node.numbers("weights")};
+        const Object node = m_root.at("nodes", index);
+        MeshUse use{node.size("mesh", 0), node.index("skin"), node.numbers("weights"), false};
         const Object mesh = m_source.document.get("meshes", use.mesh, node);
         if (!node.has("weights"))
             use.weights = mesh.numbers("weights");
+        const auto moving = m_shapes.find(index);
+        if (moving != m_shapes.end())
+            return addShapes(node, mesh, moving->second, made, children);
         const std::vector<unsigned>& meshes = getMeshes(mesh, use, node);
         const Object instancing = node.extension("EXT_mesh_gpu_instancing");
         if (!instancing)
@@ -216,6 +221,19 @@ private:
                 m_nodeNames.make(made.mName.C_Str() + std::string(" instance"), "")));
             children.back()->mTransformation = transform;
             setMeshes(*children.back(), meshes);
+        }
+    }
+
+    void addShapes(const Object& node, const Object& mesh, MovingShapes& shapes, const aiNode& made,
+                   std::vector<std::unique_ptr<aiNode>>& children)
+    {
+        for (const std::vector<float>& weights : shapes.weights)
+        {
+            shapes.nodes.push_back(m_nodeNames.make(made.mName.C_Str() + std::string(" shape"), ""));
+            aiNode& child = *children.emplace_back(std::make_unique<aiNode>(shapes.nodes.back()));
+            if (children.size() > 1)
+                aiMatrix4x4::Scaling(aiVector3D(), child.mTransformation);
+            setMeshes(child, getMeshes(mesh, {node.size("mesh", 0), std::nullopt, weights, true}, node));
         }
     }
 
@@ -275,7 +293,8 @@ private:
             const size_t material = getMaterial(primitive);
             const std::string name = getName(mesh) + (count > 1 ? "-" + std::to_string(i) : "");
             std::unique_ptr<aiMesh> read = readPrimitive(
-                m_source, primitive, {name, use.weights, m_placings[material], use.skin ? &skin : nullptr});
+                m_source, primitive,
+                {name, use.weights, m_placings[material], use.skin ? &skin : nullptr, use.isMoving});
             if (!read)
                 continue;
             read->mMaterialIndex = unsigned(material);
@@ -304,7 +323,7 @@ private:
     {
         std::vector<std::unique_ptr<aiAnimation>> animations;
         for (size_t i = 0; m_source.options.animation && i < m_root.length("animations"); ++i)
-            animations.push_back(readAnimation(m_source, m_root.at("animations", i), m_names));
+            animations.push_back(readAnimation(m_source, i, m_names, m_shapes));
         hand(std::move(animations), m_scene->mAnimations, m_scene->mNumAnimations);
     }
 
@@ -319,6 +338,7 @@ private:
     std::vector<UvPlacing> m_placings; ///< by material
     std::vector<std::unique_ptr<aiMesh>> m_meshes;
     std::map<MeshUse, std::vector<unsigned>> m_uses;
+    std::map<size_t, MovingShapes> m_shapes; ///< by number of node
     std::vector<std::unique_ptr<aiLight>> m_lights;
     std::vector<std::unique_ptr<aiCamera>> m_cameras;
 };

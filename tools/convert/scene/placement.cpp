@@ -26,6 +26,10 @@ aiVector3D across(const aiVector3D& v)
 /// Makes columns of length 1 at right angles, right-handed, of whatever they are.
 void orthonormalise(aiVector3D columns[3])
 {
+    const bool isNothing = std::all_of(
+        columns, columns + 3, [](const aiVector3D& column) { return column.SquareLength() == 0.0f; });
+    for (unsigned i = 0; isNothing && i < 3; ++i)
+        columns[i][i] = 1.0f; // what has no size is not turned, either: it may grow
     columns[0] = columns[0].SquareLength() > 0.0f ? columns[0].Normalize() : across(columns[1] ^ columns[2]);
     columns[1] -= columns[0] * (columns[0] * columns[1]);
     if (columns[1].Length() < 1e-6f)
