@@ -271,7 +271,9 @@ private:
     /// @param most  of the light: what a smooth one loses.
     void dimMetal(float metalness, float roughness, float most)
     {
-        const float share = 1.0f - most * getSmoothness(roughness) * std::clamp(metalness, 0.0f, 1.0f);
+        constexpr float LEAST = 0.15f; // what a rough one loses beside three.js
+        const float lost = std::lerp(LEAST, most, getSmoothness(roughness));
+        const float share = 1.0f - lost * std::clamp(metalness, 0.0f, 1.0f);
         const float shown = toScreen(Vector4f(share, share, share, 1.0f)).x;
         for (Vector4f* colour : {&m_made.diffuse.colour, &m_made.ambient.colour})
             *colour = Vector4f(colour->x * shown, colour->y * shown, colour->z * shown, 1.0f);
