@@ -226,14 +226,33 @@ std::vector<AnimationKey<Vector4f>> makeKeys(int channel)
     return keys;
 }
 
-Frame makeAnimationEngine()
+SharedPtr<AnimationController> makeAnimation()
 {
     const auto group = makeShared<AnimationGroup>();
     for (int i = 0; i < CHANNELS; ++i)
         group->addAnimation(
             createAnimationChannel<Vector4f>(makeShared<AnimationKeySequence<Vector4f>>(makeKeys(i)),
                                              makeShared<SceneNodeRotationAnimator>(makeShared<SceneNode>())));
-    const auto controller = makeShared<AnimationController>(group);
+    return makeShared<AnimationController>(group);
+}
+
+Frame makeAnimationEngine()
+{
+    return [controller = makeAnimation()](int) { controller->update(0.0335f); };
+}
+
+Frame makeInterpolatedEngine()
+{
+    const auto controller = makeAnimation();
+    controller->setInterpolated(true);
+    return [controller](int) { controller->update(0.0335f); };
+}
+
+Frame makeFadeEngine()
+{
+    const auto controller = makeAnimation();
+    controller->setInterpolated(true);
+    controller->fadeTo(1.0f, 3.0f, 100.0f);
     return [controller](int) { controller->update(0.0335f); };
 }
 
@@ -259,6 +278,51 @@ Frame makeAnimationHand()
             const Vector4f& value = later == channel.keys.begin() ? later->value : (later - 1)->value;
             channel.isChanged = !(value == channel.rotation);
             channel.rotation = value;
+        }
+    };
+}
+
+/// Interpolates, and mixes two moments into one rotation where there are two.
+Frame makeMixHand(int moments)
+{
+    struct Channel
+    {
+        std::vector<AnimationKey<Vector4f>> keys;
+        Quaternionf rotation;
+        bool isChanged = false;
+    };
+    const auto turnTo = [](const Vector4f& v)
+    { return quaternionFromAxisAngle(v.xyz(), Anglef::fromRadians(v.w)); };
+    const auto mix = [](const Quaternionf& p, const Quaternionf& q, float share)
+    {
+        const float cosine = p.a * q.a + p.x * q.x + p.y * q.y + p.z * q.z;
+        const float angle = std::acos(std::min(std::fabs(cosine), 1.0f));
+        const float sine = std::sin(angle);
+        const float a = sine > 0.001f ? std::sin((1.0f - share) * angle) / sine : 1.0f - share;
+        const float b = std::copysign(sine > 0.001f ? std::sin(share * angle) / sine : share, cosine);
+        return Quaternionf(p.a * a + q.a * b, p.x * a + q.x * b, p.y * a + q.y * b, p.z * a + q.z * b);
+    };
+    const auto channels = std::make_shared<std::vector<Channel>>();
+    for (int i = 0; i < CHANNELS; ++i)
+        channels->push_back({makeKeys(i), Quaternionf(), false});
+    return [=](int frame)
+    {
+        for (Channel& channel : *channels)
+        {
+            Quaternionf rotation;
+            for (int moment = 0; moment < moments; ++moment)
+            {
+                const float time = 0.0335f * float(frame) + float(moment); // well inside the keys
+                const auto later =
+                    std::upper_bound(channel.keys.begin(), channel.keys.end(), time,
+                                     [](float t, const AnimationKey<Vector4f>& key) { return t < key.time; });
+                const AnimationKey<Vector4f>& earlier = *(later - 1);
+                const float share = (time - earlier.time) / (later->time - earlier.time);
+                const Quaternionf now = mix(turnTo(earlier.value), turnTo(later->value), share);
+                rotation = moment == 0 ? now : mix(rotation, now, 0.3f);
+            }
+            channel.isChanged = !(rotation == channel.rotation);
+            channel.rotation = rotation;
         }
     };
 }
@@ -533,6 +597,8 @@ struct Case
 constexpr Case CASES[] = {
     {"skins", JOINTS, "joint", makeSkinEngine, makeSkinHand},
     {"animation", CHANNELS, "channel", makeAnimationEngine, makeAnimationHand},
+    {"interpolated", CHANNELS, "channel", makeInterpolatedEngine, [] { return makeMixHand(1); }},
+    {"cross-fade", CHANNELS, "channel", makeFadeEngine, [] { return makeMixHand(2); }},
     {"text-that-changes", GLYPHS, "glyph", [] { return makeTextEngine(true); },
      [] { return makeTextHand(true); }},
     {"text-that-stays", 1, "text", [] { return makeTextEngine(false); }, [] { return makeTextHand(false); }},

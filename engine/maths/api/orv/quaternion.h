@@ -52,6 +52,13 @@ inline Quaternionf quaternionFromAxisAngle(const Vector3f& axis, Anglef angle)
     return Quaternionf(std::cos(angle.radians() * 0.5f), axis.x * sine, axis.y * sine, axis.z * sine);
 }
 
+/// The rotation that lies share of the way from one to another: the short way round, at constant speed.
+///
+/// Quaternions of unit length give one of unit length; others keep their lengths in proportion. Of two ways of the same
+/// length (half a turn) it takes one. What is not finite is not gone to: then the result is from.
+/// @param share  0 is from, 1 is to, each exactly (to perhaps with all signs changed, which is the same rotation).
+ORV_API Quaternionf slerp(const Quaternionf& from, const Quaternionf& to, float share);
+
 /// The four components, then axis and angle on lines of their own. The axis of no rotation prints as Y_AXIS.
 ORV_API std::string toString(const Quaternionf& q);
 

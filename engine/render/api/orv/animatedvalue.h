@@ -17,6 +17,14 @@ public:
     virtual T getValue(float time) const = 0;
     virtual float getStart() const = 0;
     virtual float getEnd() const = 0;
+
+    /// The two values between which a time lies, for interpolation. A value that has no keys to lie between is both.
+    /// @return how far it lies between them, 0 up to, without, 1.
+    virtual float getSpan(float time, T& from, T& to) const
+    {
+        from = to = getValue(time);
+        return 0.0f;
+    }
 };
 
 } // namespace orv

@@ -1,5 +1,6 @@
 #pragma once
 
+#include "orv/animationmix.h"
 #include "orv/shared.h"
 #include "orv/sharedptr.h"
 
@@ -20,6 +21,14 @@ public:
     /// Whether applying this applies other: true for itself, for a group also for its members' members. A class that
     /// holds further animations asks them.
     virtual bool contains(const Animation& other) const { return this == &other; }
+
+    /// apply() as a controller wants it that was asked for smooth motion. An animation that does not know of it (this one)
+    /// is applied with a weight of a half or more, and not at all on a subtree.
+    virtual void applyMixed(float progress, const AnimationMix& mix)
+    {
+        if (mix.isMostly())
+            apply(progress);
+    }
 };
 
 /// End minus start, never below 0.

@@ -25,6 +25,7 @@ public:
     float getStart() const override; ///< the earliest of the members', 0 without members
     float getEnd() const override;   ///< the latest of the members', 0 without members
     bool contains(const Animation& other) const override;
+    void applyMixed(float progress, const AnimationMix& mix) override;
 
 private:
     std::vector<Animation::Ptr> m_animations;

@@ -1,6 +1,7 @@
 #pragma once
 
 #include "orv/animatedvalue.h"
+#include "orv/animationmix.h"
 #include "orv/colour.h"
 #include "orv/log.h"
 #include "orv/vector.h"
@@ -23,7 +24,8 @@ struct AnimationKey
 };
 
 /// Keyed values, stepped: each key's value holds until the next key's time, the first also before its own
-/// time, the last ever after. Without keys the value is 0 in all components.
+/// time, the last ever after. Without keys the value is 0 in all components. Of keys at one time the last holds; where
+/// values are interpolated, the first one of them is what they go to, so two such keys are a jump.
 template <class T>
 class AnimationKeySequence : public AnimatedValue<T>
 {
@@ -60,9 +62,22 @@ public:
     {
         if (m_keys.empty())
             return T();
-        const auto later = std::upper_bound(m_keys.begin(), m_keys.end(), time,
-                                            [](float t, const AnimationKey<T>& key) { return t < key.time; });
+        const auto later = findLater(time);
         return later == m_keys.begin() ? later->value : std::prev(later)->value;
+    }
+
+    float getSpan(float time, T& from, T& to) const override
+    {
+        const auto later = findLater(time);
+        if (later == m_keys.begin() || later == m_keys.end())
+        {
+            from = to = getValue(time);
+            return 0.0f;
+        }
+        const AnimationKey<T>& earlier = *std::prev(later);
+        from = earlier.value;
+        to = later->value;
+        return AnimationMix::getShare(earlier.time, later->time, time);
     }
 
     /// The first key's time, 0 without keys.
@@ -72,6 +87,13 @@ public:
     float getEnd() const override { return m_keys.empty() ? 0.0f : m_keys.back().time; }
 
 private:
+    /// The first key after a time.
+    typename std::vector<AnimationKey<T>>::const_iterator findLater(float time) const
+    {
+        return std::upper_bound(m_keys.begin(), m_keys.end(), time,
+                                [](float t, const AnimationKey<T>& key) { return t < key.time; });
+    }
+
     std::vector<AnimationKey<T>> m_keys;
 };
 

@@ -9,6 +9,7 @@
 #include "orv/animationcontroller.h"
 #include "orv/animationgroup.h"
 #include "orv/animationkeysequence.h"
+#include "orv/animationmix.h"
 #include "orv/animator.h"
 #include "orv/appearance.h"
 #include "orv/assetcache.h"

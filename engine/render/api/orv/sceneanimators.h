@@ -15,7 +15,7 @@ class Light;
 class SceneNode;
 
 /// The animators of scene objects. Each shares its target; one without a target logs an error each time it is
-/// applied and does nothing.
+/// applied and does nothing. All of them mix: see AnimationMix.
 
 class ORV_API SceneNodePositionAnimator : public Animator<Vector3f>
 {
@@ -26,6 +26,7 @@ public:
     explicit SceneNodePositionAnimator(const SharedPtr<SceneNode>& node);
     ~SceneNodePositionAnimator() override;
     void apply(const Vector3f& position) override;
+    void applyMixed(const Vector3f& from, const Vector3f& to, float share, const AnimationMix& mix) override;
 
 private:
     SharedPtr<SceneNode> m_node;
@@ -41,6 +42,7 @@ public:
     ~SceneNodeRotationAnimator() override;
     /// @param axisAngle  axis x, y, z, taken as it is (not normalised), and angle in radians.
     void apply(const Vector4f& axisAngle) override;
+    void applyMixed(const Vector4f& from, const Vector4f& to, float share, const AnimationMix& mix) override;
 
 private:
     SharedPtr<SceneNode> m_node;
@@ -56,6 +58,7 @@ public:
     explicit SceneNodeScaleAnimator(const SharedPtr<SceneNode>& node);
     ~SceneNodeScaleAnimator() override;
     void apply(const Vector3f& scale) override;
+    void applyMixed(const Vector3f& from, const Vector3f& to, float share, const AnimationMix& mix) override;
 
 private:
     SharedPtr<SceneNode> m_node;
@@ -71,6 +74,7 @@ public:
     explicit LightColourAnimator(const SharedPtr<Light>& light);
     ~LightColourAnimator() override;
     void apply(const Colour4f& colour) override;
+    void applyMixed(const Colour4f& from, const Colour4f& to, float share, const AnimationMix& mix) override;
 
 private:
     SharedPtr<Light> m_light;
@@ -85,6 +89,7 @@ public:
     explicit LightIntensityAnimator(const SharedPtr<Light>& light);
     ~LightIntensityAnimator() override;
     void apply(const float& intensity) override;
+    void applyMixed(const float& from, const float& to, float share, const AnimationMix& mix) override;
 
 private:
     SharedPtr<Light> m_light;
@@ -111,6 +116,19 @@ public:
     {
         if (Appearance* appearance = m_appearance.operator->()) // which logs when there is none
             m_property.set(*appearance, value);
+    }
+
+    /// An appearance is in no subtree.
+    void applyMixed(const T& from, const T& to, float share, const AnimationMix& mix) override
+    {
+        Appearance* appearance = m_appearance.operator->();
+        if (!appearance || !mix.reaches(nullptr))
+            return;
+        T value = AnimationMix::between(from, to, share);
+        T current;
+        if (const void* place = m_property.get(*appearance, current))
+            value = mix.resolve(place, current, value);
+        m_property.set(*appearance, value);
     }
 
 private:

@@ -1,7 +1,8 @@
 #include "orv/animation.h"
 
-#include "orv/animationcontroller.h"
 #include "orv/log.h"
+
+#include "smoothmotion.h"
 
 #include <algorithm>
 #include <cmath>
@@ -56,16 +57,25 @@ AnimationController::AnimationController(const Animation::Ptr& animation)
 {
 }
 
+AnimationController::~AnimationController() = default;
+
 void AnimationController::update(float deltaTime)
 {
     if (!m_enabled)
         return;
+    move(deltaTime);
+    if (m_smooth)
+        applySmoothly(deltaTime);
+    else if (m_animation)
+        m_animation->apply(m_progress);
+}
+
+void AnimationController::move(float deltaTime)
+{
     m_progress = clampToRange(m_progress);
     const float step = deltaTime * m_speed;
     if (!m_paused && !std::isnan(step))
         m_progress = clampToRange(advance(step));
-    if (m_animation)
-        m_animation->apply(m_progress);
 }
 
 float AnimationController::clampToRange(float progress) const
@@ -126,6 +136,7 @@ void pause(AnimationController& controller, bool update)
 
 void stop(AnimationController& controller, bool update)
 {
+    controller.endFades();
     controller.setEnabled(true);
     rewind(controller, update);
     controller.setEnabled(false);

@@ -48,6 +48,12 @@ void AnimationGroup::apply(float progress)
         animation->apply(progress);
 }
 
+void AnimationGroup::applyMixed(float progress, const AnimationMix& mix)
+{
+    for (const Animation::Ptr& animation : m_animations)
+        animation->applyMixed(progress, mix);
+}
+
 float AnimationGroup::getStart() const
 {
     if (m_animations.empty())

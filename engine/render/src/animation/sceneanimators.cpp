@@ -10,6 +10,21 @@
 namespace orv
 {
 
+namespace
+{
+
+Vector4f toVector4(const Vector3f& v)
+{
+    return Vector4f(v.x, v.y, v.z, 0.0f);
+}
+
+Quaternionf toQuaternion(const Vector4f& axisAngle)
+{
+    return quaternionFromAxisAngle(axisAngle.xyz(), Anglef::fromRadians(axisAngle.w));
+}
+
+} // namespace
+
 SceneNodePositionAnimator::SceneNodePositionAnimator(const SharedPtr<SceneNode>& node) : m_node(node) {}
 
 SceneNodePositionAnimator::~SceneNodePositionAnimator() = default;
@@ -20,6 +35,17 @@ void SceneNodePositionAnimator::apply(const Vector3f& position)
         node->setPosition(position);
 }
 
+void SceneNodePositionAnimator::applyMixed(const Vector3f& from, const Vector3f& to, float share,
+                                           const AnimationMix& mix)
+{
+    SceneNode* node = m_node.getLogged();
+    if (!node || !mix.reaches(node))
+        return;
+    const Vector3f value = AnimationMix::between(from, to, share);
+    const Vector3f& current = node->getPosition();
+    node->setPosition(mix.resolve(&current, toVector4(current), toVector4(value)).xyz());
+}
+
 SceneNodeRotationAnimator::SceneNodeRotationAnimator(const SharedPtr<SceneNode>& node) : m_node(node) {}
 
 SceneNodeRotationAnimator::~SceneNodeRotationAnimator() = default;
@@ -27,7 +53,20 @@ SceneNodeRotationAnimator::~SceneNodeRotationAnimator() = default;
 void SceneNodeRotationAnimator::apply(const Vector4f& axisAngle)
 {
     if (SceneNode* node = m_node.getLogged())
-        node->setRotation(quaternionFromAxisAngle(axisAngle.xyz(), Anglef::fromRadians(axisAngle.w)));
+        node->setRotation(toQuaternion(axisAngle));
+}
+
+void SceneNodeRotationAnimator::applyMixed(const Vector4f& from, const Vector4f& to, float share,
+                                           const AnimationMix& mix)
+{
+    SceneNode* node = m_node.getLogged();
+    if (!node || !mix.reaches(node))
+        return;
+    Quaternionf value = toQuaternion(from);
+    if (share > 0.0f && !(from == to))
+        value = AnimationMix::between(value, toQuaternion(to), share);
+    const Quaternionf& current = node->getRotation();
+    node->setRotation(mix.resolve(&current, current, value));
 }
 
 SceneNodeScaleAnimator::SceneNodeScaleAnimator(const SharedPtr<SceneNode>& node)
@@ -49,6 +88,18 @@ void SceneNodeScaleAnimator::apply(const Vector3f& scale)
     m_lastScale = scale;
 }
 
+void SceneNodeScaleAnimator::applyMixed(const Vector3f& from, const Vector3f& to, float share,
+                                        const AnimationMix& mix)
+{
+    SceneNode* node = m_node.getLogged();
+    if (!node || !mix.reaches(node))
+        return;
+    const Vector3f value = AnimationMix::between(from, to, share);
+    const Vector3f& current = node->getScale();
+    m_lastScale = mix.resolve(&current, toVector4(current), toVector4(value)).xyz();
+    node->setScale(m_lastScale);
+}
+
 LightColourAnimator::LightColourAnimator(const SharedPtr<Light>& light) : m_light(light) {}
 
 LightColourAnimator::~LightColourAnimator() = default;
@@ -59,6 +110,19 @@ void LightColourAnimator::apply(const Colour4f& colour)
         light->setColour(colour);
 }
 
+void LightColourAnimator::applyMixed(const Colour4f& from, const Colour4f& to, float share,
+                                     const AnimationMix& mix)
+{
+    Light* light = m_light.getLogged();
+    if (!light || !mix.reaches(light))
+        return;
+    const Colour4f value = AnimationMix::between(from, to, share);
+    const Colour4f& current = light->getColour();
+    const Vector4f mixed = mix.resolve(&current, Vector4f(current.r, current.g, current.b, current.a),
+                                       Vector4f(value.r, value.g, value.b, value.a));
+    light->setColour(Colour4f(mixed.x, mixed.y, mixed.z, mixed.w));
+}
+
 LightIntensityAnimator::LightIntensityAnimator(const SharedPtr<Light>& light) : m_light(light) {}
 
 LightIntensityAnimator::~LightIntensityAnimator() = default;
@@ -67,6 +131,15 @@ void LightIntensityAnimator::apply(const float& intensity)
 {
     if (Light* light = m_light.getLogged())
         light->setIntensity(intensity);
+}
+
+void LightIntensityAnimator::applyMixed(const float& from, const float& to, float share,
+                                        const AnimationMix& mix)
+{
+    Light* light = m_light.getLogged();
+    if (light && mix.reaches(light))
+        light->setIntensity(
+            mix.resolve(light, light->getIntensity(), AnimationMix::between(from, to, share)));
 }
 
 } // namespace orv
