@@ -497,6 +497,46 @@ TEST_F(GloSceneTest, animationsApply)
     EXPECT_EQ(Vector4f(0.5f, 0.6f, 0.7f, 1.0f), colour);
 }
 
+// Faults caught: files of today, whatever number they have there, played otherwise than they were; a kind of channel that
+// steps although its file asks for what lies between; keys of a light's that only the first one gets.
+TEST_F(GloSceneTest, channelsInterpolateIfTheFileAsks)
+{
+    for (const uint32_t method : {0u, 1u, 2u, 0xffffffffu, glo::interpolation::LINEAR})
+    {
+        glo::GloScene scene = makeFullScene();
+        scene.scene->top.children.push_back(makeLightNode("second lamp"));
+        glo::AnimationData& walk = scene.animations[0];
+        walk.animations.clear();
+        walk.channels = {makeChannel("node", "hip", "translation", {0, 0, 0}, 0.0f),
+                         makeChannel("node", "knee", "rotation", {0, 0, 1, 0}, 0.0f),
+                         makeChannel("light", "lamp", "multiplier", {0}, 0.0f),
+                         makeChannel("light", "lamp", "colour", {0, 0, 0, 0}, 0.0f),
+                         makeChannel("material", "red", "opacity", {0}, 0.0f),
+                         makeChannel("material", "red", "emission", {0, 0, 0, 0}, 0.0f)};
+        for (glo::Channel& channel : walk.channels)
+        {
+            channel.interpolation = method;
+            glo::addKey(channel, 4.0f, std::vector<float>(channel.coefficientCount, 1.0f));
+        }
+        const Glo::Ptr loaded = load(scene);
+        ASSERT_TRUE(loaded);
+        loaded->getAnimationGroup()->apply(1.0f);
+        const float wanted = method == glo::interpolation::LINEAR ? 0.25f : 0.0f;
+        const SceneNode& top = *loaded->getTopNode();
+        EXPECT_EQ(wanted, top.find("hip")->getPosition().y) << method;
+        EXPECT_EQ(wanted > 0.0f, top.find("knee")->getRotation().z > 0.01f) << method;
+        EXPECT_EQ(wanted, getFloat(*loaded->getAppearance("red"), "M_OPACITY")) << method;
+        Vector4f colour;
+        loaded->getAppearance("red")->getPropertyUniform("M_EMISSIVE_COLOUR")->getValue(colour, 0);
+        EXPECT_EQ(wanted, colour.z) << method;
+        for (int i = 0; i < 2; ++i)
+        {
+            EXPECT_EQ(wanted, loaded->getLight(i)->getIntensity()) << method;
+            EXPECT_EQ(wanted, loaded->getLight(i)->getColour().g) << method;
+        }
+    }
+}
+
 // Fault caught: joints bound to a node of the same name elsewhere; a material that skins what has no joints, or
 // the other way round.
 TEST_F(GloSceneTest, skins)

@@ -4,6 +4,7 @@
 #include "convert/files/filegate.h"
 #include "convert/files/modelfiles.h"
 #include "convert/model.h"
+#include "convert/scene/keychoice.h"
 #include "convert/scene/placement.h"
 
 #include "orv/animationgroup.h"
@@ -21,6 +22,7 @@
 #include <fstream>
 #include <iterator>
 #include <map>
+#include <random>
 #include <tuple>
 
 using namespace orv;
@@ -339,6 +341,100 @@ TEST_F(ConvertMotionTest, posesAreThoseOfTheSource)
         }
     }
     RecordProperty("largestDeviationInMillionths", int(m_largest * 1e6f));
+}
+
+// Faults caught: keys left out where the movement bends; a file whose keys are stepped all the same; clips, rest poses and
+// jumps that run into each other.
+TEST_F(ConvertMotionTest, sparseKeysStayNearTheSource)
+{
+    const struct
+    {
+        const char* file;
+        float metres;
+    } cases[] = {
+        {"glTF2/simple_skin/simple_skin.gltf", 1.0f},
+        {"FBX/huesitos.fbx", 0.01f},
+        {"X/Testwuson.X", 1.0f},
+        {"X/BCN_Epileptic.X", 1.0f},
+        {"BVH/Boxing_Toes.bvh", 1.0f},
+        {"Collada/box_nested_animation.dae", 1.0f},
+        {"ASE/MotionCaptureROM.ase", 1.0f},
+    };
+    convert::Options options;
+    options.sparseKeys = true;
+    options.fps = 1000.0; // all keys of the models count
+    for (const auto& item : cases)
+    {
+        SCOPED_TRACE(item.file);
+        Reference reference(std::string(MODELS) + item.file);
+        ASSERT_TRUE(reference.isThere());
+        ASSERT_TRUE(convertAndLoad(std::string(MODELS) + item.file, options));
+        const float size = getSize(reference.pose(-1, 0.0, item.metres));
+        for (unsigned clip = 0; clip < m_model.clips.size(); ++clip)
+        {
+            const double seconds = reference.getSeconds(clip);
+            for (const double share : {0.0, 0.123, 0.4567, 0.5, 0.789, 0.9999, 1.0})
+            {
+                const float time = m_model.clips[clip].start + float(seconds * share);
+                const Posed wanted =
+                    reference.pose(int(clip), double(time - m_model.clips[clip].start), item.metres);
+                // An error of a thousandth in each joint of a chain adds up on its way to a fingertip.
+                const float deviation = getDeviation(pose(time), wanted);
+                EXPECT_LT(deviation, 0.003f * size) << clip << " at " << share;
+                m_largest = std::max(m_largest, deviation / size);
+            }
+        }
+    }
+    RecordProperty("largestDeviationInMillionths", int(m_largest * 1e6f));
+}
+
+// Fault caught: keys beyond the error, more of them than a movement needs, or a jump made a slope.
+TEST(ChooseKeys, keepsWhatTheErrorAsksFor)
+{
+    std::mt19937 random(11);
+    std::uniform_real_distribution<float> any(-1.0f, 1.0f);
+    for (int run = 0; run < 300; ++run)
+    {
+        std::vector<convert::Sample> samples;
+        float slope = 0.0f, value = 0.0f;
+        for (int i = 0; i < 100; ++i)
+        {
+            slope = any(random) > 0.8f ? any(random) : slope;
+            value += slope + (any(random) > 0.95f ? 5.0f : 0.0f) + any(random) * 0.01f;
+            const bool isJump = i > 0 && any(random) > 0.9f;
+            samples.push_back(
+                {isJump ? samples.back().seconds : double(i), Vector4f(value, -value, 0.0f, 0.0f)});
+        }
+        const double error = 0.05;
+        const std::vector<size_t> keys = convert::chooseKeys(samples, false, error);
+        ASSERT_EQ(0u, keys.front());
+        ASSERT_EQ(samples.size() - 1, keys.back());
+        for (size_t k = 1; k < keys.size(); ++k)
+        {
+            const convert::Sample& from = samples[keys[k - 1]];
+            const convert::Sample& to = samples[keys[k]];
+            for (size_t i = keys[k - 1] + 1; i < keys[k]; ++i)
+            {
+                const double share = (samples[i].seconds - from.seconds) / (to.seconds - from.seconds);
+                const double made = double(from.value.x) * (1.0 - share) + double(to.value.x) * share;
+                ASSERT_LE(std::fabs(made - double(samples[i].value.x)) * std::sqrt(2.0), error * 1.001)
+                    << run;
+            }
+        }
+    }
+
+    std::vector<convert::Sample> spin, line, jump;
+    for (int i = 0; i <= 1000; ++i)
+    {
+        spin.push_back({i * 0.01, Vector4f(0.6f, 0.0f, 0.8f, float(i) * 0.003f)});
+        line.push_back({i * 0.01, Vector4f(float(i), 1.0f, -2.0f * float(i), 0.0f)});
+        jump.push_back({i * 0.01, Vector4f(i < 500 ? 0.0f : 9.0f, 0.0f, 0.0f, 0.0f)});
+    }
+    jump.insert(jump.begin() + 500, {5.0, Vector4f()});
+    EXPECT_EQ((std::vector<size_t>{0, 1000}), convert::chooseKeys(spin, true, 0.001)) << "one even turn";
+    EXPECT_EQ((std::vector<size_t>{0, 1000}), convert::chooseKeys(line, false, 0.01));
+    EXPECT_EQ((std::vector<size_t>{0, 500, 501, 1001}), convert::chooseKeys(jump, false, 0.01));
+    EXPECT_EQ((std::vector<size_t>{0}), convert::chooseKeys({line[0]}, false, 0.01));
 }
 
 // Fault caught: of two clips the second one also moves what only the first one does; values that step and are read as

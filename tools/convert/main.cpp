@@ -26,6 +26,7 @@ struct Command
     std::string report;
     bool dryRun = false;
     bool noAnimation = false;
+    std::string keys = "stepped";
     std::vector<std::string> allowed;
     convert::Options options;
     convert::Limits limits;
@@ -37,6 +38,7 @@ const char* const FOOTER =
     "Examples:\n"
     "  orv-convert duck.dae duck.glo                        duck.glo and duck-duckCM.tga\n"
     "  orv-convert walk.fbx scenes/walk.glo --fps 60        smoother animations, larger file\n"
+    "  orv-convert walk.fbx walk.glo --keys sparse          smooth animations, smaller file\n"
     "  orv-convert part.stl part.glo --up z --scale 0.001   from millimetres with z up\n"
     "  orv-convert house.gltf house.glo --max-texture-size 1024 --power-of-two\n"
     "  orv-convert big.ifc big.glo --dry-run                only say what would come of it\n"
@@ -119,6 +121,14 @@ void addOptions(CLI::App& app, Command& command)
     app.add_option("--fps", options.fps, "samples per second of animations")
         ->check(CLI::Range(1.0, 1000.0))
         ->capture_default_str();
+    app.add_option("--keys", command.keys,
+                   "stepped: a key for each change; sparse: keys where movement bends, to be interpolated")
+        ->check(CLI::IsMember({"stepped", "sparse"}))
+        ->capture_default_str();
+    app.add_option("--key-error", options.keyError,
+                   "of sparse keys: a share of the model's size, radians, a share of 1 for scales")
+        ->check(CLI::Range(1e-6, 0.1))
+        ->capture_default_str();
     app.add_flag("--no-animation", command.noAnimation, "leave animations out");
     app.add_option("--up", options.up, "the axis that points up in the model, if its file has it wrong")
         ->check(CLI::IsMember({"x", "y", "z"}));
@@ -168,6 +178,7 @@ int main(int argc, char** argv)
         return app.exit(error) == 0 ? 0 : MISUSED;
     }
     command.options.animation = !command.noAnimation;
+    command.options.sparseKeys = command.keys == "sparse";
     if (std::filesystem::path(command.out).extension() != ".glo")
     {
         fail(command.out + ": the output's name has to end in .glo");

@@ -9,8 +9,10 @@ namespace convert
 /// What the command line may choose.
 struct Options
 {
-    double fps = 30.0;     ///< samples per second of animations, above 0
-    bool animation = true; ///< false: the model stands as its file places it
+    double fps = 30.0;       ///< samples per second of animations, at most so many keys; above 0
+    bool sparseKeys = false; ///< keys only where movement bends, for the engine to interpolate between
+    double keyError = 0.001; ///< of those: of the model's diagonal, radians, of a scale
+    bool animation = true;   ///< false: the model stands as its file places it
     std::string up;     ///< axis that points up in the file: "x", "y", "z", or empty for what the file says
     double scale = 1.0; ///< of the whole model, above 0
     int maxTextureSize = 0;  ///< pixels of a picture's longer side; 0 for no limit

@@ -82,6 +82,7 @@ private:
         for (const Channel& channel : animation.channels)
         {
             m_forecast.keys += channel.keyCount;
+            m_forecast.interpolated += channel.interpolation == interpolation::LINEAR ? channel.keyCount : 0;
             const auto material = m_materials.find(std::string(getTargetName(channel.targetName)));
             if (channel.targetType == "material" && channel.type <= type::FLOAT &&
                 material != m_materials.end())

@@ -25,6 +25,7 @@ struct Forecast
     uint64_t triangles = 0;        ///< drawn when everything is in view
     uint64_t vertices = 0;         ///< kept, not drawn
     uint64_t keys = 0;             ///< of all channels
+    uint64_t interpolated = 0;     ///< keys of channels between whose keys the engine interpolates
     uint64_t vertexBytes = 0;      ///< of GPU buffers
     uint64_t indexBytes = 0;
     uint64_t textureBytes = 0; ///< with mipmaps; compressed pictures as their files hold them

@@ -129,7 +129,8 @@ ordered_json sceneToJson(const Report& report)
           {"cameras", scene.cameras.size()},
           {"animations", scene.animations.size()},
           {"vertices", forecast.vertices},
-          {"keys", forecast.keys}}},
+          {"keys", forecast.keys},
+          {"interpolatedKeys", forecast.interpolated}}},
         {"engine",
          {{"draws", forecast.draws},
           {"triangles", forecast.triangles},
@@ -173,7 +174,9 @@ void printTotals(const Report& report)
         counted(scene.lights.size(), "light", "lights"),
         counted(scene.cameras.size(), "camera", "cameras"),
         counted(scene.animations.size(), "animation", "animations") + " (" +
-            counted(forecast.keys, "key", "keys") + ")",
+            counted(forecast.keys, "key", "keys") +
+            (forecast.interpolated > 0 ? ", " + std::to_string(forecast.interpolated) + " interpolated)"
+                                       : ")"),
     };
     std::string line = "  holds   ";
     for (const std::string& item : holds)

@@ -1,8 +1,10 @@
 #include "animations.h"
 
+#include "keychoice.h"
 #include "placement.h"
 
 #include <assimp/anim.h>
+#include <assimp/mesh.h>
 #include <assimp/scene.h>
 
 #include <algorithm>
@@ -123,6 +125,108 @@ std::vector<double> listJumps(const aiNodeAnim& channel, Property property)
     return findJumps(channel.mScalingKeys, channel.mNumScalingKeys);
 }
 
+/// Which of a model's keys to look at: those in a clip, of many within a sample's time the first, and all of those that have
+/// the same time as the one before.
+struct KeyRange
+{
+    double end; ///< in ticks, as all times of keys
+    double samplesPerTick;
+};
+
+template <class Key, class Convert>
+void appendKeys(const Key* keys, unsigned count, const KeyRange& range, const Convert& toValue,
+                std::vector<Sample>& samples)
+{
+    double last = 0.0; // earlier ones, and those that go back in time, are passed over
+    double lastSample = -1.0;
+    for (unsigned i = 0; i < count; ++i)
+    {
+        const double time = keys[i].mTime;
+        if (!(time >= last && time <= range.end))
+            continue;
+        const double sample = std::floor(time * range.samplesPerTick + 1e-6);
+        const bool isJump =
+            (i > 0 && keys[i - 1].mTime == time) || (i + 1 < count && keys[i + 1].mTime == time);
+        if (sample <= lastSample && !isJump)
+            continue;
+        last = time;
+        lastSample = sample;
+        samples.push_back({time, toValue(keys[i].mValue)});
+    }
+}
+
+void appendKeys(const aiNodeAnim& channel, Property property, const KeyRange& range,
+                std::vector<Sample>& samples)
+{
+    const auto toPlace = [](const aiVector3D& v) { return orv::Vector4f(toVector(v), 0.0f); };
+    switch (property)
+    {
+    case Property::TRANSLATION:
+        return appendKeys(channel.mPositionKeys, channel.mNumPositionKeys, range, toPlace, samples);
+    case Property::ROTATION:
+        return appendKeys(channel.mRotationKeys, channel.mNumRotationKeys, range, toAxisAngle, samples);
+    case Property::SCALE: break;
+    }
+    appendKeys(channel.mScalingKeys, channel.mNumScalingKeys, range, toPlace, samples);
+}
+
+orv::Vector4f toVector4(const Values& values)
+{
+    return orv::Vector4f(values[0], values[1], values[2], values.size() > 3 ? values[3] : 0.0f);
+}
+
+Values toValues(const Sample& sample, Property property)
+{
+    if (property == Property::ROTATION)
+        return toValues(sample.value);
+    return toValues(sample.value.xyz());
+}
+
+/// Lengths of a model as it stands.
+struct Extent
+{
+    aiVector3D low = aiVector3D(HUGE_VALF);
+    aiVector3D high = aiVector3D(-HUGE_VALF);
+
+    void add(const aiVector3D& place)
+    {
+        for (unsigned i = 0; i < 3; ++i)
+        {
+            low[i] = std::min(low[i], place[i]);
+            high[i] = std::max(high[i], place[i]);
+        }
+    }
+    /// Of the diagonal; 0 without a place.
+    float getLength() const { return low.x <= high.x ? (high - low).Length() : 0.0f; }
+};
+
+void measure(const aiScene& scene, const aiNode& node, const aiMatrix4x4& above, Extent& nodes,
+             Extent& vertices)
+{
+    const aiMatrix4x4 world = above * node.mTransformation;
+    nodes.add(world * aiVector3D());
+    for (unsigned i = 0; i < node.mNumMeshes; ++i)
+    {
+        const aiMesh& mesh = *scene.mMeshes[node.mMeshes[i]];
+        for (unsigned v = 0; v < mesh.mNumVertices; ++v)
+            vertices.add(world * mesh.mVertices[v]);
+    }
+    for (unsigned i = 0; i < node.mNumChildren; ++i)
+        measure(scene, *node.mChildren[i], world, nodes, vertices);
+}
+
+/// The factor by which a node's children are larger in the world than by themselves, where they are largest.
+float findScale(const aiNode* node)
+{
+    aiMatrix4x4 world;
+    for (; node; node = node->mParent)
+        world = node->mTransformation * world;
+    float largest = 0.0f;
+    for (unsigned i = 0; i < 3; ++i)
+        largest = std::max(largest, aiVector3D(world[0][i], world[1][i], world[2][i]).Length());
+    return largest > 0.0f && std::isfinite(largest) ? largest : 1.0f;
+}
+
 bool isSame(const Values& a, const Values& b)
 {
     return std::equal(a.begin(), a.end(), b.begin(),
@@ -158,8 +262,17 @@ public:
         , m_nodeNames(nodeNames)
         , m_clipNode(clipNode)
         , m_fps(options.fps)
+        , m_isSparse(options.sparseKeys)
+        , m_keyError(options.keyError)
         , m_report(report)
     {
+        if (!m_isSparse)
+            return;
+        Extent nodes;
+        Extent vertices;
+        measure(scene, *scene.mRootNode, aiMatrix4x4(), nodes, vertices);
+        const float length = vertices.getLength() > 0.0f ? vertices.getLength() : nodes.getLength();
+        m_length = length > 0.0f && std::isfinite(length) ? double(length) : 1.0;
     }
 
     Motion make()
@@ -246,11 +359,23 @@ private:
             addTracks(*node.mChildren[i]);
     }
 
-    /// A key where the value changes, since values hold until the next key. A track that stays as it is has one
-    /// key, and none if it stays as the node is anyway.
+    /// A track that stays as it is has one key, and none if it stays as the node is anyway.
     void addTrack(const aiNode& node, Property property, const glo::NodeData& rest)
     {
         glo::Channel track = makeChannel(m_nodeNames.at(&node), PROPERTY_NAMES[size_t(property)]);
+        const Values last =
+            m_isSparse ? addSparseKeys(track, node, property, rest) : addSteps(track, node, property, rest);
+        if (track.keyCount == 1 && isSame(last, getRest(rest, property)))
+            return;
+        m_lastOfFirst = m_all.channels.empty() ? last : m_lastOfFirst;
+        m_all.channels.push_back(std::move(track));
+    }
+
+    /// A key where the value changes, since values hold until the next key.
+    /// @return the last key's values.
+    Values addSteps(glo::Channel& track, const aiNode& node, Property property,
+                    const glo::NodeData& rest) const
+    {
         const Values restValues = getRest(rest, property);
         Values last;
         for (const Source& source : m_sources)
@@ -269,10 +394,52 @@ private:
                 last = values;
             }
         }
-        if (track.keyCount == 1 && isSame(last, restValues))
-            return;
-        m_lastOfFirst = m_all.channels.empty() ? last : m_lastOfFirst;
-        m_all.channels.push_back(std::move(track));
+        return last;
+    }
+
+    /// Keys where the movement bends, since the engine interpolates between them.
+    /// @return the last key's values.
+    Values addSparseKeys(glo::Channel& track, const aiNode& node, Property property,
+                         const glo::NodeData& rest) const
+    {
+        std::vector<Sample> samples;
+        for (const Source& source : m_sources)
+            appendSamples(source, node, property, rest, samples);
+        double error = m_keyError;
+        if (property == Property::TRANSLATION)
+            error *= m_length / double(findScale(node.mParent));
+        std::vector<size_t> keys = chooseKeys(samples, property == Property::ROTATION, error);
+        // What holds to the end holds after its first key as well.
+        while (keys.size() > 1 && isSame(toValues(samples[keys[keys.size() - 2]], property),
+                                         toValues(samples[keys.back()], property)))
+            keys.pop_back();
+        track.interpolation = glo::interpolation::LINEAR;
+        for (const size_t key : keys)
+            glo::addKey(track, float(samples[key].seconds), toValues(samples[key], property));
+        return toValues(samples[keys.back()], property);
+    }
+
+    /// What a clip has the node do, to be approached: the model's keys, and its value at both ends.
+    void appendSamples(const Source& source, const aiNode& node, Property property, const glo::NodeData& rest,
+                       std::vector<Sample>& samples) const
+    {
+        const size_t first = samples.size();
+        const auto channel = source.channels.find(&node);
+        const auto evaluateAt = [&](double ticks)
+        {
+            return toVector4(channel != source.channels.end()
+                                 ? sample(*channel->second, property, ticks, rest)
+                                 : getRest(rest, property));
+        };
+        if (channel != source.channels.end())
+            appendKeys(*channel->second, property, {source.duration, m_fps / source.ticksPerSecond}, samples);
+        if (samples.size() == first || samples[first].seconds > 0.0)
+            samples.insert(samples.begin() + std::ptrdiff_t(first), {0.0, evaluateAt(0.0)});
+        if (samples.back().seconds < source.duration)
+            samples.push_back({source.duration, evaluateAt(source.duration)});
+        for (size_t i = first; i < samples.size(); ++i) // to seconds on the time line, as they will be read
+            samples[i].seconds =
+                double(float(double(source.clip.start) + samples[i].seconds / source.ticksPerSecond));
     }
 
     /// Seconds at which a value is taken: evenly through each second, the end, and where the value jumps.
@@ -312,6 +479,9 @@ private:
     const NodeNames& m_nodeNames;
     const std::string& m_clipNode;
     double m_fps;
+    bool m_isSparse;
+    double m_keyError;
+    double m_length = 1.0; ///< of the model's diagonal, as it stands
     Report& m_report;
     NameMaker m_names;
     std::vector<Source> m_sources;

@@ -34,7 +34,8 @@ struct Motion
 /// What the model's nodes are called in the scene.
 using NodeNames = std::map<const aiNode*, std::string>;
 
-/// Samples the movement of nodes to stepped keys, the clips one after the other with a sample's time between.
+/// Samples the movement of nodes to stepped keys, or chooses keys to interpolate between; the clips one after the other with
+/// a sample's time between.
 ///
 /// A single clip is an animation of its name. Of several, all movement is in one animation "all clips", since of
 /// several channels for one node the last would win at all times; before it comes an animation for each clip, which

@@ -101,6 +101,14 @@ SharedPtr<AnimatedValue<T>> makeValue(const Channel& channel, const char* fileNa
     return makeShared<AnimationKeySequence<T>>(std::move(keys)); // sorts them
 }
 
+template <class T>
+SharedPtr<Animation> connect(const Channel& channel, const SharedPtr<AnimatedValue<T>>& value,
+                             const SharedPtr<Animator<T>>& animator)
+{
+    return channel.interpolation == interpolation::LINEAR ? createInterpolatedChannel<T>(value, animator)
+                                                          : createAnimationChannel<T>(value, animator);
+}
+
 template <class T, class SomeAnimator>
 bool addChannel(const Channel& channel, const char* fileName, const SharedPtr<SomeAnimator>& animator,
                 AnimationGroup& group)
@@ -108,7 +116,7 @@ bool addChannel(const Channel& channel, const char* fileName, const SharedPtr<So
     const SharedPtr<AnimatedValue<T>> value = makeValue<T>(channel, fileName);
     if (!value)
         return false;
-    group.addAnimation(createAnimationChannel<T>(value, animator));
+    group.addAnimation(connect<T>(channel, value, animator));
     return true;
 }
 
@@ -121,7 +129,7 @@ bool addLightChannels(const Channel& channel, const char* fileName,
     if (!value)
         return false;
     for (const SharedPtr<Light>& light : lights)
-        group.addAnimation(createAnimationChannel<T>(value, makeShared<LightAnimator>(light)));
+        group.addAnimation(connect<T>(channel, value, makeShared<LightAnimator>(light)));
     return true;
 }
 
@@ -154,8 +162,8 @@ const MaterialProperty* findMaterialProperty(const std::string& name)
 }
 
 template <class T>
-bool addMaterialChannels(const std::vector<AnimationKey<T>>& keys, const MaterialProperty& property,
-                         GloMaterial& material, AnimationGroup& group)
+bool addMaterialChannels(const Channel& channel, const std::vector<AnimationKey<T>>& keys,
+                         const MaterialProperty& property, GloMaterial& material, AnimationGroup& group)
 {
     for (const AnimationKey<T>& key : keys)
         material.reach(property.name, key.value);
@@ -164,7 +172,7 @@ bool addMaterialChannels(const std::vector<AnimationKey<T>>& keys, const Materia
         [&](const SharedPtr<Appearance>& appearance, bool)
         {
             const auto animator = makeShared<AppearancePropertyAnimator<T>>(appearance, property.property);
-            group.addAnimation(createAnimationChannel<T>(value, animator));
+            group.addAnimation(connect<T>(channel, value, animator));
         });
     return true;
 }
@@ -263,7 +271,8 @@ bool GloBuilder::makeMaterialChannel(const Channel& channel, const std::string& 
     if (!property.isColour)
     {
         std::vector<AnimationKey<float>> keys;
-        return readKeys(channel, m_name, keys) && addMaterialChannels(keys, property, found->second, group);
+        return readKeys(channel, m_name, keys) &&
+               addMaterialChannels(channel, keys, property, found->second, group);
     }
     std::vector<AnimationKey<Colour4f>> colours;
     if (!readKeys(channel, m_name, colours))
@@ -272,7 +281,7 @@ bool GloBuilder::makeMaterialChannel(const Channel& channel, const std::string& 
     keys.reserve(colours.size());
     for (const AnimationKey<Colour4f>& key : colours)
         keys.push_back({key.time, Vector4f(key.value.r, key.value.g, key.value.b, key.value.a)});
-    return addMaterialChannels(keys, property, found->second, group);
+    return addMaterialChannels(channel, keys, property, found->second, group);
 }
 
 } // namespace orv::detail

@@ -184,6 +184,14 @@ enum class UpAxis : uint32_t
     Z = 2  ///< replaced by -90 degrees about x
 };
 
+/// How a channel's keys are meant. Whatever else stands there is stepped: tools have written numbers of their own, which
+/// nothing reads, so the one that is read is none that they would have.
+namespace interpolation
+{
+constexpr uint32_t STEPPED = 0;
+constexpr uint32_t LINEAR = chunkId("LINE");
+} // namespace interpolation
+
 /// Number types of vertex attributes, indices and animation keys.
 namespace type
 {

@@ -239,7 +239,7 @@ struct Channel
     std::string targetType;
     std::string targetName; ///< "node-" in front of it counts for nothing
     std::string property;
-    uint32_t interpolation = 0; ///< kept, not used: values are stepped
+    uint32_t interpolation = interpolation::STEPPED; ///< whatever is not LINEAR is stepped
     uint32_t coefficientCount = 0;
     uint32_t type = type::FLOAT;
     uint32_t keyCount = 0;
