@@ -20,6 +20,7 @@
 #include "orv/camera.h"
 #include "orv/charrange.h"
 #include "orv/colour.h"
+#include "orv/debuglines.h"
 #include "orv/export.h"
 #include "orv/extensions.h"
 #include "orv/filestreamsource.h"
