@@ -1,7 +1,9 @@
 #include "orv/matrix.h"
 
+#include <algorithm>
 #include <cmath>
 #include <initializer_list>
+#include <limits>
 
 namespace orv
 {
@@ -236,6 +238,20 @@ Matrix4f lookAt(const Vector3f& eye, const Vector3f& target, const Vector3f& up)
     side = normalize(side);
     return Matrix4f(Vector4f(side, 0.0f), Vector4f(cross(back, side), 0.0f), Vector4f(back, 0.0f),
                     Vector4f(eye, 1.0f));
+}
+
+/// The square root of the largest row sum of transpose(m) * m, which no eigenvalue of that is above.
+float detail::getStretch(const Matrix4f& m)
+{
+    if (!isAffine(m))
+        return std::numeric_limits<float>::infinity();
+    const Vector3f x = m.columns[0].xyz();
+    const Vector3f y = m.columns[1].xyz();
+    const Vector3f z = m.columns[2].xyz();
+    const float xy = std::fabs(dot(x, y));
+    const float yz = std::fabs(dot(y, z));
+    const float zx = std::fabs(dot(z, x));
+    return std::sqrt(std::max({dot(x, x) + xy + zx, dot(y, y) + xy + yz, dot(z, z) + yz + zx}));
 }
 
 std::string toString(const Matrix2f& m)

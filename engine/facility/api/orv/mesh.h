@@ -1,11 +1,14 @@
 #pragma once
 
+#include "orv/bounds.h"
 #include "orv/detail/drawmark.h"
 #include "orv/export.h"
 #include "orv/indexbuffer.h"
 #include "orv/matrix.h"
 #include "orv/vector.h"
 #include "orv/vertexbuffer.h"
+
+#include <vector>
 
 namespace orv
 {
@@ -36,13 +39,38 @@ public:
     const IndexBuffer::Ptr& getIndexBuffer() const { return m_indexBuffer; }
     const VertexBuffer::Ptr& getVertexBuffer() const { return m_vertexBuffer; }
 
+    /// Around the vertices that are drawn, in the mesh's own space. Unknown for a mesh whose header has no bounding
+    /// radius, until they are set.
+    const Bounds& getBounds() const { return m_bounds; }
+
+    /// For a mesh whose bounds are not known (see computeBounds()), or whose program moves vertices about: then around
+    /// all places that they may reach. What is drawn with SimpleRenderer::setCulled() has to stay inside.
+    void setBounds(const Bounds& bounds);
+
+    /// Of a mesh for joints, by their numbers: around the vertices that have a weight for the joint, in the mesh's own
+    /// space, and unknown where there are none. Empty while nothing is known.
+    const std::vector<Bounds>& getJointBounds() const { return m_jointBounds; }
+    void setJointBounds(std::vector<Bounds> bounds);
+
     detail::DrawMark& getDrawMark() const { return m_drawMark; } ///< the renderer's
 
+    /// Draw path: the centre of a sphere around the mesh and, in w, its radius below 0: minus infinity where the bounds
+    /// are unknown.
+    const Vector4f& getSphere() const { return m_sphere; }
+    bool isCentred() const { return m_isCentred; } ///< that sphere's centre is the origin
+    static Vector4f makeSphere(const Bounds& bounds);
+
 private:
+    void takeBounds(const Bounds& bounds);
+
     MeshHeader m_header;
     IndexBuffer::Ptr m_indexBuffer;
     VertexBuffer::Ptr m_vertexBuffer;
     mutable detail::DrawMark m_drawMark;
+    Vector4f m_sphere;
+    bool m_isCentred = true;
+    Bounds m_bounds;
+    std::vector<Bounds> m_jointBounds;
 };
 
 } // namespace orv

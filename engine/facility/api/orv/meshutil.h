@@ -11,6 +11,12 @@ namespace orv
 /// @return 0 for a null array, or, after logging an assertion, for one of other than 4-byte components.
 ORV_API float computeMaximumLength(const SharedPtr<VertexArray>& array);
 
+/// The box around all positions, and the sphere about its centre, for Mesh::setBounds().
+/// @param array  as for computeMaximumLength().
+/// @return unknown for a null array, one without vertices, or, after logging an assertion, one of other than 4-byte
+/// components.
+ORV_API Bounds computeBounds(const SharedPtr<VertexArray>& array);
+
 /// Built-in shapes: triangle lists, committed, with a_position, a_normal and a_uv0, front faces counter-clockwise
 /// from outside. Texture coordinates run from 0 to uvScale, v upwards, so a scale above 1 repeats the texture.
 /// The meshes are unnamed in the cache. @return empty, after an error, where memory lacks.

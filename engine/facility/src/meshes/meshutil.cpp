@@ -83,6 +83,7 @@ void addQuad(Shape& shape, const Vector3f& corner, const Vector3f& right, const 
 Mesh::Ptr createMesh(MeshCache& cache, const Shape& shape, float boundingRadius)
 {
     shape.checkTotals();
+    const Bounds bounds = computeBounds(shape.positions);
     const VertexBuffer::Ptr vertexBuffer = cache.getVertexBufferCache()->create(nullptr);
     if (!vertexBuffer)
         return {};
@@ -104,7 +105,10 @@ Mesh::Ptr createMesh(MeshCache& cache, const Shape& shape, float boundingRadius)
 
     MeshHeader header;
     header.boundingRadius = boundingRadius;
-    return cache.create(header, indexBuffer, vertexBuffer, nullptr);
+    const Mesh::Ptr mesh = cache.create(header, indexBuffer, vertexBuffer, nullptr);
+    if (mesh)
+        mesh->setBounds(bounds);
+    return mesh;
 }
 
 void addSphereVertices(Shape& shape, unsigned int segments, unsigned int wedges, const Vector2f& uvScale)
@@ -162,6 +166,20 @@ float computeMaximumLength(const SharedPtr<VertexArray>& array)
         maximum = std::max(maximum, square);
     }
     return std::sqrt(maximum);
+}
+
+Bounds computeBounds(const SharedPtr<VertexArray>& array)
+{
+    const float* components = array ? std::as_const(*array).getData<float>() : nullptr;
+    if (!components)
+        return {};
+    std::vector<Vector3f> places(size_t(array->getVertexCount()));
+    for (Vector3f& place : places)
+    {
+        std::copy_n(components, std::min(array->getComponentCount(), 3), place.data());
+        components += array->getComponentCount();
+    }
+    return computeBounds(places.data(), places.size());
 }
 
 Mesh::Ptr createSphereMesh(MeshCache& cache, unsigned int segments, unsigned int wedges,

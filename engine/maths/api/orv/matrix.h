@@ -179,6 +179,10 @@ inline bool isAffine(const Matrix4<float>& m)
            m.columns[3].w == 1.0f;
 }
 
+/// An upper limit of what an affine transform does to lengths: where its axes stay at right angles, what it does to the
+/// most stretched of them. Infinite if it is not affine.
+ORV_API float getStretch(const Matrix4<float>& m);
+
 } // namespace detail
 
 using Matrix2f = Matrix2<float>;

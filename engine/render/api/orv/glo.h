@@ -125,6 +125,13 @@ private:
     Appearances m_kinds[2]; ///< for plain, for skinned geometry
 };
 
+/// What is worked out about the meshes of a scene file, beyond what is needed to draw them.
+enum class MeshData
+{
+    NONE,  ///< no vertex is looked at
+    BOUNDS ///< how far each mesh reaches, and what each joint moves of it: see Mesh::getBounds()
+};
+
 /// Loads a scene file and hangs its tree under a node.
 ///
 /// Textures and shader programs come from the pool by name; buffers, meshes and appearances are made again by
@@ -136,11 +143,14 @@ private:
 /// @param name    looked for on the pool's path.
 /// What is made by reference (solids, joints of skins, channels of lights) is bounded by 4 MiB and 32 bytes of memory
 /// for each byte of the file; a file that asks for more is refused.
-/// @param measuresMeshes  looks at every vertex to find the bounding radius of each mesh, which is unknown otherwise.
+/// @param measuresMeshes  looks at every vertex to find the bounding radius of each mesh, which is unknown otherwise; the
+/// same as MeshData::BOUNDS.
 /// @return empty, after logging why, if the file is missing, damaged, newer than the loader, or names something
 /// that it does not hold; parent is unchanged then. Missing textures, materials and joints and unknown animated
 /// properties are logged and replaced or left out.
 ORV_API SharedPtr<Glo> loadGloFile(AssetCachePool& pool, const SharedPtr<SceneNode>& parent, const char* name,
                                    bool measuresMeshes = false);
+ORV_API SharedPtr<Glo> loadGloFile(AssetCachePool& pool, const SharedPtr<SceneNode>& parent, const char* name,
+                                   MeshData meshData);
 
 } // namespace orv

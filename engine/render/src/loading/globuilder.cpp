@@ -55,14 +55,14 @@ GloBuilder::GloBuilder(AssetCachePool& pool, GloScene& scene, FileVersion versio
 
 GloBuilder::~GloBuilder() = default;
 
-SharedPtr<Glo> GloBuilder::build(const SharedPtr<SceneNode>& parent, bool measuresMeshes)
+SharedPtr<Glo> GloBuilder::build(const SharedPtr<SceneNode>& parent, MeshData wanted)
 {
     if (m_scene.scene && m_scene.upAxis > uint32_t(UpAxis::Z))
     {
         fail("Unrecognized up-axis option in %s");
         return {};
     }
-    if (!makeGeometries(measuresMeshes) || !makeMaterials())
+    if (!makeGeometries(wanted) || !makeMaterials())
         return {};
 
     SharedPtr<SceneNode> top;
@@ -128,12 +128,12 @@ bool GloBuilder::spend(uint64_t bytes)
     return m_credit.spend(bytes) || fail("References in %s ask for more than a file of its size may have");
 }
 
-bool GloBuilder::makeGeometries(bool measuresMeshes)
+bool GloBuilder::makeGeometries(MeshData wanted)
 {
     for (Geometry& geometry : m_scene.geometries)
     {
         GloGeometry made;
-        if (!makeGeometry(m_pool, geometry, m_version, m_name, measuresMeshes, made))
+        if (!makeGeometry(m_pool, geometry, m_version, m_name, wanted, made))
             return false;
         m_geometries.emplace(geometry.name, std::move(made));
     }

@@ -29,7 +29,7 @@ public:
     ~GloBuilder();
 
     /// @return empty, with parent unchanged, on failure.
-    SharedPtr<Glo> build(const SharedPtr<SceneNode>& parent, bool measuresMeshes);
+    SharedPtr<Glo> build(const SharedPtr<SceneNode>& parent, MeshData wanted);
 
 private:
     using Objects = std::vector<SharedPtr<SceneNode>>;
@@ -73,7 +73,7 @@ private:
 
     bool spend(uint64_t bytes);
 
-    bool makeGeometries(bool measuresMeshes);
+    bool makeGeometries(MeshData wanted);
     bool makeMaterials();
     SharedPtr<SceneNode> makeNode(const glo::NodeData& data, const SharedPtr<SceneNode>& parent);
     void setTransform(SceneNode& node, const glo::NodeData& data, bool top) const;

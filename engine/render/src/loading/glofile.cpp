@@ -15,6 +15,12 @@ namespace orv
 SharedPtr<Glo> loadGloFile(AssetCachePool& pool, const SharedPtr<SceneNode>& parent, const char* name,
                            bool measuresMeshes)
 {
+    return loadGloFile(pool, parent, name, measuresMeshes ? MeshData::BOUNDS : MeshData::NONE);
+}
+
+SharedPtr<Glo> loadGloFile(AssetCachePool& pool, const SharedPtr<SceneNode>& parent, const char* name,
+                           MeshData meshData)
+{
     const detail::LoadScope scope(name);
     const SharedPtr<Stream> stream = name ? pool.getStream(name) : SharedPtr<Stream>();
     if (!stream)
@@ -29,7 +35,7 @@ SharedPtr<Glo> loadGloFile(AssetCachePool& pool, const SharedPtr<SceneNode>& par
         return {};
     detail::GloBuilder builder(pool, reader.scene(), reader.version(), reader.tool(),
                                uint32_t(std::max(stream->size(), 0)), name);
-    return builder.build(parent, measuresMeshes);
+    return builder.build(parent, meshData);
 }
 
 } // namespace orv

@@ -5,6 +5,7 @@
 #include "orv/detail/glovertices.h"
 #include "orv/indexbuffercache.h"
 #include "orv/meshcache.h"
+#include "orv/meshgeometry.h"
 #include "orv/vertexbuffercache.h"
 
 #include <algorithm>
@@ -60,38 +61,52 @@ bool describe(const Geometry& geometry, FileVersion version, const char* fileNam
     return true;
 }
 
-/// Squared distances of the vertices from the origin; none without positions.
-std::vector<float> getSquaredDistances(const Geometry& geometry, FileVersion version)
+/// The first four components of an attribute's values; those that it lacks are 0.
+/// @return empty where the geometry has no such attribute.
+std::vector<Vector4f> readAttribute(const Geometry& geometry, FileVersion version, const char* name)
 {
-    std::vector<float> distances;
-    const VertexAttribute* position = findAttribute(geometry, "a_position");
-    if (!position)
-        return distances;
-    distances.resize(geometry.vertices.vertexCount);
-    forEachComponent(*position, geometry.vertices, isNormalised(*position, version), 3,
-                     [&distances](uint32_t vertex, float value) { distances[vertex] += value * value; });
-    return distances;
+    std::vector<Vector4f> values;
+    const VertexAttribute* const attribute = findAttribute(geometry, name);
+    if (!attribute)
+        return values;
+    values.resize(geometry.vertices.vertexCount);
+    int component = 0;
+    forEachComponent(*attribute, geometry.vertices, isNormalised(*attribute, version), 4,
+                     [&](uint32_t vertex, float value)
+                     {
+                         values[vertex].data()[component] = value;
+                         component = (component + 1) % attribute->componentCount;
+                     });
+    return values;
 }
 
-float getRadius(const std::vector<float>& squaredDistances)
+/// @return without places if the geometry has none.
+SharedPtr<MeshVertices> readVertices(const Geometry& geometry, FileVersion version)
 {
-    if (squaredDistances.empty())
-        return MeshHeader::INVALID_BOUNDING_RADIUS;
-    float largest = 0.0f;
-    for (const float distance : squaredDistances)
-        largest = std::max(largest, distance);
-    return std::sqrt(largest);
+    const SharedPtr<MeshVertices> vertices = makeShared<MeshVertices>();
+    if (!vertices)
+        return {};
+    for (const Vector4f& place : readAttribute(geometry, version, "a_position"))
+        vertices->places.push_back(place.xyz());
+    const std::vector<Vector4f> joints = readAttribute(geometry, version, "a_joints");
+    const std::vector<Vector4f> weights = readAttribute(geometry, version, "a_weights");
+    const Vector4f missing(1.0f, 1.0f, 1.0f, 1.0f); // as GL has it
+    for (size_t i = 0; i < joints.size() && i < vertices->places.size(); ++i)
+        vertices->influences.push_back(makeInfluence(joints[i], weights.empty() ? missing : weights[i]));
+    return vertices;
 }
 
 /// Of the vertices that the set draws.
-/// @param all  the radius of all vertices, which is not computed once more for each set without indices.
-float getRadius(const PrimitiveSet& set, const std::vector<float>& squaredDistances, float all)
+float getRadius(const PrimitiveSet& set, const MeshVertices& vertices)
 {
-    if (squaredDistances.empty() || !set.indices)
-        return all;
     float largest = 0.0f;
-    for (const uint16_t index : set.indices->indices)
-        largest = std::max(largest, squaredDistances[index]);
+    const auto addPlace = [&largest](const Vector3f& place)
+    { largest = std::max(largest, dot(place, place)); };
+    if (!set.indices)
+        std::for_each(vertices.places.begin(), vertices.places.end(), addPlace);
+    else
+        for (const uint16_t index : set.indices->indices)
+            addPlace(vertices.places[index]);
     return std::sqrt(largest);
 }
 
@@ -145,7 +160,7 @@ bool isInside(const PrimitiveSet& set, uint32_t vertexCount)
 } // namespace
 
 bool makeGeometry(AssetCachePool& pool, Geometry& geometry, FileVersion version, const char* fileName,
-                  bool measuresMeshes, GloGeometry& made)
+                  MeshData wanted, GloGeometry& made)
 {
     VertexSet& vertices = geometry.vertices;
     std::vector<uint8_t>& bytes = vertices.data.bytes;
@@ -177,14 +192,15 @@ bool makeGeometry(AssetCachePool& pool, Geometry& geometry, FileVersion version,
                                          bytes.data(), static_cast<unsigned int>(bytes.size()))))
         return fail(geometry, fileName);
 
-    const std::vector<float> squaredDistances =
-        measuresMeshes ? getSquaredDistances(geometry, version) : std::vector<float>();
-    const float radius = getRadius(squaredDistances);
+    const SharedPtr<MeshVertices> places =
+        wanted != MeshData::NONE ? readVertices(geometry, version) : SharedPtr<MeshVertices>();
+    const bool isMeasured = places && !places->places.empty();
     bytes = {};
     for (const PrimitiveSet& set : geometry.primitiveSets)
     {
         MeshHeader header;
-        header.boundingRadius = getRadius(set, squaredDistances, radius);
+        if (isMeasured)
+            header.boundingRadius = getRadius(set, *places);
         const SharedPtr<IndexBuffer> indexBuffer =
             makeIndexBuffer(*pool.getIndexBufferCache(), set, vertices.vertexCount);
         const SharedPtr<Mesh> mesh =
@@ -192,6 +208,9 @@ bool makeGeometry(AssetCachePool& pool, Geometry& geometry, FileVersion version,
                         : SharedPtr<Mesh>();
         if (!mesh)
             return fail(geometry, fileName);
+        if (isMeasured)
+            setBounds(*mesh, *places, set.indices ? set.indices->indices.data() : nullptr,
+                      set.indices ? set.indices->indices.size() : 0);
         made.meshes.push_back(mesh);
     }
     return true;

@@ -1,6 +1,7 @@
 #pragma once
 
 #include "orv/detail/glorecords.h"
+#include "orv/glo.h"
 #include "orv/sharedptr.h"
 
 #include <vector>
@@ -25,7 +26,7 @@ struct GloGeometry
 /// @param fileName  for messages.
 /// @return false, after logging, if the GL would be led outside the vertices or cannot take them.
 bool makeGeometry(AssetCachePool& pool, glo::Geometry& geometry, glo::FileVersion version,
-                  const char* fileName, bool measuresMeshes, GloGeometry& made);
+                  const char* fileName, MeshData wanted, GloGeometry& made);
 
 } // namespace detail
 
