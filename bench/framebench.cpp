@@ -470,6 +470,49 @@ Frame makeStereoEngine()
     };
 }
 
+/// A thousand cubes in sight, which a look at each finds out, since one beside them is not.
+Frame makeCubesEngine(bool isCulled)
+{
+    const auto engine = std::make_shared<Engine>();
+    engine->addCubes(CUBES, engine->makePlain());
+    engine->scene->getChild(engine->scene->getChildCount() - 1)->setPosition(Vector3f(0.0f, 0.0f, 1000.0f));
+    engine->camera->setPosition(Vector3f(13.0f, 13.0f, 70.0f));
+    engine->renderer->setCulled(isCulled);
+    return [engine](int) { engine->block->render(); };
+}
+
+/// The same below nodes of a hundred each, behind the camera.
+Frame makeHiddenCubesEngine()
+{
+    const auto engine = std::make_shared<Engine>();
+    const auto appearance = engine->makePlain();
+    for (int i = 0; i < CUBES; ++i)
+    {
+        if (i % GROUP == 0)
+            makeShared<SceneNode>()->setParent(engine->scene);
+        const auto solid = makeShared<Solid>(engine->mesh, appearance);
+        solid->setPosition(findPlace(i));
+        solid->setParent(engine->scene->getChild(engine->scene->getChildCount() - 1));
+    }
+    engine->camera->setPosition(Vector3f(0.0f, 0.0f, -1000.0f));
+    engine->renderer->setCulled(true);
+    return [engine](int frame)
+    {
+        engine->scene->getChild(1)->setPosition(Vector3f(0.0f, 0.0f, float(frame)));
+        engine->block->render();
+    };
+}
+
+Frame makeOnePassHand()
+{
+    const auto hand = std::make_shared<Hand>(CUBES);
+    return [hand](int)
+    {
+        glClear(GL_COLOR_BUFFER_BIT);
+        hand->draw(hand->projection * hand->view);
+    };
+}
+
 Frame makeTwoPassHand()
 {
     const auto hand = std::make_shared<Hand>(CUBES);
@@ -606,6 +649,9 @@ constexpr Case CASES[] = {
     {"mirror", 2 * CUBES, "draw", makeMirrorEngine, makeTwoPassHand},
     {"stereo", 2 * CUBES, "draw", makeStereoEngine, makeTwoPassHand},
     {"motion-blur", CUBES, "solid", makeBlurEngine, makeBlurHand},
+    {"solids", CUBES, "solid", [] { return makeCubesEngine(false); }, makeOnePassHand},
+    {"solids-culled", CUBES, "solid", [] { return makeCubesEngine(true); }, makeOnePassHand},
+    {"solids-hidden", CUBES, "solid", makeHiddenCubesEngine, makeOnePassHand},
     {"tree", NODES, "node", makeTreeEngine, makeTreeHand},
 };
 

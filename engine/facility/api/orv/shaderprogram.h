@@ -74,6 +74,10 @@ public:
     /// uniformExists("J_WORLD"), likewise.
     bool usesJoints() const { return m_usesJoints; }
 
+    /// Whether a uniform takes T_MODEL, T_MODEL_VIEW or T_MODEL_VIEW_PROJECTION, likewise. Without one, nothing that is
+    /// drawn depends on where its node is.
+    bool usesModelTransform() const { return m_usesModelTransform; }
+
     /// Looks the property names up in the context, unless that was done before and neither the context nor its
     /// set of properties is another one by now. A name that is not found keeps what it had.
     void link(RenderContext& context);
@@ -157,6 +161,7 @@ private:
     mutable detail::DrawMark m_drawMark;
     bool m_usesMirrorTexture = false;
     bool m_usesJoints = false;
+    bool m_usesModelTransform = false;
 };
 
 } // namespace orv

@@ -1,5 +1,6 @@
 #include "orv/appearance.h"
 
+#include "orv/detail/boundsrevision.h"
 #include "orv/propertycollector.h"
 #include "orv/rendercontext.h"
 
@@ -179,6 +180,8 @@ void Appearance::setShaderProgram(const SharedPtr<ShaderProgram>& program)
         return;
     m_shaderProgram = program;
     m_linked = false;
+    if (program && !program->usesModelTransform())
+        detail::boundsChanged();
 }
 
 bool Appearance::sizeAllowed(int size)

@@ -4,6 +4,7 @@
 #include "shaderuniformprivate.h"
 
 #include "orv/detail/bindingepoch.h"
+#include "orv/detail/boundsrevision.h"
 #include "orv/detail/resource.h"
 #include "orv/extensions.h"
 #include "orv/rendercontext.h"
@@ -223,6 +224,11 @@ void ShaderProgram::setUniformPropertyName(int index, const char* name)
     m_sourcesRevision = detail::nextRevision();
     m_usesMirrorTexture = uniformExists("M_MIRROR_TEXTURE");
     m_usesJoints = uniformExists("J_WORLD");
+    const bool usedModelTransform = m_usesModelTransform;
+    m_usesModelTransform =
+        uniformExists("T_MODEL_VIEW_PROJECTION") || uniformExists("T_MODEL_VIEW") || uniformExists("T_MODEL");
+    if (usedModelTransform && !m_usesModelTransform)
+        detail::boundsChanged();
 }
 
 void ShaderProgram::setUniformPropertyValue(int index, const SharedPtr<ShaderUniformBase>& value)

@@ -9,6 +9,7 @@
 #include "orv/vector.h"
 
 #include <cstdint>
+#include <limits>
 #include <memory>
 #include <vector>
 
@@ -134,6 +135,16 @@ public:
 
     detail::ChildList* getChildList() const { return m_children.get(); } ///< the walks'; null for most nodes
 
+    /// Draw path, of nodes with children: a sphere in this node's own space around all solids of the subtree, as
+    /// Mesh::getSphere() has it. Infinite where the subtree has lights, solids with joints, solids of unknown bounds, or
+    /// nodes that have moved since the last call but one.
+    Vector4f getReach() const;
+    /// Draw path: an upper limit of what the world transform does to lengths; infinite if it is not affine.
+    float getWorldStretch() const { return isWorldRigid() ? 1.0f : findStretch(); }
+    /// The same where it is known already, and the world transform too; else minus infinity.
+    float getKnownStretch() const;
+    const Matrix4f& peekWorldTransform() const { return m_worldTransform; } ///< perhaps of an earlier place
+
     /// Depth first, this node before its children, children in order; names compare exactly.
     /// @return borrowed; null when no node of this subtree has the name.
     SceneNode* find(const char* name);
@@ -149,7 +160,21 @@ private:
         SharedPtr<detail::JointTie> tie; ///< of a joint of solids
         std::unique_ptr<Matrix4f> lastWorldTransform;
         Matrix3f normalTransform; ///< unless the world transform is rigid
-        bool isNormalKnown = false;
+        float stretch = 0.0f;     ///< likewise
+        uint32_t known = 0;       ///< of the two above: NORMAL, STRETCH
+        uint32_t reachRevision = 0;
+        Vector4f reach; ///< while m_reachState says so
+    };
+
+    static constexpr uint32_t NORMAL = 1;
+    static constexpr uint32_t STRETCH = 2;
+
+    /// What is known of the nodes below, and by them: a node's reach is known only where those of all below are.
+    enum class ReachState : uint8_t
+    {
+        UNKNOWN,
+        STEADY, ///< nothing has moved since the last time that it was asked for
+        KNOWN
     };
 
     ORV_LOCAL SharedPtr<detail::JointTie> tie();
@@ -162,7 +187,20 @@ private:
     ORV_LOCAL void placeBelow(const Matrix4f& parentWorld, bool parentMirrored, bool parentRigid) const;
     ORV_LOCAL Extras* makeExtras() const;
     Matrix3f findNormal() const;
+    float findStretch() const;
     ORV_LOCAL void markChildren();
+    ORV_LOCAL Vector4f findReach() const;
+    ORV_LOCAL Vector4f getOwnReach() const;
+    template <class Use>
+    ORV_LOCAL void forEachReach(const Use& use) const;
+
+    /// What those above this node know of it does not hold any longer. Next to nothing where nobody has asked.
+    void forgetReachAbove() const
+    {
+        if (m_reachState != ReachState::UNKNOWN) [[unlikely]]
+            forgetReach(m_parent);
+    }
+    static void forgetReach(const SceneNode* node);
 
     mutable bool m_localMirrored = false;
     mutable bool m_worldMirrored = false;
@@ -171,6 +209,7 @@ private:
     mutable bool m_localRigid = true; ///< known to be rotation and translation alone
     mutable bool m_worldRigid = true;
     bool m_scaled = false; ///< m_scale is not all 1
+    mutable ReachState m_reachState = ReachState::UNKNOWN;
     uint32_t m_flags = 0;
     uint32_t m_skinnedCount = 0; ///< solids with joints in this subtree, itself included
     uint32_t m_place = 0;        ///< in the parent's list
@@ -197,6 +236,14 @@ inline bool SceneNode::isWorldRigid() const
     if (m_worldTransformChanged)
         update();
     return m_worldRigid;
+}
+
+inline float SceneNode::getKnownStretch() const
+{
+    if (m_worldRigid && !m_worldTransformChanged)
+        return 1.0f;
+    const bool isKnown = m_extras && !m_worldTransformChanged && (m_extras->known & STRETCH);
+    return isKnown ? m_extras->stretch : -std::numeric_limits<float>::infinity();
 }
 
 inline Matrix3f SceneNode::getNormalTransform() const

@@ -18,6 +18,7 @@ class RenderTarget;
 
 namespace detail
 {
+class Culling;
 class DrawGroups;
 struct Eye;
 struct RendererProperties;
@@ -84,6 +85,21 @@ public:
     void setOpaqueGrouped(bool grouped);
     bool isOpaqueGrouped() const { return m_groups != nullptr; }
 
+    /// Leaves out solids that are outside of what an eye sees, in stereo and in mirrors for each picture by itself; whole
+    /// subtrees of them without a look at each. Off at first.
+    ///
+    /// A solid counts with the sphere around its mesh (Mesh::getBounds()), one with joints with spheres around what each
+    /// joint moves (Mesh::getJointBounds()), so that none is left out that could be seen. Always drawn are solids of
+    /// unknown bounds, and those whose program takes no model transform. Known are the bounds of the built-in shapes, of
+    /// scene files loaded with MeshData::BOUNDS, and what Mesh::setBounds() says; that is for programs that move vertices
+    /// about, too. Pictures stay the same; the transform properties end up with the values of the last solid drawn.
+    ///
+    /// Subtrees with lights, solids with joints or solids of unknown bounds are gone through solid by solid, and those in
+    /// which something moves. A node class of the application's own whose accept() hands over other nodes than itself
+    /// needs a getNodeType() of its own, so that its subtree is never left out as a whole.
+    void setCulled(bool culled);
+    bool isCulled() const { return m_culling != nullptr; }
+
     /// The scene walk of render() arrives here.
     using SceneNodeVisitor::visit;
     void visit(Solid* solid) override;
@@ -96,6 +112,7 @@ private:
         Solid* solid;
     };
 
+    ORV_LOCAL void collect(SceneNode& scene, const FlagMask& renderFlags, const FlagMask& recursiveFlags);
     ORV_LOCAL void publishLights();
     ORV_LOCAL void publishLight(const Light& light, int index);
     ORV_LOCAL void publishEye(const Matrix4f& world, const Matrix4f& view);
@@ -116,6 +133,7 @@ private:
     std::vector<Light*> m_lights;
     std::vector<SortKey> m_sortKeys;
     std::unique_ptr<detail::DrawGroups> m_groups; // null where the walk's order counts
+    std::unique_ptr<detail::Culling> m_culling;   // null where all is drawn
     std::vector<PropertyRef> m_mirrorProperties;  // one for each place in m_mirrors
     detail::Viewport m_viewport;                  // of the whole picture
     SharedPtr<RenderTarget> m_mirrorTarget;

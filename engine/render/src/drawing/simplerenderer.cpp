@@ -1,5 +1,6 @@
 #include "orv/simplerenderer.h"
 
+#include "culling.h"
 #include "drawgroups.h"
 #include "eyes.h"
 #include "rendererproperties.h"
@@ -68,6 +69,12 @@ void SimpleRenderer::setOpaqueGrouped(bool grouped)
         m_groups = grouped ? std::make_unique<detail::DrawGroups>(m_opaque) : nullptr;
 }
 
+void SimpleRenderer::setCulled(bool culled)
+{
+    if (culled != isCulled())
+        m_culling = culled ? std::make_unique<detail::Culling>(*this) : nullptr;
+}
+
 void SimpleRenderer::visit(Solid* solid)
 {
     const Appearance* appearance = solid->getAppearance().get();
@@ -89,20 +96,36 @@ void SimpleRenderer::visit(Light* light)
     m_lights.push_back(light);
 }
 
-void SimpleRenderer::render(Camera* camera, SceneNode& scene, const FlagMask& renderFlags,
-                            const FlagMask& recursiveFlags)
+void SimpleRenderer::collect(SceneNode& scene, const FlagMask& renderFlags, const FlagMask& recursiveFlags)
 {
     m_opaque.clear();
     m_transparent.clear();
     m_mirrors.clear();
     m_lights.clear();
-    if (!m_properties->isComplete())
-        return; // the log said so when they were made
     if (m_groups)
         m_groups->begin();
-    visitScene(*this, scene, renderFlags, recursiveFlags);
+    if (m_culling)
+        m_culling->walk(scene, renderFlags, recursiveFlags);
+    else
+        visitScene(*this, scene, renderFlags, recursiveFlags);
     if (m_groups)
         m_groups->finish();
+}
+
+void SimpleRenderer::render(Camera* camera, SceneNode& scene, const FlagMask& renderFlags,
+                            const FlagMask& recursiveFlags)
+{
+    if (!m_properties->isComplete())
+        return; // the log said so when they were made
+    if (m_culling)
+    {
+        detail::Eye eyes[2];
+        const float aspect = detail::getAspect(detail::getViewport(*m_context));
+        m_culling->begin(eyes, detail::findEyes(camera, aspect, eyes));
+    }
+    collect(scene, renderFlags, recursiveFlags);
+    if (m_culling && !m_culling->finish(m_mirrors.size() > 0))
+        collect(scene, renderFlags, recursiveFlags);
 
     const RenderContext::DrawScope scope(*m_context);
     const detail::MirroredView mirroredView(*m_context, camera);
@@ -174,6 +197,8 @@ void SimpleRenderer::renderEye(const detail::Eye& eye, const detail::Viewport& v
     for (size_t i = 0; i < m_mirrors.size(); ++i)
     {
         Solid* mirror = m_mirrors[i];
+        if (m_culling && m_culling->hides(*mirror, view, eye.projection))
+            continue;
         if (prepareMirrorTarget())
         {
             renderReflection(*mirror, eye, viewport);
@@ -289,6 +314,8 @@ void SimpleRenderer::draw(Solid* const* solids, size_t count, const Matrix4f& vi
                           const Matrix4f& projection)
 {
     m_properties->viewProjection->set(projection * view);
+    if (m_culling)
+        solids = m_culling->select(solids, count, view, projection);
     detail::SolidPainter(*m_context, *m_properties, view, projection).draw(solids, count);
 }
 

@@ -83,6 +83,7 @@ void SceneNode::setLocalTransform(const Matrix4f& transform)
     m_localTransformChanged = false;
     m_localRigid = false;
     m_localMirrored = determinant(upper3x3(transform)) < 0.0f;
+    forgetReachAbove();
     setWorldTransformChanged();
 }
 
@@ -155,6 +156,7 @@ void SceneNode::addChild(SceneNode& child)
     if (!m_children)
         m_children = std::make_unique<detail::ChildList>();
     m_children->add(child);
+    forgetReach(this);
 }
 
 void SceneNode::removeChild(const SharedPtr<SceneNode>& child)
@@ -226,6 +228,7 @@ SharedPtr<SceneNode> SceneNode::takeChild(const SceneNode* child)
     if (!child || child->m_parent != this)
         return nullptr;
     SharedPtr<SceneNode> taken = m_children->take(*child);
+    forgetReach(this);
     detail::SceneWalk::keep(taken);
     countSkinned(0u - child->m_skinnedCount);
     return taken;

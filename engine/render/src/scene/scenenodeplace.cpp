@@ -35,6 +35,7 @@ void SceneNode::setScale(const Vector3f& scale)
 void SceneNode::setTransformChanged()
 {
     m_localTransformChanged = true;
+    forgetReachAbove();
     setWorldTransformChanged();
 }
 
@@ -89,7 +90,7 @@ void SceneNode::buildLocal() const
     m_worldRigid = parentRigid && m_localRigid;
     m_worldTransformChanged = false;
     if (m_extras)
-        m_extras->isNormalKnown = false;
+        m_extras->known = 0;
 }
 
 void SceneNode::updateAll(const Matrix4f& parentWorld, bool parentMirrored) const
@@ -119,7 +120,7 @@ void SceneNode::updateRoot() const
 Matrix3f SceneNode::findNormal() const
 {
     Extras* const extras = makeExtras();
-    if (extras && extras->isNormalKnown)
+    if (extras && (extras->known & NORMAL))
         return extras->normalTransform;
     const Vector3f x = m_worldTransform.columns[0].xyz();
     const Vector3f y = m_worldTransform.columns[1].xyz();
@@ -131,9 +132,24 @@ Matrix3f SceneNode::findNormal() const
     if (extras)
     {
         extras->normalTransform = normal;
-        extras->isNormalKnown = true;
+        extras->known |= NORMAL;
     }
     return normal;
+}
+
+/// For a world transform that is not rigid; the update is done.
+float SceneNode::findStretch() const
+{
+    Extras* const extras = makeExtras();
+    if (extras && (extras->known & STRETCH))
+        return extras->stretch;
+    const float stretch = detail::getStretch(m_worldTransform);
+    if (extras)
+    {
+        extras->stretch = stretch;
+        extras->known |= STRETCH;
+    }
+    return stretch;
 }
 
 } // namespace orv

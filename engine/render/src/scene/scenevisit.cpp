@@ -21,7 +21,8 @@ struct Walk
     SceneNodeVisitor& visitor;
     const FlagMask& renderFlags;
     const FlagMask& recursiveFlags;
-    bool plainFlags; ///< no recursive flag is on by default: once the condition holds, it holds below
+    bool plainFlags;  ///< no recursive flag is on by default: once the condition holds, it holds below
+    WalkGuide* guide; ///< null where there is none
 };
 
 void visitBelow(SceneNodeVisitor& visitor, ChildList& list)
@@ -32,6 +33,26 @@ void visitBelow(SceneNodeVisitor& visitor, ChildList& list)
         child->accept(visitor);
         if (child->getChildList()) // most have none, and need no call
             visitBelow(visitor, *child->getChildList());
+    }
+}
+
+void visitAllGuided(WalkGuide& guide, SceneNode& node)
+{
+    SceneNodeVisitor* const visitor = node.getChildList() ? guide.choose(node) : &guide.getVisitor();
+    if (!visitor)
+        return;
+    if (visitor != &guide.getVisitor())
+        return visitAll(*visitor, node);
+    node.accept(*visitor);
+    if (!node.getChildList())
+        return;
+    ChildList::Cursor children(*node.getChildList());
+    while (SceneNode* child = children.next())
+    {
+        if (child->getChildList())
+            visitAllGuided(guide, *child);
+        else
+            child->accept(*visitor);
     }
 }
 
@@ -47,7 +68,10 @@ void visitBelow(SceneNodeVisitor& visitor, ChildList& list)
     state.satisfied = nowSatisfied;
     if (stop && nowSatisfied)
     {
-        visitAll(walk.visitor, node);
+        if (walk.guide)
+            visitAllGuided(*walk.guide, node);
+        else
+            visitAll(walk.visitor, node);
         return false;
     }
 
@@ -68,6 +92,34 @@ void visitRestrictedBelow(const Walk& walk, ChildList& list, const WalkState& st
     }
 }
 
+Walk makeWalk(SceneNodeVisitor& visitor, const FlagMask& renderFlags, const FlagMask& recursiveFlags,
+              WalkGuide* guide)
+{
+    return {visitor, renderFlags, recursiveFlags, (recursiveFlags.mask & recursiveFlags.inverted) == 0,
+            guide};
+}
+
+void visitRestricted(const Walk& walk, SceneNode& node, WalkState& state)
+{
+    if (visitOne(walk, node, state) && node.getChildList())
+        visitRestrictedBelow(walk, *node.getChildList(), state);
+}
+
+void visitRestrictedGuided(const Walk& walk, SceneNode& node, WalkState state)
+{
+    SceneNodeVisitor* const visitor = node.getChildList() ? walk.guide->choose(node) : &walk.visitor;
+    if (!visitor)
+        return;
+    if (visitor != &walk.visitor)
+        return visitRestricted(makeWalk(*visitor, walk.renderFlags, walk.recursiveFlags, nullptr), node,
+                               state);
+    if (!visitOne(walk, node, state) || !node.getChildList())
+        return;
+    ChildList::Cursor children(*node.getChildList());
+    while (SceneNode* child = children.next())
+        visitRestrictedGuided(walk, *child, state);
+}
+
 } // namespace
 
 void visitAll(SceneNodeVisitor& visitor, SceneNode& node)
@@ -80,11 +132,18 @@ void visitAll(SceneNodeVisitor& visitor, SceneNode& node)
 void visitRestricted(SceneNodeVisitor& visitor, SceneNode& node, const FlagMask& renderFlags,
                      const FlagMask& recursiveFlags)
 {
-    const bool plainFlags = (recursiveFlags.mask & recursiveFlags.inverted) == 0;
-    const Walk walk = {visitor, renderFlags, recursiveFlags, plainFlags};
     WalkState state;
-    if (visitOne(walk, node, state) && node.getChildList())
-        visitRestrictedBelow(walk, *node.getChildList(), state);
+    visitRestricted(makeWalk(visitor, renderFlags, recursiveFlags, nullptr), node, state);
+}
+
+void visitGuided(WalkGuide& guide, SceneNode& node, const FlagMask& renderFlags,
+                 const FlagMask& recursiveFlags)
+{
+    const SceneWalk walk(node);
+    if (renderFlags.mask == 0)
+        visitAllGuided(guide, node);
+    else
+        visitRestrictedGuided(makeWalk(guide.getVisitor(), renderFlags, recursiveFlags, &guide), node, {});
 }
 
 } // namespace orv::detail

@@ -32,6 +32,30 @@ private:
     std::vector<SharedPtr<SceneNode>> m_kept;
 };
 
+/// Says who visits the parts of a scene.
+class WalkGuide
+{
+public:
+    explicit WalkGuide(SceneNodeVisitor& visitor) : m_visitor(visitor) {}
+
+    SceneNodeVisitor& getVisitor() const { return m_visitor; }
+
+    /// @param node  one with children.
+    /// @return the visitor above, to be asked again for nodes below; another visitor for the whole of this subtree; or null
+    /// to leave it out.
+    virtual SceneNodeVisitor* choose(const SceneNode& node) = 0;
+
+protected:
+    ~WalkGuide() = default;
+
+private:
+    SceneNodeVisitor& m_visitor;
+};
+
+/// The walk of visitScene() with flags, guided.
+void visitGuided(WalkGuide& guide, SceneNode& node, const FlagMask& renderFlags,
+                 const FlagMask& recursiveFlags);
+
 /// The walk of all nodes without a look at flags.
 void visitAll(SceneNodeVisitor& visitor, SceneNode& node);
 

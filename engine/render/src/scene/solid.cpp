@@ -55,11 +55,13 @@ void Solid::accept(SceneNodeVisitor& visitor)
 void Solid::setMesh(const SharedPtr<Mesh>& mesh)
 {
     m_mesh = mesh;
+    forgetReach(this);
 }
 
 void Solid::setAppearance(const SharedPtr<Appearance>& appearance)
 {
     m_appearance = appearance;
+    forgetReach(this);
 }
 
 void Solid::setJointsPerVertex(int count)

@@ -1,0 +1,173 @@
+#include "culling.h"
+
+#include "eyes.h"
+
+#include "orv/appearance.h"
+#include "orv/mesh.h"
+#include "orv/sceneutil.h"
+#include "orv/shaderprogram.h"
+#include "orv/solid.h"
+
+#include <algorithm>
+
+namespace orv::detail
+{
+
+namespace
+{
+
+Vector3f place(const Matrix4f& transform, const Vector4f& sphere)
+{
+    return (transform * Vector4f(sphere.xyz(), 1.0f)).xyz();
+}
+
+const ShaderProgram* getProgram(const Solid& solid)
+{
+    const Appearance* const appearance = solid.getAppearance().get();
+    return appearance ? appearance->getShaderProgram().get() : nullptr;
+}
+
+/// Each vertex is somewhere between the places that the joints would give it.
+[[gnu::noinline]] bool hidesSkin(const Frustum& frustum, const Solid& solid, const Mesh& mesh)
+{
+    const int last = std::min(solid.getJointCount(), Solid::MAX_JOINTS) - 1;
+    const std::vector<Bounds>& bounds = mesh.getJointBounds();
+    HullSight sight(frustum);
+    for (size_t i = 0; i < bounds.size(); ++i)
+    {
+        if (!bounds[i].isKnown())
+            continue; // no vertex follows it
+        const Matrix4f transform = solid.getJointTransform(std::min(int(i), last));
+        const Vector4f sphere = Mesh::makeSphere(bounds[i]);
+        sight.add(place(transform, sphere), sphere.w * getStretch(transform));
+    }
+    return !bounds.empty() && sight.isHidden();
+}
+
+[[gnu::noinline]] bool hides(const Frustum& frustum, const Solid& solid)
+{
+    const Mesh* const mesh = solid.getMesh().get();
+    const ShaderProgram* const program = getProgram(solid);
+    if (!mesh || !program)
+        return false;
+    if (program->usesJoints() && solid.getJointCount() > 0)
+        return hidesSkin(frustum, solid, *mesh);
+    const Vector4f& sphere = mesh->getSphere();
+    const Vector3f centre = place(solid.getWorldTransform(), sphere);
+    return program->usesModelTransform() && frustum.hides(centre, sphere.w * solid.getWorldStretch());
+}
+
+/// Whether it is plain that a solid is not hidden, as it is of most that are not.
+[[gnu::always_inline]] inline bool isSeen(const Frustum& frustum, const Solid& solid)
+{
+    const Mesh* const mesh = solid.getMesh().get();
+    if (!mesh || solid.hasSkin()) [[unlikely]]
+        return false;
+    const Vector4f& sphere = mesh->getSphere();
+    const float negativeRadius = sphere.w * solid.getKnownStretch(); // infinite if that is not known
+    const Matrix4f& world = solid.peekWorldTransform();
+    return !(mesh->isCentred() ? frustum.hides(world.columns[3].xyz(), negativeRadius)
+                               : frustum.hides(world, sphere.xyz(), negativeRadius));
+}
+
+} // namespace
+
+Culling::Culling(SceneNodeVisitor& renderer)
+    : WalkGuide(static_cast<SceneNodeVisitor&>(*this))
+    , m_renderer(renderer)
+{
+}
+
+void Culling::begin(const Eye* eyes, int eyeCount)
+{
+    m_eyeCount = eyeCount;
+    for (int i = 0; i < eyeCount; ++i)
+        m_frustums[i] = Frustum(inverse(eyes[i].world), eyes[i].projection);
+}
+
+void Culling::walk(SceneNode& scene, const FlagMask& renderFlags, const FlagMask& recursiveFlags)
+{
+    if (m_hasMirrors)
+        visitScene(m_renderer, scene, renderFlags, recursiveFlags);
+    else
+        visitGuided(*this, scene, renderFlags, recursiveFlags);
+}
+
+bool Culling::finish(bool hasMirrors)
+{
+    const bool isWhole = m_hasMirrors || !hasMirrors;
+    m_hasMirrors = hasMirrors;
+    return isWhole;
+}
+
+Solid* const* Culling::select(Solid* const* solids, size_t& count, const Matrix4f& view,
+                              const Matrix4f& projection)
+{
+    if (m_eyeCount == 1 && !m_hasMirrors)
+        return solids; // the walk has seen to it
+    const Frustum frustum(view, projection);
+    m_selected.clear();
+    for (Solid* const* next = solids; next != solids + count; ++next)
+    {
+        if (isSeen(frustum, **next) || !detail::hides(frustum, **next))
+            m_selected.add(*next);
+    }
+    count = m_selected.size();
+    return m_selected.begin();
+}
+
+bool Culling::hides(const Solid& solid, const Matrix4f& view, const Matrix4f& projection)
+{
+    return detail::hides(Frustum(view, projection), solid);
+}
+
+bool Culling::isHidden(const Solid& solid) const
+{
+    return detail::hides(m_frustums[0], solid) && (m_eyeCount == 1 || detail::hides(m_frustums[1], solid));
+}
+
+void Culling::visit(Solid* solid)
+{
+    if (isSeen(m_frustums[0], *solid)) [[likely]]
+        return m_renderer.visit(solid);
+    visitDoubtful(solid);
+}
+
+[[gnu::noinline]] void Culling::visitDoubtful(Solid* solid)
+{
+    if (!isHidden(*solid))
+        m_renderer.visit(solid);
+}
+
+void Culling::visit(SceneNode* node)
+{
+    m_renderer.visit(node);
+}
+
+void Culling::visit(Camera* camera)
+{
+    m_renderer.visit(camera);
+}
+
+void Culling::visit(Light* light)
+{
+    m_renderer.visit(light);
+}
+
+SceneNodeVisitor* Culling::choose(const SceneNode& node)
+{
+    const Vector4f reach = node.getReach();
+    const Vector3f centre = place(node.getWorldTransform(), reach);
+    const float negativeRadius = reach.w * node.getWorldStretch();
+    bool isOutside = true;
+    bool isInside = true;
+    for (int i = 0; i < m_eyeCount; ++i)
+    {
+        const Frustum::Sight sight = m_frustums[i].look(centre, negativeRadius);
+        isOutside = isOutside && sight == Frustum::Sight::OUTSIDE;
+        isInside = isInside && sight == Frustum::Sight::INSIDE;
+    }
+    return isOutside ? nullptr : isInside ? &m_renderer : this;
+}
+
+} // namespace orv::detail
