@@ -165,9 +165,6 @@ private:
     /// Takes over the source's values, without a new revision. @return whether any of the own ones changed.
     virtual bool takeOver(const ShaderUniformBase& source) = 0;
 
-    /// The same, and sends all own values to the current program if any changed.
-    virtual void update(const ShaderUniformBase& source, int location, int textureUnit) = 0;
-
     /// Sends all own values to the current program.
     virtual void send(int location, int textureUnit) const = 0;
 
@@ -255,29 +252,13 @@ private:
 
     bool takeOver(const ShaderUniformBase& source) override
     {
-        const bool fits = source.holds<T>() && source.m_size >= m_size;
-        return fits ? takeOver(static_cast<const ShaderUniform&>(source), m_size) : takeOverMisfit(source);
-    }
-
-    void update(const ShaderUniformBase& source, int location, int textureUnit) override
-    {
-        const bool fits = source.holds<T>() && source.m_size >= m_size;
-        if (fits ? takeOver(static_cast<const ShaderUniform&>(source), m_size) : takeOverMisfit(source))
-            sendValues(location, textureUnit, m_values);
-    }
-
-    [[gnu::noinline]] bool takeOverMisfit(const ShaderUniformBase& source)
-    {
-        assertSize(&source, m_size);
-        return source.holds<T>() && takeOver(static_cast<const ShaderUniform&>(source), source.m_size);
-    }
-
-    /// @param count  of values, at least 1.
-    [[gnu::always_inline]] bool takeOver(const ShaderUniform& source, int count)
-    {
+        if (!source.holds<T>() || source.m_size < m_size) [[unlikely]]
+            assertSize(&source, m_size);
+        if (!source.holds<T>())
+            return false;
         bool changed = false;
-        const T* from = source.m_values;
-        for (T *to = m_values, *const end = to + count; to != end; ++to, ++from)
+        const T* from = static_cast<const ShaderUniform&>(source).m_values;
+        for (T *to = m_values, *const end = to + std::min(m_size, source.m_size); to != end; ++to, ++from)
         {
             if (*to == *from)
                 continue;

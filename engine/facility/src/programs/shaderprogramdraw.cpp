@@ -38,7 +38,9 @@ inline void ShaderProgram::sendIfNew(const detail::UniformSources::Value& value)
     if (uniform.sentRevision == value.source->getRevision())
         return;
     uniform.sentRevision = value.source->getRevision();
-    uniform.sent.get()->update(*value.source, uniform.location, uniform.textureUnit);
+    ShaderUniformBase& sent = *uniform.sent.get();
+    if (sent.takeOver(*value.source))
+        sent.send(uniform.location, uniform.textureUnit);
 }
 
 const detail::UniformSources* ShaderProgram::prepare(RenderContext& context,
@@ -100,7 +102,9 @@ void ShaderProgram::sendHeldTransform(const detail::UniformSources& sources, det
     if (!uniform)
         return;
     uniform->sentRevision = 0;
-    uniform->sent.get()->update(*sources.transformSources[int(transform)], uniform->location, -1);
+    ShaderUniformBase& sent = *uniform->sent.get();
+    if (sent.takeOver(*sources.transformSources[int(transform)]))
+        sent.send(uniform->location, -1);
 }
 
 void ShaderProgram::sendTransform(detail::DrawnUniform& uniform, const Matrix4f& matrix)
