@@ -5,7 +5,7 @@
 #include "guard.h"
 #include "progress.h"
 
-#include <CLI/CLI.hpp>
+#include "commandline/commandline.h"
 
 #include <algorithm>
 #include <cstdio>
@@ -13,9 +13,6 @@
 
 namespace
 {
-
-constexpr int FAILED = 1; // exit codes
-constexpr int MISUSED = 2;
 
 constexpr int LARGEST_TEXTURE = 16384; // pixels, as far as the engine goes
 
@@ -49,7 +46,7 @@ const char* const FOOTER =
 int fail(const std::string& message)
 {
     std::fprintf(stderr, "orv-convert: %s\n", message.c_str());
-    return FAILED;
+    return commandline::FAILED;
 }
 
 /// In a child process.
@@ -169,20 +166,21 @@ int main(int argc, char** argv)
                  "orv-convert");
     Command command;
     addOptions(app, command);
+    commandline::addCommon(app);
     try
     {
         app.parse(argc, argv);
     }
     catch (const CLI::ParseError& error)
     {
-        return app.exit(error) == 0 ? 0 : MISUSED;
+        return commandline::finishParsing(app, error);
     }
     command.options.animation = !command.noAnimation;
     command.options.sparseKeys = command.keys == "sparse";
     if (std::filesystem::path(command.out).extension() != ".glo")
     {
         fail(command.out + ": the output's name has to end in .glo");
-        return MISUSED;
+        return commandline::MISUSED;
     }
-    return run(command);
+    return commandline::finishOutput("orv-convert", run(command));
 }

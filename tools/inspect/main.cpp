@@ -4,7 +4,7 @@
 #include "glochecks.h"
 #include "print.h"
 
-#include <CLI/CLI.hpp>
+#include "commandline/commandline.h"
 
 #include <cstdio>
 #include <filesystem>
@@ -16,8 +16,7 @@ namespace
 
 namespace fs = std::filesystem;
 
-constexpr int WITH_ERRORS = 1; // exit codes
-constexpr int MISUSED = 2;
+constexpr int WITH_ERRORS = commandline::FAILED; // exit codes
 constexpr int WITH_WARNINGS = 3;
 
 constexpr uintmax_t LARGEST_FILE = 0x7fffffff; ///< as the engine's streams
@@ -37,30 +36,27 @@ int printCodes()
     return 0;
 }
 
-bool fail(const std::string& path, const std::string& reason)
-{
-    std::fprintf(stderr, "orv-inspect: %s: %s\n", path.c_str(), reason.c_str());
-    return false;
-}
-
-bool readFile(const std::string& path, std::vector<uint8_t>& bytes)
+/// @return why it cannot be read, or empty.
+std::string readFile(const std::string& path, std::vector<uint8_t>& bytes)
 {
     std::error_code error;
     const uintmax_t size = fs::file_size(path, error);
     if (error)
-        return fail(path, error.message());
+        return error.message();
     if (size > LARGEST_FILE)
-        return fail(path, "larger than two gigabytes");
+        return "larger than two gigabytes";
     std::ifstream file(path, std::ios::binary);
     bytes.assign(std::istreambuf_iterator<char>(file), {});
-    return file.bad() || bytes.size() != size ? fail(path, "cannot be read") : true;
+    return file.bad() || bytes.size() != size ? "cannot be read" : "";
 }
 
-bool inspectFile(const std::string& path, inspect::Report& report)
+/// @return why it cannot be read, or empty.
+std::string inspectFile(const std::string& path, inspect::Report& report)
 {
     std::vector<uint8_t> bytes;
-    if (!readFile(path, bytes))
-        return false;
+    const std::string failure = readFile(path, bytes);
+    if (!failure.empty())
+        return failure;
     const fs::path folder = fs::path(path).parent_path();
     const std::string extension = fs::path(path).extension().string();
     const std::string text(bytes.begin(), bytes.end());
@@ -78,7 +74,7 @@ bool inspectFile(const std::string& path, inspect::Report& report)
             inspect::checkGlo(report.scene, folder, report.findings);
         report.forecast = inspect::forecast(report.scene, folder);
     }
-    return true;
+    return "";
 }
 
 void print(const inspect::Report& report, const Options& options)
@@ -102,8 +98,11 @@ int run(const Options& options)
     for (const std::string& path : options.files)
     {
         inspect::Report report;
-        if (!inspectFile(path, report))
+        const std::string failure = inspectFile(path, report);
+        if (!failure.empty())
         {
+            std::fprintf(stderr, "orv-inspect: %s: %s\n", path.c_str(), failure.c_str());
+            json.push_back({{"file", path}, {"error", failure}});
             unread = true;
             continue;
         }
@@ -143,6 +142,7 @@ int main(int argc, char** argv)
     app.add_flag("--tree", options.tree, "print every chunk with its fields, every statement of a text file");
     app.add_flag("--check", options.check, "print nothing but what is wrong");
     app.add_flag("--json", options.json, "print one JSON array with an object for each file");
+    commandline::addCommon(app);
     app.add_flag("--codes", codes, "list every code with its meaning");
     try
     {
@@ -150,14 +150,14 @@ int main(int argc, char** argv)
     }
     catch (const CLI::ParseError& error)
     {
-        return app.exit(error) == 0 ? 0 : MISUSED;
+        return commandline::finishParsing(app, error);
     }
     if (codes)
-        return printCodes();
+        return commandline::finishOutput("orv-inspect", printCodes());
     if (options.files.empty())
     {
         std::fprintf(stderr, "orv-inspect: no file is named; --help shows how\n");
-        return MISUSED;
+        return commandline::MISUSED;
     }
-    return run(options);
+    return commandline::finishOutput("orv-inspect", run(options));
 }

@@ -6,6 +6,8 @@
 #include "pictures.h"
 #include "viewer.h"
 
+#include "commandline/commandline.h"
+
 #include <cstdio>
 #include <cstdlib>
 #include <filesystem>
@@ -50,7 +52,7 @@ int main(int argumentCount, char** arguments)
     view::loadlog::start();
     std::string error;
     if (run(options, error))
-        return EXIT_SUCCESS;
+        return commandline::finishOutput("orv-view", EXIT_SUCCESS);
     if (!error.empty())
         std::fprintf(stderr, "orv-view: %s\n", error.c_str());
     return EXIT_FAILURE;

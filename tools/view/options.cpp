@@ -1,6 +1,6 @@
 #include "options.h"
 
-#include <CLI/CLI.hpp>
+#include "commandline/commandline.h"
 
 #include <cmath>
 #include <cstdio>
@@ -13,7 +13,6 @@ namespace view
 namespace
 {
 
-constexpr int MISUSED = 2;      // exit code
 constexpr int MAX_EDGE = 16384; // pixels
 constexpr int MAX_PICTURES = 9999;
 constexpr int SHEET_WIDTH = 320; // of one picture in it
@@ -205,6 +204,7 @@ bool parseCommandLine(int argumentCount, char** arguments, Options& options, int
     std::vector<std::string> dressings;
     addSceneOptions(app, options, dressings);
     addPictureOptions(app, options);
+    commandline::addCommon(app);
     exitCode = 0;
     try
     {
@@ -220,7 +220,7 @@ bool parseCommandLine(int argumentCount, char** arguments, Options& options, int
     }
     catch (const CLI::ParseError& error)
     {
-        exitCode = app.exit(error) == 0 ? 0 : MISUSED; // 0: --help
+        exitCode = commandline::finishParsing(app, error);
         return false;
     }
     for (const std::string& text : dressings)

@@ -1,0 +1,49 @@
+#pragma once
+
+#include "orv/version.h"
+
+#include <CLI/CLI.hpp>
+
+#include <cerrno>
+#include <cstdio>
+#include <cstring>
+#include <string>
+
+/// What the command lines of all tools have in common.
+namespace commandline
+{
+
+constexpr int FAILED = 1; ///< exit codes
+constexpr int MISUSED = 2;
+
+/// Gives a command line --version, and errors that begin with the program's name.
+inline void addCommon(CLI::App& app)
+{
+    const orv::Version& version = orv::getVersion();
+    app.set_version_flag("--version", app.get_name() + " " + std::to_string(version.getMajor()) + "." +
+                                          std::to_string(version.getMinor()) + "." +
+                                          std::to_string(version.getPatch()));
+    app.failure_message([](const CLI::App* failed, const CLI::Error& error)
+                        { return failed->get_name() + ": " + error.what() + "; --help shows how\n"; });
+}
+
+/// To be called when all is printed: what could not be written, to a full disk for instance, is an error.
+/// @param exitCode  the program's otherwise.
+/// @return exitCode, FAILED in place of 0 where something is missing.
+inline int finishOutput(const char* program, int exitCode)
+{
+    const bool wasLost = std::ferror(stdout) != 0;
+    if (std::fflush(stdout) == 0 && !wasLost)
+        return exitCode;
+    std::fprintf(stderr, "%s: standard output: %s\n", program,
+                 errno ? std::strerror(errno) : "cannot be written");
+    return exitCode == 0 ? FAILED : exitCode;
+}
+
+/// The same for a command line that did not parse, or asked for help or the version.
+inline int finishParsing(const CLI::App& app, const CLI::ParseError& error)
+{
+    return finishOutput(app.get_name().c_str(), app.exit(error) == 0 ? 0 : MISUSED);
+}
+
+} // namespace commandline
