@@ -3,6 +3,9 @@
 #include "support/gltest.h"
 #include "support/picture.h"
 
+#include <algorithm>
+#include <cstdlib>
+
 using support::GlTest;
 
 namespace
@@ -87,6 +90,23 @@ TEST_F(GlCallsTest, failuresEndWithReset)
     glGenTextures(1, &texture);
     EXPECT_TRUE(texture && glCreateProgram());
     EXPECT_EQ(GLenum(GL_FRAMEBUFFER_COMPLETE), glCheckFramebufferStatus(GL_FRAMEBUFFER));
+}
+
+// Fault caught: an error that is written down beside the wrong call, or kept from the program that made it.
+TEST_F(GlCallsTest, checksEachCallWhereTheEnvironmentSaysSo)
+{
+    setenv("ORV_GL_CHECK", "1", 1);
+    glcalls::reset();
+    testing::internal::CaptureStderr();
+    glEnable(GL_BLEND);
+    glEnable(0x0bad);
+    glDisable(GL_BLEND);
+    const std::string said = testing::internal::GetCapturedStderr();
+    unsetenv("ORV_GL_CHECK");
+    EXPECT_EQ(0u, said.find("GL error 0x0500: glEnable(0x0bad); bound are program 0,")) << said;
+    EXPECT_EQ(1, std::count(said.begin(), said.end(), '\n')) << said;
+    EXPECT_EQ(GLenum(GL_INVALID_ENUM), glGetError());
+    EXPECT_EQ(GLenum(GL_NO_ERROR), glGetError());
 }
 
 // Fault caught: a replacement that calls the entry point it replaces and never comes back.
