@@ -15,6 +15,8 @@
 #include "facilitytest.h"
 #include "imagefiles.h"
 
+#include <algorithm>
+#include <cstring>
 #include <functional>
 #include <limits>
 
@@ -247,6 +249,12 @@ TEST_F(LoadTest, logStaysShort)
         loadLines(test.line, 500);
         EXPECT_LE(1, log.countMessage(test.first)) << log.text();
         EXPECT_GE(20u, log.records().size()) << test.line;
+        const std::vector<LogCapture::Record> records = log.records();
+        const auto explains = [](const LogCapture::Record& record)
+        { return record.message.find("\"none0.png\" was looked for in: ") == 0; };
+        EXPECT_EQ(std::strstr(test.line, "none") ? 1 : 0,
+                  std::count_if(records.begin(), records.end(), explains))
+            << log.text();
     }
     std::string program = "1.0\nvertex_source_file orv#error.vert\nfragment_source_file orv#error.frag\n";
     for (int i = 0; i < 500; ++i)

@@ -85,9 +85,9 @@ SharedPtr<Stream> AssetCachePool::getStream(const char* name) const
     return m_assetPath->find(name);
 }
 
-std::string AssetCachePool::describePath() const
+void AssetCachePool::explainMissing(const char* name) const
 {
-    return m_assetPath->describe();
+    m_assetPath->explainMissing(name);
 }
 
 SharedPtr<Stream> AssetCachePool::getCacheStream(const char* name, bool writable) const

@@ -44,8 +44,9 @@ public:
     /// Opens a file by its exact name. @return empty if no source has it.
     SharedPtr<Stream> getStream(const char* name) const;
 
-    /// The names of the sources in the order in which getStream() asks them, for messages.
-    std::string describePath() const;
+    /// To be called after a message about a file that may not have been found: where no source has it, logs a warning that
+    /// says where it was looked for, once in a load.
+    void explainMissing(const char* name) const;
 
     /// Opens a file of derived data; for writing, the source makes the folders of its name.
     /// @return empty without a cache source or where it cannot be opened.

@@ -1,7 +1,9 @@
 #include "orv/detail/assetpath.h"
 
 #include "orv/detail/loadscope.h"
+#include "orv/log.h"
 
+#include <algorithm>
 #include <string_view>
 
 namespace orv::detail
@@ -78,6 +80,17 @@ std::string AssetPath::describe() const
             names.append(names.empty() ? "" : ", ").append(source->getName());
     }
     return names;
+}
+
+void AssetPath::explainMissing(const char* name) const
+{
+    static const char HERE = 0; // stands for having been here, whichever cache asked
+    const auto hasIt = [name](const SharedPtr<StreamSource>& source)
+    { return source && source->exists(name); };
+    if (LoadScope::hasFailed(&HERE, "") || std::any_of(m_sources.begin(), m_sources.end(), hasIt))
+        return;
+    LoadScope::addFailure(&HERE, "");
+    ORV_LOG_WARN("\"%s\" was looked for in: %s", name, describe().c_str());
 }
 
 void AssetPath::setCacheDirectory(const char* directory)

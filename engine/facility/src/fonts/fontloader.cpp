@@ -84,6 +84,7 @@ Font::Ptr FontLoader::load(AssetCache<Font>& cache, const char* name)
     {
         ORV_LOG_ERROR("Error reading Font \"%s\"", file.c_str());
         ORV_LOG_INFO("Font name %s: %s", normalized.c_str(), fault);
+        cache.getAssetPath()->explainMissing(file.c_str());
         return {};
     }
 

@@ -48,11 +48,17 @@ public:
         while (detail::readStatement(m_text, statement) && readArguments(statement.tag))
             eatWhite(m_text);
         if (m_missingCount > 0)
-            ORV_LOG_ERROR("Appearance file: %s names %u assets that cannot be loaded; the first is %s",
-                          m_name, m_missingCount, m_firstMissing);
+            reportMissing();
     }
 
 private:
+    void reportMissing() const
+    {
+        ORV_LOG_ERROR("Appearance file: %s names %u assets that cannot be loaded; the first is %s", m_name,
+                      m_missingCount, m_firstMissing);
+        m_pool.explainMissing(m_firstMissing);
+    }
+
     using Read = void (AppearanceFileReader::*)();
     using ReadProperty = void (AppearanceFileReader::*)(const char* property);
 
@@ -311,6 +317,7 @@ void Appearance::apply(AssetCachePool& pool, const char* name)
     if (!stream)
     {
         ORV_LOG_ERROR("Appearance file: %s not found", normalized.c_str());
+        pool.explainMissing(normalized.c_str());
         return;
     }
     const FileToString text(*stream);

@@ -50,6 +50,7 @@ bool applyTextureProperty(AssetCachePool& pool, Appearance& appearance, const ch
         if (const SharedPtr<Texture2D> texture = find2D(*pool.getTexture2DCache(), name))
             return appearance.setProperty(propertyName, texture);
         ORV_LOG_ERROR("Failed to find 2d texture \"%s\"; using \"missing\" texture.", name.c_str());
+        pool.explainMissing(name.c_str());
     }
     else if (samplerKind == SAMPLER_KIND_CUBE)
     {

@@ -147,6 +147,7 @@ private:
         if (!stream)
         {
             ORV_LOG_ERROR("Reading vertex shader file: %s", fileName.c_str()); // said of both kinds
+            m_cache.getAssetPath()->explainMissing(fileName.c_str());
             return false;
         }
         const FileToString source(*stream);

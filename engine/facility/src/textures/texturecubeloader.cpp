@@ -101,6 +101,7 @@ SharedPtr<Image> loadImage(AssetCache<TextureCube>& cache, const char* name)
     if (!stream)
     {
         ORV_LOG_ERROR("TextureCube image \"%s\" not found.", name);
+        cache.getAssetPath()->explainMissing(name);
         return {};
     }
     auto image = makeShared<Image>(*stream);

@@ -26,7 +26,8 @@ SharedPtr<Glo> loadGloFile(AssetCachePool& pool, const SharedPtr<SceneNode>& par
     if (!stream)
     {
         ORV_GLO_ERROR("GLO file %s cannot be opened", name ? name : "(null)");
-        ORV_GLO_WARN("It was looked for in: %s", pool.describePath().c_str());
+        if (name)
+            pool.explainMissing(name);
         return {};
     }
     detail::LoadScope::addRead(uint64_t(std::max(stream->size(), 0)));

@@ -46,6 +46,10 @@ public:
     /// The names of the sources in order, with ", " between them, for messages.
     std::string describe() const;
 
+    /// To be called after a message about a file that may not have been found: where no source has it, logs a warning that
+    /// says where it was looked for, once in a load.
+    void explainMissing(const char* name) const;
+
     /// Stored for the application; the engine does not use it.
     void setCacheDirectory(const char* directory);
     const char* getCacheDirectory() const { return m_cacheDirectory.c_str(); }
