@@ -22,13 +22,20 @@ public:
     size_t size() const { return m_count; }
 
 private:
-    size_t findSlot(const float* row) const;
+    /// Of a row; the hash tells most others from it without a look at them.
+    struct Slot
+    {
+        uint32_t number;
+        uint32_t hash;
+    };
+
+    size_t findSlot(const float* row, uint32_t hash) const;
     void grow();
 
     size_t m_width;
     size_t m_count = 0;
     std::vector<float> m_values;
-    std::vector<uint32_t> m_slots; ///< numbers of rows, from where their hashes point on; a power of two
+    std::vector<Slot> m_slots; ///< of rows, from where their hashes point on; a power of two
 };
 
 } // namespace convert
