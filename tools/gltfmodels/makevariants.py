@@ -3,6 +3,7 @@
 
     makevariants.py MODELS NODE_MODULES/.bin OUT_FOLDER
 
+OUT_FOLDER/MADE gets files of rare kinds (tools/gltfpictures/makemodels.py).
 Every glTF 2.0 file below MODELS is one, as are those that `assimp export` makes of some models of other formats; of each
 come variants by gltfpack, gltf-transform and gltf-pipeline. A program that fails on a file makes no variant of it. What
 is in OUT_FOLDER already is kept.
@@ -12,6 +13,9 @@ import os
 import shutil
 import subprocess
 import sys
+
+sys.path.append(os.path.join(os.path.dirname(os.path.abspath(__file__)), "..", "gltfpictures"))
+import makemodels  # noqa: E402
 
 SECONDS = 120  # for one file
 
@@ -99,6 +103,7 @@ def make_variant(base, stem, name, binaries, out):
 def main():
     models, binaries, out = sys.argv[1:]
     os.makedirs(out, exist_ok=True)
+    makemodels.write_all(os.path.join(out, "MADE"))
     bases = make_bases(models, out)
     for path, _ in bases:
         if path.startswith(models):  # beside what they name

@@ -1,14 +1,17 @@
-// Reads a glTF file with three.js and writes where its triangles, lines and points are, at rest and at moments of its
-// animations: node readwiththree.mjs NODE_MODULES MODEL OUT FPS
+// Reads glTF files with three.js and writes where their triangles, lines and points are, at rest and at moments of their
+// animations: node readwiththree.mjs NODE_MODULES FPS
 //
+// Standard input has a line for each file: {model, out} in JSON. Standard output gets one for each in turn: {fault, ms}, what
+// is wrong ("" for nothing) and the processor's milliseconds for loading.
 // OUT: the size of a JSON text (32 bits), the text ({clips, poses}), then for each pose its faces as 32-bit floats: triangles,
-// lines, points. Of "-" it is nothing, and standard output gets the processor's milliseconds for loading.
+// lines, points.
 import fs from 'node:fs';
 import path from 'node:path';
+import readline from 'node:readline';
 import { createRequire } from 'node:module';
 import { pathToFileURL } from 'node:url';
 
-const [modules, model, out, fps] = process.argv.slice(2);
+const [modules, fps] = process.argv.slice(2);
 const load = (file) => import(pathToFileURL(path.join(path.resolve(modules), file)).href);
 const MOST_CORNERS = 600000; // of a pose; larger models are compared at rest alone
 
@@ -62,7 +65,7 @@ function toDataUri(url) {
   return file ? 'data:application/octet-stream;base64,' + fs.readFileSync(file).toString('base64') : url;
 }
 
-async function read() {
+async function read(model) {
   const manager = new THREE.LoadingManager();
   manager.setURLModifier(toDataUri);
   const loader = new GLTFLoader(manager);
@@ -70,8 +73,13 @@ async function read() {
   loader.setDRACOLoader(new DracoHere());
   loader.setKTX2Loader({ load: (url, onLoad) => onLoad(new THREE.Texture()), detectSupport() {} });
   const bytes = fs.readFileSync(model);
-  return loader.parseAsync(bytes.buffer.slice(bytes.byteOffset, bytes.byteOffset + bytes.length),
-                           path.dirname(model) + '/');
+  const gltf = await loader.parseAsync(bytes.buffer.slice(bytes.byteOffset, bytes.byteOffset + bytes.length),
+                                       path.dirname(model) + '/');
+  const { json } = gltf.parser;
+  for (let i = 0; i < (json.nodes?.length ?? 0); ++i) // which three.js does not read
+    if (json.nodes[i].extensions?.KHR_node_visibility?.visible === false)
+      (await gltf.parser.getDependency('node', i)).visible = false;
+  return gltf;
 }
 
 function pickCorners(mesh, count) {
@@ -110,41 +118,53 @@ function pose(scene) {
   return faces;
 }
 
-const start = process.cpuUsage();
-const gltf = await read();
-if (out === '-') {
-  const spent = process.cpuUsage(start);
-  console.log((spent.user + spent.system) / 1000);
-  process.exit(0);
-}
-const poses = [];
-const floats = [];
-function add(clip, time) {
-  const faces = pose(gltf.scene);
-  poses.push({ clip, time, counts: [3, 2, 1].map((count) => faces[count].length / 3 / count) });
-  for (const count of [3, 2, 1]) floats.push(Buffer.from(new Float32Array(faces[count]).buffer));
-  return faces[3].length / 3;
-}
-const size = add(-1, 0);
-const mixer = new THREE.AnimationMixer(gltf.scene);
-for (let clip = 0; clip < gltf.animations.length && size <= MOST_CORNERS; ++clip) {
-  const duration = gltf.animations[clip].duration;
-  const action = mixer.clipAction(gltf.animations[clip]);
-  action.setLoop(THREE.LoopOnce);
-  action.clampWhenFinished = true;
-  const samples = Math.ceil(duration * fps - 1e-6);
-  for (const sample of new Set([0, Math.floor(samples / 3), Math.floor((2 * samples) / 3), samples])) {
-    action.reset().play();
-    const time = Math.min(sample / fps, duration);
-    mixer.setTime(time);
-    add(clip, time);
+function write(gltf, out) {
+  const poses = [];
+  const floats = [];
+  function add(clip, time) {
+    const faces = pose(gltf.scene);
+    poses.push({ clip, time, counts: [3, 2, 1].map((count) => faces[count].length / 3 / count) });
+    for (const count of [3, 2, 1]) floats.push(Buffer.from(new Float32Array(faces[count]).buffer));
+    return faces[3].length / 3;
   }
-  action.stop();
-  mixer.uncacheAction(gltf.animations[clip]);
+  const size = add(-1, 0);
+  const mixer = new THREE.AnimationMixer(gltf.scene);
+  for (let clip = 0; clip < gltf.animations.length && size <= MOST_CORNERS; ++clip) {
+    const duration = gltf.animations[clip].duration;
+    const action = mixer.clipAction(gltf.animations[clip]);
+    action.setLoop(THREE.LoopOnce);
+    action.clampWhenFinished = true;
+    const samples = Math.ceil(duration * fps - 1e-6);
+    for (const sample of new Set([0, Math.floor(samples / 3), Math.floor((2 * samples) / 3), samples])) {
+      action.reset().play();
+      const time = Math.min(sample / fps, duration);
+      mixer.setTime(time);
+      add(clip, time);
+    }
+    action.stop();
+    mixer.uncacheAction(gltf.animations[clip]);
+  }
+  const clips = gltf.animations.map((clip) => ({ name: clip.name, duration: clip.duration }));
+  const text = Buffer.from(JSON.stringify({ clips, poses }));
+  const head = Buffer.alloc(4);
+  head.writeUInt32LE(text.length);
+  fs.writeFileSync(out, Buffer.concat([head, text, ...floats]));
 }
-const clips = gltf.animations.map((clip) => ({ name: clip.name, duration: clip.duration }));
-const text = Buffer.from(JSON.stringify({ clips, poses }));
-const head = Buffer.alloc(4);
-head.writeUInt32LE(text.length);
-fs.writeFileSync(out, Buffer.concat([head, text, ...floats]));
+
+process.on('unhandledRejection', () => {}); // of a part that nobody waits for any more, once another has failed
+for await (const line of readline.createInterface({ input: process.stdin })) {
+  const { model, out } = JSON.parse(line);
+  let fault = '';
+  let ms = 0;
+  try {
+    const start = process.cpuUsage();
+    const gltf = await read(model);
+    const spent = process.cpuUsage(start);
+    ms = (spent.user + spent.system) / 1000;
+    write(gltf, out);
+  } catch (error) {
+    fault = String(error) || 'Error';
+  }
+  console.log(JSON.stringify({ fault, ms }));
+}
 process.exit(0);

@@ -4,10 +4,11 @@ TargetRealtime_Quality makes of it), three.js's loading.
 
     timegltf.py CONVERTER TOOLBENCH NODE_MODULES FOLDER [OTHER_CONVERTER]
 
-FOLDER is what makevariants.py made; three large files are added to it. Times are of the processor in ms (user and system,
+FOLDER is what makevariants.py made; large files are made beside it. Times are of the processor in ms (user and system,
 all processes), the best of several, since others may use the machine; three.js's without the start of node. With another
 converter, its times, too.
 """
+import json
 import os
 import resource
 import subprocess
@@ -29,14 +30,14 @@ FILES = (
     ("engine, 75,730 triangles", "as-it-is/glTF2/2CylinderEngine-glTF-Binary/2CylinderEngine.glb"),
     ("the same, meshopt", ENGINE + "/pack-cc.glb"),
     ("the same, Draco", ENGINE + "/pipeline-draco.glb"),
-    ("grid, 1,152,162 triangles", "MADE/grid/model.gltf"),
-    ("the same, quantised and meshopt", "MADE/grid/meshopt.glb"),
-    ("the same, Draco", "MADE/grid/draco.glb"),
+    ("grid, 1,152,162 triangles", "../gltftimes/model.gltf"),
+    ("the same, quantised and meshopt", "../gltftimes/meshopt.glb"),
+    ("the same, Draco", "../gltftimes/draco.glb"),
 )
 
 
 def make_grid(folder, binaries):
-    home = os.path.join(folder, "MADE", "grid")
+    home = os.path.join(folder, "..", "gltftimes")
     os.makedirs(home, exist_ok=True)
     whole = os.path.join(home, "model.gltf")
     if not os.path.exists(whole):
@@ -73,9 +74,10 @@ def measure(command):
 
 
 def load_with_three(modules, path):
-    command = ["node", os.path.join(HERE, "readwiththree.mjs"), modules, path, "-", "30"]
-    times = [subprocess.run(command, capture_output=True, text=True).stdout for _ in range(ROUNDS)]
-    return min((float(time) for time in times if time), default=None)
+    command = ["node", os.path.join(HERE, "readwiththree.mjs"), modules, "30"]
+    request = json.dumps({"model": path, "out": os.devnull}) + "\n"
+    answers = [subprocess.run(command, capture_output=True, text=True, input=request).stdout for _ in range(ROUNDS)]
+    return min((json.loads(answer)["ms"] for answer in answers if answer), default=None)
 
 
 def main():
@@ -87,7 +89,7 @@ def main():
     for kind, name in FILES:
         path = os.path.join(folder, name)
         scene = os.path.join(folder, "timed.glo")
-        size = sum(os.path.getsize(path[: -len("gltf")] + end) for end in ("gltf", "bin")) if "MADE" in path and \
+        size = sum(os.path.getsize(path[: -len("gltf")] + end) for end in ("gltf", "bin")) if "gltftimes" in path and \
             path.endswith("gltf") else os.path.getsize(path)
         times = [measure([program, path, scene]) for program in [converter, *others]]
         times += [measure([bench, way, path]) for way in ("--read", "--read-for-drawing")]

@@ -294,10 +294,7 @@ def write_page(docs, rows, sheets):
 
 def main():
     converter, viewer, modules, chromium, folder, docs, *names = sys.argv[1:]
-    for name, make in makemodels.MODELS.items():
-        home = os.path.join(folder, "MADE", name)
-        os.makedirs(home, exist_ok=True)
-        make(home)
+    makemodels.write_all(os.path.join(folder, "MADE"))
     chosen = [model for model in MODELS if not names or model.name in names]
     failed = False
     with tempfile.TemporaryDirectory(ignore_cleanup_errors=True) as scratch:

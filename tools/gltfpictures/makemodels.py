@@ -508,4 +508,12 @@ def make_bumps(folder):
     gltf.write(folder)
 
 
+def write_all(folder):
+    """Each model into a folder of its own."""
+    for name, make in MODELS.items():
+        home = os.path.join(folder, name)
+        os.makedirs(home, exist_ok=True)
+        make(home)
+
+
 MODELS = {name[5:].replace("_", ""): function for name, function in list(globals().items()) if name.startswith("make_")}

@@ -54,7 +54,7 @@ PAIRS = (
          "The same curve, in two parts here as shaders have 20 joints, without a seam. The sheen is the engine's highlight "
          "for a roughness of 0.6, which Cycles spreads farther.", 1.0),
     Pair("morphcube", "glTF2/glTF-Sample-Models/AnimatedMorphCube-glTF/AnimatedMorphCube.gltf", "blender",
-         "glTF 2.0, morph targets", "The same shape at rest. The other shapes are lost, as the report says."),
+         "glTF 2.0, morph targets", "The same shape at rest. While the animation plays, meshes of other shapes take turns."),
     Pair("skeleton", "FBX/animation_with_skeleton.fbx", "blender", "FBX, skin, animated, at 0.4 s",
          "The same pose. Where the rod bends it is a little narrower here: up to six joints pull at a vertex, of which the "
          "engine has four. The file's own lamp, from below, lights it here; Blender's picture has lamps of its own.", 0.4),
