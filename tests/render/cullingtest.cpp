@@ -21,6 +21,8 @@ using namespace orv;
 namespace
 {
 
+constexpr int FRAMES = 6000;
+
 using Place = std::array<double, 4>;
 using Transform = std::array<std::array<double, 4>, 4>; // columns
 
@@ -465,7 +467,7 @@ protected:
 TEST_F(CullingTest, leavesNothingOutThatMayBeSeen)
 {
     makeScene();
-    for (int frame = 0; frame < 20000 && !HasFailure(); ++frame)
+    for (int frame = 0; frame < FRAMES && !HasFailure(); ++frame)
     {
         changeScene();
         placeCamera();
@@ -486,7 +488,7 @@ TEST_F(CullingTest, leavesNothingOutThatAMirrorMayShow)
         {{"u_transform", "T_MODEL_VIEW_PROJECTION"}, {"u_mirror", "M_MIRROR_TEXTURE"}}));
     addSolid(makeMesh(true), appearance, scene);
     const SharedPtr<Solid> added = items[lastCount].solid;
-    for (int frame = 0; frame < 2000 && !HasFailure(); ++frame)
+    for (int frame = 0; frame < FRAMES / 4 && !HasFailure(); ++frame)
     {
         if (frame % 10 == 0) // with one or without
         {

@@ -13,6 +13,8 @@
 namespace orv
 {
 
+class MeshGeometry;
+
 struct MeshHeader
 {
     static constexpr float INVALID_BOUNDING_RADIUS = -1.0f;
@@ -52,6 +54,12 @@ public:
     const std::vector<Bounds>& getJointBounds() const { return m_jointBounds; }
     void setJointBounds(std::vector<Bounds> bounds);
 
+    /// The triangles in memory, for exact bounds of what joints move and for pick(); empty unless they were asked for:
+    /// MeshData::GEOMETRY keeps those of scene files.
+    const SharedPtr<MeshGeometry>& getGeometry() const { return m_geometry; }
+    /// @param geometry  shared; what the mesh draws, or empty to keep nothing.
+    void setGeometry(const SharedPtr<MeshGeometry>& geometry);
+
     detail::DrawMark& getDrawMark() const { return m_drawMark; } ///< the renderer's
 
     /// Draw path: the centre of a sphere around the mesh and, in w, its radius below 0: minus infinity where the bounds
@@ -71,6 +79,7 @@ private:
     bool m_isCentred = true;
     Bounds m_bounds;
     std::vector<Bounds> m_jointBounds;
+    SharedPtr<MeshGeometry> m_geometry;
 };
 
 } // namespace orv

@@ -1,6 +1,7 @@
 #include "orv/mesh.h"
 
 #include "orv/detail/boundsrevision.h"
+#include "orv/meshgeometry.h"
 
 #include <cmath>
 #include <limits>
@@ -62,6 +63,11 @@ void Mesh::setBounds(const Bounds& bounds)
 void Mesh::setJointBounds(std::vector<Bounds> bounds)
 {
     m_jointBounds = std::move(bounds);
+}
+
+void Mesh::setGeometry(const SharedPtr<MeshGeometry>& geometry)
+{
+    m_geometry = geometry;
 }
 
 } // namespace orv

@@ -3,6 +3,7 @@
 #include "orv/mesh.h"
 
 #include <algorithm>
+#include <utility>
 #include <vector>
 
 namespace orv
@@ -10,26 +11,6 @@ namespace orv
 
 namespace
 {
-
-/// Whether each vertex is drawn.
-std::vector<bool> findDrawn(const MeshVertices& vertices, const unsigned short* indices, std::size_t count)
-{
-    std::vector<bool> drawn(vertices.places.size(), !indices);
-    for (std::size_t i = 0; indices && i < count; ++i)
-        drawn[indices[i]] = true;
-    return drawn;
-}
-
-Bounds findBounds(const MeshVertices& vertices, const std::vector<bool>& drawn)
-{
-    std::vector<Vector3f> places;
-    for (std::size_t i = 0; i < drawn.size(); ++i)
-    {
-        if (drawn[i])
-            places.push_back(vertices.places[i]);
-    }
-    return computeBounds(places.data(), places.size());
-}
 
 bool isShare(float weight)
 {
@@ -55,26 +36,6 @@ bool forEachShare(const MeshVertices& vertices, const std::vector<bool>& drawn, 
     return areShares;
 }
 
-std::vector<Bounds> findJointBounds(const MeshVertices& vertices, const std::vector<bool>& drawn)
-{
-    std::vector<Box> boxes;
-    const auto addPlace = [&boxes](uint8_t joint, const Vector3f& place)
-    {
-        if (boxes.size() <= joint)
-            boxes.resize(std::size_t(joint) + 1);
-        boxes[joint].add(place);
-    };
-    if (!forEachShare(vertices, drawn, addPlace))
-        return {};
-    std::vector<Bounds> bounds;
-    for (const Box& box : boxes)
-        bounds.push_back(Bounds(box, box.isEmpty() ? -1.0f : 0.0f));
-    const auto growRadius = [&bounds](uint8_t joint, const Vector3f& place)
-    { bounds[joint].radius = std::max(bounds[joint].radius, length(place - bounds[joint].box.getCentre())); };
-    forEachShare(vertices, drawn, growRadius);
-    return bounds;
-}
-
 } // namespace
 
 MeshVertices::Influence makeInfluence(const Vector4f& joints, const Vector4f& weights)
@@ -91,12 +52,78 @@ MeshVertices::Influence makeInfluence(const Vector4f& joints, const Vector4f& we
     return influence;
 }
 
-void setBounds(Mesh& mesh, const MeshVertices& vertices, const unsigned short* indices, std::size_t count)
+MeshGeometry::MeshGeometry(const MeshVertices::Ptr& vertices, IndexBuffer::Primitive primitive,
+                           const unsigned short* indices, std::size_t count)
+    : m_vertices(vertices)
+    , m_drawn(vertices->places.size())
 {
-    const std::vector<bool> drawn = findDrawn(vertices, indices, count);
-    mesh.setBounds(findBounds(vertices, drawn));
-    if (!vertices.influences.empty())
-        mesh.setJointBounds(findJointBounds(vertices, drawn));
+    std::vector<uint32_t> order(indices, indices ? indices + count : indices);
+    for (uint32_t i = 0; !indices && i < m_drawn.size(); ++i)
+        order.push_back(i);
+    for (const uint32_t vertex : order)
+    {
+        if (vertex < m_drawn.size())
+            m_drawn[vertex] = true;
+    }
+    addTriangles(primitive, order);
+}
+
+MeshGeometry::~MeshGeometry() = default;
+
+void MeshGeometry::addTriangles(IndexBuffer::Primitive primitive, const std::vector<uint32_t>& order)
+{
+    const bool isFan = primitive == IndexBuffer::Primitive::TRIANGLE_FAN;
+    const bool isStrip = primitive == IndexBuffer::Primitive::TRIANGLE_STRIP;
+    if (!isFan && !isStrip && primitive != IndexBuffer::Primitive::TRIANGLES)
+        return;
+    for (std::size_t i = 2; i < order.size(); i += isFan || isStrip ? 1 : 3)
+    {
+        uint32_t corners[3] = {order[isFan ? 0 : i - 2], order[i - 1], order[i]};
+        if (isStrip && i % 2 != 0) // every other triangle of a strip is wound the other way
+            std::swap(corners[0], corners[1]);
+        const auto isThere = [this](uint32_t vertex) { return vertex < m_drawn.size(); };
+        if (std::all_of(corners, corners + 3, isThere))
+            m_triangles.insert(m_triangles.end(), corners, corners + 3);
+    }
+}
+
+Bounds MeshGeometry::findBounds() const
+{
+    std::vector<Vector3f> places;
+    for (std::size_t i = 0; i < m_drawn.size(); ++i)
+    {
+        if (m_drawn[i])
+            places.push_back(m_vertices->places[i]);
+    }
+    return computeBounds(places.data(), places.size());
+}
+
+std::vector<Bounds> MeshGeometry::findJointBounds() const
+{
+    if (m_vertices->influences.empty())
+        return {};
+    std::vector<Box> boxes;
+    const auto addPlace = [&boxes](uint8_t joint, const Vector3f& place)
+    {
+        if (boxes.size() <= joint)
+            boxes.resize(std::size_t(joint) + 1);
+        boxes[joint].add(place);
+    };
+    if (!forEachShare(*m_vertices.get(), m_drawn, addPlace))
+        return {};
+    std::vector<Bounds> bounds;
+    for (const Box& box : boxes)
+        bounds.push_back(Bounds(box, box.isEmpty() ? -1.0f : 0.0f));
+    const auto growRadius = [&bounds](uint8_t joint, const Vector3f& place)
+    { bounds[joint].radius = std::max(bounds[joint].radius, length(place - bounds[joint].box.getCentre())); };
+    forEachShare(*m_vertices.get(), m_drawn, growRadius);
+    return bounds;
+}
+
+void setBounds(Mesh& mesh, const MeshGeometry& geometry)
+{
+    mesh.setBounds(geometry.findBounds());
+    mesh.setJointBounds(geometry.findJointBounds());
 }
 
 } // namespace orv

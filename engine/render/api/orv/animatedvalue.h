@@ -3,6 +3,8 @@
 #include "orv/shared.h"
 #include "orv/sharedptr.h"
 
+#include <vector>
+
 namespace orv
 {
 
@@ -24,6 +26,12 @@ public:
     {
         from = to = getValue(time);
         return 0.0f;
+    }
+
+    /// Adds the times at which the value changes; those at which it starts and ends unless it knows more.
+    virtual void addTimes(std::vector<float>& times) const
+    {
+        times.insert(times.end(), {getStart(), getEnd()});
     }
 };
 

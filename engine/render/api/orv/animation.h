@@ -4,6 +4,8 @@
 #include "orv/shared.h"
 #include "orv/sharedptr.h"
 
+#include <vector>
+
 namespace orv
 {
 
@@ -17,6 +19,12 @@ public:
     virtual void apply(float progress) = 0;
     virtual float getStart() const = 0;
     virtual float getEnd() const = 0;
+
+    /// Adds the times at which what it applies changes, in any order; those at which it starts and ends unless it knows more.
+    virtual void addTimes(std::vector<float>& times) const
+    {
+        times.insert(times.end(), {getStart(), getEnd()});
+    }
 
     /// Whether applying this applies other: true for itself, for a group also for its members' members. A class that
     /// holds further animations asks them.

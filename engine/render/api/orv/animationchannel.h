@@ -48,6 +48,12 @@ public:
         return value ? value->getEnd() : 0.0f;
     }
 
+    void addTimes(std::vector<float>& times) const override
+    {
+        if (m_value)
+            m_value->addTimes(times);
+    }
+
 protected:
     void applyAs(bool isInterpolated, float progress, const AnimationMix& mix)
     {

@@ -24,6 +24,7 @@ public:
     void apply(float progress) override;
     float getStart() const override; ///< the earliest of the members', 0 without members
     float getEnd() const override;   ///< the latest of the members', 0 without members
+    void addTimes(std::vector<float>& times) const override;
     bool contains(const Animation& other) const override;
     void applyMixed(float progress, const AnimationMix& mix) override;
 

@@ -86,6 +86,12 @@ public:
     /// The last key's time, 0 without keys.
     float getEnd() const override { return m_keys.empty() ? 0.0f : m_keys.back().time; }
 
+    void addTimes(std::vector<float>& times) const override
+    {
+        for (const AnimationKey<T>& key : m_keys)
+            times.push_back(key.time);
+    }
+
 private:
     /// The first key after a time.
     typename std::vector<AnimationKey<T>>::const_iterator findLater(float time) const

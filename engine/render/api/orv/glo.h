@@ -128,8 +128,9 @@ private:
 /// What is worked out about the meshes of a scene file, beyond what is needed to draw them.
 enum class MeshData
 {
-    NONE,  ///< no vertex is looked at
-    BOUNDS ///< how far each mesh reaches, and what each joint moves of it: see Mesh::getBounds()
+    NONE,    ///< no vertex is looked at
+    BOUNDS,  ///< how far each mesh reaches, and what each joint moves of it: see Mesh::getBounds()
+    GEOMETRY ///< the same, and all vertices and triangles stay in memory: see Mesh::getGeometry()
 };
 
 /// Loads a scene file and hangs its tree under a node.

@@ -194,12 +194,9 @@ private:
     template <class Use>
     ORV_LOCAL void forEachReach(const Use& use) const;
 
-    /// What those above this node know of it does not hold any longer. Next to nothing where nobody has asked.
-    void forgetReachAbove() const
-    {
-        if (m_reachState != ReachState::UNKNOWN) [[unlikely]]
-            forgetReach(m_parent);
-    }
+    /// What those above this node know of it does not hold any longer.
+    ORV_LOCAL void changeKnownPlace();
+    /// Of this node and those above it.
     static void forgetReach(const SceneNode* node);
 
     mutable bool m_localMirrored = false;

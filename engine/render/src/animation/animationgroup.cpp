@@ -22,6 +22,12 @@ void AnimationGroup::addAnimation(const Animation::Ptr& animation)
     m_animations.push_back(animation);
 }
 
+void AnimationGroup::addTimes(std::vector<float>& times) const
+{
+    for (const Animation::Ptr& animation : m_animations)
+        animation->addTimes(times);
+}
+
 bool AnimationGroup::contains(const Animation& other) const
 {
     for (const Animation::Ptr& animation : m_animations)

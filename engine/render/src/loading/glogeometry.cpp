@@ -96,18 +96,29 @@ SharedPtr<MeshVertices> readVertices(const Geometry& geometry, FileVersion versi
     return vertices;
 }
 
-/// Of the vertices that the set draws.
-float getRadius(const PrimitiveSet& set, const MeshVertices& vertices)
+/// About the origin, of the vertices that are drawn.
+float getRadius(const MeshGeometry& geometry)
 {
     float largest = 0.0f;
-    const auto addPlace = [&largest](const Vector3f& place)
-    { largest = std::max(largest, dot(place, place)); };
-    if (!set.indices)
-        std::for_each(vertices.places.begin(), vertices.places.end(), addPlace);
-    else
-        for (const uint16_t index : set.indices->indices)
-            addPlace(vertices.places[index]);
+    const std::vector<Vector3f>& places = geometry.getVertices().places;
+    for (size_t i = 0; i < places.size(); ++i)
+    {
+        if (geometry.getDrawn()[i])
+            largest = std::max(largest, dot(places[i], places[i]));
+    }
     return std::sqrt(largest);
+}
+
+/// @param vertices  empty where nothing is to be known of the mesh.
+/// @return empty then.
+SharedPtr<MeshGeometry> makeMeshGeometry(const PrimitiveSet& set, const SharedPtr<MeshVertices>& vertices)
+{
+    if (!vertices || vertices->places.empty())
+        return {};
+    if (!set.indices)
+        return makeShared<MeshGeometry>(vertices, getPrimitive(set.primitive), nullptr, 0);
+    const std::vector<uint16_t>& indices = set.indices->indices;
+    return makeShared<MeshGeometry>(vertices, getPrimitive(set.primitive), indices.data(), indices.size());
 }
 
 SharedPtr<IndexBuffer> makeIndexBuffer(IndexBufferCache& cache, const PrimitiveSet& set, uint32_t vertexCount)
@@ -194,13 +205,13 @@ bool makeGeometry(AssetCachePool& pool, Geometry& geometry, FileVersion version,
 
     const SharedPtr<MeshVertices> places =
         wanted != MeshData::NONE ? readVertices(geometry, version) : SharedPtr<MeshVertices>();
-    const bool isMeasured = places && !places->places.empty();
     bytes = {};
     for (const PrimitiveSet& set : geometry.primitiveSets)
     {
         MeshHeader header;
-        if (isMeasured)
-            header.boundingRadius = getRadius(set, *places);
+        const SharedPtr<MeshGeometry> meshGeometry = makeMeshGeometry(set, places);
+        if (meshGeometry)
+            header.boundingRadius = getRadius(*meshGeometry);
         const SharedPtr<IndexBuffer> indexBuffer =
             makeIndexBuffer(*pool.getIndexBufferCache(), set, vertices.vertexCount);
         const SharedPtr<Mesh> mesh =
@@ -208,9 +219,10 @@ bool makeGeometry(AssetCachePool& pool, Geometry& geometry, FileVersion version,
                         : SharedPtr<Mesh>();
         if (!mesh)
             return fail(geometry, fileName);
-        if (isMeasured)
-            setBounds(*mesh, *places, set.indices ? set.indices->indices.data() : nullptr,
-                      set.indices ? set.indices->indices.size() : 0);
+        if (meshGeometry)
+            setBounds(*mesh, *meshGeometry);
+        if (wanted == MeshData::GEOMETRY)
+            mesh->setGeometry(meshGeometry);
         made.meshes.push_back(mesh);
     }
     return true;

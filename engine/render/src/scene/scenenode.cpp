@@ -83,7 +83,7 @@ void SceneNode::setLocalTransform(const Matrix4f& transform)
     m_localTransformChanged = false;
     m_localRigid = false;
     m_localMirrored = determinant(upper3x3(transform)) < 0.0f;
-    forgetReachAbove();
+    forgetReach(m_parent);
     setWorldTransformChanged();
 }
 

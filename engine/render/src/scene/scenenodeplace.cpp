@@ -35,7 +35,14 @@ void SceneNode::setScale(const Vector3f& scale)
 void SceneNode::setTransformChanged()
 {
     m_localTransformChanged = true;
-    forgetReachAbove();
+    if (m_reachState != ReachState::UNKNOWN) [[unlikely]]
+        return changeKnownPlace();
+    setWorldTransformChanged();
+}
+
+[[gnu::noinline]] void SceneNode::changeKnownPlace()
+{
+    forgetReach(m_parent);
     setWorldTransformChanged();
 }
 

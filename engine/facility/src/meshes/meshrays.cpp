@@ -1,0 +1,182 @@
+// How rays find the triangles of a mesh; the rest of the class is in meshgeometry.cpp.
+
+#include "orv/meshgeometry.h"
+
+#include <algorithm>
+#include <cmath>
+#include <limits>
+#include <numeric>
+
+namespace orv
+{
+
+namespace
+{
+
+constexpr uint32_t FEW = 4; ///< triangles that are not worth halving
+
+/// @param hit  changes to this triangle if the ray meets it sooner than what it holds, or as soon and it comes first.
+void meetTriangle(const Ray& ray, const Vector3f& a, const Vector3f& b, const Vector3f& c,
+                  TriangleSides sides, uint32_t triangle, MeshGeometry::Hit& hit, bool& isMet)
+{
+    const Vector3f ab = b - a;
+    const Vector3f ac = c - a;
+    const Vector3f perpendicular = cross(ray.direction, ac);
+    const float determinant = dot(ab, perpendicular); // above 0: the ray comes from the front
+    if ((sides == TriangleSides::FRONT && determinant < 0.0f) ||
+        (sides == TriangleSides::BACK && determinant > 0.0f))
+        return;
+    const float reciprocal =
+        1.0f / determinant; // infinite for a ray in the plane: no comparison below holds then
+    const Vector3f start = ray.position - a;
+    const float u = dot(start, perpendicular) * reciprocal;
+    if (!(u >= 0.0f && u <= 1.0f))
+        return;
+    const Vector3f other = cross(start, ab);
+    const float v = dot(ray.direction, other) * reciprocal;
+    const float distance = dot(ac, other) * reciprocal;
+    if (!(v >= 0.0f && u + v <= 1.0f && distance >= 0.0f))
+        return;
+    const bool isFirst =
+        distance < hit.distance || (isMet && distance == hit.distance && triangle < hit.triangle);
+    if (isFirst)
+        hit = {distance, triangle};
+    isMet = isMet || isFirst;
+}
+
+/// A ray made ready for many boxes. They count as a little larger than they are, so that what lies on their sides is inside.
+class BoxRay
+{
+public:
+    explicit BoxRay(const Ray& ray)
+    {
+        for (int axis = 0; axis < 3; ++axis)
+        {
+            m_start[axis] = ray.position.data()[axis];
+            m_reciprocal[axis] = 1.0f / ray.direction.data()[axis];
+        }
+    }
+
+    /// @return where the ray enters the box; infinity if that is beyond limit, or it does not.
+    float enter(const Box& box, float limit) const
+    {
+        constexpr float ROUNDING = 1e-5f;
+        float from = 0.0f;
+        float to = limit;
+        for (int axis = 0; axis < 3; ++axis)
+        {
+            const float low = box.lowest.data()[axis];
+            const float high = box.highest.data()[axis];
+            const float slack = ROUNDING * (std::fabs(low) + std::fabs(high) + std::fabs(m_start[axis]));
+            const float first = (low - slack - m_start[axis]) * m_reciprocal[axis];
+            const float second = (high + slack - m_start[axis]) * m_reciprocal[axis];
+            from = std::max(
+                from, std::min(first, second)); // what is no number, on the side of a box, changes nothing
+            to = std::min(to, std::max(first, second));
+        }
+        return from <= to * (1.0f + ROUNDING) ? from : std::numeric_limits<float>::infinity();
+    }
+
+private:
+    float m_start[3];
+    float m_reciprocal[3];
+};
+
+} // namespace
+
+bool MeshGeometry::meet(const Ray& ray, TriangleSides sides, const std::vector<Vector3f>& places,
+                        Hit& hit) const
+{
+    bool isMet = false;
+    for (std::size_t i = 0; sides != TriangleSides::NONE && i < m_triangles.size(); i += 3)
+        meetTriangle(ray, places[m_triangles[i]], places[m_triangles[i + 1]], places[m_triangles[i + 2]],
+                     sides, uint32_t(i / 3), hit, isMet);
+    return isMet;
+}
+
+bool MeshGeometry::meet(const Ray& ray, TriangleSides sides, Hit& hit) const
+{
+    if (sides == TriangleSides::NONE || m_triangles.empty())
+        return false;
+    if (m_nodes.empty())
+        sort();
+    const std::vector<Vector3f>& places = m_vertices->places;
+    const BoxRay boxRay(ray);
+    bool isMet = false;
+    uint32_t waiting[64]; // one for each level at most, and halves of halves have no more than 32
+    int count = 0;
+    waiting[count++] = 0;
+    while (count > 0)
+    {
+        const uint32_t index = waiting[--count];
+        const Node& node = m_nodes[index];
+        if (!(boxRay.enter(node.box, hit.distance) < std::numeric_limits<float>::infinity()))
+            continue;
+        for (uint32_t i = node.first; i < node.first + node.count; ++i)
+        {
+            const uint32_t* const corners = &m_triangles[std::size_t(m_order[i]) * 3];
+            meetTriangle(ray, places[corners[0]], places[corners[1]], places[corners[2]], sides, m_order[i],
+                         hit, isMet);
+        }
+        if (node.count > 0)
+            continue;
+        // The nearer half first: what it has may do without the other.
+        const bool isFirstNearer = boxRay.enter(m_nodes[index + 1].box, hit.distance) <=
+                                   boxRay.enter(m_nodes[node.first].box, hit.distance);
+        waiting[count++] = isFirstNearer ? node.first : index + 1;
+        waiting[count++] = isFirstNearer ? index + 1 : node.first;
+    }
+    return isMet;
+}
+
+Box MeshGeometry::findBox(uint32_t triangle) const
+{
+    Box box;
+    for (std::size_t i = 0; i < 3; ++i)
+        box.add(m_vertices->places[m_triangles[std::size_t(triangle) * 3 + i]]);
+    return box;
+}
+
+void MeshGeometry::sort() const
+{
+    const uint32_t count = uint32_t(m_triangles.size() / 3);
+    m_order.resize(count);
+    std::iota(m_order.begin(), m_order.end(), 0u);
+    std::vector<Vector3f> centres(count);
+    for (uint32_t i = 0; i < count; ++i)
+    {
+        const Vector3f centre = findBox(i).getCentre();
+        if (std::isfinite(centre.x + centre.y + centre.z)) // else there is no order of them
+            centres[i] = centre;
+    }
+    m_nodes.reserve(count);
+    split(0, count, centres);
+}
+
+/// By the middle one of the triangles, along the longest side of the box around their centres.
+void MeshGeometry::split(uint32_t first, uint32_t count, const std::vector<Vector3f>& centres) const
+{
+    const std::size_t index = m_nodes.size();
+    m_nodes.push_back({Box(), first, count});
+    Box places;
+    for (uint32_t i = first; i < first + count; ++i)
+    {
+        m_nodes[index].box.add(findBox(m_order[i]));
+        places.add(centres[m_order[i]]);
+    }
+    if (count <= FEW)
+        return;
+    const Vector3f size = places.highest - places.lowest;
+    const int axis = size.x >= size.y && size.x >= size.z ? 0 : size.y >= size.z ? 1 : 2;
+    const auto begin = m_order.begin() + first;
+    const uint32_t half = count / 2;
+    std::nth_element(begin, begin + half, begin + count,
+                     [&](uint32_t a, uint32_t b)
+                     { return centres[a].data()[axis] < centres[b].data()[axis]; });
+    split(first, half, centres);
+    m_nodes[index].first = uint32_t(m_nodes.size());
+    m_nodes[index].count = 0;
+    split(first + half, count - half, centres);
+}
+
+} // namespace orv

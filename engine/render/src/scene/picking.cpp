@@ -1,0 +1,90 @@
+#include "orv/picking.h"
+
+#include "orv/appearance.h"
+#include "orv/mesh.h"
+#include "orv/meshgeometry.h"
+#include "orv/ray.h"
+#include "orv/scenebounds.h"
+#include "orv/scenenodevisitor.h"
+#include "orv/sceneutil.h"
+#include "orv/solid.h"
+
+#include <algorithm>
+#include <limits>
+
+namespace orv
+{
+
+namespace
+{
+
+/// The sides of a solid's triangles, as its mesh has them, that are drawn.
+/// @param isTurned  what takes the mesh to where the ray is turns its sides.
+TriangleSides getDrawnSides(const Appearance& appearance, bool isMirrored, bool isTurned)
+{
+    const RenderState& state = appearance.getRenderState();
+    switch (state.cullingMode)
+    {
+    case CullingMode::CULL_NONE: return TriangleSides::BOTH;
+    case CullingMode::CULL_FRONT_AND_BACK: return TriangleSides::NONE;
+    default: break;
+    }
+    const bool drawsFront = state.cullingMode == CullingMode::CULL_BACK;
+    const bool isClockwise = (state.windingOrder == WindingOrder::WINDING_CW) != isMirrored;
+    return drawsFront != (isClockwise != isTurned) ? TriangleSides::FRONT : TriangleSides::BACK;
+}
+
+class Picker : public SceneNodeVisitor
+{
+public:
+    explicit Picker(const Ray& ray) : m_ray(ray) {}
+
+    using SceneNodeVisitor::visit;
+    void visit(Solid* solid) override
+    {
+        MeshGeometry::Hit hit;
+        hit.distance = std::numeric_limits<float>::max();
+        const MeshGeometry* const geometry =
+            solid->getMesh() ? solid->getMesh()->getGeometry().get() : nullptr;
+        if (!geometry || !solid->getAppearance() || !meet(*solid, *geometry, hit))
+            return;
+        hits.push_back({SharedPtr<Solid>(solid), hit.triangle,
+                        m_ray.position + m_ray.direction * hit.distance,
+                        hit.distance * length(m_ray.direction)});
+    }
+
+    std::vector<PickHit> hits;
+
+private:
+    /// A mesh without joints is met in its own space, where its triangles are sorted.
+    bool meet(const Solid& solid, const MeshGeometry& geometry, MeshGeometry::Hit& hit)
+    {
+        const Appearance& appearance = *solid.getAppearance();
+        const bool isMirrored = solid.turnsWinding(appearance.getShaderProgram().get());
+        const Matrix4f toMesh = inverse(solid.getWorldTransform());
+        const bool isFlat = toMesh == Matrix4f(); // it has no inverse
+        if (!solid.isSkinned() && !isFlat)
+            return geometry.meet(transform(m_ray, toMesh), getDrawnSides(appearance, isMirrored, isMirrored),
+                                 hit);
+        placeVertices(solid, m_places);
+        return geometry.meet(m_ray, getDrawnSides(appearance, isMirrored, false), m_places, hit);
+    }
+
+    const Ray& m_ray;
+    std::vector<Vector3f> m_places;
+};
+
+} // namespace
+
+std::vector<PickHit> pick(SceneNode& scene, const Ray& ray, const FlagMask& flags)
+{
+    Picker picker(ray);
+    if (ray.direction == Vector3f())
+        return {};
+    visitScene(picker, scene, flags, flags);
+    std::stable_sort(picker.hits.begin(), picker.hits.end(),
+                     [](const PickHit& a, const PickHit& b) { return a.distance < b.distance; });
+    return picker.hits;
+}
+
+} // namespace orv

@@ -1,0 +1,167 @@
+#include "orv/scenebounds.h"
+
+#include "orv/appearance.h"
+#include "orv/mesh.h"
+#include "orv/meshgeometry.h"
+#include "orv/scenenodevisitor.h"
+#include "orv/sceneutil.h"
+#include "orv/shaderprogram.h"
+#include "orv/solid.h"
+
+#include <algorithm>
+
+namespace orv
+{
+
+namespace
+{
+
+Vector3f place(const Matrix4f& transform, const Vector3f& at)
+{
+    return (transform * Vector4f(at, 1.0f)).xyz();
+}
+
+/// Adds the corners of a box to places.
+void addCorners(const Box& box, const Matrix4f& transform, std::vector<Vector3f>& places)
+{
+    for (int i = 0; i < 8; ++i)
+        places.push_back(place(transform, Vector3f(i & 1 ? box.highest.x : box.lowest.x,
+                                                   i & 2 ? box.highest.y : box.lowest.y,
+                                                   i & 4 ? box.highest.z : box.lowest.z)));
+}
+
+std::vector<Matrix4f> getJointTransforms(const Solid& solid)
+{
+    std::vector<Matrix4f> transforms;
+    for (int i = 0; i < std::min(solid.getJointCount(), Solid::MAX_JOINTS); ++i)
+        transforms.push_back(solid.getJointTransform(i));
+    return transforms;
+}
+
+/// A joint that there is not is stood in for by the last one.
+const Matrix4f& getJoint(const std::vector<Matrix4f>& joints, size_t number)
+{
+    return joints[std::min(number, joints.size() - 1)];
+}
+
+/// Corners of boxes in the world around all that a solid draws.
+void addCorners(const Solid& solid, const Mesh& mesh, std::vector<Vector3f>& places)
+{
+    if (!solid.isSkinned())
+    {
+        if (mesh.getBounds().isKnown())
+            addCorners(mesh.getBounds().box, solid.getWorldTransform(), places);
+        return;
+    }
+    const std::vector<Matrix4f> joints = getJointTransforms(solid);
+    for (size_t i = 0; i < mesh.getJointBounds().size(); ++i)
+    {
+        if (mesh.getJointBounds()[i].isKnown())
+            addCorners(mesh.getJointBounds()[i].box, getJoint(joints, i), places);
+    }
+}
+
+/// Places in the world around all that a solid draws, in place of those there are; none if that is not known.
+void findPlaces(const Solid& solid, std::vector<Vector3f>& places)
+{
+    const Mesh* const mesh = solid.getMesh().get();
+    if (!placeVertices(solid, places) && mesh)
+        addCorners(solid, *mesh, places);
+    const MeshGeometry* const geometry = mesh ? mesh->getGeometry().get() : nullptr;
+    size_t kept = 0;
+    for (size_t i = 0; geometry && i < places.size(); ++i)
+    {
+        if (geometry->getDrawn()[i])
+            places[kept++] = places[i];
+    }
+    if (geometry)
+        places.resize(kept);
+}
+
+/// Goes through a scene twice, for the box and then for the sphere about its centre.
+class BoundsVisitor : public SceneNodeVisitor
+{
+public:
+    using SceneNodeVisitor::visit;
+    void visit(Solid* solid) override
+    {
+        findPlaces(*solid, m_places);
+        if (m_places.empty() && solid->getMesh())
+            ++unknown;
+        const Vector3f centre = bounds.box.getCentre();
+        for (const Vector3f& at : m_places)
+        {
+            if (isMeasuring)
+                bounds.radius = std::max(bounds.radius, length(at - centre));
+            else
+                bounds.box.add(at);
+        }
+    }
+
+    Bounds bounds;
+    bool isMeasuring = false; ///< the sphere
+    int unknown = 0;
+
+private:
+    std::vector<Vector3f> m_places;
+};
+
+} // namespace
+
+bool Solid::isSkinned() const
+{
+    const ShaderProgram* const program = m_appearance ? m_appearance->getShaderProgram().get() : nullptr;
+    return getJointCount() > 0 && program && program->usesJoints();
+}
+
+Bounds Solid::getBounds() const
+{
+    if (!isSkinned())
+        return m_mesh ? m_mesh->getBounds() : Bounds();
+    std::vector<Vector3f> places;
+    findPlaces(*this, places);
+    const Matrix4f toOwn = inverse(getWorldTransform());
+    for (Vector3f& at : places)
+        at = place(toOwn, at);
+    return computeBounds(places.data(), places.size());
+}
+
+bool placeVertices(const Solid& solid, std::vector<Vector3f>& places)
+{
+    places.clear();
+    const MeshGeometry* const geometry = solid.getMesh() ? solid.getMesh()->getGeometry().get() : nullptr;
+    if (!geometry)
+        return false;
+    const MeshVertices& vertices = geometry->getVertices();
+    places.resize(vertices.places.size());
+    const bool isSkinned = solid.isSkinned() && !vertices.influences.empty();
+    const std::vector<Matrix4f> joints =
+        isSkinned ? getJointTransforms(solid) : std::vector<Matrix4f>{solid.getWorldTransform()};
+    for (size_t i = 0; i < places.size(); ++i)
+    {
+        if (!isSkinned)
+            places[i] = place(joints.front(), vertices.places[i]);
+        for (int j = 0; isSkinned && j < 4; ++j)
+        {
+            const MeshVertices::Influence& influence = vertices.influences[i];
+            if (influence.weights[j] != 0.0f)
+                places[i] +=
+                    place(getJoint(joints, influence.joints[j]), vertices.places[i]) * influence.weights[j];
+        }
+    }
+    return true;
+}
+
+Bounds getWorldBounds(SceneNode& top, int* unknown)
+{
+    BoundsVisitor visitor;
+    visitScene(visitor, top);
+    if (unknown)
+        *unknown = visitor.unknown;
+    visitor.isMeasuring = true;
+    if (!visitor.bounds.box.isEmpty())
+        visitScene(visitor, top);
+    return visitor.bounds;
+}
+
+} // namespace orv

@@ -1,0 +1,296 @@
+#include "glotest.h"
+
+#include "orv/animationbounds.h"
+#include "orv/animationgroup.h"
+#include "orv/appearance.h"
+#include "orv/mesh.h"
+#include "orv/meshgeometry.h"
+#include "orv/picking.h"
+#include "orv/ray.h"
+#include "orv/scenebounds.h"
+#include "orv/sceneutil.h"
+#include "orv/solid.h"
+
+#include <cmath>
+#include <limits>
+#include <random>
+
+using namespace orv;
+
+namespace
+{
+
+float getVolume(const Box& box)
+{
+    const Vector3f size = box.highest - box.lowest;
+    return size.x * size.y * size.z;
+}
+
+void expectNear(const Vector3f& expected, const Vector3f& actual, const char* what)
+{
+    EXPECT_LT(length(expected - actual), 1e-4f) << what << toString(expected) << toString(actual);
+}
+
+} // namespace
+
+class BoundsTest : public GloTest
+{
+protected:
+    float number(float from, float to) { return std::uniform_real_distribution<float>(from, to)(random); }
+    Vector3f vector(float reach)
+    {
+        return Vector3f(number(-reach, reach), number(-reach, reach), number(-reach, reach));
+    }
+    Quaternionf rotation()
+    {
+        return quaternionFromAxisAngle(normalize(vector(1.0f)), Anglef::fromRadians(number(-3.0f, 3.0f)));
+    }
+
+    Glo::Ptr load(const glo::GloScene& scene, MeshData data)
+    {
+        m_source->set("test.glo", write(scene));
+        return loadGloFile(*m_pool, m_root, "test.glo", data);
+    }
+
+    /// An arm of two joints that bends: the vertices along it follow both by shares.
+    glo::GloScene makeArm()
+    {
+        glo::GloScene scene;
+        glo::Geometry& geometry = scene.geometries.emplace_back();
+        geometry.name = "arm";
+        std::vector<float> joints, weights;
+        for (int i = 0; i < 200; ++i)
+        {
+            const float along = number(0.0f, 4.0f);
+            const float share = std::min(std::max(along - 1.5f, 0.0f), 1.0f);
+            armPlaces.push_back(Vector3f(along, number(-0.3f, 0.3f), number(-0.2f, 0.2f)));
+            armShares.push_back(share);
+            joints.insert(joints.end(), {0, 1, 0, 0});
+            weights.insert(weights.end(), {1.0f - share, share, 0, 0});
+        }
+        std::vector<float> places;
+        for (const Vector3f& place : armPlaces)
+            places.insert(places.end(), {place.x, place.y, place.z});
+        geometry.vertices = glo::makeVertexSet(
+            {{"a_position", 3, places}, {"a_joints", 4, joints}, {"a_weights", 4, weights}});
+        geometry.primitiveSets.push_back({glo::primitive::TRIANGLE_STRIP, {}});
+        glo::Skin& skin = scene.skins.emplace_back();
+        skin.name = "skin";
+        skin.geometry = "arm";
+        skin.attachments = {{"shoulder", Matrix4f::IDENTITY},
+                            {"elbow", translationMatrix(Vector3f(-2, 0, 0))}};
+        glo::NodeData elbow = makeNode("elbow");
+        moveTo(elbow, Vector3f(2, 0, 0));
+        scene.scene = glo::SceneData{"scene", makeNode("top", {makeNode("figure", &glo::NodeData::skin,
+                                                                        glo::SkinReference{"skin", {}, {}}),
+                                                               makeNode("shoulder", {elbow})})};
+        glo::AnimationData& clip = scene.animations.emplace_back();
+        clip.name = "bend";
+        for (const char* joint : {"shoulder", "elbow"})
+        {
+            glo::Channel turn = makeChannel("node", joint, "rotation", {0, 0, 1, 0}, 0.0f);
+            for (int key = 1; key < 20; ++key)
+                glo::addKey(turn, float(key) * (joint[0] == 's' ? 0.1f : 0.07f),
+                            {0, 0, 1, number(-2.0f, 2.0f)});
+            clip.channels.push_back(turn);
+        }
+        return scene;
+    }
+
+    /// Of the arm at the moment, from nothing but the joints' places.
+    void addArm(SceneNode& top, Box& box) const
+    {
+        const Matrix4f shoulder = top.find("shoulder")->getWorldTransform();
+        const Matrix4f elbow = top.find("elbow")->getWorldTransform() * translationMatrix(Vector3f(-2, 0, 0));
+        for (size_t i = 0; i < armPlaces.size(); ++i)
+        {
+            const Vector4f place(armPlaces[i], 1.0f);
+            box.add(((shoulder * place) * (1.0f - armShares[i]) + (elbow * place) * armShares[i]).xyz());
+        }
+    }
+
+    std::mt19937 random{1};
+    std::vector<Vector3f> armPlaces;
+    std::vector<float> armShares; ///< of the elbow
+};
+
+// Faults caught: boxes of vertices that are not drawn, of another space, or that leave a solid out.
+TEST_F(BoundsTest, subtreesReachAsFarAsWhatIsInThem)
+{
+    glo::GloScene file;
+    file.geometries = {makeSquareGeometry("square")};
+    file.geometries[0].vertices = glo::makeVertexSet(
+        {{"a_position", 3, {-0.5f, -0.5f, 0, 0.5f, -0.5f, 0, 0.5f, 0.5f, 0, -0.5f, 0.5f, 0, 99, 99, 99}}});
+    glo::NodeData near = makeSolidNode("near", "square", "");
+    moveTo(near, Vector3f(10, 0, 0));
+    file.scene = glo::SceneData{"scene", makeNode("top", {near})};
+    const Glo::Ptr glo = load(file, MeshData::BOUNDS);
+    ASSERT_TRUE(glo);
+    SceneNode& top = *glo->getTopNode();
+    int unknown = -1;
+    Bounds bounds = getWorldBounds(top, &unknown);
+    EXPECT_EQ(0, unknown);
+    expectNear(Vector3f(9.5f, -0.5f, 0), bounds.box.lowest, "lowest");
+    expectNear(Vector3f(10.5f, 0.5f, 0), bounds.box.highest, "highest");
+    EXPECT_NEAR(std::sqrt(0.5f), bounds.radius, 1e-5f);
+
+    const auto cube = createCube(*m_pool, Vector2f(1, 1));
+    cube->setParent(glo->getTopNode());
+    cube->setScale(Vector3f(1, 2, 1));
+    EXPECT_EQ(Vector3f(1, 1, 1), cube->getBounds().box.highest);
+    EXPECT_NEAR(std::sqrt(3.0f), cube->getBounds().radius, 1e-5f);
+    top.setPosition(Vector3f(0, 0, 100));
+    bounds = getWorldBounds(top, &unknown);
+    expectNear(Vector3f(-1, -2, 99), bounds.box.lowest, "lowest");
+    expectNear(Vector3f(10.5f, 2, 101), bounds.box.highest, "highest");
+
+    const auto strange = makeShared<Solid>(makeShared<Mesh>(MeshHeader(), nullptr, nullptr), nullptr);
+    strange->setParent(glo->getTopNode());
+    EXPECT_FALSE(strange->getBounds().isKnown());
+    EXPECT_EQ(bounds.radius, getWorldBounds(top, &unknown).radius);
+    EXPECT_EQ(1, unknown);
+    EXPECT_FALSE(getWorldBounds(*makeShared<SceneNode>()).isKnown());
+}
+
+// Faults caught: keys that are passed over, joints without their shares; boxes that are much wider than what is in them.
+TEST_F(BoundsTest, clipsReachAsFarAsTheirKeys)
+{
+    const glo::GloScene file = makeArm();
+    const Glo::Ptr glo = load(file, MeshData::GEOMETRY);
+    ASSERT_TRUE(glo);
+    SceneNode& top = *glo->getTopNode();
+    top.setRotation(rotation());
+    AnimationGroup& clip = *glo->getAnimationGroup();
+    const Bounds bounds = getWorldBounds(top, clip, 1);
+
+    Box expected;
+    for (int i = 0; i <= 2000; ++i)
+    {
+        clip.apply(float(i) * 0.001f);
+        addArm(top, expected);
+        Box moment;
+        addArm(top, moment);
+        const Bounds now = getWorldBounds(top);
+        expectNear(moment.lowest, now.box.lowest, "lowest");
+        expectNear(moment.highest, now.box.highest, "highest");
+    }
+    expectNear(expected.lowest, bounds.box.lowest, "lowest of all");
+    expectNear(expected.highest, bounds.box.highest, "highest of all");
+    EXPECT_LE(bounds.radius, length(expected.highest - expected.lowest) * 0.5f + 1e-4f);
+
+    // From the joints' boxes alone it is wider, and never narrower.
+    Solid& figure = static_cast<Solid&>(*top.find("figure"));
+    figure.getMesh()->setGeometry(nullptr);
+    const Bounds wide = getWorldBounds(top, clip, 1);
+    EXPECT_LE(getVolume(bounds.box), getVolume(wide.box));
+    Box both = wide.box;
+    both.add(bounds.box);
+    expectNear(wide.box.lowest, both.lowest, "lowest of boxes");
+    expectNear(wide.box.highest, both.highest, "highest of boxes");
+    EXPECT_LT(getVolume(wide.box), 1.5f * getVolume(bounds.box));
+}
+
+// Faults caught: halves that lose triangles, boxes that a ray passes by, the wrong one of two; all against a look at every
+// triangle.
+TEST_F(BoundsTest, raysFindTheNearestTriangle)
+{
+    const auto vertices = makeShared<MeshVertices>();
+    std::vector<unsigned short> indices;
+    for (int i = 0; i < 2000; ++i)
+    {
+        const Vector3f centre = vector(10.0f);
+        for (int corner = 0; corner < 3; ++corner)
+        {
+            indices.push_back(uint16_t(vertices->places.size()));
+            vertices->places.push_back(centre + vector(i % 7 ? 0.7f : 0.0f));
+        }
+        if (i % 10 == 0) // the same once more, which comes second
+            indices.insert(indices.end(), indices.end() - 3, indices.end());
+    }
+    vertices->places[5].x = std::numeric_limits<float>::quiet_NaN();
+    vertices->places[50].y = std::numeric_limits<float>::infinity();
+    const MeshGeometry geometry(vertices, IndexBuffer::Primitive::TRIANGLES, indices.data(), indices.size());
+    EXPECT_EQ(indices.size(), geometry.getTriangles().size());
+    int metCount = 0;
+    for (int i = 0; i < 4000; ++i)
+    {
+        Ray ray = {vector(15.0f), vector(1.0f)};
+        if (i % 5 == 0)
+            (i % 2 ? ray.direction.x : ray.direction.z) = 0.0f;
+        if (i % 11 == 0)
+            ray.position.x = vertices->places[size_t(i) % vertices->places.size()].x;
+        const TriangleSides sides = TriangleSides(i % 4);
+        MeshGeometry::Hit found, expected;
+        found.distance = expected.distance = i % 3 ? std::numeric_limits<float>::max() : 10.0f;
+        const bool isMet = geometry.meet(ray, sides, vertices->places, expected);
+        EXPECT_EQ(isMet, geometry.meet(ray, sides, found)) << i;
+        EXPECT_EQ(expected.distance, found.distance) << i;
+        EXPECT_EQ(expected.triangle, found.triangle) << i;
+        metCount += isMet;
+    }
+    EXPECT_LT(400, metCount);
+}
+
+// Faults caught: sides that are not drawn, of mirrored solids too; hits in another space, order or pose; what is hidden.
+TEST_F(BoundsTest, picksWhatIsDrawn)
+{
+    glo::GloScene file;
+    file.geometries = {makeSquareGeometry("square")};
+    file.scene = glo::SceneData{"scene", makeNode("top", {makeSolidNode("first", "square", ""),
+                                                          makeSolidNode("second", "square", "")})};
+    const Glo::Ptr glo = load(file, MeshData::GEOMETRY);
+    ASSERT_TRUE(glo);
+    SceneNode& top = *glo->getTopNode();
+    Solid& first = static_cast<Solid&>(*top.find("first"));
+    Solid& second = static_cast<Solid&>(*top.find("second"));
+    second.setAppearance(makeShared<Appearance>());
+    second.getAppearance()->setShaderProgram(first.getAppearance()->getShaderProgram());
+    first.setPosition(Vector3f(0, 0, -4));
+    first.setScale(Vector3f(3, 3, 3));
+    second.setPosition(Vector3f(0, 0, -8));
+    second.setScale(Vector3f(3, 3, 3));
+    const Ray ray = {Vector3f(1.0f, -1.2f, 1.0f), Vector3f(0, 0, -2.0f)};
+    const Ray back = {Vector3f(1.0f, -1.2f, -20.0f), Vector3f(0, 0, 1.0f)};
+
+    std::vector<PickHit> hits = pick(top, ray);
+    ASSERT_EQ(2u, hits.size());
+    EXPECT_EQ(&first, hits[0].solid.get());
+    EXPECT_EQ(&second, hits[1].solid.get());
+    EXPECT_EQ(0u, hits[0].triangle);
+    EXPECT_NEAR(5.0f, hits[0].distance, 1e-5f);
+    expectNear(Vector3f(1.0f, -1.2f, -4.0f), hits[0].point, "point");
+    EXPECT_TRUE(pick(top, back).empty());
+
+    first.setScale(Vector3f(-3, 3, 3)); // mirrored, and drawn from the same side
+    hits = pick(top, ray);
+    ASSERT_EQ(2u, hits.size());
+    EXPECT_TRUE(pick(top, back).empty());
+    second.setScale(Vector3f(3, 3, 0)); // flat; both of its sides are drawn
+    second.getAppearance()->setCullingMode(CullingMode::CULL_NONE);
+    EXPECT_EQ(2u, pick(top, ray).size());
+    EXPECT_EQ(1u, pick(top, back).size());
+    second.setVisible(false);
+    EXPECT_EQ(2u, pick(top, ray).size());
+    EXPECT_EQ(1u, pick(top, ray, SceneNode::VISIBLE).size());
+    first.getMesh()->setGeometry(nullptr);
+    EXPECT_TRUE(pick(top, ray, SceneNode::VISIBLE).empty());
+    EXPECT_TRUE(pick(top, {Vector3f(), Vector3f()}).empty());
+}
+
+// Fault caught: triangles of a skinned solid where they were bound.
+TEST_F(BoundsTest, picksSkinnedSolidsAsTheyStand)
+{
+    const Glo::Ptr glo = load(makeArm(), MeshData::GEOMETRY);
+    ASSERT_TRUE(glo);
+    SceneNode& top = *glo->getTopNode();
+    Solid& figure = static_cast<Solid&>(*top.find("figure"));
+    figure.getAppearance()->setCullingMode(CullingMode::CULL_NONE);
+    const auto isMet = [&](float x, float y) {
+        return !pick(top, {Vector3f(x, y, 5.0f), Vector3f(0, 0, -1)}).empty();
+    };
+    EXPECT_TRUE(isMet(3.0f, 0.0f));
+    EXPECT_FALSE(isMet(2.0f, 1.0f));
+    top.find("elbow")->setRotation(quaternionFromAxisAngle(Vector3f(0, 0, 1), Anglef::fromDegrees(90.0f)));
+    EXPECT_FALSE(isMet(3.0f, 0.0f));
+    EXPECT_TRUE(isMet(2.0f, 1.0f));
+}
