@@ -45,4 +45,5 @@ int main()
     for (int i = 0; i < 300 * 400; ++i)
         std::fwrite(pixels[299 - i / 400][i % 400], 3, 1, stdout);
     pool->release(); // the GL objects go with the context, which ends with the program
+    return 0;
 }

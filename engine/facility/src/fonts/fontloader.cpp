@@ -1,6 +1,7 @@
 #include "orv/fontloader.h"
 
 #include "fontbaker.h"
+#include "gl/countedgl.h"
 #include "orv/detail/loadscope.h"
 #include "orv/filetostring.h"
 #include "orv/fontcache.h"
@@ -8,8 +9,6 @@
 #include "orv/stream.h"
 #include "orv/textsuffix.h"
 #include "orv/texture2dcache.h"
-
-#include <GLES2/gl2.h>
 
 #include <charconv>
 #include <string>

@@ -1,8 +1,8 @@
 #pragma once
 
-#include "orv/vertexbuffer.h"
+#include "countedgl.h"
 
-#include <GLES2/gl2.h>
+#include "orv/vertexbuffer.h"
 
 #include <array>
 

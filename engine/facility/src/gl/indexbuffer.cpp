@@ -1,12 +1,12 @@
 #include "orv/indexbuffer.h"
 
+#include "countedgl.h"
+
 #include "orv/detail/bindingepoch.h"
 #include "orv/detail/resource.h"
 #include "orv/log.h"
 #include "orv/rendercontext.h"
 #include "orv/renderdevice.h"
-
-#include <GLES2/gl2.h>
 
 #include <algorithm>
 #include <iterator>

@@ -1,11 +1,12 @@
 #include "orv/rendercontext.h"
 
+#include "countedgl.h"
+
 #include "orv/detail/revision.h"
 #include "orv/detail/texturetarget.h"
 #include "orv/log.h"
 #include "orv/renderdevice.h"
 
-#include <GLES2/gl2.h>
 #include <GLES2/gl2ext.h>
 
 #include <algorithm>

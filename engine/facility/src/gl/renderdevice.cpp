@@ -1,9 +1,10 @@
 #include "orv/renderdevice.h"
 
+#include "countedgl.h"
+
 #include "orv/log.h"
 
 #include <EGL/egl.h>
-#include <GLES2/gl2.h>
 
 #include <cstring>
 

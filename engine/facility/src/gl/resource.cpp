@@ -1,8 +1,8 @@
 #include "orv/detail/resource.h"
 
-#include "orv/detail/bindingepoch.h"
+#include "countedgl.h"
 
-#include <GLES2/gl2.h>
+#include "orv/detail/bindingepoch.h"
 
 namespace orv::detail
 {

@@ -1,5 +1,6 @@
 #include "orv/shaderprogram.h"
 
+#include "gl/countedgl.h"
 #include "shaderprogramdraw.h"
 #include "shaderuniformprivate.h"
 
@@ -13,7 +14,6 @@
 #include "orv/texturecube.h"
 #include "orv/vertexbuffer.h"
 
-#include <GLES2/gl2.h>
 #include <GLES2/gl2ext.h>
 
 #include <algorithm>

@@ -1,10 +1,10 @@
 #include "orv/shaderprogramcache.h"
 
+#include "gl/countedgl.h"
+
 #include "orv/detail/resource.h"
 #include "orv/extensions.h"
 #include "orv/renderdevice.h"
-
-#include <GLES2/gl2.h>
 
 #include <vector>
 

@@ -1,12 +1,11 @@
 #include "orv/shaderuniform.h"
 
+#include "gl/countedgl.h"
 #include "shaderuniformprivate.h"
 
 #include "orv/detail/bindingepoch.h"
 #include "orv/texture2d.h"
 #include "orv/texturecube.h"
-
-#include <GLES2/gl2.h>
 
 #include <algorithm>
 #include <array>
@@ -61,7 +60,7 @@ void sendAsInts(SendInts send, int location, int size, int components, const Com
         ints = large.data();
     }
     std::copy(values, values + count, ints);
-    send(location, size, ints);
+    ORV_GL(UNIFORM, send(location, size, ints));
 }
 
 template <class TextureType>

@@ -1,8 +1,8 @@
 #pragma once
 
-#include "orv/texturecube.h"
+#include "gl/countedgl.h"
 
-#include <GLES2/gl2.h>
+#include "orv/texturecube.h"
 
 namespace orv::detail
 {

@@ -1,12 +1,13 @@
 #include "pvrtexture.h"
 
+#include "gl/countedgl.h"
+
 #include "orv/detail/bindingepoch.h"
 #include "orv/detail/loadscope.h"
 #include "orv/renderdevice.h"
 #include "orv/texture.h"
 #include "pvr/pvrpixels.h"
 
-#include <GLES2/gl2.h>
 #include <GLES2/gl2ext.h>
 
 #include <cstdint>

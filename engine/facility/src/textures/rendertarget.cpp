@@ -1,9 +1,10 @@
 #include "orv/rendertarget.h"
 
+#include "gl/countedgl.h"
+
 #include "orv/log.h"
 #include "orv/renderdevice.h"
 
-#include <GLES2/gl2.h>
 #include <GLES2/gl2ext.h>
 
 namespace orv

@@ -1,12 +1,12 @@
 #include "orv/texture2d.h"
 
+#include "gl/countedgl.h"
 #include "gltexture.h"
 
 #include "orv/detail/bindingepoch.h"
 #include "orv/log.h"
 #include "orv/renderdevice.h"
 
-#include <GLES2/gl2.h>
 #include <GLES2/gl2ext.h>
 
 #include <algorithm>

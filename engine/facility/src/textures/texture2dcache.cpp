@@ -1,5 +1,6 @@
 #include "orv/texture2dcache.h"
 
+#include "gl/countedgl.h"
 #include "gltexture.h"
 
 #include "orv/detail/bindingepoch.h"
@@ -8,7 +9,6 @@
 #include "orv/rendercontext.h"
 #include "orv/renderdevice.h"
 
-#include <GLES2/gl2.h>
 #include <GLES2/gl2ext.h>
 
 #include <iterator>

@@ -31,6 +31,7 @@
 #include "orv/font.h"
 #include "orv/fontcache.h"
 #include "orv/fontloader.h"
+#include "orv/framecounters.h"
 #include "orv/glo.h"
 #include "orv/image.h"
 #include "orv/indexbuffer.h"

@@ -3,6 +3,7 @@
 #include "orv/export.h"
 #include "orv/flagmask.h"
 #include "orv/sharedptr.h"
+#include "orv/solid.h"
 #include "orv/vector.h"
 
 #include <cstdint>
@@ -12,7 +13,6 @@ namespace orv
 {
 
 class SceneNode;
-class Solid;
 struct Ray;
 
 /// What a ray meets of a solid first.

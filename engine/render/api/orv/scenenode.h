@@ -139,6 +139,8 @@ public:
     /// Mesh::getSphere() has it. Infinite where the subtree has lights, solids with joints, solids of unknown bounds, or
     /// nodes that have moved since the last call but one.
     Vector4f getReach() const;
+    /// The solids inside of the reach that getReach() has told.
+    uint32_t countReach() const { return m_extras ? m_extras->reachSolids : 0; }
     /// Draw path: an upper limit of what the world transform does to lengths; infinite if it is not affine.
     float getWorldStretch() const { return isWorldRigid() ? 1.0f : findStretch(); }
     /// The same where it is known already, and the world transform too; else minus infinity.
@@ -163,6 +165,7 @@ private:
         float stretch = 0.0f;     ///< likewise
         uint32_t known = 0;       ///< of the two above: NORMAL, STRETCH
         uint32_t reachRevision = 0;
+        uint32_t reachSolids = 0;
         Vector4f reach; ///< while m_reachState says so
     };
 

@@ -2,6 +2,7 @@
 
 #include "orv/detail/framelist.h"
 #include "orv/detail/viewport.h"
+#include "orv/framecounters.h"
 #include "orv/matrix.h"
 #include "orv/renderer.h"
 
@@ -100,6 +101,12 @@ public:
     void setCulled(bool culled);
     bool isCulled() const { return m_culling != nullptr; }
 
+    /// Counts what each frame takes, from the beginning of render() to its end. Off at first.
+    void setCounted(bool counted);
+    bool isCounted() const { return m_counters != nullptr; }
+    /// Of the last frame that was counted; the render block's clearing is not in it.
+    FrameCounters getCounters() const { return m_counters ? *m_counters : FrameCounters(); }
+
     /// The scene walk of render() arrives here.
     using SceneNodeVisitor::visit;
     void visit(Solid* solid) override;
@@ -112,6 +119,8 @@ private:
         Solid* solid;
     };
 
+    ORV_LOCAL void drawFrame(Camera* camera, SceneNode& scene, const FlagMask& renderFlags,
+                             const FlagMask& recursiveFlags);
     ORV_LOCAL void collect(SceneNode& scene, const FlagMask& renderFlags, const FlagMask& recursiveFlags);
     ORV_LOCAL void publishLights();
     ORV_LOCAL void publishLight(const Light& light, int index);
@@ -134,6 +143,7 @@ private:
     std::vector<SortKey> m_sortKeys;
     std::unique_ptr<detail::DrawGroups> m_groups; // null where the walk's order counts
     std::unique_ptr<detail::Culling> m_culling;   // null where all is drawn
+    std::unique_ptr<FrameCounters> m_counters;    // null where nothing is counted
     std::vector<PropertyRef> m_mirrorProperties;  // one for each place in m_mirrors
     detail::Viewport m_viewport;                  // of the whole picture
     SharedPtr<RenderTarget> m_mirrorTarget;

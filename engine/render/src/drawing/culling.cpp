@@ -80,6 +80,7 @@ Culling::Culling(SceneNodeVisitor& renderer)
 
 void Culling::begin(const Eye* eyes, int eyeCount)
 {
+    m_count = 0;
     m_eyeCount = eyeCount;
     for (int i = 0; i < eyeCount; ++i)
         m_frustums[i] = Frustum(inverse(eyes[i].world), eyes[i].projection);
@@ -97,6 +98,8 @@ bool Culling::finish(bool hasMirrors)
 {
     const bool isWhole = m_hasMirrors || !hasMirrors;
     m_hasMirrors = hasMirrors;
+    if (!isWhole)
+        m_count = 0;
     return isWhole;
 }
 
@@ -112,13 +115,16 @@ Solid* const* Culling::select(Solid* const* solids, size_t& count, const Matrix4
         if (isSeen(frustum, **next) || !detail::hides(frustum, **next))
             m_selected.add(*next);
     }
+    m_count += uint32_t(count - m_selected.size());
     count = m_selected.size();
     return m_selected.begin();
 }
 
 bool Culling::hides(const Solid& solid, const Matrix4f& view, const Matrix4f& projection)
 {
-    return detail::hides(Frustum(view, projection), solid);
+    const bool isOut = detail::hides(Frustum(view, projection), solid);
+    m_count += isOut ? 1 : 0;
+    return isOut;
 }
 
 bool Culling::isHidden(const Solid& solid) const
@@ -135,7 +141,9 @@ void Culling::visit(Solid* solid)
 
 [[gnu::noinline]] void Culling::visitDoubtful(Solid* solid)
 {
-    if (!isHidden(*solid))
+    if (isHidden(*solid))
+        m_count += uint32_t(m_eyeCount);
+    else
         m_renderer.visit(solid);
 }
 
@@ -167,6 +175,8 @@ SceneNodeVisitor* Culling::choose(const SceneNode& node)
         isOutside = isOutside && sight == Frustum::Sight::OUTSIDE;
         isInside = isInside && sight == Frustum::Sight::INSIDE;
     }
+    if (isOutside)
+        m_count += uint32_t(m_eyeCount) * node.countReach();
     return isOutside ? nullptr : isInside ? &m_renderer : this;
 }
 

@@ -46,7 +46,10 @@ public:
                          const Matrix4f& projection);
 
     /// Whether one eye cannot see a solid.
-    static bool hides(const Solid& solid, const Matrix4f& view, const Matrix4f& projection);
+    bool hides(const Solid& solid, const Matrix4f& view, const Matrix4f& projection);
+
+    /// Draws that were left out since begin().
+    uint32_t getCount() const { return m_count; }
 
 private:
     void visit(SceneNode* node) override;
@@ -61,6 +64,7 @@ private:
     SceneNodeVisitor& m_renderer;
     Frustum m_frustums[2];
     int m_eyeCount = 0;
+    uint32_t m_count = 0;
     bool m_hasMirrors = false;
     FrameList<Solid*> m_selected;
 };

@@ -75,6 +75,12 @@ void SimpleRenderer::setCulled(bool culled)
         m_culling = culled ? std::make_unique<detail::Culling>(*this) : nullptr;
 }
 
+void SimpleRenderer::setCounted(bool counted)
+{
+    if (counted != isCounted())
+        m_counters = counted ? std::make_unique<FrameCounters>() : nullptr;
+}
+
 void SimpleRenderer::visit(Solid* solid)
 {
     const Appearance* appearance = solid->getAppearance().get();
@@ -117,6 +123,17 @@ void SimpleRenderer::render(Camera* camera, SceneNode& scene, const FlagMask& re
 {
     if (!m_properties->isComplete())
         return; // the log said so when they were made
+    if (!m_counters)
+        return drawFrame(camera, scene, renderFlags, recursiveFlags);
+    const FrameCounters before = countGlCalls();
+    drawFrame(camera, scene, renderFlags, recursiveFlags);
+    *m_counters = countGlCalls() - before;
+    m_counters->culled = m_culling ? m_culling->getCount() : 0;
+}
+
+void SimpleRenderer::drawFrame(Camera* camera, SceneNode& scene, const FlagMask& renderFlags,
+                               const FlagMask& recursiveFlags)
+{
     if (m_culling)
     {
         detail::Eye eyes[2];

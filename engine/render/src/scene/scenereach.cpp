@@ -86,6 +86,7 @@ Vector4f SceneNode::findReach() const
     if (!extras)
         return UNLIMITED;
 
+    extras->reachSolids = getNodeType() == Solid::NODE_TYPE ? 1 : 0;
     Box box;
     bool isLimited = true;
     forEachReach(
@@ -95,6 +96,11 @@ Vector4f SceneNode::findReach() const
             addSphere(box, sphere);
         });
     extras->reach = !isLimited ? UNLIMITED : box.isEmpty() ? NOTHING : Vector4f(box.getCentre(), 0.0f);
+    detail::ChildList::Cursor children(*m_children);
+    while (const SceneNode* child = children.next())
+        extras->reachSolids += child->m_children                          ? child->countReach()
+                               : child->getNodeType() == Solid::NODE_TYPE ? 1
+                                                                          : 0;
     if (isLimited)
         forEachReach([&](const Vector4f& sphere) { growSphere(extras->reach, sphere); });
     extras->reachRevision = detail::g_boundsRevision;
