@@ -4,9 +4,7 @@
 #include "view/fontsearch.h"
 #include "view/keys.h"
 #include "view/orbit.h"
-#include "view/picker.h"
 #include "view/player.h"
-#include "view/scenemeshes.h"
 #include "view/watcher.h"
 #include "window/window.h"
 
@@ -43,15 +41,6 @@ public:
     float getEnd() const override { return 10.0f; }
     float m_applied = -1.0f;
 };
-
-/// A square from -0.5 to 0.5 that faces +z.
-view::MeshTriangles makeSquare()
-{
-    const auto vertices = std::make_shared<view::MeshVertices>();
-    vertices->positions = {
-        {-0.5f, -0.5f, 0.0f}, {0.5f, -0.5f, 0.0f}, {0.5f, 0.5f, 0.0f}, {-0.5f, 0.5f, 0.0f}};
-    return {vertices, {0, 1, 2, 0, 2, 3}};
-}
 
 } // namespace
 
@@ -237,111 +226,6 @@ TEST(ViewPlayer, keepsToItsClip)
         EXPECT_NEAR(c.time, player.getTime(), 1e-4) << c.name;
         EXPECT_EQ(player.getTime(), animation->m_applied) << c.name;
         EXPECT_EQ(c.isMoving, player.isMoving()) << c.name;
-    }
-}
-
-// Fault caught: a name under the pointer that is not that of what is seen there.
-TEST(ViewPicker, meetsWhatIsDrawn)
-{
-    using Culling = orv::CullingMode;
-    struct Case
-    {
-        const char* name;
-        Vector3f scale;
-        Vector3f position;
-        Culling culling;
-        orv::WindingOrder winding;
-        orv::Ray ray;
-        float distance; ///< below 0: not met
-    };
-    const auto CCW = orv::WindingOrder::WINDING_CCW;
-    const auto CW = orv::WindingOrder::WINDING_CW;
-    const orv::Ray ahead = {{0.25f, 0.1f, 5}, {0, 0, -1}};
-    const orv::Ray back = {{0.25f, 0.1f, -5}, {0, 0, 1}};
-    const Vector3f one(1, 1, 1);
-    const Case cases[] = {
-        {"its front", one, {}, Culling::CULL_BACK, CCW, ahead, 5.0f},
-        {"beside it", one, {}, Culling::CULL_BACK, CCW, {{0.6f, 0, 5}, {0, 0, -1}}, -1.0f},
-        {"looking away", one, {}, Culling::CULL_NONE, CCW, {{0, 0, 5}, {0, 0, 1}}, -1.0f},
-        {"its back", one, {}, Culling::CULL_BACK, CCW, back, -1.0f},
-        {"its back, drawn", one, {}, Culling::CULL_NONE, CCW, back, 5.0f},
-        {"its back alone", one, {}, Culling::CULL_FRONT, CCW, back, 5.0f},
-        {"nothing of it", one, {}, Culling::CULL_FRONT_AND_BACK, CCW, ahead, -1.0f},
-        {"wound the other way", one, {}, Culling::CULL_BACK, CW, ahead, -1.0f},
-        {"mirrored, its front is still its front", {-1, 1, 1}, {}, Culling::CULL_BACK, CCW, ahead, 5.0f},
-        {"mirrored, its back alone", {-1, 1, 1}, {}, Culling::CULL_FRONT, CCW, ahead, -1.0f},
-        {"in world units", {20, 20, 20}, {3, 0, -5}, Culling::CULL_BACK, CCW, ahead, 10.0f},
-        {"squeezed flat", {1, 1, 0}, {}, Culling::CULL_NONE, CCW, ahead, 5.0f},
-    };
-    for (const Case& c : cases)
-    {
-        orv::MeshHeader header;
-        header.boundingRadius = std::sqrt(0.5f);
-        const auto mesh = makeShared<orv::Mesh>(header, nullptr, nullptr);
-        const auto solid = makeShared<orv::Solid>(mesh, makeShared<orv::Appearance>());
-        solid->setScale(c.scale);
-        solid->setPosition(c.position);
-        solid->getAppearance()->setCullingMode(c.culling);
-        solid->getAppearance()->setWindingOrder(c.winding);
-        view::SceneMeshes meshes;
-        meshes.add(*mesh, makeSquare());
-        const view::Hit hit = view::pick(meshes, *solid, c.ray);
-        EXPECT_EQ(c.distance >= 0.0f, hit.solid == solid.get()) << c.name;
-        EXPECT_NEAR(std::max(c.distance, 0.0f), hit.distance, 1e-4) << c.name;
-    }
-}
-
-// Fault caught: a figure that is met where it stood when it was bound, or one behind another.
-TEST(ViewPicker, meetsTheNearestWhereItsJointsHoldIt)
-{
-    const auto mesh = makeShared<orv::Mesh>(orv::MeshHeader(), nullptr, nullptr);
-    const auto root = makeShared<orv::SceneNode>();
-    const auto joint = makeShared<orv::SceneNode>();
-    joint->setPosition(Vector3f(10, 0, 2));
-    joint->setParent(root);
-    const auto figure = makeShared<orv::Solid>(mesh, makeShared<orv::Appearance>());
-    figure->attachJoint(joint, orv::Matrix4f::IDENTITY);
-    figure->setParent(root);
-    const auto wallMesh = makeShared<orv::Mesh>(orv::MeshHeader(), nullptr, nullptr);
-    const auto wall = makeShared<orv::Solid>(wallMesh, makeShared<orv::Appearance>());
-    wall->setScale(Vector3f(100, 100, 1));
-    wall->setParent(root);
-
-    view::MeshTriangles skinned = makeSquare();
-    auto vertices = std::make_shared<view::MeshVertices>(*skinned.vertices);
-    vertices->joints.assign(4, orv::Vector4f(0, 7, NAN, 0)); // the others have no weight, but are looked up
-    vertices->weights.assign(4, orv::Vector4f(1, 0, 0, 0));
-    skinned.vertices = vertices;
-    view::SceneMeshes meshes;
-    meshes.add(*mesh, skinned);
-    meshes.add(*wallMesh, makeSquare());
-    EXPECT_EQ(figure.get(), view::pick(meshes, *root, {{10, 0, 5}, {0, 0, -1}}).solid);
-    EXPECT_FLOAT_EQ(3.0f, view::pick(meshes, *root, {{10, 0, 5}, {0, 0, -1}}).distance);
-    EXPECT_EQ(wall.get(), view::pick(meshes, *root, {{0, 0, 5}, {0, 0, -1}}).solid);
-}
-
-// Fault caught: triangles that GL draws but that cannot be pointed at, and indices beyond the vertices.
-TEST(ViewPicker, readsTrianglesAsTheyAreDrawn)
-{
-    namespace primitive = orv::detail::glo::primitive;
-    struct Case
-    {
-        uint32_t primitive;
-        std::vector<uint16_t> indices; ///< empty: the vertices in their order
-        std::vector<uint16_t> triangles;
-    };
-    const Case cases[] = {{primitive::TRIANGLES, {4, 3, 2, 1, 0}, {4, 3, 2}},
-                          {primitive::TRIANGLE_FAN, {4, 3, 2, 1}, {4, 3, 2, 4, 2, 1}},
-                          {primitive::TRIANGLE_STRIP, {}, {0, 1, 2, 2, 1, 3, 2, 3, 4}},
-                          {primitive::LINES, {0, 1, 2, 3}, {}},
-                          {primitive::TRIANGLES, {0, 1, 5}, {}}};
-    for (const Case& c : cases)
-    {
-        orv::detail::glo::PrimitiveSet set;
-        set.primitive = c.primitive;
-        if (!c.indices.empty())
-            set.indices = orv::detail::glo::IndexData{3, c.indices};
-        EXPECT_EQ(c.triangles, view::readTriangles(set, 5)) << c.primitive;
     }
 }
 

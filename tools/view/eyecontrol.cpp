@@ -1,7 +1,9 @@
 #include "eyecontrol.h"
 
 #include "framing.h"
-#include "picker.h"
+
+#include "orv/picking.h"
+#include "orv/ray.h"
 
 namespace view
 {
@@ -86,11 +88,11 @@ void EyeControl::pan(Stage& stage, float right, float down, float viewSize)
 void EyeControl::lookCloser(Stage& stage, float x, float y, int width, int height)
 {
     const orv::Ray ray = castThrough(stage.getCamera(), x, y, float(width), float(height));
-    const Hit hit = pick(stage.getMeshes(), stage.getScene(), ray);
-    if (!hit.solid)
+    const std::vector<orv::PickHit> hits = orv::pick(stage.getScene(), ray);
+    if (hits.empty())
         return;
     leaveFileCamera(stage);
-    m_orbit.middle = ray.position + ray.direction * hit.distance;
+    m_orbit.middle = hits.front().point;
     m_orbit.distance = length(m_orbit.middle - stage.getCamera().getWorldTransform()[3].xyz());
     m_orbit.zoom(CLOSER_STEPS);
 }

@@ -3,6 +3,9 @@
 #include "solidvisitor.h"
 #include "stage.h"
 
+#include "orv/mesh.h"
+#include "orv/scenebounds.h"
+
 #include <algorithm>
 #include <cmath>
 
@@ -11,6 +14,7 @@ namespace view
 
 using orv::Matrix4f;
 using orv::Vector3f;
+using orv::Vector4f;
 
 namespace
 {
@@ -21,6 +25,30 @@ constexpr float FILLED_SHARE = 0.9f;  // of the view, by the scene
 constexpr float GOOD_ENOUGH = 0.005f; // off the centre and off that share together
 constexpr int MAX_ROUNDS = 8;
 constexpr size_t MAX_SHOTS = 8;
+
+/// Evenly spread, along a spiral from pole to pole.
+void spreadOverSphere(float radius, std::vector<Vector3f>& positions)
+{
+    constexpr int COUNT = 400;
+    constexpr float GOLDEN_ANGLE = 2.3999632f;
+    for (int i = 0; i < COUNT; ++i)
+    {
+        const float height = 1.0f - 2.0f * (float(i) + 0.5f) / float(COUNT);
+        const float side = std::sqrt(1.0f - height * height);
+        const float angle = GOLDEN_ANGLE * float(i);
+        positions.push_back(Vector3f(side * std::cos(angle), height, side * std::sin(angle)) * radius);
+    }
+}
+
+/// Where a solid's vertices are in the world now; for one whose mesh keeps none, places all over its bounding sphere.
+void findPlaces(const orv::Solid& solid, std::vector<Vector3f>& places)
+{
+    if (orv::placeVertices(solid, places) || !solid.getMesh())
+        return;
+    spreadOverSphere(std::max(solid.getMesh()->getHeader().boundingRadius, 0.0f), places);
+    for (Vector3f& place : places)
+        place = (solid.getWorldTransform() * Vector4f(place, 1.0f)).xyz();
+}
 
 /// A box along axes around everything that was added.
 struct Extent
@@ -100,7 +128,7 @@ void Framer::forEachPlace(const Shot& shot, const Operation& operation)
     forEachSolid(m_stage.getScene(),
                  [&](orv::Solid& solid)
                  {
-                     m_stage.getMeshes().placeVertices(solid, m_places);
+                     findPlaces(solid, m_places);
                      for (const Vector3f& place : m_places)
                          operation(place);
                  });

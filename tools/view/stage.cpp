@@ -93,7 +93,7 @@ std::unique_ptr<Stage> Stage::load(Studio& studio, const SceneFile& file, std::s
     std::unique_ptr<Stage> stage(new Stage(studio));
     const FileKind kind = getFileKind(file.path);
     const bool isOnBall = kind == FileKind::MATERIAL || kind == FileKind::PROGRAM;
-    if (!(isOnBall ? stage->loadBall(name, kind) : stage->loadScene(file.path, name)))
+    if (!(isOnBall ? stage->loadBall(name, kind) : stage->loadScene(name)))
     {
         error = file.path + ": cannot be loaded as a " +
                 (kind == FileKind::PROGRAM ? "shader program"
@@ -120,7 +120,8 @@ std::unique_ptr<Stage> Stage::load(Studio& studio, const SceneFile& file, std::s
     forEachSolid(*stage->m_scene, [&](orv::Solid& solid)
                  { stage->m_usesShaderTime = stage->m_usesShaderTime || takesTime(solid); });
     const auto renderer = makeShared<orv::SimpleRenderer>(studio.getContext(), studio.getPool());
-    renderer->setOpaqueGrouped(true); // a model's parts come in any order
+    renderer->setOpaqueGrouped(true);                         // a model's parts come in any order
+    renderer->setCulled(file.dressings.empty() && !isOnBall); // other programs may move vertices about
     stage->m_block = makeShared<orv::RenderBlock>(renderer, stage->m_scene, stage->m_freeCamera);
     stage->setBackground(BACKGROUND);
     return stage;
@@ -135,13 +136,12 @@ Stage::~Stage()
     m_studio.flush();
 }
 
-bool Stage::loadScene(const std::string& path, const std::string& name)
+bool Stage::loadScene(const std::string& name)
 {
-    m_glo = orv::loadGloFile(*m_studio.getPool(), m_scene, name.c_str(), true);
+    m_glo = orv::loadGloFile(*m_studio.getPool(), m_scene, name.c_str(), orv::MeshData::GEOMETRY);
     if (!m_glo)
         return false;
     m_animation = m_glo->getAnimationGroup();
-    m_meshes.load(path, *m_studio.getPool());
     return true;
 }
 

@@ -1,7 +1,6 @@
 #pragma once
 
 #include "player.h"
-#include "scenemeshes.h"
 #include "studio.h"
 
 #include "orv/camera.h"
@@ -93,12 +92,11 @@ public:
     void draw(int width, int height);
 
     orv::SceneNode& getScene() { return *m_scene; }
-    const SceneMeshes& getMeshes() const { return m_meshes; }
 
 private:
     explicit Stage(Studio& studio);
 
-    bool loadScene(const std::string& path, const std::string& name);
+    bool loadScene(const std::string& name);
     bool loadBall(const std::string& name, FileKind kind);
     bool dress(const SceneFile::Dressing& dressing, std::string& error);
     void findClips();
@@ -109,7 +107,6 @@ private:
     Studio& m_studio;
     orv::SceneNode::Ptr m_scene;
     orv::Glo::Ptr m_glo; ///< empty for a material
-    SceneMeshes m_meshes;
     orv::SharedPtr<orv::RenderBlock> m_block;
     orv::SharedPtr<orv::Animation> m_animation;
     std::vector<Clip> m_clips;

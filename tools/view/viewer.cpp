@@ -2,11 +2,13 @@
 
 #include "fontsearch.h"
 #include "keys.h"
-#include "picker.h"
 #include "screenshot.h"
 #include "statuslines.h"
 
 #include "glcalls/glcalls.h"
+
+#include "orv/picking.h"
+#include "orv/ray.h"
 
 #include <algorithm>
 #include <cmath>
@@ -303,8 +305,9 @@ void Viewer::pick()
         return;
     const orv::Ray ray = castThrough(getStage().getCamera(), m_pointerX, m_pointerY,
                                      float(m_window->getWidth()), float(m_window->getHeight()));
-    if (const orv::Solid* solid = view::pick(getStage().getMeshes(), getStage().getScene(), ray).solid)
-        m_underPointer = findName(*solid);
+    const std::vector<orv::PickHit> hits = orv::pick(getStage().getScene(), ray);
+    if (!hits.empty())
+        m_underPointer = findName(*hits.front().solid);
 }
 
 void Viewer::say(const std::string& message)
