@@ -33,7 +33,17 @@ public:
 
     void applyMixed(float progress, const AnimationMix& mix) override
     {
-        applyAs(mix.isInterpolated(), progress, mix);
+        Animator<T>* animator = m_animator.getLogged();
+        const AnimatedValue<T>* value = m_value.getLogged();
+        if (!animator || !value)
+            return;
+        T from, to;
+        float share = 0.0f;
+        if (mix.isInterpolated())
+            share = value->getSpan(progress, from, to);
+        else
+            from = to = value->getValue(progress);
+        animator->applyMixed(from, to, share, mix);
     }
 
     float getStart() const override
@@ -54,37 +64,9 @@ public:
             m_value->addTimes(times);
     }
 
-protected:
-    void applyAs(bool isInterpolated, float progress, const AnimationMix& mix)
-    {
-        Animator<T>* animator = m_animator.getLogged();
-        const AnimatedValue<T>* value = m_value.getLogged();
-        if (!animator || !value)
-            return;
-        T from, to;
-        float share = 0.0f;
-        if (isInterpolated)
-            share = value->getSpan(progress, from, to);
-        else
-            from = to = value->getValue(progress);
-        animator->applyMixed(from, to, share, mix);
-    }
-
 private:
     typename AnimatedValue<T>::Ptr m_value;
     typename Animator<T>::Ptr m_animator;
-};
-
-/// A channel whose keys are made to be interpolated, however it is played: AnimationController::setInterpolated() has the
-/// rules.
-template <class T>
-class InterpolatedChannel final : public AnimationChannel<T>
-{
-public:
-    using AnimationChannel<T>::AnimationChannel;
-
-    void apply(float progress) override { this->applyAs(true, progress, AnimationMix(true)); }
-    void applyMixed(float progress, const AnimationMix& mix) override { this->applyAs(true, progress, mix); }
 };
 
 template <class T>
@@ -92,14 +74,6 @@ typename AnimationChannel<T>::Ptr createAnimationChannel(const SharedPtr<Animate
                                                          const SharedPtr<Animator<T>>& animator)
 {
     return makeShared<AnimationChannel<T>>(value, animator);
-}
-
-/// The same, of a channel that interpolates.
-template <class T>
-typename AnimationChannel<T>::Ptr createInterpolatedChannel(const SharedPtr<AnimatedValue<T>>& value,
-                                                            const SharedPtr<Animator<T>>& animator)
-{
-    return makeShared<InterpolatedChannel<T>>(value, animator);
 }
 
 } // namespace orv

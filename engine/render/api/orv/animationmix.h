@@ -37,6 +37,8 @@ public:
     }
 
     bool isInterpolated() const { return m_isInterpolated; }
+    /// The same, interpolated.
+    AnimationMix interpolated() const { return AnimationMix(true, m_weight, m_subtree, m_places); }
     float getWeight() const { return m_weight; }
 
     /// Whether a target is to be written to.

@@ -36,6 +36,7 @@
 #include "orv/image.h"
 #include "orv/indexbuffer.h"
 #include "orv/indexbuffercache.h"
+#include "orv/interpolatedanimation.h"
 #include "orv/light.h"
 #include "orv/loadlimits.h"
 #include "orv/log.h"

@@ -5,6 +5,7 @@
 #include "orv/animationkeysequence.h"
 #include "orv/detail/glolog.h"
 #include "orv/detail/littleendian.h"
+#include "orv/interpolatedanimation.h"
 #include "orv/light.h"
 #include "orv/sceneanimators.h"
 
@@ -101,12 +102,11 @@ SharedPtr<AnimatedValue<T>> makeValue(const Channel& channel, const char* fileNa
     return makeShared<AnimationKeySequence<T>>(std::move(keys)); // sorts them
 }
 
-template <class T>
-SharedPtr<Animation> connect(const Channel& channel, const SharedPtr<AnimatedValue<T>>& value,
-                             const SharedPtr<Animator<T>>& animator)
+void add(const Channel& channel, const Animation::Ptr& animation, AnimationGroup& group)
 {
-    return channel.interpolation == interpolation::LINEAR ? createInterpolatedChannel<T>(value, animator)
-                                                          : createAnimationChannel<T>(value, animator);
+    const bool isInterpolated = animation && channel.interpolation == interpolation::LINEAR;
+    group.addAnimation(isInterpolated ? Animation::Ptr(makeShared<InterpolatedAnimation>(animation))
+                                      : animation);
 }
 
 template <class T, class SomeAnimator>
@@ -116,7 +116,7 @@ bool addChannel(const Channel& channel, const char* fileName, const SharedPtr<So
     const SharedPtr<AnimatedValue<T>> value = makeValue<T>(channel, fileName);
     if (!value)
         return false;
-    group.addAnimation(connect<T>(channel, value, animator));
+    add(channel, createAnimationChannel<T>(value, animator), group);
     return true;
 }
 
@@ -129,7 +129,7 @@ bool addLightChannels(const Channel& channel, const char* fileName,
     if (!value)
         return false;
     for (const SharedPtr<Light>& light : lights)
-        group.addAnimation(connect<T>(channel, value, makeShared<LightAnimator>(light)));
+        add(channel, createAnimationChannel<T>(value, makeShared<LightAnimator>(light)), group);
     return true;
 }
 
@@ -172,7 +172,7 @@ bool addMaterialChannels(const Channel& channel, const std::vector<AnimationKey<
         [&](const SharedPtr<Appearance>& appearance, bool)
         {
             const auto animator = makeShared<AppearancePropertyAnimator<T>>(appearance, property.property);
-            group.addAnimation(connect<T>(channel, value, animator));
+            add(channel, createAnimationChannel<T>(value, animator), group);
         });
     return true;
 }
