@@ -3,15 +3,17 @@
 include(CMakePackageConfigHelpers)
 set(CMAKE_SKIP_INSTALL_ALL_DEPENDENCY ON) # the library is enough
 
-install(TARGETS orv EXPORT orvTargets
-    LIBRARY DESTINATION ${CMAKE_INSTALL_LIBDIR} COMPONENT runtime NAMELINK_COMPONENT development)
+install(TARGETS orv orv_extra EXPORT orvTargets
+    LIBRARY DESTINATION ${CMAKE_INSTALL_LIBDIR} COMPONENT runtime NAMELINK_COMPONENT development
+    ARCHIVE DESTINATION ${CMAKE_INSTALL_LIBDIR} COMPONENT development)
 
 # The interface, with those of its inner headers that it includes itself; an installed-tree test holds the two
 # against each other.
-foreach(room common maths pss facility render)
+foreach(room common maths pss facility render extra)
     install(DIRECTORY engine/${room}/api/orv DESTINATION ${CMAKE_INSTALL_INCLUDEDIR} COMPONENT development
         FILES_MATCHING PATTERN "*.h"
         PATTERN "detail/digestmaker.h" EXCLUDE
+        PATTERN "detail/eyes.h" EXCLUDE
         PATTERN "detail/formattedtext.h" EXCLUDE
         PATTERN "detail/littleendian.h" EXCLUDE
         PATTERN "detail/loadscope.h" EXCLUDE
@@ -42,7 +44,7 @@ Name: orv
 Description: Compact real-time 3D engine for OpenGL ES 2.0; its headers need C++20
 Version: @PROJECT_VERSION@
 Cflags: -I\${includedir}
-Libs: -L\${libdir} -lorv
+Libs: -L\${libdir} -lorvextra -lorv
 ")
 install(FILES ${CMAKE_CURRENT_BINARY_DIR}/orv.pc DESTINATION ${CMAKE_INSTALL_LIBDIR}/pkgconfig COMPONENT development)
 

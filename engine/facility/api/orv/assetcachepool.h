@@ -46,7 +46,7 @@ public:
 
     /// To be called after a message about a file that may not have been found: where no source has it, logs a warning that
     /// says where it was looked for, once in a load.
-    void explainMissing(const char* name) const;
+    ORV_LOCAL void explainMissing(const char* name) const;
 
     /// Opens a file of derived data; for writing, the source makes the folders of its name.
     /// @return empty without a cache source or where it cannot be opened.

@@ -66,10 +66,10 @@ public:
     /// are unknown.
     const Vector4f& getSphere() const { return m_sphere; }
     bool isCentred() const { return m_isCentred; } ///< that sphere's centre is the origin
-    static Vector4f makeSphere(const Bounds& bounds);
+    ORV_LOCAL static Vector4f makeSphere(const Bounds& bounds);
 
 private:
-    void takeBounds(const Bounds& bounds);
+    ORV_LOCAL void takeBounds(const Bounds& bounds);
 
     MeshHeader m_header;
     IndexBuffer::Ptr m_indexBuffer;

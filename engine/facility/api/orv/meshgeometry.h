@@ -37,7 +37,7 @@ public:
 /// Shares as the built-in programs make them of weights: that add up to 1 or, where the weights do not add up to more than
 /// 0, with all for the first joint. Joint numbers beyond 255 become that.
 /// @param joints  numbers; the nearest whole ones count.
-ORV_API MeshVertices::Influence makeInfluence(const Vector4f& joints, const Vector4f& weights);
+MeshVertices::Influence makeInfluence(const Vector4f& joints, const Vector4f& weights);
 
 /// Which sides of triangles count: their fronts are those from which their corners go round counter-clockwise.
 enum class TriangleSides

@@ -151,11 +151,10 @@ protected:
 
     static void assertSize(const ShaderUniformBase* other, int size);
 
-    /// Sends the values, which are of the holder's type, to the current program.
-    void sendValues(int location, int textureUnit, const void* values) const;
-
     void becomeSingle() { m_size = 1; }
     void touch() { m_revision = detail::nextRevision(); }
+
+    void* m_data = nullptr; ///< the values: the derived class's own one, or an array when there are more
 
 private:
     friend class ShaderProgram;
@@ -166,7 +165,7 @@ private:
     virtual bool takeOver(const ShaderUniformBase& source) = 0;
 
     /// Sends all own values to the current program.
-    virtual void send(int location, int textureUnit) const = 0;
+    ORV_LOCAL void send(int location, int textureUnit) const;
 
     uint64_t m_revision = detail::nextRevision();
     int m_type;
@@ -192,14 +191,14 @@ public:
     /// @param size  count of values; below 1 is an error and counts as 1.
     explicit ShaderUniform(int size)
         : ShaderUniformBase(detail::UniformTypes::indexOf<T>(), size)
-        , m_values(&m_single)
     {
+        m_data = &m_single;
         if (getSize() == 1)
             return;
 
         if (T* values = new (std::nothrow) T[std::size_t(getSize())]())
         {
-            m_values = values;
+            m_data = values;
             return;
         }
         ORV_LOG_ERROR("No memory for a uniform of %d values; setting to 1", getSize());
@@ -208,8 +207,8 @@ public:
 
     ~ShaderUniform() override
     {
-        if (m_values != &m_single)
-            delete[] m_values;
+        if (m_data != &m_single)
+            delete[] values();
     }
 
     using ShaderUniformBase::getValue;
@@ -230,20 +229,20 @@ public:
     {
         if (index < 0 || index >= getSize())
             return false;
-        value = m_values[index];
+        value = values()[index];
         return true;
     }
 
     /// @param index  in [0, getSize()); not checked.
-    const T& get(int index = 0) const { return m_values[index]; }
+    const T& get(int index = 0) const { return values()[index]; }
 
     /// Stores the value; an equal one (components compared with ==) changes nothing.
     /// @param index  in [0, getSize()); not checked.
     void set(const T& value, int index = 0)
     {
-        if (m_values[index] == value)
+        if (values()[index] == value)
             return;
-        m_values[index] = value;
+        values()[index] = value;
         touch();
     }
 
@@ -257,8 +256,8 @@ private:
         if (!source.holds<T>())
             return false;
         bool changed = false;
-        const T* from = static_cast<const ShaderUniform&>(source).m_values;
-        for (T *to = m_values, *const end = to + std::min(m_size, source.m_size); to != end; ++to, ++from)
+        const T* from = static_cast<const ShaderUniform&>(source).values();
+        for (T *to = values(), *const end = to + std::min(m_size, source.m_size); to != end; ++to, ++from)
         {
             if (*to == *from)
                 continue;
@@ -268,9 +267,9 @@ private:
         return changed;
     }
 
-    void send(int location, int textureUnit) const override { sendValues(location, textureUnit, m_values); }
+    T* values() { return static_cast<T*>(m_data); }
+    const T* values() const { return static_cast<const T*>(m_data); }
 
-    T* m_values; ///< m_single, or an array of its own when there are more
     T m_single{};
 };
 

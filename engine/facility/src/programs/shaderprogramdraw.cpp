@@ -109,7 +109,7 @@ void ShaderProgram::sendHeldTransform(const detail::UniformSources& sources, det
 
 void ShaderProgram::sendTransform(detail::DrawnUniform& uniform, const Matrix4f& matrix)
 {
-    Matrix4f& sent = *static_cast<ShaderUniform<Matrix4f>&>(*uniform.sent.get()).m_values;
+    Matrix4f& sent = *static_cast<ShaderUniform<Matrix4f>&>(*uniform.sent.get()).values();
     // The translation first: it differs most.
     if (sent.columns[3] == matrix.columns[3] && sent == matrix)
         return;
@@ -120,7 +120,7 @@ void ShaderProgram::sendTransform(detail::DrawnUniform& uniform, const Matrix4f&
 
 void ShaderProgram::sendTransform(detail::DrawnUniform& uniform, const Matrix3f& matrix)
 {
-    Matrix3f& sent = *static_cast<ShaderUniform<Matrix3f>&>(*uniform.sent.get()).m_values;
+    Matrix3f& sent = *static_cast<ShaderUniform<Matrix3f>&>(*uniform.sent.get()).values();
     if (sent == matrix)
         return;
     sent = matrix;

@@ -233,9 +233,9 @@ void ShaderUniformBase::assertSize(const ShaderUniformBase* other, int size)
     ORV_ASSERT(other->getSize() >= size);
 }
 
-void ShaderUniformBase::sendValues(int location, int textureUnit, const void* values) const
+void ShaderUniformBase::send(int location, int textureUnit) const
 {
-    SENDERS[std::size_t(m_type)](location, textureUnit, m_size, values);
+    SENDERS[std::size_t(m_type)](location, textureUnit, m_size, m_data);
 }
 
 void ShaderUniformBase::enable(const SharedPtr<ShaderUniformBase>& source, int location, int textureUnit,

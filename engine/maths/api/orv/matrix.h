@@ -181,7 +181,7 @@ inline bool isAffine(const Matrix4<float>& m)
 
 /// An upper limit of what an affine transform does to lengths: where its axes stay at right angles, what it does to the
 /// most stretched of them. Infinite if it is not affine.
-ORV_API float getStretch(const Matrix4<float>& m);
+float getStretch(const Matrix4<float>& m);
 
 } // namespace detail
 

@@ -115,7 +115,7 @@ public:
     void endFades();
 
 private:
-    struct Smooth;
+    struct ORV_LOCAL Smooth;
 
     ORV_LOCAL void move(float deltaTime);
     ORV_LOCAL void applySmoothly(float deltaTime);

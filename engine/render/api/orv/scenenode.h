@@ -138,7 +138,7 @@ public:
     /// Draw path, of nodes with children: a sphere in this node's own space around all solids of the subtree, as
     /// Mesh::getSphere() has it. Infinite where the subtree has lights, solids with joints, solids of unknown bounds, or
     /// nodes that have moved since the last call but one.
-    Vector4f getReach() const;
+    ORV_LOCAL Vector4f getReach() const;
     /// The solids inside of the reach that getReach() has told.
     uint32_t countReach() const { return m_extras ? m_extras->reachSolids : 0; }
     /// Draw path: an upper limit of what the world transform does to lengths; infinite if it is not affine.
@@ -190,7 +190,7 @@ private:
     ORV_LOCAL void placeBelow(const Matrix4f& parentWorld, bool parentMirrored, bool parentRigid) const;
     ORV_LOCAL Extras* makeExtras() const;
     Matrix3f findNormal() const;
-    float findStretch() const;
+    ORV_LOCAL float findStretch() const;
     ORV_LOCAL void markChildren();
     ORV_LOCAL Vector4f findReach() const;
     ORV_LOCAL Vector4f getOwnReach() const;
@@ -200,7 +200,7 @@ private:
     /// What those above this node know of it does not hold any longer.
     ORV_LOCAL void changeKnownPlace();
     /// Of this node and those above it.
-    static void forgetReach(const SceneNode* node);
+    ORV_LOCAL static void forgetReach(const SceneNode* node);
 
     mutable bool m_localMirrored = false;
     mutable bool m_worldMirrored = false;

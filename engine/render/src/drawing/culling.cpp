@@ -1,6 +1,6 @@
 #include "culling.h"
 
-#include "eyes.h"
+#include "orv/detail/eyes.h"
 
 #include "orv/appearance.h"
 #include "orv/mesh.h"

@@ -99,7 +99,7 @@ DrawMark DrawGroups::numberMesh(const Mesh* mesh)
 }
 
 /// The order by meshes first: that by materials then leaves it as it is within each.
-void DrawGroups::finish()
+[[gnu::noinline]] void DrawGroups::finish()
 {
     if (m_meshCount > 2)
         sortByMesh();

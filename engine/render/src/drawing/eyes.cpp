@@ -1,4 +1,4 @@
-#include "eyes.h"
+#include "orv/detail/eyes.h"
 
 #include "orv/camera.h"
 #include "orv/rendercontext.h"
@@ -31,30 +31,6 @@ MirroredView::MirroredView(RenderContext& context, const Camera* camera)
 MirroredView::~MirroredView()
 {
     m_context.setViewMirrored(m_before);
-}
-
-Viewport getViewport(const RenderContext& context)
-{
-    return {context.getViewportX(), context.getViewportY(), context.getViewportWidth(),
-            context.getViewportHeight()};
-}
-
-void setViewport(RenderContext& context, const Viewport& viewport)
-{
-    context.setViewport(viewport.x, viewport.y, viewport.width, viewport.height);
-}
-
-float getAspect(const Viewport& viewport)
-{
-    if (viewport.width <= 0 || viewport.height <= 0)
-        return 1.0f;
-    return static_cast<float>(viewport.width) / static_cast<float>(viewport.height);
-}
-
-Viewport getHalf(const Viewport& viewport, int eye)
-{
-    const int width = viewport.width / 2;
-    return {viewport.x + eye * width, viewport.y, width, viewport.height};
 }
 
 } // namespace orv::detail

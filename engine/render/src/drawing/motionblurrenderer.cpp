@@ -1,6 +1,6 @@
 #include "orv/motionblurrenderer.h"
 
-#include "eyes.h"
+#include "orv/detail/eyes.h"
 #include "rendererproperties.h"
 
 #include "orv/appearance.h"

@@ -2,7 +2,7 @@
 
 #include "culling.h"
 #include "drawgroups.h"
-#include "eyes.h"
+#include "orv/detail/eyes.h"
 #include "rendererproperties.h"
 #include "solidpainter.h"
 

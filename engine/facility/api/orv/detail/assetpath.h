@@ -48,7 +48,7 @@ public:
 
     /// To be called after a message about a file that may not have been found: where no source has it, logs a warning that
     /// says where it was looked for, once in a load.
-    void explainMissing(const char* name) const;
+    ORV_LOCAL void explainMissing(const char* name) const;
 
     /// Stored for the application; the engine does not use it.
     void setCacheDirectory(const char* directory);

@@ -1,13 +1,14 @@
 #pragma once
 
 #include "orv/detail/viewport.h"
+#include "orv/export.h"
 #include "orv/matrix.h"
+#include "orv/rendercontext.h"
 
 namespace orv
 {
 
 class Camera;
-class RenderContext;
 
 namespace detail
 {
@@ -22,7 +23,7 @@ struct Eye
 /// @param camera  may be null: one eye at the origin without projection.
 /// @param aspect  width / height of the whole view.
 /// @return 2 for a camera with an eye separation (left, right), else 1.
-int findEyes(Camera* camera, float aspect, Eye (&eyes)[2]);
+ORV_API int findEyes(Camera* camera, float aspect, Eye (&eyes)[2]);
 
 /// While it lives, the context turns windings if the camera's world transform mirrors.
 class MirroredView
@@ -39,14 +40,31 @@ private:
     bool m_before;
 };
 
-Viewport getViewport(const RenderContext& context);
-void setViewport(RenderContext& context, const Viewport& viewport);
+inline Viewport getViewport(const RenderContext& context)
+{
+    return {context.getViewportX(), context.getViewportY(), context.getViewportWidth(),
+            context.getViewportHeight()};
+}
+
+inline void setViewport(RenderContext& context, const Viewport& viewport)
+{
+    context.setViewport(viewport.x, viewport.y, viewport.width, viewport.height);
+}
 
 /// Width / height, 1 for an empty viewport.
-float getAspect(const Viewport& viewport);
+inline float getAspect(const Viewport& viewport)
+{
+    if (viewport.width <= 0 || viewport.height <= 0)
+        return 1.0f;
+    return static_cast<float>(viewport.width) / static_cast<float>(viewport.height);
+}
 
 /// The half that an eye (0 left, 1 right) draws to in stereo.
-Viewport getHalf(const Viewport& viewport, int eye);
+inline Viewport getHalf(const Viewport& viewport, int eye)
+{
+    const int width = viewport.width / 2;
+    return {viewport.x + eye * width, viewport.y, width, viewport.height};
+}
 
 } // namespace detail
 } // namespace orv

@@ -1,6 +1,6 @@
 #include "orv/debuglines.h"
 
-#include "eyes.h"
+#include "orv/detail/eyes.h"
 
 #include "orv/appearance.h"
 #include "orv/assetcachepool.h"
