@@ -431,6 +431,18 @@ TEST_F(GltfReader, animationsMoveAsTheFileHasThem)
     EXPECT_TRUE(isLost("animation-target"));
 }
 
+// Fault caught: vertices at the end that make no whole face and go without a word.
+TEST_F(GltfReader, facesThatAreCutShort)
+{
+    GltfWriter writer;
+    writer.setAttribute("POSITION", writer.add(Numbers{0, 0, 0, 1, 0, 0, 0, 1, 0, 1, 1, 0, 2, 2, 2}, "VEC3"));
+    EXPECT_EQ(1u, read(GltfWriter(writer).write()).mMeshes[0]->mNumFaces);
+    EXPECT_TRUE(isLost("face"));
+    writer.primitive()["mode"] = 5;
+    EXPECT_EQ(3u, read(writer.write()).mMeshes[0]->mNumFaces);
+    EXPECT_FALSE(isLost("face"));
+}
+
 // Fault caught: instances, hidden nodes, lights and cameras that get lost, or scenes that get mixed.
 TEST_F(GltfReader, scenesHoldWhatTheFileHas)
 {

@@ -56,6 +56,8 @@ Faces makeFaces(size_t mode, const std::vector<uint32_t>& indices, size_t vertex
     made.cornersPerFace = CORNERS[mode];
     const size_t count = countFaces(mode, indices.size());
     made.corners.reserve(count * made.cornersPerFace);
+    const bool isList = mode == LINES || mode == TRIANGLES;
+    made.dropped = isList && indices.size() % made.cornersPerFace != 0 ? 1 : 0;
     for (size_t face = 0; face < count; ++face)
     {
         uint32_t corners[3];

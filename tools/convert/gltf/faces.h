@@ -12,7 +12,7 @@ struct Faces
 {
     unsigned cornersPerFace = 0; ///< 0 if the mode is none
     std::vector<uint32_t> corners;
-    size_t dropped = 0; ///< faces with an index over the end
+    size_t dropped = 0; ///< faces with an index over the end, or too few indices at the end to make one
 };
 
 /// @param mode         0 to 6: points, lines, a loop, a strip, triangles, a strip, a fan.

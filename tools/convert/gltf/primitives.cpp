@@ -100,7 +100,7 @@ private:
         if (m_faces.cornersPerFace == 0)
             m_primitive.fail("mode", "is none");
         if (m_faces.dropped > 0)
-            m_source.report.lose("face", "faces of " + m_what + " that name vertices it has not");
+            m_source.report.lose("face", "faces of " + m_what + " that name vertices it has not, or too few");
     }
 
     /// Files share long arrays of vertices among many primitives.
