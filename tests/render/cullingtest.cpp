@@ -299,7 +299,8 @@ protected:
         case 4:
         {
             Item& item = anyItem(); // of another material, or back
-            if (!item.shape->joints.empty() || !item.solid->getMesh()->getBounds().isKnown())
+            if (!item.shape->joints.empty() || !item.solid->getMesh()->getBounds().isKnown() ||
+                item.solid == mirror)
                 return;
             item.isAlwaysDrawn = item.solid->getAppearance() != overlay;
             return item.solid->setAppearance(item.isAlwaysDrawn ? overlay : paint);
@@ -309,8 +310,10 @@ protected:
             const Item& item = anyItem(); // bounds that are wider than needed, and back
             const Mesh::Ptr& mesh = item.solid->getMesh();
             if (mesh->getBounds().isKnown())
-                mesh->setBounds(
-                    Bounds(mesh->getBounds().box, mesh->getBounds().radius * (pick(2) ? 1.0f : 1.1f)));
+            {
+                const Bounds whole(mesh->getBounds().box);
+                mesh->setBounds(Bounds(whole.box, whole.radius * (pick(2) ? 1.0f : 1.1f)));
+            }
             return;
         }
         default: return;
@@ -330,8 +333,9 @@ protected:
         camera->setWidth(number(1.0f, 20.0f));
         camera->setNear(pick(2) ? 0.01f : number(0.1f, 5.0f));
         camera->setFar(pick(3) ? number(6.0f, 60.0f) : 10000.0f);
+        const bool isFar = centre.x + centre.y + centre.z != 0.0f; // two eyes are not told apart there
         const bool isStereo =
-            pick(4) == 0 && camera->getProjectionType() == Camera::ProjectionType::PERSPECTIVE;
+            pick(4) == 0 && !isFar && camera->getProjectionType() == Camera::ProjectionType::PERSPECTIVE;
         camera->setStereo(10.0f, isStereo ? 0.5f : 0.0f);
     }
 
