@@ -7,6 +7,7 @@ namespace window
 
 static_assert(key::ESCAPE == SDLK_ESCAPE && key::F1 == SDLK_F1 && key::HOME == SDLK_HOME &&
               key::END == SDLK_END && key::RIGHT == SDLK_RIGHT && key::LEFT == SDLK_LEFT &&
+              key::F11 == SDLK_F11 && key::UP == SDLK_UP && key::DOWN == SDLK_DOWN &&
               key::KEYPAD_MINUS == SDLK_KP_MINUS && key::KEYPAD_PLUS == SDLK_KP_PLUS);
 
 struct Window::Native
@@ -125,6 +126,11 @@ Event translate(const SDL_Event& native, float scale)
         event.turns =
             native.wheel.preciseY * (native.wheel.direction == SDL_MOUSEWHEEL_FLIPPED ? -1.0f : 1.0f);
         break;
+    case SDL_DROPFILE:
+        event.type = Event::Type::DROP;
+        event.path = native.drop.file ? native.drop.file : "";
+        SDL_free(native.drop.file); // the receiver's
+        break;
     default: break;
     }
     return event;
@@ -177,6 +183,16 @@ float Window::getScale() const
 void Window::setTitle(const std::string& title)
 {
     SDL_SetWindowTitle(m_native->window, title.c_str());
+}
+
+void Window::setFullScreen(bool isFull)
+{
+    SDL_SetWindowFullscreen(m_native->window, isFull ? SDL_WINDOW_FULLSCREEN_DESKTOP : 0);
+}
+
+bool Window::isFullScreen() const
+{
+    return (SDL_GetWindowFlags(m_native->window) & SDL_WINDOW_FULLSCREEN_DESKTOP) != 0;
 }
 
 Event Window::take(const void* nativeEvent)

@@ -23,10 +23,13 @@ namespace key
 {
 constexpr int32_t ESCAPE = 27;
 constexpr int32_t F1 = 0x4000003A;
+constexpr int32_t F11 = 0x40000044;
 constexpr int32_t HOME = 0x4000004A;
 constexpr int32_t END = 0x4000004D;
 constexpr int32_t RIGHT = 0x4000004F;
 constexpr int32_t LEFT = 0x40000050;
+constexpr int32_t DOWN = 0x40000051;
+constexpr int32_t UP = 0x40000052;
 constexpr int32_t KEYPAD_MINUS = 0x40000056;
 constexpr int32_t KEYPAD_PLUS = 0x40000057;
 } // namespace key
@@ -51,7 +54,8 @@ struct Event
         RELEASE,
         MOVE,
         WHEEL,
-        LEAVE ///< the pointer left the window
+        LEAVE, ///< the pointer left the window
+        DROP   ///< a file was dropped on the window
     };
 
     Type type = Type::OTHER;
@@ -62,6 +66,7 @@ struct Event
     float x = 0.0f;               ///< of the pointer, in pixels from the upper left corner
     float y = 0.0f;
     float turns = 0.0f; ///< steps of the wheel, away from the hand is more than 0
+    std::string path;   ///< of DROP
 };
 
 /// One window, with a GL context that is current on the thread that made it.
@@ -83,6 +88,10 @@ public:
     float getScale() const; ///< pixels for one of the desktop's units
 
     void setTitle(const std::string& title);
+
+    /// Takes the whole screen, without a change of its resolution, or gives it back. A SHOW follows.
+    void setFullScreen(bool isFull);
+    bool isFullScreen() const;
 
     /// @return false if there is no event.
     bool poll(Event& event);

@@ -313,8 +313,7 @@ TEST(ViewKeys, thePageListsWhatTheWindowShows)
     std::string page((std::istreambuf_iterator<char>(file)), {});
     page.erase(std::remove(page.begin(), page.end(), '`'), page.end());
     for (const view::HeadsUp::Row& row : view::listKeys())
-        EXPECT_NE(std::string::npos, page.find(std::string("| ") + row.left + " | " + row.right + " |"))
-            << row.left;
+        EXPECT_NE(std::string::npos, page.find("| " + row.left + " | " + row.right + " |")) << row.left;
 
     EXPECT_EQ(view::Command::GO_TO_TENTH, view::findCommand('7'));
     EXPECT_EQ(view::Command::QUIT, view::findCommand(window::key::ESCAPE));

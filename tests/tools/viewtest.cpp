@@ -65,6 +65,7 @@ TEST_F(ViewPictureTest, failuresSayWhyAndWriteNothing)
         {"scene.glo --out a.png --tolerance 3", 2, "--compare"},
         {"scene.glo --out a.png --compare b.png --tolerance many", 2, "many"},
         {"scene.glo --out a.png --background pink", 2, "pink"},
+        {"scene.glo --out a.png --show axes,shoes", 2, "\"shoes\" is none of bounds, skeletons"},
         {"scene.glo --out a.png --material paint", 2, "paint"},
         {"scene.glo --out a.png --material paint=none.ap", 1, "none.ap: No such file"},
         {"scene.glo --out a.png --material tar=scene.glo", 1, "no material \"tar\"; there are \"paint\""},
@@ -227,4 +228,35 @@ TEST_F(ViewPictureTest, showsWhatIsNoScene)
         EXPECT_LT(100, countRed(picture("a.png"), 0, 90)) << scene;
     }
     EXPECT_TRUE(m_temporary.list().empty()) << "what a model was converted to";
+}
+
+// Faults caught: markings that are not drawn, in other places than where things are, or in pictures that did not ask.
+TEST_F(ViewPictureTest, marksWhatIsAskedFor)
+{
+    const auto draw = [&](const std::string& name, const std::string& options)
+    {
+        EXPECT_EQ(0,
+                  view("scene.glo --camera eye --time 1.5 --size 200x200 --out " + name + ".png " + options)
+                      .exitCode);
+        return picture(name + ".png");
+    };
+    const auto countNear = [](const Picture& picture, const support::Rgba& colour)
+    {
+        int count = 0;
+        for (int y = 0; y < picture.height; ++y)
+            for (int x = 0; x < picture.width; ++x)
+                count += isNear(picture.pixel(x, y), colour, 60);
+        return count;
+    };
+    const support::Rgba orange = {242, 140, 26, 255};
+    const Picture plain = draw("plain", "");
+    const int square = countRed(plain, 0, 200);
+    ASSERT_LT(2000, square);
+    EXPECT_EQ(0, countNear(plain, orange));
+    EXPECT_LT(100, countNear(draw("bounds", "--show bounds"), orange)) << "around the square, which is flat";
+    EXPECT_NE(plain.rgba, draw("axes", "--show axes").rgba);
+    const Picture edges = draw("edges", "--show wireframe");
+    EXPECT_LT(50, countRed(edges, 0, 200));
+    EXPECT_GT(square / 4, countRed(edges, 0, 200)) << "its edges and one across";
+    EXPECT_NE(edges.rgba, draw("all", "--show wireframe,axes,axes").rgba) << "a name said twice is shown";
 }

@@ -1,6 +1,7 @@
 #include "viewtest.h"
 
 #include "support/picture.h"
+#include "view/viewer.h"
 
 #include <chrono>
 #include <csignal>
@@ -11,6 +12,7 @@
 #include <iterator>
 #include <thread>
 
+#include <SDL2/SDL.h>
 #include <fcntl.h>
 #include <sys/wait.h>
 #include <unistd.h>
@@ -250,6 +252,92 @@ TEST_F(ViewWindowTest, drawsWhatPicturesShow)
     ASSERT_EQ(0, std::system(command.c_str()));
     EXPECT_TRUE(support::comparePictures("view-window", picture("drawn.png"), shown, {2, 0.01}));
     leave();
+}
+
+// Faults caught: a key that marks nothing, or not what it says; marks that stay; what is hidden and seen, or pointed at.
+TEST_F(ViewWindowTest, marksAndHidesWhatIsAskedFor)
+{
+    view("scene.glo --camera eye --clip rest");
+    use("key space key 0");
+    const Picture plain = takePicture();
+    std::vector<Picture> marked;
+    for (const std::string key : {"o", "j", "a", "g", "w"})
+    {
+        use("key " + key);
+        marked.push_back(takePicture());
+        EXPECT_FALSE(areSame(plain, marked.back())) << key;
+        for (size_t i = 0; i + 1 < marked.size(); ++i)
+            EXPECT_FALSE(areSame(marked[i], marked.back())) << key << " is like another";
+        use("key " + key);
+        EXPECT_TRUE(areSame(plain, takePicture())) << key;
+    }
+    use("key v");
+    EXPECT_EQ(0, countRed(takePicture(), 0, 320));
+    use("key v"); // nothing is under the pointer any more
+    use("key shift+v");
+    EXPECT_TRUE(areSame(plain, takePicture()));
+
+    use("key t");
+    EXPECT_TRUE(waitFor([&] { return isNear(takePicture("shift+s").pixel(310, 4), {33, 38, 46, 255}, 2); }));
+    const Picture tree = takePicture("shift+s");
+    use("key t");
+    EXPECT_TRUE(areSame(plain, takePicture()));
+    use("key v key t");
+    EXPECT_FALSE(areSame(tree, takePicture("shift+s"))) << "what is hidden is told";
+    use("key t key shift+v");
+    EXPECT_TRUE(areSame(plain, takePicture()));
+    leave();
+}
+
+// Faults caught: a file dropped that is not shown, found in the last one's folder by its name, or, where it is broken,
+// takes away what is shown.
+TEST_F(ViewWindowTest, showsFilesDroppedOnIt)
+{
+    m_folder.write("other/scene.glo", write(makeScene(orv::Vector4f(0, 0, 1, 1))));
+    const std::string before = std::filesystem::current_path();
+    std::filesystem::current_path(m_folder.path());
+    setenv("DISPLAY", m_environment.substr(8, m_environment.find(' ') - 8).c_str(), 1);
+    setenv("SDL_VIDEODRIVER", "x11", 1);
+    const auto push = [](Uint32 type, SDL_Keycode key, const std::string& path)
+    {
+        SDL_Event event{};
+        event.type = type;
+        if (type == SDL_KEYDOWN)
+            event.key.keysym.sym = key;
+        if (type == SDL_DROPFILE)
+            event.drop.file = SDL_strdup(path.c_str());
+        SDL_PushEvent(&event);
+    };
+    std::thread hand(
+        [&]
+        {
+            waitFor([] { return SDL_GetWindowFromID(1) != nullptr; });
+            push(SDL_DROPFILE, 0, m_folder.path("other/scene.glo"));
+            push(SDL_KEYDOWN, SDLK_0, "");
+            push(SDL_KEYDOWN, SDLK_s, "");
+            waitFor([&] { return m_folder.exists("scene-001.png"); });
+            push(SDL_DROPFILE, 0, m_folder.path("damaged.glo"));
+            push(SDL_DROPFILE, 0, m_folder.path("none.dae"));
+            push(SDL_KEYDOWN, SDLK_s, "");
+            waitFor([&] { return m_folder.exists("scene-002.png"); });
+            push(SDL_QUIT, 0, "");
+        });
+    view::Options options;
+    options.scene.path = "scene.glo";
+    options.width = 320;
+    options.height = 240;
+    std::string error;
+    EXPECT_TRUE(view::Viewer(options, nullptr).run(error)) << error;
+    hand.join();
+    std::filesystem::current_path(before);
+    const Picture dropped = picture("scene-001.png");
+    int blue = 0;
+    for (int y = 0; y < dropped.height; ++y)
+        for (int x = 0; x < dropped.width; ++x)
+            blue += isBlue(dropped.pixel(x, y));
+    EXPECT_LT(100, blue);
+    EXPECT_EQ(0, countRed(dropped, 0, 320));
+    EXPECT_TRUE(areSame(dropped, picture("scene-002.png")));
 }
 
 // Fault caught: a node that is named where another is seen, or none at all.

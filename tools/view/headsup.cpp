@@ -68,6 +68,12 @@ void HeadsUp::setTable(const std::vector<Row>& rows)
     m_rows = rows;
 }
 
+int HeadsUp::countRows(int height) const
+{
+    const float line = orv::Text::getLineHeight(*m_font);
+    return std::max(int((float(height) - 2.0f * line * GAP) / line), 1);
+}
+
 void HeadsUp::write(const char* text, float x, float y)
 {
     for (const float side : {-1.0f, 1.0f})
@@ -93,12 +99,12 @@ void HeadsUp::layOut()
 
     float column = 0.0f;
     for (const Row& row : m_rows)
-        column = std::max(column, orv::Text::measure(*m_font, row.left).x);
+        column = std::max(column, orv::Text::measure(*m_font, row.left.c_str()).x);
     float y = gap;
     for (const Row& row : m_rows)
     {
-        write(row.left, gap, y);
-        write(row.right, 3.0f * gap + column, y);
+        write(row.left.c_str(), gap, y);
+        write(row.right.c_str(), 3.0f * gap + column, y);
         y += line;
     }
     m_changed = false;

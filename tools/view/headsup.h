@@ -19,8 +19,8 @@ class HeadsUp
 public:
     struct Row
     {
-        const char* left;
-        const char* right;
+        std::string left;
+        std::string right;
     };
 
     /// @param context  of the picture; shared.
@@ -38,6 +38,9 @@ public:
     bool setLines(const std::string& lines);
     bool setMessage(const std::string& message);
     void setTable(const std::vector<Row>& rows); ///< empty for none
+
+    /// How many rows a table of that height has room for.
+    int countRows(int height) const;
 
     /// Draws over a viewport of that size. Only what has changed since is laid out again.
     void draw(int width, int height);

@@ -12,11 +12,12 @@ namespace
 
 using namespace window;
 
-constexpr HeadsUp::Row MOUSE[] = {
+const HeadsUp::Row MOUSE[] = {
     {"left button", "turn"},
     {"right or middle button, shift + left", "move"},
     {"wheel", "nearer and farther"},
     {"double click", "look at what is there from closer"},
+    {"a file dropped here", "is shown instead"},
 };
 
 struct Binding
@@ -55,6 +56,17 @@ const std::vector<Group>& getGroups()
         {{"s, shift + s", "save a picture in the current folder, without and with what is written over it"},
          {{Command::SAVE_SCREENSHOT, {'s'}}}},
         {{"b", "next background"}, {{Command::STEP_BACKGROUND, {'b'}}}},
+        {{"o", "boxes around what is drawn"}, {{Command::TOGGLE_BOUNDS, {'o'}}}},
+        {{"j", "joints, or how nodes hang together where there are none"},
+         {{Command::TOGGLE_SKELETONS, {'j'}}}},
+        {{"a", "axes of nodes: x red, y green, z blue"}, {{Command::TOGGLE_AXES, {'a'}}}},
+        {{"g", "a grid on the ground"}, {{Command::TOGGLE_GRID, {'g'}}}},
+        {{"w", "edges of triangles in place of the triangles"}, {{Command::TOGGLE_WIREFRAME, {'w'}}}},
+        {{"v, shift + v", "hide what is under the pointer, and show everything again"},
+         {{Command::HIDE, {'v'}}}},
+        {{"t, up, down", "the tree of nodes, and on in it"},
+         {{Command::TOGGLE_TREE, {'t'}}, {Command::TREE_UP, {key::UP}}, {Command::TREE_DOWN, {key::DOWN}}}},
+        {{"f11", "the full screen, and back"}, {{Command::TOGGLE_FULL_SCREEN, {key::F11}}}},
         {{"i", "the writing on and off"}, {{Command::TOGGLE_LINES, {'i'}}}},
         {{"r", "load again (happens by itself when a file changes)"}, {{Command::RELOAD, {'r'}}}},
         {{"h", "these keys"}, {{Command::TOGGLE_KEYS, {'h', key::F1}}}},

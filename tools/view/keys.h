@@ -28,6 +28,16 @@ enum class Command
     STEP_CLIP,       ///< backwards with shift
     SAVE_SCREENSHOT, ///< with the writing, with shift
     STEP_BACKGROUND,
+    TOGGLE_BOUNDS,
+    TOGGLE_SKELETONS,
+    TOGGLE_AXES,
+    TOGGLE_GRID,
+    TOGGLE_WIREFRAME,
+    HIDE, ///< what is under the pointer; everything shown again, with shift
+    TOGGLE_TREE,
+    TREE_UP,
+    TREE_DOWN,
+    TOGGLE_FULL_SCREEN,
     TOGGLE_LINES,
     RELOAD,
     TOGGLE_KEYS,

@@ -7,12 +7,18 @@
 namespace view
 {
 
-LiveScene::LiveScene(const SceneFile& file, Conversion* conversion) : m_file(file), m_conversion(conversion)
+LiveScene::LiveScene(const SceneFile& file, Conversion* conversion)
 {
-    if (!conversion)
-        return;
-    m_model = file.path;
-    m_file.path = conversion->getScenePath();
+    setFile(file, conversion);
+}
+
+void LiveScene::setFile(const SceneFile& file, Conversion* conversion)
+{
+    m_file = file;
+    m_conversion = conversion;
+    m_model = conversion ? file.path : "";
+    if (conversion)
+        m_file.path = conversion->getScenePath();
 }
 
 bool LiveScene::load(std::string& error)
@@ -20,6 +26,28 @@ bool LiveScene::load(std::string& error)
     std::unique_ptr<Stage> stage = loadStage(error);
     if (!stage)
         return false;
+    takeStage(std::move(stage));
+    watchFiles(true);
+    return true;
+}
+
+bool LiveScene::open(const SceneFile& file, Conversion* conversion, std::string& error)
+{
+    SceneFile before = m_file;
+    if (m_conversion)
+        before.path = m_model;
+    Conversion* const conversionBefore = m_conversion;
+    const std::set<std::string> folders = m_studio.getFolders();
+    m_studio.limitFolders({}); // files of the same name in the other file's folder are others
+    setFile(file, conversion);
+    std::unique_ptr<Stage> stage = loadStage(error);
+    if (!stage)
+    {
+        setFile(before, conversionBefore);
+        m_studio.limitFolders(folders);
+        return false;
+    }
+    m_player.reset();
     takeStage(std::move(stage));
     watchFiles(true);
     return true;

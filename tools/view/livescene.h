@@ -29,6 +29,10 @@ public:
     /// The first time. @return false if there is nothing to show; nothing else may be asked for then.
     bool load(std::string& error);
 
+    /// Shows another file from now on, played from its start.
+    /// @return false, with everything as it was, if it cannot be loaded.
+    bool open(const SceneFile& file, Conversion* conversion, std::string& error);
+
     /// Whether a file that matters has changed since the last load. Ask a few times a second.
     bool hasChanged() { return m_watcher.hasChanged(); }
 
@@ -43,13 +47,14 @@ public:
     uint64_t getTriangleCount() const { return m_triangleCount; }
 
 private:
+    void setFile(const SceneFile& file, Conversion* conversion);
     std::unique_ptr<Stage> loadStage(std::string& error);
     void takeStage(std::unique_ptr<Stage> stage);
     void watchFiles(bool isLoaded);
 
     SceneFile m_file;
     std::string m_model; ///< the file that m_file was converted from; "" if it was not
-    Conversion* m_conversion;
+    Conversion* m_conversion = nullptr;
     Studio m_studio;
     std::unique_ptr<Stage> m_stage;
     std::unique_ptr<Player> m_player;

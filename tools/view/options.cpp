@@ -2,10 +2,12 @@
 
 #include "commandline/commandline.h"
 
+#include <algorithm>
 #include <cmath>
 #include <cstdio>
 #include <cstdlib>
 #include <filesystem>
+#include <sstream>
 
 namespace view
 {
@@ -67,6 +69,22 @@ std::string checkDressing(const std::string& text)
                : text + ": not a material's name, = and a file";
 }
 
+/// "bounds,axes"
+std::string checkMarkings(const std::string& text, std::vector<Marking>& markings)
+{
+    markings.clear();
+    std::istringstream words(text);
+    for (std::string word; std::getline(words, word, ',');)
+    {
+        const Marking marking = findMarking(word);
+        if (marking == Marking::COUNT)
+            return text + ": \"" + word + "\" is none of " + listMarkings();
+        if (std::find(markings.begin(), markings.end(), marking) == markings.end())
+            markings.push_back(marking);
+    }
+    return "";
+}
+
 void addSceneOptions(CLI::App& app, Options& options, std::vector<std::string>& dressings)
 {
     app.add_option("scene", options.scene.path,
@@ -96,6 +114,9 @@ void addSceneOptions(CLI::App& app, Options& options, std::vector<std::string>& 
                            ? std::string()
                            : text + ": not a colour (#rrggbb, black, grey, white)";
             });
+    app.add_option("--show", "Beside the picture: bounds, skeletons, axes, grid, wireframe")
+        ->type_name("WHAT,...")
+        ->check([&options](const std::string& text) { return checkMarkings(text, options.markings); });
     app.add_option("--material", dressings, "Put an appearance file over a material of the scene")
         ->type_name("NAME=FILE.ap")
         ->expected(1)

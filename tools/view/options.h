@@ -1,6 +1,7 @@
 #pragma once
 
 #include "compare.h"
+#include "markings.h"
 #include "stage.h"
 
 #include "orv/colour.h"
@@ -24,6 +25,7 @@ struct Options
     std::string camera;   ///< "" for the free one
     std::string clip;     ///< "" for the whole time line
     std::optional<orv::Colour4f> background;
+    std::vector<Marking> markings; ///< to be shown, each once
 
     std::string out;   ///< "" opens a window
     float time = 0.0f; ///< seconds from the start of the clip

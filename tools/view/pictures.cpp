@@ -138,12 +138,16 @@ bool compare(const Options& options, const Picture& picture, std::string& error)
 class Session
 {
 public:
-    Session(const Options& options, Stage& stage, const headless::Context& context)
+    Session(const Options& options, Stage& stage, const headless::Context& context,
+            const orv::RenderContext::Ptr& renderContext)
         : m_options(options)
         , m_stage(stage)
         , m_context(context)
+        , m_markings(renderContext)
         , m_player(stage.getAnimation(), stage.getClips())
     {
+        for (const Marking marking : options.markings)
+            m_markings.toggle(marking);
     }
 
     bool run(std::string& error);
@@ -157,6 +161,7 @@ private:
     const Options& m_options;
     Stage& m_stage;
     const headless::Context& m_context;
+    Markings m_markings;
     Player m_player;
     std::vector<Shot> m_shots;
     Orbit m_orbit;
@@ -197,7 +202,7 @@ bool Session::draw(const Shot& shot, Picture& picture, std::string& error)
     }
     glcalls::resetCounts();
     const Stopwatch watch;
-    m_stage.draw(m_options.width, m_options.height);
+    m_markings.draw(m_stage, m_options.width, m_options.height);
     m_stats.glCalls = glcalls::total();
     m_stats.draws = glcalls::count(glDrawElements) + glcalls::count(glDrawArrays);
     glFinish();
@@ -292,7 +297,7 @@ bool drawPictures(const Options& options, const std::string& scenePath, std::str
     if (size.solids == 0)
         std::fprintf(stderr, "orv-view: %s: nothing to see in it\n", options.scene.path.c_str());
 
-    Session session(options, *stage, *context);
+    Session session(options, *stage, *context, studio.getContext());
     const bool isDrawn = session.run(error);
     if (isDrawn && options.wantsStats)
         printStats(options, size, loadMilliseconds, session.getStats());

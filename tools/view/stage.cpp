@@ -123,6 +123,7 @@ std::unique_ptr<Stage> Stage::load(Studio& studio, const SceneFile& file, std::s
     renderer->setOpaqueGrouped(true);                         // a model's parts come in any order
     renderer->setCulled(file.dressings.empty() && !isOnBall); // other programs may move vertices about
     stage->m_block = makeShared<orv::RenderBlock>(renderer, stage->m_scene, stage->m_freeCamera);
+    stage->m_block->setRenderFlags(orv::SceneNode::VISIBLE);
     stage->setBackground(BACKGROUND);
     return stage;
 }

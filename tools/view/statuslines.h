@@ -1,9 +1,16 @@
 #pragma once
 
 #include "framestats.h"
+#include "headsup.h"
 #include "player.h"
 
 #include <string>
+#include <vector>
+
+namespace orv
+{
+class SceneNode;
+}
 
 namespace view
 {
@@ -15,5 +22,8 @@ std::string describeFrame(const FrameStats& stats, uint64_t triangleCount);
 
 /// The clip, where in it the player is, and how it goes on; "" for what does not move.
 std::string describeClip(const Player& player);
+
+/// A row for each node of a tree, its name indented below its parent's; what it is, and whether it or one above is hidden.
+std::vector<HeadsUp::Row> listNodes(const orv::SceneNode& top);
 
 } // namespace view

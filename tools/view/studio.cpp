@@ -24,11 +24,29 @@ Studio::~Studio()
 
 void Studio::addFolder(const std::string& folder)
 {
-    if (std::find(m_folders.begin(), m_folders.end(), folder) != m_folders.end())
-        return;
+    const auto known = std::find(m_folders.begin(), m_folders.end(), folder);
+    if (known != m_folders.end())
+        return m_sources[size_t(known - m_folders.begin())]->setUsed(true);
     m_folders.push_back(folder);
     m_sources.push_back(makeShared<RecordingSource>(folder));
     m_pool->registerSource(m_sources.back());
+}
+
+std::set<std::string> Studio::getFolders() const
+{
+    std::set<std::string> folders;
+    for (size_t i = 0; i < m_folders.size(); ++i)
+    {
+        if (m_sources[i]->isUsed())
+            folders.insert(m_folders[i]);
+    }
+    return folders;
+}
+
+void Studio::limitFolders(const std::set<std::string>& folders)
+{
+    for (size_t i = 0; i < m_folders.size(); ++i)
+        m_sources[i]->setUsed(folders.count(m_folders[i]) > 0);
 }
 
 void Studio::forgetAssets()

@@ -31,6 +31,11 @@ public:
     /// Assets are looked for in this folder too from now on, after those that were added before.
     void addFolder(const std::string& folder);
 
+    /// The folders in which assets are looked for.
+    std::set<std::string> getFolders() const;
+    /// Assets are looked for in those of the added folders alone that are among these.
+    void limitFolders(const std::set<std::string>& folders);
+
     /// What is asked for from now on is read from its file again. Assets that a stage holds stay with it.
     void forgetAssets();
 

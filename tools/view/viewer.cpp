@@ -5,6 +5,8 @@
 #include "screenshot.h"
 #include "statuslines.h"
 
+#include "orv/sceneutil.h"
+
 #include "glcalls/glcalls.h"
 
 #include "orv/picking.h"
@@ -14,6 +16,7 @@
 #include <cmath>
 #include <cstdio>
 #include <filesystem>
+#include <functional>
 
 namespace view
 {
@@ -57,11 +60,13 @@ Viewer::Viewer(const Options& options, Conversion* conversion) : m_options(optio
 
 Viewer::~Viewer()
 {
-    m_headsUp.reset(); // both before the window, with whose GL they are
+    m_headsUp.reset(); // all before the window, with whose GL they are
+    m_markings.reset();
+    m_underPointer.reset();
     m_scene.reset();
 }
 
-bool Viewer::open(std::string& error)
+bool Viewer::openWindow(std::string& error)
 {
     window::Options wanted;
     wanted.title = fs::path(m_options.scene.path).filename().string() + " - orv-view";
@@ -76,6 +81,9 @@ bool Viewer::open(std::string& error)
     m_scene = std::make_unique<LiveScene>(m_options.scene, m_conversion);
     if (!m_scene->load(error))
         return false;
+    m_markings = std::make_unique<Markings>(m_scene->getStudio().getContext());
+    for (const Marking marking : m_options.markings)
+        m_markings->toggle(marking);
     if (m_options.background)
         getStage().setBackground(*m_options.background);
     openHeadsUp();
@@ -119,11 +127,14 @@ void Viewer::reload()
 {
     const std::string camera = m_eye.getCameraName(getStage());
     std::string error;
+    m_underPointer.reset();
+    m_markings->forget();
     if (!m_scene->reload(error))
         return say("The last good picture stays: " + error);
 
     m_eye.adopt(getStage(), getPlayer(), camera, m_window->getWidth(), m_window->getHeight());
     m_needsFrame = true;
+    fillTable();
     say("Loaded again");
 }
 
@@ -146,6 +157,7 @@ void Viewer::handle(const window::Event& event)
         m_isPointerInside = false;
         m_isPickOld = true;
         break;
+    case Type::DROP: open(event.path); break;
     case Type::OTHER: break;
     }
 }
@@ -174,6 +186,16 @@ void Viewer::handleKey(int32_t key, bool shift)
     case Command::STEP_CLIP: stepClip(shift ? -1 : 1); break;
     case Command::SAVE_SCREENSHOT: savePicture(shift); break;
     case Command::STEP_BACKGROUND: stepBackground(); break;
+    case Command::TOGGLE_BOUNDS: mark(Marking::BOUNDS); break;
+    case Command::TOGGLE_SKELETONS: mark(Marking::SKELETONS); break;
+    case Command::TOGGLE_AXES: mark(Marking::AXES); break;
+    case Command::TOGGLE_GRID: mark(Marking::GRID); break;
+    case Command::TOGGLE_WIREFRAME: mark(Marking::WIREFRAME); break;
+    case Command::HIDE: shift ? showAll() : hide(); break;
+    case Command::TOGGLE_TREE: toggleTree(); break;
+    case Command::TREE_UP: scrollTree(-1); break;
+    case Command::TREE_DOWN: scrollTree(1); break;
+    case Command::TOGGLE_FULL_SCREEN: m_window->setFullScreen(!m_window->isFullScreen()); break;
     case Command::TOGGLE_LINES: m_showsLines = !m_showsLines; break;
     case Command::RELOAD: reload(); break;
     case Command::TOGGLE_KEYS: toggleKeys(); break;
@@ -181,11 +203,100 @@ void Viewer::handleKey(int32_t key, bool shift)
     }
 }
 
+void Viewer::mark(Marking marking)
+{
+    m_markings->toggle(marking);
+}
+
+void Viewer::hide()
+{
+    if (m_isPickOld)
+        pick();
+    if (!m_underPointer)
+        return say("There is nothing under the pointer");
+    m_underPointer->setVisible(false);
+    m_isPickOld = true;
+    fillTable();
+}
+
+void Viewer::showAll()
+{
+    const std::function<void(orv::SceneNode&)> show = [&](orv::SceneNode& node)
+    {
+        node.setVisible(true);
+        for (const orv::SharedPtr<orv::SceneNode>& child : node.getChildren())
+            show(*child);
+    };
+    show(getStage().getScene());
+    m_isPickOld = true;
+    fillTable();
+}
+
 void Viewer::toggleKeys()
 {
     m_showsKeys = !m_showsKeys;
-    if (m_headsUp)
-        m_headsUp->setTable(m_showsKeys ? listKeys() : std::vector<HeadsUp::Row>());
+    m_showsTree = false;
+    fillTable();
+}
+
+void Viewer::toggleTree()
+{
+    m_showsTree = !m_showsTree;
+    m_showsKeys = false;
+    m_firstRow = 0;
+    fillTable();
+}
+
+void Viewer::scrollTree(int rows)
+{
+    m_firstRow += rows;
+    fillTable();
+}
+
+/// The keys, or that part of the tree that the window has room for.
+void Viewer::fillTable()
+{
+    if (!m_headsUp)
+        return;
+    std::vector<HeadsUp::Row> rows;
+    if (m_showsKeys)
+        rows = listKeys();
+    if (m_showsTree)
+    {
+        rows = listNodes(getStage().getTopNode());
+        const int room = m_headsUp->countRows(m_window->getHeight());
+        m_firstRow = std::clamp(m_firstRow, 0, std::max(int(rows.size()) - room, 0));
+        rows.erase(rows.begin(), rows.begin() + m_firstRow);
+        rows.resize(std::min(rows.size(), size_t(room)));
+    }
+    m_headsUp->setTable(rows);
+}
+
+/// Shows another file. What is shown stays if that one cannot be.
+void Viewer::open(const std::string& path)
+{
+    std::string error;
+    std::unique_ptr<Conversion> conversion;
+    bool isReady = true;
+    if (getFileKind(path) == FileKind::MODEL)
+    {
+        conversion = Conversion::create(path, m_options.converterArguments, error);
+        isReady = conversion && conversion->run(error);
+    }
+    const orv::Colour4f background = getStage().getBackground();
+    m_underPointer.reset();
+    m_markings->forget();
+    m_needsFrame = true;
+    if (!isReady || !m_scene->open({path, {}}, conversion.get(), error))
+        return say("What is shown stays: " + error);
+    m_dropped = std::move(conversion);
+    m_conversion = m_dropped.get();
+    m_options.scene = {path, {}};
+    getStage().setBackground(background);
+    m_window->setTitle(fs::path(path).filename().string() + " - orv-view");
+    frameAll();
+    fillTable();
+    say("h shows the keys");
 }
 
 void Viewer::handlePress(const window::Event& event)
@@ -280,7 +391,7 @@ void Viewer::advance()
 void Viewer::drawPicture()
 {
     m_eye.apply(getStage());
-    getStage().draw(m_window->getWidth(), m_window->getHeight());
+    m_markings->draw(getStage(), m_window->getWidth(), m_window->getHeight());
 }
 
 void Viewer::drawFrame()
@@ -291,7 +402,7 @@ void Viewer::drawFrame()
     drawPicture();
     m_stats.glCalls = glcalls::total();
     m_stats.draws = glcalls::count(glDrawElements) + glcalls::count(glDrawArrays);
-    if (m_headsUp && (m_showsLines || m_showsKeys))
+    if (m_headsUp && (m_showsLines || m_showsKeys || m_showsTree))
         m_headsUp->draw(m_window->getWidth(), m_window->getHeight());
     m_window->show();
     m_stats.addFrame(std::chrono::duration<double>(Clock::now().time_since_epoch()).count());
@@ -300,14 +411,17 @@ void Viewer::drawFrame()
 void Viewer::pick()
 {
     m_isPickOld = false;
-    m_underPointer.clear();
+    m_underPointer.reset();
     if (!m_isPointerInside || m_held != window::Button::NONE)
         return;
     const orv::Ray ray = castThrough(getStage().getCamera(), m_pointerX, m_pointerY,
                                      float(m_window->getWidth()), float(m_window->getHeight()));
-    const std::vector<orv::PickHit> hits = orv::pick(getStage().getScene(), ray);
-    if (!hits.empty())
-        m_underPointer = findName(*hits.front().solid);
+    for (const orv::PickHit& hit : orv::pick(getStage().getScene(), ray))
+    {
+        if (m_underPointer || !orv::getDerivedFlags(*hit.solid, orv::SceneNode::VISIBLE))
+            continue;
+        m_underPointer = hit.solid;
+    }
 }
 
 void Viewer::say(const std::string& message)
@@ -332,15 +446,18 @@ void Viewer::writeHeadsUp()
     const std::string camera = m_eye.getCameraName(getStage());
     if (!camera.empty())
         lines += "\ncamera " + camera;
-    if (!m_underPointer.empty())
-        lines += "\nunder the pointer: " + m_underPointer;
+    const std::string marked = m_markings->describe();
+    if (!marked.empty())
+        lines += "\nshown: " + marked;
+    if (m_underPointer)
+        lines += std::string("\nunder the pointer: ") + findName(*m_underPointer);
     const bool isOther = m_headsUp->setLines(lines);
     m_needsFrame = m_headsUp->setMessage(m_message) || isOther || m_needsFrame;
 }
 
 bool Viewer::run(std::string& error)
 {
-    if (!open(error))
+    if (!openWindow(error))
         return false;
     while (!m_quits)
     {

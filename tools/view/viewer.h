@@ -5,6 +5,7 @@
 #include "framestats.h"
 #include "headsup.h"
 #include "livescene.h"
+#include "markings.h"
 #include "options.h"
 
 #include "window/window.h"
@@ -39,7 +40,7 @@ private:
     Stage& getStage() const { return m_scene->getStage(); }
     Player& getPlayer() const { return m_scene->getPlayer(); }
 
-    bool open(std::string& error);
+    bool openWindow(std::string& error);
     bool chooseBeginning(std::string& error);
     void openHeadsUp();
 
@@ -50,7 +51,14 @@ private:
     void handleKey(int32_t key, bool shift);
     void handlePress(const window::Event& event);
     void handleMove(const window::Event& event);
+    void mark(Marking marking);
+    void hide();
+    void showAll();
     void toggleKeys();
+    void toggleTree();
+    void scrollTree(int rows);
+    void fillTable();
+    void open(const std::string& path);
     void frameAll();
     void stepClip(int count);
     void stepCamera(int count);
@@ -65,19 +73,23 @@ private:
     void say(const std::string& message);
     void writeHeadsUp();
 
-    const Options& m_options;
+    Options m_options;
     Conversion* m_conversion;
+    std::unique_ptr<Conversion> m_dropped; ///< of the file that was dropped last, if it is a model
     std::unique_ptr<window::Window> m_window;
     std::unique_ptr<LiveScene> m_scene;
+    std::unique_ptr<Markings> m_markings;
     std::unique_ptr<HeadsUp> m_headsUp; ///< null without a font
     EyeControl m_eye;
     size_t m_background = 0;
 
     FrameStats m_stats;
     std::string m_message;
-    std::string m_underPointer;
+    orv::SharedPtr<orv::SceneNode> m_underPointer;
     bool m_showsLines = true;
     bool m_showsKeys = false;
+    bool m_showsTree = false;
+    int m_firstRow = 0; ///< of the tree that is shown
 
     window::Button m_held = window::Button::NONE;
     bool m_pans = false;
