@@ -21,10 +21,11 @@ Image::Image(int width, int height, int channels, const unsigned char* data)
         return;
     }
 
-    const std::size_t rowBytes = std::size_t(width) * std::size_t(channels);
-    const std::size_t maxRows = rowBytes > 0 ? std::numeric_limits<std::ptrdiff_t>::max() / rowBytes : 0;
-    if (rowBytes == 0 || std::size_t(height) <= maxRows)
-        m_data = new (std::nothrow) unsigned char[rowBytes * std::size_t(height)]();
+    const uint64_t rowBytes = uint64_t(width) * uint64_t(channels); // a size_t may have 32 bits
+    const uint64_t maxRows =
+        rowBytes > 0 ? uint64_t(std::numeric_limits<std::ptrdiff_t>::max()) / rowBytes : 0;
+    if (rowBytes == 0 || uint64_t(height) <= maxRows)
+        m_data = new (std::nothrow) unsigned char[std::size_t(rowBytes * uint64_t(height))]();
     if (!m_data)
     {
         ORV_LOG_ERROR("No memory for an image of %d x %d pixels of %d bytes.", width, height, channels);
@@ -34,7 +35,7 @@ Image::Image(int width, int height, int channels, const unsigned char* data)
     m_height = height;
     m_channelCount = channels;
     if (data)
-        std::memcpy(m_data, data, rowBytes * std::size_t(height));
+        std::memcpy(m_data, data, std::size_t(rowBytes * uint64_t(height)));
 }
 
 Image::Image(Stream& stream)
