@@ -3,7 +3,7 @@
 #   cmake -DFOLDER=dir -DNAMESPACE=orv -DOUTPUT=file.cpp -P embedassets.cmake
 #
 # FOLDER     read flat; every file in it becomes the asset "NAMESPACE#file name", byte for byte, but for shaders, which
-#            keep the comment that opens them and leave other comments, indentation and the blanks around operators
+#            keep the comment that opens them and leave other comments, indentation and blanks around assignments and sums
 #            out; their lines stay
 # NAMESPACE  asset namespace; the archive is called NAMESPACE_ARCHIVE, in upper case
 # OUTPUT     replaced when the assets have changed
@@ -34,7 +34,7 @@ foreach(name IN LISTS names)
         string(SUBSTRING "${text}" ${end} -1 text)
         string(REGEX REPLACE " *//[^\n]*" "" text "${text}")
         string(REGEX REPLACE "\n +" "\n" text "${text}")
-        string(REGEX REPLACE " (=|[-+*/]=?|&&|\\|\\||[<>?:]) " "\\1" text "${text}")
+        string(REGEX REPLACE " ([-+*/]?=|\\+) " "\\1" text "${text}")
         string(REPLACE ", " "," text "${text}")
         string(HEX "${comment}${text}" hex)
     endif()

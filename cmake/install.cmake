@@ -12,6 +12,7 @@ install(TARGETS orv orv_extra EXPORT orvTargets
 foreach(room common maths pss facility render extra)
     install(DIRECTORY engine/${room}/api/orv DESTINATION ${CMAKE_INSTALL_INCLUDEDIR} COMPONENT development
         FILES_MATCHING PATTERN "*.h"
+        PATTERN "detail/boundsrevision.h" EXCLUDE
         PATTERN "detail/digestmaker.h" EXCLUDE
         PATTERN "detail/eyes.h" EXCLUDE
         PATTERN "detail/formattedtext.h" EXCLUDE

@@ -27,6 +27,6 @@ function(check name depends)
 endfunction()
 
 check(liborv1 "libc6.*libegl1.*libgles2.*libstdc" "/liborv\\.so\\.1" "/usr/share/doc/liborv1/copyright")
-check(liborv-dev "liborv1 \\(= " "/liborv\\.so -> liborv\\.so\\.1" "/usr/include/orv/orv\\.h" "/usr/include/orv/.*\\.h"
+check(liborv-dev "liborv1 \\(= " "/liborv\\.so -> liborv\\.so\\.1" "/liborvextra\\.a" "/usr/include/orv/orv\\.h" "/usr/include/orv/.*\\.h"
     "/cmake/orv/orvConfig\\.cmake" "/cmake/orv/orv.*\\.cmake" "/pkgconfig/orv\\.pc" "/share/doc/liborv-dev/copyright"
     "/share/doc/liborv-dev/")

@@ -1,4 +1,5 @@
-// Fault caught: classes of a program's own that link only when they are compiled without type information.
+// Faults caught: classes of a program's own that link only when they are compiled without type information; parts of the
+// static library that do not.
 #include <orv/orv.h>
 
 namespace
@@ -30,4 +31,13 @@ int countNodes(orv::AssetCachePool& pool, orv::SceneNode& scene, orv::Appearance
     Counter counter;
     orv::visitScene(counter, scene);
     return counter.count;
+}
+
+bool isInSight(orv::AssetCachePool& pool, orv::RenderContext& context, orv::Camera& camera,
+               orv::SceneNode& scene)
+{
+    orv::DebugLines lines(pool);
+    lines.addSkeleton(scene, orv::Colour4f::RED);
+    lines.draw(context, camera);
+    return !orv::getWorldBounds(scene).box.isEmpty() && !orv::pick(scene, orv::Ray()).empty();
 }

@@ -50,7 +50,7 @@ enum class TriangleSides
 
 /// What a mesh draws, in memory: for exact bounds, and for rays that look for triangles.
 ///
-/// Threads: none; the first look for a triangle sorts them, some 0.1 seconds for 100,000.
+/// Threads: none; the first look for a triangle sorts them, which takes some tenths of a second for 100,000.
 class ORV_API MeshGeometry : public Shared
 {
 public:

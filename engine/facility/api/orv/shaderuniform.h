@@ -189,8 +189,7 @@ public:
     using Ptr = SharedPtr<ShaderUniform<T>>;
 
     /// @param size  count of values; below 1 is an error and counts as 1.
-    explicit ShaderUniform(int size)
-        : ShaderUniformBase(detail::UniformTypes::indexOf<T>(), size)
+    explicit ShaderUniform(int size) : ShaderUniformBase(detail::UniformTypes::indexOf<T>(), size)
     {
         m_data = &m_single;
         if (getSize() == 1)
