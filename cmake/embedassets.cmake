@@ -3,7 +3,7 @@
 #   cmake -DFOLDER=dir -DNAMESPACE=orv -DOUTPUT=file.cpp -P embedassets.cmake
 #
 # FOLDER     read flat; every file in it becomes the asset "NAMESPACE#file name", byte for byte, but for shaders, which
-#            keep the comment that opens them and leave other comments, indentation and blanks around assignments and sums
+#            keep the comment that opens them and leave other comments, indentation and blanks around operators
 #            out; their lines stay
 # NAMESPACE  asset namespace; the archive is called NAMESPACE_ARCHIVE, in upper case
 # OUTPUT     replaced when the assets have changed
@@ -35,6 +35,7 @@ foreach(name IN LISTS names)
         string(REGEX REPLACE " *//[^\n]*" "" text "${text}")
         string(REGEX REPLACE "\n +" "\n" text "${text}")
         string(REGEX REPLACE " ([-+*/]?=|\\+) " "\\1" text "${text}")
+        string(REGEX REPLACE "([a-z0-9)]) \\* " "\\1*" text "${text}") # no macro that begins with it
         string(REPLACE ", " "," text "${text}")
         string(HEX "${comment}${text}" hex)
     endif()

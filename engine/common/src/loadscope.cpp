@@ -10,6 +10,7 @@
 #include <map>
 #include <new>
 #include <string_view>
+#include <utility>
 
 namespace orv
 {
@@ -98,6 +99,7 @@ struct LoadLedger
     bool isReadingRefused = false;
     bool isTextureRefused = false;
     bool isProgramRefused = false;
+    bool isExplained = false; ///< where files are looked for
 };
 
 LoadScope::LoadScope(const char* name)
@@ -179,6 +181,11 @@ bool LoadScope::hasFailed(const void* cache, const std::string& name)
 {
     return t_ledger && !t_ledger->failures.empty() &&
            t_ledger->failures.find(toFailure(cache, name)) != t_ledger->failures.end();
+}
+
+bool LoadScope::mayExplain()
+{
+    return !t_ledger || !std::exchange(t_ledger->isExplained, true);
 }
 
 void LoadScope::forgetFailures()

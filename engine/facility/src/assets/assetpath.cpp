@@ -84,13 +84,10 @@ std::string AssetPath::describe() const
 
 void AssetPath::explainMissing(const char* name) const
 {
-    static const char HERE = 0; // stands for having been here, whichever cache asked
     const auto hasIt = [name](const SharedPtr<StreamSource>& source)
     { return source && source->exists(name); };
-    if (LoadScope::hasFailed(&HERE, "") || std::any_of(m_sources.begin(), m_sources.end(), hasIt))
-        return;
-    LoadScope::addFailure(&HERE, "");
-    ORV_LOG_WARN("\"%s\" was looked for in: %s", name, describe().c_str());
+    if (!std::any_of(m_sources.begin(), m_sources.end(), hasIt) && LoadScope::mayExplain())
+        ORV_LOG_WARN("\"%s\" was looked for in: %s", name, describe().c_str());
 }
 
 void AssetPath::setCacheDirectory(const char* directory)

@@ -17,25 +17,6 @@ bool isShare(float weight)
     return weight >= 0.0f && weight <= 1.0f;
 }
 
-/// Calls use(joint, place) for everything that a joint has a share in.
-/// @return false if there are shares that are none.
-template <class Use>
-bool forEachShare(const MeshVertices& vertices, const std::vector<bool>& drawn, const Use& use)
-{
-    bool areShares = true;
-    for (std::size_t vertex = 0; vertex < drawn.size(); ++vertex)
-    {
-        const MeshVertices::Influence& influence = vertices.influences[vertex];
-        for (int i = 0; drawn[vertex] && i < 4; ++i)
-        {
-            areShares = areShares && isShare(influence.weights[i]);
-            if (influence.weights[i] > 0.0f)
-                use(influence.joints[i], vertices.places[vertex]);
-        }
-    }
-    return areShares;
-}
-
 } // namespace
 
 MeshVertices::Influence makeInfluence(const Vector4f& joints, const Vector4f& weights)
@@ -100,23 +81,24 @@ Bounds MeshGeometry::findBounds() const
 
 std::vector<Bounds> MeshGeometry::findJointBounds() const
 {
-    if (m_vertices->influences.empty())
-        return {};
-    std::vector<Box> boxes;
-    const auto addPlace = [&boxes](uint8_t joint, const Vector3f& place)
+    std::vector<Vector3f> places[256]; // by joint
+    std::size_t jointCount = 0;
+    for (std::size_t vertex = 0; vertex < m_vertices->influences.size(); ++vertex)
     {
-        if (boxes.size() <= joint)
-            boxes.resize(std::size_t(joint) + 1);
-        boxes[joint].add(place);
-    };
-    if (!forEachShare(*m_vertices.get(), m_drawn, addPlace))
-        return {};
+        const MeshVertices::Influence& influence = m_vertices->influences[vertex];
+        for (int i = 0; m_drawn[vertex] && i < 4; ++i)
+        {
+            if (!isShare(influence.weights[i]))
+                return {};
+            if (influence.weights[i] == 0.0f)
+                continue;
+            places[influence.joints[i]].push_back(m_vertices->places[vertex]);
+            jointCount = std::max(jointCount, influence.joints[i] + std::size_t(1));
+        }
+    }
     std::vector<Bounds> bounds;
-    for (const Box& box : boxes)
-        bounds.push_back(Bounds(box, box.isEmpty() ? -1.0f : 0.0f));
-    const auto growRadius = [&bounds](uint8_t joint, const Vector3f& place)
-    { bounds[joint].radius = std::max(bounds[joint].radius, length(place - bounds[joint].box.getCentre())); };
-    forEachShare(*m_vertices.get(), m_drawn, growRadius);
+    for (std::size_t joint = 0; joint < jointCount; ++joint)
+        bounds.push_back(computeBounds(places[joint].data(), places[joint].size()));
     return bounds;
 }
 

@@ -44,6 +44,9 @@ public:
     static bool hasFailed(const void* cache, const std::string& name);
     static void forgetFailures(); ///< as when a source is added
 
+    /// Whether it has to be said where files are looked for: once in a load.
+    static bool mayExplain();
+
 private:
     std::unique_ptr<LoadLedger> m_ledger; ///< of the outermost
 };
