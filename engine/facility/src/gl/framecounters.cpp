@@ -32,7 +32,7 @@ FrameCounters countGlCalls()
 {
     using detail::GlKind;
     const detail::GlCounts& counts = detail::g_glCounts;
-    const auto get = [&counts](GlKind kind) { return counts.calls[int(kind)]; };
+    const auto get = [](GlKind kind) { return detail::g_glCounts.calls[int(kind)]; };
     FrameCounters counters;
     counters.draws = std::accumulate(counts.draws, counts.draws + 8, 0u);
     counters.triangles = counts.elements[GL_TRIANGLES] / 3 + counts.elements[GL_TRIANGLE_STRIP] +
