@@ -13,7 +13,7 @@
 namespace orv
 {
 
-class FlagMask;
+struct FlagMask;
 class Mesh;
 class Solid;
 
