@@ -62,7 +62,7 @@ std::vector<uint16_t> listEdges(const std::vector<uint32_t>& triangles)
     for (size_t i = 0; i + 2 < triangles.size(); i += 3)
     {
         for (size_t side = 0; side < 3; ++side)
-            edges.push_back(std::minmax(triangles[i + side], triangles[i + (side + 1) % 3]));
+            edges.emplace_back(std::minmax(triangles[i + side], triangles[i + (side + 1) % 3]));
     }
     std::sort(edges.begin(), edges.end());
     edges.erase(std::unique(edges.begin(), edges.end()), edges.end());
