@@ -6,7 +6,6 @@
 
 #include <cmath>
 #include <functional>
-#include <memory>
 
 using namespace orv;
 using support::LogCapture;
@@ -219,81 +218,6 @@ TEST_F(RenderContextTest, applySendsDifferencesAndSkipsWhatWasApplied)
 
     state.lineWidth = 3.0f;
     EXPECT_EQ(Calls{"glLineWidth(3)"}, callsOf([&] { target.apply(state, 78, false); }));
-}
-
-// Faults caught: a binding sent twice, or not although something else changed it; units and targets mixed up.
-TEST_F(RenderContextTest, bindingsAreSentOnceUntilTheyChangeElsewhere)
-{
-    GLuint texture = 0, buffer = 0;
-    glGenTextures(1, &texture);
-    glGenBuffers(1, &buffer);
-    const std::string bindTexture = "glBindTexture(0x0de1, " + std::to_string(texture) + ")";
-    const std::string bufferText = std::to_string(buffer);
-    auto target = makeShared<RenderContext>();
-    auto scope = std::make_unique<RenderContext::DrawScope>(*target);
-    const Step steps[] = {
-        {[&](auto& c) { c.bindTexture(1, GL_TEXTURE_2D, texture); },
-         {"glActiveTexture(0x84c1)", bindTexture}},
-        {[&](auto& c) { c.bindTexture(1, GL_TEXTURE_CUBE_MAP, 0); }, {"glBindTexture(0x8513, 0)"}},
-        {[&](auto& c) { c.bindTexture(1, GL_TEXTURE_2D, texture); }, {}},
-        {[&](auto& c) { c.bindTexture(0, GL_TEXTURE_2D, texture); },
-         {"glActiveTexture(0x84c0)", bindTexture}},
-        {[&](auto& c) { c.bindArrayBuffer(buffer); }, {"glBindBuffer(0x8892, " + bufferText + ")"}},
-        {[&](auto& c) { c.bindElementBuffer(buffer); }, {"glBindBuffer(0x8893, " + bufferText + ")"}},
-        {[&](auto& c) { c.bindArrayBuffer(buffer), c.bindElementBuffer(buffer); }, {}},
-        {[&](auto& c) { c.useProgram(0); }, {"glUseProgram(0)"}},
-        {[&](auto& c) { c.useProgram(0); }, {}},
-    };
-    for (size_t i = 0; i < std::size(steps); ++i)
-        EXPECT_EQ(steps[i].expected, callsOf([&] { steps[i].set(*target); })) << "step " << i;
-
-    target->setVertexInputBound(5, 6);
-    EXPECT_TRUE(target->isVertexInputBound(5, 6));
-    EXPECT_FALSE(target->isVertexInputBound(5, 7));
-    detail::bindingsChanged();
-    EXPECT_FALSE(target->isVertexInputBound(5, 6));
-    EXPECT_EQ((Calls{"glActiveTexture(0x84c1)", bindTexture}),
-              callsOf([&] { target->bindTexture(1, GL_TEXTURE_2D, texture); }));
-    EXPECT_EQ(Calls{"glUseProgram(0)"}, callsOf([&] { target->useProgram(0); }));
-
-    target->forgetBindings();
-    EXPECT_EQ(Calls{"glUseProgram(0)"}, callsOf([&] { target->useProgram(0); }));
-    scope = nullptr;
-    for (int i = 0; i < 2; ++i) // outside nothing is trusted
-    {
-        EXPECT_EQ(Calls{"glUseProgram(0)"}, callsOf([&] { target->useProgram(0); }));
-        target->setVertexInputBound(5, 6);
-        EXPECT_FALSE(target->isVertexInputBound(5, 6));
-    }
-
-    target = makeShared<RenderContext>();
-    EXPECT_EQ(Calls{"glUseProgram(0)"}, callsOf([&] { target->useProgram(0); }));
-    glDeleteTextures(1, &texture);
-    glDeleteBuffers(1, &buffer);
-}
-
-// Faults caught: an array of an earlier program left on; a constant trusted after an array was in its place.
-TEST_F(RenderContextTest, attributeArraysAreSwitchedByDifference)
-{
-    RenderContext target;
-    const RenderContext::DrawScope scope(target);
-    glEnableVertexAttribArray(7);
-    target.setAttribArrays(0b0111u);
-    for (GLuint i = 0; i < 8; ++i)
-    {
-        GLint enabled = -1;
-        glGetVertexAttribiv(i, GL_VERTEX_ATTRIB_ARRAY_ENABLED, &enabled);
-        EXPECT_EQ(i < 3 ? 1 : 0, enabled) << i;
-    }
-    EXPECT_EQ((Calls{"glDisableVertexAttribArray(2)", "glEnableVertexAttribArray(3)"}),
-              callsOf([&] { target.setAttribArrays(0b1011u); }));
-    EXPECT_EQ(Calls(), callsOf([&] { target.setAttribArrays(0b1011u); }));
-
-    EXPECT_EQ(Calls{"glVertexAttrib4fv(2, {1, 1, 1, 1})"}, callsOf([&] { target.setAttribOnes(2); }));
-    EXPECT_EQ(Calls(), callsOf([&] { target.setAttribOnes(2); }));
-    target.setAttribArrays(0b0100u);
-    target.setAttribArrays(0);
-    EXPECT_EQ(1u, callsOf([&] { target.setAttribOnes(2); }).size());
 }
 
 // Faults caught: GL errors, or a value sent again and again, from numbers that GL does not take.

@@ -367,7 +367,7 @@ TEST_F(ShaderProgramTest, knowsTheCurrentProgram)
     program->enable(*m_renderContext);
     EXPECT_EQ(program.get(), ShaderProgram::getCurrent(*m_renderContext));
     detail::bindingsChanged();
-    EXPECT_EQ(program->getId(), m_renderContext->getProgramInUse());
+    EXPECT_EQ(program->getId(), m_renderContext->getBindings().getProgramInUse());
     glUseProgram(0);
     detail::bindingsChanged();
     EXPECT_EQ(nullptr, ShaderProgram::getCurrent(*m_renderContext));

@@ -1,8 +1,7 @@
 #pragma once
 
-#include "orv/detail/bindingepoch.h"
+#include "orv/detail/bindings.h"
 #include "orv/detail/contextproperties.h"
-#include "orv/detail/programhandle.h"
 #include "orv/export.h"
 #include "orv/renderstate.h"
 #include "orv/shared.h"
@@ -20,7 +19,7 @@ class ShaderUniformBase;
 /// Every setter compares with a cached copy and calls GL only when something differs. The cache starts with
 /// the defaults of a freshly created context, so a RenderContext is made once, on a fresh GL context, and
 /// after a context loss a new one is made for the new context. State changed behind its back stays unnoticed;
-/// bindings (textures, buffers, programs) are the exception, see detail/bindingepoch.h.
+/// bindings (textures, buffers, programs) are the exception, see detail/bindings.h.
 /// An enum value outside its enum is logged, cached, and sent as GL_INVALID_ENUM, which GL refuses. A line width
 /// that is not above 0, a negative width or height, and NaN for a depth are logged, and the old value stays.
 /// GL thread only.
@@ -142,98 +141,20 @@ public:
 
     /// To be called inside a DrawScope after GL calls of your own that bound or unbound a program, a buffer or a
     /// texture, or that concerned the active texture unit or vertex attributes. Makes no GL call.
-    void forgetBindings();
+    void forgetBindings() { m_bindings.forget(); }
 
-    bool isDrawScopeOpen() const { return m_drawScopes != 0; }
+    bool isDrawScopeOpen() const { return m_bindings.isScopeOpen(); }
 
     /// Whether apply() turns every winding order once more, for a view that mirrors everything. Renderers set it
     /// for cameras whose world transform mirrors, and put it back.
     bool isViewMirrored() const { return m_viewTurns != 0; }
     void setViewMirrored(bool mirrored) { m_viewTurns = mirrored ? APPLY_TURNED : 0; }
 
-    // Draw path: bindings. Each operation does nothing when GL is known to hold what it asks for; what was
-    // remembered is forgotten first if bindings were changed elsewhere, or if no DrawScope is open.
-
-    void useProgram(unsigned name)
-    {
-        checkBindings();
-        if (name != m_program)
-            sendProgram(name);
-    }
-
-    /// Whether the program of this stamp was made ready and nothing else has been used since by way of this context.
-    bool isProgramReady(uint64_t programRevision) const { return m_readyProgram == programRevision; }
-
-    void setProgramReady(uint64_t programRevision) { m_readyProgram = programRevision; }
-
-    /// The program that GL draws with, 0 for none.
-    unsigned getProgramInUse() const;
-
-    /// The program object that was enabled last, for ShaderProgram::getCurrent(), which see.
-    void setCurrentProgram(const SharedPtr<detail::ProgramHandle>& handle) { m_currentProgram = handle; }
-    const SharedPtr<detail::ProgramHandle>& getCurrentProgram() const { return m_currentProgram; }
-
-    /// @param unit    from 0; GL_TEXTURE0 + unit is active afterwards if GL had to be called.
-    /// @param target  GL_TEXTURE_2D, GL_TEXTURE_CUBE_MAP or GL_TEXTURE_EXTERNAL_OES; what the unit's other
-    ///                targets hold stays.
-    void bindTexture(int unit, unsigned target, unsigned name)
-    {
-        bindTexture(unit, target, name, getTextureSlot(unit, target));
-    }
-
-    /// @param slot  what getTextureSlot() says of the two before.
-    void bindTexture(int unit, unsigned target, unsigned name, int slot)
-    {
-        checkBindings();
-        if (slot < 0 || m_textures[slot] != name)
-            sendTexture(unit, target, name, slot);
-    }
-
-    /// @return where a unit's target is remembered, -1 for what is not.
-    static int getTextureSlot(int unit, unsigned target);
-
-    void bindArrayBuffer(unsigned name)
-    {
-        checkBindings();
-        if (name != m_arrayBuffer)
-            sendArrayBuffer(name);
-    }
-
-    void bindElementBuffer(unsigned name)
-    {
-        checkBindings();
-        if (name != m_elementBuffer)
-            sendElementBuffer(name);
-    }
-
-    /// Switches vertex attribute arrays so that those of the mask's bits are enabled and all others are not.
-    void setAttribArrays(uint32_t enabledMask)
-    {
-        checkBindings();
-        if (!m_attribArraysKnown || enabledMask != m_attribArrays)
-            sendAttribArrays(enabledMask);
-    }
-
-    /// Gives a disabled attribute array's location the constant value (1, 1, 1, 1).
-    void setAttribOnes(unsigned location);
-
-    /// Whether arrays, pointers and constants are still those that were set up last for this pair.
-    bool isVertexInputBound(uint64_t programRevision, uint64_t vertexBufferRevision) const
-    {
-        return m_epoch == detail::g_bindingEpoch && m_inputProgram == programRevision &&
-               m_inputBuffer == vertexBufferRevision;
-    }
-
-    void setVertexInputBound(uint64_t programRevision, uint64_t vertexBufferRevision)
-    {
-        checkBindings();
-        m_inputProgram = programRevision;
-        m_inputBuffer = vertexBufferRevision;
-    }
+    /// What the engine has bound through this context.
+    detail::Bindings& getBindings() { return m_bindings; }
+    const detail::Bindings& getBindings() const { return m_bindings; }
 
 private:
-    static constexpr int TEXTURE_UNITS = 32; ///< remembered; higher units are bound every time
-    static constexpr int TEXTURE_TARGETS = 3;
     static constexpr uint32_t APPLY_BLEND = 1; ///< bits of m_appliedFlags
     static constexpr uint32_t APPLY_TURNED = 2;
 
@@ -241,23 +162,6 @@ private:
     {
         return ((blendEnabled ? APPLY_BLEND : 0u) | (turnWinding ? APPLY_TURNED : 0u)) ^ m_viewTurns;
     }
-    static constexpr unsigned UNKNOWN = 0xFFFFFFFFu;   ///< no GL object has this name
-    static constexpr uint64_t NO_EPOCH = ~uint64_t(0); ///< outside of scopes nothing is known
-
-    void checkBindings()
-    {
-        if (m_epoch != detail::g_bindingEpoch) [[unlikely]]
-            forgetBindings();
-    }
-
-    ORV_LOCAL void tidyBindings();
-    void sendProgram(unsigned name);
-    void sendTexture(int unit, unsigned target, unsigned name, int slot);
-    ORV_LOCAL void sendTextureElsewhere(int unit, unsigned target, unsigned name, int slot);
-    ORV_LOCAL void selectUnit(unsigned unit);
-    void sendArrayBuffer(unsigned name);
-    void sendElementBuffer(unsigned name);
-    void sendAttribArrays(uint32_t enabledMask);
 
     void applyChanged(const RenderState& state, uint64_t stateRevision, uint32_t flags);
     void stateChanged() { m_appliedRevision = 0; }
@@ -272,7 +176,7 @@ private:
     ORV_LOCAL static unsigned glStencilOperationConvert(StencilOperation operation);
 
     detail::ContextProperties m_properties;
-    SharedPtr<detail::ProgramHandle> m_currentProgram;
+    detail::Bindings m_bindings;
     bool m_blendEnabled = false;
     RenderState m_state;
     float m_depthRange[2] = {0.0f, 1.0f};
@@ -286,22 +190,6 @@ private:
     uint32_t m_appliedFlags = 0;
     uint32_t m_viewTurns = 0;   ///< APPLY_TURNED, or 0
     RenderState m_appliedState; ///< as it was given, before masks and winding order were chosen
-
-    unsigned m_drawScopes = 0;
-    bool m_bindingsUsed = false; ///< so there is something to tidy
-    bool m_attribArraysKnown = false;
-    uint32_t m_attribArrays = 0;
-    uint32_t m_allAttribArrays = 0; ///< those that the GL has; 0 before it was asked
-    uint32_t m_attribOnes = 0;      ///< locations known to hold the constant (1, 1, 1, 1)
-    uint64_t m_epoch = NO_EPOCH;
-    uint64_t m_inputProgram = 0;
-    uint64_t m_inputBuffer = 0;
-    uint64_t m_readyProgram = 0;
-    mutable unsigned m_program = UNKNOWN;
-    unsigned m_arrayBuffer = UNKNOWN;
-    unsigned m_elementBuffer = UNKNOWN;
-    unsigned m_activeUnit = UNKNOWN;
-    unsigned m_textures[TEXTURE_UNITS * TEXTURE_TARGETS];
 };
 
 /// The same for the back face and then the front face, each only when it differs.

@@ -98,7 +98,7 @@ detail::DrawCall IndexBuffer::bind(RenderContext& context)
     const GLenum mode = glPrimitiveConvert(m_primitive);
     if (buffer == 0 && !m_indices)
         return {Kind::IN_ORDER, mode, m_count, nullptr};
-    context.bindElementBuffer(buffer);
+    context.getBindings().bindElementBuffer(buffer);
     return {Kind::INDEXED, mode, m_count, buffer != 0 ? nullptr : m_indices.get()};
 }
 

@@ -3,14 +3,8 @@
 #include "countedgl.h"
 
 #include "orv/detail/revision.h"
-#include "orv/detail/texturetarget.h"
 #include "orv/log.h"
-#include "orv/renderdevice.h"
 
-#include <GLES2/gl2ext.h>
-
-#include <algorithm>
-#include <bit>
 #include <iterator>
 
 namespace orv
@@ -18,10 +12,6 @@ namespace orv
 
 namespace
 {
-
-static_assert(detail::TEXTURE_TARGET_2D == GL_TEXTURE_2D &&
-              detail::TEXTURE_TARGET_CUBE_MAP == GL_TEXTURE_CUBE_MAP &&
-              detail::TEXTURE_TARGET_EXTERNAL == GL_TEXTURE_EXTERNAL_OES);
 
 // GL's values in the order of the enums, each as long as the table of keywords.
 
@@ -90,15 +80,12 @@ WindingOrder turned(WindingOrder order)
 
 RenderContext::DrawScope::DrawScope(RenderContext& context) : m_context(context)
 {
-    ++m_context.m_drawScopes;
-    m_context.forgetBindings();
+    m_context.m_bindings.openScope();
 }
 
 RenderContext::DrawScope::~DrawScope()
 {
-    m_context.tidyBindings();
-    if (--m_context.m_drawScopes == 0)
-        m_context.forgetBindings();
+    m_context.m_bindings.closeScope();
 }
 
 RenderContext::RenderContext() : m_revision(detail::nextRevision())
@@ -114,8 +101,6 @@ RenderContext::RenderContext() : m_revision(detail::nextRevision())
     m_state.scissorWidth = scissor[2];
     m_state.scissorHeight = scissor[3];
     glGetIntegerv(GL_VIEWPORT, m_viewport);
-
-    forgetBindings();
 }
 
 RenderContext::~RenderContext() = default;
@@ -427,132 +412,6 @@ void RenderContext::applyChanged(const RenderState& state, uint64_t stateRevisio
     m_appliedState = state;
     m_appliedRevision = stateRevision;
     m_appliedFlags = flags;
-}
-
-unsigned RenderContext::getProgramInUse() const
-{
-    const bool isKnown = m_epoch == detail::g_bindingEpoch;
-    if (isKnown && m_program != UNKNOWN)
-        return m_program;
-    GLint program = 0;
-    glGetIntegerv(GL_CURRENT_PROGRAM, &program);
-    if (isKnown)
-        m_program = unsigned(program);
-    return unsigned(program);
-}
-
-void RenderContext::setAttribOnes(unsigned location)
-{
-    static const GLfloat ONES[4] = {1.0f, 1.0f, 1.0f, 1.0f};
-    checkBindings();
-    const uint32_t bit = location < 32 ? 1u << location : 0u;
-    if ((m_attribOnes & bit) != 0)
-        return;
-    glVertexAttrib4fv(location, ONES);
-    m_attribOnes |= bit;
-}
-
-void RenderContext::forgetBindings()
-{
-    m_epoch = m_drawScopes != 0 ? detail::g_bindingEpoch : NO_EPOCH;
-    m_attribArraysKnown = false;
-    m_attribOnes = 0;
-    m_inputProgram = 0;
-    m_inputBuffer = 0;
-    m_readyProgram = 0;
-    m_program = UNKNOWN;
-    m_arrayBuffer = UNKNOWN;
-    m_elementBuffer = UNKNOWN;
-    m_activeUnit = UNKNOWN;
-    std::fill(std::begin(m_textures), std::end(m_textures), UNKNOWN);
-}
-
-/// What is left on would be read by the application's own draws, from buffers that may be gone by then.
-void RenderContext::tidyBindings()
-{
-    if (!m_bindingsUsed)
-        return;
-    setAttribArrays(0);
-    bindArrayBuffer(0);
-    bindElementBuffer(0);
-    if (m_activeUnit != 0)
-        selectUnit(0);
-    m_bindingsUsed = false;
-}
-
-int RenderContext::getTextureSlot(int unit, unsigned target)
-{
-    constexpr GLenum TARGETS[TEXTURE_TARGETS] = {GL_TEXTURE_2D, GL_TEXTURE_CUBE_MAP, GL_TEXTURE_EXTERNAL_OES};
-    const auto found = std::find(std::begin(TARGETS), std::end(TARGETS), target);
-    if (unsigned(unit) >= unsigned(TEXTURE_UNITS) || found == std::end(TARGETS))
-        return -1;
-    return unit * TEXTURE_TARGETS + int(found - std::begin(TARGETS));
-}
-
-void RenderContext::sendProgram(unsigned name)
-{
-    glUseProgram(name);
-    m_program = name;
-    m_readyProgram = 0;
-}
-
-void RenderContext::sendTexture(int unit, unsigned target, unsigned name, int slot)
-{
-    if (m_activeUnit != unsigned(unit)) [[unlikely]]
-        return sendTextureElsewhere(unit, target, name, slot);
-    if (slot >= 0)
-        m_textures[slot] = name;
-    glBindTexture(target, name);
-}
-
-[[gnu::noinline]] void RenderContext::sendTextureElsewhere(int unit, unsigned target, unsigned name, int slot)
-{
-    selectUnit(unsigned(unit));
-    sendTexture(unit, target, name, slot);
-}
-
-void RenderContext::selectUnit(unsigned unit)
-{
-    glActiveTexture(GL_TEXTURE0 + unit);
-    m_activeUnit = unit;
-    m_bindingsUsed = true;
-}
-
-void RenderContext::sendArrayBuffer(unsigned name)
-{
-    m_bindingsUsed = true;
-    glBindBuffer(GL_ARRAY_BUFFER, name);
-    m_arrayBuffer = name;
-}
-
-void RenderContext::sendElementBuffer(unsigned name)
-{
-    m_bindingsUsed = true;
-    glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, name);
-    m_elementBuffer = name;
-}
-
-void RenderContext::sendAttribArrays(uint32_t enabledMask)
-{
-    m_bindingsUsed = true;
-    if (m_allAttribArrays == 0)
-    {
-        const int count = RenderDevice::getMaxVertexAttributeVectors();
-        m_allAttribArrays = count < 32 ? (1u << count) - 1u : ~0u;
-    }
-    uint32_t different = m_attribArraysKnown ? enabledMask ^ m_attribArrays : m_allAttribArrays | enabledMask;
-    for (; different != 0; different &= different - 1u)
-    {
-        const auto location = unsigned(std::countr_zero(different));
-        if ((enabledMask >> location & 1u) != 0)
-            glEnableVertexAttribArray(location);
-        else
-            glDisableVertexAttribArray(location);
-    }
-    m_attribArrays = enabledMask;
-    m_attribArraysKnown = true;
-    // A draw leaves the constant value of an enabled array's location undefined.
-    m_attribOnes &= ~enabledMask;
 }
 
 unsigned RenderContext::glBlendFactorConvert(BlendFactor factor)

@@ -63,7 +63,8 @@ bool VertexBuffer::enableAttrib(unsigned int location, const char* name)
 void VertexBuffer::bindAttribs(RenderContext& context, uint64_t programRevision,
                                const detail::ProgramAttrib* attribs, int count)
 {
-    if (context.isVertexInputBound(programRevision, m_revision))
+    detail::Bindings& bindings = context.getBindings();
+    if (bindings.isVertexInputBound(programRevision, m_revision))
         return;
     const Plan& plan = getPlan(programRevision, attribs, count);
     const GLuint buffer = getId();
@@ -74,15 +75,15 @@ void VertexBuffer::bindAttribs(RenderContext& context, uint64_t programRevision,
         const AttribRecord* record = plan.sources[unsigned(i)];
         if (!record || !isDrawable(*record, buffer))
         {
-            context.setAttribOnes(location);
+            bindings.setAttribOnes(location);
             continue;
         }
-        context.bindArrayBuffer(getSourceBuffer(*record, buffer));
+        bindings.bindArrayBuffer(getSourceBuffer(*record, buffer));
         setPointer(location, *record);
         enabled |= 1u << location;
     }
-    context.setAttribArrays(enabled);
-    context.setVertexInputBound(programRevision, m_revision);
+    bindings.setAttribArrays(enabled);
+    bindings.setVertexInputBound(programRevision, m_revision);
 }
 
 const VertexBuffer::Plan& VertexBuffer::getPlan(uint64_t programRevision,

@@ -262,7 +262,7 @@ void addUnits(const detail::DrawnUniform& sampler, const ShaderUniformBase* sour
 {
     for (int unit = sampler.textureUnit; unit < sampler.textureUnit + sampler.size; ++unit)
         units.push_back({source, unit, sampler.textureTarget,
-                         RenderContext::getTextureSlot(unit, sampler.textureTarget), 0});
+                         detail::Bindings::getTextureSlot(unit, sampler.textureTarget), 0});
 }
 
 } // namespace
@@ -409,9 +409,10 @@ bool ShaderProgram::getBinary(unsigned int& length, unsigned int& format, char*&
 
 ShaderProgram* ShaderProgram::getCurrent(const RenderContext& context)
 {
-    const detail::ProgramHandle* handle = context.getCurrentProgram().get();
+    const detail::ProgramHandle* handle = context.getBindings().getCurrentProgram().get();
     ShaderProgram* program = handle ? handle->program : nullptr;
-    const bool isCurrent = program && program->getId() && program->getId() == context.getProgramInUse();
+    const bool isCurrent =
+        program && program->getId() && program->getId() == context.getBindings().getProgramInUse();
     return isCurrent ? program : nullptr;
 }
 

@@ -53,7 +53,7 @@ const detail::UniformSources* ShaderProgram::prepare(RenderContext& context,
     for (const detail::UniformSources::Value* const end = own + sources.ownCount; own != end; ++own)
         sendIfNew(*own);
     for (const detail::UniformSources::Unit& unit : sources.units)
-        context.bindTexture(unit.unit, unit.target, unit.name, unit.slot);
+        context.getBindings().bindTexture(unit.unit, unit.target, unit.name, unit.slot);
     return &sources;
 }
 
@@ -61,7 +61,7 @@ const detail::UniformSources* ShaderProgram::prepare(RenderContext& context,
 /// its own. Every change is a new last revision, those of the program's sources and of bindings as well.
 inline bool ShaderProgram::isReady(const RenderContext& context, const detail::UniformSources& sources) const
 {
-    return context.isProgramReady(m_revision) && m_readyRevision == detail::g_lastRevision &&
+    return context.getBindings().isProgramReady(m_revision) && m_readyRevision == detail::g_lastRevision &&
            m_readyUniforms == sources.ownUniforms && sources.readyRevision == detail::g_lastRevision;
 }
 
@@ -72,9 +72,10 @@ inline bool ShaderProgram::isReady(const RenderContext& context, const detail::U
     const unsigned program = getId();
     if (!program)
         return false;
-    context.useProgram(program);
-    context.setCurrentProgram(m_handle);
-    context.setProgramReady(m_revision);
+    detail::Bindings& bindings = context.getBindings();
+    bindings.useProgram(program);
+    bindings.setCurrentProgram(m_handle);
+    bindings.setProgramReady(m_revision);
     link(context);
     if (sources.revision != m_sourcesRevision)
         resolve(values, sources);

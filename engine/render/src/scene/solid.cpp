@@ -167,7 +167,7 @@ detail::DrawCall Solid::bindMesh(RenderContext& context, ShaderProgram& program)
     IndexBuffer* const indices = m_mesh->getIndexBuffer().get();
     if (!vertices || !indices)
         return {};
-    if (!context.isVertexInputBound(program.getRevision(), vertices->getRevision()))
+    if (!context.getBindings().isVertexInputBound(program.getRevision(), vertices->getRevision()))
     {
         // Whatever a lost context took along, drawing the rest would read garbage.
         if (!program.getId() || vertices->isLost())
