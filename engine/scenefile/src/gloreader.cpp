@@ -50,54 +50,16 @@ bool isAllocatable(size_t size)
 
 } // namespace
 
-GloReader::GloReader(const SharedPtr<Stream>& stream, const char* name) : m_stream(stream), m_name(name)
-{
-    addChunkReader<GloScene>();
-    m_chunkReaders[Info::ID] = &GloReader::readInfo;
-    m_chunkReaders[Geometry::LIST_ID] = &GloReader::readList<&GloScene::geometries>;
-    addChunkReader<Geometry>();
-    addChunkReader<VertexSet>();
-    addChunkReader<VertexAttribute>();
-    addChunkReader<VertexData>();
-    addChunkReader<PrimitiveSet>();
-    addChunkReader<IndexData>();
-    m_chunkReaders[Material::LIST_ID] = &GloReader::readList<&GloScene::materials>;
-    addChunkReader<Material>();
-    addChunkReader<StandardMaterial>();
-    addChunkReader<Sampler>();
-    m_chunkReaders[Surfaces::ID] = &GloReader::readSurfaces;
-    m_chunkReaders[Skin::LIST_ID] = &GloReader::readList<&GloScene::skins>;
-    addChunkReader<Skin>();
-    addChunkReader<Attachment>();
-    m_chunkReaders[LightDefinition::LIST_ID] = &GloReader::readList<&GloScene::lights>;
-    addChunkReader<LightDefinition>();
-    m_chunkReaders[CameraDefinition::LIST_ID] = &GloReader::readList<&GloScene::cameras>;
-    addChunkReader<CameraDefinition>();
-    m_chunkReaders[AnimationData::LIST_ID] = &GloReader::readList<&GloScene::animations>;
-    addChunkReader<AnimationData>();
-    addChunkReader<Channel>();
-    m_chunkReaders[SceneData::ID] = &GloReader::readScene;
-    addChunkReader<NodeData>();
-    addChunkReader<GeometryReference>();
-    addChunkReader<SkinReference>();
-    addChunkReader<LightReference>();
-    addChunkReader<CameraReference>();
-}
-
-template <class Record>
-void GloReader::addChunkReader()
-{
-    m_chunkReaders[Record::ID] = &GloReader::readRecord<Record>;
-}
+GloReader::GloReader(const SharedPtr<Stream>& stream, const char* name) : m_stream(stream), m_name(name) {}
 
 bool GloReader::read()
 {
     return chunk(m_scene);
 }
 
-/// Reads one chunk by the operation for its ID. At the end of the stream a chunk that may be absent counts as
-/// read.
-bool GloReader::readChunk(const uint32_t ids[], bool skipUnknown)
+/// Goes to the data of the next chunk if its ID is one of those, a list that ends with 0. At the end of the stream a
+/// chunk that may be absent counts as skipped.
+GloReader::Opening GloReader::open(const uint32_t ids[], bool skipUnknown, OpenChunk& chunk)
 {
     ORV_ASSERT(ids);
     unsigned char word[4];
@@ -105,15 +67,16 @@ bool GloReader::readChunk(const uint32_t ids[], bool skipUnknown)
     if (!readExactly(word, sizeof(word)))
     {
         m_ended = true;
-        if (!skipUnknown || !isEnd)
-            ORV_GLO_ERROR("Failed to read chunk ID");
-        return skipUnknown && isEnd;
+        if (skipUnknown && isEnd)
+            return Opening::SKIPPED;
+        ORV_GLO_ERROR("Failed to read chunk ID");
+        return Opening::FAILED;
     }
     const uint32_t id = readLittleEndian(word);
     if (!readExactly(word, sizeof(word)))
     {
         ORV_GLO_ERROR("Failed to read %s chunk size", ChunkName(id).text);
-        return false;
+        return Opening::FAILED;
     }
     const uint32_t size = readLittleEndian(word);
 
@@ -121,44 +84,47 @@ bool GloReader::readChunk(const uint32_t ids[], bool skipUnknown)
     while (*known != 0 && *known != id)
         ++known;
     if (*known != 0)
-        return readListedChunk(id, size);
+        return enter(id, size, chunk);
     if (skipUnknown)
-        return skipChunk(id, size);
+        return skipChunk(id, size) ? Opening::SKIPPED : Opening::FAILED;
 
     std::string expected;
     for (known = ids; *known != 0; ++known)
         expected.append(expected.empty() ? "" : ", ").append(ChunkName(*known).text);
     ORV_GLO_ERROR("Chunk ID \"%s\" does not match expected ID(s): \"%s\"", ChunkName(id).text,
                   expected.c_str());
-    return false;
+    return Opening::FAILED;
 }
 
-bool GloReader::readChunk(uint32_t id, bool skipUnknown)
+GloReader::Opening GloReader::open(uint32_t id, bool skipUnknown, OpenChunk& chunk)
 {
     const uint32_t ids[] = {id, 0};
-    return readChunk(ids, skipUnknown);
+    return open(ids, skipUnknown, chunk);
 }
 
-bool GloReader::readListedChunk(uint32_t id, uint32_t size)
+GloReader::Opening GloReader::enter(uint32_t id, uint32_t size, OpenChunk& chunk)
 {
-    const auto reader = m_chunkReaders.find(id);
-    ORV_ASSERT(reader != m_chunkReaders.end());
-    if (reader == m_chunkReaders.end())
-        return false;
     if (m_depth >= MAX_CHUNK_DEPTH)
-        return fail("Chunks lie more than 512 deep in %s");
-
-    const uint32_t outerSize = m_chunkSize;
-    const uint32_t start = position();
+    {
+        fail("Chunks lie more than 512 deep in %s");
+        return Opening::FAILED;
+    }
+    chunk = {id, position(), m_chunkSize};
     m_chunkSize = size;
     ++m_depth;
-    const bool succeeded = (this->*reader->second)();
+    return Opening::OPENED;
+}
+
+/// @param isRead  whether its data were. @return that they were, and all of them.
+bool GloReader::close(const OpenChunk& chunk, bool isRead)
+{
+    const uint32_t size = m_chunkSize;
+    m_chunkSize = chunk.outerSize;
     --m_depth;
-    m_chunkSize = outerSize;
-    if (!succeeded)
+    if (!isRead)
         return false;
-    const uint32_t consumed = position() - start;
-    return consumed == size || sizeMismatch(id, consumed, size);
+    const uint32_t consumed = position() - chunk.start;
+    return consumed == size || sizeMismatch(chunk.id, consumed, size);
 }
 
 /// A chunk that reaches beyond the end is damaged: seeking there would wrap or, in some streams, stop short.
@@ -299,50 +265,44 @@ bool GloReader::acceptTool(const std::string& text)
 
 bool GloReader::body(GloScene& scene)
 {
-    ORV_ASSERT(&scene == &m_scene); // the operations of BODY_CHUNKS fill it
     while (!m_ended && !m_stream->eof())
     {
-        if (!readChunk(BODY_CHUNKS, true))
+        OpenChunk opened;
+        const Opening opening = open(BODY_CHUNKS, true, opened);
+        if (opening == Opening::FAILED)
+            return false;
+        if (opening == Opening::OPENED && !close(opened, bodyChunk(opened.id, scene)))
             return false;
     }
     return true;
 }
 
-template <class Record>
-bool GloReader::readRecord()
+/// One of BODY_CHUNKS.
+bool GloReader::bodyChunk(uint32_t id, GloScene& scene)
 {
-    return fields(*this, *static_cast<Record*>(std::exchange(m_record, nullptr)));
-}
-
-template <auto LIST>
-bool GloReader::readList()
-{
-    return listFields(*this, m_scene.*LIST);
-}
-
-bool GloReader::readInfo()
-{
-    m_tool = AuthoringTool::MAX;
-    return fields(*this, m_scene.info);
-}
-
-bool GloReader::readSurfaces()
-{
-    return fields(*this, m_scene.surfaces);
-}
-
-bool GloReader::readScene()
-{
-    if (m_scene.scene)
-        return fail("More than one scene in %s");
-    return fields(*this, m_scene.scene.emplace());
+    switch (id)
+    {
+    case Info::ID: m_tool = AuthoringTool::MAX; return fields(*this, scene.info);
+    case Geometry::LIST_ID: return listFields(*this, scene.geometries);
+    case Material::LIST_ID: return listFields(*this, scene.materials);
+    case Surfaces::ID: return fields(*this, scene.surfaces);
+    case Skin::LIST_ID: return listFields(*this, scene.skins);
+    case LightDefinition::LIST_ID: return listFields(*this, scene.lights);
+    case CameraDefinition::LIST_ID: return listFields(*this, scene.cameras);
+    case AnimationData::LIST_ID: return listFields(*this, scene.animations);
+    case SceneData::ID:
+        if (scene.scene)
+            return fail("More than one scene in %s");
+        return fields(*this, scene.scene.emplace());
+    default: return false;
+    }
 }
 
 template <class Record>
 bool GloReader::chunk(Record& record)
 {
-    m_record = &record;
-    return readChunk(Record::ID, false);
+    OpenChunk opened;
+    return open(Record::ID, false, opened) == Opening::OPENED && close(opened, fields(*this, record));
 }
 
 template <class Optional>
@@ -356,13 +316,16 @@ bool GloReader::chunks(uint32_t count, std::vector<Record>& records, bool skipUn
 {
     for (uint32_t i = 0; i < count && !m_ended; ++i)
     {
-        Record record;
-        m_record = &record;
-        if (!readChunk(Record::ID, skipUnknown))
+        OpenChunk opened;
+        const Opening opening = open(Record::ID, skipUnknown, opened);
+        if (opening == Opening::FAILED)
             return false;
-        const bool skipped = std::exchange(m_record, nullptr) != nullptr;
-        if (!skipped)
-            records.push_back(std::move(record));
+        if (opening == Opening::SKIPPED)
+            continue;
+        Record record;
+        if (!close(opened, fields(*this, record)))
+            return false;
+        records.push_back(std::move(record));
     }
     return true;
 }

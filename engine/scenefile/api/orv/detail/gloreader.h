@@ -3,7 +3,6 @@
 #include "orv/detail/glofields.h"
 #include "orv/stream.h"
 
-#include <map>
 #include <string>
 #include <vector>
 
@@ -52,21 +51,25 @@ public:
     bool each(uint32_t count, std::vector<Element>& elements, Fields&& elementFields);
 
 private:
-    using ChunkReader = bool (GloReader::*)();
+    enum class Opening
+    {
+        FAILED,
+        SKIPPED, ///< a chunk that was not asked for, or the end of the stream
+        OPENED
+    };
 
-    template <class Record>
-    void addChunkReader();
-    template <class Record>
-    bool readRecord();
-    template <auto LIST>
-    bool readList();
-    bool readInfo();
-    bool readSurfaces();
-    bool readScene();
+    struct OpenChunk
+    {
+        uint32_t id;
+        uint32_t start;     ///< of its data
+        uint32_t outerSize; ///< m_chunkSize around it
+    };
 
-    bool readChunk(const uint32_t ids[], bool skipUnknown);
-    bool readChunk(uint32_t id, bool skipUnknown);
-    bool readListedChunk(uint32_t id, uint32_t size);
+    Opening open(const uint32_t ids[], bool skipUnknown, OpenChunk& chunk);
+    Opening open(uint32_t id, bool skipUnknown, OpenChunk& chunk);
+    Opening enter(uint32_t id, uint32_t size, OpenChunk& chunk);
+    bool close(const OpenChunk& chunk, bool isRead);
+    bool bodyChunk(uint32_t id, glo::GloScene& scene);
     bool skipChunk(uint32_t id, uint32_t size);
     bool readExactly(void* buffer, uint32_t size);
     template <class Element>
@@ -78,9 +81,7 @@ private:
 
     SharedPtr<Stream> m_stream;
     std::string m_name;
-    std::map<uint32_t, ChunkReader> m_chunkReaders;
-    void* m_record = nullptr; ///< filled by the chunk that is read next; null from then on
-    bool m_ended = false;     ///< the stream had no further chunk
+    bool m_ended = false; ///< the stream had no further chunk
     uint32_t m_chunkSize = 0;
     int m_depth = 0;
     glo::FileVersion m_version;
