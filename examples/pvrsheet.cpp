@@ -35,7 +35,7 @@ constexpr int COLUMNS = 4;
 constexpr int CELL = 160; // pixels
 
 /// The crate's picture with a red, a green and a blue corner, fading out towards its edges.
-bool makePicture(pvr::Picture& picture)
+bool makePicture(pvr::SourcePicture& picture)
 {
     const SharedPtr<StreamSource> samples = makeShared<FileStreamSource>(SAMPLES_FOLDER "/showpiece");
     const SharedPtr<Stream> stream = samples->open("crate.png", false);
@@ -73,7 +73,7 @@ bool makePicture(pvr::Picture& picture)
 /// Names of textures in the pool, one for each cell.
 std::vector<std::string> writeFormats(AssetCachePool& pool, std::deque<std::vector<uint8_t>>& files)
 {
-    pvr::Picture picture;
+    pvr::SourcePicture picture;
     if (!makePicture(picture))
         return {};
     const auto source = makeShared<MemoryStreamSource>();

@@ -18,9 +18,9 @@ using Bytes = std::vector<uint8_t>;
 constexpr Header HEADERS[] = {Header::LEGACY_44, Header::LEGACY_52, Header::VERSION_3};
 
 /// Different in every pixel and channel, not symmetric.
-Picture makePicture(uint32_t width, uint32_t height)
+SourcePicture makePicture(uint32_t width, uint32_t height)
 {
-    Picture picture{width, height, {}};
+    SourcePicture picture{width, height, {}};
     for (uint32_t y = 0; y < height; ++y)
     {
         for (uint32_t x = 0; x < width; ++x)
@@ -89,7 +89,7 @@ TEST(PvrFile, everyHeaderAndByteOrderGivesTheSamePixels)
                                      {Header::VERSION_3, true, true, false, Bytes(5, 77)},
                                      {Header::LEGACY_44, true, true, true},
                                      {Header::LEGACY_52, false, true, true}};
-    const Picture picture = makePicture(16, 8);
+    const SourcePicture picture = makePicture(16, 8);
     for (unsigned i = 0; i < FORMAT_COUNT; ++i)
     {
         const auto format = Format(i);

@@ -23,9 +23,9 @@ using Filter = TextureParameters::FilterMode;
 using Wrap = TextureParameters::WrapMode;
 
 /// A picture of the view's size or smaller, in colours that run, with a fully opaque alpha unless told otherwise.
-pvr::Picture makePicture(uint32_t width, uint32_t height, bool isOpaque = true)
+pvr::SourcePicture makePicture(uint32_t width, uint32_t height, bool isOpaque = true)
 {
-    pvr::Picture picture{width, height, {}};
+    pvr::SourcePicture picture{width, height, {}};
     for (uint32_t y = 0; y < height; ++y)
     {
         for (uint32_t x = 0; x < width; ++x)
@@ -38,7 +38,7 @@ pvr::Picture makePicture(uint32_t width, uint32_t height, bool isOpaque = true)
     return picture;
 }
 
-pvr::Picture makeFlat(uint32_t width, uint32_t height, const support::Rgba& colour)
+pvr::SourcePicture makeFlat(uint32_t width, uint32_t height, const support::Rgba& colour)
 {
     return {width, height, Picture::filled(int(width), int(height), colour).rgba};
 }
@@ -100,7 +100,7 @@ TEST_F(PvrTextureLoaderTest, everyFormatShowsItsPicture)
         const pvr::FormatInfo& info = pvr::FORMATS[i];
         const std::string name = info.name + std::string(".pvr");
         const int width = info.isPvrtc() ? 32 : 30; // where rows may end anywhere, they do
-        const pvr::Picture picture = makePicture(unsigned(width), 32, false);
+        const pvr::SourcePicture picture = makePicture(unsigned(width), 32, false);
         LogCapture log;
         for (const bool isTurned : {false, true})
         {

@@ -467,7 +467,7 @@ TEST(Pictures, readsWebp)
         std::vector<uint8_t> bytes(encoded, encoded + size);
         WebPFree(encoded);
         convert::PictureHeader header;
-        convert::Picture picture;
+        convert::DecodedPicture picture;
         ASSERT_TRUE(convert::readHeader(bytes, header));
         EXPECT_EQ("", header.extension); // the engine reads none
         ASSERT_TRUE(convert::decodePicture(bytes, header, picture));
@@ -481,17 +481,18 @@ TEST(Pictures, readsWebp)
 // Fault caught: slopes that lean the wrong way; opacity from a map that lands in another pixel or channel.
 TEST(Pictures, mapsBecomeOthers)
 {
-    convert::Picture ramp{3, 3, 1, {0, 100, 200, 0, 100, 200, 0, 100, 200}};
+    convert::DecodedPicture ramp{3, 3, 1, {0, 100, 200, 0, 100, 200, 0, 100, 200}};
     ASSERT_TRUE(convert::makeNormals(ramp));
     EXPECT_LT(ramp.data[4 * 3], 100) << "rises to the right, so it looks left";
     EXPECT_NEAR(128, ramp.data[4 * 3 + 1], 1);
-    convert::Picture stairs{3, 3, 1, {200, 200, 200, 100, 100, 100, 0, 0, 0}}; // the top row is the highest
+    convert::DecodedPicture stairs{
+        3, 3, 1, {200, 200, 200, 100, 100, 100, 0, 0, 0}}; // the top row is the highest
     ASSERT_TRUE(convert::makeNormals(stairs));
     EXPECT_LT(stairs.data[4 * 3 + 1], 100) << "rises upwards, so it looks down";
-    convert::Picture normals{1, 1, 3, {128, 128, 255}};
+    convert::DecodedPicture normals{1, 1, 3, {128, 128, 255}};
     EXPECT_FALSE(convert::makeNormals(normals));
 
-    convert::Picture base{2, 1, 3, {1, 2, 3, 4, 5, 6}};
+    convert::DecodedPicture base{2, 1, 3, {1, 2, 3, 4, 5, 6}};
     convert::setAlpha(base, {2, 1, 1, {0, 255}});
     EXPECT_EQ((std::vector<uint8_t>{1, 2, 3, 0, 4, 5, 6, 255}), base.data);
 }

@@ -238,8 +238,8 @@ TEST(ViewCompare, countsWhatDiffers)
         bool isTolerable;
         size_t pixels;
     };
-    const view::Picture reference{2, 2, std::vector<uint8_t>(16, 100)};
-    view::Picture actual = reference;
+    const view::PngPicture reference{2, 2, std::vector<uint8_t>(16, 100)};
+    view::PngPicture actual = reference;
     actual.rgba[9] = 110; // the third pixel's green
     actual.rgba[15] = 98; // the fourth one's alpha
     const Case cases[] = {{"0", false, 2},   {"2", false, 1},   {"9,24.9", false, 1},

@@ -1,4 +1,5 @@
 #include "glcalls/weakdevice.h"
+#include "headless/headless.h"
 #include "support/logcapture.h"
 #include "support/picture.h"
 #include "support/tempdir.h"
@@ -9,11 +10,8 @@
 #include <iterator>
 #include <sstream>
 
-// The show-piece itself, with the scene that it draws.
-#define main showShowpiece
-#define SAMPLES_FOLDER ORV_SOURCE_FOLDER "/samples"
-#include "../../examples/showpiece.cpp"
-#undef main
+/// The main() of examples/showpiece.cpp, which is compiled into this program under that name.
+int showpiece_main(int argc, char** argv);
 
 namespace
 {
@@ -35,7 +33,7 @@ support::Picture draw(const std::string& commandLine)
     std::vector<char*> arguments;
     for (std::string& word : words)
         arguments.push_back(word.data());
-    EXPECT_EQ(0, showShowpiece(int(arguments.size()), arguments.data()));
+    EXPECT_EQ(0, showpiece_main(int(arguments.size()), arguments.data()));
     return support::readPng(words.back());
 }
 

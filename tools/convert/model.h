@@ -19,7 +19,7 @@ struct ConvertedModel
 {
     glo::GloScene scene;
     std::vector<OutputFile> textures;
-    std::vector<Clip> clips; ///< on the scene's time line, in its order
+    std::vector<ModelClip> clips; ///< on the scene's time line, in its order
     Report report;
 };
 

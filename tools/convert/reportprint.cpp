@@ -59,7 +59,7 @@ std::string spell(const char* kind, const std::map<Report::Finding, int>& findin
     return lines;
 }
 
-std::string spell(const Clip& clip)
+std::string spell(const ModelClip& clip)
 {
     char times[100];
     std::snprintf(times, sizeof times, "from %.2f to %.2f seconds\n", double(clip.start), double(clip.end));
@@ -94,7 +94,7 @@ std::string toText(const std::string& path, const std::vector<OutputFile>& files
         text += file.path + ": " + spell("bytes", file.bytes.size());
         text += isScene ? ", " + spell(report.getOut()) + "\n" : "\n";
     }
-    for (const Clip& clip : model.clips)
+    for (const ModelClip& clip : model.clips)
         text += spell(clip);
     for (const auto& [figure, number] : report.getFigures())
     {
@@ -116,7 +116,7 @@ std::string toJson(const std::string& path, const std::vector<OutputFile>& files
     for (size_t i = 0; i + 1 < files.size(); ++i)
         json["textures"].push_back({{"file", files[i].path}, {"bytes", files[i].bytes.size()}});
     json["clips"] = Json::array();
-    for (const Clip& clip : model.clips)
+    for (const ModelClip& clip : model.clips)
         json["clips"].push_back({{"name", clip.name}, {"start", clip.start}, {"end", clip.end}});
     json["figures"] = report.getFigures();
     json["approximated"] = toJson(report.getApproximations());

@@ -58,7 +58,7 @@ std::vector<uint8_t> encodePixel(const uint8_t* rgba, Format format, bool bigEnd
     return bigEndian ? std::vector<uint8_t>{high, low} : std::vector<uint8_t>{low, high};
 }
 
-std::vector<uint8_t> encodeEtc1(const Picture& picture)
+std::vector<uint8_t> encodeEtc1(const SourcePicture& picture)
 {
     std::vector<uint8_t> rgb;
     for (size_t i = 0; i < picture.rgba.size(); i += 4)
@@ -101,7 +101,7 @@ uint32_t packColour(const uint8_t* rgba, bool isB)
 class PvrtcImage
 {
 public:
-    PvrtcImage(const Picture& picture, Format format)
+    PvrtcImage(const SourcePicture& picture, Format format)
         : m_picture(picture)
         , m_info(getInfo(format))
         , m_keepsAlpha(format == Format::PVRTC_2_RGBA || format == Format::PVRTC_4_RGBA)
@@ -226,7 +226,7 @@ private:
         return stride == 2 ? word & ~1u : word;
     }
 
-    const Picture& m_picture;
+    const SourcePicture& m_picture;
     const FormatInfo& m_info;
     bool m_keepsAlpha;
     uint32_t m_across;
@@ -236,7 +236,7 @@ private:
 
 } // namespace
 
-std::vector<uint8_t> encode(const Picture& picture, Format format, bool bigEndian)
+std::vector<uint8_t> encode(const SourcePicture& picture, Format format, bool bigEndian)
 {
     if (format == Format::ETC1)
         return encodeEtc1(picture);

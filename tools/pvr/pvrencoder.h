@@ -9,7 +9,7 @@ namespace pvr
 {
 
 /// RGBA pixels, 4 bytes each, top row first.
-struct Picture
+struct SourcePicture
 {
     uint32_t width = 0;
     uint32_t height = 0;
@@ -23,6 +23,6 @@ struct Picture
 /// Luminance is weighed as the eye does. ETC1 comes out as libetc1 makes it. PVRTC is made simply: the darkest and
 /// the brightest colour of each block, and for each pixel the nearest mix of what becomes of them.
 /// @param picture  for PVRTC, of power-of-two sides.
-std::vector<uint8_t> encode(const Picture& picture, Format format, bool bigEndian);
+std::vector<uint8_t> encode(const SourcePicture& picture, Format format, bool bigEndian);
 
 } // namespace pvr

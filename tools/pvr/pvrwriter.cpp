@@ -55,8 +55,8 @@ uint32_t getLegacyCode(Format format)
     return type->code; // every format but those two is in the table
 }
 
-std::vector<uint8_t> writeLegacyHeader(const Picture& picture, Format format, const WriteOptions& options,
-                                       uint32_t mipmaps, uint32_t dataBytes)
+std::vector<uint8_t> writeLegacyHeader(const SourcePicture& picture, Format format,
+                                       const WriteOptions& options, uint32_t mipmaps, uint32_t dataBytes)
 {
     Words words(options.header, options.bigEndian);
     words[legacy::HEADER_SIZE] = HEADER_BYTES[unsigned(options.header)];
@@ -77,8 +77,8 @@ std::vector<uint8_t> writeLegacyHeader(const Picture& picture, Format format, co
     return words.toBytes();
 }
 
-std::vector<uint8_t> writeVersion3Header(const Picture& picture, Format format, const WriteOptions& options,
-                                         uint32_t mipmaps)
+std::vector<uint8_t> writeVersion3Header(const SourcePicture& picture, Format format,
+                                         const WriteOptions& options, uint32_t mipmaps)
 {
     const FormatInfo& info = getInfo(format);
     const bool isPacked = info.bitsPerPixel == 16 && format != Format::LA_88;
@@ -98,7 +98,7 @@ std::vector<uint8_t> writeVersion3Header(const Picture& picture, Format format, 
     return bytes;
 }
 
-Picture turnUpsideDown(Picture picture)
+SourcePicture turnUpsideDown(SourcePicture picture)
 {
     const size_t rowBytes = size_t(picture.width) * 4;
     for (uint32_t y = 0; y < picture.height / 2; ++y)
@@ -112,9 +112,9 @@ Picture turnUpsideDown(Picture picture)
 
 } // namespace
 
-Picture halve(const Picture& picture)
+SourcePicture halve(const SourcePicture& picture)
 {
-    Picture half{std::max(picture.width / 2, 1u), std::max(picture.height / 2, 1u), {}};
+    SourcePicture half{std::max(picture.width / 2, 1u), std::max(picture.height / 2, 1u), {}};
     for (uint32_t y = 0; y < half.height; ++y)
     {
         for (uint32_t x = 0; x < half.width; ++x)
@@ -134,11 +134,12 @@ Picture halve(const Picture& picture)
     return half;
 }
 
-std::vector<uint8_t> write(const Picture& picture, Format format, const WriteOptions& options)
+std::vector<uint8_t> write(const SourcePicture& picture, Format format, const WriteOptions& options)
 {
     uint32_t mipmaps = 0;
     std::vector<uint8_t> data;
-    for (Picture level = options.bottomRowFirst ? turnUpsideDown(picture) : picture;; level = halve(level))
+    for (SourcePicture level = options.bottomRowFirst ? turnUpsideDown(picture) : picture;;
+         level = halve(level))
     {
         const std::vector<uint8_t> bytes = encode(level, format, options.bigEndian);
         data.insert(data.end(), bytes.begin(), bytes.end());

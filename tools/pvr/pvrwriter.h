@@ -19,9 +19,9 @@ struct WriteOptions
 };
 
 /// A whole PVR file.
-std::vector<uint8_t> write(const Picture& picture, Format format, const WriteOptions& options = {});
+std::vector<uint8_t> write(const SourcePicture& picture, Format format, const WriteOptions& options = {});
 
 /// Half the picture in both directions, as mipmaps are: sides rounded down, at least 1.
-Picture halve(const Picture& picture);
+SourcePicture halve(const SourcePicture& picture);
 
 } // namespace pvr

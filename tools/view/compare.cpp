@@ -23,7 +23,7 @@ constexpr int GAIN = 8; // a channel that is off by 32 shows as white
 
 } // namespace
 
-bool readPng(const std::string& path, Picture& picture, std::string& error)
+bool readPng(const std::string& path, PngPicture& picture, std::string& error)
 {
     int channels = 0;
     stbi_uc* pixels = stbi_load(path.c_str(), &picture.width, &picture.height, &channels, 4);
@@ -57,7 +57,7 @@ bool parseTolerance(const std::string& text, Tolerance& tolerance)
     return true;
 }
 
-Difference comparePictures(const Picture& reference, const Picture& actual, const Tolerance& tolerance)
+Difference comparePictures(const PngPicture& reference, const PngPicture& actual, const Tolerance& tolerance)
 {
     Difference difference;
     difference.picture = {actual.width, actual.height, std::vector<uint8_t>(actual.rgba.size(), 255)};

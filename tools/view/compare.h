@@ -8,7 +8,7 @@ namespace view
 {
 
 /// RGBA, 8 bits each, top row first.
-struct Picture
+struct PngPicture
 {
     int width = 0;
     int height = 0;
@@ -16,7 +16,7 @@ struct Picture
 };
 
 /// @return false, with "path: reason" in error, if it cannot be read.
-bool readPng(const std::string& path, Picture& picture, std::string& error);
+bool readPng(const std::string& path, PngPicture& picture, std::string& error);
 
 /// How much two pictures may differ.
 struct Tolerance
@@ -36,11 +36,11 @@ struct Difference
     int x = 0;            ///< where that is, from the upper left
     int y = 0;
     bool isTolerable = true;
-    Picture picture; ///< how much each channel differs, eight times as bright
+    PngPicture picture; ///< how much each channel differs, eight times as bright
 };
 
 /// Of two pictures of one size. Alpha counts as the other channels do, and is not in the picture.
-Difference comparePictures(const Picture& reference, const Picture& actual, const Tolerance& tolerance);
+Difference comparePictures(const PngPicture& reference, const PngPicture& actual, const Tolerance& tolerance);
 
 /// For a person: "12 of 4800 pixels (0.25 %) differ by more than 2, the most by 37 at 10, 20".
 std::string describe(const Difference& difference, const Tolerance& tolerance);

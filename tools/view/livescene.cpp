@@ -7,12 +7,12 @@
 namespace view
 {
 
-LiveScene::LiveScene(const SceneFile& file, Conversion* conversion)
+LiveScene::LiveScene(const SceneFile& file, ConvertedModel* conversion)
 {
     setFile(file, conversion);
 }
 
-void LiveScene::setFile(const SceneFile& file, Conversion* conversion)
+void LiveScene::setFile(const SceneFile& file, ConvertedModel* conversion)
 {
     m_file = file;
     m_conversion = conversion;
@@ -31,12 +31,12 @@ bool LiveScene::load(std::string& error)
     return true;
 }
 
-bool LiveScene::open(const SceneFile& file, Conversion* conversion, std::string& error)
+bool LiveScene::open(const SceneFile& file, ConvertedModel* conversion, std::string& error)
 {
     SceneFile before = m_file;
     if (m_conversion)
         before.path = m_model;
-    Conversion* const conversionBefore = m_conversion;
+    ConvertedModel* const conversionBefore = m_conversion;
     const std::set<std::string> folders = m_studio.getFolders();
     m_studio.limitFolders({}); // files of the same name in the other file's folder are others
     setFile(file, conversion);

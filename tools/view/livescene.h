@@ -1,6 +1,6 @@
 #pragma once
 
-#include "conversion.h"
+#include "convertedmodel.h"
 #include "player.h"
 #include "stage.h"
 #include "studio.h"
@@ -20,7 +20,7 @@ class LiveScene
 {
 public:
     /// @param conversion  of a model that is no scene file, null for others; borrowed.
-    LiveScene(const SceneFile& file, Conversion* conversion);
+    LiveScene(const SceneFile& file, ConvertedModel* conversion);
     ~LiveScene() = default;
 
     LiveScene(const LiveScene&) = delete;
@@ -31,7 +31,7 @@ public:
 
     /// Shows another file from now on, played from its start.
     /// @return false, with everything as it was, if it cannot be loaded.
-    bool open(const SceneFile& file, Conversion* conversion, std::string& error);
+    bool open(const SceneFile& file, ConvertedModel* conversion, std::string& error);
 
     /// Whether a file that matters has changed since the last load. Ask a few times a second.
     bool hasChanged() { return m_watcher.hasChanged(); }
@@ -47,14 +47,14 @@ public:
     uint64_t getTriangleCount() const { return m_triangleCount; }
 
 private:
-    void setFile(const SceneFile& file, Conversion* conversion);
+    void setFile(const SceneFile& file, ConvertedModel* conversion);
     std::unique_ptr<Stage> loadStage(std::string& error);
     void takeStage(std::unique_ptr<Stage> stage);
     void watchFiles(bool isLoaded);
 
     SceneFile m_file;
     std::string m_model; ///< the file that m_file was converted from; "" if it was not
-    Conversion* m_conversion = nullptr;
+    ConvertedModel* m_conversion = nullptr;
     Studio m_studio;
     std::unique_ptr<Stage> m_stage;
     std::unique_ptr<Player> m_player;

@@ -1,6 +1,6 @@
 // orv-view: shows a scene, a material or a model in a window, or draws it into PNG pictures without one.
 
-#include "conversion.h"
+#include "convertedmodel.h"
 #include "loadlog.h"
 #include "options.h"
 #include "pictures.h"
@@ -24,10 +24,10 @@ bool run(const view::Options& options, std::string& error)
         error = path + ": " + (reason ? reason.message() : "not a file");
         return false;
     }
-    std::unique_ptr<view::Conversion> conversion;
+    std::unique_ptr<view::ConvertedModel> conversion;
     if (view::getFileKind(path) == view::FileKind::MODEL)
     {
-        conversion = view::Conversion::create(path, options.converterArguments, error);
+        conversion = view::ConvertedModel::create(path, options.converterArguments, error);
         if (!conversion || !conversion->run(error))
             return false;
     }

@@ -77,7 +77,7 @@ std::string numberOf(size_t index)
 }
 
 /// With a grey line above and to the left, except at the edges of the sheet.
-void copyInto(Picture& sheet, const Picture& picture, int column, int row)
+void copyInto(PngPicture& sheet, const PngPicture& picture, int column, int row)
 {
     const auto getPlace = [&](int x, int y)
     {
@@ -96,9 +96,9 @@ void copyInto(Picture& sheet, const Picture& picture, int column, int row)
         std::memset(getPlace(x, 0), LINE_GREY, 3);
 }
 
-Picture makeSheet(const Options& options, const orv::Colour4f& background)
+PngPicture makeSheet(const Options& options, const orv::Colour4f& background)
 {
-    Picture sheet{options.columns * options.width, options.rows * options.height, {}};
+    PngPicture sheet{options.columns * options.width, options.rows * options.height, {}};
     const uint8_t pixel[] = {uint8_t(std::lround(background.r * 255.0f)),
                              uint8_t(std::lround(background.g * 255.0f)),
                              uint8_t(std::lround(background.b * 255.0f)), 255};
@@ -108,14 +108,14 @@ Picture makeSheet(const Options& options, const orv::Colour4f& background)
     return sheet;
 }
 
-bool write(const std::string& path, const Picture& picture, std::string& error)
+bool write(const std::string& path, const PngPicture& picture, std::string& error)
 {
     return headless::writePng(path, picture.width, picture.height, picture.rgba.data(), error);
 }
 
-bool compare(const Options& options, const Picture& picture, std::string& error)
+bool compare(const Options& options, const PngPicture& picture, std::string& error)
 {
-    Picture reference;
+    PngPicture reference;
     if (!readPng(options.reference, reference, error))
         return false;
     if (reference.width != picture.width || reference.height != picture.height)
@@ -155,8 +155,8 @@ public:
 
 private:
     bool prepare(std::string& error);
-    bool draw(const Shot& shot, Picture& picture, std::string& error);
-    bool drawAll(Picture& whole, std::string& error);
+    bool draw(const Shot& shot, PngPicture& picture, std::string& error);
+    bool drawAll(PngPicture& whole, std::string& error);
 
     const Options& m_options;
     Stage& m_stage;
@@ -190,7 +190,7 @@ bool Session::prepare(std::string& error)
     return camera >= 0;
 }
 
-bool Session::draw(const Shot& shot, Picture& picture, std::string& error)
+bool Session::draw(const Shot& shot, PngPicture& picture, std::string& error)
 {
     m_player.seek(shot.time);
     m_stage.setShaderTime(shot.time);
@@ -222,12 +222,12 @@ bool Session::draw(const Shot& shot, Picture& picture, std::string& error)
 }
 
 /// @param whole  set to the one picture that there is in the end, or to the last of those with numbers.
-bool Session::drawAll(Picture& whole, std::string& error)
+bool Session::drawAll(PngPicture& whole, std::string& error)
 {
     const bool isSheet = m_options.columns > 0;
     const bool isNumbered = !isSheet && m_options.frames + m_options.turntable > 0;
     const bool showsProgress = m_shots.size() > 1 && isatty(STDERR_FILENO);
-    Picture sheet;
+    PngPicture sheet;
     if (isSheet)
         sheet = makeSheet(m_options, m_stage.getBackground());
     for (size_t i = 0; i < m_shots.size(); ++i)
@@ -254,7 +254,7 @@ bool Session::run(std::string& error)
         error = m_options.scene.path + ": " + error;
         return false;
     }
-    Picture picture;
+    PngPicture picture;
     if (m_options.columns > 0)
         picture = makeSheet(m_options, m_stage.getBackground());
     return drawAll(picture, error) && (m_options.reference.empty() || compare(m_options, picture, error));

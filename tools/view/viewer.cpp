@@ -54,7 +54,9 @@ const char* findName(const orv::SceneNode& node)
 
 } // namespace
 
-Viewer::Viewer(const Options& options, Conversion* conversion) : m_options(options), m_conversion(conversion)
+Viewer::Viewer(const Options& options, ConvertedModel* conversion)
+    : m_options(options)
+    , m_conversion(conversion)
 {
 }
 
@@ -276,11 +278,11 @@ void Viewer::fillTable()
 void Viewer::open(const std::string& path)
 {
     std::string error;
-    std::unique_ptr<Conversion> conversion;
+    std::unique_ptr<ConvertedModel> conversion;
     bool isReady = true;
     if (getFileKind(path) == FileKind::MODEL)
     {
-        conversion = Conversion::create(path, m_options.converterArguments, error);
+        conversion = ConvertedModel::create(path, m_options.converterArguments, error);
         isReady = conversion && conversion->run(error);
     }
     const orv::Colour4f background = getStage().getBackground();

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "conversion.h"
+#include "convertedmodel.h"
 #include "eyecontrol.h"
 #include "framestats.h"
 #include "headsup.h"
@@ -24,7 +24,7 @@ class Viewer
 {
 public:
     /// @param conversion  of the model that is looked at, null for a scene; borrowed.
-    Viewer(const Options& options, Conversion* conversion);
+    Viewer(const Options& options, ConvertedModel* conversion);
     ~Viewer();
 
     Viewer(const Viewer&) = delete;
@@ -74,8 +74,8 @@ private:
     void writeHeadsUp();
 
     Options m_options;
-    Conversion* m_conversion;
-    std::unique_ptr<Conversion> m_dropped; ///< of the file that was dropped last, if it is a model
+    ConvertedModel* m_conversion;
+    std::unique_ptr<ConvertedModel> m_dropped; ///< of the file that was dropped last, if it is a model
     std::unique_ptr<window::Window> m_window;
     std::unique_ptr<LiveScene> m_scene;
     std::unique_ptr<Markings> m_markings;

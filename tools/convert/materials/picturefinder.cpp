@@ -45,7 +45,7 @@ FoundPicture readEmbedded(const std::string& path, const aiTexture& texture)
         found.bytes.assign(data, data + texture.mWidth);
         return found;
     }
-    Picture pixels{int(texture.mWidth), int(texture.mHeight), 4, {}};
+    DecodedPicture pixels{int(texture.mWidth), int(texture.mHeight), 4, {}};
     for (size_t i = 0; i < pixels.getPixelCount(); ++i)
     {
         const aiTexel& texel = texture.pcData[i];

@@ -83,7 +83,7 @@ std::string recognise(const std::vector<uint8_t>& bytes)
     return ".tga";
 }
 
-bool decodeAsEngine(const std::vector<uint8_t>& bytes, Picture& picture)
+bool decodeAsEngine(const std::vector<uint8_t>& bytes, DecodedPicture& picture)
 {
     orv::MemoryStream stream(bytes.data(), int(bytes.size()));
     const orv::Image image(stream);
@@ -94,7 +94,7 @@ bool decodeAsEngine(const std::vector<uint8_t>& bytes, Picture& picture)
     return true;
 }
 
-bool decodeOther(const std::vector<uint8_t>& bytes, Picture& picture)
+bool decodeOther(const std::vector<uint8_t>& bytes, DecodedPicture& picture)
 {
     stbi_uc* data = stbi_load_from_memory(bytes.data(), int(bytes.size()), &picture.width, &picture.height,
                                           &picture.channels, 0);
@@ -105,7 +105,7 @@ bool decodeOther(const std::vector<uint8_t>& bytes, Picture& picture)
     return true;
 }
 
-void setChannels(Picture& picture, int channels, int (*source)(int channel))
+void setChannels(DecodedPicture& picture, int channels, int (*source)(int channel))
 {
     std::vector<uint8_t> data;
     data.reserve(picture.getPixelCount() * size_t(channels));
@@ -128,7 +128,7 @@ int getBrightness(const uint8_t* pixel)
 }
 
 /// On average, red, green and blue hardly differ.
-bool isGrey(const Picture& picture)
+bool isGrey(const DecodedPicture& picture)
 {
     constexpr uint64_t SLACK = 8;
     if (picture.channels < 3)
@@ -170,14 +170,14 @@ bool readHeader(const std::vector<uint8_t>& bytes, PictureHeader& header)
     return true;
 }
 
-bool decodePicture(const std::vector<uint8_t>& bytes, const PictureHeader& header, Picture& picture)
+bool decodePicture(const std::vector<uint8_t>& bytes, const PictureHeader& header, DecodedPicture& picture)
 {
     if (isWebp(bytes))
         return decodeWebp(bytes, picture);
     return header.extension.empty() ? decodeOther(bytes, picture) : decodeAsEngine(bytes, picture);
 }
 
-std::vector<uint8_t> encodePng(const Picture& picture)
+std::vector<uint8_t> encodePng(const DecodedPicture& picture)
 {
     std::vector<uint8_t> bytes;
     const auto append = [](void* context, void* data, int size)
@@ -191,9 +191,9 @@ std::vector<uint8_t> encodePng(const Picture& picture)
     return bytes;
 }
 
-void resize(Picture& picture, int width, int height, bool wraps)
+void resize(DecodedPicture& picture, int width, int height, bool wraps)
 {
-    Picture made{width, height, picture.channels, {}};
+    DecodedPicture made{width, height, picture.channels, {}};
     made.data.resize(made.getPixelCount() * size_t(made.channels));
     const int alpha = picture.hasAlphaChannel() ? picture.channels - 1 : STBIR_ALPHA_CHANNEL_NONE;
     const int done = stbir_resize_uint8_generic(picture.data.data(), picture.width, picture.height, 0,
@@ -205,7 +205,7 @@ void resize(Picture& picture, int width, int height, bool wraps)
     picture = std::move(made);
 }
 
-void spreadGrey(Picture& picture)
+void spreadGrey(DecodedPicture& picture)
 {
     if (picture.channels == 1)
         setChannels(picture, 3, [](int) { return 0; });
@@ -213,14 +213,14 @@ void spreadGrey(Picture& picture)
         setChannels(picture, 4, [](int channel) { return channel < 3 ? 0 : 1; });
 }
 
-void dropAlpha(Picture& picture)
+void dropAlpha(DecodedPicture& picture)
 {
     spreadGrey(picture);
     if (picture.channels == 4)
         setChannels(picture, 3, [](int channel) { return channel; });
 }
 
-void setAlpha(Picture& picture, Picture opacity)
+void setAlpha(DecodedPicture& picture, DecodedPicture opacity)
 {
     dropAlpha(picture);
     setChannels(picture, 4, [](int channel) { return channel < 3 ? channel : -1; });
@@ -231,13 +231,13 @@ void setAlpha(Picture& picture, Picture opacity)
         picture.data[pixel * 4 + 3] = uint8_t(getBrightness(&opacity.data[pixel * 3]));
 }
 
-bool makeNormals(Picture& heights)
+bool makeNormals(DecodedPicture& heights)
 {
     constexpr float STEEPNESS = 2.0f; // of a step from black to white over two pixels
     if (!isGrey(heights))
         return false;
     dropAlpha(heights);
-    Picture made{heights.width, heights.height, 3, {}};
+    DecodedPicture made{heights.width, heights.height, 3, {}};
     made.data.reserve(heights.data.size());
     const auto height = [&](int x, int y)
     {
@@ -260,7 +260,7 @@ bool makeNormals(Picture& heights)
     return true;
 }
 
-void makeOcclusion(Picture& picture, float strength, bool isShare)
+void makeOcclusion(DecodedPicture& picture, float strength, bool isShare)
 {
     constexpr float GAMMA = 2.2f; // the engine's own
     std::array<uint8_t, 256> table{};
@@ -275,7 +275,7 @@ void makeOcclusion(Picture& picture, float strength, bool isShare)
         std::fill_n(&picture.data[at], 3, table[picture.data[at]]);
 }
 
-Transparency getTransparency(const Picture& picture)
+Transparency getTransparency(const DecodedPicture& picture)
 {
     constexpr uint8_t MOST = 250; // compression and drawing programs leave a little here and there
     constexpr uint8_t LEAST = 5;
@@ -292,7 +292,7 @@ Transparency getTransparency(const Picture& picture)
     return !visible ? Transparency::ALL : transparent ? Transparency::SOME : Transparency::NONE;
 }
 
-bool hasHoles(const Picture& picture, float threshold)
+bool hasHoles(const DecodedPicture& picture, float threshold)
 {
     const size_t step = size_t(picture.channels);
     bool found = false;
@@ -301,7 +301,7 @@ bool hasHoles(const Picture& picture, float threshold)
     return found;
 }
 
-bool isAllOrNothing(const Picture& picture)
+bool isAllOrNothing(const DecodedPicture& picture)
 {
     constexpr uint8_t FULL = 224;
     constexpr uint8_t NONE = 32;
@@ -313,7 +313,7 @@ bool isAllOrNothing(const Picture& picture)
     return between <= picture.getPixelCount() / RARE;
 }
 
-float getMean(const Picture& picture, int channel)
+float getMean(const DecodedPicture& picture, int channel)
 {
     const size_t step = size_t(picture.channels);
     const size_t first = picture.channels >= 3 ? size_t(std::min(channel, picture.channels - 1)) : 0;

@@ -8,7 +8,7 @@ namespace convert
 {
 
 /// Pixels in memory: rows from top to bottom, 1 (grey), 2 (grey, alpha), 3 or 4 bytes per pixel.
-struct Picture
+struct DecodedPicture
 {
     int width = 0;
     int height = 0;
@@ -34,31 +34,31 @@ struct PictureHeader
 bool readHeader(const std::vector<uint8_t>& bytes, PictureHeader& header);
 
 /// @return false if it is damaged.
-bool decodePicture(const std::vector<uint8_t>& bytes, const PictureHeader& header, Picture& picture);
+bool decodePicture(const std::vector<uint8_t>& bytes, const PictureHeader& header, DecodedPicture& picture);
 
-std::vector<uint8_t> encodePng(const Picture& picture);
+std::vector<uint8_t> encodePng(const DecodedPicture& picture);
 
 /// @param width, height  pixels, above 0. Edges take in what lies beyond the opposite edge, if wrapping.
-void resize(Picture& picture, int width, int height, bool wraps);
+void resize(DecodedPicture& picture, int width, int height, bool wraps);
 
 /// Grey becomes red, green and blue; alpha stays.
-void spreadGrey(Picture& picture);
+void spreadGrey(DecodedPicture& picture);
 
-void dropAlpha(Picture& picture);
+void dropAlpha(DecodedPicture& picture);
 
 /// Brightness becomes alpha of the other picture.
 /// @param opacity  any size.
-void setAlpha(Picture& picture, Picture opacity);
+void setAlpha(DecodedPicture& picture, DecodedPicture opacity);
 
 /// A picture of heights becomes one of normals: red along u, green up. A picture that is coloured stays: many
 /// programs write normals where heights belong.
 /// @return whether it was one of heights.
-bool makeNormals(Picture& heights);
+bool makeNormals(DecodedPicture& heights);
 
 /// Red, which says how much light reaches a place from all around, becomes grey.
 /// @param strength  0 to 1; 0 is light everywhere.
 /// @param isShare   the light is wanted in the screen's values, of which half of it is 0.74.
-void makeOcclusion(Picture& picture, float strength, bool isShare);
+void makeOcclusion(DecodedPicture& picture, float strength, bool isShare);
 
 /// What the alpha channel amounts to.
 enum class Transparency
@@ -67,15 +67,15 @@ enum class Transparency
     SOME, ///< here more, there less
     ALL   ///< invisible all over, so alpha surely means something else
 };
-Transparency getTransparency(const Picture& picture);
+Transparency getTransparency(const DecodedPicture& picture);
 
 /// Whether some alpha is below the threshold (0 to 1).
-bool hasHoles(const Picture& picture, float threshold);
+bool hasHoles(const DecodedPicture& picture, float threshold);
 
 /// Whether alpha is nearly full or nearly none, but for a few pixels along the edges (one of twenty).
-bool isAllOrNothing(const Picture& picture);
+bool isAllOrNothing(const DecodedPicture& picture);
 
 /// Of one channel (0 to 3), 0 to 1; grey is all of the first three.
-float getMean(const Picture& picture, int channel);
+float getMean(const DecodedPicture& picture, int channel);
 
 } // namespace convert

@@ -42,7 +42,7 @@ float getHeight(Face face, float right, float down)
     return face == Face::ACROSS ? across : face == Face::UP ? along : -along;
 }
 
-void putPixel(Picture& picture, int x, int y, float height)
+void putPixel(DecodedPicture& picture, int x, int y, float height)
 {
     uint8_t* pixel = &picture.data[size_t(y * picture.width + x) * 3];
     const Vector3f& low = height > 0.0f ? HORIZON : GROUND;
@@ -55,12 +55,12 @@ void putPixel(Picture& picture, int x, int y, float height)
 
 } // namespace
 
-Picture makeSky()
+DecodedPicture makeSky()
 {
     // -x, -z, +x and below them -y, +y, +z
     constexpr Face CELLS[2][3] = {{Face::ACROSS, Face::ACROSS, Face::ACROSS},
                                   {Face::DOWN, Face::UP, Face::ACROSS}};
-    Picture picture{3 * SIDE, 2 * SIDE, 3, std::vector<uint8_t>(size_t(3 * SIDE * 2 * SIDE * 3))};
+    DecodedPicture picture{3 * SIDE, 2 * SIDE, 3, std::vector<uint8_t>(size_t(3 * SIDE * 2 * SIDE * 3))};
     for (int y = 0; y < picture.height; ++y)
     {
         for (int x = 0; x < picture.width; ++x)

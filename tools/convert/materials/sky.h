@@ -6,6 +6,6 @@ namespace convert
 {
 
 /// A plain sky for metals to mirror, as the engine takes cube maps: pale at the horizon, blue above, with a dark ground.
-Picture makeSky();
+DecodedPicture makeSky();
 
 } // namespace convert

@@ -33,7 +33,7 @@ int toPowerOfTwo(int size, int limit)
 /// Does with the alpha channel what is wanted.
 /// @param changed  set if the picture is not what it was.
 /// @return whether some of the picture is transparent now.
-bool applyAlpha(const TextureWish& wish, Picture& pixels, bool& changed)
+bool applyAlpha(const TextureWish& wish, DecodedPicture& pixels, bool& changed)
 {
     if (!pixels.hasAlphaChannel())
         return false;
@@ -97,7 +97,7 @@ TextureUse TextureStore::add(const TextureWish& wish)
     return known != m_known.end() ? known->second : m_known[wish] = make(wish);
 }
 
-std::string TextureStore::addMade(const std::string& name, Picture (*paint)())
+std::string TextureStore::addMade(const std::string& name, DecodedPicture (*paint)())
 {
     std::string& made = m_made[name];
     if (made.empty())
@@ -117,7 +117,7 @@ std::optional<orv::Vector4f> TextureStore::getMean(const std::string& path)
     std::optional<Loaded> loaded = load(path);
     if (!loaded || !decode(*loaded, path))
         return mean;
-    const Picture& pixels = loaded->pixels;
+    const DecodedPicture& pixels = loaded->pixels;
     const float alpha = pixels.hasAlphaChannel() ? convert::getMean(pixels, pixels.channels - 1) : 1.0f;
     mean = orv::Vector4f(convert::getMean(pixels, 0), convert::getMean(pixels, 1),
                          convert::getMean(pixels, 2), alpha);
@@ -156,7 +156,7 @@ TextureUse TextureStore::make(const TextureWish& wish)
     if (!decode(*loaded, wish.path))
         return {};
 
-    Picture& pixels = loaded->pixels;
+    DecodedPicture& pixels = loaded->pixels;
     bool changed = treat(pixels, wish);
     const bool hasAlpha = applyAlpha(wish, pixels, changed);
     const bool allOrNothing = hasAlpha && isAllOrNothing(pixels); // which another size would blur
@@ -199,7 +199,7 @@ TextureUse TextureStore::passOn(const Loaded& loaded, const TextureWish& wish)
 
 /// Does everything that has nothing to do with the size or with the picture's own alpha.
 /// @return whether the picture is not what it was.
-bool TextureStore::treat(Picture& pixels, const TextureWish& wish)
+bool TextureStore::treat(DecodedPicture& pixels, const TextureWish& wish)
 {
     bool changed = pixels.channels < 3;
     spreadGrey(pixels);

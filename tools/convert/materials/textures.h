@@ -76,7 +76,7 @@ public:
 
     /// A picture that the model does not have.
     /// @return the name of its file, the same for the same name.
-    std::string addMade(const std::string& name, Picture (*paint)());
+    std::string addMade(const std::string& name, DecodedPicture (*paint)());
 
     /// The mean red, green, blue and alpha of a picture, 0 to 1; nothing if it cannot be had.
     std::optional<orv::Vector4f> getMean(const std::string& path);
@@ -89,7 +89,7 @@ private:
     {
         FoundPicture file;
         PictureHeader header;
-        Picture pixels;
+        DecodedPicture pixels;
     };
 
     struct Size
@@ -102,7 +102,7 @@ private:
     TextureUse make(const TextureWish& wish);
     bool canPassOn(const PictureHeader& header, const TextureWish& wish) const;
     TextureUse passOn(const Loaded& loaded, const TextureWish& wish);
-    bool treat(Picture& pixels, const TextureWish& wish);
+    bool treat(DecodedPicture& pixels, const TextureWish& wish);
     Size getFittingSize(int width, int height, bool repeats) const;
     std::string makeName(const std::string& name, const std::string& extension);
 

@@ -25,7 +25,7 @@ bool readWebpHeader(const std::vector<uint8_t>& bytes, PictureHeader& header)
     return true;
 }
 
-bool decodeWebp(const std::vector<uint8_t>& bytes, Picture& picture)
+bool decodeWebp(const std::vector<uint8_t>& bytes, DecodedPicture& picture)
 {
     PictureHeader header;
     if (!readWebpHeader(bytes, header))

@@ -11,6 +11,6 @@ bool isWebp(const std::vector<uint8_t>& bytes);
 bool readWebpHeader(const std::vector<uint8_t>& bytes, PictureHeader& header);
 
 /// Of a moving picture, none.
-bool decodeWebp(const std::vector<uint8_t>& bytes, Picture& picture);
+bool decodeWebp(const std::vector<uint8_t>& bytes, DecodedPicture& picture);
 
 } // namespace convert

@@ -246,7 +246,7 @@ glo::Channel makeChannel(const std::string& node, const char* property)
 /// An animation of the model and how it is sampled.
 struct Source
 {
-    Clip clip;
+    ModelClip clip;
     unsigned sampleCount;
     double ticksPerSecond;
     double duration; ///< in ticks
@@ -289,7 +289,7 @@ public:
             motion.clips.push_back(source.clip);
         if (m_sources.size() > 1)
         {
-            for (const Clip& clip : motion.clips)
+            for (const ModelClip& clip : motion.clips)
                 motion.animations.push_back(makeMark(clip));
         }
         motion.usesClipNode = m_sources.size() > 1 || m_all.channels.empty();
@@ -463,7 +463,7 @@ private:
     }
 
     /// An animation that lasts from a clip's start to its end and moves nothing.
-    glo::AnimationData makeMark(const Clip& clip) const
+    glo::AnimationData makeMark(const ModelClip& clip) const
     {
         glo::AnimationData mark;
         mark.name = clip.name;

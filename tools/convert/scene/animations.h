@@ -16,7 +16,7 @@ namespace convert
 {
 
 /// One of a model's animations on the scene's time line, in seconds.
-struct Clip
+struct ModelClip
 {
     std::string name;
     float start = 0.0f;
@@ -26,7 +26,7 @@ struct Clip
 /// How a scene moves.
 struct Motion
 {
-    std::vector<Clip> clips;
+    std::vector<ModelClip> clips;
     std::vector<glo::AnimationData> animations;
     bool usesClipNode = false; ///< see convertAnimations
 };

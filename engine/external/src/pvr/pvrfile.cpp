@@ -70,7 +70,7 @@ bool identify(const uint8_t* data, size_t size, Header& header, bool& bigEndian)
 }
 
 /// What a header says about the picture, before it is known whether the file is long enough.
-struct Picture
+struct PictureInfo
 {
     Format format = Format::RGBA_8888;
     bool bottomRowFirst = false;
@@ -151,7 +151,7 @@ bool findLegacyFormat(uint32_t flags, uint32_t alphaMask, Format& format, std::s
                   findName(REFUSED_LEGACY_TYPES, code));
 }
 
-bool readLegacy(const Words& words, Header header, Picture& picture, std::string& error)
+bool readLegacy(const Words& words, Header header, PictureInfo& picture, std::string& error)
 {
     const bool hasTag = header == Header::LEGACY_52;
     if (hasTag && words[legacy::TAG] != legacy::TAG_VALUE)
@@ -209,7 +209,7 @@ bool findFormat(uint64_t value, Format& format, std::string& error)
                   channels.c_str());
 }
 
-bool readVersion3(const Words& words, Picture& picture, std::string& error)
+bool readVersion3(const Words& words, PictureInfo& picture, std::string& error)
 {
     if (!findFormat(words.readLong(version3::FORMAT), picture.format, error))
         return false;
@@ -239,7 +239,7 @@ bool isPowerOfTwo(uint32_t value)
     return (value & (value - 1)) == 0;
 }
 
-bool checkSides(const Picture& picture, std::string& error)
+bool checkSides(const PictureInfo& picture, std::string& error)
 {
     if (picture.width == 0)
         return refuse(error, "width is 0");
@@ -268,7 +268,7 @@ uint64_t countBlocks(const FormatInfo& info, uint32_t width, uint32_t height)
 }
 
 /// Lays the levels one behind the other.
-bool layOut(const Picture& picture, uint64_t size, std::vector<Level>& levels, std::string& error)
+bool layOut(const PictureInfo& picture, uint64_t size, std::vector<Level>& levels, std::string& error)
 {
     const FormatInfo& info = getInfo(picture.format);
     if (picture.dataOffset > size)
@@ -312,7 +312,7 @@ bool parse(const uint8_t* data, size_t size, PvrFile& file, std::string& error)
         return refuse(error, "header is cut off after %zu of %u bytes", size, HEADER_BYTES[unsigned(header)]);
 
     const Words words(data, bigEndian);
-    Picture picture;
+    PictureInfo picture;
     const bool isRead = header == Header::VERSION_3 ? readVersion3(words, picture, error)
                                                     : readLegacy(words, header, picture, error);
     std::vector<Level> levels;

@@ -1,4 +1,4 @@
-#include "conversion.h"
+#include "convertedmodel.h"
 
 #include <cerrno>
 #include <csignal>
@@ -102,8 +102,8 @@ int runProgram(const std::vector<std::string>& words)
 
 } // namespace
 
-std::unique_ptr<Conversion> Conversion::create(const std::string& model, std::vector<std::string> arguments,
-                                               std::string& error)
+std::unique_ptr<ConvertedModel> ConvertedModel::create(const std::string& model,
+                                                       std::vector<std::string> arguments, std::string& error)
 {
     std::error_code reason;
     std::string folder = (fs::temp_directory_path(reason) / "orv-view-XXXXXX").string();
@@ -113,7 +113,7 @@ std::unique_ptr<Conversion> Conversion::create(const std::string& model, std::ve
                 " is converted to: " + (reason ? reason.message() : std::strerror(errno));
         return nullptr;
     }
-    std::unique_ptr<Conversion> conversion(new Conversion);
+    std::unique_ptr<ConvertedModel> conversion(new ConvertedModel);
     conversion->m_program = findConverter();
     conversion->m_model = model;
     conversion->m_arguments = std::move(arguments);
@@ -122,13 +122,13 @@ std::unique_ptr<Conversion> Conversion::create(const std::string& model, std::ve
     return conversion;
 }
 
-Conversion::~Conversion()
+ConvertedModel::~ConvertedModel()
 {
     std::error_code error;
     fs::remove_all(m_folder, error);
 }
 
-bool Conversion::run(std::string& error)
+bool ConvertedModel::run(std::string& error)
 {
     std::vector<std::string> words = {m_program, m_model, m_scene};
     words.insert(words.end(), m_arguments.begin(), m_arguments.end());

@@ -9,17 +9,17 @@ namespace view
 
 /// A model that is no scene file, and the scene that orv-convert makes of it in a folder of its own, which goes
 /// away with this object.
-class Conversion
+class ConvertedModel
 {
 public:
     /// Finds the converter: beside this program, where a build puts it, or on the PATH; and makes the folder.
     /// @param arguments  further ones for the converter.
-    static std::unique_ptr<Conversion> create(const std::string& model, std::vector<std::string> arguments,
-                                              std::string& error);
-    ~Conversion();
+    static std::unique_ptr<ConvertedModel> create(const std::string& model,
+                                                  std::vector<std::string> arguments, std::string& error);
+    ~ConvertedModel();
 
-    Conversion(const Conversion&) = delete;
-    Conversion& operator=(const Conversion&) = delete;
+    ConvertedModel(const ConvertedModel&) = delete;
+    ConvertedModel& operator=(const ConvertedModel&) = delete;
 
     /// Converts the model as it is now. The converter's messages go to standard error.
     /// @return false, with the scene as it was, if it cannot be converted.
@@ -34,7 +34,7 @@ public:
     }
 
 private:
-    Conversion() = default;
+    ConvertedModel() = default;
 
     std::string m_program;
     std::string m_model;
