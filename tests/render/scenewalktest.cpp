@@ -178,7 +178,7 @@ class Mourned : public SceneNode
 {
 public:
     Mourned(const char* name, std::string& text) : SceneNode(name), m_text(text) {}
-    ~Mourned() override { m_text += std::string("-") + getName(); }
+    ~Mourned() override { m_text += getName(); }
 
 private:
     std::string& m_text;
@@ -188,73 +188,94 @@ private:
 
 // Fault caught: a visitor that removes or moves what it visits, or what is beside or above it, reads nodes that are
 // gone, misses others, or never ends. The tree is r with a, b (with x, y), c.
-TEST(SceneWalk, survivesWhatItsVisitorDoes)
+class ChangedWalk : public testing::TestWithParam<FlagMask>
 {
-    const auto remove = [](SceneNode& parent, unsigned child) { parent.removeChild(parent.getChild(child)); };
-    const auto is = [](const SceneNode& node, char name) { return node.getName()[0] == name; };
-    using Root = SharedPtr<SceneNode>;
-    const struct
+protected:
+    /// Walks a tree r of a, b (with x and y) and c, whose nodes are changed as they are met.
+    /// @return the names that were met, "|", and those that had died by its end, sorted.
+    std::string walk(const Changer::Change& change)
     {
-        const char* name;
-        std::function<void(SceneNode& node, Root& root)> change;
-        const char* text; ///< what is met, "|", what then dies in some order
-    } cases[] = {
-        {"nothing", [](SceneNode&, Root&) {}, "rabxyc|"},
-        {"each removes itself", [](SceneNode& node, Root&) { node.setParent(nullptr); }, "rabxyc|abcxy"},
-        {"b removes the ones before and after it",
-         [&](SceneNode& node, Root& root)
-         {
-             if (is(node, 'b'))
-             {
-                 remove(*root, 2);
-                 remove(*root, 0);
-             }
-         },
-         "rabxy|ac"},
-        {"c removes all children",
-         [&](SceneNode& node, Root& root)
-         {
-             while (is(node, 'c') && root->getChildCount() > 0)
-                 remove(*root, 0);
-         },
-         "rabxyc|abcxy"},
-        {"x removes its parent and all beside that",
-         [&](SceneNode& node, Root& root)
-         {
-             while (is(node, 'x') && root->getChildCount() > 0)
-                 remove(*root, 0);
-         },
-         "rabxy|abcxy"},
-        {"each child moves behind the others",
-         [](SceneNode& node, Root&) { node.setParent(SharedPtr<SceneNode>(node.getParent())); }, "rabxyc|"},
-        {"a drops the whole tree", [](SceneNode&, Root& root) { root = nullptr; }, "rabxyc|abcrxy"},
-        {"a walk within a walk",
-         [](SceneNode& node, Root&)
-         {
-             Changer inner([](SceneNode& each) { each.setParent(nullptr); });
-             visitScene(inner, node);
-         },
-         "r|abcxy"},
-    };
-    for (const FlagMask& flags : {FlagMask(), FlagMask(1, 1)})
-    {
-        for (const auto& test : cases)
-        {
-            std::string dead;
-            Root root = makeShared<Mourned>("r", dead);
-            for (const char* name : {"a", "b", "c"})
-                makeShared<Mourned>(name, dead)->setParent(root);
-            for (const char* name : {"x", "y"})
-                makeShared<Mourned>(name, dead)->setParent(root->getChild(1));
-            Changer changer(
-                [&](SceneNode& node)
-                {
-                    test.change(node, root);
-                    EXPECT_EQ("", dead) << test.name;
-                });
-            visitScene(changer, *root, flags, flags);
-            std::sort(dead.begin(), dead.end());
-            EXPECT_EQ(test.text, changer.text + "|" + dead.substr(dead.find_last_of('-') + 1)) << test.name;
-        }
+        m_root = nullptr;
+        m_dead.clear();
+        m_root = makeShared<Mourned>("r", m_dead);
+        for (const char* name : {"a", "b", "c"})
+            makeShared<Mourned>(name, m_dead)->setParent(m_root);
+        for (const char* name : {"x", "y"})
+            makeShared<Mourned>(name, m_dead)->setParent(m_root->getChild(1));
+        Changer changer(
+            [&](SceneNode& node)
+            {
+                change(node);
+                EXPECT_EQ("", m_dead) << "while it is walked";
+            });
+        visitScene(changer, *m_root, GetParam(), GetParam());
+        std::string dead = m_dead;
+        std::sort(dead.begin(), dead.end());
+        return changer.text + "|" + dead;
     }
+
+    void removeChild(unsigned index) { m_root->removeChild(m_root->getChild(index)); }
+
+    void removeAllChildren()
+    {
+        while (m_root->getChildCount() > 0)
+            removeChild(0);
+    }
+
+    static bool is(const SceneNode& node, const char* name) { return std::string(name) == node.getName(); }
+
+    std::string m_dead; ///< names, by the destructors
+    SharedPtr<SceneNode> m_root;
+};
+
+INSTANTIATE_TEST_SUITE_P(, ChangedWalk, testing::Values(FlagMask(), FlagMask(1, 1)),
+                         [](const auto& given) { return given.index == 0 ? "all" : "byFlags"; });
+
+TEST_P(ChangedWalk, meetsAllThatStaysAndWhatWasToCome)
+{
+    EXPECT_EQ("rabxyc|", walk([](SceneNode&) {}));
+    EXPECT_EQ("rabxyc|abcxy", walk([](SceneNode& node) { node.setParent(nullptr); }))
+        << "each removes itself";
+    EXPECT_EQ("rabxyc|",
+              walk([](SceneNode& node) { node.setParent(SharedPtr<SceneNode>(node.getParent())); }))
+        << "each child moves behind the others";
+}
+
+TEST_P(ChangedWalk, leavesOutWhatWasRemoved)
+{
+    const auto removeBesideB = [this](SceneNode& node)
+    {
+        if (!is(node, "b"))
+            return;
+        removeChild(2);
+        removeChild(0);
+    };
+    EXPECT_EQ("rabxy|ac", walk(removeBesideB));
+    const auto removeAllAtC = [this](SceneNode& node)
+    {
+        if (is(node, "c"))
+            removeAllChildren();
+    };
+    EXPECT_EQ("rabxyc|abcxy", walk(removeAllAtC));
+    const auto removeAllAtX = [this](SceneNode& node)
+    {
+        if (is(node, "x"))
+            removeAllChildren();
+    };
+    EXPECT_EQ("rabxy|abcxy", walk(removeAllAtX)) << "its own parent too";
+}
+
+TEST_P(ChangedWalk, survivesTheLossOfTheWholeTree)
+{
+    EXPECT_EQ("rabxyc|abcrxy", walk([this](SceneNode&) { m_root = nullptr; }));
+}
+
+TEST_P(ChangedWalk, mayHaveAnotherWalkInIt)
+{
+    const auto removeEach = [](SceneNode& node)
+    {
+        Changer inner([](SceneNode& each) { each.setParent(nullptr); });
+        visitScene(inner, node);
+    };
+    EXPECT_EQ("r|abcxy", walk(removeEach));
 }

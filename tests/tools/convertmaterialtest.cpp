@@ -162,76 +162,98 @@ TEST_F(ConvertTest, classicMaterials)
     EXPECT_EQ(getTexture(glowing), glow);
 }
 
+namespace
+{
+
+/// A material of a glTF file, and what is to become of it.
+struct PhysicalCase
+{
+    const char* material;
+    const char* program; // after "orv#max_"
+    bool opaque;
+    Rgba left, right; // of the square, where nothing but the material decides; else SEEN_THROUGH or lit
+    float specularLevel = 0.0f, shininess = 1.0f;
+};
+
+const Rgba ORANGE{255, 128, 0}, SEEN_THROUGH{0, 0, 0, 0};
+const PhysicalCase PHYSICAL_CASES[] = {
+    {R"({"name":"unlit","pbrMetallicRoughness":{"baseColorTexture":{"index":0},
+             "baseColorFactor":[0.2,1,1,0.5]},"extensions":{"KHR_materials_unlit":{}}})",
+     "pvl.sp$EMIS",
+     true,
+     {124, 128, 0}, // 0.2 of the light
+     {124, 128, 0}},
+    {R"({"name":"mask","alphaMode":"MASK","pbrMetallicRoughness":{"baseColorTexture":{"index":0}},
+             "extensions":{"KHR_materials_unlit":{}}})",
+     "pvl.sp$DIFF$CUTOFF$UNLIT", true, ORANGE, SEEN_THROUGH},
+    {R"({"name":"lit mask","alphaMode":"MASK","pbrMetallicRoughness":{"baseColorTexture":{"index":0},
+             "baseColorFactor":[1,1,1,0.9],"metallicFactor":0},"alphaCutoff":0.36})",
+     "pvl.sp$DIFF$AMBI$CUTOFF$LINEAR",
+     true,
+     {},
+     SEEN_THROUGH},
+    {R"({"name":"turned","alphaMode":"MASK","extensions":{"KHR_materials_unlit":{}},"pbrMetallicRoughness":
+             {"baseColorTexture":{"index":0,"extensions":{"KHR_texture_transform":
+             {"rotation":-1.5707963,"scale":[0.4,0.4],"offset":[0.45,0.1]}}}}})",
+     "pvl.sp$DIFF$CUTOFF$UNLIT", true, ORANGE, ORANGE}, // u = 0.45 - 0.4 v
+    {R"({"name":"low cutoff","alphaMode":"MASK","alphaCutoff":0.3,
+             "pbrMetallicRoughness":{"baseColorTexture":{"index":0}},"extensions":{"KHR_materials_unlit":{}}})",
+     "pvl.sp$EMIS", true, ORANGE, ORANGE},
+    {R"({"name":"blend","alphaMode":"BLEND","pbrMetallicRoughness":{"baseColorFactor":[1,0,0,0]},
+             "extensions":{"KHR_materials_unlit":{}}})",
+     "pvl.sp$EMIS", false, SEEN_THROUGH, SEEN_THROUGH},
+    {R"({"name":"emissive","emissiveFactor":[0,1,0],"pbrMetallicRoughness":{"baseColorFactor":[0,0,0,1]}})",
+     "pvl.sp$EMIS",
+     true,
+     {0, 255, 0},
+     {0, 255, 0}},
+    {R"({"name":"bump","normalTexture":{"index":1}})", "ppl.sp$BUMP$DIFF$AMBI$LINEAR", true, {}, {}},
+    {R"({"name":"metal","doubleSided":true,"pbrMetallicRoughness":{"metallicFactor":1,"roughnessFactor":0.5,
+             "baseColorFactor":[1,0.5,0,1]}})",
+     "pvl.sp$DIFF$SPEC$AMBI$BACK$LINEAR",
+     true,
+     {},
+     {},
+     0.25f,
+     30.0f},
+    {R"({"name":"dull","pbrMetallicRoughness":{"metallicFactor":0,"roughnessFactor":0.5},
+             "extensions":{"KHR_materials_specular":{"specularFactor":0}}})",
+     "pvl.sp$DIFF$AMBI$LINEAR",
+     true,
+     {},
+     {},
+     0.125f,
+     30.0f},
+    {R"({"name":"gloss","extensions":{"KHR_materials_pbrSpecularGlossiness":
+             {"specularFactor":[0.04,0.04,0.04],"glossinessFactor":0.5}}})",
+     "pvl.sp$DIFF$SPEC$AMBI$LINEAR",
+     true,
+     {},
+     {},
+     0.125f,
+     30.0f},
+};
+
+/// The left and the right of a square as they are to be seen; Rgba() stands for any lit colour.
+void expectSeen(const PhysicalCase& item, const Picture& picture, int x)
+{
+    for (const auto& [wanted, column] : {std::pair(item.left, x + 5), std::pair(item.right, x + 15)})
+    {
+        const Rgba seen = picture.pixel(column, 10);
+        const bool isBackground = support::isNear(seen, {214, 219, 227}, 8);
+        EXPECT_EQ(wanted == SEEN_THROUGH, isBackground) << item.material << " " << seen;
+        EXPECT_TRUE(wanted == SEEN_THROUGH || wanted == Rgba() || support::isNear(wanted, seen, 2))
+            << item.material << " " << seen;
+    }
+}
+
+} // namespace
+
 // Fault caught: features of a material that are dropped, or that switch on what the model did not ask for.
 TEST_F(ConvertMaterialTest, physicalMaterials)
 {
-    const Rgba ORANGE{255, 128, 0}, SEEN_THROUGH{0, 0, 0, 0};
-    const struct
-    {
-        const char* material;
-        const char* program; // after "orv#max_"
-        bool opaque;
-        Rgba left, right; // of the square, where nothing but the material decides; else SEEN_THROUGH or lit
-        float specularLevel = 0.0f, shininess = 1.0f;
-    } cases[] = {
-        {R"({"name":"unlit","pbrMetallicRoughness":{"baseColorTexture":{"index":0},
-             "baseColorFactor":[0.2,1,1,0.5]},"extensions":{"KHR_materials_unlit":{}}})",
-         "pvl.sp$EMIS",
-         true,
-         {124, 128, 0}, // 0.2 of the light
-         {124, 128, 0}},
-        {R"({"name":"mask","alphaMode":"MASK","pbrMetallicRoughness":{"baseColorTexture":{"index":0}},
-             "extensions":{"KHR_materials_unlit":{}}})",
-         "pvl.sp$DIFF$CUTOFF$UNLIT", true, ORANGE, SEEN_THROUGH},
-        {R"({"name":"lit mask","alphaMode":"MASK","pbrMetallicRoughness":{"baseColorTexture":{"index":0},
-             "baseColorFactor":[1,1,1,0.9],"metallicFactor":0},"alphaCutoff":0.36})",
-         "pvl.sp$DIFF$AMBI$CUTOFF$LINEAR",
-         true,
-         {},
-         SEEN_THROUGH},
-        {R"({"name":"turned","alphaMode":"MASK","extensions":{"KHR_materials_unlit":{}},"pbrMetallicRoughness":
-             {"baseColorTexture":{"index":0,"extensions":{"KHR_texture_transform":
-             {"rotation":-1.5707963,"scale":[0.4,0.4],"offset":[0.45,0.1]}}}}})",
-         "pvl.sp$DIFF$CUTOFF$UNLIT", true, ORANGE, ORANGE}, // u = 0.45 - 0.4 v
-        {R"({"name":"low cutoff","alphaMode":"MASK","alphaCutoff":0.3,
-             "pbrMetallicRoughness":{"baseColorTexture":{"index":0}},"extensions":{"KHR_materials_unlit":{}}})",
-         "pvl.sp$EMIS", true, ORANGE, ORANGE},
-        {R"({"name":"blend","alphaMode":"BLEND","pbrMetallicRoughness":{"baseColorFactor":[1,0,0,0]},
-             "extensions":{"KHR_materials_unlit":{}}})",
-         "pvl.sp$EMIS", false, SEEN_THROUGH, SEEN_THROUGH},
-        {R"({"name":"emissive","emissiveFactor":[0,1,0],"pbrMetallicRoughness":{"baseColorFactor":[0,0,0,1]}})",
-         "pvl.sp$EMIS",
-         true,
-         {0, 255, 0},
-         {0, 255, 0}},
-        {R"({"name":"bump","normalTexture":{"index":1}})", "ppl.sp$BUMP$DIFF$AMBI$LINEAR", true, {}, {}},
-        {R"({"name":"metal","doubleSided":true,"pbrMetallicRoughness":{"metallicFactor":1,"roughnessFactor":0.5,
-             "baseColorFactor":[1,0.5,0,1]}})",
-         "pvl.sp$DIFF$SPEC$AMBI$BACK$LINEAR",
-         true,
-         {},
-         {},
-         0.25f,
-         30.0f},
-        {R"({"name":"dull","pbrMetallicRoughness":{"metallicFactor":0,"roughnessFactor":0.5},
-             "extensions":{"KHR_materials_specular":{"specularFactor":0}}})",
-         "pvl.sp$DIFF$AMBI$LINEAR",
-         true,
-         {},
-         {},
-         0.125f,
-         30.0f},
-        {R"({"name":"gloss","extensions":{"KHR_materials_pbrSpecularGlossiness":
-             {"specularFactor":[0.04,0.04,0.04],"glossinessFactor":0.5}}})",
-         "pvl.sp$DIFF$SPEC$AMBI$LINEAR",
-         true,
-         {},
-         {},
-         0.125f,
-         30.0f},
-    };
     std::vector<std::string> materials;
-    for (const auto& item : cases)
+    for (const PhysicalCase& item : PHYSICAL_CASES)
         materials.push_back(item.material);
     m_folder.write("model.gltf", makeModel(materials).dump());
     const Glo::Ptr loaded = convertAndLoad("model.gltf out.glo", "out.glo");
@@ -242,7 +264,7 @@ TEST_F(ConvertMaterialTest, physicalMaterials)
     const Picture picture = support::readPng(m_folder.path("out.png"));
 
     int x = 0;
-    for (const auto& item : cases)
+    for (const PhysicalCase& item : PHYSICAL_CASES)
     {
         const std::string name = json::parse(item.material)["name"];
         const SharedPtr<Appearance> appearance = loaded->getAppearance(name.c_str());
@@ -253,14 +275,7 @@ TEST_F(ConvertMaterialTest, physicalMaterials)
         EXPECT_EQ(item.opaque, appearance->isOpaque()) << name;
         EXPECT_NEAR(item.specularLevel, getValue<float>(appearance, "M_SPECULAR_LEVEL"), 1e-4f) << name;
         EXPECT_NEAR(item.shininess, getValue<float>(appearance, "M_SHININESS"), 1e-3f) << name;
-        for (const auto& [wanted, column] : {std::pair(item.left, x + 5), std::pair(item.right, x + 15)})
-        {
-            const Rgba seen = picture.pixel(column, 10);
-            const bool isBackground = support::isNear(seen, {214, 219, 227}, 8);
-            EXPECT_EQ(wanted == SEEN_THROUGH, isBackground) << name << " " << seen;
-            EXPECT_TRUE(wanted == SEEN_THROUGH || wanted == Rgba() || support::isNear(wanted, seen, 2))
-                << name << " " << seen;
-        }
+        expectSeen(item, picture, x);
         x += 20;
     }
     const Vector4f metal = getValue<Vector4f>(loaded->getAppearance("metal"), "M_SPECULAR_COLOUR");

@@ -17,7 +17,6 @@
 #include <algorithm>
 #include <cmath>
 #include <fstream>
-#include <functional>
 #include <iterator>
 
 using orv::makeShared;
@@ -45,62 +44,64 @@ public:
 } // namespace
 
 // Fault caught: an axis the wrong way round, an eye that tips over the pole, a drag that slides away from the hand.
-TEST(ViewOrbit, goesWhereTheHandGoes)
+class ViewOrbit : public ::testing::Test
 {
-    struct Case
+protected:
+    ViewOrbit() { m_orbit.distance = 10.0f; }
+
+    void expectAt(const Vector3f& eye, const Vector3f& middle)
     {
-        const char* name;
-        std::function<void(view::Orbit&)> move;
-        Vector3f eye;
-        Vector3f middle;
-    };
-    const float halfView = std::tan(orv::Anglef::fromDegrees(20.0f).radians()) * 10.0f;
-    const Case cases[] = {
-        {"at first", [](view::Orbit&) {}, {0, 0, 10}, {0, 0, 0}},
-        {"dragged to the right, the left side comes to the front",
-         [](view::Orbit& o) { o.turn(180, 0); },
-         {-10, 0, 0},
-         {0, 0, 0}},
-        {"dragged down, seen from above",
-         [](view::Orbit& o) { o.turn(0, 90); },
-         {0, 7.0710678f, 7.0710678f},
-         {0, 0, 0}},
-        {"not over the pole", [](view::Orbit& o) { o.turn(0, 9999); }, {0, 10, 0.01f}, {0, 0, 0}},
-        {"moved by half the view",
-         [](view::Orbit& o) { o.pan(50, 0, 100); },
-         {-halfView, 0, 10},
-         {-halfView, 0, 0}},
-        {"moved down", [](view::Orbit& o) { o.pan(0, 50, 100); }, {0, halfView, 10}, {0, halfView, 0}},
-        {"two steps nearer", [](view::Orbit& o) { o.zoom(2); }, {0, 0, 8.1f}, {0, 0, 0}},
-        {"not through the middle", [](view::Orbit& o) { o.zoom(1e6f); }, {0, 0, 1e-6f}, {0, 0, 0}},
-        {"from a camera of the file",
-         [](view::Orbit& o)
-         {
-             orv::Camera camera;
-             camera.setPosition(Vector3f(7, 0, 0));
-             camera.setRotation(quaternionFromAxisAngle(Vector3f(0, 1, 0), orv::Anglef::fromDegrees(90)));
-             o.continueFrom(camera);
-         },
-         {7, 0, 0},
-         {0, 0, 0}},
-    };
-    for (const Case& c : cases)
-    {
-        view::Orbit orbit;
-        orbit.distance = 10.0f;
-        c.move(orbit);
-        expectNear(c.eye, orbit.getEye(), c.name);
-        expectNear(c.middle, orbit.middle, c.name);
+        expectNear(eye, m_orbit.getEye(), "eye");
+        expectNear(middle, m_orbit.middle, "middle");
         orv::Camera camera;
-        orbit.apply(camera);
-        expectNear(orbit.getEye(), camera.getWorldTransform()[3].xyz(), c.name);
-        expectNear(orbit.getDirection(), camera.getWorldTransform()[2].xyz(), c.name);
-        EXPECT_LT(0.0f, camera.getNear()) << c.name;
+        m_orbit.apply(camera);
+        expectNear(m_orbit.getEye(), camera.getWorldTransform()[3].xyz(), "the camera's eye");
+        expectNear(m_orbit.getDirection(), camera.getWorldTransform()[2].xyz(), "the camera's direction");
+        EXPECT_LT(0.0f, camera.getNear());
     }
+
+    view::Orbit m_orbit;
+};
+
+TEST_F(ViewOrbit, isTurnedByDragging)
+{
+    expectAt({0, 0, 10}, {0, 0, 0});
+    m_orbit.turn(180, 0); // to the right: the left side comes to the front
+    expectAt({-10, 0, 0}, {0, 0, 0});
+    m_orbit.turn(-180, 90); // down: seen from above
+    expectAt({0, 7.0710678f, 7.0710678f}, {0, 0, 0});
+    m_orbit.turn(0, 9999); // not over the pole
+    expectAt({0, 10, 0.01f}, {0, 0, 0});
+}
+
+TEST_F(ViewOrbit, isMovedByTheHeightOfTheView)
+{
+    const float halfView = std::tan(orv::Anglef::fromDegrees(20.0f).radians()) * 10.0f;
+    m_orbit.pan(50, 0, 100);
+    expectAt({-halfView, 0, 10}, {-halfView, 0, 0});
+    m_orbit.pan(-50, 50, 100);
+    expectAt({0, halfView, 10}, {0, halfView, 0});
+}
+
+TEST_F(ViewOrbit, comesNearerAndNotThrough)
+{
+    m_orbit.zoom(2);
+    expectAt({0, 0, 8.1f}, {0, 0, 0});
+    m_orbit.zoom(1e6f);
+    expectAt({0, 0, 1e-6f}, {0, 0, 0});
+}
+
+TEST_F(ViewOrbit, goesOnFromACamera)
+{
+    orv::Camera camera;
+    camera.setPosition(Vector3f(7, 0, 0));
+    camera.setRotation(quaternionFromAxisAngle(Vector3f(0, 1, 0), orv::Anglef::fromDegrees(90)));
+    m_orbit.continueFrom(camera);
+    expectAt({7, 0, 0}, {0, 0, 0});
 }
 
 // Fault caught: a ray that is upside down, or wrong in views that are not square or not in perspective.
-TEST(ViewOrbit, castsRaysThroughPixels)
+TEST_F(ViewOrbit, castsRaysThroughPixels)
 {
     orv::Camera camera;
     camera.setPosition(Vector3f(0, 0, 5));
@@ -116,117 +117,87 @@ TEST(ViewOrbit, castsRaysThroughPixels)
 }
 
 // Fault caught: a clip that plays into the next one, a step that leaves the loop, a player that cannot be restarted.
-TEST(ViewPlayer, keepsToItsClip)
+class ViewPlayer : public ::testing::Test
 {
-    struct Case
+protected:
+    /// After each: what is seen is what the player says.
+    void expectAt(float seconds, bool isMoving)
     {
-        const char* name;
-        std::function<void(view::Player&)> use;
-        float time;
-        bool isMoving;
-    };
-    const Case cases[] = {
-        {"at first", [](view::Player&) {}, 0.0f, true},
-        {"plays", [](view::Player& p) { p.update(0.5f); }, 0.5f, true},
-        {"twice as fast",
-         [](view::Player& p)
-         {
-             p.scaleSpeed(2.0f);
-             p.update(0.5f);
-         },
-         1.0f, true},
-        {"round and round", [](view::Player& p) { p.update(10.5f); }, 0.5f, true},
-        {"once",
-         [](view::Player& p)
-         {
-             p.setLooping(false);
-             p.update(11.0f);
-         },
-         10.0f, false},
-        {"once, and once more",
-         [](view::Player& p)
-         {
-             p.setLooping(false);
-             p.update(11.0f);
-             p.togglePaused();
-         },
-         0.0f, true},
-        {"paused",
-         [](view::Player& p)
-         {
-             p.togglePaused();
-             p.update(1.0f);
-         },
-         0.0f, false},
-        {"and on",
-         [](view::Player& p)
-         {
-             p.togglePaused();
-             p.togglePaused();
-             p.update(1.0f);
-         },
-         1.0f, true},
-        {"a frame on stops",
-         [](view::Player& p)
-         {
-             p.step(1);
-             p.update(1.0f);
-         },
-         1.0f / 30.0f, false},
-        {"a frame back from the start", [](view::Player& p) { p.step(-1); }, 10.0f - 1.0f / 30.0f, false},
-        {"a frame back, once",
-         [](view::Player& p)
-         {
-             p.setLooping(false);
-             p.step(-1);
-         },
-         0.0f, false},
-        {"a clip", [](view::Player& p) { EXPECT_TRUE(p.chooseClip("run")); }, 4.0f, true},
-        {"a clip, round and round",
-         [](view::Player& p)
-         {
-             p.chooseClip("run");
-             p.update(2.5f);
-         },
-         4.5f, true},
-        {"a clip, its middle",
-         [](view::Player& p)
-         {
-             p.chooseClip("run");
-             p.seekShare(0.5f);
-         },
-         5.0f, true},
-        {"a clip, skipped over",
-         [](view::Player& p)
-         {
-             p.chooseClip("run");
-             p.skip(-0.5f);
-         },
-         5.5f, true},
-        {"the clip before the first",
-         [](view::Player& p)
-         {
-             p.stepClip(-1);
-             EXPECT_EQ("pose", p.getClip().name);
-         },
-         7.0f, false},
-        {"no such clip",
-         [](view::Player& p)
-         {
-             p.update(1.0f);
-             EXPECT_FALSE(p.chooseClip("fly"));
-         },
-         1.0f, true},
-    };
-    for (const Case& c : cases)
-    {
-        const auto animation = makeShared<FakeAnimation>();
-        view::Player player(animation, {{"all", 0, 10}, {"run", 4, 6}, {"pose", 7, 7}});
-        c.use(player);
-        EXPECT_NEAR(c.time, player.getTime(), 1e-4) << c.name;
-        EXPECT_EQ(player.getTime(), animation->m_applied) << c.name;
-        EXPECT_EQ(c.isMoving, player.isMoving()) << c.name;
+        EXPECT_NEAR(seconds, m_player.getTime(), 1e-4);
+        EXPECT_EQ(m_player.getTime(), m_animation->m_applied);
+        EXPECT_EQ(isMoving, m_player.isMoving());
     }
+
+    orv::SharedPtr<FakeAnimation> m_animation = makeShared<FakeAnimation>();
+    view::Player m_player{m_animation, {{"all", 0, 10}, {"run", 4, 6}, {"pose", 7, 7}}};
+};
+
+TEST_F(ViewPlayer, playsRoundAndRound)
+{
+    expectAt(0.0f, true);
+    m_player.update(0.5f);
+    expectAt(0.5f, true);
+    m_player.update(10.0f);
+    expectAt(0.5f, true);
+    m_player.scaleSpeed(2.0f);
+    m_player.update(0.5f);
+    expectAt(1.5f, true);
+}
+
+TEST_F(ViewPlayer, stopsAtTheEndOfOneRound)
+{
+    m_player.setLooping(false);
+    m_player.update(11.0f);
+    expectAt(10.0f, false);
+    m_player.togglePaused(); // from the start
+    expectAt(0.0f, true);
+}
+
+TEST_F(ViewPlayer, pausesAndGoesOn)
+{
+    m_player.togglePaused();
+    m_player.update(1.0f);
+    expectAt(0.0f, false);
+    m_player.togglePaused();
+    m_player.update(1.0f);
+    expectAt(1.0f, true);
+}
+
+TEST_F(ViewPlayer, stepsByFrames)
+{
+    m_player.step(1);
+    m_player.update(1.0f);
+    expectAt(1.0f / 30.0f, false);
+    m_player.step(-2);
+    expectAt(10.0f - 1.0f / 30.0f, false);
+}
+
+TEST_F(ViewPlayer, doesNotStepBackBeforeTheStartOfOneRound)
+{
+    m_player.setLooping(false);
+    m_player.step(-1);
+    expectAt(0.0f, false);
+}
+
+TEST_F(ViewPlayer, keepsToItsClip)
+{
+    EXPECT_TRUE(m_player.chooseClip("run"));
+    expectAt(4.0f, true);
+    m_player.update(2.5f);
+    expectAt(4.5f, true);
+    m_player.seekShare(0.5f);
+    expectAt(5.0f, true);
+    m_player.skip(-1.5f);
+    expectAt(5.5f, true);
+    EXPECT_FALSE(m_player.chooseClip("fly"));
+    expectAt(5.5f, true);
+}
+
+TEST_F(ViewPlayer, goesFromClipToClip)
+{
+    m_player.stepClip(-1);
+    EXPECT_EQ("pose", m_player.getClip().name);
+    expectAt(7.0f, false);
 }
 
 // Fault caught: a comparison that passes what a person would see, or fails for what the text allows.
