@@ -2,7 +2,6 @@
 
 #include "orv/assetcachepool.h"
 #include "orv/propertycollector.h"
-#include "orv/propertyref.h"
 #include "orv/rendercontext.h"
 #include "orv/shaderprogramcache.h"
 #include "orv/texture2dcache.h"
@@ -249,26 +248,6 @@ TEST_F(AppearanceTest, feedsTheProgram)
     EXPECT_EQ(Calls{}, callsOf([&] { other->enable(*m_context); }));
     program->enable(*m_context); // nothing of the appearance stays behind
     EXPECT_EQ(9.0f, getSent(*program, "u_b"));
-}
-
-// Fault caught: a remembered holder that is written although its appearance, or the property in it, is another.
-TEST(PropertyRef, writesThePropertyOfTheMoment)
-{
-    PropertyRef reference("P");
-    Appearance first, second;
-    using Values = std::vector<float>;
-    EXPECT_TRUE(reference.set(first, 1.0f)); // creates it
-    EXPECT_TRUE(reference.set(second, 2.0f));
-    EXPECT_EQ(Values{1}, valuesOf(first, "P"));
-    EXPECT_EQ(Values{2}, valuesOf(second, "P"));
-    second.addProperty<float>("P", 1);
-    EXPECT_TRUE(reference.set(second, 3.0f));
-    EXPECT_EQ(Values{3}, valuesOf(second, "P"));
-    LogCapture log;
-    EXPECT_FALSE(reference.set(second, 5));
-    EXPECT_FALSE(reference.set(second, 5.0f, -1));
-    EXPECT_FALSE(reference.set(second, 5.0f, 1));
-    EXPECT_EQ(2, log.count('E'));
 }
 
 // Faults caught: noise about a ".pvr" variant that need not be there; a failure that leaves the material untextured.

@@ -2,9 +2,6 @@
 
 #include "orv/filetostring.h"
 #include "orv/memorystream.h"
-#include "orv/textsuffix.h"
-
-#include "support/tempdir.h"
 
 #include <gtest/gtest.h>
 
@@ -127,56 +124,4 @@ TEST(TokenReader, requiredCharacter)
     EXPECT_EQ("x", present.rest());
     Text blank("  ");
     EXPECT_FALSE(requireChar(blank.range, '\0')) << "the byte behind the range is not part of it";
-}
-
-TEST(TextSuffix, matches)
-{
-    const struct
-    {
-        const char* text;
-        const char* suffix;
-        bool exact;
-        bool ignoringCase;
-    } cases[] = {
-        {"IMAGE.PNG", ".png", false, true}, {"g", ".png", false, false}, {"x", "", true, true},
-        {"a[", "a{", false, false},         {nullptr, "", false, false}, {"a", nullptr, false, false}};
-    for (const auto& test : cases)
-    {
-        EXPECT_EQ(test.exact, endsWith(test.text, test.suffix)) << (test.text ? test.text : "null");
-        EXPECT_EQ(test.ignoringCase, endsWithI(test.text, test.suffix)) << (test.text ? test.text : "null");
-    }
-}
-
-namespace
-{
-
-/// Says that it is larger than it is.
-class ShortStream : public MemoryStream
-{
-public:
-    using MemoryStream::MemoryStream;
-    int32_t size() const override { return 1000; }
-};
-
-} // namespace
-
-// Fault caught: text behind the part that was really read.
-TEST(FileToString, readsTheRestOfAStream)
-{
-    MemoryStream stream("0123456789", 10);
-    stream.seek(4);
-    FileToString text(stream);
-    EXPECT_STREQ("456789", text.getStart());
-    EXPECT_EQ('\0', *text.getEnd());
-    EXPECT_EQ(6, text.getEnd() - text.getStart());
-
-    ShortStream shortStream("abc", 3);
-    text.read(shortStream);
-    EXPECT_STREQ("abc", text.getStart());
-    EXPECT_EQ(3, text.getEnd() - text.getStart());
-
-    text.read(stream); // at its end
-    EXPECT_STREQ("", text.getStart());
-
-    EXPECT_EQ(nullptr, FileToString("no/such/file").getStart());
 }

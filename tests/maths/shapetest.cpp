@@ -65,11 +65,3 @@ TEST(Shape, raycast)
         EXPECT_NEAR(0.0f, length(c.normal - result.normal), 1e-5f) << toString(result.normal);
     }
 }
-
-TEST(Sphere, fromItsCentreBothRootsAreEquallyNear)
-{
-    const RaycastResult result = makeShared<Sphere>()->raycast({Vector3f(), Vector3f(0, 2, 0)});
-    EXPECT_TRUE(result.hit);
-    EXPECT_NEAR(0.5f, std::fabs(result.distance), 1e-6f);
-    EXPECT_NEAR(1.0f, std::fabs(result.normal.y), 1e-6f);
-}

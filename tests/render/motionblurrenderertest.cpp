@@ -24,7 +24,7 @@ Picture makePicture(int size, Function colourAt)
     return picture;
 }
 
-class MotionBlurTest : public SceneTest
+class MotionBlurRendererTest : public SceneTest
 {
 protected:
     void SetUp() override
@@ -85,7 +85,7 @@ private:
 } // namespace
 
 // Faults caught: a step turned upside down, a division by no time at all, a time that is not remembered.
-TEST_F(MotionBlurTest, deltaTimeIsOneAtSixtyFrames)
+TEST_F(MotionBlurRendererTest, deltaTimeIsOneAtSixtyFrames)
 {
     const struct
     {
@@ -106,7 +106,7 @@ TEST_F(MotionBlurTest, deltaTimeIsOneAtSixtyFrames)
 }
 
 // Faults caught: old matrices of the wrong frame, factors in the wrong order, motion data of solids that took no part.
-TEST_F(MotionBlurTest, comparesWithTheFrameBefore)
+TEST_F(MotionBlurRendererTest, comparesWithTheFrameBefore)
 {
     flags = FlagMask(1, 1);
     const auto hidden = addSquare(Vector3f(0, 1, 0), 1.0f, paint);
@@ -134,7 +134,7 @@ TEST_F(MotionBlurTest, comparesWithTheFrameBefore)
 }
 
 // Faults caught: signs and axes, values that depend on the frame rate, an eye compared with the other one's past.
-TEST_F(MotionBlurTest, picturesShowTheWayOverTheScreen)
+TEST_F(MotionBlurRendererTest, picturesShowTheWayOverTheScreen)
 {
     const auto solid = addSquare(Vector3f(), 2.0f, paint);
     solid->setRotation(quaternionFromAxisAngle(Vector3f(0.6f, 0.8f, 0), Anglef::fromDegrees(25.0f)));
@@ -180,7 +180,7 @@ TEST_F(MotionBlurTest, picturesShowTheWayOverTheScreen)
 }
 
 // Faults caught: a program given to skinned solids, their mesh not bound, a draw that no program asked for.
-TEST_F(MotionBlurTest, skinnedSolidsTakeTheCurrentProgram)
+TEST_F(MotionBlurRendererTest, skinnedSolidsTakeTheCurrentProgram)
 {
     const auto skinned = addSquare(Vector3f(0, 0, 0), 1.0f, paint);
     skinned->setJointsPerVertex(1);
@@ -207,7 +207,7 @@ TEST_F(MotionBlurTest, skinnedSolidsTakeTheCurrentProgram)
 }
 
 // Faults caught: solids pulled to where another renderer's last skin was; joints that do not reach the program.
-TEST_F(MotionBlurTest, jointsAreThoseOfTheSolid)
+TEST_F(MotionBlurRendererTest, jointsAreThoseOfTheSolid)
 {
     const auto joint = makeShared<SceneNode>();
     joint->setPosition(Vector3f(2, 0, 0));
@@ -231,7 +231,7 @@ TEST_F(MotionBlurTest, jointsAreThoseOfTheSolid)
 
 // Faults caught: what rests changed by rounding, a smear to one side, one eye's picture in the other's, the opposite
 // edge or the black surroundings of smaller velocities mixed in.
-TEST_F(MotionBlurTest, blursAlongTheVelocityAlone)
+TEST_F(MotionBlurRendererTest, blursAlongTheVelocityAlone)
 {
     const Picture noise =
         makePicture(64,

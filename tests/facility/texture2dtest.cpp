@@ -20,7 +20,7 @@ using Type = Texture::Type;
 using Filter = TextureParameters::FilterMode;
 using Wrap = TextureParameters::WrapMode;
 
-class TextureTest : public TextureFixture<Texture2DCache>
+class Texture2DTest : public TextureFixture<Texture2DCache>
 {
 protected:
     SharedPtr<Texture2D> create(unsigned width, unsigned height, Format format = Format::RGBA,
@@ -33,7 +33,7 @@ protected:
 } // namespace
 
 // Faults caught: a texture that GL takes for incomplete and shows black, and sizes miscounted.
-TEST_F(TextureTest, createChoosesWhatTheSizeAndFormatAllow)
+TEST_F(Texture2DTest, createChoosesWhatTheSizeAndFormatAllow)
 {
     const struct
     {
@@ -74,7 +74,7 @@ TEST_F(TextureTest, createChoosesWhatTheSizeAndFormatAllow)
 }
 
 // Fault caught: rows of three bytes per pixel skewed by GL's default row alignment, or turned upside down.
-TEST_F(TextureTest, rowsArriveAsGiven)
+TEST_F(Texture2DTest, rowsArriveAsGiven)
 {
     Bytes pixels(5 * 3 * 3, 0);
     for (int y = 0; y < 3; ++y)
@@ -90,7 +90,7 @@ TEST_F(TextureTest, rowsArriveAsGiven)
 }
 
 // Faults caught: settings under which GL shows the texture black, and mipmaps asked for but never made.
-TEST_F(TextureTest, settingsThatWouldTurnATextureBlackAreRefused)
+TEST_F(Texture2DTest, settingsThatWouldTurnATextureBlackAreRefused)
 {
     GLuint names[2] = {};
     glGenTextures(2, names);
@@ -140,7 +140,7 @@ TEST_F(TextureTest, settingsThatWouldTurnATextureBlackAreRefused)
 
 // Faults caught: mipmaps that a wrapped texture lacks are never made, or taken for made when there was no memory; setters
 // that reach name 0.
-TEST_F(TextureTest, mipmapsOnDemandAndNothingAfterRelease)
+TEST_F(Texture2DTest, mipmapsOnDemandAndNothingAfterRelease)
 {
     GLuint name = 0;
     glGenTextures(1, &name);
@@ -165,7 +165,7 @@ TEST_F(TextureTest, mipmapsOnDemandAndNothingAfterRelease)
 }
 
 // Fault caught: a render context that draws with what it bound before, although the unit was taken.
-TEST_F(TextureTest, everyBindOutsideDrawingMovesTheEpoch)
+TEST_F(Texture2DTest, everyBindOutsideDrawingMovesTheEpoch)
 {
     const auto texture = create(8, 8);
     RenderContext render;
@@ -188,7 +188,7 @@ TEST_F(TextureTest, everyBindOutsideDrawingMovesTheEpoch)
 }
 
 // Faults caught: rows missing, RGB refused for a surface with alpha, wrong sampling, names leaked by failed copies.
-TEST_F(TextureTest, backbufferCopies)
+TEST_F(Texture2DTest, backbufferCopies)
 {
     RenderContext render;
     render.setViewport(0, 0, 20, 10);
@@ -225,7 +225,7 @@ TEST_F(TextureTest, backbufferCopies)
     EXPECT_EQ(3, log.count('E'));
 }
 
-TEST_F(TextureTest, externalTexturesNeedTheirExtension)
+TEST_F(Texture2DTest, externalTexturesNeedTheirExtension)
 {
     LogCapture log;
     const auto texture = cache->createForExternalSource();
@@ -244,7 +244,7 @@ TEST_F(TextureTest, externalTexturesNeedTheirExtension)
 }
 
 // Faults caught: a channel count uploaded as another format, files that no loader claims.
-TEST_F(TextureTest, loaderReadsImagesByName)
+TEST_F(Texture2DTest, loaderReadsImagesByName)
 {
     const struct
     {
