@@ -171,6 +171,41 @@ testing::AssertionResult comparePictures(const std::string& name, const Picture&
     return failure;
 }
 
+testing::AssertionResult compareWithKept(const std::string& path, const Picture& actual,
+                                         const Tolerance& tolerance)
+{
+    std::string error;
+    if (std::getenv("ORV_ACCEPT_PICTURES"))
+    {
+        const bool isWritten =
+            headless::writePng(path, actual.width, actual.height, actual.rgba.data(), error);
+        return isWritten ? testing::AssertionSuccess() : testing::AssertionFailure() << error;
+    }
+    const std::string::size_type start = path.rfind('/') + 1;
+    const std::string name = path.substr(start, path.rfind('.') - start);
+    testing::AssertionResult result = comparePictures(name, readPng(path), actual, tolerance);
+    if (!result)
+        result << "\n  Look at them. If the new one is right, \"./run accept\" puts it in the place of "
+               << path;
+    return result;
+}
+
+Picture shrink(const Picture& picture, int side)
+{
+    Picture small = Picture::filled(picture.width / side, picture.height / side, {});
+    for (int y = 0; y < small.height; ++y)
+    {
+        for (int x = 0; x < small.width; ++x)
+        {
+            Picture block = Picture::filled(side, side, {});
+            for (int i = 0; i < side * side; ++i)
+                block.setPixel(i % side, i / side, picture.pixel(x * side + i % side, y * side + i / side));
+            small.setPixel(x, y, block.average());
+        }
+    }
+    return small;
+}
+
 std::string savePicture(const std::string& name, const Picture& actual)
 {
     return save(name + "-actual.png", actual);

@@ -61,6 +61,15 @@ struct Tolerance
 testing::AssertionResult comparePictures(const std::string& name, const Picture& expected,
                                          const Picture& actual, const Tolerance& tolerance = {});
 
+/// The same beside a PNG that is kept in the source tree. With ORV_ACCEPT_PICTURES in the environment, as "./run accept"
+/// has it, the picture is written there instead, to be looked at before it is committed.
+/// @param path  of the kept PNG; its name is NAME.
+testing::AssertionResult compareWithKept(const std::string& path, const Picture& actual,
+                                         const Tolerance& tolerance = {});
+
+/// The means of square blocks of so many pixels a side; what is left over at the right and lower edges goes.
+Picture shrink(const Picture& picture, int side);
+
 /// For a failed check of single pixels: writes NAME-actual.png and says where.
 std::string savePicture(const std::string& name, const Picture& actual);
 
