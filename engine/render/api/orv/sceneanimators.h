@@ -114,14 +114,14 @@ public:
 
     void apply(const T& value) override
     {
-        if (Appearance* appearance = m_appearance.operator->()) // which logs when there is none
+        if (Appearance* appearance = m_appearance.getLogged())
             m_property.set(*appearance, value);
     }
 
     /// An appearance is in no subtree.
     void applyMixed(const T& from, const T& to, float share, const AnimationMix& mix) override
     {
-        Appearance* appearance = m_appearance.operator->();
+        Appearance* appearance = m_appearance.getLogged();
         if (!appearance || !mix.reaches(nullptr))
             return;
         T value = AnimationMix::between(from, to, share);
