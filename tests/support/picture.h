@@ -67,7 +67,7 @@ testing::AssertionResult comparePictures(const std::string& name, const Picture&
 testing::AssertionResult compareWithKept(const std::string& path, const Picture& actual,
                                          const Tolerance& tolerance = {});
 
-/// The means of square blocks of so many pixels a side; what is left over at the right and lower edges goes.
+/// The means of square blocks of side x side pixels; what is left over at the right and lower edges is dropped.
 Picture shrink(const Picture& picture, int side);
 
 /// For a failed check of single pixels: writes NAME-actual.png and says where.

@@ -90,8 +90,8 @@ std::pair<unsigned, unsigned> getShape(const Object& accessor)
     accessor.fail("type", "is \"" + type + "\", which is none");
 }
 
-/// Bytes that so many elements take.
-/// @return nothing if no file could hold so many.
+/// The bytes that a number of elements take.
+/// @return nothing if no file could hold that many.
 std::optional<size_t> getExtent(size_t count, size_t stride, size_t elementSize)
 {
     if (count == 0)

@@ -7,7 +7,7 @@
 /// please; a source that derives from any other class is compiled with -fno-rtti. dynamic_cast and typeid do not
 /// work on the library's objects.
 ///
-/// ORV_LOCAL takes a private member of an exported class back that no inline function calls.
+/// ORV_LOCAL hides a private member of an exported class again, where no inline function calls it.
 #if defined(__GNUC__)
 #define ORV_API __attribute__((visibility("default")))
 #define ORV_LOCAL __attribute__((visibility("hidden")))

@@ -10,9 +10,10 @@ namespace orv
 /// How much one load may make. A load is what one call of the program starts (a cache's get(), loadAppearance(),
 /// loadGloFile()) with everything that it names: pictures, shader programs, other files.
 ///
-/// What a file costs must follow from its size; these are what any file may cost besides, and a program raises them
-/// for files that it trusts or lowers them for a device with little memory. What goes beyond is refused with a message
-/// and counts as a file that cannot be loaded. Below, N is the bytes read in the load, each different content once.
+/// The cost of a file must follow from its size; these limits are what any file may cost on top of that. A
+/// program raises them for files that it trusts, or lowers them for a device with little memory. A file that
+/// goes beyond them is refused with a message, like any file that cannot be loaded. Below, N is the number of
+/// bytes read in the load, each different content counted once.
 struct LoadLimits
 {
     /// Decoded bytes that any one picture may have, whatever it is loaded for. A larger one needs a file of 1/64 of

@@ -14,7 +14,7 @@ enum class LogLevel : int32_t
     INFO = 1,
     WARNING = 2,
     ERROR = 3,
-    NONE = 4 ///< of no record: as the lowest level it silences the log
+    NONE = 4 ///< no record has it: as the lowest level it silences the log
 };
 
 /// Takes one record in place of the platform's log, on the thread that wrote it. It may not log itself.

@@ -47,7 +47,7 @@ private:
         return static_cast<AssetLoader<T>&>(loader).load(*this, name);
     }
 
-    /// Nothing but a T and its loaders comes in.
+    /// Only a T and its loaders are ever stored.
     static SharedPtr<T> typed(const SharedPtr<Shared>& asset) { return static_cast<T*>(asset.get()); }
 };
 

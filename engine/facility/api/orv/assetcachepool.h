@@ -44,7 +44,7 @@ public:
     /// Opens a file by its exact name. @return empty if no source has it.
     SharedPtr<Stream> getStream(const char* name) const;
 
-    /// To be called after a message about a file that may not have been found: where no source has it, logs a warning that
+    /// Call this after a message about a file that may not have been found: if no source has it, a warning
     /// says where it was looked for, once in a load.
     ORV_LOCAL void explainMissing(const char* name) const;
 

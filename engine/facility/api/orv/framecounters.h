@@ -30,12 +30,12 @@ struct ORV_API FrameCounters
     }
 };
 
-/// What the engine has sent to GL in this process so far; numbers go on at 0 beyond their types. GL thread only. For a
-/// frame, see SimpleRenderer::setCounted(); for a part of it or for a load, subtract what this said before.
+/// What the engine has sent to GL in this process so far; counters wrap around. GL thread only. For one
+/// frame, see SimpleRenderer::setCounted(); for a part of a frame or a load, subtract an earlier answer.
 /// Calls that an application makes itself do not count.
 ORV_API FrameCounters countGlCalls();
 
-/// What has come since earlier ones; culled stays 0.
+/// The calls between two answers; culled stays 0.
 ORV_API FrameCounters operator-(const FrameCounters& later, const FrameCounters& earlier);
 
 } // namespace orv

@@ -49,8 +49,8 @@ public:
     /// all places that they may reach. What is drawn with SimpleRenderer::setCulled() has to stay inside.
     void setBounds(const Bounds& bounds);
 
-    /// Of a mesh for joints, by their numbers: around the vertices that have a weight for the joint, in the mesh's own
-    /// space, and unknown where there are none. Empty while nothing is known.
+    /// For skinned meshes, indexed by joint number: boxes in the mesh's own space around the vertices that
+    /// have a weight for the joint, unknown where there are none. Empty while nothing is known.
     const std::vector<Bounds>& getJointBounds() const { return m_jointBounds; }
     void setJointBounds(std::vector<Bounds> bounds);
 

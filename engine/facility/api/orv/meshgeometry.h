@@ -34,8 +34,8 @@ public:
     std::vector<Influence> influences; ///< as many as places, or none for meshes without joints
 };
 
-/// Shares as the built-in programs make them of weights: that add up to 1 or, where the weights do not add up to more than
-/// 0, with all for the first joint. Joint numbers beyond 255 become that.
+/// The shares that the built-in programs compute from weights: they add up to 1. Where the weights add up to
+/// 0 or less, the first joint has all of it. Joint numbers beyond 255 become 255.
 /// @param joints  numbers; the nearest whole ones count.
 MeshVertices::Influence makeInfluence(const Vector4f& joints, const Vector4f& weights);
 
@@ -111,7 +111,7 @@ private:
     mutable std::vector<Node> m_nodes;
 };
 
-/// Gives a mesh the bounds of a geometry, and of its joints.
+/// Sets the bounds of a mesh, and of its joints, to those of a geometry.
 ORV_API void setBounds(Mesh& mesh, const MeshGeometry& geometry);
 
 } // namespace orv

@@ -30,15 +30,15 @@ public:
 
     ORV_CLASS_NAME("RenderContext")
 
-    /// The time in which the context remembers from draw to draw what is bound and binds what differs alone.
+    /// While one exists, the context remembers from draw to draw what is bound, and binds only what differs.
     ///
-    /// Where none is open every draw binds all it needs, whatever the application has bound. Renderers and
-    /// render blocks open one for each frame; open one around direct draws (Solid::draw(), Text::draw()) where
-    /// there are many. GL calls of your own inside are to be followed by forgetBindings().
+    /// Without one, every draw binds everything it needs, whatever the application has bound. Renderers and
+    /// render blocks open one for each frame; open one around many direct draws (Solid::draw(),
+    /// Text::draw()). After GL calls of your own inside one, call forgetBindings().
     ///
-    /// Scopes may be nested; what is bound counts as unknown at each beginning. At each end, if anything was
-    /// drawn, no vertex array is enabled, no vertex or index buffer is bound and texture unit 0 is the active
-    /// one; the program stays current and textures stay bound.
+    /// Scopes may be nested. At the start of each, what is bound counts as unknown. At the end of each, if
+    /// anything was drawn, no vertex array is enabled, no vertex or index buffer is bound and texture unit 0
+    /// is active; the program stays current and textures stay bound.
     class ORV_API DrawScope
     {
     public:
@@ -107,13 +107,13 @@ public:
     void addProperty(const SharedPtr<ShaderUniformBase>& property, const char* name);
     /// @return empty when there is no such property.
     SharedPtr<ShaderUniformBase> getProperty(const char* name) const;
-    /// Makes uniform the very holder that is stored under name; leaves it alone when there is none.
+    /// Makes uniform point to the holder that is stored under name; leaves it alone when there is none.
     void linkUniform(SharedPtr<ShaderUniformBase>& uniform, const char* name) const;
 
     /// Identity: no other render context of this process has or had it, so it may be remembered in place of
     /// a pointer.
     uint64_t getRevision() const { return m_revision; }
-    /// Another number after every addProperty() that stored something.
+    /// Changes with every addProperty() that stores something.
     uint64_t getPropertyRevision() const { return m_properties.getRevision(); }
 
     /// Draw path: sends a material's whole state through the setters above, in their order.
@@ -139,8 +139,8 @@ public:
                getApplyFlags(blendEnabled, turnWinding) == m_appliedFlags;
     }
 
-    /// To be called inside a DrawScope after GL calls of your own that bound or unbound a program, a buffer or a
-    /// texture, or that concerned the active texture unit or vertex attributes. Makes no GL call.
+    /// Call this inside a DrawScope after GL calls of your own that bound or unbound a program, a buffer or a
+    /// texture, or that changed the active texture unit or vertex attributes. Makes no GL call.
     void forgetBindings() { m_bindings.forget(); }
 
     bool isDrawScopeOpen() const { return m_bindings.isScopeOpen(); }

@@ -61,8 +61,8 @@ ORV_API void checkGLError(const char* file, const char* function, int line);
 namespace detail
 {
 
-/// The same for those who have to give something up then. Its caller calls RenderDevice::getError(false)
-/// first, so that an older error is not taken for its own.
+/// The same for callers that have to give something up after an error. Call RenderDevice::getError(false)
+/// before the call in question, so that an older error is not taken for its own.
 /// @return whether there was an error.
 bool reportGLError(const char* file, const char* function, int line);
 

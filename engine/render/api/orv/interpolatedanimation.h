@@ -7,8 +7,8 @@
 namespace orv
 {
 
-/// Another animation, interpolated between its keys whoever plays it: AnimationController::setInterpolated() has the rules.
-/// Channels of scene files that ask for it are in one of these.
+/// Another animation, interpolated between its keys by every controller that plays it;
+/// AnimationController::setInterpolated() has the rules.
 class InterpolatedAnimation final : public Animation
 {
 public:

@@ -197,7 +197,7 @@ private:
     template <class Use>
     ORV_LOCAL void forEachReach(const Use& use) const;
 
-    /// What those above this node know of it does not hold any longer.
+    /// Marks what the nodes above know of this one as out of date.
     ORV_LOCAL void changeKnownPlace();
     /// Of this node and those above it.
     ORV_LOCAL static void forgetReach(const SceneNode* node);

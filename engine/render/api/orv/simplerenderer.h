@@ -75,29 +75,31 @@ public:
     void update(float time) override { m_time = time; }
     const SharedPtr<RenderContext>& getRenderContext() const override { return m_context; }
 
-    /// Draws opaque solids program by program, of each material by material, of each mesh by mesh, in place of in the
-    /// order of the walk, which holds within a group; in reflections too. Off at first.
+    /// Draws opaque solids grouped by program, then by material, then by mesh, instead of in the order of the
+    /// walk; within a group they keep that order. Reflections are grouped too. Off by default.
     ///
-    /// Switching programs and textures is what most drivers spend a frame of many solids on. Pictures stay the same,
-    /// but where two solids have equal depths. A solid keeps its place, after all that come before it in the walk,
-    /// where its material's render state makes the order matter: depth test or write off, a depth function other than
-    /// LESS and LEQUAL, a depth offset, the stencil test, a colour mask. Not for targets without a depth buffer, nor
-    /// for programs with uniforms that some of their materials give no value: those keep the last one sent.
+    /// On most drivers, changing programs and textures takes most of the time of a frame with many solids.
+    /// Pictures stay the same, except where two solids have equal depths. A solid keeps its place, after
+    /// everything that comes before it in the walk, where its material's render state makes the order matter:
+    /// depth test or write off, a depth function other than LESS and LEQUAL, a depth offset, the stencil
+    /// test, a colour mask. Do not use it for targets without a depth buffer, nor for programs with uniforms
+    /// that some of their materials give no value: those keep the last value sent.
     void setOpaqueGrouped(bool grouped);
     bool isOpaqueGrouped() const { return m_groups != nullptr; }
 
-    /// Leaves out solids that are outside of what an eye sees, in stereo and in mirrors for each picture by itself; whole
-    /// subtrees of them without a look at each. Off at first.
+    /// Leaves out solids that are outside the view. Each eye in stereo and each mirror's picture is tested by
+    /// itself; a subtree that is wholly outside costs one test. Off by default.
     ///
-    /// A solid counts with the sphere around its mesh (Mesh::getBounds()), one with joints with spheres around what each
-    /// joint moves (Mesh::getJointBounds()), so that none is left out that could be seen. Always drawn are solids of
-    /// unknown bounds, and those whose program takes no model transform. Known are the bounds of the built-in shapes, of
-    /// scene files loaded with MeshData::BOUNDS, and what Mesh::setBounds() says; that is for programs that move vertices
-    /// about, too. Pictures stay the same; the transform properties end up with the values of the last solid drawn.
+    /// A solid is tested by the sphere around its mesh (Mesh::getBounds()), a skinned one by spheres around
+    /// what each joint moves (Mesh::getJointBounds()), so that nothing visible is left out. Solids of unknown
+    /// bounds are always drawn, and so are those whose program takes no model transform. Bounds are known for
+    /// the built-in shapes, for scene files loaded with MeshData::BOUNDS, and where Mesh::setBounds() set
+    /// them; programs that move vertices need the latter. Pictures stay the same; the transform properties
+    /// end up with the values of the last solid drawn.
     ///
-    /// Subtrees with lights, solids with joints or solids of unknown bounds are gone through solid by solid, and those in
-    /// which something moves. A node class of the application's own whose accept() hands over other nodes than itself
-    /// needs a getNodeType() of its own, so that its subtree is never left out as a whole.
+    /// Subtrees that hold lights, skinned solids, solids of unknown bounds or anything that moves are tested
+    /// solid by solid. A node class of your own whose accept() hands over other nodes than itself needs a
+    /// getNodeType() of its own, so that its subtree is never left out as a whole.
     void setCulled(bool culled);
     bool isCulled() const { return m_culling != nullptr; }
 

@@ -107,7 +107,7 @@ Vector4f SceneNode::findReach() const
     return extras->reach;
 }
 
-/// Nodes of other classes may hand anything to a visitor; lights shine from where nobody sees them.
+/// Nodes of other classes may hand anything to a visitor; lights shine from outside the view.
 Vector4f SceneNode::getOwnReach() const
 {
     switch (getNodeType())
