@@ -140,8 +140,10 @@ private:
     ORV_LOCAL bool indexInRange(int index) const;
     ORV_LOCAL void addUniform(const char* name, int location, int size, unsigned glType, int& nextUnit);
     ORV_LOCAL void setSamplerUnits() const;
-    static void sendIfNew(const detail::UniformSources::Value& value);
-    bool isReady(const RenderContext& context, const detail::UniformSources& sources) const;
+    ORV_LOCAL static void sendIfNew(const detail::UniformSources::Value& value);
+    ORV_LOCAL static void sendVector(const detail::UniformSources::Value& value);
+    ORV_LOCAL static Vector4f* getSentVector(const Uniform& uniform, const ShaderUniformBase& source);
+    ORV_LOCAL bool isReady(const RenderContext& context, const detail::UniformSources& sources) const;
     ORV_LOCAL bool makeReady(RenderContext& context, const ShaderUniformBase* const* values,
                              detail::UniformSources& sources);
     ORV_LOCAL void linkAnew(RenderContext& context);

@@ -267,6 +267,12 @@ void addUnits(const detail::DrawnUniform& sampler, const ShaderUniformBase* sour
 
 } // namespace
 
+Vector4f* ShaderProgram::getSentVector(const Uniform& uniform, const ShaderUniformBase& source)
+{
+    const bool isPair = uniform.size == 1 && uniform.sent->holds<Vector4f>() && source.holds<Vector4f>();
+    return isPair ? static_cast<ShaderUniform<Vector4f>&>(*uniform.sent.get()).values() : nullptr;
+}
+
 void ShaderProgram::resolve(const ShaderUniformBase* const* values, detail::UniformSources& sources)
 {
     // Materials can tell only so many uniforms apart; of more, each is looked at for every material.
@@ -293,11 +299,11 @@ void ShaderProgram::resolve(const ShaderUniformBase* const* values, detail::Unif
         }
         else if (own || (source && isLarge))
         {
-            sources.values.push_back({source, &uniform});
+            sources.values.push_back({source, &uniform, getSentVector(uniform, *source)});
             sources.ownUniforms |= isLarge ? 0 : uint64_t(1) << i;
         }
         else if (source)
-            others.push_back({source, &uniform});
+            others.push_back({source, &uniform, getSentVector(uniform, *source)});
     }
     sources.ownCount = sources.values.size();
     sources.values.insert(sources.values.end(), others.begin(), others.end());

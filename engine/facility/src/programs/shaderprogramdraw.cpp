@@ -32,12 +32,24 @@ void lookUpNames(detail::UniformSources& sources)
 
 } // namespace
 
+/// A colour, as a rule: what a change of material mostly is.
+inline void ShaderProgram::sendVector(const detail::UniformSources::Value& value)
+{
+    const Vector4f& now = *static_cast<const ShaderUniform<Vector4f>*>(value.source)->values();
+    if (*value.sentVector == now)
+        return;
+    *value.sentVector = now;
+    ShaderUniformPrivate::setUniform(value.uniform->location, -1, 1, &now);
+}
+
 inline void ShaderProgram::sendIfNew(const detail::UniformSources::Value& value)
 {
     detail::DrawnUniform& uniform = *value.uniform;
     if (uniform.sentRevision == value.source->getRevision())
         return;
     uniform.sentRevision = value.source->getRevision();
+    if (value.sentVector) [[likely]]
+        return sendVector(value);
     ShaderUniformBase& sent = *uniform.sent.get();
     if (sent.takeOver(*value.source))
         sent.send(uniform.location, uniform.textureUnit);
@@ -52,8 +64,9 @@ const detail::UniformSources* ShaderProgram::prepare(RenderContext& context,
     const detail::UniformSources::Value* own = sources.values.data();
     for (const detail::UniformSources::Value* const end = own + sources.ownCount; own != end; ++own)
         sendIfNew(*own);
+    detail::Bindings& bindings = context.getBindings();
     for (const detail::UniformSources::Unit& unit : sources.units)
-        context.getBindings().bindTexture(unit.unit, unit.target, unit.name, unit.slot);
+        bindings.bindNextTexture(unit.unit, unit.target, unit.name, unit.slot);
     return &sources;
 }
 

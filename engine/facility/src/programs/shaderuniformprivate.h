@@ -11,6 +11,7 @@ void setSamplerUnits(int location, int unit, int size);
 
 /// Sends a number of values to the current program. There is one of these for each type of uniform.
 /// @param textureUnit  the first of a sampler's.
+void setUniform(int location, int textureUnit, int size, const Vector4<float>* values);
 void setUniform(int location, int textureUnit, int size, const Matrix3<float>* values);
 void setUniform(int location, int textureUnit, int size, const Matrix4<float>* values);
 

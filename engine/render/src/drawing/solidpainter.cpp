@@ -42,14 +42,15 @@ void SolidPainter::draw(Solid* const* solids, size_t count)
 /// @return false if there is nothing to draw with.
 bool SolidPainter::takeMaterial(const Solid& solid)
 {
-    publishJoints(solid);
+    if (solid.hasSkin() || m_hadJoints)
+        publishJoints(solid);
     if (!solid.getMesh())
         return false;
     Appearance& appearance = *solid.getAppearance().get();
     const ShaderProgram* const program = appearance.getShaderProgram().get();
-    const bool isSameProgram = m_appearance && m_appearance->getShaderProgram().get() == program;
-    if (!isSameProgram || m_revision != g_lastRevision)
+    if (program != m_program || m_revision != g_lastRevision)
         m_mesh = nullptr;
+    m_program = program;
 
     m_turnsWinding = solid.turnsWinding(program);
     m_sources = appearance.prepare(m_context, m_turnsWinding);

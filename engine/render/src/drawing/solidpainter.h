@@ -12,6 +12,7 @@ namespace orv
 class Appearance;
 class Mesh;
 class RenderContext;
+class ShaderProgram;
 class Solid;
 
 namespace detail
@@ -50,7 +51,8 @@ private:
 
     // Of the solid before; null where the next one has to be looked at in any case.
     const Appearance* m_appearance = nullptr;
-    const Mesh* m_mesh = nullptr;
+    const ShaderProgram* m_program = nullptr;
+    const Mesh* m_mesh = nullptr; ///< bound for m_program
     uint64_t m_revision = 0; ///< the last of all revisions when its material was ready
     bool m_turnsWinding = false;
     bool m_hadJoints;

@@ -60,6 +60,12 @@ public:
     void bindTexture(int unit, unsigned target, unsigned name, int slot)
     {
         check();
+        bindNextTexture(unit, target, name, slot);
+    }
+
+    /// The same after another operation, if nothing was bound elsewhere since.
+    void bindNextTexture(int unit, unsigned target, unsigned name, int slot)
+    {
         if (slot < 0 || m_textures[slot] != name)
             sendTexture(unit, target, name, slot);
     }

@@ -31,6 +31,7 @@ struct UniformSources
     {
         const ShaderUniformBase* source;
         DrawnUniform* uniform;
+        Vector4f* sentVector; ///< uniform's value sent last, if it and source are single ones of this type; else null
     };
 
     /// A texture unit, one for each element of a sampler that is an array.
