@@ -3,8 +3,8 @@
 #include "view/compare.h"
 #include "view/fontsearch.h"
 #include "view/keys.h"
-#include "view/orbit.h"
-#include "view/player.h"
+#include "stage/orbit.h"
+#include "stage/player.h"
 #include "view/watcher.h"
 #include "window/window.h"
 

@@ -2,7 +2,8 @@
 
 #include "companions.h"
 #include "loadlog.h"
-#include "scenesize.h"
+
+#include "stage/scenesize.h"
 
 namespace view
 {

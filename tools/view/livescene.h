@@ -1,10 +1,11 @@
 #pragma once
 
 #include "convertedmodel.h"
-#include "player.h"
-#include "stage.h"
-#include "studio.h"
 #include "watcher.h"
+
+#include "stage/player.h"
+#include "stage/stage.h"
+#include "stage/studio.h"
 
 #include <cstdint>
 #include <memory>

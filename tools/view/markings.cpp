@@ -1,7 +1,7 @@
 #include "markings.h"
 
-#include "solidvisitor.h"
-#include "stage.h"
+#include "stage/solidvisitor.h"
+#include "stage/stage.h"
 
 #include "orv/indexbuffercache.h"
 #include "orv/meshgeometry.h"

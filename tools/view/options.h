@@ -2,7 +2,8 @@
 
 #include "compare.h"
 #include "markings.h"
-#include "stage.h"
+
+#include "stage/stage.h"
 
 #include "orv/colour.h"
 

@@ -1,7 +1,7 @@
 #include "pictures.h"
 
-#include "framing.h"
-#include "scenesize.h"
+#include "stage/framing.h"
+#include "stage/scenesize.h"
 
 #include "glcalls/glcalls.h"
 #include "headless/headless.h"

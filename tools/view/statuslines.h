@@ -1,8 +1,9 @@
 #pragma once
 
-#include "framestats.h"
 #include "headsup.h"
-#include "player.h"
+
+#include "stage/framestats.h"
+#include "stage/player.h"
 
 #include <string>
 #include <vector>

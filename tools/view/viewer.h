@@ -1,12 +1,13 @@
 #pragma once
 
 #include "convertedmodel.h"
-#include "eyecontrol.h"
-#include "framestats.h"
 #include "headsup.h"
 #include "livescene.h"
 #include "markings.h"
 #include "options.h"
+
+#include "stage/eyecontrol.h"
+#include "stage/framestats.h"
 
 #include "window/window.h"
 
