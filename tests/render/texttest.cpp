@@ -192,12 +192,12 @@ TEST_F(TextTest, drawsAllAtOnceAndLeavesTheSceneAlone)
     text->draw(*renderContext);
     text->draw(*renderContext);
     EXPECT_EQ(allocations, support::countAllocations());
-    EXPECT_EQ(2u, glcalls::count(glDrawElements));
+    EXPECT_EQ(2u, glcalls::count(glDrawArrays));
     EXPECT_EQ(0u, glcalls::count(glBufferData) + glcalls::count(glTexImage2D));
 
     text->clear();
     text->draw(*renderContext);
-    EXPECT_EQ(2u, glcalls::count(glDrawElements));
+    EXPECT_EQ(2u, glcalls::count(glDrawArrays));
 }
 
 // Fault caught: a place counted from another corner than the viewport's.
@@ -265,7 +265,7 @@ TEST_F(TextTest, longStringsTakeSeveralDraws)
     put(expected, 'A', 8, 9);
     glcalls::resetCounts();
     text->draw(*renderContext);
-    EXPECT_EQ(2u, glcalls::count(glDrawElements));
+    EXPECT_EQ(2u, glcalls::count(glDrawArrays));
     EXPECT_TRUE(comparePictures("long", expected, support::readFrame(), {1, 0}));
 
     const SharedPtr<Solid> solid = text->createSolid(*pool);

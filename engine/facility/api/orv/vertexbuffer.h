@@ -106,6 +106,12 @@ public:
     bool setAllAttributes(const AttribDescription* descriptions, unsigned int count,
                           const unsigned char* data, unsigned int size);
 
+    /// Puts other vertices of the same attributes into the GL buffer, which stays bound: for what changes often.
+    /// @param data  copied; what the buffer held before is dropped.
+    /// @return false, buffer unchanged, if there is no GL buffer; false, after an error and with the buffer lost, where
+    /// GL has no memory for it.
+    bool replaceData(const unsigned char* data, unsigned int size);
+
     /// Lets a vertex shader input read the attribute of this name.
     /// @return false, with the array disabled, if it is missing.
     bool enableAttrib(unsigned int location, const char* name);

@@ -161,6 +161,11 @@ bool VertexBuffer::setAllAttributes(const AttribDescription* descriptions, unsig
     return upload(data, size);
 }
 
+bool VertexBuffer::replaceData(const unsigned char* data, unsigned int size)
+{
+    return getId() != 0 && upload(data, size);
+}
+
 bool VertexBuffer::isLost() const
 {
     const auto isStored = [](const AttribRecord& record) { return record.usage == STORED && !record.array; };

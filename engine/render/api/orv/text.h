@@ -19,10 +19,12 @@ namespace orv
 
 class Appearance;
 class AssetCachePool;
-class Mesh;
 class RenderContext;
 class ShaderProgram;
 class Solid;
+class VertexArray;
+class VertexBuffer;
+class VertexBufferCache;
 
 /// Any number of strings in one font and colour, drawn together: over a frame, or in the scene.
 ///
@@ -50,7 +52,7 @@ public:
         RIGHT = 2
     };
 
-    /// @param pool  borrowed during the call, for the shader program.
+    /// @param pool  for the shader program; its cache of vertex buffers is held as well.
     /// @param font  shared; an empty one is an error, and nothing is ever drawn.
     Text(AssetCachePool& pool, const Font::Ptr& font, const Colour4f& colour);
     ~Text() override;
@@ -75,7 +77,8 @@ public:
     /// Draws over what the viewport shows, blended, whatever the depth buffer holds; nothing is written there.
     ///
     /// One GL draw for up to MAX_GLYPHS glyphs, one more for each further lot. Without a change since the last
-    /// time nothing is made again. The strings are kept in client memory, so there is nothing to be flushed here.
+    /// time nothing is made again. The vertices have a GL buffer, which stays when the strings change and goes with the
+    /// pool's flush() after the text.
     void draw(RenderContext& context);
 
     /// A copy of the strings as they are, to be put into a scene.
@@ -98,7 +101,8 @@ private:
 
     ORV_LOCAL void addLine(std::string_view line, float x, float top, Alignment alignment);
     ORV_LOCAL SharedPtr<Appearance> makeAppearance() const;
-    ORV_LOCAL SharedPtr<Mesh> makeMesh(std::size_t firstGlyph, AssetCachePool* pool) const;
+    ORV_LOCAL SharedPtr<VertexArray> makeVertices(std::size_t firstGlyph, float ySign) const;
+    ORV_LOCAL static SharedPtr<VertexBuffer> makeBuffer(VertexBufferCache& cache, VertexArray& vertices);
     ORV_LOCAL void makeSolids();
 
     Font::Ptr m_font;
@@ -107,6 +111,8 @@ private:
     std::vector<Glyph> m_glyphs;
     SharedPtr<Appearance> m_overlay;                 ///< what draw() draws with
     SharedPtr<ShaderUniform<Matrix4f>> m_projection; ///< m_overlay's, from pixels to clip space
+    SharedPtr<VertexBufferCache> m_cache;            ///< the pool's
+    std::vector<SharedPtr<VertexBuffer>> m_buffers;  ///< of each lot of glyphs; kept when there are fewer
     std::vector<SharedPtr<Solid>> m_solids;          ///< what draw() draws
     bool m_changed = false;                          ///< m_solids do not show m_glyphs yet
 };

@@ -14,7 +14,6 @@
 
 #include <algorithm>
 #include <cmath>
-#include <iterator>
 #include <string_view>
 
 namespace orv
@@ -93,6 +92,7 @@ Text::Text(AssetCachePool& pool, const Font::Ptr& font, const Colour4f& colour)
     : m_font(font)
     , m_colour(colour)
     , m_program(pool.getShaderProgramCache()->get("luvane#textfadequad.sp"))
+    , m_cache(pool.getVertexBufferCache())
 {
     if (!font || !font->getTexture())
     {
@@ -213,7 +213,21 @@ SharedPtr<Solid> Text::createSolid(AssetCachePool& pool) const
     SharedPtr<Solid> solid;
     for (std::size_t first = 0; first < m_glyphs.size(); first += MAX_GLYPHS)
     {
-        const SharedPtr<Mesh> mesh = makeMesh(first, &pool);
+        const SharedPtr<VertexArray> vertices = makeVertices(first, -1.0f);
+        if (!vertices)
+            return {};
+        MeshHeader header;
+        for (int i = 0; i < vertices->getVertexCount(); ++i)
+        {
+            const float* at = vertices->getData<float>() + 4 * i;
+            header.boundingRadius = std::max(header.boundingRadius, std::hypot(at[0], at[1]));
+        }
+        const IndexBuffer::Ptr order =
+            orv::create(*pool.getIndexBufferCache(), IndexBuffer::Primitive::TRIANGLES,
+                        unsigned(vertices->getVertexCount()), nullptr);
+        const VertexBuffer::Ptr buffer = makeBuffer(*pool.getVertexBufferCache(), *vertices);
+        const SharedPtr<Mesh> mesh =
+            order && buffer ? pool.getMeshCache()->create(header, order, buffer, nullptr) : Mesh::Ptr();
         const auto part = mesh ? makeShared<Solid>(mesh, appearance) : SharedPtr<Solid>();
         if (!part)
             return {};
@@ -243,62 +257,49 @@ SharedPtr<Appearance> Text::makeAppearance() const
     return appearance;
 }
 
-/// @param pool  where the buffers are made, y upwards; null for client memory, y downwards.
+/// Two triangles for each glyph of a lot: places and texture coordinates, six vertices of four floats.
+/// @param ySign  1 for y downwards, -1 for y upwards.
 /// @return empty, after an error, where memory lacks.
-SharedPtr<Mesh> Text::makeMesh(std::size_t firstGlyph, AssetCachePool* pool) const
+SharedPtr<VertexArray> Text::makeVertices(std::size_t firstGlyph, float ySign) const
 {
     const std::size_t count = std::min<std::size_t>(m_glyphs.size() - firstGlyph, MAX_GLYPHS);
-    const auto positions = makeShared<VertexArray>(int(4 * count), int(sizeof(float)), 2);
-    const auto uvs = makeShared<VertexArray>(int(4 * count), int(sizeof(float)), 2);
-    const auto primitive = IndexBuffer::Primitive::TRIANGLES;
-    const IndexBuffer::Ptr indices =
-        pool ? pool->getIndexBufferCache()->create(primitive, unsigned(6 * count), nullptr, nullptr)
-             : makeShared<IndexBuffer>(primitive, int(6 * count), true, nullptr);
-    const VertexBuffer::Ptr vertices =
-        pool ? pool->getVertexBufferCache()->create(nullptr) : makeShared<VertexBuffer>(nullptr);
-    if (!indices || !indices->getIndices() || !vertices || !positions || positions->getSizeInBytes() == 0 ||
-        !uvs || uvs->getSizeInBytes() == 0)
+    auto vertices = makeShared<VertexArray>(int(6 * count), int(sizeof(float)), 4);
+    if (!vertices || vertices->getSizeInBytes() == 0)
     {
         ORV_LOG_ERROR("No memory for a text of %u glyphs", unsigned(count));
         return {};
     }
-
-    const float ySign = pool ? -1.0f : 1.0f;
     const auto atlasWidth = float(m_font->getTexture()->getWidth());
     const auto atlasHeight = float(m_font->getTexture()->getHeight());
-    auto* position = positions->getData<float>();
-    auto* uv = uvs->getData<float>();
-    unsigned short* index = indices->getIndices();
-    for (std::size_t i = 0; i < count; ++i)
+    auto* out = vertices->getData<float>();
+    for (std::size_t i = firstGlyph; i < firstGlyph + count; ++i)
     {
-        const auto& [x, y, data] = m_glyphs[firstGlyph + i];
-        const float left = x, right = x + data->x1 - data->x0;
-        const float upper = ySign * y, lower = ySign * (y + data->y1 - data->y0);
-        const float corners[] = {left, upper, right, upper, left, lower, right, lower};
-        position = std::copy(std::begin(corners), std::end(corners), position);
-
-        const float u0 = data->x0 / atlasWidth, u1 = data->x1 / atlasWidth;
-        const float v0 = 1.0f - data->y0 / atlasHeight, v1 = 1.0f - data->y1 / atlasHeight;
-        const float places[] = {u0, v0, u1, v0, u0, v1, u1, v1};
-        uv = std::copy(std::begin(places), std::end(places), uv);
-
-        for (const std::size_t corner : {0, 2, 1, 1, 2, 3})
-            *index++ = static_cast<unsigned short>(4 * i + corner);
+        const auto& [x, y, data] = m_glyphs[i];
+        const float xs[] = {x, x + data->x1 - data->x0};
+        const float ys[] = {ySign * y, ySign * (y + data->y1 - data->y0)};
+        const float us[] = {data->x0 / atlasWidth, data->x1 / atlasWidth};
+        const float vs[] = {1.0f - data->y0 / atlasHeight, 1.0f - data->y1 / atlasHeight};
+        for (const int corner : {0, 2, 1, 1, 2, 3}) // bit 0: right, bit 1: below
+        {
+            *out++ = xs[corner & 1];
+            *out++ = ys[corner >> 1];
+            *out++ = us[corner & 1];
+            *out++ = vs[corner >> 1];
+        }
     }
+    return vertices;
+}
 
+/// @return empty, after an error, where memory lacks.
+SharedPtr<VertexBuffer> Text::makeBuffer(VertexBufferCache& cache, VertexArray& vertices)
+{
     using Format = VertexBuffer::AttribFormat;
-    const auto usage = pool ? VertexBuffer::AttribUsage::GL_BUFFER : VertexBuffer::AttribUsage::CLIENT_MEMORY;
-    vertices->addAttrib(positions, "a_position", Format::FLOAT, usage, false);
-    vertices->addAttrib(uvs, "a_uv0", Format::FLOAT, usage, false);
-    if (!pool)
-        return makeShared<Mesh>(MeshHeader(), indices, vertices);
-
-    MeshHeader header;
-    for (const float* at = positions->getData<float>(); at != position; at += 2)
-        header.boundingRadius = std::max(header.boundingRadius, std::hypot(at[0], at[1]));
-    vertices->commit();
-    indices->commit();
-    return pool->getMeshCache()->create(header, indices, vertices, nullptr);
+    const VertexBuffer::Ptr buffer = cache.create(nullptr);
+    const VertexBuffer::AttribDescription attributes[] = {{"a_position", Format::FLOAT, false, 0, 2, 16},
+                                                          {"a_uv0", Format::FLOAT, false, 8, 2, 16}};
+    if (!buffer || !buffer->setAllAttributes(attributes, 2, vertices.getBytes(), vertices.getSizeInBytes()))
+        return {};
+    return buffer;
 }
 
 void Text::makeSolids()
@@ -307,7 +308,17 @@ void Text::makeSolids()
     m_solids.clear();
     for (std::size_t first = 0; first < m_glyphs.size(); first += MAX_GLYPHS)
     {
-        const SharedPtr<Mesh> mesh = makeMesh(first, nullptr);
+        const SharedPtr<VertexArray> vertices = makeVertices(first, 1.0f);
+        if (!vertices)
+            continue;
+        const std::size_t lot = first / MAX_GLYPHS;
+        m_buffers.resize(std::max(m_buffers.size(), lot + 1));
+        VertexBuffer::Ptr& buffer = m_buffers[lot];
+        if (!buffer || !buffer->replaceData(vertices->getBytes(), vertices->getSizeInBytes()))
+            buffer = makeBuffer(*m_cache, *vertices);
+        const auto order = makeShared<IndexBuffer>(IndexBuffer::Primitive::TRIANGLES,
+                                                   vertices->getVertexCount(), false, nullptr);
+        const auto mesh = makeShared<Mesh>(MeshHeader(), order, buffer);
         if (const SharedPtr<Solid> solid = mesh ? makeShared<Solid>(mesh, m_overlay) : SharedPtr<Solid>())
             m_solids.push_back(solid);
     }
