@@ -29,11 +29,12 @@ target_compile_options(orv_engine_options INTERFACE ${prefixMaps})
 target_link_options(orv_engine_options INTERFACE ${prefixMaps})
 
 # All configurations but Debug compile the library for size, save what a frame or a decoder runs through
-# (orv_hot_sources), and with GCC optimise it as a whole when they link it (ORV_LTO). The objects hold ordinary code as
-# well: the tests link that, in a fraction of the time. Unwind tables stay: crash reporters need them, and exceptions
-# that a program lets pass through.
+# (orv_hot_sources), and with GCC optimise it as a whole when they link it (ORV_LTO), which for a static library others
+# do. The objects hold ordinary code as well: the tests link that, in a fraction of the time. Unwind tables stay: crash
+# reporters need them, and exceptions that a program lets pass through.
 set(ORV_OPTIMISED $<NOT:$<OR:$<CONFIG:Debug>,$<BOOL:${ORV_SANITIZE}>,$<BOOL:${ORV_BUILD_FUZZ}>>>)
-set(ORV_WHOLE $<AND:${ORV_OPTIMISED},$<BOOL:${ORV_LTO}>,$<STREQUAL:${CMAKE_CXX_COMPILER_ID},GNU>>)
+set(ORV_WHOLE
+    $<AND:${ORV_OPTIMISED},$<BOOL:${ORV_LTO}>,$<NOT:$<BOOL:${ORV_STATIC}>>,$<STREQUAL:${CMAKE_CXX_COMPILER_ID},GNU>>)
 target_compile_options(orv_engine_options INTERFACE
     $<${ORV_OPTIMISED}:-Os> $<${ORV_WHOLE}:-flto> $<${ORV_WHOLE}:-ffat-lto-objects>
     -ffunction-sections -fdata-sections -funwind-tables -fstack-protector)

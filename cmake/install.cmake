@@ -1,5 +1,6 @@
 # What `cmake --install` puts where, for programs that find the library by CMake or pkg-config; and the packages
-# that cpack makes of it. Two components: runtime (the library) and development (everything else).
+# that cpack makes of it. Components: runtime (the shared library, which a static build has not), development, and
+# tools where they are built.
 include(CMakePackageConfigHelpers)
 set(CMAKE_SKIP_INSTALL_ALL_DEPENDENCY ON) # the library is enough
 
@@ -34,7 +35,7 @@ write_basic_package_version_file(${CMAKE_CURRENT_BINARY_DIR}/orvConfigVersion.cm
 install(FILES ${CMAKE_CURRENT_BINARY_DIR}/orvConfig.cmake ${CMAKE_CURRENT_BINARY_DIR}/orvConfigVersion.cmake
     DESTINATION ${package} COMPONENT development)
 
-# The prefix is found from where the file lies, so that the tree may be moved.
+# A static library needs what it calls named along with it, with --static or without. The prefix is found from where the file lies, so that the tree may be moved.
 file(RELATIVE_PATH prefixFromPc /${CMAKE_INSTALL_LIBDIR}/pkgconfig /)
 file(CONFIGURE OUTPUT orv.pc @ONLY CONTENT
 "prefix=\${pcfiledir}/@prefixFromPc@
@@ -45,24 +46,39 @@ Name: orv
 Description: Compact real-time 3D engine for OpenGL ES 2.0; its headers need C++20
 Version: @PROJECT_VERSION@
 Cflags: -I\${includedir}
-Libs: -L\${libdir} -lorvextra -lorv
+Libs: -L\${libdir} -lorvextra -lorv @ORV_STATIC_LIBS@
 ")
 install(FILES ${CMAKE_CURRENT_BINARY_DIR}/orv.pc DESTINATION ${CMAKE_INSTALL_LIBDIR}/pkgconfig COMPONENT development)
 
-file(GLOB pages docs/*.md)
-install(FILES README.md CHANGELOG.md SECURITY.md ${pages} DESTINATION share/doc/liborv-dev COMPONENT development)
-install(FILES examples/firstframe.cpp DESTINATION share/doc/liborv-dev/examples COMPONENT development)
-install(FILES cmake/copyright DESTINATION share/doc/liborv${PROJECT_VERSION_MAJOR} COMPONENT runtime)
-install(FILES cmake/copyright DESTINATION share/doc/liborv-dev COMPONENT development)
+# The pages lie as they do in the tree, so that what they link to is where they say.
+set(pages share/doc/liborv-dev)
+install(FILES README.md CHANGELOG.md CONTRIBUTING.md SECURITY.md cmake/copyright DESTINATION ${pages}
+    COMPONENT development)
+install(DIRECTORY docs/ DESTINATION ${pages}/docs COMPONENT development PATTERN Doxyfile.in EXCLUDE)
+install(DIRECTORY examples/ DESTINATION ${pages}/examples COMPONENT development PATTERN CMakeLists.txt EXCLUDE)
+if(NOT ORV_STATIC)
+    install(FILES cmake/copyright DESTINATION share/doc/liborv${PROJECT_VERSION_MAJOR} COMPONENT runtime)
+endif()
 
-# Packages: cpack in the build folder. Two for Debian, as its own libraries have them.
+if(TARGET orv_convert)
+    include(installtools)
+endif()
+
+# Packages: cpack in the build folder, divided as Debian divides its own libraries.
 set(CPACK_GENERATOR DEB)
 set(CPACK_PACKAGE_VENDOR orv)
 set(CPACK_PACKAGE_CONTACT "the orv developers <orv@localhost>")
 set(CPACK_PACKAGE_DESCRIPTION_SUMMARY "compact real-time 3D engine for OpenGL ES 2.0")
 set(CPACK_PACKAGING_INSTALL_PREFIX /usr)
 set(CPACK_STRIP_FILES ON)
-set(CPACK_COMPONENTS_ALL runtime development)
+set(CPACK_COMPONENTS_ALL development)
+if(NOT ORV_STATIC)
+    list(APPEND CPACK_COMPONENTS_ALL runtime)
+    set(CPACK_DEBIAN_DEVELOPMENT_PACKAGE_DEPENDS "liborv${PROJECT_VERSION_MAJOR} (= ${PROJECT_VERSION})")
+endif()
+if(TARGET orv_convert)
+    list(APPEND CPACK_COMPONENTS_ALL tools)
+endif()
 set(CPACK_DEB_COMPONENT_INSTALL ON)
 set(CPACK_DEBIAN_FILE_NAME DEB-DEFAULT)
 set(CPACK_DEBIAN_RUNTIME_PACKAGE_NAME liborv${PROJECT_VERSION_MAJOR})
@@ -73,8 +89,12 @@ file(WRITE ${CMAKE_CURRENT_BINARY_DIR}/triggers "activate-noawait ldconfig\n")
 set(CPACK_COMPONENT_RUNTIME_DESCRIPTION "The shared library, for the programs that need it.")
 set(CPACK_DEBIAN_DEVELOPMENT_PACKAGE_NAME liborv-dev)
 set(CPACK_DEBIAN_DEVELOPMENT_PACKAGE_SECTION libdevel)
-set(CPACK_DEBIAN_DEVELOPMENT_PACKAGE_DEPENDS "liborv${PROJECT_VERSION_MAJOR} (= ${PROJECT_VERSION})")
 set(CPACK_COMPONENT_DEVELOPMENT_DESCRIPTION "Headers, documentation and what CMake and pkg-config need.")
+set(CPACK_DEBIAN_TOOLS_PACKAGE_NAME orv-tools)
+set(CPACK_DEBIAN_TOOLS_PACKAGE_SECTION graphics)
+set(CPACK_DEBIAN_TOOLS_PACKAGE_SHLIBDEPS ON)
+set(CPACK_DEBIAN_TOOLS_PACKAGE_RECOMMENDS fonts-dejavu-core)
+set(CPACK_COMPONENT_TOOLS_DESCRIPTION "Programs that convert models to scenes, look at them and look into them.")
 
 # Packing the same change gives the same bytes: files in a package are as old as the change.
 file(CONFIGURE OUTPUT packagetime.cmake @ONLY CONTENT

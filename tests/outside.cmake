@@ -1,6 +1,6 @@
 # Fault caught: a library that builds here and nowhere else. Copies examples/firstframe.cpp out of the tree, builds it
 # the way that a stranger would, runs it and looks at the middle of its picture.
-# Called with -DWAY=find_package, pkg-config or add_subdirectory, and
+# Called with -DWAY=find_package, pkg-config, add_subdirectory or static, and
 #   -DSOURCE=this project -DPREFIX=where it was installed -DWORK=scratch folder -DCOMPILER=c++ -DGENERATOR=cmake's
 cmake_minimum_required(VERSION 3.22)
 
@@ -13,7 +13,7 @@ if(WAY STREQUAL "pkg-config")
     file(GLOB_RECURSE pc ${PREFIX}/*/orv.pc)
     get_filename_component(pcFolder ${pc} DIRECTORY)
     set(ENV{PKG_CONFIG_PATH} ${pcFolder})
-    execute_process(COMMAND ${PKG_CONFIG} --cflags --libs orv OUTPUT_VARIABLE flags OUTPUT_STRIP_TRAILING_WHITESPACE
+    execute_process(COMMAND ${PKG_CONFIG} ${STATIC} --cflags --libs orv OUTPUT_VARIABLE flags OUTPUT_STRIP_TRAILING_WHITESPACE
         COMMAND_ERROR_IS_FATAL ANY)
     separate_arguments(flags UNIX_COMMAND "${flags}")
     execute_process(COMMAND ${COMPILER} -std=c++20 -o firstframe firstframe.cpp derived.cpp ${flags} -lEGL -Wl,-rpath,${pcFolder}/..
@@ -21,6 +21,8 @@ if(WAY STREQUAL "pkg-config")
 else()
     if(WAY STREQUAL "find_package")
         set(get "find_package(orv 1.0 REQUIRED)")
+    elseif(WAY STREQUAL "static") # and installed from there, for the two other ways
+        set(get "set(ORV_STATIC ON)\nset(ORV_INSTALL ON)\nadd_subdirectory(${SOURCE} orv)")
     else()
         set(get "add_subdirectory(${SOURCE} orv)")
     endif()
@@ -45,4 +47,19 @@ math(EXPR middle "15 + (150 * 400 + 200) * 3")
 file(READ ${folder}/firstframe.ppm pixel OFFSET ${middle} LIMIT 3 HEX)
 if(NOT header MATCHES "^P6" OR pixel STREQUAL "" OR pixel STREQUAL "000000")
     message(FATAL_ERROR "${folder}/firstframe.ppm shows no cube in its middle: ${header} ${pixel}")
+endif()
+
+if(WAY STREQUAL "static")
+    file(REMOVE_RECURSE ${folder}/installed)
+    execute_process(COMMAND ${CMAKE_COMMAND} --install ${folder}/build --prefix ${folder}/installed
+        OUTPUT_QUIET COMMAND_ERROR_IS_FATAL ANY)
+    file(GLOB_RECURSE shared ${folder}/build/*liborv.so* ${folder}/installed/*liborv.so*)
+    if(shared)
+        message(FATAL_ERROR "a static build made ${shared}")
+    endif()
+    foreach(way find_package pkg-config)
+        execute_process(COMMAND ${CMAKE_COMMAND} -DWAY=${way} -DSTATIC=--static -DSOURCE=${SOURCE}
+            -DPREFIX=${folder}/installed -DWORK=${folder} -DCOMPILER=${COMPILER} -DGENERATOR=${GENERATOR}
+            -DPKG_CONFIG=${PKG_CONFIG} -P ${CMAKE_CURRENT_LIST_FILE} COMMAND_ERROR_IS_FATAL ANY)
+    endforeach()
 endif()

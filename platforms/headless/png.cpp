@@ -24,30 +24,40 @@ namespace
 constexpr int PNG_FILTER =
     3; // average; trying all of them on each line takes longer than what it saves is worth
 
-} // namespace
-
-bool writePng(const std::string& path, int width, int height, const uint8_t* rgba, std::string& error)
+/// @param file  stays open. @return false, with errno or 0, if not all of it is written.
+bool writeTo(std::FILE* file, int width, int height, const uint8_t* rgba)
 {
-    const std::string temporary = path + ".tmp" + std::to_string(getpid());
-    std::FILE* file = std::fopen(temporary.c_str(), "wb");
-    if (!file)
-    {
-        error = path + ": cannot be written: " + std::strerror(errno);
-        return false;
-    }
-
     const auto write = [](void* context, void* data, int size)
     { std::fwrite(data, 1, size_t(size), static_cast<std::FILE*>(context)); };
     stbi_write_force_png_filter = PNG_FILTER;
     errno = 0;
-    bool isWritten = stbi_write_png_to_func(write, file, width, height, 4, rgba, width * 4) != 0;
-    isWritten = !std::ferror(file) && isWritten;
-    isWritten = std::fclose(file) == 0 && isWritten; // a full disk may show only here
+    const bool isMade = stbi_write_png_to_func(write, file, width, height, 4, rgba, width * 4) != 0;
+    return std::fflush(file) == 0 && !std::ferror(file) && isMade; // a full disk may show only here
+}
+
+bool fail(const std::string& path, std::string& error)
+{
+    error = path + ": cannot be written: " + (errno ? std::strerror(errno) : "the picture is too large");
+    return false;
+}
+
+} // namespace
+
+bool writePng(const std::string& path, int width, int height, const uint8_t* rgba, std::string& error)
+{
+    if (path == "-")
+        return writeTo(stdout, width, height, rgba) || fail("standard output", error);
+    const std::string temporary = path + ".tmp" + std::to_string(getpid());
+    std::FILE* file = std::fopen(temporary.c_str(), "wb");
+    if (!file)
+        return fail(path, error);
+    bool isWritten = writeTo(file, width, height, rgba);
+    isWritten = std::fclose(file) == 0 && isWritten;
     isWritten = isWritten && std::rename(temporary.c_str(), path.c_str()) == 0;
     if (isWritten)
         return true;
 
-    error = path + ": cannot be written: " + (errno ? std::strerror(errno) : "the picture is too large");
+    fail(path, error);
     std::remove(temporary.c_str());
     return false;
 }

@@ -1,5 +1,7 @@
 #pragma once
 
+#include "manual.h"
+
 #include "orv/version.h"
 
 #include <CLI/CLI.hpp>
@@ -16,13 +18,24 @@ namespace commandline
 constexpr int FAILED = 1; ///< exit codes
 constexpr int MISUSED = 2;
 
-/// Gives a command line --version, and errors that begin with the program's name.
+/// Gives a command line --version, errors that begin with the program's name, and what the build makes the manual page
+/// and the completions by: --manual, and --completion with bash, zsh or fish, which --help does not list.
 inline void addCommon(CLI::App& app)
 {
     const orv::Version& version = orv::getVersion();
-    app.set_version_flag("--version", app.get_name() + " " + std::to_string(version.getMajor()) + "." +
-                                          std::to_string(version.getMinor()) + "." +
-                                          std::to_string(version.getPatch()));
+    const std::string number = std::to_string(version.getMajor()) + "." + std::to_string(version.getMinor()) +
+                               "." + std::to_string(version.getPatch());
+    app.set_version_flag("--version", app.get_name() + " " + number);
+    const auto print = [](const std::string& text)
+    {
+        std::fputs(text.c_str(), stdout);
+        throw CLI::Success();
+    };
+    app.add_flag_callback("--manual", [&app, print, number] { print(makeManual(app, number)); })->group("");
+    app.add_option_function<std::string>("--completion", [&app, print](const std::string& shell)
+                                         { print(makeCompletion(app, shell)); })
+        ->check(CLI::IsMember({"bash", "zsh", "fish"}))
+        ->group("");
     app.failure_message([](const CLI::App* failed, const CLI::Error& error)
                         { return failed->get_name() + ": " + error.what() + "; --help shows how\n"; });
 }

@@ -100,12 +100,13 @@ int run(Command command)
     std::vector<convert::OutputFile> files;
     if (!command.dryRun)
         files = std::move(made.files);
-    if (!command.report.empty())
+    const bool isReportPrinted = command.report == "-";
+    if (!command.report.empty() && !isReportPrinted)
         files.insert(files.begin(), {command.report, {made.json.begin(), made.json.end()}});
     if (!convert::writeFiles(files, gate, error))
         return fail(error);
-    std::fputs(made.text.c_str(), stdout);
-    if (command.dryRun)
+    std::fputs(isReportPrinted ? made.json.c_str() : made.text.c_str(), stdout);
+    if (command.dryRun && !isReportPrinted)
         std::puts("Dry run: no scene or texture has been written.");
     return 0;
 }
@@ -145,7 +146,9 @@ void addOptions(CLI::App& app, Command& command)
                    "whether materials reckon in shares of light; by default those of glTF do")
         ->check(CLI::IsMember({"on", "off"}));
     app.add_flag("--sky", options.sky, "gives metals a plain sky to mirror");
-    app.add_option("--report", command.report, "also write what is reported as JSON to this file");
+    app.add_option("--report", command.report,
+                   "also write what is reported as JSON to this file; - for standard output alone")
+        ->option_text("FILE");
     app.add_flag("--dry-run", command.dryRun, "write no scene and no textures");
     app.add_option("--time-limit", command.limits.seconds, "seconds after which to give up; 0 for never")
         ->check(CLI::Range(0.0, 1e6))

@@ -6,7 +6,9 @@
 
 #include "commandline/commandline.h"
 
+#include <cerrno>
 #include <cstdio>
+#include <cstring>
 #include <filesystem>
 #include <fstream>
 #include <iterator>
@@ -37,6 +39,19 @@ int printCodes()
 }
 
 /// @return why it cannot be read, or empty.
+std::string readInput(std::vector<uint8_t>& bytes)
+{
+    uint8_t part[1 << 16];
+    for (size_t count = 0; (count = std::fread(part, 1, sizeof part, stdin)) > 0;)
+    {
+        if (bytes.size() + count > LARGEST_FILE)
+            return "larger than two gigabytes";
+        bytes.insert(bytes.end(), part, part + count);
+    }
+    return std::ferror(stdin) ? std::strerror(errno) : "";
+}
+
+/// @return why it cannot be read, or empty.
 std::string readFile(const std::string& path, std::vector<uint8_t>& bytes)
 {
     std::error_code error;
@@ -54,7 +69,7 @@ std::string readFile(const std::string& path, std::vector<uint8_t>& bytes)
 std::string inspectFile(const std::string& path, inspect::Report& report)
 {
     std::vector<uint8_t> bytes;
-    const std::string failure = readFile(path, bytes);
+    const std::string failure = path == "-" ? readInput(bytes) : readFile(path, bytes);
     if (!failure.empty())
         return failure;
     const fs::path folder = fs::path(path).parent_path();
@@ -138,7 +153,9 @@ int main(int argc, char** argv)
         "  orv-inspect --codes                   all that can be wrong");
     Options options;
     bool codes = false;
-    app.add_option("FILE", options.files, "what to look at; pictures and sources are looked for beside it");
+    app.add_option(
+        "FILE", options.files,
+        "what to look at, - for a scene on standard input; pictures and sources are looked for beside it");
     app.add_flag("--tree", options.tree, "print every chunk with its fields, every statement of a text file");
     app.add_flag("--check", options.check, "print nothing but what is wrong");
     app.add_flag("--json", options.json, "print one JSON array with an object for each file");

@@ -33,6 +33,7 @@ Examples:
   orv-view walk.glo --out walk.png --sheet 4x3   twelve moments of the animation on one sheet
   orv-view walk.glo --out run.png --frames 24 --clip run      run-000.png to run-023.png
   orv-view duck.glo --out duck.png --turntable 36             once around the duck
+  orv-view duck.glo --out - --thumbnail 128 >icon.png          a small square one
   orv-view duck.glo --out now.png --compare good.png --tolerance 8,0.1
                      fail if more than 0.1 % of the pixels differ by more than 8 of 255
 
@@ -46,11 +47,6 @@ std::string parsePair(const std::string& text, const char* what, int most, int& 
     if (found == 2 && first >= 1 && first <= most && second >= 1 && second <= most)
         return "";
     return std::string(what) + ", each 1 to " + std::to_string(most) + ", not " + text;
-}
-
-std::string checkPngName(const std::string& name)
-{
-    return std::filesystem::path(name).extension() == ".png" ? "" : name + ": only PNG can be written";
 }
 
 std::string checkTime(const std::string& text)
@@ -129,9 +125,8 @@ void addSceneOptions(CLI::App& app, Options& options, std::vector<std::string>& 
 void addPictureOptions(CLI::App& app, Options& options)
 {
     const std::string group = "Pictures, without a window";
-    auto* out = app.add_option("--out", options.out, "Picture to write")
+    auto* out = app.add_option("--out", options.out, "Picture to write; - for standard output")
                     ->type_name("FRAME.png")
-                    ->check(checkPngName)
                     ->group(group);
     auto* time = app.add_option("--time", options.time, "Moment to draw, from the start of the clip")
                      ->type_name("SECONDS")
@@ -153,6 +148,15 @@ void addPictureOptions(CLI::App& app, Options& options)
             ->check(
                 [&options](const std::string& text)
                 { return parsePair(text, "a sheet is COLUMNSxROWS", 100, options.columns, options.rows); });
+    auto* thumbnail =
+        app.add_option("--thumbnail", options.thumbnail,
+                       "A square picture of N x N pixels, for file managers: FRAME may be any name")
+            ->type_name("N")
+            ->check(CLI::Range(1, MAX_EDGE))
+            ->excludes(frames)
+            ->excludes(turntable)
+            ->excludes(sheet)
+            ->excludes("--size");
     auto* compare = app.add_option("--compare", options.reference,
                                    "Compare the picture, and save the difference as FRAME-difference.png")
                         ->type_name("REFERENCE.png")
@@ -172,13 +176,19 @@ void addPictureOptions(CLI::App& app, Options& options)
                 });
     auto* stats =
         app.add_flag("--stats", options.wantsStats, "Print what the scene holds and what drawing it took");
-    for (CLI::Option* option : {time, frames, turntable, sheet, compare, tolerance, stats})
+    for (CLI::Option* option : {time, frames, turntable, sheet, thumbnail, compare, tolerance, stats})
         option->needs(out)->group(group);
 }
 
 /// What CLI11 cannot say of options together.
 std::string findConflict(const Options& options)
 {
+    const bool isNumbered = options.columns == 0 && options.frames + options.turntable > 0;
+    if (options.out == "-" && (isNumbered || !options.reference.empty() || options.wantsStats))
+        return "--out -: one picture, without --compare and --stats";
+    if (!options.out.empty() && options.out != "-" && options.thumbnail == 0 &&
+        std::filesystem::path(options.out).extension() != ".png")
+        return "--out: " + options.out + ": only PNG can be written";
     if (options.columns == 0)
         return options.turntable > 0 && !options.reference.empty()
                    ? "--compare takes one picture: add --sheet, or leave --turntable"
@@ -235,6 +245,8 @@ bool parseCommandLine(int argumentCount, char** arguments, Options& options, int
             options.width = SHEET_WIDTH;
             options.height = SHEET_HEIGHT;
         }
+        if (options.thumbnail > 0)
+            options.width = options.height = options.thumbnail;
         const std::string conflict = findConflict(options);
         if (!conflict.empty())
             throw CLI::ValidationError(conflict);

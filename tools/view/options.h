@@ -28,12 +28,13 @@ struct Options
     std::optional<orv::Colour4f> background;
     std::vector<Marking> markings; ///< to be shown, each once
 
-    std::string out;   ///< "" opens a window
+    std::string out;   ///< "" opens a window, "-" is standard output
     float time = 0.0f; ///< seconds from the start of the clip
     int frames = 0;    ///< pictures over the clip; 0 for one without a number
     int turntable = 0; ///< pictures around the scene
     int columns = 0;   ///< of the contact sheet; 0 for none
     int rows = 0;
+    int thumbnail = 0;     ///< width and height of a picture that may have any name; 0 for none
     std::string reference; ///< "" compares with nothing
     Tolerance tolerance;
     bool wantsStats = false;
