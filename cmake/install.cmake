@@ -25,15 +25,18 @@ endforeach()
 
 set(package ${CMAKE_INSTALL_LIBDIR}/cmake/orv)
 install(EXPORT orvTargets NAMESPACE orv:: DESTINATION ${package} COMPONENT development)
+file(RELATIVE_PATH toolsFolder /${package} /${CMAKE_INSTALL_BINDIR})
 file(CONFIGURE OUTPUT orvConfig.cmake @ONLY CONTENT
-"# find_package(orv) gives the target orv::orv. Nothing has to be found along with it: programs that call OpenGL ES
-# or EGL themselves link those themselves. A source that derives from a class of the library is compiled with
-# -fno-rtti, as the library is.
+"# find_package(orv) gives the target orv::orv, and orv_add_scenes for models (see orvScenes.cmake). Nothing has to be
+# found along with it: programs that call OpenGL ES or EGL themselves link those themselves. A source that derives from
+# a class of the library is compiled with -fno-rtti, as the library is.
 include(\"\${CMAKE_CURRENT_LIST_DIR}/orvTargets.cmake\")
+include(\"\${CMAKE_CURRENT_LIST_DIR}/orvScenes.cmake\")
+set(ORV_TOOLS_FOLDER \"\${CMAKE_CURRENT_LIST_DIR}/@toolsFolder@\")
 ")
 write_basic_package_version_file(${CMAKE_CURRENT_BINARY_DIR}/orvConfigVersion.cmake COMPATIBILITY SameMajorVersion)
 install(FILES ${CMAKE_CURRENT_BINARY_DIR}/orvConfig.cmake ${CMAKE_CURRENT_BINARY_DIR}/orvConfigVersion.cmake
-    DESTINATION ${package} COMPONENT development)
+    cmake/orvScenes.cmake DESTINATION ${package} COMPONENT development)
 
 # A static library needs what it calls named along with it, with --static or without. The prefix is found from where the file lies, so that the tree may be moved.
 file(RELATIVE_PATH prefixFromPc /${CMAKE_INSTALL_LIBDIR}/pkgconfig /)

@@ -14,7 +14,7 @@ import subprocess
 import sys
 import tempfile
 
-PREFIX = os.path.abspath(sys.argv[1])
+PREFIX = os.path.abspath(sys.argv[1])  # of scenes.py too, which makes its models as this does
 BIN = os.path.join(PREFIX, "bin")
 SHARE = os.path.join(PREFIX, "share")
 TOOLS = ("orv-convert", "orv-inspect", "orv-view")

@@ -1,13 +1,9 @@
 // orv-convert: makes a scene file, with its textures beside it, of a model file.
 
-#include "conversion.h"
-#include "convert/files/filegate.h"
-#include "guard.h"
-#include "progress.h"
+#include "batch/folder.h"
 
 #include "commandline/commandline.h"
 
-#include <algorithm>
 #include <cstdio>
 #include <filesystem>
 
@@ -15,23 +11,23 @@ namespace
 {
 
 constexpr int LARGEST_TEXTURE = 16384; // pixels, as far as the engine goes
+constexpr int MOST_PROCESSES = 1024;
+constexpr unsigned MOST_SHARDS = 1000000;
 
 struct Command
 {
-    std::string model;
-    std::string out;
-    std::string report;
-    bool dryRun = false;
+    convert::Job job;
+    convert::FolderJob folder; ///< where the model is one
+    std::string shard;
     bool noAnimation = false;
     std::string keys = "stepped";
-    std::vector<std::string> allowed;
-    convert::Options options;
-    convert::Limits limits;
 };
 
 const char* const FOOTER =
     "Textures are written beside the scene, their names beginning with its name. Files of these names are\n"
-    "replaced; on failure nothing is written. Exit code: 0 converted, 1 not, 2 wrong usage.\n\n"
+    "replaced; on failure nothing is written. Of a folder, models that are new or have changed are "
+    "converted, each with\n"
+    "a report beside its scene. Exit code: 0 converted, 1 not (or not all), 2 wrong usage.\n\n"
     "Examples:\n"
     "  orv-convert duck.dae duck.glo                        duck.glo and duck-duckCM.tga\n"
     "  orv-convert walk.fbx scenes/walk.glo --fps 60        smoother animations, larger file\n"
@@ -41,6 +37,8 @@ const char* const FOOTER =
     "  orv-convert big.ifc big.glo --dry-run                only say what would come of it\n"
     "  orv-convert a.glb a.glo --report a.json              for a script (docs/convert.md)\n"
     "  orv-convert source/car.fbx car.glo --allow textures  a model whose pictures lie elsewhere\n"
+    "  orv-convert models scenes --jobs 8                   a folder, and again what has changed since\n"
+    "  orv-convert models scenes --shard 2/5                on the second of five machines\n"
     "  orv-convert city.obj city.glo --time-limit 0 --memory-limit 16384";
 
 int fail(const std::string& message)
@@ -49,73 +47,73 @@ int fail(const std::string& message)
     return commandline::FAILED;
 }
 
-/// In a child process.
-bool convertGuarded(const Command& command, convert::FileGate& gate, convert::Conversion& made,
-                    std::string& error)
+int run(convert::Job& job)
 {
-    const auto work = [&](std::FILE* stream, convert::ModelFiles& files) {
-        return convert::send(convert::convertFile(command.model, files, command.out, command.options),
-                             stream);
-    };
-    const auto accept = [&](std::FILE* stream)
-    {
-        made = {};
-        return convert::receive(made, command.out, stream);
-    };
-    const bool done = convert::runGuarded(command.limits, command.model, gate, work, accept, error);
-    convert::clearProgress();
-    if (done)
-        error = made.error;
-    return done && error.empty();
-}
-
-/// Whether a texture would get the place of a file that the model was read from.
-bool takesInput(const convert::Conversion& made, const Command& command, const convert::FileGate& gate)
-{
-    return std::any_of(made.files.begin(), made.files.end(),
-                       [&](const convert::OutputFile& file)
-                       { return file.path != command.out && gate.wasOpened(file.path); });
-}
-
-int run(Command command)
-{
-    convert::FileGate gate(command.model, command.allowed);
-    convert::Conversion made;
-    std::string error;
-    bool done = convertGuarded(command, gate, made, error);
-    if (done && takesInput(made, command, gate)) // which only shows when all has been read
-    {
-        for (const convert::OutputFile& file : made.files)
-        {
-            if (gate.wasOpened(file.path))
-                command.options.takenNames.insert(std::filesystem::path(file.path).stem().string());
-        }
-        for (const std::filesystem::path& input : gate.getOpened())
-            command.options.takenNames.insert(input.stem().string());
-        done = convertGuarded(command, gate, made, error);
-    }
-    if (!done)
-        return fail(command.model + ": " + error);
-
-    std::vector<convert::OutputFile> files;
-    if (!command.dryRun)
-        files = std::move(made.files);
-    const bool isReportPrinted = command.report == "-";
-    if (!command.report.empty() && !isReportPrinted)
-        files.insert(files.begin(), {command.report, {made.json.begin(), made.json.end()}});
-    if (!convert::writeFiles(files, gate, error))
-        return fail(error);
-    std::fputs(isReportPrinted ? made.json.c_str() : made.text.c_str(), stdout);
-    if (command.dryRun && !isReportPrinted)
+    const bool isReportPrinted = job.report == "-";
+    if (isReportPrinted)
+        job.report.clear();
+    const convert::Outcome outcome = convert::convertModel(job);
+    if (!outcome.error.empty())
+        return fail(outcome.error);
+    std::fputs(isReportPrinted ? outcome.json.c_str() : outcome.text.c_str(), stdout);
+    if (job.dryRun && !isReportPrinted)
         std::puts("Dry run: no scene or texture has been written.");
     return 0;
 }
 
+int runFolder(Command& command)
+{
+    convert::FolderJob& folder = command.folder;
+    folder.folder = command.job.model;
+    folder.out = command.job.out;
+    folder.common = command.job;
+    return convert::convertFolder(folder) ? 0 : commandline::FAILED;
+}
+
+/// "2/5". @return "" or what is wrong, as CLI11 asks for.
+std::string parseShard(const std::string& text, convert::FolderJob& job)
+{
+    char beyond = 0;
+    const int found = std::sscanf(text.c_str(), "%u/%u%c", &job.shard, &job.shards, &beyond);
+    const bool isFine = found == 2 && job.shard >= 1 && job.shard <= job.shards && job.shards <= MOST_SHARDS;
+    return isFine ? "" : text + ": not a part of how many, such as 2/5";
+}
+
+/// What CLI11 cannot say of options together. @return empty if all is well.
+std::string findConflict(const Command& command, bool isFolder)
+{
+    const convert::FolderJob& folder = command.folder;
+    const convert::Job& job = command.job;
+    if (isFolder && (job.dryRun || !job.report.empty() || !job.depfile.empty()))
+        return job.model + " is a folder: --dry-run, --report and --depfile are for single models";
+    if (!isFolder && (folder.again || folder.processes > 1 || !command.shard.empty()))
+        return job.model + " is no folder: --again, --jobs and --shard are for folders";
+    if (!isFolder && std::filesystem::path(job.out).extension() != ".glo")
+        return job.out + ": the output's name has to end in .glo";
+    return "";
+}
+
+void addFolderOptions(CLI::App& app, Command& command)
+{
+    app.add_option("--jobs", command.folder.processes, "of a folder: so many models at a time")
+        ->check(CLI::Range(1, MOST_PROCESSES))
+        ->capture_default_str();
+    app.add_option("--shard", command.shard,
+                   "of a folder: the first, second... of N parts of its models, for N machines")
+        ->option_text("I/N")
+        ->check([&command](const std::string& text) { return parseShard(text, command.folder); });
+    app.add_flag("--again", command.folder.again, "of a folder: convert what has not changed too");
+    app.add_option("--depfile", command.job.depfile,
+                   "also write which files the scene was made of, for make and ninja")
+        ->option_text("FILE");
+}
+
 void addOptions(CLI::App& app, Command& command)
 {
-    convert::Options& options = command.options;
-    app.add_option("MODEL", command.model, "the model file")->required();
-    app.add_option("OUT.glo", command.out, "the scene file to write")->required();
+    convert::Options& options = command.job.options;
+    app.add_option("MODEL", command.job.model, "the model file, or a folder of models")->required();
+    app.add_option("OUT.glo", command.job.out, "the scene file to write, or a folder for scenes and reports")
+        ->required();
     app.add_option("--fps", options.fps, "samples per second of animations")
         ->check(CLI::Range(1.0, 1000.0))
         ->capture_default_str();
@@ -137,7 +135,7 @@ void addOptions(CLI::App& app, Command& command)
         ->check(CLI::Range(1, LARGEST_TEXTURE));
     app.add_flag("--power-of-two", options.powerOfTwo,
                  "gives all textures sizes that can have mipmaps and repeat");
-    app.add_option("--allow", command.allowed,
+    app.add_option("--allow", command.job.allowed,
                    "another folder that the model may have files in, with what is below it; may be repeated")
         ->allow_extra_args(false)
         ->check(CLI::ExistingDirectory)
@@ -146,18 +144,19 @@ void addOptions(CLI::App& app, Command& command)
                    "whether materials reckon in shares of light; by default those of glTF do")
         ->check(CLI::IsMember({"on", "off"}));
     app.add_flag("--sky", options.sky, "gives metals a plain sky to mirror");
-    app.add_option("--report", command.report,
+    app.add_option("--report", command.job.report,
                    "also write what is reported as JSON to this file; - for standard output alone")
         ->option_text("FILE");
-    app.add_flag("--dry-run", command.dryRun, "write no scene and no textures");
-    app.add_option("--time-limit", command.limits.seconds, "seconds after which to give up; 0 for never")
+    app.add_flag("--dry-run", command.job.dryRun, "write no scene and no textures");
+    app.add_option("--time-limit", command.job.limits.seconds, "seconds after which to give up; 0 for never")
         ->check(CLI::Range(0.0, 1e6))
         ->capture_default_str();
-    app.add_option("--memory-limit", command.limits.mebibytes,
+    app.add_option("--memory-limit", command.job.limits.mebibytes,
                    convert::CAN_LIMIT_MEMORY ? "MiB of memory above which to give up; 0 for no limit"
                                              : "without effect in this build, which checks addresses")
         ->check(CLI::Range(0, 1 << 24))
         ->capture_default_str();
+    addFolderOptions(app, command);
     app.footer(FOOTER);
 }
 
@@ -178,12 +177,15 @@ int main(int argc, char** argv)
     {
         return commandline::finishParsing(app, error);
     }
-    command.options.animation = !command.noAnimation;
-    command.options.sparseKeys = command.keys == "sparse";
-    if (std::filesystem::path(command.out).extension() != ".glo")
+    command.job.options.animation = !command.noAnimation;
+    command.job.options.sparseKeys = command.keys == "sparse";
+    std::error_code ignored;
+    const bool isFolder = std::filesystem::is_directory(command.job.model, ignored);
+    const std::string conflict = findConflict(command, isFolder);
+    if (!conflict.empty())
     {
-        fail(command.out + ": the output's name has to end in .glo");
+        fail(conflict);
         return commandline::MISUSED;
     }
-    return commandline::finishOutput("orv-convert", run(command));
+    return commandline::finishOutput("orv-convert", isFolder ? runFolder(command) : run(command.job));
 }

@@ -15,6 +15,8 @@ namespace fs = std::filesystem;
 namespace
 {
 
+constexpr size_t MOST_MISSING = 1000; // of a model that names files without end
+
 bool isWithin(const fs::path& path, const fs::path& folder)
 {
     return std::mismatch(folder.begin(), folder.end(), path.begin(), path.end()).first == folder.end();
@@ -43,7 +45,12 @@ int FileGate::open(const std::string& path, int& descriptor)
     std::error_code reason;
     const fs::path canonical = fs::canonical(path.c_str(), reason); // up to a NUL, as the system reads it
     if (reason)
+    {
+        std::error_code ignored;
+        if (reason == std::errc::no_such_file_or_directory && m_missing.size() < MOST_MISSING)
+            m_missing.insert(fs::absolute(path.c_str(), ignored).string());
         return reason.value();
+    }
     if (!fs::is_regular_file(canonical, reason))
         return EISDIR;
     if (!isAllowed(canonical))

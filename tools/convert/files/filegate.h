@@ -39,12 +39,16 @@ public:
     /// Canonical paths of the files that were opened.
     const std::set<std::filesystem::path>& getOpened() const { return m_opened; }
 
+    /// Absolute paths at which a file of the model was looked for and was not; the first thousand of them.
+    const std::set<std::string>& getMissing() const { return m_missing; }
+
 private:
     bool isAllowed(const std::filesystem::path& canonical) const;
 
     std::filesystem::path m_model;                ///< canonical, as the next two
     std::vector<std::filesystem::path> m_folders; ///< whose contents are allowed
     std::set<std::filesystem::path> m_opened;
+    std::set<std::string> m_missing;
     std::set<std::pair<dev_t, ino_t>> m_identities; ///< of the files that were opened
 };
 

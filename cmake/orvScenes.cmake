@@ -1,0 +1,59 @@
+# Models as part of a build.
+#
+#   orv_add_scenes(TARGET model... [OUT folder] [OPTIONS option...])
+#
+# Makes a scene file of each model, by orv-convert, whenever the model or a file that it was made of has changed; a build
+# of many jobs converts as many models at a time.
+#
+# TARGET   a target that there is, such as the program that shows the scenes: they are made before it. Otherwise a new
+#          one, which a build of everything makes. Its property ORV_SCENES lists the scene files.
+# model    a file, from the current source folder; "duck.dae" becomes "duck.glo". Two of one name are refused.
+# OUT      where the scenes and their textures lie; the current build folder otherwise.
+# OPTIONS  for orv-convert, such as --fps 60.
+#
+# The converter is the one of this build, or the one that is installed beside the library, or on the PATH; the variable
+# ORV_CONVERT names another.
+function(orv_add_scenes target)
+    cmake_policy(PUSH)
+    cmake_policy(VERSION 3.22)
+    cmake_parse_arguments(PARSE_ARGV 1 SCENES "" "OUT" "OPTIONS")
+    if(NOT SCENES_UNPARSED_ARGUMENTS)
+        message(FATAL_ERROR "orv_add_scenes(${target}): no models are named")
+    endif()
+    set(converter orv_convert)
+    if(NOT TARGET orv_convert)
+        find_program(ORV_CONVERT orv-convert HINTS ${ORV_TOOLS_FOLDER} DOC "Makes scene files of models")
+        if(NOT ORV_CONVERT)
+            message(FATAL_ERROR "orv_add_scenes(${target}): there is no orv-convert; install orv's tools or set ORV_CONVERT")
+        endif()
+        set(converter ${ORV_CONVERT})
+    endif()
+
+    set(folder ${CMAKE_CURRENT_BINARY_DIR})
+    if(SCENES_OUT)
+        get_filename_component(folder ${SCENES_OUT} ABSOLUTE BASE_DIR ${CMAKE_CURRENT_BINARY_DIR})
+    endif()
+    file(MAKE_DIRECTORY ${folder})
+    set(scenes "")
+    foreach(model IN LISTS SCENES_UNPARSED_ARGUMENTS)
+        get_filename_component(model ${model} ABSOLUTE)
+        get_filename_component(name ${model} NAME_WLE)
+        set(scene ${folder}/${name}.glo)
+        if(scene IN_LIST scenes)
+            message(FATAL_ERROR "orv_add_scenes(${target}): two models would become ${scene}")
+        endif()
+        add_custom_command(OUTPUT ${scene}
+            COMMAND ${converter} ${model} ${scene} --depfile ${scene}.d ${SCENES_OPTIONS}
+            DEPENDS ${model} ${converter} DEPFILE ${scene}.d VERBATIM COMMENT "Converting ${model}")
+        list(APPEND scenes ${scene})
+    endforeach()
+
+    if(TARGET ${target})
+        add_custom_target(${target}_scenes DEPENDS ${scenes})
+        add_dependencies(${target} ${target}_scenes)
+    else()
+        add_custom_target(${target} ALL DEPENDS ${scenes})
+    endif()
+    set_property(TARGET ${target} APPEND PROPERTY ORV_SCENES ${scenes})
+    cmake_policy(POP)
+endfunction()

@@ -1,0 +1,121 @@
+#!/usr/bin/env python3
+"""Converts models as part of a build, and folders of models.
+
+scenes.py PREFIX WORK GENERATOR
+
+Faults caught: a scene that is not made again when a file that its model names has changed, or is made again for nothing; a
+folder of which a broken model stops the rest, is forgotten or is taken for new each time; models that no shard converts,
+or two; a converter that was interrupted and believes to be done.
+"""
+import json
+import os
+import shutil
+import subprocess
+import sys
+import time
+
+sys.path.insert(0, os.path.dirname(os.path.abspath(__file__)))
+from installedtools import make_model  # noqa: E402
+
+PREFIX, WORK, GENERATOR = os.path.abspath(sys.argv[1]), os.path.abspath(sys.argv[2]), sys.argv[3]
+CONVERT = os.path.join(PREFIX, "bin/orv-convert")
+PROJECT = """cmake_minimum_required(VERSION 3.22)
+project(scenes LANGUAGES NONE)
+include({config}/orvScenes.cmake)
+set(ORV_TOOLS_FOLDER {prefix}/bin)
+orv_add_scenes(models a/one.gltf "b c/two.gltf" OUT scenes OPTIONS --scale 2)
+"""
+
+
+def run(*command, wanted=0):
+    done = subprocess.run(command, stdout=subprocess.PIPE, stderr=subprocess.STDOUT, timeout=250, check=False)
+    text = done.stdout.decode(errors="replace")
+    if done.returncode != wanted:
+        sys.exit(f"{command} exits with {done.returncode}, not {wanted}:\n{text}")
+    return text
+
+
+def expect(condition, *what):
+    if not condition:
+        sys.exit("not as wanted: " + " ".join(map(str, what)))
+
+
+def touch_later(path):
+    """Changes a file's time by what every file system keeps apart."""
+    later = time.time() + 5
+    os.utime(path, (later, later))
+
+
+def stamp(*names):
+    return [os.stat(os.path.join(WORK, name)).st_mtime_ns for name in names]
+
+
+def check_build():
+    config = os.path.dirname(subprocess.check_output(["find", PREFIX, "-name", "orvScenes.cmake"]).decode().strip())
+    for model in ("a/one.gltf", "b c/two.gltf"):
+        os.makedirs(os.path.join(WORK, os.path.dirname(model)))
+        make_model(os.path.join(WORK, model))
+    with open(os.path.join(WORK, "CMakeLists.txt"), "w", encoding="utf-8") as file:
+        file.write(PROJECT.format(config=config, prefix=PREFIX))
+    build = os.path.join(WORK, "build")
+    scenes = ["build/scenes/one.glo", "build/scenes/two.glo"]
+    run("cmake", "-G", GENERATOR, "-S", WORK, "-B", build)
+    run("cmake", "--build", build)
+    before = stamp(*scenes)
+    run("cmake", "--build", build)
+    expect(stamp(*scenes) == before, "scenes were made again although nothing had changed")
+    time.sleep(1.1)
+    touch_later(os.path.join(WORK, "b c/corners.bin"))
+    run("cmake", "--build", build)
+    after = stamp(*scenes)
+    expect(after[0] == before[0] and after[1] != before[1],
+           "a file that one model names has changed; scenes before and after:", before, after)
+
+
+def convert(out, *options, wanted=0):
+    """@return how many were converted, unchanged and failed."""
+    text = run(CONVERT, os.path.join(WORK, "models"), os.path.join(WORK, out), *options, wanted=wanted)
+    numbers = [int(word) for word in text.splitlines()[-1].replace(",", "").split() if word.isdigit()]
+    expect(text.count("orv-convert: ") == numbers[3], "errors in", text)
+    return tuple(numbers[1:])
+
+
+def check_folder():
+    models = os.path.join(WORK, "models")
+    names = ["a/a.gltf", "b/deep/b.gltf", "c/c.gltf", "d/d d.gltf", "e/e.gltf"]
+    for name in names:
+        os.makedirs(os.path.dirname(os.path.join(models, name)))
+        make_model(os.path.join(models, name))
+    with open(os.path.join(models, "c/broken.obj"), "w", encoding="utf-8") as file:
+        file.write("f 1 2 3\n")
+
+    expect(convert("out", wanted=1) == (5, 0, 1), "at first")
+    expect(convert("out", wanted=1) == (0, 5, 1), "again")
+    report = json.load(open(os.path.join(WORK, "out/b/deep/b.json"), encoding="utf-8"))
+    expect(len(report["inputs"]) == 2 and report["scene"]["bytes"] > 0, report)
+    os.remove(os.path.join(models, "c/broken.obj"))
+    touch_later(os.path.join(models, "a/corners.bin"))
+    expect(convert("out") == (1, 4, 0), "after a change of a file that a model names")
+    expect(convert("out", "--scale", "2", "--jobs", "3") == (5, 0, 0), "with other options, three at a time")
+    os.remove(os.path.join(WORK, "out/e/e.json"))  # as if it had been interrupted before the report
+    os.remove(os.path.join(WORK, "out/d/d d.glo"))
+    expect(convert("out", "--scale", "2") == (2, 3, 0), "after a scene and a report were lost")
+    expect(convert("out", "--scale", "2", "--again") == (5, 0, 0), "--again")
+
+    parts = [convert("parts", "--shard", f"{i}/3") for i in (1, 2, 3)]
+    expect(sum(part[0] for part in parts) == 5, "of three shards", parts)
+    expect(convert("parts") == (0, 5, 0), "after all shards")
+    run(CONVERT, models, os.path.join(WORK, "out"), "--shard", "4/3", wanted=2)
+    run(CONVERT, os.path.join(models, "a/a.gltf"), os.path.join(WORK, "a.glo"), "--shard", "1/3", wanted=2)
+
+
+def main():
+    shutil.rmtree(WORK, ignore_errors=True)
+    os.makedirs(WORK)
+    check_build()
+    check_folder()
+    print("Builds and folders convert what has changed, and nothing else.")
+
+
+if __name__ == "__main__":
+    main()

@@ -1,0 +1,110 @@
+#include "job.h"
+
+#include "convert/conversion.h"
+#include "convert/files/filegate.h"
+#include "convert/progress.h"
+
+#include <algorithm>
+#include <filesystem>
+
+namespace convert
+{
+
+namespace
+{
+
+bool convertGuarded(const Job& job, FileGate& gate, Conversion& made, std::string& error)
+{
+    const auto work = [&](std::FILE* stream, ModelFiles& files)
+    { return send(convertFile(job.model, files, job.out, job.options), stream); };
+    const auto accept = [&](std::FILE* stream)
+    {
+        made = {};
+        return receive(made, job.out, stream);
+    };
+    const bool done = runGuarded(job.limits, job.model, gate, work, accept, error);
+    clearProgress();
+    if (done)
+        error = made.error;
+    return done && error.empty();
+}
+
+/// Whether a texture would get the place of a file that the model was read from.
+bool takesInput(const Conversion& made, const Job& job, const FileGate& gate)
+{
+    return std::any_of(made.files.begin(), made.files.end(),
+                       [&](const OutputFile& file)
+                       { return file.path != job.out && gate.wasOpened(file.path); });
+}
+
+/// A path in the language of make.
+std::string quoteForMake(const std::string& path)
+{
+    std::string quoted;
+    for (const char c : path)
+    {
+        if (c == ' ' || c == '#')
+            quoted += '\\';
+        quoted += c == '$' ? "$$" : std::string(1, c);
+    }
+    return quoted;
+}
+
+std::vector<uint8_t> makeDepfile(const Job& job, const FileGate& gate)
+{
+    std::string text = quoteForMake(job.out) + ":";
+    for (const std::filesystem::path& input : gate.getOpened())
+        text += " \\\n  " + quoteForMake(input.string());
+    text += "\n";
+    return {text.begin(), text.end()};
+}
+
+std::vector<OutputFile> listOutputs(const Job& job, const FileGate& gate, Conversion& made)
+{
+    std::vector<OutputFile> files;
+    if (!job.report.empty())
+        files.push_back({job.report, {made.json.begin(), made.json.end()}});
+    if (job.dryRun)
+        return files;
+    if (!job.depfile.empty())
+        files.push_back({job.depfile, makeDepfile(job, gate)});
+    std::move(made.files.begin(), made.files.end(), std::back_inserter(files));
+    return files;
+}
+
+} // namespace
+
+Outcome convertModel(Job job)
+{
+    FileGate gate(job.model, job.allowed);
+    Conversion made;
+    Outcome outcome;
+    bool done = convertGuarded(job, gate, made, outcome.error);
+    if (done && takesInput(made, job, gate)) // which only shows when all has been read
+    {
+        for (const OutputFile& file : made.files)
+        {
+            if (gate.wasOpened(file.path))
+                job.options.takenNames.insert(std::filesystem::path(file.path).stem().string());
+        }
+        for (const std::filesystem::path& input : gate.getOpened())
+            job.options.takenNames.insert(input.stem().string());
+        done = convertGuarded(job, gate, made, outcome.error);
+    }
+    for (const std::filesystem::path& input : gate.getOpened())
+        outcome.inputs.insert(input.string());
+    outcome.missing = gate.getMissing();
+    if (!done)
+    {
+        outcome.error = job.model + ": " + outcome.error;
+        return outcome;
+    }
+    const std::vector<OutputFile> files = listOutputs(job, gate, made);
+    if (writeFiles(files, gate, outcome.error))
+        outcome.error.clear();
+    outcome.text = std::move(made.text);
+    outcome.json = std::move(made.json);
+    return outcome;
+}
+
+} // namespace convert
