@@ -1,0 +1,7 @@
+1.0
+vertex_source_file ripple.vert
+fragment_source_file ripple.frag
+
+uniform u_t_modelViewProjection T_MODEL_VIEW_PROJECTION
+uniform u_time TIME
+uniform u_m_colour M_RIPPLE_COLOUR
