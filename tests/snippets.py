@@ -1,0 +1,59 @@
+#!/usr/bin/env python3
+"""Compiles the snippets of the pages, as far as a compiler reads without making code.
+
+snippets.py WORK COMPILER FLAG...
+
+A snippet that defines a function of a class stands by itself; any other is the body of a function, with the names of
+tests/outside/snippets.h. Whole programs and the snippets of docs/cookbook.md are built elsewhere.
+
+Fault caught: a snippet of a call that has another name by now, or never was right.
+"""
+import os
+import re
+import subprocess
+import sys
+
+SOURCE = os.path.dirname(os.path.dirname(os.path.abspath(__file__)))
+# Names that stand for what an earlier snippet of the page has made.
+BEFORE = {
+    "docs/guide.md": "RenderBlock block(renderer, scene, camera), inset(renderer, scene, mapCamera);\n"
+                     "const auto model = loadGloFile(*pool, scene, \"model.glo\");\n"
+                     "AnimationController player(model->getAnimationGroup());\n",
+    "docs/text.md": "const auto block = makeShared<RenderBlock>(renderer, scene, camera);\n"
+                    "Text text(*pool, font, Colour4f::WHITE);\n",
+}
+
+
+def snippets():
+    pages = subprocess.check_output(["git", "-C", SOURCE, "ls-files", "*.md"]).decode().split()
+    for page in pages:
+        if page == "docs/cookbook.md":
+            continue
+        with open(os.path.join(SOURCE, page), encoding="utf-8") as file:
+            text = file.read()
+        for match in re.finditer(r"^```cpp\n(.*?)^```$", text, flags=re.M | re.S):
+            if "#include" not in match.group(1):
+                yield page, text.count("\n", 0, match.start()) + 2, match.group(1)
+
+
+def main():
+    work, compiler, flags = sys.argv[1], sys.argv[2], [flag for flag in sys.argv[3:] if flag]
+    found = list(snippets())
+    parts = [f"#include \"{SOURCE}/tests/outside/snippets.h\""]
+    for number, (page, line, text) in enumerate(found):
+        place = f"#line {line} \"{page}\"\n"
+        if re.match(r"\w+ \w+::\w+\(", text):
+            parts.append(place + text)
+        else:
+            parts.append(f"bool snippet{number}()\n{{\n{BEFORE.get(page, '')}{{\n{place}{text}}}\nreturn true;\n}}")
+    os.makedirs(work, exist_ok=True)
+    path = os.path.join(work, "snippets.cpp")
+    with open(path, "w", encoding="utf-8") as file:
+        file.write("\n".join(parts) + "\n")
+    code = subprocess.call([compiler, "-std=c++20", "-fsyntax-only", "-fno-rtti", *flags, path])
+    print(f"{len(found)} snippets" + (" compile." if code == 0 else "; see above."))
+    return 1 if code != 0 or len(found) < 15 else 0
+
+
+if __name__ == "__main__":
+    sys.exit(main())
