@@ -24,9 +24,10 @@ target_link_libraries(orv_engine_options INTERFACE orv_options)
 target_compile_options(orv_engine_options INTERFACE
     -fno-exceptions -fvisibility=hidden -fvisibility-inlines-hidden -fno-semantic-interposition)
 # Debug information, and with it the build ID, does not say where the library was built: see docs/releasing.md.
-set(prefixMaps "-fdebug-prefix-map=${PROJECT_SOURCE_DIR}/=" "-fdebug-prefix-map=${PROJECT_BINARY_DIR}=build")
-target_compile_options(orv_engine_options INTERFACE ${prefixMaps})
-target_link_options(orv_engine_options INTERFACE ${prefixMaps})
+# The folders of the tools use these as well.
+set(ORV_PREFIX_MAPS "-fdebug-prefix-map=${PROJECT_SOURCE_DIR}/=" "-fdebug-prefix-map=${PROJECT_BINARY_DIR}=build")
+target_compile_options(orv_engine_options INTERFACE ${ORV_PREFIX_MAPS})
+target_link_options(orv_engine_options INTERFACE ${ORV_PREFIX_MAPS})
 
 # All configurations but Debug compile the library for size, save what a frame or a decoder runs through
 # (orv_hot_sources), and with GCC optimise it as a whole when they link it (ORV_LTO), which for a static library others

@@ -66,6 +66,7 @@ endif()
 if(TARGET orv_convert)
     include(installtools)
 endif()
+include(sbom)
 
 # Packages: cpack in the build folder, divided as Debian divides its own libraries.
 set(CPACK_GENERATOR DEB)
