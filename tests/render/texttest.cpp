@@ -187,6 +187,7 @@ TEST_F(TextTest, drawsAllAtOnceAndLeavesTheSceneAlone)
     renderFrame();
     EXPECT_TRUE(comparePictures("after", plain, support::readFrame()));
 
+    text->draw(*renderContext); // the driver may compile something for it
     glcalls::reset();
     const uint64_t allocations = support::countAllocations();
     text->draw(*renderContext);
@@ -198,6 +199,30 @@ TEST_F(TextTest, drawsAllAtOnceAndLeavesTheSceneAlone)
     text->clear();
     text->draw(*renderContext);
     EXPECT_EQ(2u, glcalls::count(glDrawArrays));
+}
+
+// Fault caught: a buffer more for each change, which stay until a flush that a program may not do for hours.
+TEST_F(TextTest, changesKeepTheBuffer)
+{
+    const Text::Ptr text = makeText();
+    const char* const strings[] = {"A", "AAAA", "A\nA", "", "AA"};
+    glcalls::reset();
+    for (const char* string : strings)
+    {
+        text->clear();
+        text->add(string, 3, 4);
+        clear();
+        text->draw(*renderContext);
+    }
+    EXPECT_EQ(1u, glcalls::count(glGenBuffers));
+    EXPECT_EQ(4u, glcalls::count(glBufferData)); // but for the empty one
+    EXPECT_EQ(4u, glcalls::count(glDrawArrays));
+    clear();
+    Picture expected = support::readFrame();
+    put(expected, 'A', 3, 5);
+    put(expected, 'A', 9, 5);
+    text->draw(*renderContext);
+    EXPECT_TRUE(comparePictures("changed", expected, support::readFrame(), {1, 0}));
 }
 
 // Fault caught: a place counted from another corner than the viewport's.

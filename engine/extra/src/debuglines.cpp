@@ -6,15 +6,14 @@
 #include "orv/assetcachepool.h"
 #include "orv/camera.h"
 #include "orv/indexbuffer.h"
-#include "orv/log.h"
 #include "orv/mesh.h"
 #include "orv/rendercontext.h"
 #include "orv/shaderprogramcache.h"
 #include "orv/solid.h"
-#include "orv/vertexbuffer.h"
+#include "orv/vertexbuffercache.h"
 
 #include <algorithm>
-#include <cstring>
+#include <cstddef>
 
 namespace orv
 {
@@ -56,7 +55,7 @@ bool isJoint(const Solid& solid, const SceneNode* node)
 
 } // namespace
 
-DebugLines::DebugLines(AssetCachePool& pool)
+DebugLines::DebugLines(AssetCachePool& pool) : m_cache(pool.getVertexBufferCache())
 {
     const auto appearance = makeShared<Appearance>();
     m_solid = makeShared<Solid>(nullptr, appearance);
@@ -193,47 +192,42 @@ void DebugLines::draw(RenderContext& context, Camera& camera)
         detail::setViewport(context, viewport);
 }
 
-/// @return false where memory lacks, which the log says.
+/// @return false where GL has no memory for them, which the log says.
 bool DebugLines::copyVertices()
 {
     if (m_isCopied)
         return true;
-    if ((!m_places || size_t(m_places->getVertexCount()) != m_vertices.size()) && !makeMesh())
+    const auto* data = reinterpret_cast<const unsigned char*>(m_vertices.data());
+    const auto size = unsigned(m_vertices.size() * sizeof(Vertex));
+    const bool isKept = m_buffer && m_buffer->replaceData(data, size);
+    if (!isKept && !makeBuffer(data, size))
         return false;
-    unsigned char* place = m_places->getBytes();
-    unsigned char* colour = m_colours->getBytes();
-    for (const Vertex& vertex : m_vertices)
-    {
-        std::memcpy(place, &vertex.place, sizeof(vertex.place));
-        std::memcpy(colour, vertex.colour, sizeof(vertex.colour));
-        place += sizeof(vertex.place);
-        colour += sizeof(vertex.colour);
-    }
-    m_isCopied = true;
-    return true;
+    if (!isKept || m_solid->getMesh()->getIndexBuffer()->getCount() != int(m_vertices.size()))
+        setMesh();
+    m_isCopied = bool(m_buffer);
+    return m_isCopied;
 }
 
-bool DebugLines::makeMesh()
+void DebugLines::setMesh()
 {
-    const int count = int(std::min<size_t>(m_vertices.size(), INT32_MAX));
-    m_places = makeShared<VertexArray>(count, int(sizeof(float)), 3);
-    m_colours = makeShared<VertexArray>(count, 1, 4);
-    const auto vertices = makeShared<VertexBuffer>(nullptr);
-    const auto order = makeShared<IndexBuffer>(IndexBuffer::Primitive::LINES, count, false, nullptr);
-    const bool isMade = m_places && size_t(m_places->getVertexCount()) == m_vertices.size() && m_colours &&
-                        m_colours->getVertexCount() == count && vertices && order;
-    if (!isMade)
-    {
-        ORV_LOG_ERROR("No memory for %u lines", unsigned(m_vertices.size() / 2));
-        m_places = nullptr;
-        return false;
-    }
+    const auto order =
+        makeShared<IndexBuffer>(IndexBuffer::Primitive::LINES, int(m_vertices.size()), false, nullptr);
+    m_solid->setMesh(order ? makeShared<Mesh>(MeshHeader(), order, m_buffer) : nullptr);
+    if (!m_solid->getMesh())
+        m_buffer = nullptr; // no memory, as the log said
+}
+
+bool DebugLines::makeBuffer(const unsigned char* data, unsigned size)
+{
     using Format = VertexBuffer::AttribFormat;
-    const auto usage = VertexBuffer::AttribUsage::CLIENT_MEMORY;
-    vertices->addAttrib(m_places, "a_position", Format::FLOAT, usage, false);
-    vertices->addAttrib(m_colours, "a_colour", Format::UNSIGNED_BYTE, usage, true);
-    m_solid->setMesh(makeShared<Mesh>(MeshHeader(), order, vertices));
-    return true;
+    const VertexBuffer::AttribDescription attributes[] = {
+        {"a_position", Format::FLOAT, false, int(offsetof(Vertex, place)), 3, int(sizeof(Vertex))},
+        {"a_colour", Format::UNSIGNED_BYTE, true, int(offsetof(Vertex, colour)), 4, int(sizeof(Vertex))}};
+    m_buffer = m_cache->create(nullptr);
+    if (m_buffer && m_buffer->setAllAttributes(attributes, 2, data, size))
+        return true;
+    m_buffer = nullptr;
+    return false;
 }
 
 } // namespace orv

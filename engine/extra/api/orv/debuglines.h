@@ -19,7 +19,8 @@ class Camera;
 class RenderContext;
 class SceneNode;
 class Solid;
-class VertexArray;
+class VertexBuffer;
+class VertexBufferCache;
 
 /// Lines that show what cannot be seen: places, boxes, axes, joints, what a camera sees. All of them are one GL draw, over
 /// a frame.
@@ -39,7 +40,7 @@ public:
     ORV_CLASS_NAME("DebugLines")
     using Ptr = SharedPtr<DebugLines>;
 
-    /// @param pool  borrowed during the call, for the shader program.
+    /// @param pool  for the shader program; its cache of vertex buffers is held as well.
     explicit DebugLines(AssetCachePool& pool);
     ~DebugLines() override;
 
@@ -80,8 +81,8 @@ public:
     /// Draws into the viewport as a renderer would for this camera, in stereo to both halves: right after the block, with
     /// the target enabled if it had one. One GL draw for each eye, none without lines.
     ///
-    /// Vertices are kept in client memory. As long as nothing is added or taken out, nothing is copied or made again, and
-    /// as long as their number stays, nothing is allocated.
+    /// The vertices have one GL buffer, which goes with the pool's flush() after the lines. As long as nothing is added or
+    /// taken out, nothing is copied or made again, and as long as their number stays, nothing is allocated.
     void draw(RenderContext& context, Camera& camera);
 
 private:
@@ -92,12 +93,13 @@ private:
     };
 
     ORV_LOCAL bool copyVertices();
-    ORV_LOCAL bool makeMesh();
+    ORV_LOCAL bool makeBuffer(const unsigned char* data, unsigned size);
+    ORV_LOCAL void setMesh();
 
-    std::vector<Vertex> m_vertices; ///< two for each line
-    bool m_isCopied = true;         ///< the solid's arrays hold them
-    SharedPtr<VertexArray> m_places;
-    SharedPtr<VertexArray> m_colours;
+    std::vector<Vertex> m_vertices;       ///< two for each line
+    bool m_isCopied = true;               ///< the buffer holds them
+    SharedPtr<VertexBufferCache> m_cache; ///< the pool's
+    SharedPtr<VertexBuffer> m_buffer;
     SharedPtr<Solid> m_solid;
     SharedPtr<ShaderUniform<Matrix4f>> m_transform; ///< the appearance's, from world to clip space
 };
