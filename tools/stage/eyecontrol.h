@@ -23,6 +23,7 @@ public:
     void useCamera(Stage& stage, int index); ///< of the file; -1 for the free one
     /// @return whether there is more than one camera.
     bool stepCamera(Stage& stage, int count);
+    int getCamera() const { return m_camera; }           ///< of the file; -1 for the free one
     std::string getCameraName(const Stage& stage) const; ///< "" for the free one
 
     // These go on with the free camera, from where the file's stands.

@@ -22,6 +22,15 @@ Player::Player(const orv::SharedPtr<orv::Animation>& animation, std::vector<Clip
     setClip(0);
 }
 
+void Player::continueFrom(const Player& other)
+{
+    chooseClip(other.getClip().name);
+    seek(other.getTime());
+    setPaused(other.isPaused());
+    setLooping(other.isLooping());
+    m_controller.setSpeed(other.getSpeed());
+}
+
 void Player::setClip(size_t clip)
 {
     m_clip = clip;

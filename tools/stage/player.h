@@ -23,6 +23,9 @@ public:
     /// @param clips  the first is the whole time line; there is at least that one.
     Player(const orv::SharedPtr<orv::Animation>& animation, std::vector<Clip> clips);
 
+    /// Goes on where another player is, as far as this one has the clip: for a scene that was loaded again.
+    void continueFrom(const Player& other);
+
     const std::vector<Clip>& getClips() const { return m_clips; }
     const Clip& getClip() const { return m_clips[m_clip]; }
 

@@ -68,11 +68,7 @@ void LiveScene::takeStage(std::unique_ptr<Stage> stage)
     auto player = std::make_unique<Player>(stage->getAnimation(), stage->getClips());
     if (m_player)
     {
-        player->chooseClip(m_player->getClip().name);
-        player->seek(m_player->getTime());
-        player->setPaused(m_player->isPaused());
-        player->setLooping(m_player->isLooping());
-        player->scaleSpeed(m_player->getSpeed());
+        player->continueFrom(*m_player);
         stage->setBackground(m_stage->getBackground());
     }
     m_player = std::move(player);
