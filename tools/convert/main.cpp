@@ -36,6 +36,7 @@ const char* const FOOTER =
     "  orv-convert house.gltf house.glo --max-texture-size 1024 --power-of-two\n"
     "  orv-convert big.ifc big.glo --dry-run                only say what would come of it\n"
     "  orv-convert a.glb a.glo --report a.json              for a script (docs/convert.md)\n"
+    "  orv-convert walk.glb --page walk                     a folder that any web server shows\n"
     "  orv-convert source/car.fbx car.glo --allow textures  a model whose pictures lie elsewhere\n"
     "  orv-convert models scenes --jobs 8                   a folder, and again what has changed since\n"
     "  orv-convert models scenes --shard 2/5                on the second of five machines\n"
@@ -56,6 +57,9 @@ int run(convert::Job& job)
     if (!outcome.error.empty())
         return fail(outcome.error);
     std::fputs(isReportPrinted ? outcome.json.c_str() : outcome.text.c_str(), stdout);
+    if (!job.page.empty() && !job.dryRun && !isReportPrinted)
+        std::printf("%s is a page for any web server, here and now: python3 -m http.server -d %s\n",
+                    job.page.c_str(), job.page.c_str());
     if (job.dryRun && !isReportPrinted)
         std::puts("Dry run: no scene or texture has been written.");
     return 0;
@@ -84,8 +88,10 @@ std::string findConflict(const Command& command, bool isFolder)
 {
     const convert::FolderJob& folder = command.folder;
     const convert::Job& job = command.job;
-    if (isFolder && (job.dryRun || !job.report.empty() || !job.depfile.empty()))
-        return job.model + " is a folder: --dry-run, --report and --depfile are for single models";
+    if (job.out.empty())
+        return "OUT.glo is required";
+    if (isFolder && (job.dryRun || !job.report.empty() || !job.depfile.empty() || !job.page.empty()))
+        return job.model + " is a folder: --dry-run, --report, --depfile and --page are for single models";
     if (!isFolder && (folder.again || folder.processes > 1 || !command.shard.empty()))
         return job.model + " is no folder: --again, --jobs and --shard are for folders";
     if (!isFolder && std::filesystem::path(job.out).extension() != ".glo")
@@ -112,8 +118,13 @@ void addOptions(CLI::App& app, Command& command)
 {
     convert::Options& options = command.job.options;
     app.add_option("MODEL", command.job.model, "the model file, or a folder of models")->required();
-    app.add_option("OUT.glo", command.job.out, "the scene file to write, or a folder for scenes and reports")
-        ->required();
+    CLI::Option* const out = app.add_option("OUT.glo", command.job.out,
+                                            "the scene file to write, or a folder for scenes and reports");
+    app.add_option("--page", command.job.page,
+                   "in place of OUT.glo: a folder for the scene and a page that shows it in browsers, with "
+                   "--power-of-two")
+        ->option_text("DIR")
+        ->excludes(out);
     app.add_option("--fps", options.fps, "samples per second of animations")
         ->check(CLI::Range(1.0, 1000.0))
         ->capture_default_str();
@@ -160,6 +171,14 @@ void addOptions(CLI::App& app, Command& command)
     app.footer(FOOTER);
 }
 
+/// The scene is named after the model, and its textures have what WebGL asks of them.
+void usePage(convert::Job& job)
+{
+    const std::string name = std::filesystem::path(job.model).stem().string() + ".glo";
+    job.out = (std::filesystem::path(job.page) / name).string();
+    job.options.powerOfTwo = true;
+}
+
 } // namespace
 
 int main(int argc, char** argv)
@@ -179,6 +198,8 @@ int main(int argc, char** argv)
     }
     command.job.options.animation = !command.noAnimation;
     command.job.options.sparseKeys = command.keys == "sparse";
+    if (!command.job.page.empty())
+        usePage(command.job);
     std::error_code ignored;
     const bool isFolder = std::filesystem::is_directory(command.job.model, ignored);
     const std::string conflict = findConflict(command, isFolder);

@@ -2,6 +2,7 @@
 
 #include "convert/conversion.h"
 #include "convert/files/filegate.h"
+#include "convert/page.h"
 #include "convert/progress.h"
 
 #include <algorithm>
@@ -72,6 +73,45 @@ std::vector<OutputFile> listOutputs(const Job& job, const FileGate& gate, Conver
     return files;
 }
 
+/// Makes the folder of a page where there is none; one that stays empty is removed again.
+class PageFolder
+{
+public:
+    explicit PageFolder(const std::string& path) : m_path(path) {}
+    ~PageFolder()
+    {
+        std::error_code ignored;
+        if (m_isMade)
+            std::filesystem::remove(m_path, ignored);
+    }
+    PageFolder(const PageFolder&) = delete;
+    PageFolder& operator=(const PageFolder&) = delete;
+
+    bool make(std::string& error)
+    {
+        std::error_code reason;
+        m_isMade = std::filesystem::create_directory(m_path, reason);
+        if (reason)
+            error = m_path + ": " + reason.message();
+        return !reason;
+    }
+
+private:
+    std::string m_path;
+    bool m_isMade = false;
+};
+
+/// @param page  loaded, if the job has one.
+bool writeOutputs(const Job& job, const FileGate& gate, const Page& page, Conversion& made,
+                  std::string& error)
+{
+    const bool hasPage = !job.page.empty() && !job.dryRun;
+    if (hasPage)
+        page.addTo(made.files);
+    PageFolder folder(job.page);
+    return (!hasPage || folder.make(error)) && writeFiles(listOutputs(job, gate, made), gate, error);
+}
+
 } // namespace
 
 Outcome convertModel(Job job)
@@ -79,6 +119,9 @@ Outcome convertModel(Job job)
     FileGate gate(job.model, job.allowed);
     Conversion made;
     Outcome outcome;
+    Page page;
+    if (!job.page.empty() && !page.load(outcome.error))
+        return outcome;
     bool done = convertGuarded(job, gate, made, outcome.error);
     if (done && takesInput(made, job, gate)) // which only shows when all has been read
     {
@@ -99,8 +142,7 @@ Outcome convertModel(Job job)
         outcome.error = job.model + ": " + outcome.error;
         return outcome;
     }
-    const std::vector<OutputFile> files = listOutputs(job, gate, made);
-    if (writeFiles(files, gate, outcome.error))
+    if (writeOutputs(job, gate, page, made, outcome.error))
         outcome.error.clear();
     outcome.text = std::move(made.text);
     outcome.json = std::move(made.json);

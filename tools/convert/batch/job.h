@@ -17,7 +17,8 @@ struct Job
     std::string out;    ///< path of the scene file
     std::string report; ///< path of a file for the JSON; empty for none
     std::string
-        depfile; ///< path of a file for a build, which names what the scene was made of; empty for none
+        depfile;      ///< path of a file for a build, which names what the scene was made of; empty for none
+    std::string page; ///< folder of the scene file, to become a page that shows it; empty for none
     bool dryRun = false;              ///< neither scene nor textures are written, nor a depfile
     std::vector<std::string> allowed; ///< further folders that the model may have files in
     Options options;
