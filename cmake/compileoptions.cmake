@@ -22,7 +22,10 @@ endif()
 add_library(orv_engine_options INTERFACE)
 target_link_libraries(orv_engine_options INTERFACE orv_options)
 target_compile_options(orv_engine_options INTERFACE
-    -fno-exceptions -fvisibility=hidden -fvisibility-inlines-hidden -fno-semantic-interposition)
+    -fno-exceptions -fvisibility=hidden -fvisibility-inlines-hidden)
+if(NOT EMSCRIPTEN) # where nothing is shared
+    target_compile_options(orv_engine_options INTERFACE -fno-semantic-interposition)
+endif()
 # Debug information, and with it the build ID, does not say where the library was built: see docs/releasing.md.
 # The folders of the tools use these as well.
 set(ORV_PREFIX_MAPS "-fdebug-prefix-map=${PROJECT_SOURCE_DIR}/=" "-fdebug-prefix-map=${PROJECT_BINARY_DIR}=build")
@@ -38,7 +41,10 @@ set(ORV_WHOLE
     $<AND:${ORV_OPTIMISED},$<BOOL:${ORV_LTO}>,$<NOT:$<BOOL:${ORV_STATIC}>>,$<STREQUAL:${CMAKE_CXX_COMPILER_ID},GNU>>)
 target_compile_options(orv_engine_options INTERFACE
     $<${ORV_OPTIMISED}:-Os> $<${ORV_WHOLE}:-flto> $<${ORV_WHOLE}:-ffat-lto-objects>
-    -ffunction-sections -fdata-sections -funwind-tables -fstack-protector)
+    -ffunction-sections -fdata-sections)
+if(NOT EMSCRIPTEN) # whose return addresses are out of a program's reach, and which needs no tables to unwind
+    target_compile_options(orv_engine_options INTERFACE -funwind-tables -fstack-protector)
+endif()
 
 # orv_hot_sources(source...): sources of the current room that run for every frame, solid or pixel. They are not
 # inlined beyond what costs nothing, nor padded.

@@ -1,0 +1,62 @@
+// Where files come from: chosen, dropped, or from the server.
+
+/// @return 0 for what is not looked at by itself; the smaller the number, the sooner it is shown.
+export function isModel(name) {
+    return 1 + [".glo", ".ap", ".sp"].findIndex((suffix) => name.toLowerCase().endsWith(suffix));
+}
+
+async function readFile(file, name) {
+    return { name, bytes: new Uint8Array(await file.arrayBuffer()) };
+}
+
+/// @param list  of a file chooser; files of a folder keep the path in there.
+export function readChosen(list) {
+    return Promise.all([...list].map((file) => readFile(file, file.webkitRelativePath || file.name)));
+}
+
+/// Calls back until there are no more: a reader gives some hundred entries at a time.
+function listFolder(folder) {
+    const reader = folder.createReader();
+    return new Promise((resolve, reject) => {
+        const all = [];
+        const readOn = () => reader.readEntries((some) => {
+            all.push(...some);
+            if (some.length > 0)
+                readOn();
+            else
+                resolve(all);
+        }, reject);
+        readOn();
+    });
+}
+
+async function readEntry(entry, path) {
+    if (entry.isFile) {
+        const file = await new Promise((resolve, reject) => entry.file(resolve, reject));
+        return [await readFile(file, path + entry.name)];
+    }
+    const inside = await listFolder(entry);
+    return (await Promise.all(inside.map((each) => readEntry(each, `${path}${entry.name}/`)))).flat();
+}
+
+/// @param transfer  of a drop; to be asked while the event is handled.
+export async function collectDropped(transfer) {
+    const entries = [...transfer.items].filter((item) => item.kind === "file")
+        .map((item) => (item.webkitGetAsEntry ? item.webkitGetAsEntry() : null));
+    if (entries.length === 0 || entries.includes(null))
+        return readChosen(transfer.files);
+    return (await Promise.all(entries.map((entry) => readEntry(entry, "")))).flat();
+}
+
+export async function fetchFile(url) {
+    const name = decodeURIComponent(url.pathname.slice(url.pathname.lastIndexOf("/") + 1));
+    let answer;
+    try {
+        answer = await fetch(url);
+    } catch (error) {
+        throw new Error(`${name} cannot be fetched: ${error.message}`);
+    }
+    if (!answer.ok)
+        throw new Error(`${name} cannot be fetched: ${answer.status} ${answer.statusText}`);
+    return new Uint8Array(await answer.arrayBuffer());
+}
