@@ -40,7 +40,7 @@ class Browser:
         options = webdriver.ChromeOptions()
         for argument in ("--headless=new", "--no-sandbox", "--disable-dev-shm-usage", "--use-angle=swiftshader",
                          "--enable-unsafe-swiftshader", "--hide-scrollbars", "--force-color-profile=srgb",
-                         "--js-flags=--expose-gc", "--disable-background-networking", "--no-first-run"):
+                         "--disable-background-networking", "--no-first-run"):
             options.add_argument(argument)
         options.binary_location = "/usr/bin/chromium"
         options.set_capability("goog:loggingPrefs", {"browser": "ALL"})

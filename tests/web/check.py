@@ -48,11 +48,8 @@ class Bench:
         shutil.copytree(web / "page", self.folder / "page")
         shutil.copytree(web / "examples", self.folder / "examples")
         for name, path in MODELS.items():
-            # By a link, so that page and scene are called what the checks call them.
-            model = self.native / f"{name}{pathlib.Path(path).suffix}"
-            shutil.copyfile(models / path, model)
-            subprocess.run([build / "tools/convert/orv-convert", model, "--page", self.folder / name, "--allow",
-                            (models / path).parent], check=True, stdout=subprocess.DEVNULL)
+            subprocess.run([build / "tools/convert/orv-convert", models / path, "--page", self.folder / name],
+                           check=True, stdout=subprocess.DEVNULL)
         self.server = Server(self.folder)
         self.browser = Browser()
 
@@ -60,13 +57,23 @@ class Bench:
         self.browser.close()
         self.server.close()
 
-    def show(self, page, wishes=""):
-        self.browser.open(f"{self.server.address}/{page}/{wishes}")
+    def scene(self, name):
+        """The scene file of a model, as a path below the folder that is served."""
+        return f"{name}/{pathlib.Path(MODELS[name]).stem}.glo"
+
+    def files(self, name):
+        """The same of a scene with its pictures."""
+        stem = pathlib.Path(MODELS[name]).stem
+        return [f"{name}/{path.name}" for path in sorted((self.folder / name).glob(f"{stem}*"))]
+
+    def show(self, page, *wishes):
+        """With the canvas as large as the window."""
+        self.browser.open(f"{self.server.address}/{page}/?{'&'.join(('bars=0',) + wishes)}")
 
     def draw(self, name, *options):
         """By orv-view. @return the pictures."""
         out = self.native / f"{name}.png"
-        subprocess.run([self.build / "tools/view/orv-view", self.folder / name / f"{name}.glo", "--out", out, "--size",
+        subprocess.run([self.build / "tools/view/orv-view", self.folder / self.scene(name), "--out", out, "--size",
                         f"{WIDTH}x{HEIGHT}", *options], check=True, stdout=subprocess.DEVNULL)
         return [read_png(path) for path in sorted(self.native.glob(f"{name}*.png"))]
 
@@ -110,7 +117,7 @@ def models(bench):
     said = []
     bench.browser.resize(WIDTH, HEIGHT)
     for name in MODELS:
-        bench.show(name, "?play=0")
+        bench.show(name, "play=0")
         moves = bench.browser.run("return orvPage.state.scene.clips.some((clip) => clip.end > clip.start)")
         natives = bench.draw(name, *(["--frames", str(MOMENTS)] if moves else []))
         expect(len(natives) == (MOMENTS if moves else 1), f"{name}: {len(natives)} pictures of orv-view")
@@ -118,20 +125,18 @@ def models(bench):
             bench.browser.run("orvPage.run('share', values[0])", i / MOMENTS)
             said.append(hold(f"{name}-{i}", native, bench.browser.picture()))
         if name == "duck":
-            bench.show(name, "?camera=camera1")
+            bench.show(name, "camera=camera1")
             said.append(hold("duck-camera", bench.draw(name, "--camera", "camera1")[0], bench.browser.picture()))
     return f"by more than {TOLERANCE} of 255: " + ", ".join(said)
 
 
 def examples(bench):
     """The same of whole programs: mirrors, targets, text over a frame, motion blur."""
-    scenes = {f"/{name}/{path.name}": f"../{name}/{path.name}"
-              for name in ("duck", "motion") for path in (bench.folder / name).iterdir()
-              if path.name.startswith(name)}
+    scenes = {f"/{path}": f"../{path}" for name in ("duck", "motion") for path in bench.files(name)}
     font = "/usr/share/fonts/truetype/dejavu/DejaVuSans.ttf"
     shutil.copyfile(font, bench.folder / "font.ttf")
     runs = {
-        "showpiece": (["--duck", "/duck/duck.glo", "--dancer", "/motion/motion.glo", "--out", "a.png"], scenes),
+        "showpiece": (["--duck", "/" + bench.scene("duck"), "--dancer", "/" + bench.scene("motion"), "--out", "a.png"], scenes),
         "stereo": (["--stereo", "--out", "a.png"], {}),
         "textpage": (["--font", font, "--out", "a.png"], {font: "../font.ttf"}),
         "motionblur": (["--out", "a"], {}),
@@ -226,7 +231,7 @@ def hands(bench):
             wrong[name] = error
     expect(not wrong, str(wrong))
 
-    bench.show("motion")
+    browser.open(f"{bench.server.address}/motion/")
     playing = lambda: browser.run("return document.getElementById('play').classList.contains('playing')")
     expect(playing(), "a clip does not play by itself")
     ActionChains(driver).send_keys(" ").perform()
@@ -244,10 +249,10 @@ def context(bench):
     browser = bench.browser
     browser.resize(WIDTH, HEIGHT)
     cases = {"duck": "orvPage.run('turn', 33, 5); orvPage.run('zoom', 2); orvPage.run('pan', 9, 9)",
-             "duck/?camera=camera1": "", "motion": "orvPage.run('share', 0.3); orvPage.run('backdrop')",
+             "duck camera=camera1": "", "motion": "orvPage.run('share', 0.3); orvPage.run('backdrop')",
              "skin": "orvPage.run('share', 0.4)"}
     for page, script in cases.items():
-        bench.show(page, "" if "?" in page else "?play=0")
+        bench.show(*page.split(), "play=0")
         browser.run(script)
         before = browser.picture()
         browser.run("""
@@ -293,11 +298,15 @@ def growth(bench):
             orvPage.openFiles(files);
             orvPage.drawNow();
         }
-        gc();
-        return { memory: orvPage.countMemory(), objects: window.glObjects, heap: performance.memory.usedJSHeapSize };"""
-    names = [f"duck/{path.name}" for path in (bench.folder / "duck").iterdir() if path.name.startswith("duck")]
-    early = browser.run(measure, 10, names)
-    late = browser.run(measure, 100, names)
+        return { memory: orvPage.countMemory(), objects: window.glObjects };"""
+
+    def open_often(times):
+        found = browser.run(measure, times, bench.files("duck"))
+        browser.command("HeapProfiler.collectGarbage")
+        return {**found, "heap": browser.command("Runtime.getHeapUsage")["usedSize"]}
+
+    early = open_often(10)
+    late = open_often(100)
     browser.command("Page.removeScriptToEvaluateOnNewDocument", identifier=count["identifier"])
     expect(early["objects"] > 0 and late["objects"] == early["objects"], f"GL objects: {early} {late}")
     expect(late["memory"] == early["memory"], f"memory of the program: {early} {late}")
@@ -342,11 +351,11 @@ def damage(bench):
     expect("a.txt is no .glo scene" in says(), says())
     browser.run("orvPage.openFiles([{ name: 'duck.glo', bytes: new Uint8Array(await (await fetch('/duck/duck.glo')).arrayBuffer()) }])")
     expect("not all of it could be loaded" in says() and "duck" in browser.run("return document.getElementById('remarks').textContent"), says())
-    for wish, words in {"?model=/duck/none.glo": "none.glo cannot be fetched: 404", "?model=http://127.0.0.1:1/a.glo": "its own server",
-                        "?model=/page/viewer.css": "cannot be opened", "?model=/duck/duck.glo&camera=nobody": "no camera \"nobody\""}.items():
+    for wish, words in {"model=/duck/none.glo": "none.glo cannot be fetched: 404", "model=http://127.0.0.1:1/a.glo": "its own server",
+                        "model=/page/viewer.css": "cannot be opened", "model=/duck/duck.glo&camera=nobody": "no camera \"nobody\""}.items():
         bench.show("page", wish)
         expect(words in says(), f"{wish}: {says()}")
-    bench.show("page", "?model=/duck/duck.glo")
+    bench.show("page", "model=/duck/duck.glo")
     expect(says().startswith("true") and browser.run("return orvPage.state.scene !== null"), "a good file after bad ones: " + says())
     return f"{refused} of {len(bad)} damaged scenes refused, the others drawn; 6 messages"
 
@@ -357,7 +366,7 @@ def files(bench):
     browser.resize(WIDTH, HEIGHT)
     bench.show("duck")
     wanted = browser.picture()
-    paths = [str(path) for path in sorted((bench.folder / "duck").iterdir()) if path.name.startswith("duck")]
+    paths = [str(bench.folder / path) for path in bench.files("duck")]
 
     def matches(what):
         for _ in range(50):
@@ -367,20 +376,17 @@ def files(bench):
         most = compare(wanted, browser.picture(), 0)[1]
         expect(most == 0, f"{what}: {most} of 255 off")
 
-    bench.show("page", "?model=/duck/duck.glo")
+    bench.show("page", "model=/duck/duck.glo")
     matches("named in the address")
     bench.show("page")
     browser.driver.find_element(By.ID, "filechooser").send_keys("\n".join(paths))
     matches("chosen")
-    bench.show("page")
-    data = {"items": [], "files": paths, "dragOperationsMask": 1}
-    for kind in ("dragEnter", "dragOver", "drop"):
-        browser.command("Input.dispatchDragEvent", type=kind, x=100, y=100, data=data)
-    matches("dropped")
-    bench.show("page")
-    browser.command("Input.dispatchDragEvent", type="drop", x=100, y=100,
-                    data={"items": [], "files": [str(bench.folder / "duck")], "dragOperationsMask": 1})
-    matches("dropped as a folder")
+    for what, dropped in (("dropped", paths), ("dropped as a folder", [str(bench.folder / "duck")])):
+        bench.show("page")
+        for kind in ("dragEnter", "dragOver", "drop"):
+            browser.command("Input.dispatchDragEvent", type=kind, x=100, y=100,
+                            data={"items": [], "files": dropped, "dragOperationsMask": 1})
+        matches(what)
     return "named, chosen, dropped, dropped as a folder: the same picture"
 
 
@@ -404,7 +410,7 @@ def sizes(bench):
     browser = bench.browser
     for width, height, density in ((1280, 800, 1), (360, 640, 3), (640, 360, 2.5), (240, 320, 1), (2560, 1300, 1.5)):
         browser.resize(width, height, density, touch=density > 2)
-        bench.show("skin", "?play=0")
+        browser.open(f"{bench.server.address}/skin/?play=0")
         found = browser.run("""
             await new Promise((resolve) => requestAnimationFrame(() => requestAnimationFrame(resolve)));
             const view = document.getElementById("view");
@@ -412,12 +418,13 @@ def sizes(bench):
                 const box = item.getBoundingClientRect();
                 return box.width > 0 && (box.left < 0 || box.top < 0 || box.right > innerWidth || box.bottom > innerHeight);
             }).map((item) => item.id);
-            return { cut, size: [view.width, view.height] };""")
-        wanted = [round(width * density), round(height * density)]
+            return { cut, size: [view.width, view.height], shown: [view.clientWidth, view.clientHeight] };""")
+        wanted = [round(side * density) for side in found["shown"]]
+        expect(found["shown"][0] == width and found["shown"][1] > height / 2, f"{width} x {height}: {found['shown']} are left for the view")
         expect(not found["cut"], f"{width} x {height}: cut off: {found['cut']}")
         expect(found["size"] == wanted, f"{width} x {height} at {density}: {found['size']} pixels, not {wanted}")
     browser.resize(WIDTH, HEIGHT)
-    bench.show("skin", "?play=0")
+    browser.open(f"{bench.server.address}/skin/?play=0")
     nodes = browser.command("Accessibility.getFullAXTree")["nodes"]
     names = {}
     for node in nodes:

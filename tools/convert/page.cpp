@@ -20,7 +20,7 @@ const char* const PARTS[] = {"orv.wasm",  "orv.js",     "files.js",  "input.js",
 const char* const PLACES[] = {"../share/orv/web", "../../../web/page"}; // from the folder of the program
 
 /// What index.html has in place of a scene.
-const char* const NO_SCENE = R"(<script id="scene" type="application/json">{}</script>)";
+const char* const NO_SCENE = ">{}</script>";
 
 fs::path findFolder()
 {

@@ -12,7 +12,8 @@ const middle = (one, other) => ({ x: (one.x + other.x) / 2, y: (one.y + other.y)
 
 /// One pointer turns, with another button or shift it moves; two move and pinch.
 export function listenToHands(canvas, run) {
-    const pointers = new Map();
+    const pointers = new Map(); // where they are
+    let pinched = null; // where two were when they were followed last
     let tap = { time: -Infinity, x: 0, y: 0 };
 
     const place = (event) => {
@@ -20,18 +21,28 @@ export function listenToHands(canvas, run) {
         return { x: event.clientX - box.left, y: event.clientY - box.top, pans: event.shiftKey || (event.buttons & 6) !== 0 };
     };
     const moveOne = (from, to) => run(to.pans ? "pan" : "turn", to.x - from.x, to.y - from.y);
-    const moveTwo = (from, to, other) => {
-        const before = middle(from, other);
-        const after = middle(to, other);
+    // Both at once: one after the other would move what only comes nearer.
+    const followTwo = () => {
+        const now = [...pointers.values()];
+        if (!pinched || now.length !== 2)
+            return;
+        const before = middle(...pinched);
+        const after = middle(...now);
+        const factor = distance(...now) / distance(...pinched);
+        pinched = now;
         run("pan", after.x - before.x, after.y - before.y);
-        if (distance(from, other) > 1 && distance(to, other) > 1)
-            run("zoom", Math.log(distance(to, other) / distance(from, other)) / -Math.log(STEP));
+        if (Number.isFinite(factor) && factor > 0)
+            run("zoom", Math.log(factor) / -Math.log(STEP));
+    };
+    const countTwo = () => {
+        pinched = pointers.size === 2 ? [...pointers.values()] : null;
     };
 
     canvas.addEventListener("pointerdown", (event) => {
         canvas.focus({ preventScroll: true });
         canvas.setPointerCapture(event.pointerId);
         pointers.set(event.pointerId, place(event));
+        countTwo();
     });
     canvas.addEventListener("pointermove", (event) => {
         const from = pointers.get(event.pointerId);
@@ -39,13 +50,16 @@ export function listenToHands(canvas, run) {
             return;
         const to = place(event);
         pointers.set(event.pointerId, to);
-        const others = [...pointers].filter(([id]) => id !== event.pointerId).map(([, other]) => other);
-        if (others.length === 0)
+        if (pointers.size === 1)
             moveOne(from, to);
-        else if (others.length === 1)
-            moveTwo(from, to, others[0]);
+        else
+            requestAnimationFrame(followTwo); // of several in one frame the first does all
     });
-    const end = (event) => pointers.delete(event.pointerId);
+    const end = (event) => {
+        followTwo();
+        pointers.delete(event.pointerId);
+        countTwo();
+    };
     canvas.addEventListener("pointerup", end);
     canvas.addEventListener("pointercancel", end);
     canvas.addEventListener("pointerup", (event) => {

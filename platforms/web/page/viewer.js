@@ -22,6 +22,11 @@ function describe() {
     return JSON.parse(engine.UTF8ToString(call("orvDescribe")));
 }
 
+/// "1 part", "4,212 triangles"
+function count(number, word) {
+    return `${number.toLocaleString("en")} ${word}${number === 1 ? "" : "s"}`;
+}
+
 function fileName(path) {
     return path.slice(path.lastIndexOf("/") + 1);
 }
@@ -113,11 +118,11 @@ function showCounts() {
     if (find("counts").hidden || performance.now() - lastCounts < COUNTS_INTERVAL && moves)
         return;
     lastCounts = performance.now();
-    const number = (what) => call("orvCount", what).toLocaleString("en");
+    const counted = (what, word) => count(call("orvCount", what), word);
     find("counts").textContent = [
         moves ? `${frameTimes.length} frames a second` : "at rest",
         `${took.toFixed(1)} ms in the engine`,
-        `${number(0)} draws`, `${number(1)} triangles`, `${number(2)} calls of GL`, `${number(3)} uploads`,
+        counted(0, "draw"), counted(1, "triangle"), counted(2, "GL call"), counted(3, "upload"),
         `${canvas.width} x ${canvas.height} pixels`].join("\n");
 }
 
@@ -165,17 +170,17 @@ function show(model, scene) {
     const isOpen = state.scene !== null;
     const name = fileName(model);
     find("welcome").hidden = isOpen;
-    find("bar").hidden = !isOpen;
+    find("all").hidden = !isOpen;
+    find("bar").hidden = true;
+    canvas.classList.toggle("empty", !isOpen); // else it goes on showing what was there last
     find("name").textContent = isOpen ? name : "orv viewer";
     document.title = isOpen ? `${name} - orv viewer` : "orv viewer";
     if (!isOpen) {
         canvas.setAttribute("aria-label", "Nothing is open");
         call("orvClose");
-        canvas.hidden = true; // what it showed last
         showMessage(`${name} cannot be opened: it is damaged, or no scene.`, remarks);
         return;
     }
-    canvas.hidden = false;
     const errors = scene.remarks.filter((remark) => remark.error).length;
     if (errors > 0)
         showMessage(`${name} is open, but not all of it could be loaded. Files that are missing can be dropped here too.`, remarks);
@@ -185,6 +190,9 @@ function show(model, scene) {
     fillSelect(find("clip"), scene.clips.map((clip) => clip.name || "without a name"), scene.clips.length > 1);
     fillSelect(find("camera"), ["free view", ...scene.cameras.map((camera) => camera || "without a name")], scene.cameras.length > 0);
     find("transport").hidden = !scene.clips.some((clip) => clip.end > clip.start);
+    find("bar").hidden = find("transport").hidden && find("clip").hidden && find("camera").hidden;
+    fitCanvas(); // beside the bar, if there is one
+    call("orvFrameAll");
     labelView();
     say(`${name} is open.`);
     requestFrame();
@@ -192,7 +200,6 @@ function show(model, scene) {
 
 function labelView() {
     const scene = state.scene;
-    const count = (number, word) => `${number.toLocaleString("en")} ${word}${number === 1 ? "" : "s"}`;
     const camera = scene.cameras[call("orvGetCamera")];
     canvas.setAttribute("aria-label", `${fileName(state.model)}: ${count(scene.parts, "part")}, ` +
         `${count(scene.triangles, "triangle")}, ${camera ? `through camera ${camera}` : "seen freely"}`);
@@ -337,7 +344,7 @@ function run(command, ...values) {
 function fitCanvas() {
     const width = Math.max(1, Math.round(canvas.clientWidth * devicePixelRatio));
     const height = Math.max(1, Math.round(canvas.clientHeight * devicePixelRatio));
-    if (canvas.hidden || width === canvas.width && height === canvas.height)
+    if (width === canvas.width && height === canvas.height)
         return;
     call("orvSetSize", width, height);
     if (state.scene && !state.lost)
@@ -413,7 +420,7 @@ function listenToButtons() {
     find("camera").addEventListener("change", () => run("camera", find("camera").selectedIndex - 1 - call("orvGetCamera")));
 }
 
-/// What the address asks for beside the scene: ?camera=name&clip=name&time=seconds&play=0
+/// What the address asks for beside the scene: ?camera=name&clip=name&time=seconds&play=0&bars=0
 function applyAddress(wishes) {
     const clip = wishes.has("clip") ? state.scene.clips.findIndex(({ name }) => name === wishes.get("clip")) : 0;
     const camera = wishes.has("camera") ? state.scene.cameras.indexOf(wishes.get("camera")) : -1;
@@ -452,6 +459,7 @@ async function start() {
     fitCanvas();
     const given = JSON.parse(find("scene").textContent);
     const wishes = new URLSearchParams(location.search);
+    document.body.classList.toggle("bare", wishes.get("bars") === "0");
     const model = wishes.get("model") || encodeURIComponent(given.model || "");
     if (!model)
         return;
