@@ -16,11 +16,13 @@ foreach(room common maths pss facility render extra)
         PATTERN "detail/boundsrevision.h" EXCLUDE
         PATTERN "detail/digestmaker.h" EXCLUDE
         PATTERN "detail/eyes.h" EXCLUDE
+        PATTERN "detail/fonttables.h" EXCLUDE
         PATTERN "detail/formattedtext.h" EXCLUDE
         PATTERN "detail/littleendian.h" EXCLUDE
         PATTERN "detail/loadscope.h" EXCLUDE
         PATTERN "detail/logbudget.h" EXCLUDE
-        PATTERN "detail/textstatement.h" EXCLUDE)
+        PATTERN "detail/textstatement.h" EXCLUDE
+        PATTERN "detail/utf8.h" EXCLUDE)
 endforeach()
 
 set(package ${CMAKE_INSTALL_LIBDIR}/cmake/orv)

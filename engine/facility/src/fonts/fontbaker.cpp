@@ -1,6 +1,6 @@
 #include "fontbaker.h"
 
-#include "fonttables.h"
+#include "orv/detail/fonttables.h"
 
 // The one place where stb_truetype becomes code: everything static. Its assertions must not stop the program; what
 // they ask for of the file is made sure of before the file gets there.

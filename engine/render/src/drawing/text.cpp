@@ -1,5 +1,7 @@
 #include "orv/text.h"
 
+#include "orv/detail/utf8.h"
+
 #include "orv/appearance.h"
 #include "orv/assetcachepool.h"
 #include "orv/indexbuffercache.h"
@@ -22,46 +24,13 @@ namespace orv
 namespace
 {
 
-/// Takes one code point off the start of a text that is not empty.
-/// @return -1 for what is not UTF-8, of which as much goes as could have been the start of a code point.
-int readCodePoint(std::string_view& text)
-{
-    const auto first = static_cast<unsigned char>(text.front());
-    text.remove_prefix(1);
-    if (first < 0x80)
-        return first;
-    if (first < 0xC2 || first > 0xF4) // followers, longer forms of ASCII, beyond the last code point
-        return -1;
-
-    const int followers = first < 0xE0 ? 1 : (first < 0xF0 ? 2 : 3);
-    int code = first & (0x3F >> followers);
-    for (int i = 0; i < followers; ++i)
-    {
-        const int next = text.empty() ? 0 : static_cast<unsigned char>(text.front());
-        // The first follower also tells longer forms, surrogates and what is beyond the last code point.
-        const int least = i > 0 ? 0x80 : (first == 0xE0 ? 0xA0 : (first == 0xF0 ? 0x90 : 0x80));
-        const int most = i > 0 ? 0xBF : (first == 0xED ? 0x9F : (first == 0xF4 ? 0x8F : 0xBF));
-        if (next < least || next > most)
-            return -1;
-        code = code << 6 | (next & 0x3F);
-        text.remove_prefix(1);
-    }
-    return code;
-}
-
-/// What draws nothing: negative, and control characters, for some of which fonts have a glyph.
-bool isControl(int c)
-{
-    return c < 0x20 || (c >= 0x7F && c < 0xA0);
-}
-
 float getLineWidth(const Font& font, std::string_view line)
 {
     float width = 0.0f;
     while (!line.empty())
     {
-        const int c = readCodePoint(line);
-        width += isControl(c) ? 0.0f : font.getCharacterData(c).xadvance;
+        const int c = detail::readCodePoint(line);
+        width += detail::isControl(c) ? 0.0f : font.getCharacterData(c).xadvance;
     }
     return width;
 }
@@ -70,20 +39,6 @@ void applyColour(Appearance& appearance, const Colour4f& colour)
 {
     appearance.setProperty("M_DIFFUSE_COLOUR", Vector4f(colour.r, colour.g, colour.b, 1.0f));
     appearance.setProperty("M_OPACITY", colour.a);
-}
-
-/// Calls use(line) for every line, the empty one after a last "\n" included.
-template <class Use>
-void forEachLine(std::string_view text, const Use& use)
-{
-    while (true)
-    {
-        const std::size_t end = text.find('\n');
-        use(text.substr(0, end));
-        if (end == std::string_view::npos)
-            return;
-        text.remove_prefix(end + 1);
-    }
 }
 
 } // namespace
@@ -124,12 +79,12 @@ Vector2f Text::measure(const Font& font, const char* utf8)
     if (!utf8 || !*utf8)
         return {};
     Vector2f size(0.0f, std::ceil(font.getAscent()) + std::ceil(font.getDescent()) - getLineHeight(font));
-    forEachLine(utf8,
-                [&](std::string_view line)
-                {
-                    size.x = std::max(size.x, getLineWidth(font, line));
-                    size.y += getLineHeight(font);
-                });
+    detail::forEachLine(utf8,
+                        [&](std::string_view line)
+                        {
+                            size.x = std::max(size.x, getLineWidth(font, line));
+                            size.y += getLineHeight(font);
+                        });
     return size;
 }
 
@@ -138,12 +93,12 @@ void Text::add(const char* utf8, float x, float y, Alignment alignment)
     if (!m_font || !utf8)
         return;
     float top = std::round(y);
-    forEachLine(utf8,
-                [&](std::string_view line)
-                {
-                    addLine(line, x, top, alignment);
-                    top += getLineHeight(*m_font);
-                });
+    detail::forEachLine(utf8,
+                        [&](std::string_view line)
+                        {
+                            addLine(line, x, top, alignment);
+                            top += getLineHeight(*m_font);
+                        });
 }
 
 void Text::addLine(std::string_view line, float x, float top, Alignment alignment)
@@ -155,8 +110,8 @@ void Text::addLine(std::string_view line, float x, float top, Alignment alignmen
     const float baseline = top + std::ceil(m_font->getAscent());
     while (!line.empty())
     {
-        const int c = readCodePoint(line);
-        if (isControl(c))
+        const int c = detail::readCodePoint(line);
+        if (detail::isControl(c))
             continue;
         const Font::CharacterData& data = m_font->getCharacterData(c);
         if (data.x1 > data.x0 && data.y1 > data.y0)
