@@ -29,9 +29,9 @@ set(package ${CMAKE_INSTALL_LIBDIR}/cmake/orv)
 install(EXPORT orvTargets NAMESPACE orv:: DESTINATION ${package} COMPONENT development)
 file(RELATIVE_PATH toolsFolder /${package} /${CMAKE_INSTALL_BINDIR})
 file(CONFIGURE OUTPUT orvConfig.cmake @ONLY CONTENT
-"# find_package(orv) gives the target orv::orv, and orv_add_scenes for models (see orvScenes.cmake). Nothing has to be
-# found along with it: programs that call OpenGL ES or EGL themselves link those themselves. A source that derives from
-# a class of the library is compiled with -fno-rtti, as the library is.
+"# find_package(orv) gives the target orv::orv, which brings GLESv2 along, and orv_add_scenes for models (see
+# orvScenes.cmake). Nothing has to be found along with it: programs that call EGL themselves link that themselves. A
+# source that derives from a class of the library is compiled with -fno-rtti, as the library is.
 include(\"\${CMAKE_CURRENT_LIST_DIR}/orvTargets.cmake\")
 include(\"\${CMAKE_CURRENT_LIST_DIR}/orvScenes.cmake\")
 set(ORV_TOOLS_FOLDER \"\${CMAKE_CURRENT_LIST_DIR}/@toolsFolder@\")
@@ -51,7 +51,7 @@ Name: orv
 Description: Compact real-time 3D engine for OpenGL ES 2.0; its headers need C++20
 Version: @PROJECT_VERSION@
 Cflags: -I\${includedir}
-Libs: -L\${libdir} -lorvextra -lorv @ORV_STATIC_LIBS@
+Libs: -L\${libdir} -lorvextra -lorv -lGLESv2 @ORV_STATIC_LIBS@
 ")
 install(FILES ${CMAKE_CURRENT_BINARY_DIR}/orv.pc DESTINATION ${CMAKE_INSTALL_LIBDIR}/pkgconfig COMPONENT development)
 
@@ -78,9 +78,10 @@ set(CPACK_PACKAGE_DESCRIPTION_SUMMARY "compact real-time 3D engine for OpenGL ES
 set(CPACK_PACKAGING_INSTALL_PREFIX /usr)
 set(CPACK_STRIP_FILES ON)
 set(CPACK_COMPONENTS_ALL development)
+set(CPACK_DEBIAN_DEVELOPMENT_PACKAGE_DEPENDS libgles-dev) # orvextra is linked with it
 if(NOT ORV_STATIC)
     list(APPEND CPACK_COMPONENTS_ALL runtime)
-    set(CPACK_DEBIAN_DEVELOPMENT_PACKAGE_DEPENDS "liborv${PROJECT_VERSION_MAJOR} (= ${PROJECT_VERSION})")
+    string(PREPEND CPACK_DEBIAN_DEVELOPMENT_PACKAGE_DEPENDS "liborv${PROJECT_VERSION_MAJOR} (= ${PROJECT_VERSION}), ")
 endif()
 if(TARGET orv_convert)
     list(APPEND CPACK_COMPONENTS_ALL tools)

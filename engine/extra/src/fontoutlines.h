@@ -1,0 +1,50 @@
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+#include <memory>
+#include <vector>
+
+namespace orv::detail
+{
+
+class FontTables;
+
+/// A glyph at one size, drawn.
+struct GlyphPicture
+{
+    int width = 0; ///< pixels; 0 for a blank
+    int height = 0;
+    int x = 0; ///< where the upper left corner goes, seen from the pen on the baseline; y counts downwards
+    int y = 0;
+    std::vector<unsigned char> ink; ///< width x height, top row first: 255 is full
+};
+
+/// Draws the glyphs of a font whose tables have been checked; each glyph is checked when it is asked for.
+///
+/// What one glyph takes is bounded by the pixels that it has.
+class FontOutlines
+{
+public:
+    /// @param file    borrowed as long as this is.
+    /// @param tables  of this file, without a fault; copied.
+    /// @param start   of the font in its file.
+    FontOutlines(const unsigned char* file, const FontTables& tables, std::size_t start);
+    ~FontOutlines();
+
+    /// False if the rasteriser does not take the file.
+    bool isValid() const { return m_valid; }
+
+    /// @param scale    pixels for a unit of the font.
+    /// @param mostSide  pixels that a picture may have each way.
+    /// @param picture   filled in; its memory is used again.
+    /// @return null, or why the glyph cannot be drawn.
+    const char* draw(uint32_t glyph, float scale, int mostSide, GlyphPicture& picture) const;
+
+private:
+    struct Rasteriser;
+    std::unique_ptr<Rasteriser> m_rasteriser;
+    bool m_valid;
+};
+
+} // namespace orv::detail

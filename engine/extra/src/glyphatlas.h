@@ -1,0 +1,150 @@
+#pragma once
+
+#include "orv/colour.h"
+#include "orv/matrix.h"
+#include "orv/shaderuniform.h"
+#include "orv/sharedptr.h"
+
+#include <cstdint>
+#include <unordered_map>
+#include <vector>
+
+namespace orv
+{
+
+class Appearance;
+class ShaderProgram;
+class Texture2D;
+class Texture2DCache;
+
+namespace detail
+{
+
+struct GlyphPicture;
+
+/// Blended, seen from both sides, without a depth of its own; the texture's alpha is the ink.
+/// @return empty where memory lacks (logged).
+SharedPtr<Appearance> makeInkAppearance(const SharedPtr<ShaderProgram>& program,
+                                        const SharedPtr<Texture2D>& ink, const Colour4f& colour);
+
+/// Pictures of glyphs in square textures, the pages.
+///
+/// A page is filled by rows of square cells, each row as high as its cells, which come in few sizes. Where there is room for
+/// no more, whatever was used the longest ago is forgotten: a glyph in a cell of the size that is wanted, or a page, if
+/// all of it was used before that glyph. Nothing that was used since the last beginUse() is forgotten.
+/// A page that somebody else holds the texture of keeps its glyphs; instead of being cleared it is let go, and is theirs.
+class GlyphAtlas
+{
+public:
+    static constexpr uint32_t NONE = UINT32_MAX;
+
+    struct Entry
+    {
+        uint64_t key = 0;
+        uint64_t lastUse = 0;
+        uint64_t id = 0; ///< of this glyph in this place, never given again; 0: nothing is here
+        uint16_t page = 0;
+        uint16_t cell = 0;     ///< side of its cell
+        uint16_t x = 0, y = 0; ///< upper left corner, of cell and glyph
+        int16_t width = 0, height = 0;
+        int16_t offsetX = 0, offsetY = 0; ///< as GlyphPicture has them
+    };
+
+    /// What a page is drawn with over a frame; a colour and a projection for whoever draws next.
+    struct Look
+    {
+        SharedPtr<Appearance> appearance; ///< empty as long as there is no texture
+        SharedPtr<ShaderUniform<Matrix4f>> projection;
+        Colour4f colour;
+    };
+
+    GlyphAtlas(const SharedPtr<Texture2DCache>& textures, const SharedPtr<ShaderProgram>& program,
+               unsigned pageSize, unsigned mostPages);
+    ~GlyphAtlas();
+
+    int getPageSize() const { return m_pageSize; }
+    unsigned getPageCount() const { return unsigned(m_pages.size()); }
+    unsigned getGlyphCount() const { return unsigned(m_byKey.size()); }
+    uint64_t getDrawnCount() const { return m_lastId; } ///< pictures that were ever added
+
+    /// From here on everything may be forgotten that is not used again.
+    void beginUse() { ++m_use; }
+
+    /// @return the number of a glyph, which is used by that, or NONE.
+    uint32_t find(uint64_t key);
+
+    /// Adds a glyph that is not there, and uses it.
+    /// @param picture  not blank, and each side below that of a page.
+    /// @return NONE if everything there is room for is in use.
+    uint32_t add(uint64_t key, const GlyphPicture& picture);
+
+    const Entry& getEntry(uint32_t number) const { return m_entries[number]; }
+
+    /// Uses a glyph again. @return false if it has been forgotten since it had that id.
+    bool use(uint32_t number, uint64_t id)
+    {
+        Entry& entry = m_entries[number];
+        if (entry.id != id)
+            return false;
+        entry.lastUse = m_use;
+        m_pages[entry.page].lastUse = m_use;
+        return true;
+    }
+
+    /// Sends to GL what has been added. To be called before anything is drawn.
+    /// @param isTryingAgain  also what GL refused before.
+    void upload(bool isTryingAgain);
+
+    /// What GL refused, or lost with its context, has no appearance or draws nothing.
+    Look& getLook(unsigned page) { return m_pages[page].look; }
+
+    /// The page's texture, with mipmaps from here on; empty where GL has none. As long as somebody else holds it, its
+    /// glyphs stay.
+    SharedPtr<Texture2D> takeTexture(unsigned page);
+
+private:
+    struct Cell
+    {
+        uint16_t page, x, y;
+    };
+
+    struct Page
+    {
+        std::vector<unsigned char> ink; ///< what the texture shows, or will
+        SharedPtr<Texture2D> texture;
+        int ownShares = 0; ///< of the texture, while nobody else holds it
+        bool hasMipmaps = false;
+        bool isRefused = false;
+        int rowsEnd = 0;                    ///< below the last row of cells
+        int changedTop = 0, changedEnd = 0; ///< rows of pixels that GL does not have yet
+        uint64_t lastUse = 0;
+        Look look;
+    };
+
+    static bool isHeld(const Page& page);
+    bool findCell(int side, Cell& cell);
+    bool addRow(int side);
+    bool forget(int side);
+    uint32_t findOldest(int side) const;
+    unsigned findOldestPage() const;
+    void forgetEntry(uint32_t number);
+    void clearPage(unsigned number);
+    bool updateTexture(Page& page);
+    bool makeTexture(Page& page);
+    void draw(const Entry& entry, const GlyphPicture& picture);
+
+    SharedPtr<Texture2DCache> m_textures;
+    SharedPtr<ShaderProgram> m_program;
+    int m_pageSize;
+    unsigned m_mostPages;
+    uint64_t m_use = 1;
+    uint64_t m_lastId = 0;
+    std::vector<Page> m_pages;
+    std::vector<Entry> m_entries;
+    std::vector<uint32_t> m_freeEntries;
+    std::unordered_map<uint64_t, uint32_t> m_byKey;
+    std::unordered_map<int, std::vector<Cell>> m_freeCells; ///< by their side
+};
+
+} // namespace detail
+} // namespace orv

@@ -1,0 +1,58 @@
+#pragma once
+
+#include "glyphatlas.h"
+
+#include "orv/vertexarray.h"
+
+namespace orv
+{
+
+class AssetCachePool;
+class Mesh;
+class Solid;
+
+namespace detail
+{
+
+/// The glyphs of one page that one draw takes: a square for each, with room for more of them.
+///
+/// Over a frame they are in client memory, and used again: what there is no glyph for has no size. For a scene they go into
+/// buffers, once.
+class GlyphQuads
+{
+public:
+    /// @param count  that there is to be room for. Without memory (logged) there is none.
+    explicit GlyphQuads(unsigned count);
+    ~GlyphQuads();
+
+    unsigned getRoom() const { return m_room; }
+
+    /// Begins anew. @param count  that will be added, up to getRoom().
+    void start(unsigned page, unsigned count);
+    /// @param x,y  of its upper left corner; @param width,height  downwards and to the right of it, or else negative.
+    void add(const GlyphAtlas::Entry& entry, float pageSize, float x, float y, float width, float height);
+    bool isFull() const { return m_count == m_wanted; }
+    /// Hides what is left of the time before.
+    void end();
+
+    unsigned getPage() const { return m_page; }
+
+    /// What shows them over a frame, in client memory.
+    const SharedPtr<Solid>& getSolid() const { return m_solid; }
+
+    /// @return a mesh in buffers of the pool; the quads are of no use any more. Empty where memory lacks.
+    SharedPtr<Mesh> makeMesh(AssetCachePool& pool);
+
+private:
+    SharedPtr<VertexArray> m_positions;
+    SharedPtr<VertexArray> m_uvs;
+    SharedPtr<Solid> m_solid;
+    unsigned m_page = 0;
+    unsigned m_room = 0;
+    unsigned m_wanted = 0;
+    unsigned m_count = 0;
+    unsigned m_shown = 0; ///< of the time before
+};
+
+} // namespace detail
+} // namespace orv
