@@ -13,12 +13,16 @@
 #include "orv/detail/digestmaker.h"
 #include "orv/detail/programattrib.h"
 #include "orv/fontcache.h"
+#include "orv/fontface.h"
 #include "orv/glo.h"
+#include "orv/glyphcache.h"
 #include "orv/light.h"
 #include "orv/loadlimits.h"
 #include "orv/memorystream.h"
+#include "orv/rendercontext.h"
 #include "orv/shaderprogramcache.h"
 #include "orv/solid.h"
+#include "orv/textlayout.h"
 #include "orv/texture2dcache.h"
 #include "orv/texturecubecache.h"
 #include "orv/vertexbuffercache.h"
@@ -196,9 +200,45 @@ bool loadScene(Session& session, const Bytes&, std::string& fault)
     return true;
 }
 
-bool loadFont(Session& session, const Bytes&, std::string& fault)
+/// Every glyph of some characters and of the first numbers, at two sizes, on pages that hold few of them.
+void drawFace(Session& session, const Bytes& file, std::string& fault)
+{
+    MemoryStream stream(file.data(), int(file.size()));
+    const FontFace::Ptr face = FontFace::load(stream, "file.ttf");
+    if (!face)
+        return;
+    const auto cache = makeShared<GlyphCache>(session.pool(), GlyphCacheOptions{64, 2});
+    cache->addFont(face);
+    const auto text = makeShared<TextLayout>(session.pool(), cache, Colour4f::WHITE);
+    for (const float size : {16.0f, 60.0f})
+    {
+        std::string ascii;
+        for (char c = ' '; c < 127; ++c)
+            ascii += c;
+        text->add((ascii + "\xE4\xB8\x96\xF0\x9F\x98\x80").c_str(), size, 0.0f, 0.0f);
+        const Vector2f room = text->measure(ascii.c_str(), size);
+        if (!std::isfinite(room.x + room.y))
+            fault = "a text without end";
+    }
+    for (unsigned i = 0; i < 64; ++i)
+    {
+        const TextLayout::Glyph glyph = {0, i, 0.0f, 0.0f};
+        if (i < face->getGlyphCount())
+            text->addGlyphs(&glyph, 1, 30.0f, 0.0f, 0.0f);
+        if (face->findGlyph(i * 331) >= std::max(1u, face->getGlyphCount()))
+            fault = "a glyph that is not there";
+    }
+    const auto context = makeShared<RenderContext>();
+    context->setViewport(0, 0, 64, 64);
+    text->draw(*context);
+    if (cache->getPageCount() > 2)
+        fault = "more pages than allowed";
+}
+
+bool loadFont(Session& session, const Bytes& file, std::string& fault)
 {
     const Font::Ptr font = session.pool().getFontCache()->get("file.ttf;16");
+    drawFace(session, file, fault);
     if (!font)
         return false;
     const float height = float(font->getTexture()->getHeight());

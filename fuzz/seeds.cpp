@@ -417,8 +417,32 @@ Bytes makeCharacterMap(int format)
     }
 }
 
+/// Glyph 1 followed by 2, and 2 by 1.
+Bytes makeKerning()
+{
+    return join({bigs({0, 1, 0, 14 + 12, 1, 2, 12, 1, 0}), bigs({1, 2, -50, 2, 1, 30})});
+}
+
+/// The same by a list of pairs, and by classes behind an extension.
+Bytes makePositions()
+{
+    const Bytes listed =
+        join({bigs({2, 0, 1, 8}), bigs({1, 12, 4, 0, 1, 18}), bigs({1, 1, 1}), bigs({1, 2, -50})});
+    const Bytes classes = join({bigs({2, 32, 5, 0, 42, 50, 2, 2}), bigs({0, 0, 0, 0, 0, 0, 0, -30}),
+                                bigs({2, 1, 2, 2, 0}), bigs({1, 2, 1, 1}), bigs({2, 1, 1, 1, 1})});
+    const Bytes extended = join({bigs({9, 0, 1, 8}), bigs({1, 2}), big(8), classes});
+    const Bytes features = join({bigs({1}), toBytes("kern"), bigs({8}), bigs({0, 2, 0, 1})});
+    const int lookups = 10 + int(features.size());
+    return join(
+        {bigs({1, 0, 0, 10, lookups}), features, bigs({2, 6, 6 + int(listed.size())}), listed, extended});
+}
+
+using Tables = std::vector<std::pair<const char*, Bytes>>;
+
 /// A triangle, a shape with curves, and one made of both.
-Bytes makeFont(int mapFormat)
+/// @param more   further tables.
+/// @param start  of the font in its file.
+Bytes makeFont(int mapFormat, const Tables& more = {}, uint32_t start = 0)
 {
     const Bytes triangle =
         join({bigs({1, 0, 0, 500, 700, 2, 0}), {1, 1, 1}, bigs({0, 500, -250, 0, 0, 700}), {0}});
@@ -442,7 +466,7 @@ Bytes makeFont(int mapFormat)
     put(hhea, 4, 800);
     put(hhea, 6, -200);
     put(hhea, 34, 2); // glyphs with a width of their own
-    const std::vector<std::pair<const char*, Bytes>> tables = {
+    Tables tables = {
         {"cmap", join({bigs({0, 1, 3, mapFormat == 12 ? 10 : 1}), big(12), makeCharacterMap(mapFormat)})},
         {"glyf", join({triangle, curves, both})},
         {"head", head},
@@ -451,11 +475,12 @@ Bytes makeFont(int mapFormat)
         {"loca", bigs({0, 0, first / 2, (first + second) / 2, (first + second + third) / 2})},
         {"maxp", join({big(0x00010000), bigs({4})})},
     };
+    tables.insert(tables.end(), more.begin(), more.end());
     Bytes directory = join({big(0x00010000), bigs({int(tables.size()), 0, 0, 0})});
     Bytes data;
     for (const auto& [tag, table] : tables)
     {
-        const uint32_t offset = uint32_t(12 + 16 * tables.size() + data.size());
+        const uint32_t offset = start + uint32_t(12 + 16 * tables.size() + data.size());
         directory = join({directory, toBytes(tag), big(0), big(offset), big(uint32_t(table.size()))});
         data = join({data, table});
     }
@@ -466,6 +491,11 @@ void addFonts(std::vector<Seed>& seeds)
 {
     for (const int format : {0, 4, 6, 12})
         seeds.push_back({"font", "map" + std::to_string(format), makeFont(format), "", true});
+    seeds.push_back({"font", "kern", makeFont(4, {{"kern", makeKerning()}}), "", true});
+    seeds.push_back({"font", "gpos", makeFont(4, {{"GPOS", makePositions()}}), "", true});
+    seeds.push_back({"font", "collection",
+                     join({toBytes("ttcf"), big(0x00010000), big(1), big(16), makeFont(12, {}, 16)}),
+                     "Error reading Font \"file.ttf\"", false});
     seeds.push_back({"font", "none", {}, "Error reading Font \"file.ttf\"", false});
 }
 
