@@ -46,8 +46,7 @@ bool GlyphCache::addFont(const FontFace::Ptr& face)
 {
     if (!face || m_fonts.size() >= MOST_FONTS)
     {
-        ORV_LOG_ERROR("A glyph cache has %u fonts and takes no %s", getFontCount(),
-                      face ? "more" : "empty one");
+        ORV_LOG_ERROR("A glyph cache takes up to %u fonts, and no empty one", MOST_FONTS);
         return false;
     }
     m_fonts.push_back(face);
