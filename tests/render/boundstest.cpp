@@ -5,6 +5,7 @@
 #include "orv/appearance.h"
 #include "orv/mesh.h"
 #include "orv/meshgeometry.h"
+#include "orv/meshrays.h"
 #include "orv/picking.h"
 #include "orv/ray.h"
 #include "orv/scenebounds.h"
@@ -137,8 +138,8 @@ TEST_F(BoundsTest, subtreesReachAsFarAsWhatIsInThem)
     const auto cube = createCube(*m_pool, Vector2f(1, 1));
     cube->setParent(glo->getTopNode());
     cube->setScale(Vector3f(1, 2, 1));
-    EXPECT_EQ(Vector3f(1, 1, 1), cube->getBounds().box.highest);
-    EXPECT_NEAR(std::sqrt(3.0f), cube->getBounds().radius, 1e-5f);
+    EXPECT_EQ(Vector3f(1, 1, 1), getOwnBounds(*cube).box.highest);
+    EXPECT_NEAR(std::sqrt(3.0f), getOwnBounds(*cube).radius, 1e-5f);
     top.setPosition(Vector3f(0, 0, 100));
     bounds = getWorldBounds(top, &unknown);
     expectNear(Vector3f(-1, -2, 99), bounds.box.lowest, "lowest");
@@ -146,7 +147,7 @@ TEST_F(BoundsTest, subtreesReachAsFarAsWhatIsInThem)
 
     const auto strange = makeShared<Solid>(makeShared<Mesh>(MeshHeader(), nullptr, nullptr), nullptr);
     strange->setParent(glo->getTopNode());
-    EXPECT_FALSE(strange->getBounds().isKnown());
+    EXPECT_FALSE(getOwnBounds(*strange).isKnown());
     EXPECT_EQ(bounds.radius, getWorldBounds(top, &unknown).radius);
     EXPECT_EQ(1, unknown);
     EXPECT_FALSE(getWorldBounds(*makeShared<SceneNode>()).isKnown());
@@ -220,10 +221,10 @@ TEST_F(BoundsTest, raysFindTheNearestTriangle)
         if (i % 11 == 0)
             ray.position.x = vertices->places[size_t(i) % vertices->places.size()].x;
         const TriangleSides sides = TriangleSides(i % 4);
-        MeshGeometry::Hit found, expected;
+        MeshHit found, expected;
         found.distance = expected.distance = i % 3 ? std::numeric_limits<float>::max() : 10.0f;
-        const bool isMet = geometry.meet(ray, sides, vertices->places, expected);
-        EXPECT_EQ(isMet, geometry.meet(ray, sides, found)) << i;
+        const bool isMet = meet(geometry, ray, sides, vertices->places, expected);
+        EXPECT_EQ(isMet, meet(geometry, ray, sides, found)) << i;
         EXPECT_EQ(expected.distance, found.distance) << i;
         EXPECT_EQ(expected.triangle, found.triangle) << i;
         metCount += isMet;

@@ -211,7 +211,7 @@ void Markings::addBounds(Stage& stage)
     forEachSolid(stage.getScene(),
                  [&](const Solid& solid)
                  {
-                     const orv::Box bounds = solid.getBounds().box;
+                     const orv::Box bounds = orv::getOwnBounds(solid).box;
                      if (!bounds.isEmpty() && getDerivedFlags(solid, SceneNode::VISIBLE))
                          m_inside->addBox(bounds.lowest, bounds.highest, solid.getWorldTransform(),
                                           BOUNDS_COLOUR);

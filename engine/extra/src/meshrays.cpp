@@ -1,6 +1,7 @@
-// How rays find the triangles of a mesh; the rest of the class is in meshgeometry.cpp.
+#include "orv/meshrays.h"
 
 #include "orv/meshgeometry.h"
+#include "orv/ray.h"
 
 #include <algorithm>
 #include <cmath>
@@ -17,7 +18,7 @@ constexpr uint32_t FEW = 4; ///< triangles that are not worth halving
 
 /// @param hit  changes to this triangle if the ray meets it sooner than what it holds, or as soon and it comes first.
 void meetTriangle(const Ray& ray, const Vector3f& a, const Vector3f& b, const Vector3f& c,
-                  TriangleSides sides, uint32_t triangle, MeshGeometry::Hit& hit, bool& isMet)
+                  TriangleSides sides, uint32_t triangle, MeshHit& hit, bool& isMet)
 {
     const Vector3f ab = b - a;
     const Vector3f ac = c - a;
@@ -82,25 +83,92 @@ private:
     float m_reciprocal[3];
 };
 
+/// Puts the triangles of a geometry into its tree.
+class TreeMaker
+{
+public:
+    explicit TreeMaker(const MeshGeometry& geometry)
+        : m_places(geometry.getVertices().places)
+        , m_triangles(geometry.getTriangles())
+        , m_tree(geometry.getTree())
+        , m_centres(m_triangles.size() / 3)
+    {
+        const uint32_t count = uint32_t(m_centres.size());
+        m_tree.order.resize(count);
+        std::iota(m_tree.order.begin(), m_tree.order.end(), 0u);
+        for (uint32_t i = 0; i < count; ++i)
+        {
+            const Vector3f centre = findBox(i).getCentre();
+            if (std::isfinite(centre.x + centre.y + centre.z)) // else there is no order of them
+                m_centres[i] = centre;
+        }
+        m_tree.nodes.reserve(count);
+        split(0, count);
+    }
+
+private:
+    Box findBox(uint32_t triangle) const
+    {
+        Box box;
+        for (std::size_t i = 0; i < 3; ++i)
+            box.add(m_places[m_triangles[std::size_t(triangle) * 3 + i]]);
+        return box;
+    }
+
+    /// By the middle one of the triangles, along the longest side of the box around their centres.
+    void split(uint32_t first, uint32_t count)
+    {
+        const std::size_t index = m_tree.nodes.size();
+        m_tree.nodes.push_back({Box(), first, count});
+        Box places;
+        for (uint32_t i = first; i < first + count; ++i)
+        {
+            m_tree.nodes[index].box.add(findBox(m_tree.order[i]));
+            places.add(m_centres[m_tree.order[i]]);
+        }
+        if (count <= FEW)
+            return;
+        const Vector3f size = places.highest - places.lowest;
+        const int axis = size.x >= size.y && size.x >= size.z ? 0 : size.y >= size.z ? 1 : 2;
+        const auto begin = m_tree.order.begin() + first;
+        const uint32_t half = count / 2;
+        std::nth_element(begin, begin + half, begin + count,
+                         [&](uint32_t a, uint32_t b)
+                         { return m_centres[a].data()[axis] < m_centres[b].data()[axis]; });
+        split(first, half);
+        m_tree.nodes[index].first = uint32_t(m_tree.nodes.size());
+        m_tree.nodes[index].count = 0;
+        split(first + half, count - half);
+    }
+
+    const std::vector<Vector3f>& m_places;
+    const std::vector<uint32_t>& m_triangles;
+    detail::TriangleTree& m_tree;
+    std::vector<Vector3f> m_centres;
+};
+
 } // namespace
 
-bool MeshGeometry::meet(const Ray& ray, TriangleSides sides, const std::vector<Vector3f>& places,
-                        Hit& hit) const
+bool meet(const MeshGeometry& geometry, const Ray& ray, TriangleSides sides,
+          const std::vector<Vector3f>& places, MeshHit& hit)
 {
+    const std::vector<uint32_t>& triangles = geometry.getTriangles();
     bool isMet = false;
-    for (std::size_t i = 0; sides != TriangleSides::NONE && i < m_triangles.size(); i += 3)
-        meetTriangle(ray, places[m_triangles[i]], places[m_triangles[i + 1]], places[m_triangles[i + 2]],
-                     sides, uint32_t(i / 3), hit, isMet);
+    for (std::size_t i = 0; sides != TriangleSides::NONE && i < triangles.size(); i += 3)
+        meetTriangle(ray, places[triangles[i]], places[triangles[i + 1]], places[triangles[i + 2]], sides,
+                     uint32_t(i / 3), hit, isMet);
     return isMet;
 }
 
-bool MeshGeometry::meet(const Ray& ray, TriangleSides sides, Hit& hit) const
+bool meet(const MeshGeometry& geometry, const Ray& ray, TriangleSides sides, MeshHit& hit)
 {
-    if (sides == TriangleSides::NONE || m_triangles.empty())
+    const std::vector<uint32_t>& triangles = geometry.getTriangles();
+    if (sides == TriangleSides::NONE || triangles.empty())
         return false;
-    if (m_nodes.empty())
-        sort();
-    const std::vector<Vector3f>& places = m_vertices->places;
+    const detail::TriangleTree& tree = geometry.getTree();
+    if (tree.nodes.empty())
+        TreeMaker maker(geometry);
+    const std::vector<Vector3f>& places = geometry.getVertices().places;
     const BoxRay boxRay(ray);
     bool isMet = false;
     uint32_t waiting[64]; // one for each level at most, and halves of halves have no more than 32
@@ -109,74 +177,24 @@ bool MeshGeometry::meet(const Ray& ray, TriangleSides sides, Hit& hit) const
     while (count > 0)
     {
         const uint32_t index = waiting[--count];
-        const Node& node = m_nodes[index];
+        const detail::TriangleTree::Node& node = tree.nodes[index];
         if (!(boxRay.enter(node.box, hit.distance) < std::numeric_limits<float>::infinity()))
             continue;
         for (uint32_t i = node.first; i < node.first + node.count; ++i)
         {
-            const uint32_t* const corners = &m_triangles[std::size_t(m_order[i]) * 3];
-            meetTriangle(ray, places[corners[0]], places[corners[1]], places[corners[2]], sides, m_order[i],
-                         hit, isMet);
+            const uint32_t* const corners = &triangles[std::size_t(tree.order[i]) * 3];
+            meetTriangle(ray, places[corners[0]], places[corners[1]], places[corners[2]], sides,
+                         tree.order[i], hit, isMet);
         }
         if (node.count > 0)
             continue;
         // The nearer half first: what it has may do without the other.
-        const bool isFirstNearer = boxRay.enter(m_nodes[index + 1].box, hit.distance) <=
-                                   boxRay.enter(m_nodes[node.first].box, hit.distance);
+        const bool isFirstNearer = boxRay.enter(tree.nodes[index + 1].box, hit.distance) <=
+                                   boxRay.enter(tree.nodes[node.first].box, hit.distance);
         waiting[count++] = isFirstNearer ? node.first : index + 1;
         waiting[count++] = isFirstNearer ? index + 1 : node.first;
     }
     return isMet;
-}
-
-Box MeshGeometry::findBox(uint32_t triangle) const
-{
-    Box box;
-    for (std::size_t i = 0; i < 3; ++i)
-        box.add(m_vertices->places[m_triangles[std::size_t(triangle) * 3 + i]]);
-    return box;
-}
-
-void MeshGeometry::sort() const
-{
-    const uint32_t count = uint32_t(m_triangles.size() / 3);
-    m_order.resize(count);
-    std::iota(m_order.begin(), m_order.end(), 0u);
-    std::vector<Vector3f> centres(count);
-    for (uint32_t i = 0; i < count; ++i)
-    {
-        const Vector3f centre = findBox(i).getCentre();
-        if (std::isfinite(centre.x + centre.y + centre.z)) // else there is no order of them
-            centres[i] = centre;
-    }
-    m_nodes.reserve(count);
-    split(0, count, centres);
-}
-
-/// By the middle one of the triangles, along the longest side of the box around their centres.
-void MeshGeometry::split(uint32_t first, uint32_t count, const std::vector<Vector3f>& centres) const
-{
-    const std::size_t index = m_nodes.size();
-    m_nodes.push_back({Box(), first, count});
-    Box places;
-    for (uint32_t i = first; i < first + count; ++i)
-    {
-        m_nodes[index].box.add(findBox(m_order[i]));
-        places.add(centres[m_order[i]]);
-    }
-    if (count <= FEW)
-        return;
-    const Vector3f size = places.highest - places.lowest;
-    const int axis = size.x >= size.y && size.x >= size.z ? 0 : size.y >= size.z ? 1 : 2;
-    const auto begin = m_order.begin() + first;
-    const uint32_t half = count / 2;
-    std::nth_element(begin, begin + half, begin + count,
-                     [&](uint32_t a, uint32_t b)
-                     { return centres[a].data()[axis] < centres[b].data()[axis]; });
-    split(first, half, centres);
-    m_nodes[index].first = uint32_t(m_nodes.size());
-    m_nodes[index].count = 0;
-    split(first + half, count - half, centres);
 }
 
 } // namespace orv

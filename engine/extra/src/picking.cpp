@@ -3,6 +3,7 @@
 #include "orv/appearance.h"
 #include "orv/mesh.h"
 #include "orv/meshgeometry.h"
+#include "orv/meshrays.h"
 #include "orv/ray.h"
 #include "orv/scenebounds.h"
 #include "orv/scenenodevisitor.h"
@@ -42,11 +43,11 @@ public:
     using SceneNodeVisitor::visit;
     void visit(Solid* solid) override
     {
-        MeshGeometry::Hit hit;
+        MeshHit hit;
         hit.distance = std::numeric_limits<float>::max();
         const MeshGeometry* const geometry =
             solid->getMesh() ? solid->getMesh()->getGeometry().get() : nullptr;
-        if (!geometry || !solid->getAppearance() || !meet(*solid, *geometry, hit))
+        if (!geometry || !solid->getAppearance() || !meetSolid(*solid, *geometry, hit))
             return;
         hits.push_back({SharedPtr<Solid>(solid), hit.triangle,
                         m_ray.position + m_ray.direction * hit.distance,
@@ -57,17 +58,17 @@ public:
 
 private:
     /// A mesh without joints is met in its own space, where its triangles are sorted.
-    bool meet(const Solid& solid, const MeshGeometry& geometry, MeshGeometry::Hit& hit)
+    bool meetSolid(const Solid& solid, const MeshGeometry& geometry, MeshHit& hit)
     {
         const Appearance& appearance = *solid.getAppearance();
         const bool isMirrored = solid.turnsWinding(appearance.getShaderProgram().get());
         const Matrix4f toMesh = inverse(solid.getWorldTransform());
         const bool isFlat = toMesh == Matrix4f(); // it has no inverse
-        if (!solid.isSkinned() && !isFlat)
-            return geometry.meet(transform(m_ray, toMesh), getDrawnSides(appearance, isMirrored, isMirrored),
-                                 hit);
+        if (!isMovedByJoints(solid) && !isFlat)
+            return meet(geometry, transform(m_ray, toMesh), getDrawnSides(appearance, isMirrored, isMirrored),
+                        hit);
         placeVertices(solid, m_places);
-        return geometry.meet(m_ray, getDrawnSides(appearance, isMirrored, false), m_places, hit);
+        return meet(geometry, m_ray, getDrawnSides(appearance, isMirrored, false), m_places, hit);
     }
 
     const Ray& m_ray;

@@ -1,5 +1,7 @@
 #include "orv/scenebounds.h"
 
+#include "solidcorners.h"
+
 #include "orv/appearance.h"
 #include "orv/mesh.h"
 #include "orv/meshgeometry.h"
@@ -44,29 +46,43 @@ const Matrix4f& getJoint(const std::vector<Matrix4f>& joints, size_t number)
     return joints[std::min(number, joints.size() - 1)];
 }
 
-/// Corners of boxes in the world around all that a solid draws.
-void addCorners(const Solid& solid, const Mesh& mesh, std::vector<Vector3f>& places)
+} // namespace
+
+namespace detail
 {
-    if (!solid.isSkinned())
+
+void addBoundsCorners(const Solid& solid, std::vector<Vector3f>& corners)
+{
+    if (!solid.getMesh())
+        return;
+    const Mesh& mesh = *solid.getMesh();
+    if (!isMovedByJoints(solid))
     {
         if (mesh.getBounds().isKnown())
-            addCorners(mesh.getBounds().box, solid.getWorldTransform(), places);
+            addCorners(mesh.getBounds().box, solid.getWorldTransform(), corners);
         return;
     }
-    const std::vector<Matrix4f> joints = getJointTransforms(solid);
+    const int last =
+        std::min(solid.getJointCount(), Solid::MAX_JOINTS) - 1; // stands in for those that there are not
     for (size_t i = 0; i < mesh.getJointBounds().size(); ++i)
     {
         if (mesh.getJointBounds()[i].isKnown())
-            addCorners(mesh.getJointBounds()[i].box, getJoint(joints, i), places);
+            addCorners(mesh.getJointBounds()[i].box, solid.getJointTransform(std::min(int(i), last)),
+                       corners);
     }
 }
+
+} // namespace detail
+
+namespace
+{
 
 /// Places in the world around all that a solid draws, in place of those there are; none if that is not known.
 void findPlaces(const Solid& solid, std::vector<Vector3f>& places)
 {
     const Mesh* const mesh = solid.getMesh().get();
-    if (!placeVertices(solid, places) && mesh)
-        addCorners(solid, *mesh, places);
+    if (!placeVertices(solid, places))
+        detail::addBoundsCorners(solid, places);
     const MeshGeometry* const geometry = mesh ? mesh->getGeometry().get() : nullptr;
     size_t kept = 0;
     for (size_t i = 0; geometry && i < places.size(); ++i)
@@ -108,19 +124,20 @@ private:
 
 } // namespace
 
-bool Solid::isSkinned() const
+bool isMovedByJoints(const Solid& solid)
 {
-    const ShaderProgram* const program = m_appearance ? m_appearance->getShaderProgram().get() : nullptr;
-    return getJointCount() > 0 && program && program->usesJoints();
+    const Appearance* const appearance = solid.getAppearance().get();
+    const ShaderProgram* const program = appearance ? appearance->getShaderProgram().get() : nullptr;
+    return solid.getJointCount() > 0 && program && program->usesJoints();
 }
 
-Bounds Solid::getBounds() const
+Bounds getOwnBounds(const Solid& solid)
 {
-    if (!isSkinned())
-        return m_mesh ? m_mesh->getBounds() : Bounds();
+    if (!isMovedByJoints(solid))
+        return solid.getMesh() ? solid.getMesh()->getBounds() : Bounds();
     std::vector<Vector3f> places;
-    findPlaces(*this, places);
-    const Matrix4f toOwn = inverse(getWorldTransform());
+    findPlaces(solid, places);
+    const Matrix4f toOwn = inverse(solid.getWorldTransform());
     for (Vector3f& at : places)
         at = place(toOwn, at);
     return computeBounds(places.data(), places.size());
@@ -134,7 +151,7 @@ bool placeVertices(const Solid& solid, std::vector<Vector3f>& places)
         return false;
     const MeshVertices& vertices = geometry->getVertices();
     places.resize(vertices.places.size());
-    const bool isSkinned = solid.isSkinned() && !vertices.influences.empty();
+    const bool isSkinned = isMovedByJoints(solid) && !vertices.influences.empty();
     const std::vector<Matrix4f> joints =
         isSkinned ? getJointTransforms(solid) : std::vector<Matrix4f>{solid.getWorldTransform()};
     for (size_t i = 0; i < places.size(); ++i)

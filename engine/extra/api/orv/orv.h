@@ -49,6 +49,7 @@
 #include "orv/mesh.h"
 #include "orv/meshcache.h"
 #include "orv/meshgeometry.h"
+#include "orv/meshrays.h"
 #include "orv/meshutil.h"
 #include "orv/motionblurrenderer.h"
 #include "orv/picking.h"

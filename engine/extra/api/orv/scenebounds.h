@@ -19,6 +19,14 @@ class Solid;
 /// @return unknown without any solid whose bounds are known.
 ORV_API Bounds getWorldBounds(SceneNode& top, int* unknown = nullptr);
 
+/// How far a solid reaches in its own space: as its mesh or, where isMovedByJoints(), as what the joints make of it at the
+/// moment. That is exact where the mesh keeps its geometry; from the bounds of its joints alone it is wider.
+/// @return unknown where the mesh's are, and without a mesh.
+ORV_API Bounds getOwnBounds(const Solid& solid);
+
+/// Whether joints move the vertices of a solid when it is drawn: there are some, and its program takes J_WORLD.
+ORV_API bool isMovedByJoints(const Solid& solid);
+
 /// Where the vertices of a solid's mesh are in the world, as its transform or its joints put them at the moment.
 /// @param places  replaced; as many as the geometry has vertices.
 /// @return false, with no places, unless the mesh keeps its geometry.

@@ -1,8 +1,8 @@
 #pragma once
 
 #include "orv/bounds.h"
+#include "orv/detail/triangletree.h"
 #include "orv/indexbuffer.h"
-#include "orv/ray.h"
 #include "orv/shared.h"
 #include "orv/sharedptr.h"
 #include "orv/vector.h"
@@ -39,30 +39,12 @@ public:
 /// @param joints  numbers; the nearest whole ones count.
 MeshVertices::Influence makeInfluence(const Vector4f& joints, const Vector4f& weights);
 
-/// Which sides of triangles count: their fronts are those from which their corners go round counter-clockwise.
-enum class TriangleSides
-{
-    NONE,
-    FRONT,
-    BACK,
-    BOTH
-};
-
-/// What a mesh draws, in memory: for exact bounds, and for rays that look for triangles.
-///
-/// Threads: none; the first look for a triangle sorts them, which takes some tenths of a second for 100,000.
+/// What a mesh draws, in memory: for exact bounds, and for rays that look for triangles (see meet()).
 class ORV_API MeshGeometry : public Shared
 {
 public:
     ORV_CLASS_NAME("MeshGeometry")
     using Ptr = SharedPtr<MeshGeometry>;
-
-    /// A triangle that a ray meets.
-    struct Hit
-    {
-        float distance = 0.0f; ///< times the ray's direction
-        uint32_t triangle = 0; ///< counted from 0 in the order of drawing
-    };
 
     /// @param vertices  shared, and not to change any longer; must not be empty.
     /// @param indices   copied; null for all vertices in their order. Those beyond the vertices are left out, with the
@@ -81,34 +63,16 @@ public:
     /// By the joints' numbers, as Mesh::getJointBounds() has them.
     std::vector<Bounds> findJointBounds() const;
 
-    /// Finds the nearest triangle that a ray meets, of equally near ones the first.
-    /// @param ray  in the mesh's own space, with a direction of any length.
-    /// @param hit  in: what is farther, or as far, does not count; out: the triangle.
-    /// @return false, with hit unchanged, if there is none.
-    bool meet(const Ray& ray, TriangleSides sides, Hit& hit) const;
-
-    /// The same with the vertices at other places, as joints may hold them, and triangle by triangle.
-    bool meet(const Ray& ray, TriangleSides sides, const std::vector<Vector3f>& places, Hit& hit) const;
+    /// For meet(), which fills it when it looks for the first time.
+    detail::TriangleTree& getTree() const { return m_tree; }
 
 private:
-    /// A box around triangles: its two halves follow it, or it has a few in m_order.
-    struct Node
-    {
-        Box box;
-        uint32_t first; ///< in m_order, or else the second half
-        uint32_t count; ///< 0 with halves
-    };
-
     ORV_LOCAL void addTriangles(IndexBuffer::Primitive primitive, const std::vector<uint32_t>& order);
-    ORV_LOCAL void sort() const;
-    ORV_LOCAL void split(uint32_t first, uint32_t count, const std::vector<Vector3f>& centres) const;
-    ORV_LOCAL Box findBox(uint32_t triangle) const;
 
     MeshVertices::Ptr m_vertices;
     std::vector<bool> m_drawn;
     std::vector<uint32_t> m_triangles;
-    mutable std::vector<uint32_t> m_order; ///< of triangles
-    mutable std::vector<Node> m_nodes;
+    mutable detail::TriangleTree m_tree;
 };
 
 /// Sets the bounds of a mesh, and of its joints, to those of a geometry.

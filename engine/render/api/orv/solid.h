@@ -1,6 +1,5 @@
 #pragma once
 
-#include "orv/bounds.h"
 #include "orv/detail/drawcall.h"
 #include "orv/matrix.h"
 #include "orv/scenenode.h"
@@ -81,15 +80,6 @@ public:
     /// joint is in its rest pose: this solid's world transform * bind shape.
     Matrix4f calculateJointTransform(const JointAttachment& attachment) const;
     Matrix4f getJointTransform(int i) const;
-
-    /// How far the mesh reaches, in this solid's own space: that of the mesh or, where the program takes J_WORLD and there
-    /// are joints, of what they make of it at the moment. That is exact where the mesh keeps its geometry; from the bounds of
-    /// its joints alone it is wider. See getWorldBounds() for subtrees.
-    /// @return unknown where the mesh's are, and without a mesh.
-    Bounds getBounds() const;
-
-    /// Whether joints move the vertices: there are some, and the program takes J_WORLD.
-    bool isSkinned() const;
 
     /// Draws the mesh with the solid's own appearance; nothing without one. GL thread only.
     void draw(RenderContext& context);
