@@ -1,34 +1,71 @@
-# Turns a folder of files into one C++ source: their bytes, read-only, and the table of them all.
+# Turns files into one C++ source: their bytes, read-only, and the table of them all.
 #
-#   cmake -DFOLDER=dir -DNAMESPACE=orv -DOUTPUT=file.cpp -P embedassets.cmake
+#   cmake -DFILES=a;b -DNAMESPACE=orv -DOUTPUT=file.cpp [-DSHADOWS=ON] -P embedassets.cmake
 #
-# FOLDER     read flat; every file in it becomes the asset "NAMESPACE#file name", byte for byte, but for shaders, which
-#            keep the comment that opens them and leave other comments, indentation and blanks around operators
-#            out; their lines stay
+# FILES      each becomes the asset "NAMESPACE#file name", byte for byte, but for shaders, which keep the comment that
+#            opens them and leave other comments, indentation and blanks around operators out; their lines stay
 # NAMESPACE  asset namespace; the archive is called NAMESPACE_ARCHIVE, in upper case
 # OUTPUT     replaced when the assets have changed
+# SHADOWS    with what is for shadows: in shaders what stands between "#ifdef SHADOW" and "#endif // SHADOW", in program
+#            files the uniforms u_s_..., and references to NAMESPACE in place of "orv". Without it these are left out.
 cmake_minimum_required(VERSION 3.22)
 
-foreach(argument FOLDER NAMESPACE OUTPUT)
+foreach(argument FILES NAMESPACE OUTPUT)
     if(NOT DEFINED ${argument})
         message(FATAL_ERROR "embedassets: -D${argument}=... is missing")
     endif()
 endforeach()
 
-file(GLOB names RELATIVE ${FOLDER} ${FOLDER}/*)
-list(SORT names COMPARE STRING) # byte order
-if(NOT names)
-    message(FATAL_ERROR "embedassets: nothing in ${FOLDER}")
-endif()
+list(SORT FILES COMPARE STRING) # byte order
+
+# Takes what is for shadows out of a shader, but for what stands after "#else // SHADOW".
+function(leave_shadows_out variable)
+    set(text "${${variable}}")
+    set(kept "")
+    while(TRUE)
+        string(FIND "${text}" "#ifdef SHADOW\n" begin)
+        if(begin EQUAL -1)
+            break()
+        endif()
+        string(SUBSTRING "${text}" 0 ${begin} before)
+        string(SUBSTRING "${text}" ${begin} -1 text)
+        string(FIND "${text}" "#endif // SHADOW\n" end)
+        string(SUBSTRING "${text}" 0 ${end} block)
+        math(EXPR end "${end} + 17")
+        string(SUBSTRING "${text}" ${end} -1 text)
+        string(FIND "${block}" "#else // SHADOW\n" otherwise)
+        if(otherwise EQUAL -1)
+            set(block "")
+            string(REGEX REPLACE "\n\n$" "\n" before "${before}") # one empty line, not two
+        else()
+            math(EXPR otherwise "${otherwise} + 16")
+            string(SUBSTRING "${block}" ${otherwise} -1 block)
+        endif()
+        string(APPEND kept "${before}${block}")
+    endwhile()
+    set(${variable} "${kept}${text}" PARENT_SCOPE)
+endfunction()
 
 set(table "")
 set(blocks "")
 set(count 0)
 set(line "................................................") # 24 bytes of two hex digits
-foreach(name IN LISTS names)
-    file(READ ${FOLDER}/${name} hex HEX)
-    if(name MATCHES "\\.(vert|frag)$")
-        file(READ ${FOLDER}/${name} text)
+foreach(path IN LISTS FILES)
+    get_filename_component(name ${path} NAME)
+    file(READ ${path} hex HEX)
+    if(name MATCHES "\\.sp$")
+        file(READ ${path} text)
+        if(SHADOWS)
+            string(REPLACE "orv#" "${NAMESPACE}#" text "${text}")
+        else()
+            string(REGEX REPLACE "\n(uniform u_s_[^\n]*\n)+" "" text "${text}")
+        endif()
+        string(HEX "${text}" hex)
+    elseif(name MATCHES "\\.(vert|frag)$")
+        file(READ ${path} text)
+        if(NOT SHADOWS)
+            leave_shadows_out(text)
+        endif()
         string(FIND "${text}" "\n\n" end) # of the comment
         string(SUBSTRING "${text}" 0 ${end} comment)
         string(SUBSTRING "${text}" ${end} -1 text)
@@ -48,7 +85,7 @@ endforeach()
 
 string(TOUPPER "${NAMESPACE}_ARCHIVE" archive)
 file(CONFIGURE OUTPUT ${OUTPUT} @ONLY CONTENT "// Made by cmake/embedassets.cmake.
-#include \"assets/embeddedassets.h\"
+#include \"orv/detail/embeddedassets.h\"
 
 namespace orv::detail
 {

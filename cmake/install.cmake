@@ -15,6 +15,7 @@ foreach(room common maths pss facility render extra)
         FILES_MATCHING PATTERN "*.h"
         PATTERN "detail/boundsrevision.h" EXCLUDE
         PATTERN "detail/digestmaker.h" EXCLUDE
+        PATTERN "detail/embeddedassets.h" EXCLUDE
         PATTERN "detail/eyes.h" EXCLUDE
         PATTERN "detail/fonttables.h" EXCLUDE
         PATTERN "detail/formattedtext.h" EXCLUDE

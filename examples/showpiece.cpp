@@ -3,7 +3,7 @@
 // models: a duck that slides past, and a figure that moves as its file says.
 //
 //   build/default/examples/showpiece --out showpiece.png [--duck duck.glo] [--dancer motion.glo] [--time 3.2]
-//                                    [--stereo] [--size 960x540]
+//                                    [--stereo] [--size 960x540] [--shadows sun|spot] [--far 2]
 
 #include "headless/headless.h"
 #include "headless/png.h"
@@ -27,6 +27,8 @@ struct Arguments
     std::string dancer; ///< path of a .glo that plays its own animation; none leaves it out
     float time = 2.5f;  ///< seconds
     bool stereo = false;
+    std::string shadows;   ///< the light that throws them; none without a name
+    float distance = 1.0f; ///< of the camera, in times the usual one
     int width = 960;
     int height = 540;
 };
@@ -46,6 +48,10 @@ bool parse(int argc, char** argv, Arguments& arguments)
             arguments.dancer = argv[++i];
         else if (!std::strcmp(argv[i], "--time") && hasValue)
             arguments.time = std::strtof(argv[++i], nullptr);
+        else if (!std::strcmp(argv[i], "--shadows") && hasValue)
+            arguments.shadows = argv[++i];
+        else if (!std::strcmp(argv[i], "--far") && hasValue)
+            arguments.distance = std::strtof(argv[++i], nullptr);
         else if (!std::strcmp(argv[i], "--size") && hasValue)
         {
             if (std::sscanf(argv[++i], "%dx%d", &arguments.width, &arguments.height) != 2)
@@ -103,8 +109,12 @@ SharedPtr<Solid> createFloor(AssetCachePool& pool)
     const SharedPtr<IndexBuffer> triangles =
         pool.getIndexBufferCache()->create(IndexBuffer::Primitive::TRIANGLES, 6, indices, nullptr);
     triangles->commit();
-    return makeShared<Solid>(pool.getMeshCache()->create(MeshHeader(), triangles, vertices, nullptr),
-                             nullptr);
+    const SharedPtr<Mesh> mesh = pool.getMeshCache()->create(MeshHeader(), triangles, vertices, nullptr);
+    Box box;
+    box.add(Vector3f(-0.5f, 0.0f, -0.5f));
+    box.add(Vector3f(0.5f, 0.0f, 0.5f));
+    mesh->setBounds(Bounds(box)); // for shadows
+    return makeShared<Solid>(mesh, nullptr);
 }
 
 void addLights(const SharedPtr<SceneNode>& scene)
@@ -136,10 +146,15 @@ void addLights(const SharedPtr<SceneNode>& scene)
     lamp->setParent(scene, false);
 }
 
+/// Set for all nodes but the sky, which is around everything.
+constexpr FlagMask THROWS_SHADOWS(1u << 8, 1u << 8);
+
 bool addSolids(AssetCachePool& pool, const SharedPtr<SceneNode>& scene)
 {
     const Vector2f once(1.0f, 1.0f);
-    bool complete = place(createSphere(pool, 24, 48, once), "sky.ap", pool, scene, {}, {80, 80, 80});
+    const SharedPtr<Solid> sky = createSphere(pool, 24, 48, once);
+    bool complete = place(sky, "sky.ap", pool, scene, {}, {80, 80, 80});
+    setFlags(*sky, THROWS_SHADOWS, false);
     complete &= place(createFloor(pool), "floor.ap", pool, scene, {}, {20, 1, 20});
 
     const SharedPtr<Solid> crate = createCube(pool, once);
@@ -172,7 +187,8 @@ bool addModel(AssetCachePool& pool, const SharedPtr<SceneNode>& scene, const std
     place->setRotation(quaternionFromAxisAngle(Vector3f::Y_AXIS, Anglef::fromRadians(turnRadians)));
     place->setScale(Vector3f(scale, scale, scale));
     const Glo::Ptr model =
-        loadGloFile(pool, place, slash == std::string::npos ? path.c_str() : path.substr(slash + 1).c_str());
+        loadGloFile(pool, place, slash == std::string::npos ? path.c_str() : path.substr(slash + 1).c_str(),
+                    MeshData::BOUNDS);
     if (!model)
         return false; // the log says why
     for (int i = 0; i < model->getLightCount(); ++i)
@@ -210,7 +226,7 @@ bool draw(const SharedPtr<AssetCachePool>& pool, const Arguments& arguments)
         return false;
 
     const auto camera = makeShared<Camera>("camera");
-    camera->setPosition(Vector3f(1.8f, 3.3f, 9.2f));
+    camera->setPosition(Vector3f(1.8f, 3.3f, 9.2f) * arguments.distance);
     camera->setFieldOfView(Anglef::fromDegrees(42.0f));
     camera->setParent(scene, false);
     point(*camera, Vector3f(0.0f, 1.0f, 0.0f));
@@ -220,6 +236,15 @@ bool draw(const SharedPtr<AssetCachePool>& pool, const Arguments& arguments)
     if (arguments.stereo)
         block->setStereo(9.0f, 0.4f);
     block->update(arguments.time);
+    const auto shadows =
+        arguments.shadows.empty() ? SharedPtr<ShadowMap>() : makeShared<ShadowMap>(context, pool);
+    if (shadows)
+    {
+        shadows->setLight(SharedPtr<Light>(static_cast<Light*>(scene->find(arguments.shadows.c_str()))));
+        shadows->setThrowers(THROWS_SHADOWS);
+        shadows->attach(*scene);
+        shadows->render(*scene, camera.get());
+    }
     block->render();
     return true;
 }
@@ -233,7 +258,7 @@ int main(int argc, char** argv)
     if (!parse(argc, argv, arguments))
     {
         std::fprintf(stderr, "usage: showpiece [--out FILE.png] [--duck SCENE.glo] [--dancer SCENE.glo] "
-                             "[--time SECONDS] [--stereo] [--size WxH]\n");
+                             "[--time SECONDS] [--stereo] [--size WxH] [--shadows sun|spot] [--far TIMES]\n");
         return 2;
     }
 

@@ -109,7 +109,7 @@ void lookForGlError()
 enum class Size
 {
     SMALL, ///< one of each kind of asset, in programs that compile quickly
-    FULL   ///< and a scene file, lights, text in the scene, a mirror, motion blur
+    FULL   ///< and a scene file, lights, shadows, text in the scene, a mirror, motion blur
 };
 
 /// A little of everything that can be shown, by an application that looks at what it gets.
@@ -150,6 +150,8 @@ public:
             m_glo->getAnimationGroup()->apply(0.5f);
         if (m_blocks)
         {
+            if (m_shadows)
+                m_shadows->render(*m_scene, m_camera.get());
             m_blocks->update(0.5f);
             m_blocks->render();
         }
@@ -169,12 +171,17 @@ private:
         {
             light->setPosition(Vector3f(1, 2, 4));
             light->setAmbientLevel(0.3f);
+            light->setLightType(Light::LightType::SPOT);
+            light->setSpotOuterAngle(Anglef::fromDegrees(120.0f));
             light->setParent(m_scene, false);
         }
         place(m_scene, createCubeMesh(meshes, once), "crate.ap", {-1.5f, 0, 0}, 0.5f);
         place(m_scene, createSphereMesh(meshes, 4, 6, once), "glass.ap", {1.5f, 0, 1}, 1);
         place(m_scene, createSquareMesh(meshes, once), "mirror.ap", {0, 1, -1}, 2);
         m_glo = loadGloFile(*m_pool, m_stage, "test.glo");
+        m_shadows = makeShared<ShadowMap>(m_context, m_pool, 32);
+        if (m_shadows)
+            m_shadows->attach(*m_scene);
         if (const SharedPtr<Solid> letters = m_text ? m_text->createSolid(*m_pool) : SharedPtr<Solid>())
         {
             letters->setPosition(Vector3f(-1.5f, -0.5f, 1));
@@ -254,6 +261,7 @@ private:
     SharedPtr<RenderBlockGroup> m_blocks;
     Text::Ptr m_text;
     Glo::Ptr m_glo;
+    ShadowMap::Ptr m_shadows;
 };
 
 // --- Refusals ----------------------------------------------------------------------------------------------

@@ -75,6 +75,7 @@
 #include "orv/shaderprogramcache.h"
 #include "orv/shaderprogramloader.h"
 #include "orv/shaderuniform.h"
+#include "orv/shadowmap.h"
 #include "orv/shape.h"
 #include "orv/shared.h"
 #include "orv/sharedptr.h"

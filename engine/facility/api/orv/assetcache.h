@@ -36,6 +36,17 @@ public:
             visit(typed(asset));
     }
 
+    /// The name that an asset is held under, the first of several; null if there is none. Until the cache changes.
+    const char* findName(const T& asset) const
+    {
+        for (const auto& entry : getNamed())
+        {
+            if (entry.second.get() == &asset)
+                return entry.first.c_str();
+        }
+        return nullptr;
+    }
+
 private:
     bool isKnownTo(Shared& loader, const char* name) override
     {

@@ -68,6 +68,17 @@ uniform float u_l_spotOuterCos[LIGHTS];
 uniform vec3 u_l_spotDirection[LIGHTS]; // points back, from the lit place towards the light
 #endif
 
+#ifdef SHADOW
+uniform sampler2D u_s_depths;
+// How many texels a soft edge reaches, 1.5; the map's side in one texel; 1 / 255, less than nothing for a light from
+// everywhere; which light it is.
+uniform vec4 u_s_map;
+
+varying FINE float v_shadowX;
+varying FINE float v_shadowY;
+varying FINE float v_shadowDepth;
+#endif // SHADOW
+
 uniform float u_m_opacity;
 #ifdef CUTOFF
 uniform float u_m_cutoff;
@@ -159,6 +170,31 @@ float cone(float cosine, float inner, float outer)
 }
 #endif
 
+#ifdef SHADOW
+// How much arrives of the light that throws shadows: nine texels of what it meets first, which holds distances in red,
+// green and blue, weighed so that edges are soft.
+float arrivingShare()
+{
+    float k = abs(u_s_map.z);
+    vec2 place = vec2(v_shadowX, v_shadowY) / (u_s_map.y * (u_s_map.z > 0.0 ? v_shadowDepth : 1.0));
+    vec2 middle = floor(place) + 0.5;
+    float share = 0.0;
+    for (int y = -1; y <= 1; y++)
+    {
+        for (int x = -1; x <= 1; x++)
+        {
+            vec2 texel = middle + vec2(x, y);
+            vec2 off = u_s_map.x - abs(texel - place);
+            vec2 near = max(off - 1.0, 0.0);
+            vec2 weight = 0.5 * off * off - u_s_map.x * near * near;
+            vec3 met = texture2D(u_s_depths, texel * u_s_map.y).rgb;
+            share += weight.x * weight.y * step(min(v_shadowDepth, 1.0), (met.b * k + met.g) * k + met.r);
+        }
+    }
+    return share;
+}
+#endif // SHADOW
+
 #ifdef REFL
 vec3 reflectedColour(vec3 normal, vec3 toEye)
 {
@@ -210,6 +246,10 @@ void main()
             strength = fallOff(range, u_l_attenuationNear[i], u_l_attenuationReciprocal[i]);
         }
         strength *= cone(dot(toLight, u_l_spotDirection[i]), u_l_spotInnerCos[i], u_l_spotOuterCos[i]);
+#ifdef SHADOW
+        if (float(i) == u_s_map.w)
+            strength *= arrivingShare();
+#endif // SHADOW
 
         float facing = dot(normal, toLight);
         if (facing > 0.0)

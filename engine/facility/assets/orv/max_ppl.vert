@@ -83,6 +83,19 @@ varying mediump vec3 v_binormal;
 #endif
 #endif
 
+#ifdef SHADOW
+// One light is kept back by what lies in its way; see max_pvl.
+uniform vec4 u_s_rowX; // from the world to the shadow map
+uniform vec4 u_s_rowY;
+uniform vec4 u_s_rowDepth;
+uniform vec4 u_s_light; // w 0: directional, xyz points towards the light
+uniform float u_s_offset; // how far surfaces are held off their own shadow; below nothing for each unit of depth
+
+varying FINE float v_shadowX; // single ones, which fit where pairs do not
+varying FINE float v_shadowY;
+varying FINE float v_shadowDepth;
+#endif // SHADOW
+
 #ifdef AMBI
 const int LIGHTS = 5;
 
@@ -164,6 +177,18 @@ void main()
     v_normal = safeNormalize(u_t_normalModel * a_normal);
 #endif
 #endif
+
+#ifdef SHADOW
+    vec3 outside = v_normal;
+#ifdef SHEET
+    outside *= dot(v_normal, u_s_light.xyz - v_position * u_s_light.w) < 0.0 ? -1.0 : 1.0;
+#endif
+    float depth = dot(u_s_rowDepth, vec4(v_position, 1.0));
+    vec4 held = vec4(v_position + outside * (u_s_offset < 0.0 ? -u_s_offset * depth : u_s_offset), 1.0);
+    v_shadowX = dot(u_s_rowX, held);
+    v_shadowY = dot(u_s_rowY, held);
+    v_shadowDepth = dot(u_s_rowDepth, held);
+#endif // SHADOW
 
 #if defined(BUMP) && defined(SURFACE)
     vec3 tangent = safeNormalize((transform * vec4(a_tangent, 0.0)).xyz);

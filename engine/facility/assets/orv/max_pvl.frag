@@ -28,12 +28,35 @@ precision mediump float;
 #endif
 
 #if defined(DIFF) || defined(SPEC) || defined(AMBI) || defined(EMIS)
+#ifdef SHADOW
+varying highp float v_u;
+varying highp float v_v;
+#define v_uv vec2(v_u, v_v)
+#else // SHADOW
 #ifdef GL_FRAGMENT_PRECISION_HIGH
 varying highp vec2 v_uv;
 #else
 varying mediump vec2 v_uv;
 #endif
+#endif // SHADOW
 #endif
+
+#ifdef SHADOW
+uniform sampler2D u_s_depths;
+// How many texels a soft edge reaches, 1.5; the map's side in one texel; 1 / 255, less than nothing for a light from
+// everywhere; which light it is.
+uniform highp vec4 u_s_map;
+
+varying highp float v_shadowX;
+varying highp float v_shadowY;
+varying highp float v_shadowDepth;
+#ifdef DIFF
+varying mediump vec3 v_shadowDiffuse;
+#endif
+#ifdef SPEC
+varying mediump vec3 v_shadowSpecular;
+#endif
+#endif // SHADOW
 
 uniform float u_m_opacity;
 #ifdef CUTOFF
@@ -86,15 +109,47 @@ varying mediump vec2 v_reflection;
 #endif
 #endif
 
+#ifdef SHADOW
+// How much arrives of the light that throws shadows: nine texels of what it meets first, which holds distances in red,
+// green and blue, weighed so that edges are soft.
+float arrivingShare()
+{
+    highp float k = abs(u_s_map.z);
+    highp vec2 place = vec2(v_shadowX, v_shadowY) / (u_s_map.y * (u_s_map.z > 0.0 ? v_shadowDepth : 1.0));
+    highp vec2 middle = floor(place) + 0.5;
+    float share = 0.0;
+    for (int y = -1; y <= 1; y++)
+    {
+        for (int x = -1; x <= 1; x++)
+        {
+            highp vec2 texel = middle + vec2(x, y);
+            vec2 off = u_s_map.x - abs(texel - place);
+            vec2 near = max(off - 1.0, 0.0);
+            vec2 weight = 0.5 * off * off - u_s_map.x * near * near;
+            highp vec3 met = texture2D(u_s_depths, texel * u_s_map.y).rgb;
+            share += weight.x * weight.y * step(min(v_shadowDepth, 1.0), (met.b * k + met.g) * k + met.r);
+        }
+    }
+    return share;
+}
+#endif // SHADOW
+
 void main()
 {
     vec3 colour = vec3(0.0);
     float opacity = u_m_opacity;
 
+#ifdef SHADOW
+    float arriving = u_s_map.w < 0.0 ? 1.0 : arrivingShare();
+#endif // SHADOW
+
 #ifdef DIFF
     vec4 base = texture2D(u_m_diffuseTexture, v_uv);
     base.rgb = SHARE(base.rgb);
     colour += SIDE(v_diffuse, v_diffuseBack) * base.rgb;
+#ifdef SHADOW
+    colour += max(SIDE(v_shadowDiffuse, -v_shadowDiffuse), 0.0) * arriving * base.rgb;
+#endif // SHADOW
     opacity *= base.a;
 #endif
 #ifdef VCOL
@@ -113,6 +168,9 @@ void main()
     vec3 gloss = SHARE(u_m_specularColour.rgb) * u_m_specularLevel *
                  SHARE(texture2D(u_m_specularTexture, v_uv).rgb);
     colour += SIDE(v_specular, v_specularBack) * gloss;
+#ifdef SHADOW
+    colour += max(SIDE(v_shadowSpecular, -v_shadowSpecular), 0.0) * arriving * gloss;
+#endif // SHADOW
 #endif
 
 #ifdef REFL

@@ -23,6 +23,14 @@ uniform u_l_spotInnerCos L_SPOT_INNER_COS
 uniform u_l_spotOuterCos L_SPOT_OUTER_COS
 uniform u_l_spotDirection L_SPOT_DIRECTION
 
+uniform u_s_rowX S_ROW_X
+uniform u_s_rowY S_ROW_Y
+uniform u_s_rowDepth S_ROW_DEPTH
+uniform u_s_offset S_OFFSET
+uniform u_s_index S_INDEX
+uniform u_s_map S_MAP
+uniform u_s_depths S_DEPTHS
+
 uniform u_m_uvOffsetScale M_UV_OFFSET_SCALE
 uniform u_m_diffuseColour M_DIFFUSE_COLOUR
 uniform u_m_ambientColour M_AMBIENT_COLOUR

@@ -82,8 +82,34 @@ uniform mat3 u_t_normalModel;
 #ifdef TEXTURED
 uniform vec4 u_m_uvOffsetScale;
 
+#ifdef SHADOW
+varying FINE float v_u; // single ones, which fit where pairs do not
+varying FINE float v_v;
+#else // SHADOW
 varying FINE vec2 v_uv;
+#endif // SHADOW
 #endif
+
+#ifdef SHADOW
+// One light is kept back by what lies in its way. What is for that is not in liborv but beside it, in programs called
+// shadow#..., for ShadowMap. With SHEET the surface is seen from both sides.
+uniform vec4 u_s_rowX; // from the world to the shadow map
+uniform vec4 u_s_rowY;
+uniform vec4 u_s_rowDepth;
+uniform float u_s_offset; // how far surfaces are held off their own shadow; below nothing for each unit of depth
+uniform float u_s_index; // of the light
+
+varying FINE float v_shadowX;
+varying FINE float v_shadowY;
+varying FINE float v_shadowDepth;
+// What that light gives to the front or, below nothing and with BACK, to the back.
+#ifdef DIFF
+varying mediump vec3 v_shadowDiffuse;
+#endif
+#ifdef SPEC
+varying mediump vec3 v_shadowSpecular;
+#endif
+#endif // SHADOW
 
 #ifdef SURFACE
 uniform vec4 u_t_cameraPosition;
@@ -225,7 +251,12 @@ void main()
 
 #ifdef TEXTURED
     vec2 uv = a_uv0 * u_m_uvOffsetScale.zw + u_m_uvOffsetScale.xy;
+#ifdef SHADOW
+    v_u = uv.x;
+    v_v = 1.0 - uv.y;
+#else // SHADOW
     v_uv = vec2(uv.x, 1.0 - uv.y);
+#endif // SHADOW
 #endif
 
 #ifdef SURFACE
@@ -239,6 +270,11 @@ void main()
     vec3 diffuseBack = vec3(0.0);
     vec3 specularBack = vec3(0.0);
 #endif
+#ifdef SHADOW
+    vec3 outside = normal;
+    vec3 shadowDiffuse = vec3(0.0);
+    vec3 shadowSpecular = vec3(0.0);
+#endif // SHADOW
     for (int i = 0; i < LIGHTS; i++)
     {
         if (i >= u_l_count)
@@ -261,6 +297,25 @@ void main()
         float shine = dot(normal, safeNormalize(toLight + toEye));
         float shininess = max(u_m_shininess, 0.0);
 #endif
+#ifdef SHADOW
+        if (float(i) == u_s_index)
+        {
+#ifdef SHEET
+            outside *= facing < 0.0 ? -1.0 : 1.0;
+#endif
+#ifdef BACK
+            float side = facing < 0.0 ? -1.0 : 1.0;
+#else
+            float side = facing > 0.0 ? 1.0 : 0.0;
+#endif
+            shadowDiffuse = light * abs(facing) * side;
+#ifdef SPEC
+            if (shine * side > 0.0)
+                shadowSpecular = light * pow(abs(shine), shininess) * side;
+#endif
+            light = vec3(0.0);
+        }
+#endif // SHADOW
         if (facing > 0.0)
         {
             diffuse += light * facing;
@@ -302,6 +357,20 @@ void main()
 #ifdef VCOL
     v_opacity = a_colour.a;
 #endif
+
+#ifdef SHADOW
+#ifdef DIFF
+    v_shadowDiffuse = own * shadowDiffuse;
+#endif
+#ifdef SPEC
+    v_shadowSpecular = shadowSpecular;
+#endif
+    float depth = dot(u_s_rowDepth, vec4(position, 1.0));
+    vec4 held = vec4(position + outside * (u_s_offset < 0.0 ? -u_s_offset * depth : u_s_offset), 1.0);
+    v_shadowX = dot(u_s_rowX, held);
+    v_shadowY = dot(u_s_rowY, held);
+    v_shadowDepth = dot(u_s_rowDepth, held);
+#endif // SHADOW
 
 #ifdef AMBI
     vec3 ambient = vec3(0.0);

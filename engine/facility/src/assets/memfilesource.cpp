@@ -1,6 +1,6 @@
 #include "orv/memfilesource.h"
 
-#include "embeddedassets.h"
+#include "orv/detail/embeddedassets.h"
 
 namespace orv
 {

@@ -20,8 +20,9 @@ struct EmbeddedArchive
     size_t count;
 };
 
-// Defined in sources that the build makes from the folders assets/orv and assets/luvane.
+// Defined in sources that the build makes from folders of assets; the last one beside the library, not in it.
 extern const EmbeddedArchive ORV_ARCHIVE;
 extern const EmbeddedArchive LUVANE_ARCHIVE;
+extern const EmbeddedArchive SHADOW_ARCHIVE;
 
 } // namespace orv::detail

@@ -1,0 +1,424 @@
+#include "orv/shadowmap.h"
+
+#include "shadowcasters.h"
+#include "shadowprograms.h"
+#include "shadowview.h"
+#include "solidcorners.h"
+
+#include "orv/detail/eyes.h"
+
+#include "orv/appearance.h"
+#include "orv/assetcachepool.h"
+#include "orv/background.h"
+#include "orv/camera.h"
+#include "orv/light.h"
+#include "orv/log.h"
+#include "orv/mesh.h"
+#include "orv/rendercontext.h"
+#include "orv/rendertarget.h"
+#include "orv/scenenodevisitor.h"
+#include "orv/sceneutil.h"
+#include "orv/shaderprogramcache.h"
+#include "orv/solid.h"
+#include "orv/texture2d.h"
+#include "orv/texture2dcache.h"
+
+#include <algorithm>
+#include <limits>
+#include <vector>
+
+namespace orv
+{
+
+namespace detail
+{
+
+namespace
+{
+
+constexpr int MOST_LIGHTS = 5;     // that renderers take
+constexpr float SOFT_REACH = 1.5f; // texels that the programs look around by
+constexpr int SMALLEST = 16;
+constexpr int LARGEST = 8192;
+
+/// A property of the context that all its shadow maps share.
+template <class T>
+SharedPtr<ShaderUniform<T>> shareProperty(RenderContext& context, const char* name)
+{
+    SharedPtr<ShaderUniformBase> held = context.getProperty(name);
+    if (!held)
+    {
+        held = makeShared<ShaderUniform<T>>(1);
+        if (held)
+            context.addProperty(held, name);
+    }
+    return SharedPtr<ShaderUniform<T>>(held && held->holds<T>() ? static_cast<ShaderUniform<T>*>(held.get())
+                                                                : nullptr);
+}
+
+FlagMask join(const FlagMask& a, const FlagMask& b)
+{
+    return FlagMask(a.mask | b.mask, a.inverted | b.inverted);
+}
+
+bool throwsShadow(const Light& light)
+{
+    return light.getLightType() != Light::LightType::POINT;
+}
+
+/// What a frame's walk finds.
+class ShadowWalk : public SceneNodeVisitor
+{
+public:
+    void begin(const Light* wanted)
+    {
+        m_wanted = wanted;
+        light = nullptr;
+        lightCount = 0;
+        solids.clear();
+    }
+
+    bool takesSolids = true;
+    bool takesLights = true;
+
+    using SceneNodeVisitor::visit;
+    void visit(Light* found) override
+    {
+        if (!takesLights)
+            return;
+        const bool isIt = m_wanted ? found == m_wanted : !light;
+        if (isIt && throwsShadow(*found))
+        {
+            light = found;
+            lightIndex = lightCount;
+        }
+        ++lightCount;
+    }
+
+    void visit(Solid* solid) override
+    {
+        const Appearance* const appearance = solid->getAppearance().get();
+        const ShaderProgram* const program = appearance ? appearance->getShaderProgram().get() : nullptr;
+        if (takesSolids && program && solid->getMesh() && appearance->isOpaque() &&
+            !program->usesMirrorTexture())
+            solids.push_back(solid);
+    }
+
+    const Light* light = nullptr;
+    int lightIndex = 0;
+    int lightCount = 0;
+    std::vector<Solid*> solids;
+
+private:
+    const Light* m_wanted = nullptr;
+};
+
+/// Calls a function for each material of a scene that has a program, for one of several solids several times.
+template <class Function>
+class MaterialWalk : public SceneNodeVisitor
+{
+public:
+    explicit MaterialWalk(const Function& function) : m_function(function) {}
+
+    using SceneNodeVisitor::visit;
+    void visit(Solid* solid) override
+    {
+        if (solid->getAppearance() && solid->getAppearance()->getShaderProgram())
+            m_function(solid->getAppearance());
+    }
+
+private:
+    const Function& m_function;
+};
+
+} // namespace
+
+struct ShadowParts
+{
+    ShadowParts(const SharedPtr<RenderContext>& contextToUse, const SharedPtr<AssetCachePool>& pool,
+                int sizeToUse);
+
+    bool isComplete() const
+    {
+        return target && map && rows[0] && rows[1] && rows[2] && offset && index && light && depths;
+    }
+    void warn(bool& isSaid, const char* text) const;
+    void find(SceneNode& scene, const FlagMask& renderFlags, const FlagMask& recursiveFlags);
+    void findReach(Camera* camera);
+    void draw(const ShadowView& view);
+    void publish(const ShadowView& view, int lightIndex);
+    void switchOff();
+
+    struct Changed
+    {
+        SharedPtr<Appearance> appearance;
+        SharedPtr<ShaderProgram> before;
+        SharedPtr<ShaderProgram> now;
+    };
+
+    SharedPtr<RenderContext> context;
+    int size;
+    ShadowPrograms programs;
+    ShadowCasters casters;
+    SharedPtr<Texture2D> texture;
+    SharedPtr<RenderTarget> target;
+    SharedPtr<ShaderUniform<Vector4f>> map; // these and what follows are the context's
+    SharedPtr<ShaderUniform<Vector4f>> rows[3];
+    SharedPtr<ShaderUniform<float>> offset;
+    SharedPtr<ShaderUniform<float>> index;
+    SharedPtr<ShaderUniform<Vector4f>> light;
+    SharedPtr<ShaderUniform<SharedPtr<Texture2D>>> depths;
+    SharedPtr<Light> wanted;
+    FlagMask thrower; ///< without bits where all throw shadows
+    float distance = 0.0f;
+    ShadowWalk walk;
+    std::vector<Vector3f> corners;
+    ShadowReach reach;
+    std::vector<Changed> changed;
+    bool isRoomSaid = false;
+    bool isProgramSaid = false;
+    bool isLightSaid = false;
+};
+
+ShadowParts::ShadowParts(const SharedPtr<RenderContext>& contextToUse, const SharedPtr<AssetCachePool>& pool,
+                         int sizeToUse)
+    : context(contextToUse)
+    , size(std::clamp(sizeToUse, SMALLEST, LARGEST))
+    , programs(pool)
+    , casters(programs)
+    , map(shareProperty<Vector4f>(*context, "S_MAP"))
+    , rows{shareProperty<Vector4f>(*context, "S_ROW_X"), shareProperty<Vector4f>(*context, "S_ROW_Y"),
+           shareProperty<Vector4f>(*context, "S_ROW_DEPTH")}
+    , offset(shareProperty<float>(*context, "S_OFFSET"))
+    , index(shareProperty<float>(*context, "S_INDEX"))
+    , light(shareProperty<Vector4f>(*context, "S_LIGHT"))
+    , depths(shareProperty<SharedPtr<Texture2D>>(*context, "S_DEPTHS"))
+{
+    switchOff();
+    const SharedPtr<ShaderProgram> plain = pool->getShaderProgramCache()->get("shadow#depth.sp");
+    if (!plain || !plain->uniformExists("S_SPLIT"))
+    {
+        ORV_LOG_WARN("No shadows: fragment shaders of this device lack the precision.");
+        return;
+    }
+    const unsigned side = unsigned(size + 2 * ShadowView::BORDER); // no power of two, so without mipmaps
+    texture = pool->getTexture2DCache()->create(side, side, Texture::Format::RGBA,
+                                                Texture::Type::UNSIGNED_BYTE, nullptr, nullptr);
+    if (texture)
+    {
+        texture->setParameters({Texture2D::FilterMode::NEAREST, Texture2D::FilterMode::NEAREST,
+                                Texture2D::WrapMode::CLAMP, Texture2D::WrapMode::CLAMP});
+        target = makeShared<RenderTarget>(texture, nullptr, true, false);
+    }
+    if (!target || !target->isComplete())
+    {
+        target = nullptr;
+        ORV_LOG_WARN("No shadows: this device cannot draw into a texture of %u x %u.", side, side);
+    }
+}
+
+void ShadowParts::warn(bool& isSaid, const char* text) const
+{
+    if (!isSaid)
+        ORV_LOG_WARN("%s", text);
+    isSaid = true;
+}
+
+/// The light, and what throws shadows.
+void ShadowParts::find(SceneNode& scene, const FlagMask& renderFlags, const FlagMask& recursiveFlags)
+{
+    walk.begin(wanted.get());
+    walk.takesLights = true;
+    walk.takesSolids = thrower.mask == 0;
+    visitScene(walk, scene, renderFlags, recursiveFlags);
+    if (walk.takesSolids || !walk.light)
+        return;
+    walk.takesLights = false;
+    walk.takesSolids = true;
+    visitScene(walk, scene, join(renderFlags, thrower), join(recursiveFlags, thrower));
+}
+
+/// Where the walk's solids are, and what a camera sees up to the distance.
+void ShadowParts::findReach(Camera* camera)
+{
+    reach = ShadowReach();
+    corners.clear();
+    for (const Solid* solid : walk.solids)
+    {
+        const size_t before = corners.size();
+        addBoundsCorners(*solid, corners);
+        reach.isAllKnown = reach.isAllKnown && corners.size() > before;
+    }
+    reach.casters = &corners;
+    if (!camera)
+        return;
+
+    Eye eyes[2];
+    const int count = findEyes(camera, getAspect(getViewport(*context)), eyes);
+    Vector3f seen[16];
+    int places = 0;
+    for (int i = 0; i < count * 4; ++i)
+    {
+        const Eye& eye = eyes[i / 4];
+        const Matrix4f toEye = inverse(eye.projection);
+        const auto place = [&](float z)
+        {
+            const Vector4f at = toEye * Vector4f(i & 1 ? 1.0f : -1.0f, i & 2 ? 1.0f : -1.0f, z, 1.0f);
+            return at.xyz() / at.w;
+        };
+        const Vector3f first = place(-1.0f);
+        const Vector3f last = place(1.0f);
+        const float depth = first.z - last.z;
+        const float share =
+            distance > 0.0f && depth > 0.0f ? std::clamp((distance + first.z) / depth, 0.0f, 1.0f) : 1.0f;
+        for (const Vector3f& at : {first, first + (last - first) * share})
+            seen[places++] = (eye.world * Vector4f(at, 1.0f)).xyz();
+    }
+    for (int i = 0; i < places; ++i)
+        reach.seenCentre += seen[i] / float(places);
+    for (int i = 0; i < places; ++i)
+        reach.seenRadius = std::max(reach.seenRadius, length(seen[i] - reach.seenCentre));
+}
+
+void ShadowParts::draw(const ShadowView& view)
+{
+    const RenderContext::DrawScope scope(*context);
+    const Viewport viewport = getViewport(*context);
+    const unsigned framebuffer = RenderTarget::getBoundFramebuffer();
+    target->enable();
+    setViewport(*context, {ShadowView::BORDER, ShadowView::BORDER, size, size});
+    Background(Colour4f::WHITE).enable(*context);
+    casters.begin(view);
+    for (Solid* solid : walk.solids)
+        casters.draw(*context, *solid);
+    casters.finish();
+    RenderTarget::bindFramebuffer(framebuffer);
+    setViewport(*context, viewport);
+}
+
+void ShadowParts::publish(const ShadowView& view, int lightIndex)
+{
+    const float side = float(size + 2 * ShadowView::BORDER);
+    map->set(Vector4f(SOFT_REACH, 1.0f / side, (view.isSpot ? 1.0f : -1.0f) / 255.0f, float(lightIndex)));
+    for (int i = 0; i < 3; ++i)
+        rows[i]->set(view.rows[i]);
+    offset->set(view.offset);
+    index->set(float(lightIndex));
+    light->set(view.light);
+    depths->set(texture);
+}
+
+/// Programs ask no map for a light that there is not.
+void ShadowParts::switchOff()
+{
+    if (map)
+        map->set(Vector4f(SOFT_REACH, 1.0f, -1.0f, -1.0f));
+    if (index)
+        index->set(-1.0f);
+}
+
+} // namespace detail
+
+ShadowMap::ShadowMap(const SharedPtr<RenderContext>& context, const SharedPtr<AssetCachePool>& pool, int size)
+    : m_parts(std::make_unique<detail::ShadowParts>(context, pool, size))
+{
+}
+
+ShadowMap::~ShadowMap()
+{
+    detach();
+    m_parts->switchOff();
+    if (m_parts->depths && m_parts->depths->get() == m_parts->texture)
+        m_parts->depths->set(nullptr); // a context does not keep its pool's textures
+}
+
+bool ShadowMap::isComplete() const
+{
+    return m_parts->isComplete();
+}
+
+int ShadowMap::attach(SceneNode& scene)
+{
+    if (!isComplete())
+        return 0;
+    detail::ShadowParts& parts = *m_parts;
+    std::vector<const Appearance*> seen;
+    int count = 0;
+    const auto change = [&](const SharedPtr<Appearance>& appearance)
+    {
+        if (std::find(seen.begin(), seen.end(), appearance.get()) != seen.end())
+            return;
+        seen.push_back(appearance.get());
+        SharedPtr<ShaderProgram> program;
+        switch (parts.programs.findLit(*appearance, program))
+        {
+        case detail::ShadowAnswer::TAKES:
+            ++count;
+            if (program == appearance->getShaderProgram())
+                break;
+            parts.changed.push_back({appearance, appearance->getShaderProgram(), program});
+            appearance->setShaderProgram(program);
+            break;
+        case detail::ShadowAnswer::NO_ROOM:
+            parts.warn(parts.isRoomSaid, "A material takes no shadows: its program has no room for them.");
+            break;
+        case detail::ShadowAnswer::NO_PROGRAM:
+            parts.warn(parts.isProgramSaid, "A material takes no shadows: the device refuses the program.");
+            break;
+        case detail::ShadowAnswer::STAYS: break;
+        }
+    };
+    detail::MaterialWalk<decltype(change)> walk(change);
+    visitScene(walk, scene);
+    return count;
+}
+
+void ShadowMap::detach()
+{
+    for (const detail::ShadowParts::Changed& changed : m_parts->changed)
+    {
+        if (changed.appearance->getShaderProgram() == changed.now)
+            changed.appearance->setShaderProgram(changed.before);
+    }
+    m_parts->changed.clear();
+}
+
+void ShadowMap::setLight(const SharedPtr<Light>& light)
+{
+    m_parts->wanted = light;
+    m_parts->isLightSaid = false;
+}
+
+void ShadowMap::setThrowers(const FlagMask& flags)
+{
+    m_parts->thrower = flags;
+}
+
+void ShadowMap::setDistance(float distance)
+{
+    m_parts->distance = distance > 0.0f ? distance : 0.0f;
+}
+
+void ShadowMap::render(SceneNode& scene, Camera* camera, const FlagMask& renderFlags,
+                       const FlagMask& recursiveFlags)
+{
+    detail::ShadowParts& parts = *m_parts;
+    if (!isComplete())
+        return;
+    parts.find(scene, renderFlags, recursiveFlags);
+    const Light* const light = parts.walk.light;
+    if (!light || parts.walk.lightIndex >= detail::MOST_LIGHTS)
+    {
+        parts.switchOff();
+        return parts.warn(parts.isLightSaid,
+                          "No shadows: no directional or spot light among the first five of the scene.");
+    }
+    parts.findReach(camera);
+    detail::ShadowView view;
+    if (!detail::makeShadowView(*light, parts.reach, parts.size, view))
+        return parts.switchOff();
+    parts.draw(view);
+    parts.publish(view, parts.walk.lightIndex);
+}
+
+} // namespace orv
