@@ -31,7 +31,7 @@ TEST_F(ConvertTest, failuresWriteNothing)
         {"tri.obj out.txt", 2, "out.txt: the output's name has to end in .glo"},
         {"tri.obj out.glo --fps 0", 2, "fps"},
         {"missing.obj out.glo", 1, "missing.obj: No such file"},
-        {". out.glo", 1, ".: not a file"},
+        {". out.glo", 2, ". is a folder and out.glo a scene"},
         {"broken.gltf out.glo", 1, "broken.gltf: "},
         {"noise.xyz out.glo", 1, "noise.xyz: "},
         {"tri.obj nowhere/out.glo", 1, "nowhere/out.glo: No such file"},

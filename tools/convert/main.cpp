@@ -94,7 +94,10 @@ std::string findConflict(const Command& command, bool isFolder)
         return job.model + " is a folder: --dry-run, --report, --depfile and --page are for single models";
     if (!isFolder && (folder.again || folder.processes > 1 || !command.shard.empty()))
         return job.model + " is no folder: --again, --jobs and --shard are for folders";
-    if (!isFolder && std::filesystem::path(job.out).extension() != ".glo")
+    const bool isScene = std::filesystem::path(job.out).extension() == ".glo";
+    if (isFolder && isScene)
+        return job.model + " is a folder and " + job.out + " a scene: name a folder for the scenes";
+    if (!isFolder && !isScene)
         return job.out + ": the output's name has to end in .glo";
     return "";
 }

@@ -17,7 +17,7 @@ namespace detail
 /// Inside a scope each operation does nothing when GL is known to hold what it asks for; what was remembered
 /// is forgotten first if bindings were changed elsewhere (see bindingepoch.h). Outside of scopes nothing is
 /// remembered. GL thread only.
-class ORV_API Bindings
+class Bindings
 {
 public:
     Bindings() { forget(); }
@@ -27,7 +27,7 @@ public:
     /// Leaves GL as RenderContext::DrawScope promises.
     void closeScope();
     bool isScopeOpen() const { return m_scopes != 0; }
-    void forget();
+    ORV_API void forget();
 
     void useProgram(unsigned name)
     {
@@ -124,11 +124,11 @@ private:
             forget();
     }
 
-    ORV_LOCAL void tidy();
+    void tidy();
     void sendProgram(unsigned name);
     void sendTexture(int unit, unsigned target, unsigned name, int slot);
-    ORV_LOCAL void sendTextureElsewhere(int unit, unsigned target, unsigned name, int slot);
-    ORV_LOCAL void selectUnit(unsigned unit);
+    void sendTextureElsewhere(int unit, unsigned target, unsigned name, int slot);
+    void selectUnit(unsigned unit);
     void sendArrayBuffer(unsigned name);
     void sendElementBuffer(unsigned name);
     void sendAttribArrays(uint32_t enabledMask);
