@@ -8,12 +8,13 @@ namespace orv
 /// A colour with opacity: four floats, normally 0 to 1, as the GL takes them (no colour space conversion).
 struct ORV_API Colour4f
 {
-    float r = 0.0f;
+    float r = 0.0f; ///< Red, green, blue and opacity, from 0 to 1.
     float g = 0.0f;
     float b = 0.0f;
     float a = 0.0f;
 
     constexpr Colour4f() = default;
+    /// Components from 0 to 1.
     constexpr Colour4f(float red, float green, float blue, float alpha) : r(red), g(green), b(blue), a(alpha)
     {
     }
@@ -24,7 +25,7 @@ struct ORV_API Colour4f
     /// Multiplies all four components, opacity included.
     void scale(float factor);
 
-    static const Colour4f RED;
+    static const Colour4f RED; ///< Opaque colours.
     static const Colour4f GREEN;
     static const Colour4f BLUE;
     static const Colour4f BLACK;

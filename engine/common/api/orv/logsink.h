@@ -8,6 +8,7 @@
 namespace orv
 {
 
+/// How much a record matters.
 enum class LogLevel : int32_t
 {
     DEBUGGING = 0,

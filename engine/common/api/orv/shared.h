@@ -29,6 +29,7 @@ public:
     virtual const char* getClassName() const = 0;
     static const char* className() { return "Shared"; }
 
+    /// How many pointers share it.
     int32_t sharedGetCount() const { return m_count.load(std::memory_order_relaxed); }
 
 private:

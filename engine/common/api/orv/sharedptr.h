@@ -30,7 +30,7 @@ class ORV_API SharedPtr
 {
 public:
     SharedPtr() = default;
-    SharedPtr(std::nullptr_t) {}
+    SharedPtr(std::nullptr_t) {} ///< An empty pointer.
 
     /// Takes a share of the object; a new object's count becomes 1.
     SharedPtr(T* pointer) : m_ptr(pointer)
@@ -39,8 +39,8 @@ public:
             m_ptr->sharedAcquire();
     }
 
+    /// Shares what the other one has, or takes it over.
     SharedPtr(const SharedPtr& other) : m_ptr(other.m_ptr) { acquireCopied(); }
-
     SharedPtr(SharedPtr&& other) noexcept : m_ptr(std::exchange(other.m_ptr, nullptr)) {}
 
     /// From a pointer to a derived class.
@@ -66,15 +66,17 @@ public:
         return *this;
     }
 
+    /// Lets go of what it has and shares another object, or none.
     void reset(T* pointer = nullptr)
     {
         SharedPtr replacement(pointer);
         swap(replacement);
     }
 
+    /// Exchanges what the two have.
     void swap(SharedPtr& other) noexcept { std::swap(m_ptr, other.m_ptr); }
 
-    T* get() const { return m_ptr; }
+    T* get() const { return m_ptr; } ///< The object, or null.
     /// The same; null is logged, as by the operators.
     T* getLogged() const { return operator->(); }
     explicit operator bool() const { return m_ptr != nullptr; }

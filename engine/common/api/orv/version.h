@@ -14,7 +14,7 @@ public:
     /// @param extra  copied; null counts as empty.
     Version(int major, int minor, int patch, const char* extra);
 
-    int getMajor() const { return m_major; }
+    int getMajor() const { return m_major; } ///< Its parts.
     int getMinor() const { return m_minor; }
     int getPatch() const { return m_patch; }
     const char* getExtra() const { return m_extra.c_str(); }

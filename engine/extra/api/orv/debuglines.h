@@ -44,6 +44,7 @@ public:
     explicit DebugLines(AssetCachePool& pool);
     ~DebugLines() override;
 
+    /// Adds a line in the world.
     void addLine(const Vector3f& from, const Vector3f& to, const Colour4f& colour);
     /// From one colour to another.
     void addLine(const Vector3f& from, const Colour4f& fromColour, const Vector3f& to,
@@ -71,8 +72,8 @@ public:
     /// @param aspect  width / height of the view.
     void addFrustum(Camera& camera, float aspect, const Colour4f& colour);
 
-    int getLineCount() const { return int(m_vertices.size() / 2); }
-    void clear(); ///< Takes all lines out again.
+    int getLineCount() const { return int(m_vertices.size() / 2); } ///< Lines added since clear().
+    void clear();                                                   ///< Takes all lines out again.
 
     /// Whether what lies before a line in the depth buffer hides it, as at first, or lines go over everything. Depth is
     /// never written.

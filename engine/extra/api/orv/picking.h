@@ -18,10 +18,10 @@ struct Ray;
 /// What a ray meets of a solid first.
 struct PickHit
 {
-    SharedPtr<Solid> solid;
-    uint32_t triangle = 0; ///< of the solid's mesh, counted from 0 in the order of drawing
-    Vector3f point;        ///< in the world
-    float distance = 0.0f; ///< world units from the ray's start
+    SharedPtr<Solid> solid; ///< What was met.
+    uint32_t triangle = 0;  ///< of the solid's mesh, counted from 0 in the order of drawing
+    Vector3f point;         ///< in the world
+    float distance = 0.0f;  ///< world units from the ray's start
 };
 
 /// Finds what a ray meets: the nearest triangle of each solid, skinned ones as their joints hold them at the moment. Sides

@@ -36,14 +36,15 @@ public:
     Appearance();
     ~Appearance() override;
 
-    const char* getName() const { return m_name.c_str(); }
-    void setName(const char* name); ///< copied; null counts as empty
+    const char* getName() const { return m_name.c_str(); } ///< For messages; empty at first.
+    void setName(const char* name);                        ///< copied; null counts as empty
 
     /// The render state as it was set. Each setter below stores its arguments; the next enable() sends them. What
     /// GL would refuse (a line width that is not above 0, a negative width or height, a depth offset of NaN) is
     /// logged and not stored.
     const RenderState& getRenderState() const { return m_state; }
 
+    /// What render state it is drawn with; see RenderState for what each means and how it starts.
     void setBlendColour(const Colour4f& colour);
     void setBlendFactors(BlendFactor srcColour, BlendFactor srcAlpha, BlendFactor dstColour,
                          BlendFactor dstAlpha);
@@ -62,6 +63,7 @@ public:
 
     /// @param mask  stored but never sent: the compare mask that is sent is the face's write mask.
     void setStencilFunction(StencilFace face, StencilFunction function, int reference, unsigned int mask);
+    /// What becomes of the stencil value in each case.
     void setStencilOperations(StencilFace face, StencilOperation stencilFail, StencilOperation depthFail,
                               StencilOperation pass);
     void setStencilMask(StencilFace face, unsigned int mask); ///< the face's write mask
@@ -73,6 +75,7 @@ public:
     /// Treats the appearance as opaque whatever its blend factors and functions say.
     void setForceOpaque(bool force);
 
+    /// The program that draws it; may be empty.
     const SharedPtr<ShaderProgram>& getShaderProgram() const { return m_shaderProgram; }
     void setShaderProgram(const SharedPtr<ShaderProgram>& program);
 

@@ -23,6 +23,7 @@ public:
     /// Takes an asset in under a name, or unnamed if the name is null.
     void add(const SharedPtr<T>& asset, const char* name) { addAsset(asset, name); }
 
+    /// Adds a loader behind those that are there.
     void registerLoader(const SharedPtr<AssetLoader<T>>& loader) { addLoader(loader); }
 
     /// Calls visit(const SharedPtr<T>&) for every entry, named ones first; an asset under two names comes twice.

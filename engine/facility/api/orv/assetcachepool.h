@@ -64,6 +64,7 @@ public:
     /// new context. Sources, loaders and the cache source stay.
     void forgetContext();
 
+    /// The caches; never empty in a complete pool.
     const SharedPtr<IndexBufferCache>& getIndexBufferCache() const { return m_indexBufferCache; }
     const SharedPtr<ShaderProgramCache>& getShaderProgramCache() const { return m_shaderProgramCache; }
     const SharedPtr<Texture2DCache>& getTexture2DCache() const { return m_texture2DCache; }

@@ -9,10 +9,10 @@ namespace orv
 /// byte that FileToString appends serves.
 struct CharRange
 {
-    char* start = nullptr;
-    char* end = nullptr;
+    char* start = nullptr; ///< The first character.
+    char* end = nullptr;   ///< Behind the last one.
 
-    bool empty() const { return start == end; }
+    bool empty() const { return start == end; } ///< Whether there are no characters in it.
 };
 
 } // namespace orv

@@ -9,8 +9,9 @@ namespace orv
 /// call; the two answers are remembered for the life of the process, even across a lost context.
 
 ORV_API bool GL_OES_EGL_image_external_supported();
-ORV_API bool GL_OES_get_program_binary_supported();
+ORV_API bool GL_OES_get_program_binary_supported(); ///< Whether the driver has it; asked once.
 
+/// The entry points of the extension.
 using GetProgramBinaryFunction = void (*)(unsigned int program, int capacity, int* length,
                                           unsigned int* format, void* binary);
 using ProgramBinaryFunction = void (*)(unsigned int program, unsigned int format, const void* binary,

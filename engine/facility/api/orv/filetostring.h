@@ -22,14 +22,15 @@ public:
     /// @param path  relative to the working directory.
     explicit FileToString(const char* path);
 
+    /// Takes the text over; the other one is empty afterwards.
     FileToString(FileToString&& other) noexcept;
     FileToString& operator=(FileToString&& other) noexcept;
 
     /// Replaces the text by what is left of the stream. A short read gives a shorter text.
     void read(Stream& stream);
 
-    char* getStart() const { return m_text.get(); }
-    char* getEnd() const { return m_end; } ///< Points at the zero byte.
+    char* getStart() const { return m_text.get(); } ///< The text, ended by a NUL.
+    char* getEnd() const { return m_end; }          ///< Points at the zero byte.
     CharRange getRange() const { return {m_text.get(), m_end}; }
 
 private:

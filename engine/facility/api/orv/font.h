@@ -20,6 +20,7 @@ public:
     ORV_CLASS_NAME("Font")
     using Ptr = SharedPtr<Font>;
 
+    /// Where a character lies in the atlas and how it is placed, in pixels.
     struct CharacterData
     {
         /// The glyph's rectangle in the atlas, from its upper left corner; x1 and y1 lie just outside.
@@ -43,6 +44,7 @@ public:
          int firstChar, int charCount, const CharacterData* data);
     ~Font() override;
 
+    /// The atlas, its measures in pixels, and which characters it holds.
     const SharedPtr<Texture2D>& getTexture() const { return m_texture; }
     int getSize() const { return m_size; }
     float getAscent() const { return m_ascent; }

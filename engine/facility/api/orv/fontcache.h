@@ -26,6 +26,7 @@ public:
                      float lineGap, int firstChar, int charCount, const Font::CharacterData* data,
                      const char* name);
 
+    /// Where atlases are kept.
     const SharedPtr<Texture2DCache>& getTexture2DCache() const { return m_texture2DCache; }
 
 private:

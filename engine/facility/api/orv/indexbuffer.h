@@ -61,6 +61,7 @@ public:
     /// The same but for the call of GL that draws.
     detail::DrawCall bind(RenderContext& context);
 
+    /// What the indices make, and how many there are.
     Primitive getPrimitive() const { return m_primitive; }
     int getCount() const { return m_count; }
 

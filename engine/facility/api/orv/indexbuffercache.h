@@ -6,6 +6,7 @@
 namespace orv
 {
 
+/// Makes index buffers and holds them by name. GL thread only.
 class ORV_API IndexBufferCache : public AssetCache<IndexBuffer>
 {
 public:

@@ -15,9 +15,10 @@ namespace orv
 
 class MeshGeometry;
 
+/// What is known of a mesh besides its buffers.
 struct MeshHeader
 {
-    static constexpr float INVALID_BOUNDING_RADIUS = -1.0f;
+    static constexpr float INVALID_BOUNDING_RADIUS = -1.0f; ///< Marks a radius that is not known.
 
     /// Of a sphere about the mesh's origin around all of its vertices, or INVALID_BOUNDING_RADIUS for unknown.
     float boundingRadius = INVALID_BOUNDING_RADIUS;
@@ -33,11 +34,12 @@ public:
     ORV_CLASS_NAME("Mesh")
     using Ptr = SharedPtr<Mesh>;
 
+    /// Shares the buffers.
     Mesh(const MeshHeader& header, const IndexBuffer::Ptr& indexBuffer,
          const VertexBuffer::Ptr& vertexBuffer);
     ~Mesh() override;
 
-    const MeshHeader& getHeader() const { return m_header; }
+    const MeshHeader& getHeader() const { return m_header; } ///< What it was made of.
     const IndexBuffer::Ptr& getIndexBuffer() const { return m_indexBuffer; }
     const VertexBuffer::Ptr& getVertexBuffer() const { return m_vertexBuffer; }
 

@@ -12,6 +12,7 @@ namespace orv
 class ORV_API MeshCache : public AssetCache<Mesh>
 {
 public:
+    /// Meshes take their buffers from these caches.
     MeshCache(const SharedPtr<IndexBufferCache>& indexBufferCache,
               const SharedPtr<VertexBufferCache>& vertexBufferCache);
     ~MeshCache() override;
@@ -20,6 +21,7 @@ public:
     Mesh::Ptr create(const MeshHeader& header, const IndexBuffer::Ptr& indexBuffer,
                      const VertexBuffer::Ptr& vertexBuffer, const char* name);
 
+    /// Where the buffers of meshes are kept.
     const SharedPtr<IndexBufferCache>& getIndexBufferCache() const { return m_indexBufferCache; }
     const SharedPtr<VertexBufferCache>& getVertexBufferCache() const { return m_vertexBufferCache; }
 

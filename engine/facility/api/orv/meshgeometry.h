@@ -26,8 +26,8 @@ public:
     /// What moves a vertex: up to four joints, by their numbers, and their shares, which add up to 1.
     struct Influence
     {
-        uint8_t joints[4] = {0, 0, 0, 0};
-        float weights[4] = {1.0f, 0.0f, 0.0f, 0.0f};
+        uint8_t joints[4] = {0, 0, 0, 0};            ///< The joints that move the vertex, by number.
+        float weights[4] = {1.0f, 0.0f, 0.0f, 0.0f}; ///< The share of each.
     };
 
     std::vector<Vector3f> places;      ///< in the mesh's own space
@@ -53,13 +53,14 @@ public:
                  const unsigned short* indices, std::size_t count);
     ~MeshGeometry() override;
 
+    /// The vertices, which other geometries may share.
     const MeshVertices& getVertices() const { return *m_vertices.get(); }
     /// Which of the vertices are drawn.
     const std::vector<bool>& getDrawn() const { return m_drawn; }
     /// Three vertices for each, wound as they are drawn; none of points and lines.
     const std::vector<uint32_t>& getTriangles() const { return m_triangles; }
 
-    Bounds findBounds() const;
+    Bounds findBounds() const; ///< How far the triangles reach.
     /// By the joints' numbers, as Mesh::getJointBounds() has them.
     std::vector<Bounds> findJointBounds() const;
 

@@ -16,7 +16,7 @@ public:
     /// @param name  copied.
     explicit PropertyRef(const char* name) : m_name(name ? name : "") {}
 
-    const char* getName() const { return m_name.c_str(); }
+    const char* getName() const { return m_name.c_str(); } ///< The property's name.
 
     /// The same as Appearance::setProperty.
     template <class T>

@@ -56,7 +56,7 @@ public:
     RenderContext();
     ~RenderContext() override;
 
-    void setBlendEnabled(bool enabled);
+    void setBlendEnabled(bool enabled); ///< See RenderState; what GL has already is not sent again.
     void setBlendColour(const Colour4f& colour);
     /// Both sources first, unlike glBlendFuncSeparate.
     void setBlendFactors(BlendFactor srcColour, BlendFactor srcAlpha, BlendFactor dstColour,
@@ -89,7 +89,7 @@ public:
     /// Clears colour, depth and stencil buffers together, every time; masks and scissor box apply as set.
     void clear();
 
-    bool isBlendEnabled() const { return m_blendEnabled; }
+    bool isBlendEnabled() const { return m_blendEnabled; } ///< What was sent last.
     /// All cached state that materials set. stencilFunctionMask holds what was sent to GL.
     const RenderState& getState() const { return m_state; }
     int getViewportX() const { return m_viewport[0]; }
@@ -143,7 +143,7 @@ public:
     /// texture, or that changed the active texture unit or vertex attributes. Makes no GL call.
     void forgetBindings() { m_bindings.forget(); }
 
-    bool isDrawScopeOpen() const { return m_bindings.isScopeOpen(); }
+    bool isDrawScopeOpen() const { return m_bindings.isScopeOpen(); } ///< Whether a draw scope is open.
 
     /// Whether apply() turns every winding order once more, for a view that mirrors everything. Renderers set it
     /// for cameras whose world transform mirrors, and put it back.

@@ -31,7 +31,7 @@ public:
     static const char* getExtensions();
     static const char* getShaderVersion();
 
-    static int getMaxVertexUniformVectors();
+    static int getMaxVertexUniformVectors(); ///< What the driver has of each; asked once.
     static int getMaxFragmentUniformVectors();
     static int getMaxVertexAttributeVectors();
     static int getMaxVaryingVectors();

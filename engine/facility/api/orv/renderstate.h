@@ -13,7 +13,7 @@ namespace orv
 /// How one value of a render-state enum is written in appearance files. Tables of these are indexed by the enum's value.
 struct RenderStateWord
 {
-    const char* keyword;
+    const char* keyword;               ///< The word.
     const char* alternative = nullptr; ///< second accepted spelling; null where there is none
 };
 
@@ -29,12 +29,14 @@ constexpr int findKeyword(const RenderStateWord* table, std::size_t size, std::s
     return -1;
 }
 
+/// The place of a keyword in a table. @return -1 if it is none of them.
 template <std::size_t N>
 constexpr int findKeyword(const RenderStateWord (&table)[N], std::string_view keyword)
 {
     return findKeyword(table, N, keyword);
 }
 
+/// What blending multiplies source and destination by.
 enum class BlendFactor : int32_t
 {
     CONSTANT_ALPHA = 0,
@@ -54,6 +56,7 @@ enum class BlendFactor : int32_t
     ZERO = 14
 };
 
+/// The factors as files and GL name them.
 inline constexpr RenderStateWord BLEND_FACTORS[] = {
     {"CONSTANT_ALPHA"},
     {"CONSTANT_COLOUR"},
@@ -72,6 +75,7 @@ inline constexpr RenderStateWord BLEND_FACTORS[] = {
     {"ZERO"},
 };
 
+/// What blending does with the two products.
 enum class BlendFunction : int32_t
 {
     ADD = 0,
@@ -79,12 +83,14 @@ enum class BlendFunction : int32_t
     SUBTRACT = 2
 };
 
+/// The functions as files and GL name them.
 inline constexpr RenderStateWord BLEND_FUNCTIONS[] = {
     {"ADD"},
     {"REVERSE_SUBTRACT"},
     {"SUBTRACT"},
 };
 
+/// Which sides of triangles are not drawn.
 enum class CullingMode : int32_t
 {
     CULL_BACK = 0,
@@ -93,6 +99,7 @@ enum class CullingMode : int32_t
     CULL_NONE = 3
 };
 
+/// The modes as files and GL name them.
 inline constexpr RenderStateWord CULLING_MODES[] = {
     {"BACK", "CULL_BACK"},
     {"FRONT", "CULL_FRONT"},
@@ -100,17 +107,20 @@ inline constexpr RenderStateWord CULLING_MODES[] = {
     {"NONE", "CULL_NONE"},
 };
 
+/// Which turn of the corners is the front.
 enum class WindingOrder : int32_t
 {
     WINDING_CCW = 0,
     WINDING_CW = 1
 };
 
+/// The orders as files and GL name them.
 inline constexpr RenderStateWord WINDING_ORDERS[] = {
     {"CCW", "WINDING_CCW"},
     {"CW", "WINDING_CW"},
 };
 
+/// When a fragment passes, by its value and the one that is there.
 enum class DepthFunction : int32_t
 {
     NEVER = 0,
@@ -141,6 +151,7 @@ inline constexpr RenderStateWord COMPARISONS[] = {
     {"NEVER"}, {"LESS"}, {"EQUAL"}, {"LEQUAL"}, {"GREATER"}, {"NOTEQUAL"}, {"GEQUAL"}, {"ALWAYS"},
 };
 
+/// What becomes of a stencil value.
 enum class StencilOperation : int32_t
 {
     ZERO = 0,
@@ -153,6 +164,7 @@ enum class StencilOperation : int32_t
     DECR_WRAP = 7
 };
 
+/// The operations as files and GL name them.
 inline constexpr RenderStateWord STENCIL_OPERATIONS[] = {
     {"ZERO"}, {"KEEP"}, {"REPLACE"}, {"INCR"}, {"DECR"}, {"INVERT"}, {"INCR_WRAP"}, {"DECR_WRAP"},
 };
@@ -166,8 +178,9 @@ enum class StencilFace : int32_t
     STENCIL_FRONT = FRONT
 };
 
-inline constexpr int STENCIL_FACE_COUNT = 2;
+inline constexpr int STENCIL_FACE_COUNT = 2; ///< Back and front.
 
+/// The faces as files and GL name them.
 inline constexpr RenderStateWord STENCIL_FACES[STENCIL_FACE_COUNT] = {
     {"BACK"},
     {"FRONT"},
@@ -177,7 +190,7 @@ inline constexpr RenderStateWord STENCIL_FACES[STENCIL_FACE_COUNT] = {
 /// Two-element arrays are indexed by StencilFace.
 struct RenderState
 {
-    Colour4f blendColour;
+    Colour4f blendColour; ///< Blending: the constant colour, the factors, the functions.
     BlendFactor blendSrcColour = BlendFactor::ONE;
     BlendFactor blendSrcAlpha = BlendFactor::ONE;
     BlendFactor blendDstColour = BlendFactor::ZERO;
@@ -185,28 +198,29 @@ struct RenderState
     BlendFunction blendFunctionColour = BlendFunction::ADD;
     BlendFunction blendFunctionAlpha = BlendFunction::ADD;
 
-    CullingMode cullingMode = CullingMode::CULL_BACK;
+    CullingMode cullingMode = CullingMode::CULL_BACK;      ///< Which sides are left out.
     WindingOrder windingOrder = WindingOrder::WINDING_CCW; ///< which winding is front-facing
     float lineWidth = 1.0f;                                ///< pixels
 
-    bool colourMaskRed = true;
+    bool colourMaskRed = true; ///< Which components are written.
     bool colourMaskGreen = true;
     bool colourMaskBlue = true;
     bool colourMaskAlpha = true;
 
+    /// Depth: whether it is written and tested, how, and by how much it is shifted.
     bool depthWriteEnabled = true;
     float depthOffsetFactor = 0.0f;
     float depthOffsetUnits = 0.0f;
     bool depthTestEnabled = true;
     DepthFunction depthFunction = DepthFunction::LESS;
 
-    bool scissorTestEnabled = false;
-    int scissorX = 0; ///< pixels from the lower left corner
+    bool scissorTestEnabled = false; ///< Whether only the scissor box is drawn to.
+    int scissorX = 0;                ///< pixels from the lower left corner
     int scissorY = 0;
     int scissorWidth = 0;
     int scissorHeight = 0;
 
-    bool stencilTestEnabled = false;
+    bool stencilTestEnabled = false; ///< Whether stencil values decide; all others for each face.
     StencilFunction stencilFunction[STENCIL_FACE_COUNT] = {StencilFunction::ALWAYS, StencilFunction::ALWAYS};
     int stencilReference[STENCIL_FACE_COUNT] = {0, 0};
     /// Kept, but a material never sends it: its comparisons go through stencilWriteMask (RenderContext::apply).

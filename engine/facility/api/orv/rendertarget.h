@@ -44,6 +44,7 @@ public:
     /// The same at the depth attachment; also gives up the depth buffer, if there is one.
     void setDepthTexture(const SharedPtr<Texture2D>& texture);
 
+    /// What it draws into; may be empty.
     const SharedPtr<Texture2D>& getColourTexture() const { return m_colour; }
     const SharedPtr<Texture2D>& getDepthTexture() const { return m_depth; }
     unsigned getId() const { return m_framebuffer; } ///< GL name, 0 if creation failed

@@ -51,7 +51,7 @@ public:
     /// Identifies this program for as long as the process lives.
     uint64_t getRevision() const { return m_revision; }
 
-    int getUniformCount() const { return int(m_uniforms.size()); }
+    int getUniformCount() const { return int(m_uniforms.size()); } ///< Of active uniforms.
 
     /// The GLSL name up to its first "[". The text lives as long as the program; null for a bad index (logged).
     const char* getUniformInstanceName(int index) const;

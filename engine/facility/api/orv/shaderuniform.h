@@ -149,9 +149,11 @@ protected:
     /// @param size  below 1 is an error and counts as 1.
     ShaderUniformBase(int type, int size);
 
+    /// For those that copy: both have to be of one size.
     static void assertSize(const ShaderUniformBase* other, int size);
 
-    void becomeSingle() { m_size = 1; }
+    void becomeSingle() { m_size = 1; } ///< For derived classes: one element from now on.
+    /// For derived classes: marks the value as changed.
     void touch() { m_revision = detail::nextRevision(); }
 
     void* m_data = nullptr; ///< the values: the derived class's own one, or an array when there are more
@@ -213,6 +215,7 @@ public:
     using ShaderUniformBase::getValue;
     using ShaderUniformBase::setValue;
 
+    /// Elements are counted from 0. @return false, and nothing is stored, beyond the size (logged when it is set).
     bool setValue(const T& value, int index) override
     {
         if (index < 0 || index >= getSize())
@@ -224,6 +227,7 @@ public:
         return true;
     }
 
+    /// See setValue().
     bool getValue(T& value, int index) const override
     {
         if (index < 0 || index >= getSize())

@@ -14,6 +14,7 @@ class ORV_API TextureCube;
 /// Pixel layouts of both kinds of texture.
 struct ORV_API Texture
 {
+    /// Which components a pixel has.
     enum class Format : int32_t
     {
         RGBA = 0,
@@ -24,6 +25,7 @@ struct ORV_API Texture
         DEPTH = 5
     };
 
+    /// How the components of a pixel are stored.
     enum class Type : int32_t
     {
         UNSIGNED_BYTE = 0,
@@ -44,6 +46,7 @@ struct ORV_API Texture
 /// How a texture is sampled: a plain record.
 struct TextureParameters
 {
+    /// How a texture is read between its pixels.
     enum class FilterMode : int32_t
     {
         NEAREST = 0,
@@ -54,6 +57,7 @@ struct TextureParameters
         LINEAR_MIPMAP_LINEAR = 5
     };
 
+    /// What lies beyond the edges of a texture.
     enum class WrapMode : int32_t
     {
         REPEAT = 0,
@@ -61,6 +65,7 @@ struct TextureParameters
         MIRRORED_REPEAT = 2
     };
 
+    /// All four at once.
     constexpr TextureParameters(FilterMode min, FilterMode mag, WrapMode horizontal, WrapMode vertical)
         : minFilter(min)
         , magFilter(mag)
@@ -69,7 +74,7 @@ struct TextureParameters
     {
     }
 
-    FilterMode minFilter;
+    FilterMode minFilter; ///< How it is read when it is drawn smaller, larger, and beyond its edges.
     FilterMode magFilter;
     WrapMode horizontalWrap;
     WrapMode verticalWrap;

@@ -19,7 +19,7 @@ class ORV_API Texture2D : public Shared
 {
 public:
     using Ptr = SharedPtr<Texture2D>;
-    using FilterMode = TextureParameters::FilterMode;
+    using FilterMode = TextureParameters::FilterMode; ///< See TextureParameters.
     using WrapMode = TextureParameters::WrapMode;
 
     ORV_CLASS_NAME("Texture2D")

@@ -21,6 +21,7 @@ class ORV_API TextureCube : public Shared
 public:
     using Ptr = SharedPtr<TextureCube>;
 
+    /// The directions of the faces.
     enum class Face : int32_t
     {
         POSITIVE_X = 0,
@@ -31,10 +32,11 @@ public:
         NEGATIVE_Z = 5
     };
 
-    static constexpr int FACE_COUNT = 6;
+    static constexpr int FACE_COUNT = 6; ///< Of a cube.
 
     ORV_CLASS_NAME("TextureCube")
 
+    /// Made by a TextureCubeCache.
     TextureCube(unsigned width, unsigned height, Texture::Format format, Texture::Type type,
                 const SharedPtr<detail::TextureResource>& resource);
     ~TextureCube() override;
@@ -55,6 +57,7 @@ public:
     /// and values outside their enums are refused (logged) and nothing changes.
     void setParameters(const TextureParameters& parameters);
 
+    /// The GL name, 0 when there is none, and its target.
     unsigned getId() const { return m_resource ? m_resource.get()->getId() : 0; }
     unsigned getTarget() const { return detail::TEXTURE_TARGET_CUBE_MAP; }
     unsigned getWidth() const { return m_width; }   ///< pixels of a face

@@ -22,13 +22,13 @@ public:
     VertexArray(int vertexCount, int typeSize, int componentCount);
     ~VertexArray() override;
 
-    int getVertexCount() const { return m_vertexCount; }
-    int getTypeSize() const { return m_typeSize; }                      ///< Bytes of one component.
-    int getComponentCount() const { return m_componentCount; }          ///< Per vertex.
+    int getVertexCount() const { return m_vertexCount; }       ///< How many vertices it has room for.
+    int getTypeSize() const { return m_typeSize; }             ///< Bytes of one component.
+    int getComponentCount() const { return m_componentCount; } ///< Per vertex.
     int getVertexSize() const { return m_typeSize * m_componentCount; } ///< Bytes.
     unsigned int getSizeInBytes() const { return m_sizeInBytes; }
 
-    unsigned char* getBytes() { return m_bytes.get(); }
+    unsigned char* getBytes() { return m_bytes.get(); } ///< All of it.
     const unsigned char* getBytes() const { return m_bytes.get(); }
 
     /// The components as a T. @return null, after logging an assertion, if a T has another size than they.
@@ -37,6 +37,7 @@ public:
     {
         return checkTypeSize(sizeof(T)) ? reinterpret_cast<T*>(m_bytes.get()) : nullptr;
     }
+    /// The same, for reading.
     template <class T>
     const T* getData() const
     {

@@ -50,6 +50,7 @@ public:
     ORV_CLASS_NAME("VertexBuffer")
     using Ptr = SharedPtr<VertexBuffer>;
 
+    /// The type of an attribute's components.
     enum class AttribFormat : uint32_t
     {
         BYTE = 0,
@@ -60,6 +61,7 @@ public:
         FIXED = 5 ///< 16.16 fixed point, four bytes.
     };
 
+    /// Where an attribute's values are.
     enum class AttribUsage : uint32_t
     {
         GL_BUFFER = 0,    ///< Moves into the GL buffer at commit().
@@ -69,10 +71,10 @@ public:
     /// One attribute of data that is interleaved already.
     struct AttribDescription
     {
-        std::string name;
-        AttribFormat format = AttribFormat::FLOAT;
-        bool normalised = false;
-        int offset = 0; ///< Bytes.
+        std::string name;                          ///< As the shader program calls it.
+        AttribFormat format = AttribFormat::FLOAT; ///< Of its components.
+        bool normalised = false;                   ///< Whether integers stand for shares of the largest one.
+        int offset = 0;                            ///< Bytes.
         int componentCount = 0;
         int stride = 0; ///< Bytes; 0 = tightly packed.
     };

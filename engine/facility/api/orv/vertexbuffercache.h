@@ -6,6 +6,7 @@
 namespace orv
 {
 
+/// Makes vertex buffers and holds them by name. GL thread only.
 class ORV_API VertexBufferCache : public AssetCache<VertexBuffer>
 {
 public:

@@ -14,10 +14,11 @@ class ORV_API Angle
 public:
     constexpr Angle() = default;
 
+    /// An angle of so many radians, or degrees.
     static constexpr Angle fromRadians(T radians) { return Angle(radians); }
     static constexpr Angle fromDegrees(T degrees) { return Angle(degrees / DEGREES_PER_RADIAN); }
 
-    constexpr T radians() const { return m_radians; }
+    constexpr T radians() const { return m_radians; } ///< Its size.
     constexpr T degrees() const { return m_radians * DEGREES_PER_RADIAN; }
 
     constexpr Angle operator-() const { return Angle(-m_radians); }
@@ -29,6 +30,7 @@ public:
     friend constexpr Angle operator/(Angle angle, T divisor) { return Angle(angle.m_radians / divisor); }
     friend constexpr bool operator==(Angle a, Angle b) { return a.m_radians == b.m_radians; }
     friend constexpr bool operator<(Angle a, Angle b) { return a.m_radians < b.m_radians; }
+    /// Without its sign.
     friend constexpr Angle abs(Angle angle) { return angle.m_radians < T(0) ? -angle : angle; }
 
 private:
@@ -39,7 +41,7 @@ private:
     T m_radians = T();
 };
 
-using Anglef = Angle<float>;
+using Anglef = Angle<float>; ///< The angle that the engine takes.
 
 /// In degrees: "Anglef(90 degrees)".
 ORV_API std::string toString(const Anglef& angle);

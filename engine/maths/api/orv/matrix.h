@@ -18,15 +18,16 @@ namespace orv
 template <class T>
 struct ORV_API Matrix2
 {
-    Vector2<T> columns[2];
+    Vector2<T> columns[2]; ///< From the left.
 
     constexpr Matrix2() = default;
+    /// Made of its columns, from the left.
     constexpr Matrix2(const Vector2<T>& column0, const Vector2<T>& column1) : columns{column0, column1} {}
 
     Vector2<T>& operator[](int index) { return columns[detail::checkedIndex(index, 2)]; }
     const Vector2<T>& operator[](int index) const { return columns[detail::checkedIndex(index, 2)]; }
 
-    const T* data() const { return columns[0].data(); }
+    const T* data() const { return columns[0].data(); } ///< The elements, column by column.
 
     friend constexpr Vector2<T> operator*(const Matrix2& m, const Vector2<T>& v)
     {
@@ -46,9 +47,10 @@ struct ORV_API Matrix2
 template <class T>
 struct ORV_API Matrix3
 {
-    Vector3<T> columns[3];
+    Vector3<T> columns[3]; ///< From the left.
 
     constexpr Matrix3() = default;
+    /// Made of its columns, from the left.
     constexpr Matrix3(const Vector3<T>& column0, const Vector3<T>& column1, const Vector3<T>& column2)
         : columns{column0, column1, column2}
     {
@@ -57,7 +59,7 @@ struct ORV_API Matrix3
     Vector3<T>& operator[](int index) { return columns[detail::checkedIndex(index, 3)]; }
     const Vector3<T>& operator[](int index) const { return columns[detail::checkedIndex(index, 3)]; }
 
-    const T* data() const { return columns[0].data(); }
+    const T* data() const { return columns[0].data(); } ///< The elements, column by column.
 
     friend constexpr Vector3<T> operator*(const Matrix3& m, const Vector3<T>& v)
     {
@@ -72,7 +74,7 @@ struct ORV_API Matrix3
         return m.columns[0] == n.columns[0] && m.columns[1] == n.columns[1] && m.columns[2] == n.columns[2];
     }
 
-    static const Matrix3 IDENTITY;
+    static const Matrix3 IDENTITY; ///< Changes nothing.
 };
 
 template <class T>
@@ -102,9 +104,10 @@ ORV_API void multiplyAffine(Matrix4<float>& result, const Matrix4<float>& m, con
 template <class T>
 struct ORV_API Matrix4
 {
-    Vector4<T> columns[4];
+    Vector4<T> columns[4]; ///< From the left.
 
     constexpr Matrix4() = default;
+    /// Made of its columns, from the left.
     constexpr Matrix4(const Vector4<T>& column0, const Vector4<T>& column1, const Vector4<T>& column2,
                       const Vector4<T>& column3)
         : columns{column0, column1, column2, column3}
@@ -114,7 +117,7 @@ struct ORV_API Matrix4
     Vector4<T>& operator[](int index) { return columns[detail::checkedIndex(index, 4)]; }
     const Vector4<T>& operator[](int index) const { return columns[detail::checkedIndex(index, 4)]; }
 
-    const T* data() const { return columns[0].data(); }
+    const T* data() const { return columns[0].data(); } ///< The elements, column by column.
 
     friend constexpr Vector4<T> operator*(const Matrix4& m, const Vector4<T>& v)
     {
@@ -127,7 +130,7 @@ struct ORV_API Matrix4
                m.columns[3] == n.columns[3];
     }
 
-    static const Matrix4 IDENTITY;
+    static const Matrix4 IDENTITY; ///< Changes nothing.
 };
 
 template <class T>
@@ -185,15 +188,15 @@ float getStretch(const Matrix4<float>& m);
 
 } // namespace detail
 
-using Matrix2f = Matrix2<float>;
+using Matrix2f = Matrix2<float>; ///< The matrices that the engine takes.
 using Matrix3f = Matrix3<float>;
 using Matrix4f = Matrix4<float>;
 
-ORV_API Matrix2f transpose(const Matrix2f& m);
+ORV_API Matrix2f transpose(const Matrix2f& m); ///< Rows become columns.
 ORV_API Matrix3f transpose(const Matrix3f& m);
 ORV_API Matrix4f transpose(const Matrix4f& m);
 
-ORV_API float determinant(const Matrix3f& m);
+ORV_API float determinant(const Matrix3f& m); ///< 0 where there is no inverse.
 ORV_API float determinant(const Matrix4f& m);
 
 /// @return the zero matrix if there is no inverse or it does not fit floats; never infinities or NaN.
@@ -206,6 +209,7 @@ ORV_API Matrix4f inverse(const Matrix4f& m);
     return Matrix3f(m.columns[0].xyz(), m.columns[1].xyz(), m.columns[2].xyz());
 }
 
+/// Moves by an offset, or scales by factors along the axes.
 ORV_API Matrix4f translationMatrix(const Vector3f& offset);
 ORV_API Matrix4f scaleMatrix(const Vector3f& factors);
 
@@ -230,7 +234,7 @@ ORV_API Matrix4f scaleMatrix(const Vector3f& factors);
     return Matrix3f(Vector3f(1.0f - yy - zz, xy + az, xz - ay), Vector3f(xy - az, 1.0f - xx - zz, yz + ax),
                     Vector3f(xz + ay, yz - ax, 1.0f - xx - yy));
 }
-ORV_API Matrix4f toMatrix4(const Quaternionf& q);
+ORV_API Matrix4f toMatrix4(const Quaternionf& q); ///< The matrix that turns as the quaternion does.
 
 /// The world transform of something at eye that looks along its -z at target (a camera, a light).
 /// @param up  becomes the +y side as far as possible; if it lies along the line of sight, another axis serves.

@@ -14,12 +14,13 @@ namespace orv
 template <class T>
 struct ORV_API Quaternion
 {
-    T a = T(1);
+    T a = T(1); ///< The scalar part, and the vector part.
     T x = T();
     T y = T();
     T z = T();
 
     constexpr Quaternion() = default;
+    /// Its parts, the scalar first.
     constexpr Quaternion(T scalar, T xValue, T yValue, T zValue) : a(scalar), x(xValue), y(yValue), z(zValue)
     {
     }
@@ -36,13 +37,13 @@ struct ORV_API Quaternion
         return p.a == q.a && p.x == q.x && p.y == q.y && p.z == q.z;
     }
 
-    static const Quaternion IDENTITY;
+    static const Quaternion IDENTITY; ///< Turns nothing.
 };
 
 template <class T>
 constexpr Quaternion<T> Quaternion<T>::IDENTITY(T(1), T(0), T(0), T(0));
 
-using Quaternionf = Quaternion<float>;
+using Quaternionf = Quaternion<float>; ///< The quaternion that the engine takes.
 
 /// Turns by angle about axis, counter-clockwise when the axis points at the viewer.
 /// @param axis  taken as given, so of unit length for a quaternion of unit length.

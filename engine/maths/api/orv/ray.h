@@ -10,8 +10,8 @@ namespace orv
 /// A starting point and a direction of any length.
 struct Ray
 {
-    Vector3f position;
-    Vector3f direction;
+    Vector3f position;  ///< Where it starts.
+    Vector3f direction; ///< Where it goes; of any length.
 };
 
 /// The position is transformed as a point, the direction as a vector; there is no division by w.

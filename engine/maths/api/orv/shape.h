@@ -13,7 +13,7 @@ struct Ray;
 /// What a ray met. All zero on a miss.
 struct RaycastResult
 {
-    bool hit = false;
+    bool hit = false;      ///< Whether the ray meets the shape.
     float distance = 0.0f; ///< World units along the ray; negative behind its start.
     Vector3f normal;       ///< Unit length, in world space.
 };
@@ -33,10 +33,11 @@ public:
     /// A ray without direction, or a shape whose transform cannot be inverted, meets nothing.
     RaycastResult raycast(const Ray& worldRay) const;
 
-    const Matrix4f& getTransform() const { return m_transform; }
+    const Matrix4f& getTransform() const { return m_transform; } ///< From the shape's space to the world.
     void setTransform(const Matrix4f& localToWorld) { m_transform = localToWorld; }
 
 protected:
+    /// Standing where a transform to the world puts it.
     explicit Shape(const Matrix4f& localToWorld) : m_transform(localToWorld) {}
 
 private:

@@ -9,6 +9,7 @@ namespace orv
 class ORV_API Sphere : public Shape
 {
 public:
+    /// Standing where a transform to the world puts it.
     explicit Sphere(const Matrix4f& localToWorld = Matrix4f::IDENTITY) : Shape(localToWorld) {}
 
     /// Of the two points that the ray's line meets, gives the one nearer to the start of the ray, which may lie

@@ -9,6 +9,7 @@ namespace orv
 class ORV_API Square : public Plane
 {
 public:
+    /// Standing where a transform to the world puts it.
     explicit Square(const Matrix4f& localToWorld = Matrix4f::IDENTITY) : Plane(localToWorld) {}
 
     bool localRaycast(float& distance, Vector3f& normal, const Ray& localRay) const override;

@@ -30,16 +30,16 @@ inline int checkedIndex(int index, int count)
 template <class T>
 struct ORV_API Vector2
 {
-    T x = T();
+    T x = T(); ///< The components.
     T y = T();
 
     constexpr Vector2() = default;
-    constexpr Vector2(T xValue, T yValue) : x(xValue), y(yValue) {}
+    constexpr Vector2(T xValue, T yValue) : x(xValue), y(yValue) {} ///< Its components.
 
     T& operator[](int index) { return data()[detail::checkedIndex(index, 2)]; }
     const T& operator[](int index) const { return data()[detail::checkedIndex(index, 2)]; }
 
-    T* data() { return &x; }
+    T* data() { return &x; } ///< The components, one after the other.
     const T* data() const { return &x; }
 
     constexpr Vector2 operator-() const { return Vector2(-x, -y); }
@@ -83,17 +83,18 @@ struct ORV_API Vector2
 template <class T>
 struct ORV_API Vector3
 {
-    T x = T();
+    T x = T(); ///< The components.
     T y = T();
     T z = T();
 
     constexpr Vector3() = default;
+    /// Its components.
     constexpr Vector3(T xValue, T yValue, T zValue) : x(xValue), y(yValue), z(zValue) {}
 
     T& operator[](int index) { return data()[detail::checkedIndex(index, 3)]; }
     const T& operator[](int index) const { return data()[detail::checkedIndex(index, 3)]; }
 
-    T* data() { return &x; }
+    T* data() { return &x; } ///< The components, one after the other.
     const T* data() const { return &x; }
 
     constexpr Vector3 operator-() const { return Vector3(-x, -y, -z); }
@@ -133,7 +134,7 @@ struct ORV_API Vector3
         return a.x == b.x && a.y == b.y && a.z == b.z;
     }
 
-    static const Vector3 X_AXIS;
+    static const Vector3 X_AXIS; ///< Of length 1.
     static const Vector3 Y_AXIS;
     static const Vector3 Z_AXIS;
 };
@@ -151,21 +152,23 @@ constexpr Vector3<T> Vector3<T>::Z_AXIS(T(0), T(0), T(1));
 template <class T>
 struct ORV_API Vector4
 {
-    T x = T();
+    T x = T(); ///< The components.
     T y = T();
     T z = T();
     T w = T();
 
     constexpr Vector4() = default;
+    /// Its components.
     constexpr Vector4(T xValue, T yValue, T zValue, T wValue) : x(xValue), y(yValue), z(zValue), w(wValue) {}
     constexpr Vector4(const Vector3<T>& v, T wValue) : x(v.x), y(v.y), z(v.z), w(wValue) {}
 
     T& operator[](int index) { return data()[detail::checkedIndex(index, 4)]; }
     const T& operator[](int index) const { return data()[detail::checkedIndex(index, 4)]; }
 
-    T* data() { return &x; }
+    T* data() { return &x; } ///< The components, one after the other.
     const T* data() const { return &x; }
 
+    /// Without w; there is no division.
     [[gnu::always_inline]] constexpr Vector3<T> xyz() const { return Vector3<T>(x, y, z); }
 
     constexpr Vector4 operator-() const { return Vector4(-x, -y, -z, -w); }
@@ -206,6 +209,7 @@ struct ORV_API Vector4
     }
 };
 
+/// The vectors that the engine takes: of floats, integers and truth values.
 using Vector2f = Vector2<float>;
 using Vector3f = Vector3<float>;
 using Vector4f = Vector4<float>;
@@ -216,18 +220,21 @@ using Vector2b = Vector2<bool>;
 using Vector3b = Vector3<bool>;
 using Vector4b = Vector4<bool>;
 
+/// The sum of the products of the components.
 template <class T>
 constexpr T dot(const Vector2<T>& a, const Vector2<T>& b)
 {
     return a.x * b.x + a.y * b.y;
 }
 
+/// The sum of the products of the components.
 template <class T>
 constexpr T dot(const Vector3<T>& a, const Vector3<T>& b)
 {
     return a.x * b.x + a.y * b.y + a.z * b.z;
 }
 
+/// The sum of the products of the components.
 template <class T>
 constexpr T dot(const Vector4<T>& a, const Vector4<T>& b)
 {
@@ -241,6 +248,7 @@ constexpr Vector3<T> cross(const Vector3<T>& a, const Vector3<T>& b)
     return Vector3<T>(a.y * b.z - a.z * b.y, a.z * b.x - a.x * b.z, a.x * b.y - a.y * b.x);
 }
 
+/// The root of the sum of the squares.
 template <template <class> class V, class T>
 requires requires(V<T> v)
 {

@@ -22,7 +22,7 @@ public:
     /// @param archive  not supported yet: true gives an empty pointer and an info record.
     static SharedPtr<StreamSource> get(const char* path, bool archive);
 
-    virtual bool exists(const char* name) const = 0;
+    virtual bool exists(const char* name) const = 0; ///< Whether open() for reading would find it.
 
     /// @param writable  asks for a stream to write to, which replaces what was there.
     /// @return empty when the stream cannot be opened.

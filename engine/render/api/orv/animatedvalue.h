@@ -16,8 +16,8 @@ public:
     ORV_CLASS_NAME("AnimatedValue")
     using Ptr = SharedPtr<AnimatedValue<T>>;
 
-    virtual T getValue(float time) const = 0;
-    virtual float getStart() const = 0;
+    virtual T getValue(float time) const = 0; ///< The value at a moment, in seconds.
+    virtual float getStart() const = 0;       ///< When the first and the last key are, in seconds.
     virtual float getEnd() const = 0;
 
     /// The two values between which a time lies, for interpolation. A value that has no keys to lie between is both.

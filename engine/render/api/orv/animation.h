@@ -16,8 +16,9 @@ public:
     ORV_CLASS_NAME("Animation")
     using Ptr = SharedPtr<Animation>;
 
+    /// Puts what is animated to where it is at a moment, in seconds.
     virtual void apply(float progress) = 0;
-    virtual float getStart() const = 0;
+    virtual float getStart() const = 0; ///< Where it begins and ends, in seconds.
     virtual float getEnd() const = 0;
 
     /// Adds the times at which what it applies changes, in any order; those at which it starts and ends unless it knows more.

@@ -17,6 +17,7 @@ public:
     ORV_CLASS_NAME("AnimationChannel")
     using Ptr = SharedPtr<AnimationChannel<T>>;
 
+    /// Hands a value over time to what it moves; both are shared.
     AnimationChannel(const typename AnimatedValue<T>::Ptr& value, const typename Animator<T>::Ptr& animator)
         : m_value(value)
         , m_animator(animator)
@@ -69,6 +70,7 @@ private:
     typename Animator<T>::Ptr m_animator;
 };
 
+/// Makes a channel of the two.
 template <class T>
 typename AnimationChannel<T>::Ptr createAnimationChannel(const SharedPtr<AnimatedValue<T>>& value,
                                                          const SharedPtr<Animator<T>>& animator)

@@ -44,8 +44,9 @@ public:
     /// @param deltaTime  seconds since the last call.
     void update(float deltaTime);
 
-    const Animation::Ptr& getAnimation() const { return m_animation; }
+    const Animation::Ptr& getAnimation() const { return m_animation; } ///< What it plays; may be empty.
 
+    /// While disabled or paused, update() changes nothing; looping is on or off.
     bool isEnabled() const { return m_enabled; }
     void setEnabled(bool enabled) { m_enabled = enabled; }
     bool isPaused() const { return m_paused; }
@@ -59,6 +60,7 @@ public:
     float getProgress() const { return m_progress; }
     void setProgress(float progress) { m_progress = progress; }
 
+    /// The part that is played, and the part of it that a loop repeats, in seconds.
     float getStart() const { return m_start; }
     void setStart(float start) { m_start = start; }
     float getEnd() const { return m_end; }

@@ -19,8 +19,8 @@ namespace orv
 template <class T>
 struct AnimationKey
 {
-    float time = 0.0f;
-    T value = T();
+    float time = 0.0f; ///< In seconds.
+    T value = T();     ///< What it is then.
 };
 
 /// Keyed values, stepped: each key's value holds until the next key's time, the first also before its own
@@ -56,7 +56,7 @@ public:
         return a.time < b.time;
     }
 
-    const std::vector<AnimationKey<T>>& getKeys() const { return m_keys; }
+    const std::vector<AnimationKey<T>>& getKeys() const { return m_keys; } ///< In the order of their times.
 
     T getValue(float time) const override
     {

@@ -36,7 +36,7 @@ public:
     {
     }
 
-    bool isInterpolated() const { return m_isInterpolated; }
+    bool isInterpolated() const { return m_isInterpolated; } ///< Whether values between keys are asked for.
     /// The same, interpolated.
     AnimationMix interpolated() const { return AnimationMix(true, m_weight, m_subtree, m_places); }
     float getWeight() const { return m_weight; }

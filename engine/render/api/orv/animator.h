@@ -15,7 +15,7 @@ public:
     ORV_CLASS_NAME("Animator")
     using Ptr = SharedPtr<Animator<T>>;
 
-    virtual void apply(const T& value) = 0;
+    virtual void apply(const T& value) = 0; ///< Sets what it stands for to a value.
 
     /// Writes what lies share of the way between two keys' values, as a controller wants it that was asked for smooth
     /// motion. An animator that does not override this writes with a weight of a half or more, and not at all on a

@@ -17,15 +17,16 @@ class ORV_API Background
 {
 public:
     Background() = default;
-    explicit Background(const Colour4f& colour) : m_colour(colour) {}
+    explicit Background(const Colour4f& colour) : m_colour(colour) {} ///< Clears to a colour.
 
-    const Colour4f& getColour() const { return m_colour; }
+    const Colour4f& getColour() const { return m_colour; } ///< The values that are cleared to.
     void setColour(const Colour4f& colour) { m_colour = colour; }
     float getDepth() const { return m_depth; }
     void setDepth(float depth); ///< NaN is refused (logged)
     int getStencil() const { return m_stencil; }
     void setStencil(int stencil) { m_stencil = stencil; }
 
+    /// Which parts of each buffer are cleared.
     void setColourMask(bool red, bool green, bool blue, bool alpha);
     void setDepthMask(bool enabled) { m_depthMask = enabled; }
     void setStencilMask(uint32_t mask) { m_stencilMask = mask; }

@@ -18,8 +18,9 @@ class ORV_API Camera : public SceneNode
 public:
     ORV_CLASS_NAME("Camera")
     using Ptr = SharedPtr<Camera>;
-    static constexpr NodeType NODE_TYPE = 2;
+    static constexpr NodeType NODE_TYPE = 2; ///< What getNodeType() says of a camera.
 
+    /// How the camera looks: with or without perspective.
     enum class ProjectionType : int32_t
     {
         ORTHOGRAPHIC = 0,
@@ -27,12 +28,12 @@ public:
     };
 
     Camera() = default;
-    explicit Camera(const char* name) : SceneNode(name) {}
+    explicit Camera(const char* name) : SceneNode(name) {} ///< The name is copied; it may be null.
 
     NodeType getNodeType() const override { return NODE_TYPE; }
     void accept(SceneNodeVisitor& visitor) override;
 
-    ProjectionType getProjectionType() const { return m_projectionType; }
+    ProjectionType getProjectionType() const { return m_projectionType; } ///< Perspective at first.
     void setProjectionType(ProjectionType type) { m_projectionType = type; }
 
     /// The angle that spans the shorter side of the view, in perspective.
@@ -43,6 +44,7 @@ public:
     float getWidth() const { return m_width; }
     void setWidth(float width); ///< warns on a perspective camera, and stores
 
+    /// Distances of the clipping planes from the eye, in world units.
     float getNear() const { return m_near; }
     void setNear(float distance) { m_near = distance; }
     float getFar() const { return m_far; }

@@ -15,6 +15,7 @@ struct FlagMask
     uint32_t inverted = 0; ///< those of them that are on by default
 
     constexpr FlagMask() = default;
+    /// The same two.
     constexpr explicit FlagMask(uint32_t meantBits, uint32_t invertedBits = 0)
         : mask(meantBits)
         , inverted(invertedBits)

@@ -51,7 +51,7 @@ public:
 
     /// @return null outside 0 to the count, for getAnimation() empty.
     const char* getAnimationName(int index) const;
-    SharedPtr<AnimationGroup> getAnimation(int index) const;
+    SharedPtr<AnimationGroup> getAnimation(int index) const; ///< Empty outside 0 to the count.
 
     /// The first animation of that name.
     SharedPtr<AnimationGroup> getAnimation(const char* name) const;

@@ -19,8 +19,9 @@ class ORV_API Light : public SceneNode
 public:
     ORV_CLASS_NAME("Light")
     using Ptr = SharedPtr<Light>;
-    static constexpr NodeType NODE_TYPE = 3;
+    static constexpr NodeType NODE_TYPE = 3; ///< What getNodeType() says of a light.
 
+    /// How the light shines: from a place, from far away, or in a cone.
     enum class LightType : int32_t
     {
         POINT = 0,
@@ -29,15 +30,15 @@ public:
     };
 
     Light() = default;
-    explicit Light(const char* name) : SceneNode(name) {}
+    explicit Light(const char* name) : SceneNode(name) {} ///< The name is copied; it may be null.
 
     NodeType getNodeType() const override { return NODE_TYPE; }
     void accept(SceneNodeVisitor& visitor) override;
 
-    bool isActive() const { return m_active; }
+    bool isActive() const { return m_active; } ///< Whether it shines; true at first.
     void setActive(bool active) { m_active = active; }
 
-    LightType getLightType() const { return m_lightType; }
+    LightType getLightType() const { return m_lightType; } ///< A point light at first.
     void setLightType(LightType type) { m_lightType = type; }
 
     /// A factor on the colour, 1 at first.
@@ -61,7 +62,7 @@ public:
     void setSpotInnerAngle(const Anglef& angle);
     void setSpotOuterAngle(const Anglef& angle);
 
-    const Colour4f& getColour() const { return m_colour; }
+    const Colour4f& getColour() const { return m_colour; } ///< White at first.
     void setColour(const Colour4f& colour) { m_colour = colour; }
 
     /// The part of the colour that reaches every surface, 0 at first.

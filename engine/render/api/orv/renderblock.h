@@ -21,9 +21,10 @@ public:
     ORV_CLASS_NAME("RenderBlockBase")
     using Ptr = SharedPtr<RenderBlockBase>;
 
-    virtual void render() = 0;
+    virtual void render() = 0; ///< Draws it. GL thread only.
     /// @param time  absolute, in seconds.
     virtual void update(float time) = 0;
+    /// Sets the stereo parameters of the cameras; see Camera::setStereo().
     virtual void setStereo(float focalDistance, float eyeSeparation) = 0;
 
     /// Whether rendering this renders other: true for itself, for a group also for its members' members. A class
@@ -47,8 +48,10 @@ public:
                 const SharedPtr<Camera>& camera);
     ~RenderBlock() override;
 
+    /// What it looks through; may be empty.
     const SharedPtr<Camera>& getCamera() const { return m_camera; }
     void setCamera(const SharedPtr<Camera>& camera);
+    /// What it draws into; empty for the current surface.
     const SharedPtr<RenderTarget>& getRenderTarget() const { return m_renderTarget; }
     /// @param target  empty draws to the current surface.
     void setRenderTarget(const SharedPtr<RenderTarget>& target);
@@ -64,7 +67,7 @@ public:
     /// refused (logged).
     void setViewport(int x, int y, int width, int height);
 
-    Background& getBackground() { return m_background; }
+    Background& getBackground() { return m_background; } ///< What is cleared, and to what.
     void setBackgroundColour(const Colour4f& colour) { m_background.setColour(colour); }
     void setColourClear(bool enabled); ///< false keeps the colours that are there
     void setDepthClear(bool enabled);  ///< false keeps the depths that are there

@@ -28,7 +28,7 @@ public:
     /// @param time  absolute, in seconds.
     virtual void update(float time) = 0;
 
-    virtual const SharedPtr<RenderContext>& getRenderContext() const = 0;
+    virtual const SharedPtr<RenderContext>& getRenderContext() const = 0; ///< What it draws with.
 };
 
 } // namespace orv

@@ -23,7 +23,7 @@ public:
     ORV_CLASS_NAME("SceneNodePositionAnimator")
     using Ptr = SharedPtr<SceneNodePositionAnimator>;
 
-    explicit SceneNodePositionAnimator(const SharedPtr<SceneNode>& node);
+    explicit SceneNodePositionAnimator(const SharedPtr<SceneNode>& node); ///< Shares the node.
     ~SceneNodePositionAnimator() override;
     void apply(const Vector3f& position) override;
     void applyMixed(const Vector3f& from, const Vector3f& to, float share, const AnimationMix& mix) override;
@@ -32,13 +32,14 @@ private:
     SharedPtr<SceneNode> m_node;
 };
 
+/// Turns a node: x, y and z are the axis, w the angle in radians.
 class ORV_API SceneNodeRotationAnimator : public Animator<Vector4f>
 {
 public:
     ORV_CLASS_NAME("SceneNodeRotationAnimator")
     using Ptr = SharedPtr<SceneNodeRotationAnimator>;
 
-    explicit SceneNodeRotationAnimator(const SharedPtr<SceneNode>& node);
+    explicit SceneNodeRotationAnimator(const SharedPtr<SceneNode>& node); ///< Shares the node.
     ~SceneNodeRotationAnimator() override;
     /// @param axisAngle  axis x, y, z, taken as it is (not normalised), and angle in radians.
     void apply(const Vector4f& axisAngle) override;
@@ -55,7 +56,7 @@ public:
     ORV_CLASS_NAME("SceneNodeScaleAnimator")
     using Ptr = SharedPtr<SceneNodeScaleAnimator>;
 
-    explicit SceneNodeScaleAnimator(const SharedPtr<SceneNode>& node);
+    explicit SceneNodeScaleAnimator(const SharedPtr<SceneNode>& node); ///< Shares the node.
     ~SceneNodeScaleAnimator() override;
     void apply(const Vector3f& scale) override;
     void applyMixed(const Vector3f& from, const Vector3f& to, float share, const AnimationMix& mix) override;
@@ -65,13 +66,14 @@ private:
     Vector3f m_lastScale; // not a number before the first apply(), so that any first scale differs
 };
 
+/// Sets the colour of a light.
 class ORV_API LightColourAnimator : public Animator<Colour4f>
 {
 public:
     ORV_CLASS_NAME("LightColourAnimator")
     using Ptr = SharedPtr<LightColourAnimator>;
 
-    explicit LightColourAnimator(const SharedPtr<Light>& light);
+    explicit LightColourAnimator(const SharedPtr<Light>& light); ///< Shares the light.
     ~LightColourAnimator() override;
     void apply(const Colour4f& colour) override;
     void applyMixed(const Colour4f& from, const Colour4f& to, float share, const AnimationMix& mix) override;
@@ -80,13 +82,14 @@ private:
     SharedPtr<Light> m_light;
 };
 
+/// Sets the intensity of a light.
 class ORV_API LightIntensityAnimator : public Animator<float>
 {
 public:
     ORV_CLASS_NAME("LightIntensityAnimator")
     using Ptr = SharedPtr<LightIntensityAnimator>;
 
-    explicit LightIntensityAnimator(const SharedPtr<Light>& light);
+    explicit LightIntensityAnimator(const SharedPtr<Light>& light); ///< Shares the light.
     ~LightIntensityAnimator() override;
     void apply(const float& intensity) override;
     void applyMixed(const float& from, const float& to, float share, const AnimationMix& mix) override;

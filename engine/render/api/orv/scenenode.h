@@ -43,15 +43,15 @@ public:
     static constexpr NodeType NODE_TYPE = 0;
 
     SceneNode();
-    explicit SceneNode(const char* name);
+    explicit SceneNode(const char* name); ///< The name is copied; null counts as empty.
     ~SceneNode() override;
 
-    virtual NodeType getNodeType() const { return NODE_TYPE; }
+    virtual NodeType getNodeType() const { return NODE_TYPE; } ///< Which of the engine's kinds it is.
 
     /// Calls the visitor's visit() for this node's own class; children are not walked (see visitScene()).
     virtual void accept(SceneNodeVisitor& visitor);
 
-    const char* getName() const { return m_name ? m_name.get() : ""; }
+    const char* getName() const { return m_name ? m_name.get() : ""; } ///< Empty where there is none.
     /// @param name  copied; null counts as empty.
     void setName(const char* name);
 
@@ -68,7 +68,7 @@ public:
     /// What was set here; getDerivedFlags(node, VISIBLE) asks the nodes above as well.
     bool isVisible() const { return (m_flags & VISIBLE.mask) == 0; }
 
-    const Vector3f& getPosition() const { return m_position; }
+    const Vector3f& getPosition() const { return m_position; } ///< In the space of the parent.
     const Quaternionf& getRotation() const { return m_rotation; }
     const Vector3f& getScale() const { return m_scale; }
 
@@ -81,6 +81,7 @@ public:
     /// changing one of them later rebuilds the matrix from them and discards this one.
     void setLocalTransform(const Matrix4f& transform);
 
+    /// To the parent's space, or to the world; made up to date first.
     const Matrix4f& getLocalTransform() const;
     const Matrix4f& getWorldTransform() const;
     /// Whether the world transform is known to be made of rotations and translations alone.
@@ -99,7 +100,7 @@ public:
     /// Marks this subtree's world matrices; returns at once when they are marked already.
     void setWorldTransformChanged();
 
-    void updateLocal() const;
+    void updateLocal() const; ///< Works the local transform out if it is out of date.
     /// Brings this node up to date below a parent with the given world transform.
     void updateAll(const Matrix4f& parentWorld, bool parentMirrored) const;
     /// Brings the stale ancestors, from the topmost down, and this node up to date.
@@ -107,7 +108,7 @@ public:
     /// Saves the current world matrix as the last one; once per frame, after drawing.
     void updateMotionData();
 
-    SceneNode* getParent() const { return m_parent; }
+    SceneNode* getParent() const { return m_parent; } ///< Null for a root.
 
     /// Moves the node, last, under another parent. The node may be destroyed by this call when its old parent
     /// alone held it and the new one is empty.
@@ -127,6 +128,7 @@ public:
     /// Called by the parent's destructor on a node that lives on: it becomes a root.
     void onParentDestroyed();
 
+    /// Of direct children.
     unsigned int getChildCount() const { return m_children ? m_children->getCount() : 0; }
     /// @return empty, after logging an assertion, for an index beyond the last child.
     const SharedPtr<SceneNode>& getChild(unsigned int i) const;

@@ -23,6 +23,7 @@ class ORV_API SceneNodeVisitor
 public:
     virtual ~SceneNodeVisitor() = default;
 
+    /// One for each kind of node; it does nothing unless it is overridden.
     virtual void visit(SceneNode* node);
     virtual void visit(Solid* solid);
     virtual void visit(Camera* camera);

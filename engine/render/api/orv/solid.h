@@ -27,9 +27,9 @@ class ORV_API Solid : public SceneNode
 public:
     ORV_CLASS_NAME("Solid")
     using Ptr = SharedPtr<Solid>;
-    static constexpr NodeType NODE_TYPE = 1;
+    static constexpr NodeType NODE_TYPE = 1; ///< What getNodeType() says of a solid.
 
-    static constexpr int MAX_JOINTS_PER_VERTEX = 4;
+    static constexpr int MAX_JOINTS_PER_VERTEX = 4; ///< More are clamped.
     /// The joint matrices that reach a shader; further joints are kept but have no effect.
     static constexpr int MAX_JOINTS = 20;
 
@@ -41,13 +41,14 @@ public:
     };
 
     Solid();
+    /// Shares both; where one is empty, nothing is drawn.
     Solid(const SharedPtr<Mesh>& mesh, const SharedPtr<Appearance>& appearance);
     ~Solid() override;
 
     NodeType getNodeType() const override { return NODE_TYPE; }
     void accept(SceneNodeVisitor& visitor) override;
 
-    const SharedPtr<Mesh>& getMesh() const { return m_mesh; }
+    const SharedPtr<Mesh>& getMesh() const { return m_mesh; } ///< What is drawn, and how; may be empty.
     void setMesh(const SharedPtr<Mesh>& mesh);
     const SharedPtr<Appearance>& getAppearance() const { return m_appearance; }
     void setAppearance(const SharedPtr<Appearance>& appearance);

@@ -72,7 +72,7 @@ public:
     /// Straight, not premultiplied; a is the opacity. Solids made before keep their colour.
     void setColour(const Colour4f& colour);
 
-    const Font::Ptr& getFont() const { return m_font; }
+    const Font::Ptr& getFont() const { return m_font; } ///< Empty where there was none.
 
     /// Draws over what the viewport shows, blended, whatever the depth buffer holds; nothing is written there.
     ///
