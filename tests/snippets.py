@@ -14,14 +14,14 @@ import subprocess
 import sys
 
 SOURCE = os.path.dirname(os.path.dirname(os.path.abspath(__file__)))
-# Names that stand for what an earlier snippet of the page has made.
-BEFORE = {
-    "docs/guide.md": "RenderBlock block(renderer, scene, camera), inset(renderer, scene, mapCamera);\n"
-                     "const auto model = loadGloFile(*pool, scene, \"model.glo\");\n"
-                     "AnimationController player(model->getAnimationGroup());\n",
-    "docs/text.md": "const auto block = makeShared<RenderBlock>(renderer, scene, camera);\n"
-                    "Text text(*pool, font, Colour4f::WHITE);\n",
-}
+# Names that stand for what earlier snippets have made; a snippet may make them itself, in its own braces.
+BEFORE = """RenderBlock inset(renderer, scene, mapCamera);
+const auto model = loadGloFile(*pool, scene, "model.glo");
+AnimationController player(model->getAnimationGroup());
+Text text(*pool, font, Colour4f::WHITE);
+"""
+BLOCK = "const auto block = makeShared<RenderBlock>(renderer, scene, camera);\n"
+BLOCKS = {"docs/guide.md": "RenderBlock block(renderer, scene, camera);\n"}
 
 
 def snippets():
@@ -45,7 +45,7 @@ def main():
         if re.match(r"\w+ \w+::\w+\(", text):
             parts.append(place + text)
         else:
-            parts.append(f"bool snippet{number}()\n{{\n{BEFORE.get(page, '')}{{\n{place}{text}}}\nreturn true;\n}}")
+            parts.append(f"bool snippet{number}()\n{{\n{BLOCKS.get(page, BLOCK)}{BEFORE}{{\n{place}{text}}}\nreturn true;\n}}")
     os.makedirs(work, exist_ok=True)
     path = os.path.join(work, "snippets.cpp")
     with open(path, "w", encoding="utf-8") as file:
