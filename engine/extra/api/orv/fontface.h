@@ -44,7 +44,7 @@ public:
 
     ~FontFace() override;
 
-    const char* getName() const { return m_name.c_str(); }
+    const char* getName() const { return m_name.c_str(); } ///< for messages
 
     /// @param codePoint  of Unicode.
     /// @return the number of its glyph; 0, which is that of the box for what is missing, if the font does not have it.

@@ -49,7 +49,7 @@ public:
     ORV_CLASS_NAME("GlyphCache")
     using Ptr = SharedPtr<GlyphCache>;
 
-    static constexpr unsigned MOST_FONTS = 254;
+    static constexpr unsigned MOST_FONTS = 254; ///< of one cache
 
     /// @param pool  borrowed during the call, for the shader program and the cache that textures are made in.
     explicit GlyphCache(AssetCachePool& pool, const GlyphCacheOptions& options = GlyphCacheOptions());
@@ -59,6 +59,7 @@ public:
     /// @return false, after an error, for an empty face or one too many.
     bool addFont(const FontFace::Ptr& face);
 
+    /// The fonts in the order in which they were added; characters are looked for in them in that order.
     unsigned getFontCount() const { return unsigned(m_fonts.size()); }
     const FontFace::Ptr& getFont(unsigned index) const
     {
@@ -77,9 +78,9 @@ public:
     /// A glyph at a size. The size is that of a line of the first font, in 64ths of a pixel.
     struct Key
     {
-        uint32_t font;
-        uint32_t glyph;
-        uint32_t size;
+        uint32_t font;  ///< of the cache, counted from 0, or BOX
+        uint32_t glyph; ///< its number in the font
+        uint32_t size;  ///< 64ths of a pixel
     };
     static constexpr uint32_t BOX = 255; ///< the font of the plain box
 
@@ -95,7 +96,7 @@ public:
     /// @return false if there is no room, everything being in use.
     bool place(const Key& key, uint32_t& number);
 
-    detail::GlyphAtlas& getAtlas() { return *m_atlas; }
+    detail::GlyphAtlas& getAtlas() { return *m_atlas; } ///< where glyphs are drawn
     uint32_t getRevision() const { return m_revision; } ///< changes with the fonts
 
 private:

@@ -65,7 +65,8 @@ public:
     {
         unsigned font;  ///< of the cache, counted from 0
         unsigned glyph; ///< its number in the font
-        float x, y;     ///< where the pen stands on the baseline, in units; y downwards
+        float x;        ///< where the pen stands on the baseline, in units
+        float y;        ///< the same, downwards
     };
 
     static constexpr float MOST_SIZE = 4096.0f;   ///< pixels
@@ -108,7 +109,7 @@ public:
     /// Straight, not premultiplied; a is the opacity. Solids made before keep their colour.
     void setColour(const Colour4f& colour) { m_colour = colour; }
 
-    const GlyphCache::Ptr& getGlyphs() const { return m_glyphs; }
+    const GlyphCache::Ptr& getGlyphs() const { return m_glyphs; } ///< what draws them
 
     /// Draws over what the viewport shows, blended, whatever the depth buffer holds; nothing is written there.
     ///
