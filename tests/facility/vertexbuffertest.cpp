@@ -76,6 +76,31 @@ std::string pointerCall(int location, int count, const char* type, int normalise
 
 } // namespace
 
+// Faults caught: a second buffer for each change, vertex input that is taken to be the old one's, a lost buffer filled.
+TEST_F(VertexBufferTest, replacesItsData)
+{
+    const unsigned char other[32] = {};
+    EXPECT_FALSE(buffer->replaceData(other, sizeof(other))) << "nothing to be replaced";
+    addTwoAttribs();
+    buffer->commit();
+    const GLuint name = buffer->getId();
+    const uint64_t revision = buffer->getRevision();
+    EXPECT_FALSE(buffer->replaceData(nullptr, 32));
+    EXPECT_EQ(revision, buffer->getRevision());
+
+    EXPECT_TRUE(buffer->replaceData(other, sizeof(other)));
+    EXPECT_EQ(name, buffer->getId());
+    EXPECT_NE(revision, buffer->getRevision());
+    EXPECT_TRUE(buffer->enableAttrib(0, "a_colour"));
+    GLint size = 0;
+    glGetBufferParameteriv(GL_ARRAY_BUFFER, GL_BUFFER_SIZE, &size);
+    EXPECT_EQ(32, size);
+
+    cache->getResourceCache()->release();
+    EXPECT_FALSE(buffer->replaceData(other, sizeof(other)));
+    glDeleteBuffers(1, &name);
+}
+
 // Fault caught: vertices interleaved in the order of adding, or offsets that do not match the bytes.
 TEST_F(VertexBufferTest, interleavesTheLastAddedFirst)
 {

@@ -18,8 +18,10 @@ import time
 import traceback
 
 import numpy
+from PIL import Image
 from selenium.webdriver.common.action_chains import ActionChains
 from selenium.webdriver.common.actions.action_builder import ActionBuilder
+from selenium.webdriver.common.actions.pointer_actions import PointerActions
 from selenium.webdriver.common.actions.pointer_input import PointerInput
 from selenium.webdriver.common.by import By
 from selenium.webdriver.common.keys import Keys
@@ -39,7 +41,7 @@ class Bench:
     """Everything that the checks share."""
 
     def __init__(self, build, web, models):
-        self.build, self.web, self.models = build, web, models
+        self.build, self.web = build, web
         self.folder = web / "check"
         shutil.rmtree(self.folder, ignore_errors=True)
         self.folder.mkdir(parents=True)
@@ -48,8 +50,7 @@ class Bench:
         shutil.copytree(web / "page", self.folder / "page")
         shutil.copytree(web / "examples", self.folder / "examples")
         for name, path in MODELS.items():
-            subprocess.run([build / "tools/convert/orv-convert", models / path, "--page", self.folder / name],
-                           check=True, stdout=subprocess.DEVNULL)
+            run_here([build / "tools/convert/orv-convert", models / path, "--page", self.folder / name])
         self.server = Server(self.folder)
         self.browser = Browser()
 
@@ -73,16 +74,22 @@ class Bench:
     def draw(self, name, *options):
         """By orv-view. @return the pictures."""
         out = self.native / f"{name}.png"
-        subprocess.run([self.build / "tools/view/orv-view", self.folder / self.scene(name), "--out", out, "--size",
-                        f"{WIDTH}x{HEIGHT}", *options], check=True, stdout=subprocess.DEVNULL)
+        run_here([self.build / "tools/view/orv-view", self.folder / self.scene(name), "--out", out, "--size",
+                  f"{WIDTH}x{HEIGHT}", *options])
         return [read_png(path) for path in sorted(self.native.glob(f"{name}*.png"))]
 
     def run_example(self, name, *arguments):
         """By the program for this machine. @return the pictures, by name."""
         folder = self.native / name
         folder.mkdir(exist_ok=True)
-        subprocess.run([self.build / "examples" / name, *arguments], check=True, cwd=folder, stdout=subprocess.DEVNULL)
+        run_here([self.build / "examples" / name, *arguments], folder)
         return {path.name: read_png(path) for path in folder.glob("*.png")}
+
+
+def run_here(words, folder=None):
+    """A program for this machine, whose output matters only where it fails."""
+    done = subprocess.run(words, cwd=folder, capture_output=True, text=True)
+    expect(done.returncode == 0, f"{words[0].name}: {done.stdout}{done.stderr}")
 
 
 def expect(condition, message):
@@ -94,7 +101,6 @@ def hold(name, native, drawn, tolerance=TOLERANCE, share=ALLOWED_SHARE):
     """@return what to say of two pictures that are near enough."""
     found, most = compare(native, drawn, tolerance)
     if found > share:
-        from PIL import Image
         Image.fromarray(numpy.hstack([native, drawn, abs(native - drawn)]).astype("uint8")).save(f"{name}-differs.png")
     expect(found <= share, f"{name}: {100 * found:.2f} % of the pixels differ by more than {tolerance}, "
            f"{most} at most; see {name}-differs.png")
@@ -197,8 +203,6 @@ def hands(bench):
         """Two fingers, from and to."""
         actions = ActionBuilder(driver, mouse=PointerInput("touch", "one"))
         other = actions.add_pointer_input("touch", "other")
-        pairs = list(zip((actions.pointer_action, other), moves))
-        from selenium.webdriver.common.actions.pointer_actions import PointerActions
         for source, (start, end) in zip((actions.pointer_action, PointerActions(other)), moves):
             source.move_to_location(*start)
             source.pointer_down()

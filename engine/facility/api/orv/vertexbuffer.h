@@ -110,7 +110,7 @@ public:
 
     /// Puts other vertices of the same attributes into the GL buffer, which stays bound: for what changes often.
     /// @param data  copied; what the buffer held before is dropped.
-    /// @return false, buffer unchanged, if there is no GL buffer; false, after an error and with the buffer lost, where
+    /// @return false, buffer unchanged, without data or a GL buffer; false, after an error and with the buffer lost, where
     /// GL has no memory for it.
     bool replaceData(const unsigned char* data, unsigned int size);
 

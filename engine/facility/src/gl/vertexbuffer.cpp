@@ -163,7 +163,7 @@ bool VertexBuffer::setAllAttributes(const AttribDescription* descriptions, unsig
 
 bool VertexBuffer::replaceData(const unsigned char* data, unsigned int size)
 {
-    return getId() != 0 && upload(data, size);
+    return data && getId() != 0 && upload(data, size);
 }
 
 bool VertexBuffer::isLost() const
@@ -207,6 +207,7 @@ void VertexBuffer::attribsChanged()
     m_lacksLastWeight = weights && weights->componentCount < 4;
     for (Plan& plan : m_plans)
         plan.programRevision = 0; // 0 is no program's; the records that it points to may have moved
+    m_nextPlan = 0;               // whose memory serves again
 }
 
 } // namespace orv

@@ -22,7 +22,6 @@ class AssetCachePool;
 class RenderContext;
 class ShaderProgram;
 class Solid;
-class VertexArray;
 class VertexBuffer;
 class VertexBufferCache;
 
@@ -76,21 +75,18 @@ public:
 
     /// Draws over what the viewport shows, blended, whatever the depth buffer holds; nothing is written there.
     ///
-    /// One GL draw for up to MAX_GLYPHS glyphs, one more for each further lot. Without a change since the last
-    /// time nothing is made again. The vertices have a GL buffer, which stays when the strings change and goes with the
-    /// pool's flush() after the text.
+    /// One GL draw for all strings. Without a change since the last time nothing is made again. The vertices have a GL
+    /// buffer, which stays when the strings change and goes with the pool's flush() after the text.
     void draw(RenderContext& context);
 
     /// A copy of the strings as they are, to be put into a scene.
     ///
     /// One unit is one pixel, x to the right, y upwards, in the plane z = 0: what was added at (x, y) is at
     /// (x, -y). Scale the node to the size wanted. Both sides are visible; it blends, so the renderer draws it
-    /// after opaque solids, and it does not write depth. Beyond MAX_GLYPHS glyphs the rest is in unnamed children.
+    /// after opaque solids, and it does not write depth.
     /// @param pool  where the mesh is made, unnamed.
     /// @return empty, after an error, without a font, any glyph, or memory.
     SharedPtr<Solid> createSolid(AssetCachePool& pool) const;
-
-    static constexpr unsigned MAX_GLYPHS = 16383; ///< of one draw: four vertices each, below 65,536
 
 private:
     struct Glyph
@@ -101,9 +97,8 @@ private:
 
     ORV_LOCAL void addLine(std::string_view line, float x, float top, Alignment alignment);
     ORV_LOCAL SharedPtr<Appearance> makeAppearance() const;
-    ORV_LOCAL SharedPtr<VertexArray> makeVertices(std::size_t firstGlyph, float ySign) const;
-    ORV_LOCAL static SharedPtr<VertexBuffer> makeBuffer(VertexBufferCache& cache, VertexArray& vertices);
-    ORV_LOCAL void makeSolids();
+    ORV_LOCAL SharedPtr<Solid> makeSolid(const SharedPtr<Appearance>& appearance, float ySign,
+                                         VertexBufferCache& cache, SharedPtr<VertexBuffer>& buffer) const;
 
     Font::Ptr m_font;
     Colour4f m_colour;
@@ -112,9 +107,9 @@ private:
     SharedPtr<Appearance> m_overlay;                 ///< what draw() draws with
     SharedPtr<ShaderUniform<Matrix4f>> m_projection; ///< m_overlay's, from pixels to clip space
     SharedPtr<VertexBufferCache> m_cache;            ///< the pool's
-    std::vector<SharedPtr<VertexBuffer>> m_buffers;  ///< of each lot of glyphs; kept when there are fewer
-    std::vector<SharedPtr<Solid>> m_solids;          ///< what draw() draws
-    bool m_changed = false;                          ///< m_solids do not show m_glyphs yet
+    SharedPtr<VertexBuffer> m_buffer;                ///< what draw() draws, filled again for every change
+    SharedPtr<Solid> m_solid;                        ///< of that buffer; empty without glyphs
+    bool m_changed = false;                          ///< m_solid does not show m_glyphs yet
 };
 
 } // namespace orv

@@ -4,10 +4,9 @@
 
 #include "orv/appearance.h"
 #include "orv/assetcachepool.h"
-#include "orv/indexbuffercache.h"
+#include "orv/indexbuffer.h"
 #include "orv/log.h"
 #include "orv/mesh.h"
-#include "orv/meshcache.h"
 #include "orv/rendercontext.h"
 #include "orv/shaderprogramcache.h"
 #include "orv/solid.h"
@@ -141,15 +140,17 @@ void Text::draw(RenderContext& context)
     if (!m_font || width <= 0.0f || height <= 0.0f)
         return;
     if (m_changed)
-        makeSolids();
+        m_solid = makeSolid(m_overlay, 1.0f, *m_cache, m_buffer);
+    m_changed = false;
+    if (!m_solid)
+        return;
     Matrix4f projection = Matrix4f::IDENTITY;
     projection[0].x = 2.0f / width;
     projection[1].y = -2.0f / height;
     projection[3] = Vector4f(-1.0f, 1.0f, 0.0f, 1.0f);
     m_projection->set(projection);
     const RenderContext::DrawScope scope(context);
-    for (const SharedPtr<Solid>& solid : m_solids)
-        solid->draw(context);
+    m_solid->draw(context);
 }
 
 SharedPtr<Solid> Text::createSolid(AssetCachePool& pool) const
@@ -165,33 +166,8 @@ SharedPtr<Solid> Text::createSolid(AssetCachePool& pool) const
     const SharedPtr<Appearance> appearance = makeAppearance();
     if (!appearance)
         return {};
-    SharedPtr<Solid> solid;
-    for (std::size_t first = 0; first < m_glyphs.size(); first += MAX_GLYPHS)
-    {
-        const SharedPtr<VertexArray> vertices = makeVertices(first, -1.0f);
-        if (!vertices)
-            return {};
-        MeshHeader header;
-        for (int i = 0; i < vertices->getVertexCount(); ++i)
-        {
-            const float* at = vertices->getData<float>() + 4 * i;
-            header.boundingRadius = std::max(header.boundingRadius, std::hypot(at[0], at[1]));
-        }
-        const IndexBuffer::Ptr order =
-            orv::create(*pool.getIndexBufferCache(), IndexBuffer::Primitive::TRIANGLES,
-                        unsigned(vertices->getVertexCount()), nullptr);
-        const VertexBuffer::Ptr buffer = makeBuffer(*pool.getVertexBufferCache(), *vertices);
-        const SharedPtr<Mesh> mesh =
-            order && buffer ? pool.getMeshCache()->create(header, order, buffer, nullptr) : Mesh::Ptr();
-        const auto part = mesh ? makeShared<Solid>(mesh, appearance) : SharedPtr<Solid>();
-        if (!part)
-            return {};
-        if (solid)
-            part->setParent(solid, false);
-        else
-            solid = part;
-    }
-    return solid;
+    SharedPtr<VertexBuffer> buffer;
+    return makeSolid(appearance, -1.0f, *pool.getVertexBufferCache(), buffer);
 }
 
 /// The alpha of what is drawn over grows towards 1, so that a target's picture can be laid over another one.
@@ -212,24 +188,28 @@ SharedPtr<Appearance> Text::makeAppearance() const
     return appearance;
 }
 
-/// Two triangles for each glyph of a lot: places and texture coordinates, six vertices of four floats.
-/// @param ySign  1 for y downwards, -1 for y upwards.
-/// @return empty, after an error, where memory lacks.
-SharedPtr<VertexArray> Text::makeVertices(std::size_t firstGlyph, float ySign) const
+/// Two triangles for each glyph: six vertices of place and texture coordinates.
+/// @param ySign   1 for y downwards, -1 for y upwards.
+/// @param buffer  filled again, or made where it is empty or GL has refused memory for it.
+/// @return empty without glyphs, or, after an error, where memory lacks.
+SharedPtr<Solid> Text::makeSolid(const SharedPtr<Appearance>& appearance, float ySign,
+                                 VertexBufferCache& cache, SharedPtr<VertexBuffer>& buffer) const
 {
-    const std::size_t count = std::min<std::size_t>(m_glyphs.size() - firstGlyph, MAX_GLYPHS);
-    auto vertices = makeShared<VertexArray>(int(6 * count), int(sizeof(float)), 4);
+    if (m_glyphs.empty())
+        return {};
+    const int count = 6 * int(m_glyphs.size());
+    const auto vertices = makeShared<VertexArray>(count, int(sizeof(float)), 4);
     if (!vertices || vertices->getSizeInBytes() == 0)
     {
-        ORV_LOG_ERROR("No memory for a text of %u glyphs", unsigned(count));
+        ORV_LOG_ERROR("No memory for a text of %u glyphs", unsigned(m_glyphs.size()));
         return {};
     }
     const auto atlasWidth = float(m_font->getTexture()->getWidth());
     const auto atlasHeight = float(m_font->getTexture()->getHeight());
+    MeshHeader header;
     auto* out = vertices->getData<float>();
-    for (std::size_t i = firstGlyph; i < firstGlyph + count; ++i)
+    for (const auto& [x, y, data] : m_glyphs)
     {
-        const auto& [x, y, data] = m_glyphs[i];
         const float xs[] = {x, x + data->x1 - data->x0};
         const float ys[] = {ySign * y, ySign * (y + data->y1 - data->y0)};
         const float us[] = {data->x0 / atlasWidth, data->x1 / atlasWidth};
@@ -241,42 +221,25 @@ SharedPtr<VertexArray> Text::makeVertices(std::size_t firstGlyph, float ySign) c
             *out++ = us[corner & 1];
             *out++ = vs[corner >> 1];
         }
+        if (ySign < 0.0f) // what draw() draws is culled by nobody
+            header.boundingRadius =
+                std::max(header.boundingRadius, std::hypot(std::max(std::abs(xs[0]), std::abs(xs[1])),
+                                                           std::max(std::abs(ys[0]), std::abs(ys[1]))));
     }
-    return vertices;
-}
 
-/// @return empty, after an error, where memory lacks.
-SharedPtr<VertexBuffer> Text::makeBuffer(VertexBufferCache& cache, VertexArray& vertices)
-{
     using Format = VertexBuffer::AttribFormat;
-    const VertexBuffer::Ptr buffer = cache.create(nullptr);
-    const VertexBuffer::AttribDescription attributes[] = {{"a_position", Format::FLOAT, false, 0, 2, 16},
-                                                          {"a_uv0", Format::FLOAT, false, 8, 2, 16}};
-    if (!buffer || !buffer->setAllAttributes(attributes, 2, vertices.getBytes(), vertices.getSizeInBytes()))
-        return {};
-    return buffer;
-}
-
-void Text::makeSolids()
-{
-    m_changed = false;
-    m_solids.clear();
-    for (std::size_t first = 0; first < m_glyphs.size(); first += MAX_GLYPHS)
+    if (!buffer || !buffer->replaceData(vertices->getBytes(), vertices->getSizeInBytes()))
     {
-        const SharedPtr<VertexArray> vertices = makeVertices(first, 1.0f);
-        if (!vertices)
-            continue;
-        const std::size_t lot = first / MAX_GLYPHS;
-        m_buffers.resize(std::max(m_buffers.size(), lot + 1));
-        VertexBuffer::Ptr& buffer = m_buffers[lot];
-        if (!buffer || !buffer->replaceData(vertices->getBytes(), vertices->getSizeInBytes()))
-            buffer = makeBuffer(*m_cache, *vertices);
-        const auto order = makeShared<IndexBuffer>(IndexBuffer::Primitive::TRIANGLES,
-                                                   vertices->getVertexCount(), false, nullptr);
-        const auto mesh = makeShared<Mesh>(MeshHeader(), order, buffer);
-        if (const SharedPtr<Solid> solid = mesh ? makeShared<Solid>(mesh, m_overlay) : SharedPtr<Solid>())
-            m_solids.push_back(solid);
+        const VertexBuffer::AttribDescription attributes[] = {{"a_position", Format::FLOAT, false, 0, 2, 16},
+                                                              {"a_uv0", Format::FLOAT, false, 8, 2, 16}};
+        buffer = cache.create(nullptr);
+        if (!buffer ||
+            !buffer->setAllAttributes(attributes, 2, vertices->getBytes(), vertices->getSizeInBytes()))
+            return {};
     }
+    const auto order = makeShared<IndexBuffer>(IndexBuffer::Primitive::TRIANGLES, count, false, nullptr);
+    const auto mesh = makeShared<Mesh>(header, order, buffer);
+    return mesh ? makeShared<Solid>(mesh, appearance) : SharedPtr<Solid>();
 }
 
 } // namespace orv
