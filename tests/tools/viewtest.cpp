@@ -258,5 +258,13 @@ TEST_F(ViewPictureTest, marksWhatIsAskedFor)
     const Picture edges = draw("edges", "--show wireframe");
     EXPECT_LT(50, countRed(edges, 0, 200));
     EXPECT_GT(square / 4, countRed(edges, 0, 200)) << "its edges and one across";
+    EXPECT_EQ(plain.rgba, draw("shadows", "--show shadows").rgba)
+        << "of one square, which throws none on itself";
+    m_folder.write(
+        "yard.obj",
+        "v -3 0 -3\nv -3 0 3\nv 3 0 3\nv 3 0 -3\nf 1 2 3 4\nv -1 1 0\nv 1 1 0\nv 0 2 0\nf 5 6 7\n");
+    for (const char* options : {"--out light.png", "--out dark.png --show shadows"})
+        EXPECT_EQ(0, view(std::string("yard.obj --size 200x200 ") + options).exitCode);
+    EXPECT_NE(picture("light.png").rgba, picture("dark.png").rgba);
     EXPECT_NE(edges.rgba, draw("all", "--show wireframe,axes,axes").rgba) << "a name said twice is shown";
 }

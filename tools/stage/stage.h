@@ -92,6 +92,7 @@ public:
     void draw(int width, int height);
 
     orv::SceneNode& getScene() { return *m_scene; }
+    Studio& getStudio() { return m_studio; }
     /// The top of what the file holds, without lights and cameras of the viewer's own.
     orv::SceneNode& getTopNode() { return m_glo && m_glo->getTopNode() ? *m_glo->getTopNode() : *m_scene; }
 

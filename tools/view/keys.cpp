@@ -62,6 +62,7 @@ const std::vector<Group>& getGroups()
         {{"a", "axes of nodes: x red, y green, z blue"}, {{Command::TOGGLE_AXES, {'a'}}}},
         {{"g", "a grid on the ground"}, {{Command::TOGGLE_GRID, {'g'}}}},
         {{"w", "edges of triangles in place of the triangles"}, {{Command::TOGGLE_WIREFRAME, {'w'}}}},
+        {{"d", "shadows of the first light from far away or of a spot"}, {{Command::TOGGLE_SHADOWS, {'d'}}}},
         {{"v, shift + v", "hide what is under the pointer, and show everything again"},
          {{Command::HIDE, {'v'}}}},
         {{"t, up, down", "the tree of nodes, and on in it"},

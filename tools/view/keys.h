@@ -33,6 +33,7 @@ enum class Command
     TOGGLE_AXES,
     TOGGLE_GRID,
     TOGGLE_WIREFRAME,
+    TOGGLE_SHADOWS,
     HIDE, ///< what is under the pointer; everything shown again, with shift
     TOGGLE_TREE,
     TREE_UP,

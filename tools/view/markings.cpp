@@ -31,7 +31,7 @@ constexpr float AXES_SHARE = 0.04f; // of the scene's size
 constexpr float CELL_SHARE = 0.1f;  // likewise, before it is rounded to a power of ten
 constexpr int MOST_GRID_CELLS = 200;
 
-constexpr const char* NAMES[] = {"bounds", "skeletons", "axes", "grid", "wireframe"};
+constexpr const char* NAMES[] = {"bounds", "skeletons", "axes", "grid", "wireframe", "shadows"};
 static_assert(std::size(NAMES) == size_t(Marking::COUNT));
 
 /// The same place and directions, a unit long each.
@@ -113,6 +113,7 @@ Markings::Markings(const orv::RenderContext::Ptr& context)
 Markings::~Markings()
 {
     m_edges.clear();
+    m_shadows.reset();
     m_inside.reset();
     m_above.reset();
     m_pool->flush();
@@ -140,12 +141,14 @@ std::string Markings::describe() const
 void Markings::forget()
 {
     m_edges.clear();
+    m_shadows.reset();
     m_isMeasured = false;
     m_pool->flush();
 }
 
 void Markings::draw(Stage& stage, int width, int height)
 {
+    drawShadows(stage);
     if (shows(Marking::WIREFRAME))
         drawWireframe(stage, width, height);
     else
@@ -165,6 +168,19 @@ void Markings::draw(Stage& stage, int width, int height)
         addAxes(stage);
     m_inside->draw(*m_context, stage.getCamera());
     m_above->draw(*m_context, stage.getCamera());
+}
+
+/// Materials take shadows for as long as they are shown.
+void Markings::drawShadows(Stage& stage)
+{
+    if (!shows(Marking::SHADOWS))
+        return m_shadows.reset();
+    if (!m_shadows)
+    {
+        m_shadows = orv::makeShared<orv::ShadowMap>(m_context, stage.getStudio().getPool());
+        m_shadows->attach(stage.getScene());
+    }
+    m_shadows->render(stage.getScene(), &stage.getCamera(), SceneNode::VISIBLE, SceneNode::VISIBLE);
 }
 
 /// Solids have their edges for as long as the picture is drawn, so that materials, joints and all else are as ever.

@@ -4,6 +4,7 @@
 #include "orv/debuglines.h"
 #include "orv/mesh.h"
 #include "orv/rendercontext.h"
+#include "orv/shadowmap.h"
 
 #include <array>
 #include <cstdint>
@@ -24,6 +25,7 @@ enum class Marking
     AXES,      ///< of each node
     GRID,      ///< the ground
     WIREFRAME, ///< the edges of triangles in place of the triangles
+    SHADOWS,   ///< of the first directional or spot light
     COUNT
 };
 
@@ -63,6 +65,7 @@ private:
     };
 
     orv::SharedPtr<orv::Mesh> findEdges(const orv::SharedPtr<orv::Mesh>& mesh);
+    void drawShadows(Stage& stage);
     void drawWireframe(Stage& stage, int width, int height);
     void addBounds(Stage& stage);
     void addSkeletons(Stage& stage);
@@ -74,6 +77,7 @@ private:
     orv::SharedPtr<orv::AssetCachePool> m_pool; ///< of its own: that of the scene comes and goes
     orv::DebugLines::Ptr m_inside;              ///< what solids may hide
     orv::DebugLines::Ptr m_above;               ///< what they may not
+    orv::ShadowMap::Ptr m_shadows;              ///< of the stage, while they are shown
     std::array<bool, size_t(Marking::COUNT)> m_shown{};
     std::map<const orv::Mesh*, Edges> m_edges;
     bool m_isMeasured = false;

@@ -110,7 +110,7 @@ void addSceneOptions(CLI::App& app, Options& options, std::vector<std::string>& 
                            ? std::string()
                            : text + ": not a colour (#rrggbb, black, grey, white)";
             });
-    app.add_option("--show", "Beside the picture: bounds, skeletons, axes, grid, wireframe")
+    app.add_option("--show", "Beside the picture: bounds, skeletons, axes, grid, wireframe, shadows")
         ->type_name("WHAT,...")
         ->check([&options](const std::string& text) { return checkMarkings(text, options.markings); });
     app.add_option("--material", dressings, "Put an appearance file over a material of the scene")

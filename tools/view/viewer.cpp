@@ -193,6 +193,7 @@ void Viewer::handleKey(int32_t key, bool shift)
     case Command::TOGGLE_AXES: mark(Marking::AXES); break;
     case Command::TOGGLE_GRID: mark(Marking::GRID); break;
     case Command::TOGGLE_WIREFRAME: mark(Marking::WIREFRAME); break;
+    case Command::TOGGLE_SHADOWS: mark(Marking::SHADOWS); break;
     case Command::HIDE: shift ? showAll() : hide(); break;
     case Command::TOGGLE_TREE: toggleTree(); break;
     case Command::TREE_UP: scrollTree(-1); break;
