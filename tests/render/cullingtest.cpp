@@ -495,14 +495,12 @@ TEST_F(CullingTest, leavesNothingOutThatAMirrorMayShow)
     for (int frame = 0; frame < FRAMES / 4 && !HasFailure(); ++frame)
     {
         if (frame % 10 == 0) // with one or without
-        {
-            mirror = pick(2) ? added : nullptr;
-            added->setParent(mirror ? scene : nullptr);
-            items.erase(lastCount);
-            if (mirror)
-                items[lastCount] = {mirror, &shapes[lastCount], false};
-        }
-        changeScene();
+            added->setParent(pick(2) ? scene : nullptr);
+        changeScene(); // which may put it back
+        mirror = added->getParent() ? added : nullptr;
+        items.erase(lastCount);
+        if (mirror)
+            items[lastCount] = {mirror, &shapes[lastCount], false};
         if (mirror)
             mirror->setRotation(rotation());
         placeCamera();
