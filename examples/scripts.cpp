@@ -165,7 +165,7 @@ bool draw(const SharedPtr<AssetCachePool>& pool, float density)
     Background(PAPER).enable(*context);
     for (const TextLayout::Ptr& text : {title, names, greetings})
         text->draw(*context);
-    std::printf("%u glyphs on %u pages\n", glyphs->getGlyphCount(), glyphs->getPageCount());
+    std::printf("glyphs: %u, pages: %u\n", glyphs->getGlyphCount(), glyphs->getPageCount());
     return true;
 }
 

@@ -101,8 +101,9 @@ const char* FontFace::read()
     if (!m_tables->characters.read(tables.getCharacterMaps()))
         return "it has no character map that can be read";
     m_tables->kerning.read(tables);
-    m_outlines = std::make_unique<detail::FontOutlines>(getData(), tables, std::size_t(start));
-    return m_outlines->isValid() ? nullptr : "it is no TrueType font";
+    auto* const file = reinterpret_cast<unsigned char*>(m_file.getStart());
+    m_outlines = std::make_unique<detail::FontOutlines>(file, tables);
+    return nullptr;
 }
 
 unsigned FontFace::findGlyph(uint32_t codePoint) const

@@ -26,14 +26,10 @@ struct GlyphPicture
 class FontOutlines
 {
 public:
-    /// @param file    borrowed as long as this is.
+    /// @param file    borrowed as long as this is, and not written to.
     /// @param tables  of this file, without a fault; copied.
-    /// @param start   of the font in its file.
-    FontOutlines(const unsigned char* file, const FontTables& tables, std::size_t start);
+    FontOutlines(unsigned char* file, const FontTables& tables);
     ~FontOutlines();
-
-    /// False if the rasteriser does not take the file.
-    bool isValid() const { return m_valid; }
 
     /// @param scale    pixels for a unit of the font.
     /// @param mostSide  pixels that a picture may have each way.
@@ -44,7 +40,6 @@ public:
 private:
     struct Rasteriser;
     std::unique_ptr<Rasteriser> m_rasteriser;
-    bool m_valid;
 };
 
 } // namespace orv::detail

@@ -98,9 +98,9 @@ public:
     /// What GL refused, or lost with its context, has no appearance or draws nothing.
     Look& getLook(unsigned page) { return m_pages[page].look; }
 
-    /// The page's texture, with mipmaps from here on; empty where GL has none. As long as somebody else holds it, its
+    /// A page's texture, with mipmaps from here on; empty where GL has none. As long as somebody else holds it, its
     /// glyphs stay.
-    SharedPtr<Texture2D> takeTexture(unsigned page);
+    SharedPtr<Texture2D> takeTexture(unsigned number);
 
 private:
     struct Cell

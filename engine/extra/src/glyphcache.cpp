@@ -202,7 +202,7 @@ void GlyphCache::drawBox(uint32_t size)
         for (int x = 0; x < width; ++x)
         {
             const bool isInside = x >= line && x < width - line && y >= line && y < height - line;
-            m_picture->ink[std::size_t(y * width + x)] = isInside ? 0 : 255;
+            m_picture->ink[std::size_t(y) * std::size_t(width) + std::size_t(x)] = isInside ? 0 : 255;
         }
     }
 }

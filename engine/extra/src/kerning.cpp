@@ -85,6 +85,27 @@ std::size_t getValueSize(unsigned format)
     return size;
 }
 
+/// @param left  how many records may be looked at; counted down.
+/// @return the lookups that a script uses for kerning.
+std::set<unsigned> findKerning(FontBytes script, FontBytes& features, int& left)
+{
+    std::set<unsigned> lookups;
+    const unsigned languageAt = script.u16(0); // the default one
+    FontBytes language = script.rest(languageAt);
+    const unsigned featureCount = languageAt == 0 ? 0 : language.u16(4);
+    for (unsigned i = 0; i < featureCount && language.isSound() && left > 0; ++i, --left)
+    {
+        const std::size_t record = 2 + 6 * std::size_t(language.u16(6 + 2 * std::size_t(i)));
+        if (features.u32(record) != makeFontTag("kern"))
+            continue;
+        FontBytes feature = features.rest(features.u16(record + 4));
+        const unsigned count = feature.u16(2);
+        for (unsigned j = 0; j < count && feature.isSound() && left > 0; ++j, --left)
+            lookups.insert(feature.u16(4 + 2 * std::size_t(j)));
+    }
+    return lookups;
+}
+
 } // namespace
 
 void Kerning::read(FontTables tables)
@@ -92,35 +113,40 @@ void Kerning::read(FontTables tables)
     FontBytes table;
     FontTables others = tables;
     if (tables.findTable(makeFontTag("GPOS"), table))
-        readFeatures(table);
+        readScripts(table);
     if (m_adjustments.empty() && others.findTable(makeFontTag("kern"), table))
         readPairs(table);
 }
 
-/// Notes the lookups of each feature "kern", whatever script it is for.
-void Kerning::readFeatures(FontBytes positions)
+/// Notes the lookups that the feature "kern" has for each script, in its default language.
+void Kerning::readScripts(FontBytes positions)
 {
-    const unsigned FEATURES_AT = 6, LOOKUPS_AT = 8;
-    FontBytes features = positions.rest(positions.u16(FEATURES_AT));
-    FontBytes lookups = positions.rest(positions.u16(LOOKUPS_AT));
-    std::set<unsigned> indices;
-    unsigned lookedAt = 0;
-    const unsigned count = features.u16(0);
-    for (unsigned i = 0; i < count && features.isSound() && lookedAt < MOST_LOOKUPS; ++i)
+    FontBytes scripts = positions.rest(positions.u16(4));
+    FontBytes features = positions.rest(positions.u16(6));
+    FontBytes lookups = positions.rest(positions.u16(8));
+    std::vector<std::set<unsigned>> found;
+    std::set<unsigned> general;
+    int left = MOST_RECORDS;
+    const unsigned count = scripts.u16(0);
+    for (unsigned i = 0; i < count && left > 0; ++i, --left)
     {
         const std::size_t record = 2 + 6 * std::size_t(i);
-        if (features.u32(record) != makeFontTag("kern"))
-            continue;
-        FontBytes feature = features.rest(features.u16(record + 4));
-        const unsigned lookupCount = feature.u16(2);
-        for (unsigned j = 0; j < lookupCount && feature.isSound() && lookedAt < MOST_LOOKUPS; ++j, ++lookedAt)
-            indices.insert(feature.u16(4 + 2 * std::size_t(j)));
+        const std::set<unsigned> own = findKerning(scripts.rest(scripts.u16(record + 4)), features, left);
+        if (scripts.u32(record) == makeFontTag("DFLT"))
+            general = own;
+        else if (std::find(found.begin(), found.end(), own) == found.end())
+            found.push_back(own);
     }
-    for (const unsigned index : indices)
-        addLookup(lookups, index);
+    if (std::find(found.begin(), found.end(), general) == found.end())
+        found.push_back(general);
+    for (unsigned script = 0; script < found.size(); ++script)
+    {
+        for (const unsigned index : found[script])
+            addLookup(lookups, script, index);
+    }
 }
 
-void Kerning::addLookup(FontBytes& lookups, unsigned index)
+void Kerning::addLookup(FontBytes& lookups, unsigned script, unsigned index)
 {
     const unsigned PAIR_ADJUSTMENT = 2, EXTENSION = 9;
     if (index >= lookups.u16(0))
@@ -138,7 +164,7 @@ void Kerning::addLookup(FontBytes& lookups, unsigned index)
             table = table.rest(table.u32(4));
         }
         if (tableType == PAIR_ADJUSTMENT && table.isSound())
-            m_adjustments.push_back({table, index});
+            m_adjustments.push_back({table, script, index});
     }
 }
 
@@ -171,11 +197,15 @@ int Kerning::find(uint32_t left, uint32_t right) const
     int sum = 0;
     for (std::size_t i = 0; i < m_adjustments.size(); ++i)
     {
+        const Table& table = m_adjustments[i];
+        if (sum != 0 && table.script != m_adjustments[i - 1].script)
+            return sum;
         int advance = 0;
-        if (!findAdjustment(m_adjustments[i].bytes, left, right, advance))
+        if (!findAdjustment(table.bytes, left, right, advance))
             continue;
         sum += advance;
-        while (i + 1 < m_adjustments.size() && m_adjustments[i + 1].lookup == m_adjustments[i].lookup)
+        while (i + 1 < m_adjustments.size() && m_adjustments[i + 1].lookup == table.lookup &&
+               m_adjustments[i + 1].script == table.script)
             ++i;
     }
     for (FontBytes pairs : m_pairs)

@@ -45,6 +45,7 @@ public:
     }
     FontBytes rest(std::size_t at) { return part(at, m_size - std::min(at, m_size)); }
 
+    const unsigned char* start() const { return m_start; }
     std::size_t size() const { return m_size; }
     bool isSound() const { return m_sound; }
 
