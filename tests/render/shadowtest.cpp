@@ -563,3 +563,23 @@ TEST_F(ShadowTest, deviceWithoutPrecisionDoesWithout)
     EXPECT_TRUE(support::comparePictures("mediump", plain, drawShadowed(), {.perChannel = 0}));
     EXPECT_EQ(1, log.count('W') + log.count('E')) << log.text();
 }
+
+// Faults caught: programs that the smallest device has no room for, or materials that it would have had room for. What it
+// has is counted by glcalls, not by the engine.
+TEST_F(ShadowTest, smallestDeviceTakesWhatFits)
+{
+    glcalls::emulate(
+        {.name = "small", .vertexUniformVectors = 128, .textureUnits = 8, .hasDepthTextures = false});
+    makeStage(makeWhite("orv#max_ppl.sp$BUMP$DIFF$SPEC$AMBI$REFL$VCOL$CUTOFF$LINEAR$SKIN"));
+    const char* const names[] = {"orv#max_pvl.sp$DIFF$SPEC$AMBI$REFL$EMIS$VCOL$CUTOFF$BACK$SKIN",
+                                 "orv#max_pvl.sp$DIFF$SPEC$AMBI$REFL$CUBE$EMIS$VCOL$CUTOFF$BACK$LINEAR$SKIN",
+                                 "orv#max_pvl.sp$DIFF$AMBI$REFL$LINEAR$SKIN", // no room
+                                 "orv#max_pvl.sp$AMBI$REFL$EMIS$SKIN",
+                                 "orv#max_pvl.sp$DIFF$UNLIT"}; // nothing is lit
+    for (const char* name : names)
+        addCube(Vector3f(0, 2, 0), Vector3f(1, 1, 1), makeWhite(name));
+    const LogCapture log;
+    makeShadows();
+    EXPECT_EQ(3, attached);
+    EXPECT_EQ(1, log.count('W') + log.count('E')) << log.text();
+}
