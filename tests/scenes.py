@@ -20,9 +20,8 @@ from installedtools import make_model  # noqa: E402
 PREFIX, WORK, GENERATOR = os.path.abspath(sys.argv[1]), os.path.abspath(sys.argv[2]), sys.argv[3]
 CONVERT = os.path.join(PREFIX, "bin/orv-convert")
 PROJECT = """cmake_minimum_required(VERSION 3.22)
-project(scenes LANGUAGES NONE)
-include({config}/orvScenes.cmake)
-set(ORV_TOOLS_FOLDER {prefix}/bin)
+project(scenes LANGUAGES CXX)
+find_package(orv 1.0 REQUIRED)
 orv_add_scenes(models a/one.gltf "b c/two.gltf" OUT scenes OPTIONS --scale 2)
 """
 
@@ -51,15 +50,14 @@ def stamp(*names):
 
 
 def check_build():
-    config = os.path.dirname(subprocess.check_output(["find", PREFIX, "-name", "orvScenes.cmake"]).decode().strip())
     for model in ("a/one.gltf", "b c/two.gltf"):
         os.makedirs(os.path.join(WORK, os.path.dirname(model)))
         make_model(os.path.join(WORK, model))
     with open(os.path.join(WORK, "CMakeLists.txt"), "w", encoding="utf-8") as file:
-        file.write(PROJECT.format(config=config, prefix=PREFIX))
+        file.write(PROJECT)
     build = os.path.join(WORK, "build")
     scenes = ["build/scenes/one.glo", "build/scenes/two.glo"]
-    run("cmake", "-G", GENERATOR, "-S", WORK, "-B", build)
+    run("cmake", "-G", GENERATOR, "-S", WORK, "-B", build, "-DCMAKE_PREFIX_PATH=" + PREFIX)
     run("cmake", "--build", build)
     before = stamp(*scenes)
     run("cmake", "--build", build)
