@@ -26,3 +26,6 @@ install(FILES ${desktop}/orv-view.desktop DESTINATION share/applications COMPONE
 install(FILES ${desktop}/orv-view.thumbnailer DESTINATION share/thumbnailers COMPONENT tools)
 install(FILES ${desktop}/orv.xml DESTINATION share/mime/packages COMPONENT tools)
 install(FILES cmake/copyright DESTINATION share/doc/orv-tools COMPONENT tools)
+
+# What orv-convert --page copies, if ./run web has built it.
+install(DIRECTORY build/web/page/ DESTINATION share/orv/web COMPONENT tools OPTIONAL)

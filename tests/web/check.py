@@ -41,7 +41,7 @@ class Bench:
     """Everything that the checks share."""
 
     def __init__(self, build, web, models):
-        self.build, self.web = build, web
+        self.build, self.web, self.models = build, web, models
         self.folder = web / "check"
         shutil.rmtree(self.folder, ignore_errors=True)
         self.folder.mkdir(parents=True)
@@ -364,6 +364,41 @@ def damage(bench):
     return f"{refused} of {len(bad)} damaged scenes refused, the others drawn; 6 messages"
 
 
+def pages(bench):
+    """Fault caught: a page of a model with an odd name that shows nothing; half a page, or none, without a word."""
+    convert = bench.build / "tools/convert/orv-convert"
+    folder = bench.native / "pages"
+    folder.mkdir()
+    odd = folder / "a#b%20 <i>&</script>\u00e4.dae".replace("/", "")
+    duck = bench.models / MODELS["duck"]
+    shutil.copyfile(duck, odd)
+    shutil.copyfile(duck.parent / "duckCM.tga", folder / "duckCM.tga")
+    run_here([convert, odd, "--page", bench.folder / "odd"])
+    bench.browser.resize(WIDTH, HEIGHT)
+    bench.show("duck")
+    wanted = bench.browser.picture()
+    bench.show("odd")
+    most = compare(wanted, bench.browser.picture(), 0)[1]
+    expect(most == 0, f"{odd.name}: {most} of 255 off")
+    expect(bench.browser.driver.title.startswith(odd.stem), bench.browser.driver.title)
+
+    (folder / "broken.dae").write_text("broken")
+    (folder / "file").write_text("")
+    (folder / "taken/index.html").mkdir(parents=True)
+    alone = folder / "bin/orv-convert"
+    alone.parent.mkdir()
+    shutil.copy(convert, alone)
+    for program, model, page, reason in ((convert, "broken.dae", "new", "broken.dae: "),
+                                         (convert, odd, "file", "file: "), (convert, odd, "no/new", "no/new: "),
+                                         (convert, odd, "taken", "index.html: Is a directory"),
+                                         (alone, odd, "new", "the page for browsers has not been built")):
+        done = subprocess.run([program, model, "--page", page], cwd=folder, capture_output=True, text=True)
+        expect(done.returncode == 1 and reason in done.stderr, f"{page}: {done.returncode} {done.stderr}")
+    expect(not (folder / "new").exists() and [path.name for path in (folder / "taken").iterdir()] == ["index.html"],
+           f"left behind: {[str(path) for path in folder.rglob('*')]}")
+    return "an odd name; five failures that leave nothing behind"
+
+
 def files(bench):
     """Fault caught: files that are chosen or dropped and not opened; a scene of an address without its pictures."""
     browser = bench.browser
@@ -441,7 +476,7 @@ def sizes(bench):
     return f"5 screens; for a screen reader: {names['application'][0]}"
 
 
-CHECKS = (download, requests, files, models, examples, hands, context, growth, damage, sizes)
+CHECKS = (download, requests, files, pages, models, examples, hands, context, growth, damage, sizes)
 
 
 def main():
