@@ -15,6 +15,7 @@
 
 #include <algorithm>
 #include <cmath>
+#include <iterator>
 #include <string_view>
 
 namespace orv
@@ -210,21 +211,17 @@ SharedPtr<Solid> Text::makeSolid(const SharedPtr<Appearance>& appearance, float 
     auto* out = vertices->getData<float>();
     for (const auto& [x, y, data] : m_glyphs)
     {
-        const float xs[] = {x, x + data->x1 - data->x0};
-        const float ys[] = {ySign * y, ySign * (y + data->y1 - data->y0)};
-        const float us[] = {data->x0 / atlasWidth, data->x1 / atlasWidth};
-        const float vs[] = {1.0f - data->y0 / atlasHeight, 1.0f - data->y1 / atlasHeight};
-        for (const int corner : {0, 2, 1, 1, 2, 3}) // bit 0: right, bit 1: below
-        {
-            *out++ = xs[corner & 1];
-            *out++ = ys[corner >> 1];
-            *out++ = us[corner & 1];
-            *out++ = vs[corner >> 1];
-        }
+        const float left = x, right = x + data->x1 - data->x0;
+        const float upper = ySign * y, lower = ySign * (y + data->y1 - data->y0);
+        const float u0 = data->x0 / atlasWidth, u1 = data->x1 / atlasWidth;
+        const float v0 = 1.0f - data->y0 / atlasHeight, v1 = 1.0f - data->y1 / atlasHeight;
+        const float corners[] = {left,  upper, u0, v0, left, lower, u0, v1, right, upper, u1, v0,
+                                 right, upper, u1, v0, left, lower, u0, v1, right, lower, u1, v1};
+        out = std::copy(std::begin(corners), std::end(corners), out);
         if (ySign < 0.0f) // what draw() draws is culled by nobody
             header.boundingRadius =
-                std::max(header.boundingRadius, std::hypot(std::max(std::abs(xs[0]), std::abs(xs[1])),
-                                                           std::max(std::abs(ys[0]), std::abs(ys[1]))));
+                std::max(header.boundingRadius, std::hypot(std::max(std::abs(left), std::abs(right)),
+                                                           std::max(std::abs(upper), std::abs(lower))));
     }
 
     using Format = VertexBuffer::AttribFormat;
