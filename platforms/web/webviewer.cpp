@@ -208,6 +208,7 @@ void WebViewer::zoom(float steps)
 
 void WebViewer::lookCloser(float x, float y)
 {
+    m_eye.apply(*m_stage); // before the first frame, or after a turn, the camera is elsewhere
     m_eye.lookCloser(*m_stage, x, y, m_width, m_height);
 }
 
