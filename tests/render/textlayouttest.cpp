@@ -363,6 +363,11 @@ TEST_F(TextLayoutTest, isOneDrawForEachPage)
     second->add("other", 20, 0, 0);
     drawText(*text);
     drawText(*second);
+    for (int i = 0; i < 4; ++i) // the driver makes things of its own at the third
+    {
+        text->draw(*renderContext);
+        text->setColour(Colour4f(1, 0, 0, 0));
+    }
 
     glcalls::reset();
     const uint64_t allocations = support::countAllocations();
@@ -372,7 +377,7 @@ TEST_F(TextLayoutTest, isOneDrawForEachPage)
         text->setColour(Colour4f(1, 0, 0, 0.1f * float(i)));
     }
     EXPECT_EQ(allocations, support::countAllocations());
-    EXPECT_EQ(3u, glcalls::count(glDrawElements));
+    EXPECT_EQ(3u, glcalls::count(glDrawArrays));
     EXPECT_EQ(0u, glcalls::count(glBufferData) + glcalls::count(glTexImage2D) +
                       glcalls::count(glTexSubImage2D) + glcalls::count(glGenerateMipmap));
 
@@ -392,14 +397,14 @@ TEST_F(TextLayoutTest, isOneDrawForEachPage)
 
     text->clear();
     drawText(*text);
-    EXPECT_EQ(4u, glcalls::count(glDrawElements));
+    EXPECT_EQ(4u, glcalls::count(glDrawArrays));
 
     // More glyphs than 16 bits have indices for.
     const std::string many(TextLayout::MAX_GLYPHS + 1, 'e');
     text->add(many.c_str(), 8, 0, 0);
     glcalls::resetCounts();
     drawText(*text);
-    EXPECT_EQ(2u, glcalls::count(glDrawElements));
+    EXPECT_EQ(2u, glcalls::count(glDrawArrays));
 }
 
 // Faults caught: text in the scene mirrored or out of place; its glyphs forgotten, overwritten or without mipmaps.

@@ -19,45 +19,32 @@ namespace orv::detail
 namespace
 {
 
-constexpr unsigned FLOATS_PER_QUAD = 8; ///< of positions, and of texture coordinates
+constexpr unsigned VERTICES_PER_QUAD = 6; ///< two triangles
+constexpr unsigned FLOATS_PER_VERTEX = 4; ///< place and texture coordinates
+constexpr unsigned FLOATS_PER_QUAD = VERTICES_PER_QUAD * FLOATS_PER_VERTEX;
 
-void fillIndices(unsigned short* index, unsigned quads)
+/// @return empty where memory lacks (logged).
+VertexBuffer::Ptr makeBuffer(VertexBufferCache& cache, const VertexArray& vertices)
 {
-    for (unsigned i = 0; i < quads; ++i)
-    {
-        for (const unsigned corner : {0u, 2u, 1u, 1u, 2u, 3u})
-            *index++ = static_cast<unsigned short>(4 * i + corner);
-    }
-}
-
-void addAttribs(VertexBuffer& vertices, const SharedPtr<VertexArray>& positions,
-                const SharedPtr<VertexArray>& uvs, VertexBuffer::AttribUsage usage)
-{
-    vertices.addAttrib(positions, "a_position", VertexBuffer::AttribFormat::FLOAT, usage, false);
-    vertices.addAttrib(uvs, "a_uv0", VertexBuffer::AttribFormat::FLOAT, usage, false);
+    using Format = VertexBuffer::AttribFormat;
+    const VertexBuffer::AttribDescription attributes[] = {{"a_position", Format::FLOAT, false, 0, 2, 16},
+                                                          {"a_uv0", Format::FLOAT, false, 8, 2, 16}};
+    const VertexBuffer::Ptr buffer = cache.create(nullptr);
+    const bool isMade = buffer && buffer->setAllAttributes(attributes, 2, vertices.getBytes(),
+                                                           unsigned(vertices.getSizeInBytes()));
+    return isMade ? buffer : VertexBuffer::Ptr();
 }
 
 } // namespace
 
 GlyphQuads::GlyphQuads(unsigned count)
-    : m_positions(makeShared<VertexArray>(int(4 * count), int(sizeof(float)), 2))
-    , m_uvs(makeShared<VertexArray>(int(4 * count), int(sizeof(float)), 2))
+    : m_vertices(
+          makeShared<VertexArray>(int(VERTICES_PER_QUAD * count), int(sizeof(float)), int(FLOATS_PER_VERTEX)))
 {
-    const auto indices =
-        makeShared<IndexBuffer>(IndexBuffer::Primitive::TRIANGLES, int(6 * count), true, nullptr);
-    const auto vertices = makeShared<VertexBuffer>(nullptr);
-    const bool isMade = m_positions && m_positions->getSizeInBytes() != 0 && m_uvs &&
-                        m_uvs->getSizeInBytes() != 0 && indices && indices->getIndices() && vertices;
-    const auto mesh = isMade ? makeShared<Mesh>(MeshHeader(), indices, vertices) : SharedPtr<Mesh>();
-    m_solid = mesh ? makeShared<Solid>(mesh, nullptr) : SharedPtr<Solid>();
-    if (!m_solid)
-    {
+    if (!m_vertices || m_vertices->getSizeInBytes() == 0)
         ORV_LOG_ERROR("No memory for a text of %u glyphs", count);
-        return;
-    }
-    fillIndices(indices->getIndices(), count);
-    addAttribs(*vertices, m_positions, m_uvs, VertexBuffer::AttribUsage::CLIENT_MEMORY);
-    m_room = count;
+    else
+        m_room = count;
 }
 
 GlyphQuads::~GlyphQuads() = default;
@@ -75,37 +62,48 @@ void GlyphQuads::add(const GlyphAtlas::Entry& entry, float pageSize, float x, fl
 {
     const float u0 = float(entry.x) / pageSize, u1 = float(entry.x + entry.width) / pageSize;
     const float v0 = 1.0f - float(entry.y) / pageSize, v1 = 1.0f - float(entry.y + entry.height) / pageSize;
-    const float corners[] = {x, y, x + width, y, x, y + height, x + width, y + height};
-    const float places[] = {u0, v0, u1, v0, u0, v1, u1, v1};
-    const std::size_t at = std::size_t(FLOATS_PER_QUAD) * m_count++;
-    std::copy(std::begin(corners), std::end(corners), m_positions->getData<float>() + at);
-    std::copy(std::begin(places), std::end(places), m_uvs->getData<float>() + at);
+    const float right = x + width, lower = y + height;
+    const float corners[] = {x,     y, u0, v0, x, lower, u0, v1, right, y,     u1, v0,
+                             right, y, u1, v0, x, lower, u0, v1, right, lower, u1, v1};
+    std::copy(std::begin(corners), std::end(corners),
+              m_vertices->getData<float>() + std::size_t(FLOATS_PER_QUAD) * m_count++);
 }
 
 void GlyphQuads::end()
 {
     if (m_shown > m_count)
-        std::fill_n(m_positions->getData<float>() + std::size_t(FLOATS_PER_QUAD) * m_count,
+        std::fill_n(m_vertices->getData<float>() + std::size_t(FLOATS_PER_QUAD) * m_count,
                     std::size_t(FLOATS_PER_QUAD) * (m_shown - m_count), 0.0f);
     m_shown = m_count;
 }
 
+bool GlyphQuads::send(VertexBufferCache& cache)
+{
+    if (m_solid && m_solid->getMesh()->getVertexBuffer()->replaceData(m_vertices->getBytes(),
+                                                                      unsigned(m_vertices->getSizeInBytes())))
+        return true;
+    const auto order = makeShared<IndexBuffer>(IndexBuffer::Primitive::TRIANGLES,
+                                               int(VERTICES_PER_QUAD * m_room), false, nullptr);
+    const VertexBuffer::Ptr buffer = order ? makeBuffer(cache, *m_vertices) : VertexBuffer::Ptr();
+    const auto mesh = buffer ? makeShared<Mesh>(MeshHeader(), order, buffer) : SharedPtr<Mesh>();
+    m_solid = mesh ? makeShared<Solid>(mesh, nullptr) : SharedPtr<Solid>();
+    return bool(m_solid);
+}
+
 SharedPtr<Mesh> GlyphQuads::makeMesh(AssetCachePool& pool)
 {
-    const IndexBuffer::Ptr indices =
-        pool.getIndexBufferCache()->create(IndexBuffer::Primitive::TRIANGLES, 6 * m_room, nullptr, nullptr);
-    const VertexBuffer::Ptr vertices = pool.getVertexBufferCache()->create(nullptr);
-    if (m_room == 0 || !indices || !indices->getIndices() || !vertices)
+    if (m_room == 0)
+        return {};
+    const IndexBuffer::Ptr order = create(*pool.getIndexBufferCache(), IndexBuffer::Primitive::TRIANGLES,
+                                          VERTICES_PER_QUAD * m_room, nullptr);
+    const VertexBuffer::Ptr buffer = makeBuffer(*pool.getVertexBufferCache(), *m_vertices);
+    if (!order || !buffer)
         return {};
     MeshHeader header;
-    const float* at = m_positions->getData<float>();
-    for (unsigned i = 0; i < 4 * m_count; ++i, at += 2)
+    const float* at = m_vertices->getData<float>();
+    for (unsigned i = 0; i < VERTICES_PER_QUAD * m_count; ++i, at += FLOATS_PER_VERTEX)
         header.boundingRadius = std::max(header.boundingRadius, std::hypot(at[0], at[1]));
-    fillIndices(indices->getIndices(), m_room);
-    addAttribs(*vertices, m_positions, m_uvs, VertexBuffer::AttribUsage::GL_BUFFER);
-    vertices->commit();
-    indices->commit();
-    return pool.getMeshCache()->create(header, indices, vertices, nullptr);
+    return pool.getMeshCache()->create(header, order, buffer, nullptr);
 }
 
 } // namespace orv::detail

@@ -10,14 +10,15 @@ namespace orv
 class AssetCachePool;
 class Mesh;
 class Solid;
+class VertexBufferCache;
 
 namespace detail
 {
 
 /// The glyphs of one page that one draw takes: a square for each, with room for more of them.
 ///
-/// Over a frame they are in client memory, and used again: what there is no glyph for has no size. For a scene they go into
-/// buffers, once.
+/// Over a frame they are in one GL buffer that is filled again: what there is no glyph for has no size. For a scene they go
+/// into a buffer once.
 class GlyphQuads
 {
 public:
@@ -37,15 +38,16 @@ public:
 
     unsigned getPage() const { return m_page; }
 
-    /// What shows them over a frame, in client memory.
+    /// Fills the buffer. @return false where memory lacks (logged).
+    bool send(VertexBufferCache& cache);
+    /// What shows over a frame what was sent.
     const SharedPtr<Solid>& getSolid() const { return m_solid; }
 
-    /// @return a mesh in buffers of the pool; the quads are of no use any more. Empty where memory lacks.
+    /// @return a mesh in a buffer of the pool; the quads are of no use any more. Empty where memory lacks.
     SharedPtr<Mesh> makeMesh(AssetCachePool& pool);
 
 private:
-    SharedPtr<VertexArray> m_positions;
-    SharedPtr<VertexArray> m_uvs;
+    SharedPtr<VertexArray> m_vertices;
     SharedPtr<Solid> m_solid;
     unsigned m_page = 0;
     unsigned m_room = 0;

@@ -9,6 +9,7 @@
 #include "orv/solid.h"
 #include "orv/textlayout.h"
 #include "orv/texture2d.h"
+#include "orv/vertexbuffercache.h"
 
 #include <algorithm>
 
@@ -36,7 +37,7 @@ unsigned findRoom(std::size_t count)
 
 } // namespace
 
-PlacedGlyphs::PlacedGlyphs() = default;
+PlacedGlyphs::PlacedGlyphs(const SharedPtr<VertexBufferCache>& cache) : m_cache(cache) {}
 
 PlacedGlyphs::~PlacedGlyphs() = default;
 
@@ -153,15 +154,28 @@ void PlacedGlyphs::draw(GlyphCache& cache, RenderContext& context, const Colour4
         drawQuads(atlas, context, colour);
         return;
     }
-    const int lots = forEachLot(cache,
-                                [&](std::size_t first, std::size_t end)
-                                {
-                                    if (fillQuads(atlas, first, end, 1.0f, false, m_quads, m_quadsCount))
-                                        drawQuads(atlas, context, colour);
-                                });
-    m_isMade = lots == 1;
+    bool isSent = true;
+    const int lots =
+        forEachLot(cache,
+                   [&](std::size_t first, std::size_t end)
+                   {
+                       isSent =
+                           fillQuads(atlas, first, end, 1.0f, false, m_quads, m_quadsCount) && sendQuads();
+                       if (isSent)
+                           drawQuads(atlas, context, colour);
+                   });
+    m_isMade = lots == 1 && isSent;
     if (m_isMade)
         noteUsed(atlas);
+}
+
+/// @return false where memory lacks (logged).
+bool PlacedGlyphs::sendQuads()
+{
+    bool isSent = true;
+    for (std::size_t i = 0; i < m_quadsCount; ++i)
+        isSent = m_quads[i]->send(*m_cache) && isSent;
+    return isSent;
 }
 
 void PlacedGlyphs::drawQuads(GlyphAtlas& atlas, RenderContext& context, const Colour4f& colour)

@@ -14,6 +14,7 @@ namespace orv
 class AssetCachePool;
 class RenderContext;
 class Solid;
+class VertexBufferCache;
 
 namespace detail
 {
@@ -24,7 +25,8 @@ class GlyphQuads;
 class PlacedGlyphs
 {
 public:
-    PlacedGlyphs();
+    /// @param cache  shared; where the buffers for drawing over a frame are made.
+    explicit PlacedGlyphs(const SharedPtr<VertexBufferCache>& cache);
     ~PlacedGlyphs();
 
     void clear();
@@ -62,8 +64,10 @@ private:
     void noteUsed(const GlyphAtlas& atlas);
     bool fillQuads(const GlyphAtlas& atlas, std::size_t first, std::size_t end, float scale, bool isForScene,
                    Quads& quads, std::size_t& count);
+    bool sendQuads();
     void drawQuads(GlyphAtlas& atlas, RenderContext& context, const Colour4f& colour);
 
+    SharedPtr<VertexBufferCache> m_cache;
     std::vector<Glyph> m_glyphs;
     std::vector<Used> m_used; ///< each glyph of the atlas that m_glyphs has, once
     std::vector<std::size_t>

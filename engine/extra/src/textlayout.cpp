@@ -43,7 +43,7 @@ TextLayout::TextLayout(AssetCachePool& pool, const GlyphCache::Ptr& glyphs, cons
     : m_glyphs(glyphs)
     , m_program(pool.getShaderProgramCache()->get("luvane#textfadequad.sp"))
     , m_colour(colour)
-    , m_placed(std::make_unique<detail::PlacedGlyphs>())
+    , m_placed(std::make_unique<detail::PlacedGlyphs>(pool.getVertexBufferCache()))
 {
     if (!glyphs)
         ORV_LOG_ERROR("A text layout has no glyph cache and will not be seen");
