@@ -1,10 +1,10 @@
+#include "stage/orbit.h"
+#include "stage/player.h"
 #include "support/tempdir.h"
 #include "view/companions.h"
 #include "view/compare.h"
 #include "view/fontsearch.h"
 #include "view/keys.h"
-#include "stage/orbit.h"
-#include "stage/player.h"
 #include "view/watcher.h"
 #include "window/window.h"
 

@@ -53,7 +53,7 @@ private:
     const Appearance* m_appearance = nullptr;
     const ShaderProgram* m_program = nullptr;
     const Mesh* m_mesh = nullptr; ///< bound for m_program
-    uint64_t m_revision = 0; ///< the last of all revisions when its material was ready
+    uint64_t m_revision = 0;      ///< the last of all revisions when its material was ready
     bool m_turnsWinding = false;
     bool m_hadJoints;
     const UniformSources* m_sources = nullptr;

@@ -31,7 +31,8 @@ struct UniformSources
     {
         const ShaderUniformBase* source;
         DrawnUniform* uniform;
-        Vector4f* sentVector; ///< uniform's value sent last, if it and source are single ones of this type; else null
+        /// The uniform's value sent last, if it and source are single ones of this type; else null.
+        Vector4f* sentVector;
     };
 
     /// A texture unit, one for each element of a sampler that is an array.
