@@ -152,7 +152,7 @@ void benchFrames(int cubes)
                draw();
                lines->draw(*yard.context, *yard.camera);
            });
-    report("with 10,000 lines made anew",
+    report("with 10,000 lines made again",
            [&]
            {
                draw();

@@ -3,7 +3,7 @@
 
 links.py FOLDER...
 
-Faults caught: a page that was moved or renamed, a heading that was worded anew, an installed page whose picture was left
+Faults caught: a page that was moved or renamed, a heading that was reworded, an installed page whose picture was left
 behind. Links to other hosts are not followed. Exit code: 1 for a link that leads nowhere, 0 otherwise.
 """
 import os

@@ -7,7 +7,7 @@ Messages are taken out of the sources: the texts of log calls, and of the functi
 tools say why they fail. What stands between the values of a message has to be in the page, in a code span, with the
 values as an ellipsis: "Cannot open %s" is `Cannot open …`. Single words, which are values themselves, are left out.
 
-Faults caught: a message that somebody meets and finds nowhere, one that the page has and nobody says any more. With --list all of them are printed.
+Faults caught: a message that the page does not explain, and an explanation of one that no longer exists. With --list all of them are printed.
 """
 import os
 import re
@@ -79,7 +79,7 @@ def messages():
 
 
 def all_literals():
-    """Every text of the sources, to find what the page explains and nobody says."""
+    """Every text of the sources, to find explanations of messages that do not exist."""
     for name in files():
         with open(os.path.join(SOURCE, name), encoding="utf-8") as file:
             for run in re.findall(rf"{LITERAL}(?:\s*{LITERAL})*", file.read()):
@@ -117,7 +117,7 @@ def main():
         print("docs/troubleshooting.md does not explain:\n" + "\n".join(missing))
     gone = sorted(set(invented(page)))
     if gone:
-        print("docs/troubleshooting.md explains what nobody says:\n" + "\n".join(gone))
+        print("docs/troubleshooting.md explains messages that do not exist:\n" + "\n".join(gone))
     print(f"{len(found)} texts of messages, {len(missing)} of them not explained.")
     return 1 if missing or gone or len(found) < 200 else 0
 

@@ -104,7 +104,7 @@ std::string findConflict(const Command& command, bool isFolder)
 
 void addFolderOptions(CLI::App& app, Command& command)
 {
-    app.add_option("--jobs", command.folder.processes, "of a folder: so many models at a time")
+    app.add_option("--jobs", command.folder.processes, "of a folder: the number of models at a time")
         ->check(CLI::Range(1, MOST_PROCESSES))
         ->capture_default_str();
     app.add_option("--shard", command.shard,

@@ -9,7 +9,7 @@ namespace convert
 /// What the command line may choose.
 struct Options
 {
-    double fps = 30.0;       ///< samples per second of animations, at most so many keys; above 0
+    double fps = 30.0;       ///< samples, and at most keys, per second of animations; above 0
     bool sparseKeys = false; ///< keys only where movement bends, for the engine to interpolate between
     double keyError = 0.001; ///< of those: of the model's diagonal, radians, of a scale
     bool animation = true;   ///< false: the model stands as its file places it

@@ -90,7 +90,7 @@ struct FontOutlines::Rasteriser
     stbtt_fontinfo info = {};
 };
 
-/// The rasteriser's own way to open a font reads tables that are not needed here and that nobody has checked.
+/// The rasteriser's own way to open a font reads tables that are not needed here and were not checked.
 FontOutlines::FontOutlines(unsigned char* file, const FontTables& tables)
     : m_rasteriser(new Rasteriser{tables})
 {

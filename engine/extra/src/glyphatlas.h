@@ -50,7 +50,7 @@ public:
         int16_t offsetX = 0, offsetY = 0; ///< as GlyphPicture has them
     };
 
-    /// What a page is drawn with over a frame; a colour and a projection for whoever draws next.
+    /// What a page is drawn with over a frame; the colour and projection of the next draw.
     struct Look
     {
         SharedPtr<Appearance> appearance; ///< empty as long as there is no texture

@@ -28,7 +28,7 @@ public:
 
     unsigned getRoom() const { return m_room; }
 
-    /// Begins anew. @param count  that will be added, up to getRoom().
+    /// Begins again, without glyphs. @param count  that will be added, up to getRoom().
     void start(unsigned page, unsigned count);
     /// @param x,y  of its upper left corner; @param width,height  downwards and to the right of it, or else negative.
     void add(const GlyphAtlas::Entry& entry, float pageSize, float x, float y, float width, float height);

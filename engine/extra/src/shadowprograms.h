@@ -31,7 +31,7 @@ enum class ShadowAnswer
 class ShadowPrograms
 {
 public:
-    /// Registers the assets if nobody has done that.
+    /// Registers the assets unless that was done.
     explicit ShadowPrograms(const SharedPtr<AssetCachePool>& pool);
 
     /// @param program  receives the one to draw the material with instead; of TAKES alone.

@@ -87,7 +87,7 @@ function drawFrame(now) {
         requestFrame();
 }
 
-/// Draws at once: whoever reads the canvas has to do so before the script ends.
+/// Draws at once. Read the canvas before the script ends.
 function drawNow(seconds = 0) {
     const before = performance.now();
     moves = call("orvDraw", seconds) !== 0;

@@ -91,7 +91,7 @@ private:
             m_faces = makeFaces(mode, m_source.accessors.readIndices(*indices, m_primitive), m_vertexCount);
         else
         {
-            // Reading them first tells whether there are so many.
+            // Reading them first tells whether the file has that many.
             m_positions = m_source.accessors.read(m_attributes.size("POSITION", 0), m_attributes, 3);
             std::vector<uint32_t> all(m_vertexCount);
             std::iota(all.begin(), all.end(), 0u);

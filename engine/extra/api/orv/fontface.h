@@ -66,7 +66,7 @@ public:
     /// From the pair adjustments of the font's "kern" feature (table GPOS), or else from its "kern" table.
     int getKerning(unsigned left, unsigned right) const;
 
-    /// The file, for whoever shapes text with it; as long as the face is.
+    /// The file, for libraries that shape text. Valid as long as the face.
     const unsigned char* getData() const { return reinterpret_cast<const unsigned char*>(m_file.getStart()); }
     std::size_t getSizeInBytes() const { return std::size_t(m_file.getEnd() - m_file.getStart()); }
     unsigned getIndex() const { return m_index; }

@@ -115,7 +115,7 @@ public:
     ///
     /// One GL draw for each page of the cache that glyphs are on (and for each MAX_GLYPHS glyphs there). As long as nothing
     /// changes and nothing was forgotten, nothing is made or sent again. What all pages together cannot hold is drawn in
-    /// several goes, with glyphs forgotten in between: everything is seen, but drawn anew in each frame.
+    /// several goes, with glyphs forgotten in between: everything is seen, but the glyphs are drawn again in each frame.
     void draw(RenderContext& context);
 
     /// A copy as things are, to be put into a scene.

@@ -275,7 +275,7 @@ Vector4f* ShaderProgram::getSentVector(const Uniform& uniform, const ShaderUnifo
 
 void ShaderProgram::resolve(const ShaderUniformBase* const* values, detail::UniformSources& sources)
 {
-    // Materials can tell only so many uniforms apart; of more, each is looked at for every material.
+    // There is one bit for each uniform; beyond 64 of them, each is looked at for every material.
     const bool isLarge = m_uniforms.size() > 64;
     std::vector<detail::UniformSources::Value> others;
     sources.values.clear();

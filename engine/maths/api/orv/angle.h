@@ -14,7 +14,7 @@ class ORV_API Angle
 public:
     constexpr Angle() = default;
 
-    /// An angle of so many radians, or degrees.
+    /// An angle from a number of radians, or of degrees.
     static constexpr Angle fromRadians(T radians) { return Angle(radians); }
     static constexpr Angle fromDegrees(T degrees) { return Angle(degrees / DEGREES_PER_RADIAN); }
 

@@ -89,7 +89,7 @@ float AnimationMix::between(float from, float to, float share)
 }
 
 /// The first write of an update goes over what others have there; later ones, of clips that fade, over the earlier ones.
-/// A value that stands as this controller left it was written by nobody else, so that the others' is still the one
+/// A value that stands as this controller left it was not written by others, so that the others' is still the one
 /// remembered: without that, each frame would mix into the last frame's mixture.
 template <class T>
 T AnimationMix::resolveAs(const void* place, const T& current, const T& value) const

@@ -218,7 +218,7 @@ SharedPtr<Solid> Text::makeSolid(const SharedPtr<Appearance>& appearance, float 
         const float corners[] = {left,  upper, u0, v0, left, lower, u0, v1, right, upper, u1, v0,
                                  right, upper, u1, v0, left, lower, u0, v1, right, lower, u1, v1};
         out = std::copy(std::begin(corners), std::end(corners), out);
-        if (ySign < 0.0f) // what draw() draws is culled by nobody
+        if (ySign < 0.0f) // what draw() draws is never culled
             header.boundingRadius =
                 std::max(header.boundingRadius, std::hypot(std::max(std::abs(left), std::abs(right)),
                                                            std::max(std::abs(upper), std::abs(lower))));
