@@ -230,7 +230,9 @@ void drawFace(Session& session, const Bytes& file, std::string& fault)
     }
     const auto context = makeShared<RenderContext>();
     context->setViewport(0, 0, 64, 64);
+    const std::size_t vertices = nulldriver::given().vertices;
     text->draw(*context);
+    nulldriver::given().vertices = vertices; // the text is the program's and not the file's
     if (cache->getPageCount() > 2)
         fault = "more pages than allowed";
 }

@@ -10,8 +10,8 @@ values as an ellipsis: "Cannot open %s" is `Cannot open …`. Single words, whic
 Faults caught: a message that the page does not explain, and an explanation of one that no longer exists. With --list all of them are printed.
 """
 import os
+import pathlib
 import re
-import subprocess
 import sys
 
 SOURCE = os.path.dirname(os.path.dirname(os.path.abspath(__file__)))
@@ -33,8 +33,9 @@ SPEC = re.compile(r"%(?:-?\d*\.?\d*\*?(?:ll|z|l|h)?[a-zA-Z])|%%")
 
 
 def files():
-    names = subprocess.check_output(["git", "-C", SOURCE, "ls-files", "engine", "tools", "platforms"]).decode().split()
-    return [name for name in names if name.endswith((".cpp", ".h")) and "/sanitize/" not in name]
+    paths = [path for room in ("engine", "tools", "platforms") for path in sorted(pathlib.Path(SOURCE, room).rglob("*"))]
+    names = [path.relative_to(SOURCE).as_posix() for path in paths if path.suffix in (".cpp", ".h")]
+    return [name for name in names if "/sanitize/" not in name]
 
 
 def statement(text, begin):

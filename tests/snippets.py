@@ -9,6 +9,7 @@ tests/outside/snippets.h. Whole programs and the snippets of docs/cookbook.md ar
 Fault caught: a snippet of a call that has another name by now, or never was right.
 """
 import os
+import pathlib
 import re
 import subprocess
 import sys
@@ -25,8 +26,9 @@ BLOCKS = {"docs/guide.md": "RenderBlock block(renderer, scene, camera);\n"}
 
 
 def snippets():
-    pages = subprocess.check_output(["git", "-C", SOURCE, "ls-files", "*.md"]).decode().split()
-    for page in pages:
+    root = pathlib.Path(SOURCE)
+    for path in sorted([*root.glob("*.md"), *root.glob("docs/**/*.md")]):
+        page = path.relative_to(root).as_posix()
         if page == "docs/cookbook.md":
             continue
         with open(os.path.join(SOURCE, page), encoding="utf-8") as file:
