@@ -335,7 +335,7 @@ TEST_F(ConvertMaterialTest, occlusionAndSky)
 // should not.
 TEST_F(ConvertMaterialTest, coloursOfVertices)
 {
-    const Rgba GREEN{124, 255, 0}, SEEN_THROUGH{214, 219, 227}, MIXED{169, 237, 114};
+    const Rgba GREEN{124, 255, 0}, BACKGROUND{214, 219, 227}, MIXED{169, 237, 114};
     const struct
     {
         const char* alpha;
@@ -346,7 +346,7 @@ TEST_F(ConvertMaterialTest, coloursOfVertices)
         {R"("alphaMode":"OPAQUE")", "$VCOL$UNLIT$LINEAR", true, GREEN},
         {R"("alphaMode":"BLEND")", "$VCOL$UNLIT$LINEAR", false, MIXED},
         {R"("alphaMode":"MASK","alphaCutoff":0.4)", "$VCOL$CUTOFF$UNLIT$LINEAR", true, GREEN},
-        {R"("alphaMode":"MASK","alphaCutoff":0.6)", "$VCOL$CUTOFF$UNLIT$LINEAR", true, SEEN_THROUGH},
+        {R"("alphaMode":"MASK","alphaCutoff":0.6)", "$VCOL$CUTOFF$UNLIT$LINEAR", true, BACKGROUND},
     };
     std::vector<std::string> materials;
     for (const auto& item : cases)
