@@ -320,6 +320,24 @@ TEST_F(OwnGlTest, framesAreTheSameAfterCallsInAnyOrder)
     }
 }
 
+// Fault caught: a material enabled outside of a block that trusts what it bound the last time.
+TEST_F(OwnGlTest, directEnablesBindWhatTheyNeed)
+{
+    uint64_t textures = 0;
+    for (const SharedPtr<SceneNode>& child : scene->getChildren())
+    {
+        if (child->getNodeType() != Solid::NODE_TYPE)
+            continue;
+        Appearance& appearance = *static_cast<Solid*>(child.get())->getAppearance();
+        appearance.enable(*renderContext);
+        glcalls::resetCounts();
+        appearance.enable(*renderContext);
+        EXPECT_EQ(1u, glcalls::count(glUseProgram)) << child->getName();
+        textures += glcalls::count(glBindTexture);
+    }
+    EXPECT_LT(0u, textures);
+}
+
 // Faults caught: a direct draw that trusts the draw before it; forgetBindings() that forgets too little.
 TEST_F(OwnGlTest, directDrawsBindWhatTheyNeed)
 {

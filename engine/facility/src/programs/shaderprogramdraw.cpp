@@ -88,7 +88,8 @@ inline bool ShaderProgram::isReady(const RenderContext& context, const detail::U
     detail::Bindings& bindings = context.getBindings();
     bindings.useProgram(program);
     bindings.setCurrentProgram(m_handle);
-    bindings.setProgramReady(m_revision);
+    if (bindings.isScopeOpen()) // outside, the application may bind what it likes before the next draw
+        bindings.setProgramReady(m_revision);
     link(context);
     if (sources.revision != m_sourcesRevision)
         resolve(values, sources);
