@@ -12,6 +12,7 @@
 namespace orv
 {
 
+class Appearance;
 class AssetCachePool;
 class Light;
 class PropertyRef;
@@ -124,6 +125,8 @@ private:
     ORV_LOCAL void drawFrame(Camera* camera, SceneNode& scene, const FlagMask& renderFlags,
                              const FlagMask& recursiveFlags);
     ORV_LOCAL void collect(SceneNode& scene, const FlagMask& renderFlags, const FlagMask& recursiveFlags);
+    ORV_LOCAL detail::FrameList<Solid*>* findList(const Appearance* appearance);
+    ORV_LOCAL void addToGroups(Solid* solid);
     ORV_LOCAL void publishLights();
     ORV_LOCAL void publishLight(const Light& light, int index);
     ORV_LOCAL void publishEye(const Matrix4f& world, const Matrix4f& view);

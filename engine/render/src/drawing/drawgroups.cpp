@@ -1,9 +1,6 @@
 #include "drawgroups.h"
 
-#include "orv/appearance.h"
-#include "orv/mesh.h"
 #include "orv/shaderprogram.h"
-#include "orv/solid.h"
 
 #include <algorithm>
 #include <utility>
@@ -50,23 +47,6 @@ void DrawGroups::begin()
 [[gnu::noinline]] void DrawGroups::add(Solid& solid, const Appearance& appearance)
 {
     const DrawMark& material = appearance.getDrawMark();
-    const Mesh* const mesh = solid.getMesh().get();
-    if (material.round != m_round || !mesh || mesh->getDrawMark().round != m_round || !m_entries.hasRoom())
-        [[unlikely]]
-        return addNew(solid, appearance);
-    addNumbered(solid, material, mesh->getDrawMark());
-}
-
-inline void DrawGroups::addNumbered(Solid& solid, const DrawMark& material, const DrawMark& mesh)
-{
-    ++m_materialCounts.data()[material.number];
-    m_entries.add({&solid, material.number, mesh.number});
-}
-
-/// What is rare is in a function of its own, so that adding needs few registers.
-[[gnu::noinline]] void DrawGroups::addNew(Solid& solid, const Appearance& appearance)
-{
-    const DrawMark& material = appearance.getDrawMark();
     if (material.round == m_round || numberMaterial(appearance))
         return addNumbered(solid, material, numberMesh(solid.getMesh().get()));
     finish();
@@ -105,8 +85,9 @@ DrawMark DrawGroups::numberMesh(const Mesh* mesh)
         sortByMesh();
     rankMaterials();
     Solid** const solids = m_solids.extend(m_entries.size());
+    uint32_t* const places = m_materialCounts.data();
     for (const Entry& entry : m_entries)
-        solids[m_materialCounts[entry.material]++] = entry.solid;
+        solids[places[entry.material]++] = entry.solid;
 }
 
 void DrawGroups::sortByMesh()

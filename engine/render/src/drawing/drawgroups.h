@@ -1,7 +1,10 @@
 #pragma once
 
+#include "orv/appearance.h"
 #include "orv/detail/drawmark.h"
 #include "orv/detail/framelist.h"
+#include "orv/mesh.h"
+#include "orv/solid.h"
 
 #include <cstddef>
 #include <cstdint>
@@ -9,10 +12,6 @@
 
 namespace orv
 {
-
-class Appearance;
-class Mesh;
-class Solid;
 
 namespace detail
 {
@@ -28,6 +27,11 @@ public:
     explicit DrawGroups(FrameList<Solid*>& solids) : m_solids(solids) {}
 
     void begin();
+    /// Adds a solid whose material and mesh another had since begin().
+    /// @param appearance  the solid's, or null.
+    /// @return false for any other solid.
+    bool addKnown(Solid& solid, const Appearance* appearance);
+    /// Adds a solid that addKnown() has not taken.
     /// @param appearance  the solid's; it has a program.
     void add(Solid& solid, const Appearance& appearance);
     void finish();
@@ -41,7 +45,6 @@ private:
     };
 
     void addNumbered(Solid& solid, const DrawMark& material, const DrawMark& mesh);
-    void addNew(Solid& solid, const Appearance& appearance);
     bool numberMaterial(const Appearance& appearance);
     DrawMark numberMesh(const Mesh* mesh);
     void sortByMesh();
@@ -57,6 +60,24 @@ private:
     std::vector<uint32_t> m_materialCounts; ///< solids of each material; then where the next one of them goes
     std::vector<uint32_t> m_counts;         ///< the same of meshes, and of programs
 };
+
+[[gnu::always_inline]] inline void DrawGroups::addNumbered(Solid& solid, const DrawMark& material,
+                                                           const DrawMark& mesh)
+{
+    const Entry entry{&solid, material.number, mesh.number};
+    ++m_materialCounts.data()[entry.material];
+    m_entries.add(entry);
+}
+
+[[gnu::always_inline]] inline bool DrawGroups::addKnown(Solid& solid, const Appearance* appearance)
+{
+    const Mesh* const mesh = solid.getMesh().get();
+    if (!appearance || appearance->getDrawMark().round != m_round || !mesh ||
+        mesh->getDrawMark().round != m_round || !m_entries.hasRoom()) [[unlikely]]
+        return false;
+    addNumbered(solid, appearance->getDrawMark(), mesh->getDrawMark());
+    return true;
+}
 
 } // namespace detail
 } // namespace orv

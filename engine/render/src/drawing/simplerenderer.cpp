@@ -83,18 +83,39 @@ void SimpleRenderer::setCounted(bool counted)
 
 void SimpleRenderer::visit(Solid* solid)
 {
-    const Appearance* appearance = solid->getAppearance().get();
-    const ShaderProgram* program = appearance ? appearance->getShaderProgram().get() : nullptr;
-    if (!program) [[unlikely]]
-        assertDrawable(appearance, program);
-    else if (program->usesMirrorTexture())
-        m_mirrors.add(solid);
-    else if (!appearance->isOpaque())
-        m_transparent.add(solid);
-    else if (m_groups)
+    const Appearance* const appearance = solid->getAppearance().get();
+    if (m_groups)
+    {
+        if (!m_groups->addKnown(*solid, appearance))
+            addToGroups(solid);
+    }
+    else if (detail::FrameList<Solid*>* const list = findList(appearance))
+        list->add(solid);
+}
+
+[[gnu::noinline]] void SimpleRenderer::addToGroups(Solid* solid)
+{
+    const Appearance* const appearance = solid->getAppearance().get();
+    detail::FrameList<Solid*>* const list = findList(appearance);
+    if (list == &m_opaque)
         m_groups->add(*solid, *appearance);
-    else
-        m_opaque.add(solid);
+    else if (list)
+        list->add(solid);
+}
+
+/// @return where the solids of a material go; null, after logging an assertion, if they cannot be drawn.
+[[gnu::always_inline]] inline detail::FrameList<Solid*>*
+SimpleRenderer::findList(const Appearance* appearance)
+{
+    const ShaderProgram* const program = appearance ? appearance->getShaderProgram().get() : nullptr;
+    if (!program) [[unlikely]]
+    {
+        assertDrawable(appearance, program);
+        return nullptr;
+    }
+    if (program->usesMirrorTexture())
+        return &m_mirrors;
+    return appearance->isOpaque() ? &m_opaque : &m_transparent;
 }
 
 void SimpleRenderer::visit(Light* light)
