@@ -19,9 +19,11 @@ foreach(room common maths pss facility render extra)
         PATTERN "detail/eyes.h" EXCLUDE
         PATTERN "detail/fonttables.h" EXCLUDE
         PATTERN "detail/formattedtext.h" EXCLUDE
+        PATTERN "detail/lanes.h" EXCLUDE
         PATTERN "detail/littleendian.h" EXCLUDE
         PATTERN "detail/loadscope.h" EXCLUDE
         PATTERN "detail/logbudget.h" EXCLUDE
+        PATTERN "detail/modelprojection.h" EXCLUDE
         PATTERN "detail/textstatement.h" EXCLUDE
         PATTERN "detail/utf8.h" EXCLUDE)
 endforeach()

@@ -1,5 +1,7 @@
 #include "orv/matrix.h"
 
+#include "orv/detail/lanes.h"
+
 #include <algorithm>
 #include <cmath>
 #include <initializer_list>
@@ -82,41 +84,6 @@ Matrix4f detail::multiply(const Matrix4f& m, const Matrix4f& n)
         return left.columns[0] * v.x + left.columns[1] * v.y + left.columns[2] * v.z + left.columns[3] * v.w;
     };
     return Matrix4f(weigh(n.columns[0]), weigh(n.columns[1]), weigh(n.columns[2]), weigh(n.columns[3]));
-}
-
-void detail::multiplyAffine(Matrix4f& result, const Matrix4f& m, const Matrix4f& n)
-{
-    const Matrix4f left = m; // as above
-    const auto weigh = [&left](const Vector4f& v) __attribute__((always_inline))
-    {
-        return left.columns[0] * v.x + left.columns[1] * v.y + left.columns[2] * v.z;
-    };
-    result = Matrix4f(weigh(n.columns[0]), weigh(n.columns[1]), weigh(n.columns[2]),
-                      weigh(n.columns[3]) + left.columns[3]);
-}
-
-detail::ModelProjection::ModelProjection(const Matrix4f& viewMatrix, const Matrix4f& projection)
-    : view(viewMatrix)
-{
-    const float* p = projection.data();
-    isUsable = isAffine(view) && p[1] == 0.0f && p[2] == 0.0f && p[3] == 0.0f && p[4] == 0.0f &&
-               p[6] == 0.0f && p[7] == 0.0f;
-    for (Vector4f& column : view.columns)
-        column.w = column.z;
-    scale = Vector4f(p[0], p[5], p[10], p[11]);
-    skew = Vector4f(p[8], p[9], 0.0f, 0.0f);
-    last = projection.columns[3];
-    isSkewed = p[8] != 0.0f || p[9] != 0.0f;
-}
-
-Matrix4f detail::multiplySkewed(const ModelProjection& projection, const Matrix4f& world)
-{
-    Matrix4f result;
-    multiplyAffine(result, projection.view, world);
-    for (Vector4f& column : result.columns)
-        column = column * projection.scale + projection.skew * column.z;
-    result.columns[3] = result.columns[3] + projection.last;
-    return result;
 }
 
 Matrix2f transpose(const Matrix2f& m)
@@ -218,11 +185,16 @@ Matrix4f scaleMatrix(const Vector3f& factors)
     return m;
 }
 
+Matrix3f toMatrix3(const Quaternionf& q)
+{
+    return upper3x3(toMatrix4(q));
+}
+
 Matrix4f toMatrix4(const Quaternionf& q)
 {
-    const Matrix3f m = toMatrix3(q);
-    return Matrix4f(Vector4f(m.columns[0], 0.0f), Vector4f(m.columns[1], 0.0f), Vector4f(m.columns[2], 0.0f),
-                    Vector4f(0.0f, 0.0f, 0.0f, 1.0f));
+    Matrix4f result;
+    detail::store(result, detail::makeRigid(q, Vector3f()));
+    return result;
 }
 
 Matrix4f lookAt(const Vector3f& eye, const Vector3f& target, const Vector3f& up)

@@ -67,7 +67,10 @@ public:
     /// Draw path: the centre of a sphere around the mesh and, in w, its radius below 0: minus infinity where the bounds
     /// are unknown.
     const Vector4f& getSphere() const { return m_sphere; }
-    bool isCentred() const { return m_isCentred; } ///< that sphere's centre is the origin
+    /// Draw path: whether the origin is inside of that sphere.
+    bool isAroundOrigin() const { return m_isAroundOrigin; }
+    /// Draw path: a mesh whose origin is at least so far inside of a plane is not outside of it.
+    float getSafeDistance() const { return m_safeDistance; }
     ORV_LOCAL static Vector4f makeSphere(const Bounds& bounds);
 
 private:
@@ -78,7 +81,8 @@ private:
     VertexBuffer::Ptr m_vertexBuffer;
     mutable detail::DrawMark m_drawMark;
     Vector4f m_sphere;
-    bool m_isCentred = true;
+    bool m_isAroundOrigin = true;
+    float m_safeDistance = 0.0f;
     Bounds m_bounds;
     std::vector<Bounds> m_jointBounds;
     SharedPtr<MeshGeometry> m_geometry;

@@ -47,7 +47,10 @@ void Mesh::takeBounds(const Bounds& bounds)
 {
     m_bounds = bounds;
     m_sphere = makeSphere(bounds);
-    m_isCentred = m_sphere.xyz() == Vector3f();
+    const float offset = length(m_sphere.xyz());
+    m_isAroundOrigin = offset <= -m_sphere.w;
+    m_safeDistance =
+        offset > 0.0f ? offset - m_sphere.w : m_sphere.w; // no sphere is outside whose centre is inside
 }
 
 void Mesh::setBounds(const Bounds& bounds)

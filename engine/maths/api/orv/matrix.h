@@ -95,8 +95,6 @@ constexpr Matrix4<T> multiply(const Matrix4<T>& m, const Matrix4<T>& n)
 
 /// The same in the fewest steps: frames are full of it.
 ORV_API Matrix4<float> multiply(const Matrix4<float>& m, const Matrix4<float>& n);
-/// Likewise, where the last row of n is 0 0 0 1. The result may be m or n.
-ORV_API void multiplyAffine(Matrix4<float>& result, const Matrix4<float>& m, const Matrix4<float>& n);
 
 } // namespace detail
 
@@ -141,40 +139,6 @@ constexpr Matrix4<T>
 namespace detail
 {
 
-/// A camera's view and projection, ready for many products projection * (view * world). A projection is mostly zeros:
-/// what it does to v is (v.x, v.y, v.z, v.z) * scale + v.z * skew + v.w * last.
-struct ORV_API ModelProjection
-{
-    Matrix4<float> view; ///< its last row is a second third one
-    Vector4<float> scale;
-    Vector4<float> skew; ///< not 0 for an eye of two
-    Vector4<float> last;
-    bool isSkewed;
-    bool isUsable; ///< both are of that kind
-
-    ModelProjection(const Matrix4<float>& viewMatrix, const Matrix4<float>& projection);
-};
-
-ORV_API Matrix4<float> multiplySkewed(const ModelProjection& projection, const Matrix4<float>& world);
-
-/// Each product rounded as operator* rounds it.
-/// @param projection  usable; world must be affine.
-[[gnu::always_inline]] inline Matrix4<float> multiply(const ModelProjection& projection,
-                                                      const Matrix4<float>& world)
-{
-    if (projection.isSkewed)
-        return multiplySkewed(projection, world);
-    const Matrix4<float>& view = projection.view;
-    const auto place = [&view](const Vector4<float>& v) __attribute__((always_inline))
-    {
-        return view.columns[0] * v.x + view.columns[1] * v.y + view.columns[2] * v.z;
-    };
-    return Matrix4<float>(place(world.columns[0]) * projection.scale,
-                          place(world.columns[1]) * projection.scale,
-                          place(world.columns[2]) * projection.scale,
-                          (place(world.columns[3]) + view.columns[3]) * projection.scale + projection.last);
-}
-
 /// Whether the last row is 0 0 0 1.
 inline bool isAffine(const Matrix4<float>& m)
 {
@@ -215,26 +179,8 @@ ORV_API Matrix4f scaleMatrix(const Vector3f& factors);
 
 /// The rotation alone: a quaternion that is not of unit length turns as its normalised form would; one whose
 /// squared length is zero or beyond floats does not turn.
-[[gnu::always_inline]] inline Matrix3f toMatrix3(const Quaternionf& q)
-{
-    const float squaredLength = q.a * q.a + q.x * q.x + q.y * q.y + q.z * q.z;
-    if (!(squaredLength >= std::numeric_limits<float>::min() &&
-          squaredLength <= std::numeric_limits<float>::max()))
-        return Matrix3f::IDENTITY;
-    const float twice = 2.0f / squaredLength;
-    const float xx = twice * q.x * q.x;
-    const float yy = twice * q.y * q.y;
-    const float zz = twice * q.z * q.z;
-    const float xy = twice * q.x * q.y;
-    const float xz = twice * q.x * q.z;
-    const float yz = twice * q.y * q.z;
-    const float ax = twice * q.a * q.x;
-    const float ay = twice * q.a * q.y;
-    const float az = twice * q.a * q.z;
-    return Matrix3f(Vector3f(1.0f - yy - zz, xy + az, xz - ay), Vector3f(xy - az, 1.0f - xx - zz, yz + ax),
-                    Vector3f(xz + ay, yz - ax, 1.0f - xx - yy));
-}
-ORV_API Matrix4f toMatrix4(const Quaternionf& q); ///< The matrix that turns as the quaternion does.
+ORV_API Matrix3f toMatrix3(const Quaternionf& q);
+ORV_API Matrix4f toMatrix4(const Quaternionf& q); ///< The same.
 
 /// The world transform of something at eye that looks along its -z at target (a camera, a light).
 /// @param up  becomes the +y side as far as possible; if it lies along the line of sight, another axis serves.

@@ -145,7 +145,7 @@ public:
     uint32_t countReach() const { return m_extras ? m_extras->reachSolids : 0; }
     /// Draw path: an upper limit of what the world transform does to lengths; infinite if it is not affine.
     float getWorldStretch() const { return isWorldRigid() ? 1.0f : findStretch(); }
-    /// The same where it is known already, and the world transform too; else minus infinity.
+    /// The same where it is known already, and the world transform too; else NaN.
     float getKnownStretch() const;
     const Matrix4f& peekWorldTransform() const { return m_worldTransform; } ///< perhaps of an earlier place
 
@@ -171,6 +171,14 @@ private:
         Vector4f reach; ///< while m_reachState says so
     };
 
+    /// Of the world transform.
+    enum class WorldState : uint8_t
+    {
+        STALE, ///< to be worked out
+        PLACED,
+        RIGID ///< placed, and known to be made of rotations and translations alone
+    };
+
     static constexpr uint32_t NORMAL = 1;
     static constexpr uint32_t STRETCH = 2;
 
@@ -189,7 +197,9 @@ private:
     ORV_LOCAL void endChildren();
     ORV_LOCAL void buildLocal() const;
     ORV_LOCAL void updateRoot() const;
-    ORV_LOCAL void placeBelow(const Matrix4f& parentWorld, bool parentMirrored, bool parentRigid) const;
+    ORV_LOCAL void placeRigidly(const Matrix4f& parentWorld) const;
+    ORV_LOCAL void placeLocal(const Matrix4f& parentWorld) const;
+    ORV_LOCAL void noteParent(bool parentMirrored, bool parentRigid) const;
     ORV_LOCAL Extras* makeExtras() const;
     Matrix3f findNormal() const;
     ORV_LOCAL float findStretch() const;
@@ -207,10 +217,9 @@ private:
     mutable bool m_localMirrored = false;
     mutable bool m_worldMirrored = false;
     mutable bool m_localTransformChanged = false;
-    mutable bool m_worldTransformChanged = false;
+    mutable WorldState m_worldState = WorldState::RIGID;
     mutable bool m_localRigid = true; ///< known to be rotation and translation alone
-    mutable bool m_worldRigid = true;
-    bool m_scaled = false; ///< m_scale is not all 1
+    bool m_scaled = false;            ///< m_scale is not all 1
     mutable ReachState m_reachState = ReachState::UNKNOWN;
     uint32_t m_flags = 0;
     uint32_t m_skinnedCount = 0; ///< solids with joints in this subtree, itself included
@@ -228,30 +237,30 @@ private:
 
 [[gnu::always_inline]] inline const Matrix4f& SceneNode::getWorldTransform() const
 {
-    if (m_worldTransformChanged) [[unlikely]]
+    if (m_worldState == WorldState::STALE) [[unlikely]]
         update();
     return m_worldTransform;
 }
 
 inline bool SceneNode::isWorldRigid() const
 {
-    if (m_worldTransformChanged)
+    if (m_worldState == WorldState::STALE)
         update();
-    return m_worldRigid;
+    return m_worldState == WorldState::RIGID;
 }
 
 inline float SceneNode::getKnownStretch() const
 {
-    if (m_worldRigid && !m_worldTransformChanged)
+    if (m_worldState == WorldState::RIGID) [[likely]]
         return 1.0f;
-    const bool isKnown = m_extras && !m_worldTransformChanged && (m_extras->known & STRETCH);
-    return isKnown ? m_extras->stretch : -std::numeric_limits<float>::infinity();
+    const bool isKnown = m_extras && m_worldState == WorldState::PLACED && (m_extras->known & STRETCH);
+    return isKnown ? m_extras->stretch : std::numeric_limits<float>::quiet_NaN();
 }
 
 inline Matrix3f SceneNode::getNormalTransform() const
 {
     const Matrix4f& world = getWorldTransform();
-    if (m_worldRigid)
+    if (m_worldState == WorldState::RIGID)
         return upper3x3(world);
     return findNormal();
 }
@@ -263,7 +272,7 @@ inline const Matrix4f& SceneNode::getLastWorldTransform() const
 
 inline bool SceneNode::getWorldMirrored() const
 {
-    if (m_worldTransformChanged)
+    if (m_worldState == WorldState::STALE)
         update();
     return m_worldMirrored;
 }

@@ -44,7 +44,9 @@ const ShaderProgram* getProgram(const Solid& solid)
     return !bounds.empty() && sight.isHidden();
 }
 
-[[gnu::noinline]] bool hides(const Frustum& frustum, const Solid& solid)
+} // namespace
+
+bool hides(const Frustum& frustum, const Solid& solid)
 {
     const Mesh* const mesh = solid.getMesh().get();
     const ShaderProgram* const program = getProgram(solid);
@@ -56,21 +58,6 @@ const ShaderProgram* getProgram(const Solid& solid)
     const Vector3f centre = place(solid.getWorldTransform(), sphere);
     return program->usesModelTransform() && frustum.hides(centre, sphere.w * solid.getWorldStretch());
 }
-
-/// Whether it is plain that a solid is not hidden, as it is of most that are not.
-[[gnu::always_inline]] inline bool isSeen(const Frustum& frustum, const Solid& solid)
-{
-    const Mesh* const mesh = solid.getMesh().get();
-    if (!mesh || solid.hasSkin()) [[unlikely]]
-        return false;
-    const Vector4f& sphere = mesh->getSphere();
-    const float negativeRadius = sphere.w * solid.getKnownStretch(); // infinite if that is not known
-    const Matrix4f& world = solid.peekWorldTransform();
-    return !(mesh->isCentred() ? frustum.hides(world.columns[3].xyz(), negativeRadius)
-                               : frustum.hides(world, sphere.xyz(), negativeRadius));
-}
-
-} // namespace
 
 Culling::Culling(SceneNodeVisitor& renderer)
     : WalkGuide(static_cast<SceneNodeVisitor&>(*this))
@@ -103,48 +90,11 @@ bool Culling::finish(bool hasMirrors)
     return isWhole;
 }
 
-Solid* const* Culling::select(Solid* const* solids, size_t& count, const Matrix4f& view,
-                              const Matrix4f& projection)
-{
-    if (m_eyeCount == 1 && !m_hasMirrors)
-        return solids; // the walk has seen to it
-    const Frustum frustum(view, projection);
-    m_selected.clear();
-    for (Solid* const* next = solids; next != solids + count; ++next)
-    {
-        if (isSeen(frustum, **next) || !detail::hides(frustum, **next))
-            m_selected.add(*next);
-    }
-    m_count += uint32_t(count - m_selected.size());
-    count = m_selected.size();
-    return m_selected.begin();
-}
-
 bool Culling::hides(const Solid& solid, const Matrix4f& view, const Matrix4f& projection)
 {
     const bool isOut = detail::hides(Frustum(view, projection), solid);
     m_count += isOut ? 1 : 0;
     return isOut;
-}
-
-bool Culling::isHidden(const Solid& solid) const
-{
-    return detail::hides(m_frustums[0], solid) && (m_eyeCount == 1 || detail::hides(m_frustums[1], solid));
-}
-
-void Culling::visit(Solid* solid)
-{
-    if (isSeen(m_frustums[0], *solid)) [[likely]]
-        return m_renderer.visit(solid);
-    visitDoubtful(solid);
-}
-
-[[gnu::noinline]] void Culling::visitDoubtful(Solid* solid)
-{
-    if (isHidden(*solid))
-        m_count += uint32_t(m_eyeCount);
-    else
-        m_renderer.visit(solid);
 }
 
 void Culling::visit(SceneNode* node)

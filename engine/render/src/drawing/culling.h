@@ -22,6 +22,9 @@ namespace detail
 
 struct Eye;
 
+/// Whether an eye cannot see a solid, as far as its bounds tell.
+bool hides(const Frustum& frustum, const Solid& solid);
+
 /// Keeps from a renderer what it cannot see: in the walk where there is one eye, or two which both do not see it, and in
 /// the list that is about to be drawn where it is drawn for several.
 ///
@@ -59,7 +62,6 @@ private:
     SceneNodeVisitor* choose(const SceneNode& node) override;
 
     void visitDoubtful(Solid* solid);
-    bool isHidden(const Solid& solid) const;
 
     SceneNodeVisitor& m_renderer;
     Frustum m_frustums[2];

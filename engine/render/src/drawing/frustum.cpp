@@ -62,15 +62,14 @@ Frustum::Sight Frustum::look(const Vector3f& centre, float negativeRadius) const
 {
     if (hides(centre, negativeRadius))
         return Sight::OUTSIDE;
-    const Lanes distances = getLeastDistances(centre.x, centre.y, centre.z);
-    return isAny(~(distances >= fill(-negativeRadius))) ? Sight::CROSSING : Sight::INSIDE;
+    const Lanes distances = getLeastDistances(widen(centre));
+    return areAll(distances >= fill(-negativeRadius)) ? Sight::INSIDE : Sight::CROSSING;
 }
 
 void HullSight::add(const Vector3f& centre, float negativeRadius)
 {
     for (int half = 0; half < 2; ++half)
-        m_outside[half] &=
-            m_frustum.getDistances(half, centre.x, centre.y, centre.z) < Frustum::fill(negativeRadius);
+        m_outside[half] &= m_frustum.getDistances(half, Frustum::widen(centre)) < fill(negativeRadius);
 }
 
 } // namespace orv::detail

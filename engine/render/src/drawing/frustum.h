@@ -1,8 +1,7 @@
 #pragma once
 
+#include "orv/detail/lanes.h"
 #include "orv/matrix.h"
-
-#include <cstring>
 
 namespace orv::detail
 {
@@ -26,15 +25,24 @@ public:
     /// @param negativeRadius  minus infinity is never outside.
     bool hides(const Vector3f& centre, float negativeRadius) const
     {
-        return isAny(getLeastDistances(centre.x, centre.y, centre.z) < fill(negativeRadius));
+        return isAny(getLeastDistances(widen(centre)) < fill(negativeRadius));
     }
 
-    /// The same of a centre that has to be transformed first.
-    bool hides(const Matrix4f& transform, const Vector3f& centre, float negativeRadius) const
+    /// Whether a point is inside of all planes by a distance at least. Never for NaN.
+    /// @param point  its w does not count.
+    /// @param distance  below 0 for a point that may be outside by as much.
+    [[gnu::always_inline]] bool contains(const Vector4f& point, float distance) const
     {
-        const Lanes place = load(transform.columns[0]) * centre.x + load(transform.columns[1]) * centre.y +
-                            load(transform.columns[2]) * centre.z + load(transform.columns[3]);
-        return isAny(getLeastDistances(place[0], place[1], place[2]) < fill(negativeRadius));
+        return areAll(getLeastDistances(load(point.data())) >= fill(distance));
+    }
+
+    /// The same of a point that has to be transformed first.
+    [[gnu::always_inline]] bool contains(const Matrix4f& transform, const Vector3f& point,
+                                         float distance) const
+    {
+        const LaneMatrix m = load(transform);
+        const Lanes place = m.x * fill(point.x) + m.y * fill(point.y) + m.z * fill(point.z) + m.w;
+        return areAll(getLeastDistances(place) >= fill(distance));
     }
 
     Sight look(const Vector3f& centre, float negativeRadius) const;
@@ -42,34 +50,20 @@ public:
 private:
     friend class HullSight;
 
-    typedef float Lanes __attribute__((vector_size(16)));
-    typedef int Answers __attribute__((vector_size(16)));
-    typedef long long Halves __attribute__((vector_size(16)));
+    static Lanes widen(const Vector3f& v) { return Lanes{v.x, v.y, v.z, 1.0f}; }
 
-    static Lanes fill(float value) { return Lanes{value, value, value, value}; }
-    static Lanes load(const Vector4f& v)
+    /// @param point  whose last lane does not count.
+    [[gnu::always_inline]] Lanes getDistances(int half, Lanes point) const
     {
-        Lanes lanes;
-        std::memcpy(&lanes, v.data(), sizeof lanes);
-        return lanes;
-    }
-
-    Lanes getDistances(int half, float x, float y, float z) const
-    {
-        return m_x[half] * x + m_y[half] * y + m_z[half] * z + m_offset[half];
-    }
-
-    static bool isAny(Answers answers)
-    {
-        const Halves halves = Halves(answers);
-        return (halves[0] | halves[1]) != 0;
+        return m_x[half] * spread<0>(point) + m_y[half] * spread<1>(point) + m_z[half] * spread<2>(point) +
+               m_offset[half];
     }
 
     /// Of two planes each.
-    Lanes getLeastDistances(float x, float y, float z) const
+    [[gnu::always_inline]] Lanes getLeastDistances(Lanes point) const
     {
-        const Lanes first = getDistances(0, x, y, z);
-        const Lanes second = getDistances(1, x, y, z);
+        const Lanes first = getDistances(0, point);
+        const Lanes second = getDistances(1, point);
         return first < second ? first : second;
     }
 
@@ -87,11 +81,11 @@ public:
     explicit HullSight(const Frustum& frustum) : m_frustum(frustum) {}
 
     void add(const Vector3f& centre, float negativeRadius);
-    bool isHidden() const { return Frustum::isAny(m_outside[0] | m_outside[1]); }
+    bool isHidden() const { return isAny(m_outside[0] | m_outside[1]); }
 
 private:
     const Frustum& m_frustum;
-    Frustum::Answers m_outside[2] = {{-1, -1, -1, -1}, {-1, -1, -1, -1}};
+    LaneAnswers m_outside[2] = {{-1, -1, -1, -1}, {-1, -1, -1, -1}};
 };
 
 } // namespace orv::detail

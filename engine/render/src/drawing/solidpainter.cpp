@@ -112,8 +112,8 @@ Matrix4f SolidPainter::place(const Solid& solid) const
 [[gnu::always_inline]] inline Matrix4f SolidPainter::project(const Solid& solid) const
 {
     const Matrix4f& world = solid.getWorldTransform();
-    if (m_modelProjection.isUsable && (solid.isWorldRigid() || isAffine(world))) [[likely]]
-        return multiply(m_modelProjection, world);
+    if (m_modelProjection.isUsable() && (solid.isWorldRigid() || isAffine(world))) [[likely]]
+        return m_modelProjection.multiply(world);
     return m_projection * (m_view * world);
 }
 

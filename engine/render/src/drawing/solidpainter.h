@@ -1,6 +1,7 @@
 #pragma once
 
 #include "orv/detail/drawcall.h"
+#include "orv/detail/modelprojection.h"
 #include "orv/matrix.h"
 
 #include <cstddef>

@@ -2,6 +2,8 @@
 
 #include "orv/scenenode.h"
 
+#include "orv/detail/lanes.h"
+
 #include <cmath>
 
 namespace orv
@@ -48,9 +50,9 @@ void SceneNode::setTransformChanged()
 
 void SceneNode::setWorldTransformChanged()
 {
-    if (m_worldTransformChanged)
+    if (m_worldState == WorldState::STALE)
         return;
-    m_worldTransformChanged = true;
+    m_worldState = WorldState::STALE;
     if (m_children)
         markChildren();
 }
@@ -70,9 +72,7 @@ void SceneNode::updateLocal() const
 
 void SceneNode::buildLocal() const
 {
-    const Matrix3f rotation = toMatrix3(m_rotation);
-    m_localTransform = Matrix4f(Vector4f(rotation.columns[0], 0.0f), Vector4f(rotation.columns[1], 0.0f),
-                                Vector4f(rotation.columns[2], 0.0f), Vector4f(m_position, 1.0f));
+    detail::store(m_localTransform, detail::makeRigid(m_rotation, m_position));
     m_localMirrored = false;
     m_localRigid = !m_scaled;
     m_localTransformChanged = false;
@@ -84,43 +84,61 @@ void SceneNode::buildLocal() const
     m_localMirrored = (m_scale.x < 0.0f) != ((m_scale.y < 0.0f) != (m_scale.z < 0.0f));
 }
 
-[[gnu::always_inline]] inline void SceneNode::placeBelow(const Matrix4f& parentWorld, bool parentMirrored,
-                                                         bool parentRigid) const
+/// Of a node that has moved: its local transform goes from registers to the product.
+[[gnu::always_inline]] inline void SceneNode::placeRigidly(const Matrix4f& parentWorld) const
 {
-    if (m_localTransformChanged)
-        buildLocal();
+    const detail::LaneMatrix local = detail::makeRigid(m_rotation, m_position);
+    detail::store(m_localTransform, local);
+    detail::store(m_worldTransform, detail::multiplyAffine(detail::load(parentWorld), local));
+    m_localMirrored = false;
+    m_localRigid = true;
+    m_localTransformChanged = false;
+}
+
+[[gnu::noinline]] void SceneNode::placeLocal(const Matrix4f& parentWorld) const
+{
+    updateLocal();
     if (m_localRigid)
-        detail::multiplyAffine(m_worldTransform, parentWorld, m_localTransform);
+        detail::store(m_worldTransform,
+                      detail::multiplyAffine(detail::load(parentWorld), detail::load(m_localTransform)));
     else
         m_worldTransform = parentWorld * m_localTransform;
+}
+
+inline void SceneNode::noteParent(bool parentMirrored, bool parentRigid) const
+{
     m_worldMirrored = parentMirrored != m_localMirrored;
-    m_worldRigid = parentRigid && m_localRigid;
-    m_worldTransformChanged = false;
+    m_worldState = parentRigid && m_localRigid ? WorldState::RIGID : WorldState::PLACED;
     if (m_extras)
         m_extras->known = 0;
 }
 
 void SceneNode::updateAll(const Matrix4f& parentWorld, bool parentMirrored) const
 {
-    placeBelow(parentWorld, parentMirrored, false);
+    placeLocal(parentWorld);
+    noteParent(parentMirrored, false);
 }
 
 void SceneNode::update() const
 {
-    if (!m_worldTransformChanged)
+    if (m_worldState != WorldState::STALE)
         return;
     const SceneNode* parent = m_parent;
-    if (parent && parent->m_worldTransformChanged)
+    if (!parent)
+        return updateRoot();
+    if (parent->m_worldState == WorldState::STALE)
         parent->update();
-    if (parent)
-        placeBelow(parent->m_worldTransform, parent->m_worldMirrored, parent->m_worldRigid);
+    if (m_localTransformChanged && !m_scaled)
+        placeRigidly(parent->m_worldTransform);
     else
-        updateRoot();
+        placeLocal(parent->m_worldTransform);
+    noteParent(parent->m_worldMirrored, parent->m_worldState == WorldState::RIGID);
 }
 
 void SceneNode::updateRoot() const
 {
-    placeBelow(Matrix4f::IDENTITY, false, true);
+    placeLocal(Matrix4f::IDENTITY);
+    noteParent(false, true);
 }
 
 /// For a world transform that is not rigid; the update is done.
