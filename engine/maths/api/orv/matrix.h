@@ -4,7 +4,6 @@
 #include "orv/quaternion.h"
 #include "orv/vector.h"
 
-#include <limits>
 #include <string>
 
 namespace orv

@@ -21,7 +21,8 @@ class SceneNodeVisitor;
 namespace detail
 {
 class JointTie;
-}
+struct SolidSkin;
+} // namespace detail
 
 /// A place in the scene tree: a local transform, a lazily kept world transform, flags, a name and children.
 ///
@@ -161,7 +162,8 @@ private:
     /// What few nodes have.
     struct Extras
     {
-        SharedPtr<detail::JointTie> tie; ///< of a joint of solids
+        SharedPtr<detail::JointTie> tie;         ///< of a joint of solids
+        std::unique_ptr<detail::SolidSkin> skin; ///< of a solid with joints
         std::unique_ptr<Matrix4f> lastWorldTransform;
         Matrix3f normalTransform; ///< unless the world transform is rigid
         float stretch = 0.0f;     ///< likewise
@@ -220,6 +222,7 @@ private:
     mutable WorldState m_worldState = WorldState::RIGID;
     mutable bool m_localRigid = true; ///< known to be rotation and translation alone
     bool m_scaled = false;            ///< m_scale is not all 1
+    bool m_hasSkin = false;           ///< among the extras
     mutable ReachState m_reachState = ReachState::UNKNOWN;
     uint32_t m_flags = 0;
     uint32_t m_skinnedCount = 0; ///< solids with joints in this subtree, itself included

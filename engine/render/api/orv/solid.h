@@ -5,9 +5,6 @@
 #include "orv/scenenode.h"
 #include "orv/sharedptr.h"
 
-#include <memory>
-#include <vector>
-
 namespace orv
 {
 
@@ -15,11 +12,6 @@ class Appearance;
 class Mesh;
 class RenderContext;
 class ShaderProgram;
-
-namespace detail
-{
-class JointTie;
-}
 
 /// A mesh in the scene, drawn with an appearance, perhaps skinned by joints.
 class ORV_API Solid : public SceneNode
@@ -54,13 +46,13 @@ public:
     void setAppearance(const SharedPtr<Appearance>& appearance);
 
     /// Whether anything about joints was ever set.
-    bool hasSkin() const { return m_skin != nullptr; }
-    int getJointsPerVertex() const { return m_skin ? m_skin->jointsPerVertex : 0; }
+    bool hasSkin() const { return m_hasSkin; }
+    int getJointsPerVertex() const;
     /// @param count  0 to 4; larger is clamped with a warning, negative counts as 0.
     void setJointsPerVertex(int count);
 
     /// The transform of the mesh into the space in which the joints were bound; identity at first.
-    const Matrix4f& getBindShapeTransform() const { return m_skin ? m_skin->bindShape : Matrix4f::IDENTITY; }
+    const Matrix4f& getBindShapeTransform() const;
     void setBindShapeTransform(const Matrix4f& transform);
 
     /// Adds the next joint (index 0 first, as the vertices' joint numbers count).
@@ -72,7 +64,7 @@ public:
     /// @param inverseBind  inverse of the joint's world transform in the pose of binding.
     /// One error is logged when the count first exceeds MAX_JOINTS.
     void attachJoint(const SharedPtr<SceneNode>& joint, const Matrix4f& inverseBind);
-    int getJointCount() const { return m_skin ? static_cast<int>(m_skin->joints.size()) : 0; }
+    int getJointCount() const;
     /// @param i  0 to getJointCount() - 1.
     /// @return with the joint empty when none was given or it is destroyed.
     JointAttachment getJoint(int i) const;
@@ -99,33 +91,17 @@ public:
     /// Whether draw() turns the winding for this program, which may be null.
     bool turnsWinding(const ShaderProgram* program) const
     {
-        return m_skin ? turnsSkinWinding(program) : getWorldMirrored();
+        return m_hasSkin ? turnsSkinWinding(program) : getWorldMirrored();
     }
 
 private:
-    struct Joint
-    {
-        SharedPtr<detail::JointTie> tie; ///< empty when no joint was given
-        Matrix4f inverseBind;
-        bool bindMirrored; ///< inverseBind flips handedness
-    };
-
-    struct Skin
-    {
-        int jointsPerVertex = 0;
-        Matrix4f bindShape = Matrix4f::IDENTITY;
-        bool bindShapeMirrored = false;
-        std::vector<Joint> joints;
-    };
-
-    Skin& makeSkin();
+    ORV_LOCAL detail::SolidSkin* makeSkin();
     bool turnsSkinWinding(const ShaderProgram* program) const;
     ORV_LOCAL bool isSkinMirrored() const;
     ORV_LOCAL Matrix4f calculateJointTransform(const SceneNode* joint, const Matrix4f& inverseBind) const;
 
     SharedPtr<Mesh> m_mesh;
     SharedPtr<Appearance> m_appearance;
-    std::unique_ptr<Skin> m_skin; ///< few solids have one
 };
 
 } // namespace orv

@@ -2,6 +2,7 @@
 
 #include "jointtie.h"
 #include "scenewalk.h"
+#include "solidskin.h"
 
 #include "orv/log.h"
 #include "orv/scenenodevisitor.h"

@@ -1,6 +1,6 @@
 #include "orv/solid.h"
 
-#include "jointtie.h"
+#include "solidskin.h"
 
 #include "orv/appearance.h"
 #include "orv/log.h"
@@ -41,9 +41,9 @@ Solid::Solid(const SharedPtr<Mesh>& mesh, const SharedPtr<Appearance>& appearanc
 
 Solid::~Solid()
 {
-    if (!m_skin)
+    if (!m_hasSkin)
         return;
-    for (Joint& joint : m_skin->joints)
+    for (detail::SolidSkin::Joint& joint : m_extras->skin->joints)
         detail::JointTie::leave(joint.tie);
 }
 
@@ -69,25 +69,47 @@ void Solid::setJointsPerVertex(int count)
     if (count > MAX_JOINTS_PER_VERTEX)
         ORV_LOG_WARN("%d is greater than the maximum joints per vertex; clamping to %d", count,
                      MAX_JOINTS_PER_VERTEX);
-    makeSkin().jointsPerVertex = std::clamp(count, 0, MAX_JOINTS_PER_VERTEX);
+    if (detail::SolidSkin* const skin = makeSkin())
+        skin->jointsPerVertex = std::clamp(count, 0, MAX_JOINTS_PER_VERTEX);
+}
+
+int Solid::getJointsPerVertex() const
+{
+    return m_hasSkin ? m_extras->skin->jointsPerVertex : 0;
 }
 
 void Solid::setBindShapeTransform(const Matrix4f& transform)
 {
-    makeSkin().bindShape = transform;
-    m_skin->bindShapeMirrored = isMirrored(transform);
+    detail::SolidSkin* const skin = makeSkin();
+    if (!skin)
+        return;
+    skin->bindShape = transform;
+    skin->bindShapeMirrored = isMirrored(transform);
 }
 
-Solid::Skin& Solid::makeSkin()
+const Matrix4f& Solid::getBindShapeTransform() const
 {
-    if (!m_skin)
-        m_skin = std::make_unique<Skin>();
-    return *m_skin;
+    return m_hasSkin ? m_extras->skin->bindShape : Matrix4f::IDENTITY;
+}
+
+/// @return null if there is no memory (logged).
+detail::SolidSkin* Solid::makeSkin()
+{
+    Extras* const extras = makeExtras();
+    if (!extras)
+        return nullptr;
+    if (!m_hasSkin)
+        extras->skin = std::make_unique<detail::SolidSkin>();
+    m_hasSkin = true;
+    return extras->skin.get();
 }
 
 void Solid::attachJoint(const SharedPtr<SceneNode>& joint, const Matrix4f& inverseBind)
 {
-    makeSkin().joints.push_back(
+    detail::SolidSkin* const skin = makeSkin();
+    if (!skin)
+        return;
+    skin->joints.push_back(
         {joint ? joint->tie() : SharedPtr<detail::JointTie>(), inverseBind, isMirrored(inverseBind)});
     if (getJointCount() == MAX_JOINTS + 1)
         ORV_LOG_ERROR("Solid \"%s\" has more than %d joints; the others have no effect.", getName(),
@@ -97,15 +119,20 @@ void Solid::attachJoint(const SharedPtr<SceneNode>& joint, const Matrix4f& inver
             1); // last: a joint above that nothing else holds dies now, and perhaps this solid with it
 }
 
+int Solid::getJointCount() const
+{
+    return m_hasSkin ? static_cast<int>(m_extras->skin->joints.size()) : 0;
+}
+
 Solid::JointAttachment Solid::getJoint(int i) const
 {
-    const Joint& joint = m_skin->joints[static_cast<size_t>(i)];
+    const detail::SolidSkin::Joint& joint = m_extras->skin->joints[static_cast<size_t>(i)];
     return {joint.tie ? joint.tie->getNode() : nullptr, joint.inverseBind};
 }
 
 Matrix4f Solid::getJointTransform(int i) const
 {
-    const Joint& joint = m_skin->joints[static_cast<size_t>(i)];
+    const detail::SolidSkin::Joint& joint = m_extras->skin->joints[static_cast<size_t>(i)];
     return calculateJointTransform(joint.tie ? joint.tie->getNode() : nullptr, joint.inverseBind);
 }
 
@@ -134,11 +161,11 @@ bool Solid::isSkinMirrored() const
     int mirrored = 0;
     for (int i = 0; i < count; ++i)
     {
-        const Joint& joint = m_skin->joints[static_cast<size_t>(i)];
+        const detail::SolidSkin::Joint& joint = m_extras->skin->joints[static_cast<size_t>(i)];
         const SceneNode* node = joint.tie ? joint.tie->getNode() : nullptr;
         mirrored += (node ? node->getWorldMirrored() != joint.bindMirrored : getWorldMirrored()) ? 1 : 0;
     }
-    return (2 * mirrored > count) != m_skin->bindShapeMirrored;
+    return (2 * mirrored > count) != m_extras->skin->bindShapeMirrored;
 }
 
 void Solid::draw(RenderContext& context)
