@@ -32,7 +32,7 @@ MARKER = "<!-- ./run gltfmodels writes what follows -->"
 GROUPS = ("right", "reported", "refused", "unread", "wrong")
 MEANINGS = {
     "right": "the same as three.js reads",
-    "reported": "the same but for what is reported",
+    "reported": "the same except for reported losses",
     "refused": "refused with a reason",
     "unread": "converted; three.js does not read it",
     "wrong": "WRONG",
@@ -225,8 +225,8 @@ def write_page(page, folder, rows):
         out()
         out("Made by `./run gltfmodels`: glTF files of `assimp-testmodels`, models of other formats as `assimp export` writes")
         out("them, what gltfpack, gltf-transform and gltf-pipeline make of each, and files made for rare kinds. Every triangle,")
-        out("line and point of the converted scene is held against what three.js reads, at rest and at four moments of each")
-        out("clip; the deviation is a share of the model's size, and more than 1/5,000 is wrong.")
+        out("line and point of the converted scene is compared with three.js, at rest and at four times of each clip; the")
+        out("deviation is a fraction of the model's size, and more than 1/5,000 is wrong.")
         out()
         out("| outcome | files |")
         out("|---|---|")

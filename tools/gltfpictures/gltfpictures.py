@@ -53,35 +53,35 @@ MODELS = (
     Model("engineinstances", "EXT_mesh_gpu_instancing", "glTF2_2CylinderEngine-glTF-Binary_2CylinderEngine.glb/transform-instance.glb"),
     Model("specgloss", "specular-glossiness, textured",
           "as-it-is/glTF2/BoxTextured-glTF-pbrSpecularGlossiness/BoxTextured.gltf",
-          remark="three.js has given this extension up; the page that draws reads the colours of it."),
+          remark="three.js no longer supports this extension; the drawing page reads its colours."),
     Model("clearcoat", "clear coats, which are lost", "as-it-is/glTF2/ClearCoat-glTF/ClearCoatTest.gltf",
-          remark="The coats are lost, as the report says."),
+          remark="The clear coats are lost, as the report says."),
     Model("transforms", "KHR_texture_transform", "as-it-is/glTF2/textureTransform/TextureTransformTest.gltf",
-          remark="Rough surfaces mirror a little white all over in three.js: dark and strong colours are paler."),
+          remark="In three.js rough surfaces reflect a little white everywhere: dark and saturated colours are paler."),
     Model("simpleskin", "skin, a clip at 1 s", "as-it-is/glTF2/simple_skin/simple_skin.gltf", (0, 1.0)),
     Model("badnormals", "normals that point inwards", "as-it-is/glTF2/BoxBadNormals-glTF-Binary/BoxBadNormals.glb",
-          remark="Paler in three.js: likewise."),
+          remark="Paler in three.js, as above."),
     Model("texcoords", "glTF of several textures", "as-it-is/glTF2/BoxTexcoords-glTF/boxTexcoords.gltf"),
     Model("cameras", "the file's own camera", "as-it-is/glTF2/cameras/Cameras.gltf", None, ("nodes[1]", 0),
-          remark="No material: a metal without gloss, whose brightness depends on the slant in three.js."),
+          remark="No material, that is, a metal without gloss; in three.js its brightness depends on the angle."),
     Model("morphcube", "morph targets, a clip at 1 s",
           "as-it-is/glTF2/glTF-Sample-Models/AnimatedMorphCube-glTF/AnimatedMorphCube.gltf", (0, 1.0)),
-    Model("boxmeshopt", "meshopt at its closest", "glTF2_BoxTextured-glTF_BoxTextured.gltf/transform-meshopt.glb"),
+    Model("boxmeshopt", "meshopt at its strongest", "glTF2_BoxTextured-glTF_BoxTextured.gltf/transform-meshopt.glb"),
     Model("transformswebp", "pictures of WebP", "glTF2_textureTransform_TextureTransformTest.gltf/transform-webp.glb",
           remark="Likewise."),
     Model("huesitos", "skin of 9 joints, at 0.8 s", "FBX_huesitos.fbx.glb", (0, 0.8),
-          remark="Lit at each corner here, at each pixel in three.js: highlights are softer."),
+          remark="Lit at each vertex here, at each pixel in three.js: highlights are softer."),
     Model("huesitosdraco", "skin in Draco, at 0.8 s", "FBX_huesitos.fbx/transform-draco.glb", (0, 0.8),
           remark="Likewise."),
     Model("rod", "skin in meshopt, at 0.4 s", "FBX_animation_with_skeleton.fbx/pack-cc.glb", (0, 0.4), least=0.98,
-          remark="A rod twenty pixels thick, of which much is edge."),
+          remark="A rod twenty pixels thick: many of its pixels are edges."),
     Model("epileptic", "quantised skin, at 1 s", "X_BCN_Epileptic.X/pack-named.glb", (0, 1.0)),
     Model("wuson", "the second of several clips, at 0.5 s", "X_Testwuson.X.glb", (1, 0.5)),
     Model("spider", "six materials", "OBJ_spider.obj/pack-plain.glb",
           remark="Likewise."),
     Model("mrfixit", "16-bit shares for positions", "IQM_mrfixit.iqm/pack-shares.glb"),
     Model("faerie", "quantised, normals of 8 bits", "MD2_faerie.md2/pack.glb",
-          remark="A metal, softer at the rims: likewise."),
+          remark="A metal, softer at the edges, as above."),
     Model("spheres", "KHR_materials_unlit", "MS3D_twospheres.ms3d/transform-unlit.glb"),
     Model("colouredcube", "colours of vertices, quantised", "OBJ_cube_with_vertexcolors.obj/pack-c.glb"),
     Model("coloured", "colours of vertices as bytes and as 16 bits; unlit"),
@@ -92,27 +92,27 @@ MODELS = (
     Model("glow", "emission, its picture and strength"),
     Model("mirrored", "negative scales, one in another"),
     Model("bent", "skins that share joints, below scale, mirrored; at 0.5 s", None, (0, 0.5), least=0.95,
-          remark="An armature that mirrors: three.js takes the sides of faces from the mesh's node and shows the inside, "
-                 "which is black; here they are those that the joints make."),
+          remark="A mirroring armature: three.js takes the winding from the mesh's node and shows the inside, which is "
+                 "black; here it follows the joints."),
     Model("morphed", "default weights of a mesh and of a node"),
-    Model("movingmorph", "moving weights, at 0.8 s", None, (0, 0.8)),
+    Model("movingmorph", "animated weights, at 0.8 s", None, (0, 0.8)),
     Model("seconduv", "TEXCOORD_1"),
     Model("wraps", "clamped, repeated, mirrored; nearest; turned"),
     Model("ways", "STEP, LINEAR, CUBICSPLINE; at 0.7 s", None, (0, 0.7)),
     Model("waysturn", "the same, second clip; at 0.6 s", "MADE/ways/model.gltf", (1, 0.6)),
     Model("many", "78,961 vertices"),
     Model("lamps", "point, spot, directional lights", lit=True,
-          remark="The engine's lights fall off in a straight line, see [convert.md](convert.md)."),
+          remark="The engine's lights have linear attenuation, see [convert.md](convert.md)."),
     Model("owncamera", "orthographic camera", None, None, ("nodes[3]", 0)),
     Model("plastics", "roughness; KHR_materials_specular",
-          remark="Highlights of the smoothest are as small as the engine has them."),
+          remark="Highlights of the smoothest surfaces are as small as the engine allows."),
     Model("metals", "metals under a plain sky (`--sky`)", sky=True,
-          remark="The sky is as sharp in rough metals as in smooth ones, and what is less than half a metal mirrors nothing."),
-    Model("bare", "no normals; strides; sparse without bytes"),
+          remark="The sky is as sharp in rough metals as in smooth ones; surfaces of metalness below 0.5 mirror nothing."),
+    Model("bare", "no normals; strides; sparse without a buffer view"),
     Model("strips", "strips and fans"),
-    Model("scenes", "the scene to show; a hidden node", least=0.75,
-          remark="three.js does not know KHR_node_visibility and shows the red sheet, too."),
-    Model("names", "UTF-8, percent signs, names that stand twice; at 1 s", None, (0, 1.0)),
+    Model("scenes", "the default scene; a hidden node", least=0.75,
+          remark="three.js does not know KHR_node_visibility and shows the red sheet too."),
+    Model("names", "UTF-8, percent signs, duplicate names; at 1 s", None, (0, 1.0)),
     Model("bumps", "normal maps without tangents"),
 )
 
@@ -270,10 +270,10 @@ def write_sheets(pairs, folder):
 
 INTRODUCTION = """# glTF beside three.js, drawn
 
-Made by `./run gltfpictures`: {count} glTF models that differ in kind, as `orv-convert` and `orv-view` draw them and as three.js
-0.187 does in headless Chromium. Camera and lamps stand in each file, so both take them from there; the pictures are {width} x
-{height} pixels. *Overlap*: how much of the two outlines together belongs to both, pixels at the edges by their share; at least
-{least} % where no remark says why not. *Colour*: the mean difference over the pixels that both cover, of 255.
+Made by `./run gltfpictures`: {count} glTF models of different kinds, drawn by `orv-convert` and `orv-view` and by three.js 0.187 in headless
+Chromium. Camera and lamps are those of each file; the pictures are {width} x {height} pixels. *Overlap*: the intersection of
+the two outlines divided by their union, pixels at the edges counted by coverage; at least {least} % unless a remark says why
+not. *Colour*: the mean difference over the pixels that both cover, of 255.
 
 On the sheets, orv is on the left of each pair. {below} of {count} outlines overlap by less than {least} %.
 

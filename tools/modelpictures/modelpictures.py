@@ -40,71 +40,74 @@ PAIRS = (
          "Every part in its place and colour. Parts that face away from the lamps are darker in Blender, where other parts "
          "shade them."),
     Pair("clearcoat", "glTF2/ClearCoat-glTF/ClearCoatTest.gltf", "blender", "glTF 2.0, normal maps, a blended material",
-         "Colours and bumps agree. The coats, which the engine has not and the report names, are all that the third column "
-         "shows in Blender: here it is black but for highlights, and the background shows where the second one is clear."),
+         "Colours and bumps agree. The report lists the clear coats as lost. In Blender they are all that the third "
+         "column shows; here it is black except for highlights, and the background shows through the second one."),
     Pair("texturetransform", "glTF2/textureTransform/TextureTransformTest.gltf", "blender", "glTF 2.0, texture transforms",
-         "All arrows end at the green ticks, on either side. Blender is darker as its lamps meet the panes at a slant."),
+         "All arrows end at the green ticks on both sides. Blender is darker, since its lamps light the panes at an "
+         "angle."),
     Pair("glass", "(made)", "blender", "glTF 2.0, transparent",
-         "The same order and mixture of colours. Blender's panes throw shadows on each other."),
+         "The same order and mixture of colours. Blender's panes cast shadows on each other."),
     Pair("lines", "glTF2/glTF-Asset-Generator/Mesh_PrimitiveMode/Mesh_PrimitiveMode_02.gltf", "f3d", "glTF 2.0, lines",
-         "The same outline; VTK's line is thinner as its picture is made smaller.", None, "y"),
+         "The same outline; VTK's line is thinner, since its picture is scaled down.", None, "y"),
     Pair("simpleskin", "glTF2/simple_skin/simple_skin.gltf", "blender", "glTF 2.0, skin, animated, at 1 s",
-         "The same bend at the same moment. Brighter here: the lamp meets the flat sheet head on.", 1.0),
+         "The same bend at the same time. Brighter here: the lamp faces the flat sheet.", 1.0),
     Pair("tentacle", "(made)", "blender", "glTF 2.0, skin of 30 joints, animated, at 1 s",
-         "The same curve, in two parts here as shaders have 20 joints, without a seam. The sheen is the engine's highlight "
-         "for a roughness of 0.6, which Cycles spreads farther.", 1.0),
+         "The same curve, here in two parts because of the limit of 20 joints, without a seam. The engine's highlight for "
+         "a roughness of 0.6 is narrower than that of Cycles.", 1.0),
     Pair("morphcube", "glTF2/glTF-Sample-Models/AnimatedMorphCube-glTF/AnimatedMorphCube.gltf", "blender",
-         "glTF 2.0, morph targets", "The same shape at rest. While the animation plays, meshes of other shapes take turns."),
+         "glTF 2.0, morph targets", "The same shape at rest. While the animation plays, one mesh for each shape is shown "
+         "in turn."),
     Pair("skeleton", "FBX/animation_with_skeleton.fbx", "blender", "FBX, skin, animated, at 0.4 s",
-         "The same pose. Where the rod bends it is a little narrower here: up to six joints pull at a vertex, of which the "
-         "engine has four. The file's own lamp, from below, lights it here; Blender's picture has lamps of its own.", 0.4),
+         "The same pose. Where the rod bends it is a little narrower here: vertices have up to six joints, of which the "
+         "engine uses four. Here the file's own lamp lights it from below; Blender's picture has other lamps.", 0.4),
     Pair("huesitos", "FBX/huesitos.fbx", "blender", "FBX, skin of 9 joints, animated, at 0.8 s",
-         "The same pose. The lamp is again the file's. Blender takes the opacity of 0 in the file for nothing to be seen, "
-         "which was overruled for this picture.", 0.8),
+         "The same pose. The lamp is again the file's. Blender reads the file's opacity of 0 as invisible; it was "
+         "overridden for this picture.", 0.8),
     Pair("spiderfbx", "FBX/spider.fbx", "blender", "FBX, units, a light and a camera, missing pictures",
-         "The same parts in the same places. The pictures are missing: Blender shows that in magenta, the converter says so "
+         "The same parts in the same places. The pictures are missing: Blender shows magenta, the converter reports them "
          "and keeps the colours."),
     Pair("duck", "Collada/duck.dae", "blender", "Collada, textured, a light and a camera",
-         "The same; the light is the file's here. Blender's highlights are those of a default roughness."),
+         "The same; the light here is the file's. Blender's highlights are those of a default roughness."),
     Pair("nested", "Collada/box_nested_animation.dae", "blender", "Collada, animated, at 0.6 s",
-         "The same attitude of the box.", 0.6),
+         "The box has the same orientation.", 0.6),
     Pair("instances", "Collada/teapot_instancenodes.DAE", "blender", "Collada, instances",
-         "The same places. Paler in Blender, which takes a file's colours for shares of light and not for those of a screen."),
+         "The same places. Paler in Blender, which reads the file's colours as linear, not as sRGB."),
     Pair("cinema", "Collada/Cinema4D.dae", "blender", "Collada of Cinema 4D, three meshes",
          "The same; Blender adds shadows."),
     Pair("human", "Collada/human.zae", "blender", "Collada in an archive, 28,796 triangles",
          "The same shape. Paler in Blender: the file's colours again."),
     Pair("vertexcolours", "Collada/kwxport_test_vcolors.dae", "blender", "Collada, three materials, vertex colours",
-         "The pictures lie the same way up and round. Brighter here: the file asks for a strong highlight, which Blender "
-         "does not read. The vertex colours are kept and not shown, as the report says."),
+         "The pictures have the same orientation. Brighter here: the file has a strong highlight, which Blender does not "
+         "read. The vertex colours are kept but not shown, as the report says."),
     Pair("spiderobj", "OBJ/spider.obj", "blender", "OBJ, 6 materials, 4 pictures",
          "The same pictures in the same places."),
     Pair("manyvertices", "(made)", "blender", "OBJ, 102,400 vertices in one mesh",
-         "The same waves, without a gap where the parts of at most 65,536 vertices meet. Darker here: without a colour in the "
+         "The same waves, without a gap where the parts of at most 65,536 vertices meet. Darker here: without a colour in "
+         "the "
          "file the converter takes grey of 0.6, Blender of 0.8."),
     Pair("wusonstl", "STL/Wuson.stl", "blender", "STL, normals of no length",
-         "The same shape. Smooth here as the normals are made again, in facets in Blender.", None, "y"),
+         "The same shape. Smooth here, since the normals are recomputed; faceted in Blender.", None, "y"),
     Pair("spiderstl", "STL/Spider_binary.stl", "blender", "STL, normals of the wrong side",
-         "The same, smooth and in facets. Before the normals were made again it was black.", None, "y"),
+         "The same, smooth here, faceted in Blender. With the file's normals it would be black.", None, "y"),
     Pair("fels", "3DS/fels.3ds", "f3d", "3DS",
-         "The same rock, with the normals that libassimp hands over; VTK draws its facets."),
+         "The same rock, here with the normals from libassimp, in VTK faceted."),
     Pair("alphacubes", "3DS/cubes_with_alpha.3DS", "f3d", "3DS, transparent",
-         "The same cubes, of which the large one in front lets a little through. Other colours: the file has teal, blue, "
+         "The same cubes; the large one in front is slightly transparent. Other colours: the file has teal, blue, "
          "green as ambient and dark red, orange, magenta as diffuse colours, and VTK draws the ambient ones."),
     Pair("monkey", "BLEND/Suzanne_248.blend", "blender", "Blender 2.48",
-         "The same monkey, long face and all, which is how near the eye is. Smooth here at less than 66 degrees; Blender 3.4 "
-         "draws the facets."),
+         "The same monkey; its face looks long because the eye is near. Smooth here below 66 degrees, faceted in Blender "
+         "3.4."),
     Pair("monkeysubdiv", "BLEND/SuzanneSubdiv_252.blend", "blender", "Blender 2.52, a subdivided mesh",
-         "The same outline: it looks upwards, its chin towards the eye, in both. Faces of this mesh do not share their "
-         "vertices: Blender's subdivision leaves gaps between them, libassimp's joins them first and is rounder."),
+         "The same outline: it looks upwards, its chin towards the eye, in both. Faces of this mesh share no vertices: "
+         "Blender's subdivision leaves gaps between them; libassimp joins them first, so it is rounder."),
     Pair("torus", "BLEND/TorusLightsCams_250_compressed.blend", "blender", "Blender 2.50, five lights, two cameras",
-         "The same shape. Too bright here, and black where no lamp reaches: the file's five lamps fade with distance, which "
-         "libassimp does not hand over, and add up. Blender's picture has lamps of its own."),
+         "The same shape. Too bright here, and black where no lamp reaches: the file's five lamps add up, and libassimp "
+         "does not return their attenuation. Blender's picture has other lamps."),
     Pair("wusonsmd", "SMD/WusonSMD.smd", "blender", "SMD, beside the same model as PLY",
-         "The same animal the same way up. Darker: the picture that the SMD file names is missing.", None, "y",
+         "The same animal, the same way up. Darker: the picture that the SMD file names is missing.", None, "y",
          "PLY/Wuson.ply"),
     Pair("wusonx", "X/Testwuson.X", "blender", "X, 37 joints, beside the same model as PLY",
-         "The same animal in another file, which has it look the other way.", None, "y", "PLY/Wuson.ply"),
+         "The same animal from another file, in which it looks the other way.", None, "y", "PLY/Wuson.ply"),
 )
 
 
@@ -304,20 +307,19 @@ def write_page(page):
 
 INTRODUCTION = """# Other people's models beside another renderer
 
-Made by `./run modelpictures`: models of Debian's `assimp-testmodels`, and some that the script makes where there was none
-of the kind. On the left what `orv-convert` and `orv-view` make of a file, on the right the same file, seen from the same
-place,
+Made by `./run modelpictures`: models of Debian's `assimp-testmodels`, and some made by the script where it has none of a kind. On the left the picture
+by `orv-convert` and `orv-view`, on the right the same file from the same viewpoint,
 
 - by **Blender** 3.4, its own readers (or those of OpenCOLLADA) and Cycles, with two lamps and a grey sky in place of the
   file's lights;
 - by **f3d**, VTK's own readers and renderer, for what Blender does not read.
 
-Neither reads any of these files by libassimp. Blender reckons in shares of light and shows sRGB, the engine reckons in what
-is shown; so slopes are brighter in Blender throughout. The texts are written after looking at each pair.
+Neither uses libassimp for these files. Blender lights in linear light and shows sRGB, the engine lights in sRGB values; so
+slanted surfaces are brighter in Blender. The texts were written after looking at each pair.
 
-These pairs brought to light, and have seen mended: texture transforms of glTF that turned around another point, colours of
-glTF that were taken for those of a screen, normals of STL files that have no length or point to the back, exponents below 1
-of Collada files that were highlights all over, and SMD files that lay on their backs.
+These pairs showed faults, now mended: glTF texture transforms turned around a wrong point, linear glTF colours read as sRGB,
+STL normals of no length or pointing to the back, Collada exponents below 1 drawn as highlights all over, and SMD files that
+lay on their backs.
 """
 
 

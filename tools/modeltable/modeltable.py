@@ -3,9 +3,8 @@
 
     modeltable.py CONVERTER FOLDER PAGE.md
 
-A model is a file whose extension the Assimp library knows. What the library's own command, `assimp info`, makes of it
-stands beside what the converter makes of it: a file that the one reads and the other neither converts nor refuses with
-a reason is an error, as is a converter that ends in any other way. Exit code 1 then.
+A model is a file whose extension the Assimp library knows. The library's own command, `assimp info`, reads each file too.
+The exit code is 1 if the converter neither converts a file nor refuses it with a reason.
 """
 import argparse
 import concurrent.futures
@@ -83,10 +82,10 @@ def write_page(page, rows):
             others = "".join(file.read().partition(MARKER)[1:])
     with open(page, "w", encoding="utf-8") as file:
         out = lambda text="": file.write(text + "\n")
-        out("# What becomes of other people's models")
+        out("# Converting other people's models")
         out()
-        out("Made by `./run models`: every file of Debian's `assimp-testmodels` that has the extension of a model, as")
-        out("`orv-convert` takes it. *Refused, as the library cannot read it*: `assimp info` fails on that file too; many")
+        out("Made by `./run models`: every file of Debian's `assimp-testmodels` with the extension of a model,")
+        out("converted by `orv-convert`. *Refused, as the library cannot read it*: `assimp info` fails on that file too; many")
         out("of these files are damaged on purpose.")
         out()
         out("| folder | " + " | ".join(MEANINGS[group] for group in GROUPS) + " |")
