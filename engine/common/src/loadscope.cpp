@@ -38,7 +38,7 @@ namespace detail
 namespace
 {
 
-// Reading again costs time alone, and little of it.
+// Reading again costs only a little time.
 constexpr uint64_t REREAD_BYTES = uint64_t(2) << 20;
 constexpr uint64_t REREAD_PER_BYTE = 8;
 constexpr uint64_t TEXTURE_PER_BYTE = 63;
@@ -68,7 +68,7 @@ struct LoadLedger
 {
     explicit LoadLedger(const char* what) : name(what), log(what) {}
 
-    /// A message for the first time that something is refused.
+    /// Logs the first refusal of a kind.
     void refuse(bool& isRefused, const char* what, uint64_t limit)
     {
         if (!isRefused)
@@ -99,7 +99,7 @@ struct LoadLedger
     bool isReadingRefused = false;
     bool isTextureRefused = false;
     bool isProgramRefused = false;
-    bool isExplained = false; ///< where files are looked for
+    bool isExplained = false; ///< the log has named the searched places
 };
 
 LoadScope::LoadScope(const char* name)

@@ -30,8 +30,7 @@ void Shared::sharedRelease() const
 {
     assertIsShared(sharedGetCount(), "release");
 
-    // The decrement itself says what is left: of two threads that drop the last two shares at once, exactly one
-    // sees 0.
+    // Uses the decrement's own result: if two threads drop the last two shares at once, exactly one sees 0.
     if (m_count.fetch_sub(1, std::memory_order_acq_rel) - 1 <= 0)
         delete this;
 }

@@ -212,7 +212,7 @@ Matrix4f lookAt(const Vector3f& eye, const Vector3f& target, const Vector3f& up)
                     Vector4f(eye, 1.0f));
 }
 
-/// The square root of the largest row sum of transpose(m) * m, which no eigenvalue of that is above.
+/// The square root of the largest row sum of transpose(m) * m, an upper bound of its eigenvalues.
 float detail::getStretch(const Matrix4f& m)
 {
     if (!isAffine(m))

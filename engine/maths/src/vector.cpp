@@ -9,7 +9,7 @@ namespace orv
 
 int detail::indexOutOfRange(int index, int last)
 {
-    // Said in the name of the operator that was given the index.
+    // Logged under the name of the operator.
     pssLogError("engine/maths/src/vector", "operator[]", __LINE__, "Index (%d) out of range [0, %d]", index,
                 last);
     return 0;

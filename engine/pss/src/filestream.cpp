@@ -13,7 +13,7 @@ namespace
 
 const unsigned int LARGEST = std::numeric_limits<int32_t>::max();
 
-/// A standard stream opens a directory as well, and a pipe would wait for its other end.
+/// Standard streams open directories as well, and opening a pipe would block.
 bool isRegularFile(const char* path)
 {
     struct stat status;

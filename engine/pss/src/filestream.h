@@ -29,7 +29,7 @@ private:
     bool m_isAtEnd = false;
 };
 
-/// Creates or empties a file and writes it, unbuffered: what write() returns is what the system took.
+/// Creates or empties a file and writes it, unbuffered: write() returns the bytes that the system accepted.
 class FileOutputStream : public Stream
 {
 public:

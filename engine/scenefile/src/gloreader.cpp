@@ -17,7 +17,7 @@ using namespace glo;
 namespace
 {
 
-/// Takes the fields of a block that has been read in one piece.
+/// Reads the fields of a block in memory.
 class BlockReader
 {
 public:
@@ -40,7 +40,7 @@ private:
     const unsigned char* m_bytes;
 };
 
-/// Whether a block of that size can be had: a vector cannot say no, since the engine has no exceptions.
+/// Whether a block of that size can be allocated: a vector cannot report it, since the engine has no exceptions.
 bool isAllocatable(size_t size)
 {
     void* trial = ::operator new(size, std::nothrow);
@@ -63,7 +63,7 @@ GloReader::Opening GloReader::open(const uint32_t ids[], bool skipUnknown, OpenC
 {
     ORV_ASSERT(ids);
     unsigned char word[4];
-    const bool isEnd = remaining() < sizeof(word); // or else a read that fails although there is more
+    const bool isEnd = remaining() < sizeof(word); // otherwise the read failed before the end
     if (!readExactly(word, sizeof(word)))
     {
         m_ended = true;
@@ -115,7 +115,7 @@ GloReader::Opening GloReader::enter(uint32_t id, uint32_t size, OpenChunk& chunk
     return Opening::OPENED;
 }
 
-/// @param isRead  whether its data were. @return that they were, and all of them.
+/// @param isRead  whether its data were read. @return true if they were read completely.
 bool GloReader::close(const OpenChunk& chunk, bool isRead)
 {
     const uint32_t size = m_chunkSize;
@@ -341,7 +341,7 @@ bool GloReader::each(uint32_t count, std::vector<Element>& elements, Fields&& el
     return true;
 }
 
-/// As they stand in the file, by way of the stack: a vector would first fill itself with zeros.
+/// Copies elements unchanged, through the stack: resizing a vector would first fill it with zeros.
 template <class Element>
 bool GloReader::readElements(std::vector<Element>& elements, uint32_t count)
 {
@@ -384,7 +384,7 @@ bool GloReader::keys(Channel& channel)
     const uint32_t left = remaining();
     if (keySize > left || channel.keyCount > left / keySize)
     {
-        // A channel without keys is none too short, whatever size its keys would have.
+        // Without keys there is nothing to read, whatever the size of a key.
         return channel.keyCount == 0 || fail("Failed to read animation data in %s");
     }
     const uint32_t size = channel.keyCount * uint32_t(keySize);

@@ -15,7 +15,7 @@ constexpr unsigned BLOCK_BYTES = 8;
 constexpr unsigned SHADES = 4;
 constexpr unsigned PIXEL_BYTES = 4;
 
-/// What is added to a base colour: the smaller and the larger step of each table.
+/// Offsets from a base colour: the smaller and the larger step of each table.
 constexpr uint16_t STEPS[8][2] = {{2, 8},   {5, 17},  {9, 29},   {13, 42},
                                   {18, 60}, {24, 80}, {33, 106}, {47, 183}};
 
@@ -59,7 +59,7 @@ void makeShades(const PixelPair& base, uint32_t table, uint8_t* shades)
     putShades(shades + 2 * PIXEL_BYTES, base - steps);
 }
 
-/// The codes of the 16 pixels, column by column: two bits each, of which the block keeps all high ones first.
+/// The two-bit codes of the 16 pixels, column by column. The block stores all high bits first.
 uint32_t interleaveCodes(uint32_t bits)
 {
     uint64_t spread = uint64_t(bits >> 16) << 32 | (bits & 0xffff);

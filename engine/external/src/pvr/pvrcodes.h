@@ -2,7 +2,7 @@
 
 #include "pvr/pvrformat.h"
 
-/// How the headers of PVR files are coded: shared by what reads and what writes them.
+/// The encoding of PVR headers, shared by reader and writer.
 ///
 /// A header is a row of 32-bit words, all of them in the byte order of the machine that wrote the file.
 namespace pvr
@@ -52,7 +52,7 @@ struct PixelType
 };
 
 /// The first entry of a format is the one to write. Types below 16 are the older ones, whose 16-bit words have
-/// their alpha on top. PVRTC stands here as opaque; HAS_ALPHA or an alpha mask makes it the other format.
+/// their alpha on top. PVRTC is listed as opaque; HAS_ALPHA or an alpha mask selects the format with alpha.
 inline constexpr PixelType PIXEL_TYPES[] = {
     {0x12, Format::RGBA_8888},   {0x1a, Format::BGRA_8888},   {0x05, Format::BGRA_8888},
     {0x15, Format::RGB_888},     {0x13, Format::RGB_565},     {0x02, Format::RGB_565},

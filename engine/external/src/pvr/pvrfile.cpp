@@ -69,7 +69,7 @@ bool identify(const uint8_t* data, size_t size, Header& header, bool& bigEndian)
     return false;
 }
 
-/// What a header says about the picture, before it is known whether the file is long enough.
+/// The picture as the header describes it; the file's length is checked later.
 struct PictureInfo
 {
     Format format = Format::RGBA_8888;
@@ -78,7 +78,7 @@ struct PictureInfo
     uint32_t height = 0;
     uint64_t levelCount = 0;
     uint64_t dataOffset = 0;
-    uint32_t surfaceSize = 0; ///< 0 if not told
+    uint32_t surfaceSize = 0; ///< 0 if unknown
 };
 
 struct Name

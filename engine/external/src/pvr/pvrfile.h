@@ -18,7 +18,7 @@ struct Level
     size_t size;     ///< bytes
 };
 
-/// What a PVR file holds and where. Made by parse().
+/// The contents of a PVR file. Made by parse().
 struct PvrFile
 {
     Format format = Format::RGBA_8888;
@@ -36,15 +36,15 @@ struct PvrFile
 /// Whether the first bytes are those of a PVR file.
 bool isPvr(const uint8_t* data, size_t size);
 
-/// Finds out what a PVR file holds. The pixels are not looked at.
+/// Reads the headers of a PVR file, not its pixels.
 ///
 /// Legacy headers of 44 and 52 bytes and version 3, of either byte order, that hold one picture with its mipmaps.
-/// Cube maps, arrays and volumes are refused, and so is a format that is not in Format, by its name.
+/// Cube maps, arrays and volumes are refused, and so are formats that are not in Format; the error names them.
 ///
 /// Not used: metadata (a version 3 picture has its top row first, whatever its metadata says), masks (but for the
 /// alpha of legacy PVRTC files), the colour space (sRGB is treated as plain colour: the bytes reach the shader
 /// unchanged), premultiplication, and the legacy flags about tiling, bump maps and mipmaps (their count decides).
-/// Legacy files may leave the bit count, the surface size and the number of surfaces 0; else these must agree with
+/// In legacy files the bit count, the surface size and the number of surfaces may be 0; otherwise they must agree with
 /// the rest. Twiddled pixels are refused, except for PVRTC, whose blocks always are.
 /// \param error receives what is wrong, naming the field
 /// \return false, with `file` unchanged, if the file cannot be used

@@ -5,8 +5,8 @@
 namespace pvr
 {
 
-/// What the pixels of a file are. Names of 16-bit words run from the highest bits to the lowest, those of 8-bit
-/// channels from the first byte to the last.
+/// Pixel formats. Names of 16-bit words run from the highest bits to the lowest, those of 8-bit channels from the first
+/// byte to the last.
 enum class Format : uint8_t
 {
     RGBA_8888,

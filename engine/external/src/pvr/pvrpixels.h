@@ -5,8 +5,8 @@
 namespace pvr
 {
 
-/// What unpack() makes of a format: RGBA_8888, RGB_888, RGB_565, RGBA_4444, RGBA_5551, LA_88, L_8 or A_8.
-/// Compressed pixels are decoded to RGBA_8888; other formats differ in the order of their channels at most.
+/// The format that unpack() writes: RGBA_8888, RGB_888, RGB_565, RGBA_4444, RGBA_5551, LA_88, L_8 or A_8. Compressed
+/// pixels are decoded to RGBA_8888; other formats differ in the order of their channels at most.
 Format getUnpackedFormat(Format format);
 
 /// Bytes that unpack() writes for a level.

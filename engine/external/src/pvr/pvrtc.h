@@ -27,8 +27,7 @@ uint64_t pvrtcSize(uint32_t width, uint32_t height, PvrtcBits bits);
 /// So 0 and the greatest value come out as 0 and 255. Interpolated weights (2 bits) are rounded to nearest, halves
 /// up. A punched-through pixel has the mix of its weight, 4, and alpha 0.
 ///
-/// Blocks say themselves whether they are opaque; a picture declared to have no alpha may hold translucent ones,
-/// whose alpha comes out as for any other.
+/// Each block says whether it is opaque. Translucent blocks keep their alpha even in a picture declared as opaque.
 /// \param data at least pvrtcSize(width, height, bits) bytes
 /// \param rgba receives width x height pixels of 4 bytes each
 /// \return false, with nothing written, if `size` is too small or a side is not a power of two

@@ -5,14 +5,14 @@
 #include <cstdint>
 #include <cstring>
 
-/// What a PVRTC block says, in the form that the decoder works with.
+/// A PVRTC block in the form that the decoder uses.
 namespace pvr::pvrtc
 {
 
 constexpr unsigned HEIGHT = 4; // pixels of a block; its width is 4 or 8
 constexpr unsigned BLOCK_BYTES = 8;
 
-/// How weights come about in a block of 8 x 4.
+/// How the weights of a block of 8 x 4 are stored.
 enum class Mode : uint8_t
 {
     PLAIN,

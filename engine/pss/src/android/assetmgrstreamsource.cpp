@@ -42,7 +42,7 @@ public:
     {
         if (!buffer)
             return 0;
-        // By the count asked for: this is what makes eof() true after a read that wanted too much.
+        // By the requested count, so that eof() is true after a read past the end.
         m_position = int32_t(std::min<int64_t>(int64_t(m_position) + count, LARGEST));
         return AAsset_read(m_asset, buffer, count);
     }
@@ -67,7 +67,7 @@ bool AssetMgrStreamSource::exists(const char* name) const
     AAsset* asset = AAssetManager_open(m_manager, name, AASSET_MODE_UNKNOWN);
     if (!asset)
     {
-        // A file may name as many assets that are not there as it has room for.
+        // A file may name any number of missing assets.
         if (detail::LogBudget::mayWrite(pssLogInfo, "assetmgrstreamsource", __func__, __LINE__))
             __android_log_print(ANDROID_LOG_INFO, LOG_TAG_ASSETS,
                                 "AssetMgrStreamSource %s  could not load from apk/assets folder", name);

@@ -6,7 +6,7 @@
 namespace orv::detail
 {
 
-/// By one call, so that records from several threads do not mix.
+/// With a single call, so that records of several threads do not mix.
 void writeToPlatform(LogLevel level, const char* format, va_list arguments)
 {
     static const char LETTERS[] = "DIWE";

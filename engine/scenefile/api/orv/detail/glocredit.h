@@ -9,8 +9,8 @@ namespace orv::detail::glo
 {
 
 /// References in a scene file multiply: a geometry of a thousand sets that a thousand nodes refer to is a million solids.
-/// Whatever is made by reference is paid for out of the file's size, in bytes of memory; the loader refuses a file that
-/// asks for more, and what describes files says so by the same rule.
+/// So the memory of objects made by reference is limited by the file's size. The loader refuses a file above the limit;
+/// the inspector reports it by the same rule.
 class GloCredit
 {
 public:
@@ -43,7 +43,7 @@ private:
     static constexpr uint64_t SPARE = uint64_t(4) << 20; ///< for any file
     static constexpr uint64_t PER_BYTE = 32;
 
-    // About what each takes in memory; the last one in time, for a search below one of the skeletons.
+    // The approximate memory of each; SEARCH stands for the time of a search below one of the skeletons.
     static constexpr uint64_t SOLID = 480;
     static constexpr uint64_t JOINT = 160;
     static constexpr uint64_t CHANNEL = 512;

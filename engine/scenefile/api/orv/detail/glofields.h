@@ -4,8 +4,8 @@
 
 #include <type_traits>
 
-/// The fields of every chunk: their order, their labels and the versions that have them. The same functions
-/// read, write and print, as the Io that they are given does:
+/// The fields of every chunk: their order, labels and versions. The same functions read, write and print, depending on
+/// the Io:
 ///
 ///     version()                     FileVersion of the file, once acceptVersion() was called
 ///     acceptVersion(text)           "glo version": understands it, or fails
@@ -17,7 +17,7 @@
 ///                                   and f32(value)
 ///     chunk(record)                 the record's chunk, required
 ///     optionalChunk(optional)       a chunk that is there, required
-///     chunks(count, vector, skip)   count chunks; if skip, others among them count but are passed over
+///     chunks(count, vector, skip)   count chunks; if skip, unknown ones are skipped but count
 ///     each(count, vector, fields)   fields is called for each of count elements
 ///     body(scene)                   the chunks of BODY_CHUNKS
 ///     bytes(VertexData), indices(IndexData), keys(Channel)   the rest of their chunks
@@ -31,7 +31,7 @@ namespace orv::detail::glo
 template <class T, class Record>
 concept Of = std::is_same_v<std::remove_const_t<T>, Record>;
 
-/// What a file body holds, in the order in which it is written, ended by a 0.
+/// The chunks of a file body in the order of writing, ended by a 0.
 constexpr uint32_t BODY_CHUNKS[] = {
     Info::ID,
     Geometry::LIST_ID,

@@ -6,8 +6,8 @@
 #include <limits>
 #include <string_view>
 
-/// The container rules of scene files, shared by what reads, writes and prints them: chunk IDs, type codes and
-/// the differences between versions. What the chunks hold is in glorecords.h and glofields.h.
+/// The container rules of scene files, shared by reader, writer and inspector: chunk IDs, type codes and the
+/// differences between versions. The chunks' contents are in glorecords.h and glofields.h.
 ///
 /// Everything in a file is little-endian and unaligned. A chunk is its ID (four characters, kept as one 32-bit
 /// word with the first character lowest), the number of its data bytes as an unsigned 32-bit number, the data.
@@ -81,7 +81,7 @@ constexpr int MAX_CHUNK_DEPTH = 512;
 /// Bytes of a text with its final NUL: 1 to this many.
 constexpr uint32_t MAX_TEXT_SIZE = 1024;
 
-/// "major.minor.patch" as three numbers, in this order of weight.
+/// "major.minor.patch" as three numbers.
 struct FileVersion
 {
     int first = 0;
@@ -91,7 +91,7 @@ struct FileVersion
     constexpr auto operator<=>(const FileVersion&) const = default;
 };
 
-/// The newest version; a newer file is refused, an older one is read as far back as they go.
+/// The newest version; newer files are refused, all older ones are read.
 constexpr FileVersion NEWEST_VERSION = {0, 14, 0};
 
 constexpr bool isSupported(FileVersion v)
@@ -136,8 +136,7 @@ constexpr uint32_t lightBlockSize(FileVersion v)
 constexpr uint32_t CAMERA_BLOCK_SIZE = 20;
 constexpr uint32_t SAMPLER_BLOCK_SIZE = 24;
 
-/// Reads three numbers with dots between them; blanks in front of a number and anything after the third are
-/// taken as they come.
+/// Reads three numbers with dots between them; blanks before a number and anything after the third are ignored.
 /// @return false, version unchanged, if there are fewer.
 inline bool parseVersion(const char* text, FileVersion& version)
 {
@@ -184,8 +183,8 @@ enum class UpAxis : uint32_t
     Z = 2  ///< replaced by -90 degrees about x
 };
 
-/// How a channel's keys are meant. Whatever else stands there is stepped: tools have written numbers of their own, which
-/// nothing reads, so the one that is read is none that they would have.
+/// The interpolation of a channel's keys. Every other value means steps: tools write various numbers there, so LINEAR
+/// is a number that none of them writes.
 namespace interpolation
 {
 constexpr uint32_t STEPPED = 0;
@@ -217,7 +216,7 @@ constexpr uint32_t POINTS = 0;
 constexpr uint32_t LINE_STRIP = 1;
 constexpr uint32_t LINE_LOOP = 2;
 constexpr uint32_t LINES = 3;
-constexpr uint32_t TRIANGLE_FAN = 4; ///< what any code above 6 is drawn as, too
+constexpr uint32_t TRIANGLE_FAN = 4; ///< codes above 6 are drawn as this too
 constexpr uint32_t TRIANGLES = 5;
 constexpr uint32_t TRIANGLE_STRIP = 6;
 } // namespace primitive
@@ -229,7 +228,7 @@ constexpr uint32_t TEXTURE_2D = 0;
 constexpr uint32_t TEXTURE_CUBE = 1;
 } // namespace sampler
 
-/// What a material may have besides, bit by bit; each is a feature of the lit programs. Unknown bits count for nothing.
+/// Further material features, one bit each; each is a feature of the lit programs. Unknown bits are ignored.
 namespace surface
 {
 constexpr uint32_t VERTEX_COLOUR = 1;
@@ -266,7 +265,7 @@ constexpr uint32_t ORTHOGRAPHIC = 0;
 constexpr uint32_t PERSPECTIVE = 1;
 } // namespace projection
 
-/// What a channel can move, and how many coefficients its keys have. A channel of anything else is passed over.
+/// The targets of channels and the number of coefficients of their keys. Channels of other targets are skipped.
 struct ChannelKind
 {
     const char* targetType;
@@ -302,7 +301,7 @@ constexpr const ChannelKind* findChannelKind(std::string_view targetType, std::s
     return nullptr;
 }
 
-/// The name of what a channel moves: "node-" in front of it counts for nothing.
+/// The name of a channel's target, without a leading "node-".
 constexpr std::string_view getTargetName(std::string_view name)
 {
     return name.substr(0, 5) == "node-" ? name.substr(5) : name;

@@ -6,7 +6,7 @@
 #include <string>
 #include <string_view>
 
-/// What follows from the values of a scene file's material, for the loader and for what describes files.
+/// Rules that derive program and state from a material's values, for the loader and the inspector.
 namespace orv::detail::glo
 {
 
@@ -26,7 +26,7 @@ inline bool isBlended(const StandardMaterial& material)
     return material.opacity < 1.0f && !(material.features & surface::CUTOFF);
 }
 
-/// Hands what the surfaces say to their materials.
+/// Copies the features of the SURF chunk to their materials.
 inline void applySurfaces(GloScene& scene)
 {
     for (const Surface& surface : scene.surfaces.list)
@@ -40,8 +40,8 @@ inline void applySurfaces(GloScene& scene)
     }
 }
 
-/// What an animated colour or level comes to: shader features and blending follow all that it reaches, not only
-/// what the file starts with.
+/// Notes a value that an animated colour or level takes: shader features and blending must fit all such values, not
+/// only the first.
 /// @param property  of the channel, "diffuse" or "opacity".
 inline void reach(StandardMaterial& material, std::string_view property, const Vector4f& value)
 {

@@ -9,9 +9,9 @@
 namespace orv::detail
 {
 
-/// Reads a scene file into plain records, checking every chunk against its size; makes nothing of them.
+/// Reads a scene file into plain records and checks every chunk against its size.
 ///
-/// One per load. Every failure is logged once, where it was met, and ends the reading.
+/// One per load. The first failure is logged and ends the reading.
 class GloReader
 {
 public:
@@ -23,7 +23,7 @@ public:
 
     glo::GloScene& scene() { return m_scene; }
 
-    // What glo::fields() asks for.
+    // The interface for glo::fields().
     glo::FileVersion version() const { return m_version; }
     bool acceptVersion(const std::string& text);
     bool acceptTool(const std::string& text);
@@ -54,7 +54,7 @@ private:
     enum class Opening
     {
         FAILED,
-        SKIPPED, ///< a chunk that was not asked for, or the end of the stream
+        SKIPPED, ///< another chunk, or the end of the stream
         OPENED
     };
 

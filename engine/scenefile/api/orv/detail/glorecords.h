@@ -12,8 +12,8 @@
 /// The content of a scene file as plain data, one record per kind of chunk. A record with an ID is a chunk of
 /// its own; the order of the fields in the file is that of glofields.h.
 ///
-/// Texts are at most 1023 characters. Angles are in radians, times in seconds. Names tie records together:
-/// nodes name geometries, skins, lights, cameras and materials, channels name what they move.
+/// Texts are at most 1023 characters. Angles are in radians, times in seconds. Records refer to each other by name:
+/// nodes to geometries, skins, lights, cameras and materials, channels to their targets.
 namespace orv::detail::glo
 {
 
@@ -40,7 +40,7 @@ struct VertexAttribute
     int32_t componentCount = 0;
     uint32_t type = type::FLOAT;
     int32_t offset = 0;     ///< bytes inside a vertex
-    int32_t stride = 0;     ///< bytes from one vertex to the next; 0 if nothing lies between
+    int32_t stride = 0;     ///< bytes from one vertex to the next; 0 if they are adjacent
     uint32_t normalize = 0; ///< flag; from 0.14.0
 };
 
@@ -147,12 +147,12 @@ struct Material
     std::vector<StandardMaterial> techniques; ///< the last one counts
 };
 
-/// What a material of the list has besides; readers that do not know the chunk pass over it.
+/// Further features of a material of the list; readers that do not know the chunk skip it.
 struct Surface
 {
-    uint32_t material = 0; ///< its place in the list of materials
+    uint32_t material = 0; ///< its index in the list of materials
     uint32_t features = 0; ///< bits of namespace surface
-    float cutoff = 0.5f;   ///< opacity below which CUTOFF leaves a pixel out
+    float cutoff = 0.5f;   ///< CUTOFF discards pixels of a lower opacity
 };
 
 struct Surfaces
@@ -237,9 +237,9 @@ struct Channel
     static constexpr uint32_t ID = chunkId("CHAN");
 
     std::string targetType;
-    std::string targetName; ///< "node-" in front of it counts for nothing
+    std::string targetName; ///< a leading "node-" is ignored
     std::string property;
-    uint32_t interpolation = interpolation::STEPPED; ///< whatever is not LINEAR is stepped
+    uint32_t interpolation = interpolation::STEPPED; ///< any value but LINEAR is stepped
     uint32_t coefficientCount = 0;
     uint32_t type = type::FLOAT;
     uint32_t keyCount = 0;
@@ -254,7 +254,7 @@ struct AnimationData
     static constexpr bool SKIP_UNKNOWN = false;
 
     std::string name;
-    std::vector<LoopRange> loopRanges; ///< of all in a file, the last one is the file's loop range
+    std::vector<LoopRange> loopRanges; ///< the last one in the file is its loop range
     std::vector<Channel> channels;
     std::vector<AnimationData> animations;
 };
@@ -275,7 +275,7 @@ struct SkinReference
 
     std::string skin;
     std::vector<std::string> materials;
-    std::vector<std::string> skeletons; ///< nodes below which joints are looked for first
+    std::vector<std::string> skeletons; ///< nodes below which joints are searched first
 };
 
 struct LightReference
@@ -298,7 +298,7 @@ struct NodeData
 
     std::string name;
     std::string scopedName;                  ///< from 0.14.0
-    Matrix4f transform = Matrix4f::IDENTITY; ///< from 0.12.0; counts until a component is set
+    Matrix4f transform = Matrix4f::IDENTITY; ///< from 0.12.0; used until a component is set
     Vector3f translation;
     Vector4f rotation = Vector4f(0.0f, 1.0f, 0.0f, 0.0f); ///< axis, then angle
     Vector3f scale = Vector3f(1.0f, 1.0f, 1.0f);

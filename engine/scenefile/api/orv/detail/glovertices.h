@@ -6,8 +6,7 @@
 #include <algorithm>
 #include <cstring>
 
-/// How the values of vertex attributes lie in a scene file's vertex data, for the loader and for what describes
-/// files.
+/// The layout of attributes in a scene file's vertex data, for the loader and the inspector.
 namespace orv::detail::glo
 {
 
@@ -25,14 +24,14 @@ constexpr uint32_t getComponentSize(AttribFormat format)
     return SIZES[size_t(format)];
 }
 
-/// A stride of 0 means that nothing lies between the vertices.
+/// A stride of 0 means adjacent vertices.
 inline uint32_t getStride(const VertexAttribute& attribute)
 {
     const uint32_t size = uint32_t(attribute.componentCount) * getComponentSize(getFormat(attribute.type));
     return attribute.stride > 0 ? uint32_t(attribute.stride) : size;
 }
 
-/// Whether every vertex's value lies in the data; then all reads below and in the GL are in bounds.
+/// Whether the values of all vertices are inside the data, so that all reads below and in GL are in bounds.
 inline bool isInside(const VertexAttribute& attribute, const VertexSet& vertices)
 {
     if (attribute.componentCount < 1 || attribute.componentCount > 4 || attribute.offset < 0 ||
@@ -45,7 +44,7 @@ inline bool isInside(const VertexAttribute& attribute, const VertexSet& vertices
     return uint64_t(attribute.offset) + lastVertex + size <= vertices.data.bytes.size();
 }
 
-/// Joint numbers are numbers, whatever the file says.
+/// Joint indices are never normalised, whatever the file says.
 inline bool isNormalised(const VertexAttribute& attribute, FileVersion version)
 {
     return attribute.name != "a_joints" && (!hasNormalizeFlag(version) || attribute.normalize != 0);
@@ -96,7 +95,7 @@ void forEachComponent(const VertexAttribute& attribute, const VertexSet& vertice
     }
 }
 
-/// One more than the highest joint number; one that is no number of a joint counts as too high.
+/// One more than the highest joint index; an invalid index counts as too high.
 inline int countJoints(const Geometry& geometry)
 {
     constexpr float LIMIT = 65535.0f;
