@@ -26,7 +26,7 @@ AssetCachePool::AssetCachePool()
     , m_texture2DCache(makeShared<Texture2DCache>())
     , m_textureCubeCache(makeShared<TextureCubeCache>())
     , m_vertexBufferCache(makeShared<VertexBufferCache>())
-    , m_fontCache(makeShared<FontCache>(m_texture2DCache)) // registers its loader itself
+    , m_fontCache(makeShared<FontCache>(m_texture2DCache)) // registers its own loader
     , m_meshCache(makeShared<MeshCache>(m_indexBufferCache, m_vertexBufferCache))
 {
     if (!m_assetPath || !areCachesComplete())

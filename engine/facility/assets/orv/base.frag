@@ -1,4 +1,4 @@
-// An unlit base for shader programs of one's own: fragment stage. The vertex stage says what the features mean.
+// An unlit base for your own shader programs: fragment stage. The vertex stage documents the features.
 
 #if !defined(TEXTURE) && !defined(COLOUR) && !defined(VERTEX_COLOUR)
 #define CLAY

@@ -1,15 +1,15 @@
-// An unlit base for shader programs of one's own: vertex stage.
+// An unlit base for your own shader programs: vertex stage.
 //
-// orv#base.sp feeds nothing to it: the mesh is then shown as a clay model, seen from its front (+z) and filling the
-// view at the size of -1 to 1. A program file of one's own names these two sources, declares the uniforms below, and
-// is asked for with the features it wants, as in mine.sp$TRANSFORM$TEXTURE:
+// orv#base.sp binds no uniforms: the mesh is drawn in clip space (-1 to 1) as a clay model, seen from its front (+z).
+// Your own program file names these two sources, declares the uniforms below, and is loaded with the features that it
+// needs, as in mine.sp$TRANSFORM$TEXTURE:
 //   TRANSFORM      u_t_modelViewProjection (T_MODEL_VIEW_PROJECTION): drawn where the scene has it
 //   TEXTURE        u_m_diffuseTexture (M_DIFFUSE_TEXTURE) and u_m_uvOffsetScale (M_UV_OFFSET_SCALE: offset u, offset v,
 //                  scale u, scale v)
 //   COLOUR         u_m_diffuseColour (M_DIFFUSE_COLOUR) and u_m_opacity (M_OPACITY)
 //   VERTEX_COLOUR  the mesh's a_colour
 // With TEXTURE, COLOUR or VERTEX_COLOUR the surface is their product, flat; without all three it is clay.
-// v counts upwards in meshes and downwards in pictures, so it is turned.
+// v is flipped, since it points up in meshes and down in pictures.
 
 #if !defined(TEXTURE) && !defined(COLOUR) && !defined(VERTEX_COLOUR)
 #define CLAY

@@ -1,5 +1,5 @@
-// Stands in for a program that could not be built: fragment stage. Unlit, so that it is seen in the dark too, and
-// opaque, whatever the material wanted.
+// Replaces a program that could not be built: fragment stage. Unlit, so that it is visible without lights, and always
+// opaque.
 
 precision mediump float;
 

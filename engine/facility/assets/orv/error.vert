@@ -1,5 +1,5 @@
-// Stands in for a program that could not be built: vertex stage. The mesh is drawn where it belongs, with the error
-// picture upright on it (v counts upwards in meshes and downwards in pictures).
+// Replaces a program that could not be built: vertex stage. The mesh is drawn in its place, with the error picture
+// upright on it (v points up in meshes and down in pictures).
 
 #ifdef GL_FRAGMENT_PRECISION_HIGH
 #define FINE highp

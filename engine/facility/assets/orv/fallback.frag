@@ -1,5 +1,5 @@
-// The plain material for whatever has no better one: fragment stage. Texture times light, plus highlights. The
-// opacity is M_OPACITY times the texture's alpha, straight, not premultiplied; the alphas of colours do not count.
+// The plain default material: fragment stage. Texture times light, plus highlights. The opacity is M_OPACITY times the
+// texture's alpha, straight, not premultiplied; the alphas of colours are ignored.
 
 precision mediump float;
 

@@ -1,8 +1,8 @@
-// The plain material for whatever has no better one: vertex stage. Ambient, diffuse and specular light of up to five
-// lights at each vertex, in world space, and one texture. It has no features to switch; max_pvl does.
+// The plain default material: vertex stage. Ambient, diffuse and specular light of up to five lights at each vertex, in
+// world space, and one texture. It has no features to switch; max_pvl does.
 //
-// The texture is moved and scaled by M_UV_OFFSET_SCALE (offset u, offset v, scale u, scale v); v counts upwards here
-// and downwards in GL, which has a picture's top row at 0, so v is turned.
+// The texture is moved and scaled by M_UV_OFFSET_SCALE (offset u, offset v, scale u, scale v); v is flipped: it points
+// up in meshes, but GL has a picture's top row at v = 0.
 
 #ifdef GL_FRAGMENT_PRECISION_HIGH
 #define FINE highp
@@ -40,8 +40,8 @@ uniform float u_m_specularLevel;
 uniform float u_m_shininess;
 
 varying FINE vec2 v_uv;
-varying mediump vec3 v_light;      // what the texture is multiplied with
-varying mediump vec3 v_highlights; // what comes on top of it
+varying mediump vec3 v_light;      // multiplied by the texture
+varying mediump vec3 v_highlights; // added to it
 
 // A zero vector, as a mesh with damaged normals has it, stays zero.
 vec3 safeNormalize(vec3 v)

@@ -1,6 +1,6 @@
-// A surface that fades into fog: fragment stage. The vertex stage says what the features mean.
+// A surface that fades into fog: fragment stage. The vertex stage documents the features.
 //
-// What is seen through the fog at a distance d is exp(-(density * d)^2) of the surface, the rest is fog.
+// At a distance d, exp(-(density * d)^2) of the colour is the surface's, the rest is fog.
 
 #ifdef GL_FRAGMENT_PRECISION_HIGH
 precision highp float;

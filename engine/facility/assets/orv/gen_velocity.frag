@@ -1,7 +1,7 @@
-// Draws how fast things move over the screen: fragment stage.
+// Draws velocities on the screen: fragment stage.
 //
-// A velocity is the way since the last frame as a part of the view's width and height (x right, y up), times
-// MOTION_BLUR_FACTOR and DELTA_TIME (which is 1 at 60 frames a second). The picture holds it as
+// A velocity is the movement since the last frame as a fraction of the view's width and height (x right, y up), times
+// MOTION_BLUR_FACTOR and DELTA_TIME (which is 1 at 60 frames a second). Its encoding:
 //   red, green  0.5 + 4 * velocity: up to an eighth of the view either way, longer ones shortened. The half is meant
 //               as 127 / 255, which eight bits hold exactly, so that what rests is not blurred
 //   blue        1; in a picture cleared to black, 0 says that nothing was drawn there
@@ -25,7 +25,7 @@ varying FINE vec3 v_before;
 void main()
 {
     vec2 velocity = vec2(0.0);
-    // What was behind the eye has no place on the screen to come from.
+    // A point that was behind the eye has no previous position on the screen.
     if (v_now.z > 0.0 && v_before.z > 0.0)
         velocity = (v_now.xy / v_now.z - v_before.xy / v_before.z) * (0.5 * u_blurFactor * u_deltaTime);
 

@@ -1,8 +1,8 @@
-// Draws how fast things move over the screen: vertex stage. It hands the vertex on where it is in this frame and where
-// it was in the last one; gen_velocity.frag describes the picture.
+// Draws velocities on the screen: vertex stage. It passes on the vertex's position in this frame and in the last one;
+// gen_velocity.frag describes the picture.
 //
-// With SKIN and joints the mesh is drawn in its pose, but the velocity is that of the solid as a whole: where the joints
-// were in the last frame is not known here. Without joints SKIN changes nothing.
+// With SKIN and joints the mesh is drawn in its pose, but the velocity is that of the whole solid: the joints' last
+// positions are not known here. Without joints SKIN has no effect.
 
 #ifdef GL_FRAGMENT_PRECISION_HIGH
 #define FINE highp
@@ -22,10 +22,10 @@ attribute vec4 a_weights;
 uniform mat4 u_t_viewProjection;
 uniform int u_j_count;
 uniform mat4 u_j_world[20];
-uniform float u_j_weightFilled; // 1 where GL has filled in the last weight: the mesh has fewer than four
+uniform float u_j_weightFilled; // 1 if GL supplies the last weight, since the mesh has fewer than four
 #endif
 
-// Clip coordinates x, y and w, divided for each pixel: divided here they would not interpolate rightly.
+// Clip coordinates x, y and w, divided for each pixel: divided here they would interpolate wrongly.
 varying FINE vec3 v_now;
 varying FINE vec3 v_before;
 

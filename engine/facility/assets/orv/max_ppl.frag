@@ -7,12 +7,12 @@
 //           + M_EMISSIVE_COLOUR * M_EMISSIVE_TEXTURE                                              (EMIS)
 //   gloss   = M_SPECULAR_COLOUR * M_SPECULAR_LEVEL * M_SPECULAR_LEVEL_TEXTURE * M_SPECULAR_TEXTURE
 //   opacity = M_OPACITY * alpha of M_DIFFUSE_TEXTURE where DIFF
-// The exponent of the highlights is M_SHININESS * M_GLOSS_TEXTURE; of this and of the level texture red counts, so they
-// need pictures of three or four channels. The alphas of the colours do not count. Colour and opacity are straight, not
-// premultiplied. Back faces are lit as the front of a sheet that faces the other way.
+// The exponent of the highlights is M_SHININESS * M_GLOSS_TEXTURE; the red channel of this and of the level texture is
+// used, so they need three or four channels. The alphas of the colours are ignored. Colour and opacity are straight,
+// not premultiplied. Back faces are lit from their own side.
 //
-// A device with the fewest uniforms that the language allows (16 vectors) has room for two lights here; with twice
-// that, and so nearly everywhere, there are five.
+// A device with the minimum of 16 uniform vectors has room for two lights here; with 32, as nearly all devices have,
+// there are five.
 
 #if defined(DIFF) || defined(SPEC)
 #define LIT
@@ -70,8 +70,8 @@ uniform vec3 u_l_spotDirection[LIGHTS]; // points back, from the lit place towar
 
 #ifdef SHADOW
 uniform sampler2D u_s_depths;
-// How many texels a soft edge reaches, 1.5; the map's side in one texel; 1 / 255, less than nothing for a light from
-// everywhere; which light it is.
+// The reach of a soft edge in texels, 1.5; 1 / the map's side in texels; 1 / 255, negative for a directional light; the
+// light's index.
 uniform vec4 u_s_map;
 
 varying FINE float v_shadowX;
@@ -171,8 +171,8 @@ float cone(float cosine, float inner, float outer)
 #endif
 
 #ifdef SHADOW
-// How much arrives of the light that throws shadows: nine texels of what it meets first, which holds distances in red,
-// green and blue, weighed so that edges are soft.
+// The unshadowed share of the shadowed light: a weighted mean over nine texels of the map, which holds distances in
+// red, green and blue.
 float arrivingShare()
 {
     float k = abs(u_s_map.z);

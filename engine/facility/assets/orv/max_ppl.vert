@@ -1,13 +1,13 @@
-// The standard material, lit at each pixel: vertex stage. It takes the surface to world space; see the fragment stage
-// for the light.
+// The standard material, lit at each pixel: vertex stage. It transforms the surface to world space; the fragment stage
+// lights it.
 //
-// Features are switched on by defines that stand in front of this text:
+// Features are switched on by defines before this source:
 //   DIFF SPEC AMBI REFL CUBE EMIS SKIN INVSQROOT VCOL CUTOFF LINEAR  as in max_pvl; BACK is always so, UNLIT not here
 //   BUMP  normals from M_BUMP_TEXTURE, in the space of a_tangent (along u), a_binormal (along v) and a_normal
 //   INVY  with BUMP: green points down in the picture, not up
 //
-// The texture is moved and scaled by M_UV_OFFSET_SCALE (offset u, offset v, scale u, scale v); v counts upwards here and
-// downwards in GL, which has a picture's top row at 0, so v is turned.
+// The texture is moved and scaled by M_UV_OFFSET_SCALE (offset u, offset v, scale u, scale v); v is flipped: it points
+// up in meshes, but GL has a picture's top row at v = 0.
 
 #if defined(DIFF) || defined(SPEC)
 #define LIT
@@ -57,7 +57,7 @@ attribute vec4 a_weights;
 
 uniform int u_j_count;
 uniform mat4 u_j_world[20];
-uniform float u_j_weightFilled; // 1 where GL has filled in the last weight: the mesh has fewer than four
+uniform float u_j_weightFilled; // 1 if GL supplies the last weight, since the mesh has fewer than four
 uniform mat4 u_t_model;
 uniform mat4 u_t_viewProjection;
 #else
@@ -84,14 +84,14 @@ varying mediump vec3 v_binormal;
 #endif
 
 #ifdef SHADOW
-// One light is kept back by what lies in its way; see max_pvl.
+// One light has shadows; see max_pvl.
 uniform vec4 u_s_rowX; // from the world to the shadow map
 uniform vec4 u_s_rowY;
 uniform vec4 u_s_rowDepth;
 uniform vec4 u_s_light; // w 0: directional, xyz points towards the light
-uniform float u_s_offset; // how far surfaces are held off their own shadow; below nothing for each unit of depth
+uniform float u_s_offset; // of lookups along the normal; if negative, for each unit of depth
 
-varying FINE float v_shadowX; // single ones, which fit where pairs do not
+varying FINE float v_shadowX; // single ones, which can be packed better than pairs
 varying FINE float v_shadowY;
 varying FINE float v_shadowDepth;
 #endif // SHADOW

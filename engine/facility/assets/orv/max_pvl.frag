@@ -1,6 +1,6 @@
-// The standard material, lit at each vertex: fragment stage. The vertex stage says what the features mean.
+// The standard material, lit at each vertex: fragment stage. The vertex stage documents the features.
 //
-// Light that arrives from the vertices is multiplied with the textures:
+// The vertices' light is multiplied by the textures:
 //   colour  = diffuse light * M_DIFFUSE_TEXTURE                                    (DIFF)
 //           + ambient light * M_AMBIENT_TEXTURE * M_DIFFUSE_TEXTURE where DIFF     (AMBI)
 //           + highlights * gloss                                                   (SPEC)
@@ -8,7 +8,7 @@
 //           + M_EMISSIVE_COLOUR * M_EMISSIVE_TEXTURE                               (EMIS)
 //   gloss   = M_SPECULAR_COLOUR * M_SPECULAR_LEVEL * M_SPECULAR_TEXTURE
 //   opacity = M_OPACITY * alpha of M_DIFFUSE_TEXTURE where DIFF
-// The alphas of the colours do not count. Colour and opacity are straight, not premultiplied.
+// The alphas of the colours are ignored. Colour and opacity are straight, not premultiplied.
 
 precision mediump float;
 
@@ -43,8 +43,8 @@ varying mediump vec2 v_uv;
 
 #ifdef SHADOW
 uniform sampler2D u_s_depths;
-// How many texels a soft edge reaches, 1.5; the map's side in one texel; 1 / 255, less than nothing for a light from
-// everywhere; which light it is.
+// The reach of a soft edge in texels, 1.5; 1 / the map's side in texels; 1 / 255, negative for a directional light; the
+// light's index.
 uniform highp vec4 u_s_map;
 
 varying highp float v_shadowX;
@@ -110,8 +110,8 @@ varying mediump vec2 v_reflection;
 #endif
 
 #ifdef SHADOW
-// How much arrives of the light that throws shadows: nine texels of what it meets first, which holds distances in red,
-// green and blue, weighed so that edges are soft.
+// The unshadowed share of the shadowed light: a weighted mean over nine texels of the map, which holds distances in
+// red, green and blue.
 float arrivingShare()
 {
     highp float k = abs(u_s_map.z);

@@ -1,6 +1,6 @@
 // The standard material, lit at each vertex: vertex stage.
 //
-// Features are switched on by defines that stand in front of this text:
+// Features are switched on by defines before this source:
 //   DIFF       diffuse light on M_DIFFUSE_COLOUR, and M_SELF_ILLUMINATION as light of the surface's own
 //   SPEC       highlights (half-vector model, exponent M_SHININESS)
 //   AMBI       M_AMBIENT_COLOUR in the sum of all L_AMBIENT_COLOUR
@@ -17,10 +17,10 @@
 //              then a steep end, as the lamps of some authoring tools have it
 //
 // Lighting is done in world space. The texture is moved and scaled by M_UV_OFFSET_SCALE (offset u, offset v, scale
-// u, scale v); v counts upwards here and downwards in GL, which has a picture's top row at 0, so v is turned.
+// u, scale v); v is flipped: it points up in meshes, but GL has a picture's top row at v = 0.
 //
-// Everything together fits the 128 uniform vectors that every device has, literals included: they may count as one
-// each, so there are few.
+// All features together fit into the 128 uniform vectors that every device has, including literals, each of which may
+// count as one.
 
 #ifdef UNLIT
 #undef SPEC
@@ -68,7 +68,7 @@ attribute vec4 a_weights;
 
 uniform int u_j_count;
 uniform mat4 u_j_world[20];
-uniform float u_j_weightFilled; // 1 where GL has filled in the last weight: the mesh has fewer than four
+uniform float u_j_weightFilled; // 1 if GL supplies the last weight, since the mesh has fewer than four
 uniform mat4 u_t_model;
 uniform mat4 u_t_viewProjection;
 #else
@@ -83,7 +83,7 @@ uniform mat3 u_t_normalModel;
 uniform vec4 u_m_uvOffsetScale;
 
 #ifdef SHADOW
-varying FINE float v_u; // single ones, which fit where pairs do not
+varying FINE float v_u; // single ones, which can be packed better than pairs
 varying FINE float v_v;
 #else // SHADOW
 varying FINE vec2 v_uv;
@@ -91,18 +91,18 @@ varying FINE vec2 v_uv;
 #endif
 
 #ifdef SHADOW
-// One light is kept back by what lies in its way. What is for that is not in liborv but beside it, in programs called
-// shadow#..., for ShadowMap. With SHEET the surface is seen from both sides.
+// One light has shadows. This code is not in liborv but in liborvextra, in the programs shadow#... of ShadowMap. With
+// SHEET the surface is visible from both sides.
 uniform vec4 u_s_rowX; // from the world to the shadow map
 uniform vec4 u_s_rowY;
 uniform vec4 u_s_rowDepth;
-uniform float u_s_offset; // how far surfaces are held off their own shadow; below nothing for each unit of depth
+uniform float u_s_offset; // of lookups along the normal; if negative, for each unit of depth
 uniform float u_s_index; // of the light
 
 varying FINE float v_shadowX;
 varying FINE float v_shadowY;
 varying FINE float v_shadowDepth;
-// What that light gives to the front or, below nothing and with BACK, to the back.
+// That light's contribution to the front or, if negative and with BACK, to the back.
 #ifdef DIFF
 varying mediump vec3 v_shadowDiffuse;
 #endif
@@ -191,7 +191,7 @@ mat4 worldTransform()
            u_j_world[int(joints.z)] * weights.z + u_j_world[int(joints.w)] * weights.w;
 }
 
-// What a normal is multiplied by: the inverse transpose of the transform's upper 3x3, but for a positive factor.
+// The matrix for normals: the inverse transpose of the transform's upper 3x3, up to a positive factor.
 mat3 normalTransform(mat4 transform)
 {
     vec3 x = (transform * vec4(1.0, 0.0, 0.0, 0.0)).xyz;
@@ -223,7 +223,7 @@ float cone(float cosine, float inner, float outer)
 #endif
 
 #if defined(REFL) && !defined(CUBE)
-// Where a sphere map shows what lies in a direction of eye space.
+// The sphere map coordinates of a direction in eye space.
 vec2 sphereMap(vec3 direction)
 {
     vec2 middle = safeNormalize(direction + vec3(0.0, 0.0, 1.0)).xy;

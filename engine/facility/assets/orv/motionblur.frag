@@ -2,9 +2,9 @@
 //
 // M_SHARP_TEXTURE     the scene as it is
 // M_VELOCITY_TEXTURE  coded as gen_velocity.frag says; black is rest. May be smaller than the sharp picture
-// A pixel becomes the mean of those along its velocity, with itself in the middle, 17 at most; those beyond the edge of
-// the view do not count. What rests stays as it is, to the bit.
-// STEREO: the left half of both pictures is the left eye's view, the right half the right eye's.
+// A pixel becomes the mean of at most 17 samples along its velocity, centred on itself; samples outside the view are
+// left out. Pixels at rest are unchanged, to the bit. STEREO: the left half of both pictures is the left eye's view,
+// the right half the right eye's.
 
 #ifdef GL_FRAGMENT_PRECISION_HIGH
 precision highp float;
@@ -24,7 +24,7 @@ void main()
     vec3 code = texture2D(u_m_velocityTexture, v_uv).rgb;
     vec4 sharp = texture2D(u_m_sharpTexture, v_uv);
 
-    // Both terms fade alike where a smaller picture is interpolated between what was drawn and black.
+    // Both terms fade alike where a smaller picture is interpolated between objects and black.
     vec2 velocity = code.rg - code.b * (127.0 / 255.0);
     if (max(abs(velocity.x), abs(velocity.y)) < 0.25 / 255.0)
     {
@@ -40,8 +40,8 @@ void main()
     low.x = 0.5 * step(0.5, v_uv.x);
     high.x = low.x + 0.5;
 #endif
-    // Not nearer than the middle of the outermost pixels: a filter would mix in what is beyond the edge. The little bit
-    // less is for rounding. The size of a pixel follows from where this one is.
+    // Samples end at the centre of the outermost pixels, minus a margin for rounding: filtering would mix in texels
+    // beyond the edge. The pixel size follows from this pixel's position.
     vec2 pixel = v_uv / gl_FragCoord.xy;
     low += 0.49 * pixel;
     high -= 0.49 * pixel;

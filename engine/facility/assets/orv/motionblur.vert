@@ -1,7 +1,7 @@
 // Composes a sharp picture and the velocities of orv#gen_velocity.sp into a blurred one: vertex stage.
 //
 // Draw it with the built-in square (corners at -0.5 and 0.5), which then fills the viewport, wherever camera and solid
-// are. Both textures are render targets, which have their lower row first: v is not turned.
+// are. Both textures are render targets, which have their bottom row first, so v is not flipped.
 
 #ifdef GL_FRAGMENT_PRECISION_HIGH
 #define FINE highp

@@ -1,4 +1,4 @@
-// A surface with rings of waves around its middle: fragment stage. The vertex stage says what the features mean.
+// A surface with rings of waves around its middle: fragment stage. The vertex stage documents the features.
 
 #ifdef GL_FRAGMENT_PRECISION_HIGH
 precision highp float;

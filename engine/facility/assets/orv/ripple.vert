@@ -1,8 +1,8 @@
 // A surface with rings of waves around its middle: vertex stage.
 //
-// orv#ripple.sp feeds nothing to it: the mesh is then seen from its front (+z), filling the view at the size of -1 to 1,
-// as standing waves on blue water. A program file of one's own names these two sources, declares the uniforms below,
-// and is asked for with the features it wants, as in mine.sp$TRANSFORM$ANIMATED:
+// orv#ripple.sp binds no uniforms: the mesh is drawn in clip space (-1 to 1), seen from its front (+z), as standing
+// waves on blue water. Your own program file names these two sources, declares the uniforms below, and is loaded with
+// the features that it needs, as in mine.sp$TRANSFORM$ANIMATED:
 //   TRANSFORM  u_t_modelViewProjection (T_MODEL_VIEW_PROJECTION): drawn where the scene has it
 //   TEXTURE    u_m_diffuseTexture (M_DIFFUSE_TEXTURE) and u_m_uvOffsetScale (M_UV_OFFSET_SCALE: offset u, offset v,
 //              scale u, scale v): a picture, bent by the waves, instead of blue

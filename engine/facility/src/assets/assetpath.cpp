@@ -60,7 +60,7 @@ SharedPtr<Stream> AssetPath::find(const char* name) const
 {
     if (!name || !LoadScope::mayRead())
         return {};
-    // By number and with a share of its own: a source that is asked may add and remove sources.
+    // By index, each source held: opening a stream may add and remove sources.
     for (std::size_t i = 0; i < m_sources.size(); ++i)
     {
         const SharedPtr<StreamSource> entry = m_sources[i];

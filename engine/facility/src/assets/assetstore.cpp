@@ -78,8 +78,8 @@ void AssetStore::addLoader(const SharedPtr<Shared>& loader)
 
 void AssetStore::flush()
 {
-    // An asset may be held under several names (the error program is), so all of the cache's own references are
-    // taken off before the count says whether anybody else holds it.
+    // An asset may be held under several names (like the error program), so all of the cache's own references are
+    // subtracted to see whether others hold it.
     std::map<const Shared*, int32_t> others;
     const auto takeOff = [&others](const SharedPtr<Shared>& asset)
     { --others.try_emplace(asset.get(), asset ? asset->sharedGetCount() : 0).first->second; };
@@ -117,7 +117,7 @@ SharedPtr<Stream> AssetStore::getStream(const char* name) const
 
 SharedPtr<Stream> openCacheStream(const SharedPtr<StreamSource>& cacheSource, const char* name, bool writable)
 {
-    SharedPtr<StreamSource> source; // holds what may be replaced while it is asked
+    SharedPtr<StreamSource> source; // keeps the source alive: opening may replace it
     source = cacheSource;
     if (!source)
         return {};

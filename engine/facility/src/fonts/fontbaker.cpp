@@ -2,8 +2,8 @@
 
 #include "orv/detail/fonttables.h"
 
-// The one place where stb_truetype becomes code: everything static. Its assertions must not stop the program; what
-// they ask for of the file is made sure of before the file gets there.
+// The only source that implements stb_truetype, all static. Its assertions must not stop the program; their conditions
+// on the file are checked before.
 #define STB_TRUETYPE_IMPLEMENTATION
 #define STBTT_STATIC
 #define STBTT_assert(condition) ((void)0)
@@ -24,7 +24,7 @@ namespace
 
 const int MAX_SIZE = 8192; ///< pixels, far above what fits the atlas
 const int MAX_GLYPH_WIDTH = BakedFont::WIDTH - 2;
-const int MAX_HEIGHT = 16384; ///< the rasteriser keeps places in 16 bits
+const int MAX_HEIGHT = 16384; ///< the rasteriser keeps positions in 16 bits
 
 /// Where glyphs go: from left to right, row below row.
 class Packing
@@ -71,7 +71,7 @@ struct Box
     }
 };
 
-/// What outlines cost to draw, added up over glyphs.
+/// The cost of drawing outlines, summed over glyphs.
 class Cost
 {
 public:
@@ -99,7 +99,7 @@ public:
                 edges += countHalves(from, to, scale);
             }
             isNear = isNear && limits.contains(reach);
-            // A step for each pixel along the way; what leaves the box is looked for in all pixels of a row.
+            // A step for each pixel along an edge; outside the box, for each pixel of a row.
             const float rows = float(reach.getHeight()) * scale + 1.0f;
             m_steps += box.contains(reach) ? rows + float(reach.getWidth()) * scale
                                            : rows * (float(box.getWidth()) * scale + 1.0f);
@@ -134,13 +134,13 @@ private:
     float m_steps = 0.0f;
 };
 
-/// Finds the bitmap's height by packing all glyphs, and that they can be drawn at a bearable price.
+/// Finds the bitmap's height by packing all glyphs, and checks their cost.
 /// @return null, or why not.
 const char* findHeight(const stbtt_fontinfo& font, std::size_t fileSize, float scale, int maxHeight,
                        int& height)
 {
     Packing described(2);
-    Packing rasterisers(1); // closer, which can make rows higher
+    Packing rasterisers(1); // packs closer, which can make rows higher
     Cost cost(fileSize);
     int needed = 0;
     for (int i = 0; i < BakedFont::CHAR_COUNT; ++i)

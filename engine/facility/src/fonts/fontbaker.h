@@ -24,11 +24,11 @@ struct BakedFont
     std::array<Font::CharacterData, CHAR_COUNT> characters;
 };
 
-/// Draws a TrueType file's characters. Whatever the file holds, nothing outside of it is read, and no memory is
-/// taken before it is known that the characters fit.
+/// Draws a TrueType file's characters. Any file is safe: nothing outside of it is read, and memory is allocated only if
+/// the characters fit.
 /// @param pixelSize  from the top of a line to its bottom.
 /// @param maxHeight  of the bitmap.
-/// @return null, or, with font unchanged, why it cannot be done.
+/// @return null, or the reason of failure; font is unchanged then.
 const char* bakeFont(const unsigned char* file, std::size_t size, int pixelSize, int maxHeight,
                      BakedFont& font);
 

@@ -22,11 +22,11 @@ private:
     uint32_t findGlyphInSegments(unsigned c);
     uint32_t findGlyphInGroups(unsigned c);
 
-    FontBytes m_map; ///< the one of its subtables that is read
+    FontBytes m_map; ///< the subtable that is read
     unsigned m_mapFormat = 0;
 };
 
-/// Takes the last map of a kind that the rasteriser knows: Unicode, by either of two platforms.
+/// Uses the last map of a kind that the rasteriser knows: Unicode, of either of two platforms.
 bool CharacterTables::findCharacterMap()
 {
     const unsigned UNICODE = 0, MICROSOFT = 3, MICROSOFT_BMP = 1, MICROSOFT_FULL = 10;
@@ -70,7 +70,7 @@ uint32_t CharacterTables::findGlyph(unsigned c)
     }
 }
 
-/// Format 4, by the very steps of the rasteriser: it believes what the file says about the search.
+/// Format 4, with exactly the rasteriser's steps: it trusts the file's search parameters.
 uint32_t CharacterTables::findGlyphInSegments(unsigned c)
 {
     const std::size_t ENDS = 14;

@@ -70,7 +70,7 @@ void Bindings::forget()
     std::fill(std::begin(m_textures), std::end(m_textures), UNKNOWN);
 }
 
-/// What is left on would be read by the application's own draws, from buffers that may be gone by then.
+/// Arrays left enabled would be read by the application's own draws, perhaps from deleted buffers.
 void Bindings::tidy()
 {
     if (!m_isUsed)

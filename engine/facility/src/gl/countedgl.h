@@ -1,6 +1,6 @@
 #pragma once
 
-// Stands for <GLES2/gl2.h> in the engine: each call of GL adds one to a number, and is otherwise what it was.
+// Replaces <GLES2/gl2.h> in the engine: each GL call also increments a counter.
 
 #include <GLES2/gl2.h>
 
@@ -9,7 +9,7 @@
 namespace orv::detail
 {
 
-/// What calls of GL are counted as; draws are counted by their primitive.
+/// The kinds by which GL calls are counted; draws are counted by primitive.
 enum class GlKind
 {
     UNIFORM,

@@ -47,7 +47,7 @@ constexpr GLenum GL_STENCIL_FACES[std::size(STENCIL_FACES)] = {GL_BACK, GL_FRONT
 
 /// @param what      the enum, for the message.
 /// @param function  the name that the message bears.
-/// @return the table's value, or GL_INVALID_ENUM, logged, for what lies outside of the enum.
+/// @return the table's value, or GL_INVALID_ENUM (logged) for a value outside of the enum.
 template <class Enum, std::size_t N>
 GLenum toGL(const GLenum (&table)[N], Enum value, const char* what, const char* function)
 {
@@ -90,7 +90,7 @@ RenderContext::DrawScope::~DrawScope()
 
 RenderContext::RenderContext() : m_revision(detail::nextRevision())
 {
-    // Where a new GL context differs from a new material.
+    // The differences between a new GL context and a new material.
     m_state.cullingMode = CullingMode::CULL_NONE;
     m_state.depthTestEnabled = false;
 
@@ -224,7 +224,7 @@ void RenderContext::setDepthOffset(float factor, float units)
 
     if (previousFactor == 0.0f && previousUnits == 0.0f)
         glEnable(GL_POLYGON_OFFSET_FILL);
-    // One change behind, as promised in the header.
+    // The values of the previous change, as documented.
     glPolygonOffset(previousFactor, previousUnits);
 }
 
@@ -402,7 +402,7 @@ void RenderContext::applyChanged(const RenderState& state, uint64_t stateRevisio
     for (int i = 0; i < STENCIL_FACE_COUNT; ++i)
     {
         const auto face = StencilFace(i);
-        // The write mask twice, as promised in the header.
+        // The write mask twice, as documented.
         setStencilFunction(face, state.stencilFunction[i], state.stencilReference[i],
                            state.stencilWriteMask[i]);
         setStencilOperations(face, state.stencilFailOperation[i], state.stencilDepthFailOperation[i],

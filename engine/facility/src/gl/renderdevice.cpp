@@ -102,7 +102,7 @@ bool RenderDevice::getSurfaceSize(int& width, int& height)
 void RenderDevice::getPixels(int x, int y, unsigned width, unsigned height, unsigned char* pixels)
 {
     const int alignment = getInteger(GL_PACK_ALIGNMENT);
-    const bool wouldPad = alignment > 4; // rows beyond the caller's memory; only an application sets it
+    const bool wouldPad = alignment > 4; // would write beyond the caller's memory; only applications set it
     if (wouldPad)
         glPixelStorei(GL_PACK_ALIGNMENT, 4);
     glReadPixels(x, y, GLsizei(width), GLsizei(height), GL_RGBA, GL_UNSIGNED_BYTE, pixels);

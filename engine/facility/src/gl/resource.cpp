@@ -36,7 +36,7 @@ bool GlResource::deallocate()
     if (m_state != ALLOCATED)
         return false;
     doDeallocate(m_name);
-    bindingsChanged(); // GL unbinds what it deletes, and may hand the name out again
+    bindingsChanged(); // GL unbinds deleted objects, and may reuse the name
     m_name = 0;
     m_state = DEALLOCATED;
     return true;
@@ -126,7 +126,7 @@ void TextureResource::doDeallocate(unsigned int name)
 
 ResourceCache::~ResourceCache()
 {
-    // Each resource that dies with its GL object asserts. One record will do; of the others it is said how many.
+    // Each resource that dies with its GL object asserts: one record, and the number of the others.
     int lost = 0;
     for (const SharedPtr<Resource>& resource : m_resources)
     {

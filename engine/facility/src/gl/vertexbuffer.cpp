@@ -185,8 +185,8 @@ const AttribRecord* VertexBuffer::findAttrib(const char* name) const
     return found != m_attribs.end() ? &*found : nullptr;
 }
 
-/// @return false if GL has no memory for it: a draw from a buffer without data would read from anywhere, so the
-/// buffer is lost.
+/// @return false if GL has no memory: drawing from a buffer without data would read arbitrary memory, so the buffer
+/// counts as lost.
 bool VertexBuffer::upload(const unsigned char* data, unsigned int size)
 {
     RenderDevice::getError(false);
@@ -206,8 +206,8 @@ void VertexBuffer::attribsChanged()
     const detail::AttribRecord* weights = findAttrib("a_weights");
     m_lacksLastWeight = weights && weights->componentCount < 4;
     for (Plan& plan : m_plans)
-        plan.programRevision = 0; // 0 is no program's; the records that it points to may have moved
-    m_nextPlan = 0;               // whose memory serves again
+        plan.programRevision = 0; // of no program: the plan's records may have moved
+    m_nextPlan = 0;               // their memory is reused
 }
 
 } // namespace orv

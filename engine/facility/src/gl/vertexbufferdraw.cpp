@@ -1,4 +1,4 @@
-// What a vertex buffer does for each draw; the rest of the class is in vertexbuffer.cpp.
+// The draw path of VertexBuffer; the rest of the class is in vertexbuffer.cpp.
 
 #include "orv/vertexbuffer.h"
 
@@ -20,7 +20,7 @@ using detail::AttribRecord;
 using detail::hasValidFormat;
 using detail::STORED;
 
-/// Whether GL can be given this attribute: it has values somewhere, and GL would take the description.
+/// Whether GL can use this attribute: it has values, and a valid description.
 bool isDrawable(const AttribRecord& record, GLuint buffer)
 {
     if (!record.array && (buffer == 0 || record.usage != STORED))
@@ -28,7 +28,7 @@ bool isDrawable(const AttribRecord& record, GLuint buffer)
     return hasValidFormat(record);
 }
 
-/// The buffer to bind for it: values that are still in memory are drawn from there.
+/// The buffer to bind for it: 0 if its values are still in memory.
 GLuint getSourceBuffer(const AttribRecord& record, GLuint buffer)
 {
     return record.array ? 0 : buffer;

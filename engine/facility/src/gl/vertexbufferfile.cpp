@@ -32,7 +32,7 @@ const int RECORD_SIZE = 56;
 const int NAME_SIZE = 16;
 
 /// Bytes 0 to 23 are the name: a zero-terminated text of at most 15 characters, its end position and its start
-/// position (always 0). 28 to 31 and 52 to 55 held pointers once and are 0.
+/// position (always 0). 28 to 31 and 52 to 55 are 0.
 void writeRecord(const AttribRecord& record, unsigned char* out)
 {
     std::memset(out, 0, RECORD_SIZE);
@@ -46,7 +46,7 @@ void writeRecord(const AttribRecord& record, unsigned char* out)
     writeLittleEndian(out + 48, record.usage);
 }
 
-/// @return false if it cannot be an attribute of size bytes of data.
+/// @return false if it does not fit into size bytes of data.
 bool readRecord(const unsigned char* in, unsigned int size, AttribRecord& record)
 {
     if (!std::memchr(in, 0, NAME_SIZE))

@@ -255,8 +255,7 @@ void Appearance::linkShaderProgram()
         if (found == m_properties.end())
             continue;
         found->second.uniformIndex = i;
-        m_values[std::size_t(i)] =
-            found->second.uniform.get(); // each of several that ask for one property gets it
+        m_values[std::size_t(i)] = found->second.uniform.get(); // several uniforms may share it
     }
     m_sources.revision = 0;
     m_linked = true;

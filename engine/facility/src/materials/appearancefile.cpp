@@ -113,10 +113,10 @@ private:
 
     float readNumber() { return readFloat(m_text, 0.0f); }
 
-    // Braces, here and below, because they read the arguments in the order of the file.
+    // Braces here and below guarantee the order in which arguments are read.
     Vector4f readVector4() { return Vector4f{readNumber(), readNumber(), readNumber(), readNumber()}; }
 
-    /// Most caches say nothing of files that are not there.
+    /// Most caches log nothing for missing files.
     template <class Cache>
     auto readAsset(Cache& cache)
     {
@@ -241,7 +241,7 @@ private:
     const char* m_name;
     CharRange m_text;
     unsigned m_missingCount = 0;
-    const char* m_firstMissing = nullptr; ///< in the text
+    const char* m_firstMissing = nullptr; ///< points into the text
 };
 
 const AppearanceFileReader::StatementKind AppearanceFileReader::STATEMENTS[] = {

@@ -37,7 +37,7 @@ Mesh::~Mesh() = default;
 
 Vector4f Mesh::makeSphere(const Bounds& bounds)
 {
-    constexpr float ROUNDING = 1.0001f; // of chains of transforms, too
+    constexpr float ROUNDING = 1.0001f; // also of chains of transforms
     if (!bounds.isKnown())
         return Vector4f(0.0f, 0.0f, 0.0f, -std::numeric_limits<float>::infinity());
     return Vector4f(bounds.box.getCentre(), -bounds.radius * ROUNDING);

@@ -42,7 +42,7 @@ void ContextProperties::link(SharedPtr<ShaderUniformBase>& uniform, const char* 
 
 } // namespace detail
 
-// Here, since the floor of the render context knows nothing of uniforms.
+// Here, since the floor of RenderContext is below that of uniforms.
 
 void RenderContext::addProperty(const SharedPtr<ShaderUniformBase>& property, const char* name)
 {

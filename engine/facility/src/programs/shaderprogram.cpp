@@ -35,8 +35,7 @@ SharedPtr<ShaderUniformBase> makeHolder(int size)
     return makeShared<ShaderUniform<T>>(size);
 }
 
-/// How a GL uniform type is held. Samplers have a target in place of a holder: keeping the texture that was sent
-/// last would keep it alive.
+/// How a GL uniform type is held. Samplers have a target instead of a holder, which would keep the texture alive.
 struct UniformType
 {
     GLenum glType;
@@ -65,7 +64,7 @@ constexpr UniformType UNIFORM_TYPES[] = {
     {GL_SAMPLER_EXTERNAL_OES, nullptr, GL_TEXTURE_EXTERNAL_OES},
 };
 
-/// Whether a renderer can send the source's transform to the uniform without a look at either.
+/// Whether a renderer can send the source's transform to the uniform without further checks.
 bool takesTransform(const detail::DrawnUniform& uniform, const ShaderUniformBase& source,
                     const detail::UniformSources& sources)
 {
@@ -174,7 +173,7 @@ void ShaderProgram::setSamplerUnits() const
         if (uniform.textureUnit >= 0)
             ShaderUniformPrivate::setSamplerUnits(uniform.location, uniform.textureUnit, uniform.size);
     }
-    // A program that was deleted while in use is gone now.
+    // A program deleted while in use does not exist any more.
     glUseProgram(glIsProgram(GLuint(previous)) ? GLuint(previous) : 0);
     detail::bindingsChanged();
 }
@@ -275,7 +274,7 @@ Vector4f* ShaderProgram::getSentVector(const Uniform& uniform, const ShaderUnifo
 
 void ShaderProgram::resolve(const ShaderUniformBase* const* values, detail::UniformSources& sources)
 {
-    // There is one bit for each uniform; beyond 64 of them, each is looked at for every material.
+    // One bit for each uniform; with more than 64, each is checked for every material.
     const bool isLarge = m_uniforms.size() > 64;
     std::vector<detail::UniformSources::Value> others;
     sources.values.clear();
@@ -322,7 +321,7 @@ void ShaderProgram::enableUniforms()
         if (uniform.textureUnit < 0)
         {
             uniform.sent->enable(source, uniform.location, uniform.textureUnit, false);
-            uniform.sentRevision = 0; // the draw path is to compare again
+            uniform.sentRevision = 0; // makes the draw path compare again
             continue;
         }
         const GLuint texture = source ? detail::getTextureName(*source, uniform.textureTarget) : 0;

@@ -83,7 +83,7 @@ bool isLinked(GLuint program)
     return linked;
 }
 
-/// @return false, after a message, if they do not go together.
+/// @return false, after a message, if linking fails.
 bool link(const ProgramResource& program, const ShaderResource& vertex, const ShaderResource& fragment)
 {
     glAttachShader(program.getId(), vertex.getId());
@@ -125,7 +125,7 @@ SharedPtr<ShaderProgram> ShaderProgramCache::create(const char* vertexSource, co
         fragment = makeShader(resources, ShaderResource::Kind::FRAGMENT, fragmentSource);
     if (!fragment || !link(*program, *vertex, *fragment))
     {
-        // What is left of a program that failed; what a linked one leaves goes with the next flush().
+        // Delete at once what belongs to a failed program; shaders of a linked one wait for the next flush().
         program->deallocate();
         if (vertex)
             vertex->deallocate();
@@ -157,7 +157,7 @@ SharedPtr<ShaderProgram> ShaderProgramCache::create(unsigned int length, unsigne
         programBinary(program->getId(), format, binary, int(length));
     if (!isLinked(program->getId()))
     {
-        RenderDevice::getError(false); // the driver's complaint, which this message stands for
+        RenderDevice::getError(false); // clears the driver's error, which this message reports
         ORV_LOG_ERROR("ShaderProgram binary load failed");
         program->deallocate();
         return {};

@@ -1,4 +1,4 @@
-// What a shader program does for each draw; the rest of the class is in shaderprogram.cpp.
+// The draw path of ShaderProgram; the rest of the class is in shaderprogram.cpp.
 
 #include "shaderprogramdraw.h"
 
@@ -15,7 +15,7 @@ int detail::g_boundAttribCount = 0;
 
 void ShaderProgram::link(RenderContext& context)
 {
-    // No two contexts ever have the same property revision, so it stands for the context as well.
+    // Property revisions are unique, so they identify the context as well.
     if (m_linkedRevision != context.getPropertyRevision()) [[unlikely]]
         linkAnew(context);
 }
@@ -32,7 +32,7 @@ void lookUpNames(detail::UniformSources& sources)
 
 } // namespace
 
-/// A colour, as a rule: what a change of material mostly is.
+/// Usually a colour, the most common change of a material.
 inline void ShaderProgram::sendVector(const detail::UniformSources::Value& value)
 {
     const Vector4f& now = *static_cast<const ShaderUniform<Vector4f>*>(value.source)->values();
@@ -88,7 +88,7 @@ inline bool ShaderProgram::isReady(const RenderContext& context, const detail::U
     detail::Bindings& bindings = context.getBindings();
     bindings.useProgram(program);
     bindings.setCurrentProgram(m_handle);
-    if (bindings.isScopeOpen()) // outside, the application may bind what it likes before the next draw
+    if (bindings.isScopeOpen()) // outside, the application may change bindings in between
         bindings.setProgramReady(m_revision);
     link(context);
     if (sources.revision != m_sourcesRevision)
@@ -125,7 +125,7 @@ void ShaderProgram::sendHeldTransform(const detail::UniformSources& sources, det
 void ShaderProgram::sendTransform(detail::DrawnUniform& uniform, const Matrix4f& matrix)
 {
     Matrix4f& sent = *static_cast<ShaderUniform<Matrix4f>&>(*uniform.sent.get()).values();
-    // The translation first: it differs most.
+    // The translation first: it differs most often.
     if (sent.columns[3] == matrix.columns[3] && sent == matrix)
         return;
     sent = matrix;

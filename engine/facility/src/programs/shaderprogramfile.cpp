@@ -66,7 +66,7 @@ bool ShaderProgramFile::read(CharRange text, const char* name)
 
 void ShaderProgramFile::readUniform(CharRange& text, char* lineEnd, const char* name)
 {
-    // Both names stand on the line of the tag; otherwise the word below would be taken for the missing one.
+    // Both names must be on the tag's line; otherwise the next line's word would replace a missing one.
     CharRange line{text.start, std::max(text.start, lineEnd)};
     const std::string uniform = toString(readToken(line));
     const std::string property = toString(readToken(line));

@@ -9,16 +9,16 @@
 namespace orv::detail
 {
 
-/// What a ".sp" file says.
+/// The contents of a ".sp" file.
 struct ShaderProgramFile
 {
     std::string vertexSource; ///< asset name
     std::string fragmentSource;
     std::map<std::string, std::string, std::less<>> properties; ///< property name by GLSL uniform name
 
-    /// @param text  the whole file; it is taken apart in place.
+    /// @param text  the whole file; modified in place.
     /// @param name  the file's name, for messages.
-    /// @return false, after logging why, if the text is no such file.
+    /// @return false, after logging why, if the text is not valid.
     bool read(CharRange text, const char* name);
 
 private:

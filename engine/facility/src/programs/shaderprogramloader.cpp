@@ -26,7 +26,7 @@ using detail::DigestMaker;
 
 const char* const ERROR_PROGRAM = "orv#error.sp";
 const uint32_t BINARY_VERSION = 1;
-const std::size_t PROGRAM_BYTES = 4096; ///< of source that even an empty program counts as
+const std::size_t PROGRAM_BYTES = 4096; ///< counted for each program besides its source
 
 bool readWord(Stream& stream, uint32_t& word)
 {
@@ -44,7 +44,7 @@ bool writeWord(Stream& stream, uint32_t word)
     return stream.write(bytes, sizeof(bytes)) == int32_t(sizeof(bytes));
 }
 
-/// One "#define" line for each piece behind a "$", in their order; a piece may be empty.
+/// One "#define" line for each piece after a "$", in order; a piece may be empty.
 std::string makeDefines(std::string_view pieces)
 {
     std::string lines;
@@ -70,7 +70,7 @@ public:
     {
     }
 
-    /// @return false for a missing or wrong file, or one program too many for one load (logged).
+    /// @return false for a missing or invalid file, or beyond the load's limit for programs (logged).
     bool readSources()
     {
         const std::size_t fileNameSize = std::min(m_name.find('$'), m_name.size());
@@ -119,7 +119,7 @@ public:
         SharedPtr<ShaderProgram> program;
         if (m_binary && m_binaryDigest == digest)
             program = loadBinary();
-        m_binary.reset(); // it may be the file that is written next
+        m_binary.reset(); // closed, since the same file may be written next
         if (!program)
             program = compile(digest);
         return program;
@@ -146,7 +146,7 @@ private:
         const SharedPtr<Stream> stream = m_cache.getStream(fileName.c_str());
         if (!stream)
         {
-            ORV_LOG_ERROR("Reading vertex shader file: %s", fileName.c_str()); // said of both kinds
+            ORV_LOG_ERROR("Reading vertex shader file: %s", fileName.c_str()); // for both kinds
             m_cache.getAssetPath()->explainMissing(fileName.c_str());
             return false;
         }
@@ -211,7 +211,7 @@ private:
         return program;
     }
 
-    /// @return false if the stream took less than all; true as well when the driver gives no binary.
+    /// @return false if the stream did not take everything; true also if the driver gives no binary.
     static bool writeBinary(Stream& stream, const DigestMaker::Digest& digest, const ShaderProgram& program)
     {
         unsigned int length = 0;
@@ -228,7 +228,7 @@ private:
     const std::string m_name; ///< as requested, with its defines
     const std::string m_binaryName;
     const bool m_binaryCaching;
-    SharedPtr<Stream> m_binary; ///< behind its digest
+    SharedPtr<Stream> m_binary; ///< positioned after its digest
     DigestMaker::Digest m_binaryDigest;
     detail::ShaderProgramFile m_file;
     std::string m_vertex; ///< final sources, defines included

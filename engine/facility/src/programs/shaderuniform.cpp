@@ -29,7 +29,7 @@ static_assert(sizeof(Vector2<int>) == 8 && sizeof(Vector3<int>) == 12 && sizeof(
 static_assert(sizeof(Vector2<float>) == 8 && sizeof(Vector3<float>) == 12 && sizeof(Vector4<float>) == 16);
 static_assert(sizeof(Matrix2<float>) == 16 && sizeof(Matrix3<float>) == 36 && sizeof(Matrix4<float>) == 64);
 
-/// The integers 0, 1, 2, ..., one for each texture unit that the GL has. A GL that does not answer is asked again.
+/// The integers 0, 1, 2, ..., one for each texture unit. Asks GL again if it did not answer.
 const std::vector<GLint>& getUnits()
 {
     static std::vector<GLint>& units =

@@ -17,7 +17,7 @@ void setUniform(int location, int textureUnit, int size, const Matrix4<float>* v
 
 } // namespace orv::ShaderUniformPrivate
 
-// Made once, in shaderuniformtypes.cpp, instead of in each source of the library that makes uniforms.
+// Instantiated once, in shaderuniformtypes.cpp.
 namespace orv
 {
 

@@ -33,11 +33,11 @@ bool readStatement(CharRange& text, Statement& statement)
     while (!text.empty())
     {
         eatWhite(text);
-        // Looked for before the token is read: readToken() would consume the line feed after a one-word comment,
-        // and the next line would be taken for the rest of it.
+        // Checked before the token is read: readToken() would consume the line feed after a one-word comment, and the
+        // next line would be read as a part of it.
         if (!isComment(text))
         {
-            // Kept for all statements of one line, or a long line of many would be searched once for each.
+            // Kept for all statements of a line; otherwise a long line would be searched for each statement.
             if (!statement.lineEnd || statement.lineEnd < text.start)
                 statement.lineEnd = std::find(text.start, text.end, '\n');
             statement.tag = readToken(text);

@@ -9,7 +9,7 @@ namespace orv
 namespace
 {
 
-/// The letters that file names are compared by, whatever the locale.
+/// ASCII lower case, independent of the locale.
 char toLower(char c)
 {
     return c >= 'A' && c <= 'Z' ? char(c - 'A' + 'a') : c;

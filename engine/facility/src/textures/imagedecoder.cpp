@@ -11,11 +11,10 @@
 namespace
 {
 
-/// stb_image believes what a file says of its parts' sizes; no block that it asks for may be larger than this.
+/// stb_image trusts sizes in the file; no block that it allocates may be larger than this.
 thread_local std::size_t t_largestBlock = 0;
 
-/// Zeroed, since a cut file leaves pixels and tables unwritten that are used all the same: what the heap held before
-/// must not be seen in a picture.
+/// Zeroed, since truncated files leave pixels and tables unwritten: old heap contents must not appear in a picture.
 void* takeBlock(std::size_t size)
 {
     return size <= t_largestBlock ? std::calloc(1, size) : nullptr;
@@ -34,8 +33,8 @@ void* copyBytes(void* to, const void* from, std::size_t count)
 
 } // namespace
 
-// The one place where stb_image becomes code: everything static, memory in and memory out, the four formats
-// alone. Its assertions must not stop the program.
+// The only source that implements stb_image: all static, from memory to memory, only the four formats. Its assertions
+// must not stop the program.
 #define STB_IMAGE_IMPLEMENTATION
 #define STB_IMAGE_STATIC
 #define STBI_NO_STDIO
@@ -64,7 +63,7 @@ namespace orv::detail
 namespace
 {
 
-const std::size_t DECODER_BYTES = 1 << 15; ///< what the decoder needs for its own records
+const std::size_t DECODER_BYTES = 1 << 15; ///< for the decoder's own records
 
 /// A format, and how many decoded bytes one byte of such a file can stand for. A file that claims more is damaged or
 /// was made to exhaust memory.
@@ -91,7 +90,7 @@ Density getDensity(const unsigned char* file, std::size_t size)
     return {false, 256};
 }
 
-/// What is decoded: pixels, those of a JPEG in blocks of up to 32 x 32.
+/// Bytes of the decoded pixels; a JPEG has blocks of up to 32 x 32.
 std::size_t getDecodedBytes(int width, int height, int channels, bool isJpeg)
 {
     const std::size_t margin = isJpeg ? 31 : 0;

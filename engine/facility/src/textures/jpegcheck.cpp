@@ -12,8 +12,8 @@ namespace
 const int END_OF_FILE = -1;
 
 // A scan takes as many steps for each of its blocks as it has coefficients, and a few more. The usual ten scans of a
-// progressive file come to some 200 for each block of the picture; what is coded more finely has the bytes to show. A
-// whole file has a bit for each block at the least.
+// progressive file take some 200 steps for each block of the picture; files with more scans must have more bytes. A
+// complete file has at least one bit for each block.
 const uint64_t STEPS_PER_VISIT = 4;
 const uint64_t MOST_STEPS_PER_BLOCK = 224;
 const uint64_t MOST_STEPS_PER_BYTE = 128;
@@ -39,7 +39,7 @@ public:
 private:
     static constexpr int MOST_COMPONENTS = 4;
 
-    /// Also passes over the coded data after a scan's header: markers within it stand alone.
+    /// Also skips the coded data after a scan's header: markers within it have no length.
     int findMarker()
     {
         while (m_position < m_size && m_file[m_position] != 0xFF)

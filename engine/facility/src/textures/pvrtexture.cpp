@@ -20,7 +20,7 @@ namespace orv::detail
 namespace
 {
 
-/// What GL takes the pixels of a format as.
+/// GL's parameters for the pixels of a format.
 struct GlPixels
 {
     GLenum format;
@@ -43,14 +43,14 @@ GlPixels getGlPixels(pvr::Format unpacked)
     }
 }
 
-/// The format in which GL can take the file's blocks as they are; GL_NONE if it cannot. Asked for each texture,
-/// since the answer is the current context's.
+/// The format in which GL takes the file's blocks unchanged; GL_NONE if it cannot. Queried for each texture, since it
+/// depends on the current context.
 GLenum getGlCompressedFormat(const pvr::PvrFile& file)
 {
     const pvr::FormatInfo& info = pvr::getInfo(file.format);
     if (!info.isCompressed() || file.bottomRowFirst)
         return GL_NONE;
-    if (info.isPvrtc() && file.width() != file.height()) // drivers differ in what else they take
+    if (info.isPvrtc() && file.width() != file.height()) // only some drivers take others
         return GL_NONE;
     if (!RenderDevice::isExtensionSupported(info.isPvrtc() ? "GL_IMG_texture_compression_pvrtc"
                                                            : "GL_OES_compressed_ETC1_RGB8_texture"))
@@ -113,7 +113,7 @@ void setParameters(bool isPowerOfTwoSized, bool hasMipmaps)
     glTexParameteri(GL_TEXTURE_2D, GL_TEXTURE_WRAP_T, wrap);
 }
 
-/// Asks for what GL is to be given.
+/// Asks the load for the memory that GL will need.
 bool takeLevels(const pvr::PvrFile& file, size_t fileSize, size_t levelCount, bool isUnpacked)
 {
     for (size_t i = 0; i < levelCount; ++i)
@@ -140,7 +140,7 @@ bool fillTexture(const pvr::PvrFile& file, const uint8_t* data, size_t size, Pvr
         return false;
     }
 
-    RenderDevice::getError(false); // an older error stays remembered and is not taken for the upload's
+    RenderDevice::getError(false); // an older error must not be taken for the upload's; it stays remembered
     glBindTexture(GL_TEXTURE_2D, texture.glName);
     bindingsChanged();
     if (compressedFormat != GL_NONE)

@@ -36,7 +36,7 @@ SharedPtr<Texture2D> PvrTextureLoader::load(AssetCache<Texture2D>& cache, const 
     const auto* data = reinterpret_cast<const uint8_t*>(file.getStart());
     const auto size = size_t(file.getEnd() - file.getStart());
     if (!isKnown(normalized.c_str()) && !pvr::isPvr(data, size))
-        return {}; // the loader of that kind of name has said why it failed
+        return {}; // the other loader has logged why it failed
 
     detail::PvrTexture texture;
     std::string error;

@@ -132,7 +132,7 @@ void RenderTarget::attach(bool depthBuffer, bool stencilBuffer)
     }
 }
 
-/// Many drivers refuse separate depth and stencil buffers: puts one for both in their place.
+/// Many drivers refuse separate depth and stencil buffers: replaces them by a packed one.
 bool RenderTarget::retryPacked()
 {
     if (m_depthBuffer == 0 || m_stencilBuffer == 0 ||
@@ -200,7 +200,7 @@ void RenderTarget::setDepthTexture(const SharedPtr<Texture2D>& texture)
     enable();
     if (texture)
         attachTexture(GL_DEPTH_ATTACHMENT, texture->getId());
-    // A packed buffer goes on as the stencil buffer.
+    // A packed buffer is kept as the stencil buffer.
     if (m_depthBuffer != 0 && m_depthBuffer != m_stencilBuffer)
         glDeleteRenderbuffers(1, &m_depthBuffer);
     m_depthBuffer = 0;

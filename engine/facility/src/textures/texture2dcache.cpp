@@ -19,7 +19,7 @@ namespace orv
 namespace
 {
 
-/// What the driver reads a surface as; UNSIGNED_BYTE if it is none of ours.
+/// The type as which the driver reads a surface; UNSIGNED_BYTE for unknown types.
 Texture::Type getSurfaceType()
 {
     GLint glType = 0;
@@ -130,7 +130,7 @@ SharedPtr<Texture2D> Texture2DCache::createFromBackbuffer(const RenderContext& c
     if (!resource)
         return {};
 
-    // An older error stays remembered and is not taken for the copy's.
+    // An older error must not be taken for the copy's; it stays remembered.
     RenderDevice::getError(false);
     glBindTexture(GL_TEXTURE_2D, resource->getId());
     detail::bindingsChanged();

@@ -29,7 +29,7 @@ SharedPtr<Texture2D> Texture2DLoader::load(AssetCache<Texture2D>& cache, const c
     const Image image(*stream);
     if (!image.data())
     {
-        // Files of this suffix are another loader's, which has its own messages.
+        // Another loader reads these files and has its own messages.
         if (!endsWith(normalized.c_str(), ".pvr"))
             ORV_LOG_ERROR("Image failed to load texture \"%s\"", normalized.c_str());
         return {};

@@ -43,7 +43,7 @@ void TextureCube::setFace(Face face, const void* pixels)
 
     enable();
     if (m_facesSet == 0)
-        RenderDevice::getError(false); // an older error is not taken for that of these faces
+        RenderDevice::getError(false); // an older error must not be taken for one of these faces
     glPixelStorei(GL_UNPACK_ALIGNMENT, 1);
     glTexImage2D(detail::GL_CUBE_FACES[faceIndex], 0, GLint(format), GLsizei(m_width), GLsizei(m_height), 0,
                  format, type, pixels);
@@ -52,7 +52,7 @@ void TextureCube::setFace(Face face, const void* pixels)
     {
         sendParameters();
         if (detail::reportGLError(detail::sourcePathText<__FILE__>, __func__, __LINE__))
-            m_facesSet = 0; // no memory for one of the faces, so all six are wanted again
+            m_facesSet = 0; // no memory for one of the faces: all six have to be set again
     }
 }
 

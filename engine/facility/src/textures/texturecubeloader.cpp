@@ -26,19 +26,19 @@ const TextureCube::Face GRID_FACES[TextureCube::FACE_COUNT] = {
     TextureCube::Face::NEGATIVE_X, TextureCube::Face::NEGATIVE_Z, TextureCube::Face::POSITIVE_X,
     TextureCube::Face::NEGATIVE_Y, TextureCube::Face::POSITIVE_Y, TextureCube::Face::POSITIVE_Z};
 
-/// Takes a cube's faces one after the other, so that no more than one picture has to be in memory.
+/// Uploads a cube's faces one after the other, so that only one picture is in memory.
 class CubeMaker
 {
 public:
     explicit CubeMaker(TextureCubeCache& cache) : m_cache(cache) {}
 
-    /// A cube that did not come to be leaves no name in GL.
+    /// Deletes the GL name of an incomplete cube.
     ~CubeMaker()
     {
         if (!m_resource || m_isFinished)
             return;
         m_resource->deallocate();
-        RenderDevice::getError(false); // of a face that GL refused before another was found not to fit
+        RenderDevice::getError(false); // clears the error of a refused face
     }
 
     /// @param name  of the picture, for messages.
@@ -51,7 +51,7 @@ public:
             ORV_LOG_ERROR("TextureCube images must have matching dimensions.");
             return false;
         }
-        // GL wants one format for all faces, or the cube is incomplete and black.
+        // GL needs one format for all faces, or the cube is incomplete and black.
         if (image.channelCount() != m_channels)
         {
             ORV_LOG_ERROR("TextureCube image \"%s\" has %d channels, the first one %d.", name,
@@ -189,10 +189,10 @@ bool loadSix(AssetCache<TextureCube>& cache, const std::string& name, CubeMaker&
         const bool isSame = i > 0 && names[i] == names[i - 1];
         if (!isSame)
         {
-            image.reset(); // before there is another
+            image.reset(); // frees it before the next one
             image = loadImage(cache, detail::normalizeAssetName(names[i].c_str()).c_str());
         }
-        else if (!detail::LoadScope::takeTexture(countBytes(*image))) // GL has each face by itself
+        else if (!detail::LoadScope::takeTexture(countBytes(*image))) // GL stores each face
         {
             return false;
         }
