@@ -7,7 +7,7 @@
 #include <algorithm>
 #include <cmath>
 
-// Whatever moves along an animation's time line is here; users find loopSize's assertion under this name.
+// Everything that moves along an animation's time line; log records name this file for loopSize's assertion.
 
 namespace orv
 {
@@ -15,12 +15,12 @@ namespace orv
 namespace
 {
 
-/// As many whole loops as are taken off one by one; farther away the remainder is calculated at once, so that
-/// a tiny loop or a huge step does not hold up the frame.
+/// Whole loops subtracted one by one. Beyond that the remainder is computed directly, so that a tiny loop or a huge
+/// step does not delay the frame.
 constexpr int MAX_SINGLE_LOOPS = 16;
 
 /// @param next  at or after loopEnd.
-/// @return the same moment of the loop, in [loopStart, loopEnd).
+/// @return the same point of the loop, in [loopStart, loopEnd).
 float wrapForwards(double next, float loopStart, float loopEnd)
 {
     const double size = double(loopEnd) - double(loopStart);
@@ -29,7 +29,7 @@ float wrapForwards(double next, float loopStart, float loopEnd)
 }
 
 /// @param next  at or before loopStart.
-/// @return the same moment of the loop, in (loopStart, loopEnd].
+/// @return the same point of the loop, in (loopStart, loopEnd].
 float wrapBackwards(double next, float loopStart, float loopEnd)
 {
     const double size = double(loopEnd) - double(loopStart);
@@ -80,13 +80,12 @@ void AnimationController::move(float deltaTime)
 
 float AnimationController::clampToRange(float progress) const
 {
-    if (!(progress > m_start)) // also what is not a number
+    if (!(progress > m_start)) // also for NaN
         return m_start;
     return m_end <= progress ? m_end : progress;
 }
 
-/// @return where a step leads from the current progress, not yet clamped. An infinite one ends nowhere in a loop, so
-/// nothing moves there.
+/// @return the progress after a step, not yet clamped. In a loop, an infinite step changes nothing.
 float AnimationController::advance(float step) const
 {
     float next = m_progress + step;

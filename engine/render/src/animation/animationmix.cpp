@@ -17,7 +17,7 @@ float mixStraight(float from, float to, float share)
 {
     return from == to
                ? from
-               : from * (1.0f - share) + to * share; // equal ones exactly, and no difference that overflows
+               : from * (1.0f - share) + to * share; // exact for equal values, and no difference can overflow
 }
 
 bool isFinite(const Vector4f& v)
@@ -88,9 +88,9 @@ float AnimationMix::between(float from, float to, float share)
     return between(Vector4f(from, 0.0f, 0.0f, 0.0f), Vector4f(to, 0.0f, 0.0f, 0.0f), share).x;
 }
 
-/// The first write of an update goes over what others have there; later ones, of clips that fade, over the earlier ones.
-/// A value that stands as this controller left it was not written by others, so that the others' is still the one
-/// remembered: without that, each frame would mix into the last frame's mixture.
+/// The first write of an update blends with the others' value, later ones, of fading clips, with the earlier writes. If
+/// the value is still the one that this controller wrote, nobody else has written, and the remembered value of the
+/// others is used. Otherwise each frame would blend into the last frame's result.
 template <class T>
 T AnimationMix::resolveAs(const void* place, const T& current, const T& value) const
 {

@@ -9,9 +9,9 @@
 namespace orv::detail
 {
 
-/// What a controller knows about each value that it mixes into: what others had there, and what it wrote itself.
+/// For each value that a controller blends into: the others' value, and the one that it wrote itself.
 ///
-/// A hash table by address, with open addressing; it only grows. Finding what is there allocates nothing.
+/// A hash table by address, with open addressing; it only grows. Finding an entry allocates nothing.
 class MixedPlaces
 {
 public:
@@ -19,8 +19,8 @@ public:
     {
         const void* key = nullptr;
         uint32_t update = 0; ///< the last one that wrote here
-        Vector4f base; ///< what was here before this controller wrote, or what another one has written since
-        Vector4f written; ///< not a number at first
+        Vector4f base;       ///< the value of others, from before this controller's write or since
+        Vector4f written;    ///< NaN at first
     };
 
     /// A place that is not known yet is added.

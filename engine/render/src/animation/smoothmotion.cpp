@@ -3,7 +3,7 @@
 #include <algorithm>
 #include <cmath>
 
-// What AnimationController does beyond stepping along a time line.
+// Interpolation, fading and weights of AnimationController.
 
 namespace orv
 {
@@ -48,16 +48,16 @@ void AnimationController::Smooth::advance(float deltaTime, bool isPaused)
         old.player->move(deltaTime);
         old.cover.advance(seconds);
     }
-    // What is covered whole is not seen any more.
+    // Completely covered clips have no effect.
     size_t hidden = cover.rate > 0.0f ? 0 : oldClips.size();
     for (size_t i = 1; i < oldClips.size(); ++i)
         hidden = std::max(hidden, oldClips[i].cover.rate > 0.0f ? 0 : i);
     oldClips.erase(oldClips.begin(), oldClips.begin() + std::ptrdiff_t(hidden));
     if (oldClips.empty() && !isWeighted)
-        places.clear(); // what stands now is the base of the next fade
+        places.clear(); // the current values are the base of the next fade
 }
 
-/// Each clip is written over the older ones, so its weight is its part of what is left to it and them.
+/// Each clip is blended over the older ones, so its weight is its part of the share that it has together with them.
 void AnimationController::Smooth::findWeights()
 {
     const float weight = getWeight();
@@ -74,7 +74,7 @@ void AnimationController::Smooth::findWeights()
         oldClips[i].weight = take(i > 0 ? oldClips[i].cover.value : 1.0f);
 }
 
-/// Takes out the clip that shows least.
+/// Removes the clip with the least weight.
 void AnimationController::Smooth::letGo()
 {
     float newer = cover.value;
@@ -136,7 +136,7 @@ void AnimationController::fadeWeight(float weight, float seconds)
 {
     Smooth& s = smooth();
     if (!s.isWeighted)
-        s.appliedWeight = 0.0f; // what stands now is what it mixes with
+        s.appliedWeight = 0.0f; // it blends with the current values
     s.isWeighted = true;
     s.startWeight = s.getWeight();
     s.endWeight = clampWeight(weight);

@@ -10,10 +10,10 @@
 namespace orv
 {
 
-/// What a controller has besides once smooth motion was asked of it.
+/// State of a controller that interpolates, fades or has a weight.
 struct AnimationController::Smooth
 {
-    /// Goes evenly from 0 to 1.
+    /// Goes linearly from 0 to 1.
     struct Ramp
     {
         float value = 1.0f;
@@ -27,8 +27,8 @@ struct AnimationController::Smooth
     struct OldClip
     {
         SharedPtr<AnimationController> player; ///< without smooth motion of its own
-        Ramp cover;                            ///< of what is older still
-        float weight = 0.0f;                   ///< over that, in this update
+        Ramp cover;                            ///< of the older clips
+        float weight = 0.0f;                   ///< over those, in this update
     };
 
     static constexpr size_t MOST_OLD_CLIPS = 3;
@@ -38,7 +38,7 @@ struct AnimationController::Smooth
     void letGo();
 
     bool isInterpolated = false;
-    bool isWeighted = false; ///< the weight was set at some time
+    bool isWeighted = false; ///< the weight has been set
     SharedPtr<SceneNode> subtree;
     float startWeight = 1.0f; ///< of the fade of the weight
     float endWeight = 1.0f;

@@ -27,7 +27,7 @@ const ShaderProgram* getProgram(const Solid& solid)
     return appearance ? appearance->getShaderProgram().get() : nullptr;
 }
 
-/// Each vertex is somewhere between the places that the joints would give it.
+/// Each vertex lies in the convex hull of the positions that its joints give it.
 [[gnu::noinline]] bool hidesSkin(const Frustum& frustum, const Solid& solid, const Mesh& mesh)
 {
     const int last = std::min(solid.getJointCount(), Solid::MAX_JOINTS) - 1;

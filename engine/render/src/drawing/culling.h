@@ -25,21 +25,21 @@ struct Eye;
 /// Whether an eye cannot see a solid, as far as its bounds tell.
 bool hides(const Frustum& frustum, const Solid& solid);
 
-/// Keeps from a renderer what it cannot see: in the walk where there is one eye, or two which both do not see it, and in
-/// the list that is about to be drawn where it is drawn for several.
+/// Leaves out invisible solids: in the walk if no eye sees them, and from the list to be drawn for each of several
+/// eyes.
 ///
-/// What a mirror may show is known only when the walk has found it. So a scene that had mirrors in the frame before is
-/// walked as a whole; one that turns out to have one is walked twice.
+/// The view of a mirror is known only after the walk. So if the last frame had mirrors, the whole scene is walked; if a
+/// mirror appears, the scene is walked twice.
 class Culling : private SceneNodeVisitor, private WalkGuide
 {
 public:
-    /// @param renderer  borrowed: visits what may be seen.
+    /// @param renderer  borrowed: visits solids that may be visible.
     explicit Culling(SceneNodeVisitor& renderer);
 
     void begin(const Eye* eyes, int eyeCount);
     void walk(SceneNode& scene, const FlagMask& renderFlags, const FlagMask& recursiveFlags);
-    /// @param hasMirrors  the walk has found some.
-    /// @return false if the walk has left out what these may show: it is to be done again.
+    /// @param hasMirrors  the walk has found mirrors.
+    /// @return false if the walk left out solids that mirrors may show: walk again.
     bool finish(bool hasMirrors);
 
     /// Those of the solids that one eye may see, in their order.

@@ -11,7 +11,7 @@ namespace orv::detail
 namespace
 {
 
-/// Whether it matters to the picture what was drawn before. Opaque materials do not blend; an offset depends on the
+/// Whether the picture depends on the order of drawing. Opaque materials do not blend; a depth offset depends on the
 /// one before it (see RenderContext::setDepthOffset).
 bool keepsPlace(const RenderState& state)
 {
@@ -24,7 +24,7 @@ bool keepsPlace(const RenderState& state)
     return !findsNearest || !writesAll || isOffset || state.stencilTestEnabled;
 }
 
-/// Makes of the count of each number the place of its first.
+/// Turns counts into the position of each number's first element.
 void addUp(std::vector<uint32_t>& counts)
 {
     uint32_t place = 0;
@@ -38,7 +38,7 @@ void DrawGroups::begin()
 {
     m_round = nextRevision();
     m_programCount = 0;
-    m_meshCount = 1; // number 0 is for want of a mesh
+    m_meshCount = 1; // number 0 stands for no mesh
     m_entries.clear();
     m_programs.clear();
     m_materialCounts.clear();
@@ -78,7 +78,7 @@ DrawMark DrawGroups::numberMesh(const Mesh* mesh)
     return mark;
 }
 
-/// The order by meshes first: that by materials then leaves it as it is within each.
+/// Sorts by mesh first; the stable sort by material keeps that order within each material.
 [[gnu::noinline]] void DrawGroups::finish()
 {
     if (m_meshCount > 2)
@@ -102,7 +102,7 @@ void DrawGroups::sortByMesh()
     std::copy(m_byMesh.begin(), m_byMesh.end(), m_entries.begin());
 }
 
-/// Makes of the counts the places of each material's first solid, those of a program side by side.
+/// Turns the counts into the position of each material's first solid; materials of one program are adjacent.
 void DrawGroups::rankMaterials()
 {
     m_counts.assign(m_programCount, 0);

@@ -16,10 +16,9 @@ namespace orv
 namespace detail
 {
 
-/// Puts solids that are drawn with the same things side by side, by counting: no solid is compared with another. By
-/// program, then material, then mesh, each in the order in which a solid has it first; solids of equal ones stay as they
-/// came. A solid whose material's state makes the order matter stays where it is, and what came before and after it too.
-/// Keeps its memory from frame to frame.
+/// Groups solids by program, then material, then mesh, with a counting sort. Groups are in the order of their first
+/// solid, and solids of a group keep their order. A solid whose material depends on the order of drawing stays in
+/// place, and no solid moves across it. Keeps its memory from frame to frame.
 class DrawGroups
 {
 public:
@@ -57,8 +56,8 @@ private:
     FrameList<Entry> m_entries;
     std::vector<Entry> m_byMesh;
     std::vector<uint32_t> m_programs;       ///< of each material
-    std::vector<uint32_t> m_materialCounts; ///< solids of each material; then where the next one of them goes
-    std::vector<uint32_t> m_counts;         ///< the same of meshes, and of programs
+    std::vector<uint32_t> m_materialCounts; ///< solids of each material; later the position of its next solid
+    std::vector<uint32_t> m_counts;         ///< the same for meshes and for programs
 };
 
 [[gnu::always_inline]] inline void DrawGroups::addNumbered(Solid& solid, const DrawMark& material,

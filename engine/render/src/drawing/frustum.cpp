@@ -13,7 +13,7 @@ namespace
 struct Plane
 {
     Vector4f coefficients; ///< times a place with w 1: above 0 inside
-    Vector4f terms;        ///< the sizes of what they were added from
+    Vector4f terms;        ///< the sums of absolute values, for the rounding error
 };
 
 Plane makePlane(const Vector4f& w, const Vector4f& row, float side)
@@ -32,7 +32,7 @@ Frustum::Frustum()
 
 Frustum::Frustum(const Matrix4f& view, const Matrix4f& projection) : Frustum()
 {
-    constexpr float ROUNDING = 5e-7f; // of the largest of the numbers that a distance is made from
+    constexpr float ROUNDING = 5e-7f; // relative to the largest term of a distance
     const Matrix4f rows = transpose(projection * view);
     Plane planes[6];
     float reach = 0.0f;
@@ -50,7 +50,7 @@ Frustum::Frustum(const Matrix4f& view, const Matrix4f& projection) : Frustum()
         const float size = length(plane.xyz());
         const float slack = ROUNDING * (2.0f * reach * length(planes[i].terms.xyz()) + planes[i].terms.w);
         if (!(std::isfinite(size + slack) && size > 0.0f))
-            continue; // a plane without a side, as of what is seen without end
+            continue; // a degenerate plane, as for an infinite view
         m_x[i / 4][i % 4] = plane.x / size;
         m_y[i / 4][i % 4] = plane.y / size;
         m_z[i / 4][i % 4] = plane.z / size;

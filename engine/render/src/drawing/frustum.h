@@ -6,7 +6,7 @@
 namespace orv::detail
 {
 
-/// What one eye can see: the inside of six planes, a little widened, for rounding.
+/// The view volume of one eye: six planes, slightly widened for rounding errors.
 class Frustum
 {
 public:
@@ -21,7 +21,7 @@ public:
     Frustum();
     Frustum(const Matrix4f& view, const Matrix4f& projection);
 
-    /// Whether a sphere is outside. One that is not made of numbers is not.
+    /// Whether a sphere is outside. A sphere with NaN is not.
     /// @param negativeRadius  minus infinity is never outside.
     bool hides(const Vector3f& centre, float negativeRadius) const
     {
@@ -67,14 +67,14 @@ private:
         return first < second ? first : second;
     }
 
-    // Eight planes, of unit length and towards the inside; those that are not needed see everything.
+    // Eight planes with unit normals that point inside; unused planes contain everything.
     Lanes m_x[2] = {};
     Lanes m_y[2] = {};
     Lanes m_z[2] = {};
     Lanes m_offset[2];
 };
 
-/// The same for what is somewhere between spheres: it is outside if all of them are outside of one plane.
+/// The same for the convex hull of spheres: outside if all spheres are outside of one plane.
 class HullSight
 {
 public:

@@ -37,7 +37,7 @@ struct MotionBlurRenderer::Properties
             modelViewProjection->setDrawTransform(detail::DrawTransform::MODEL_VIEW_PROJECTION);
             oldModelViewProjection->setDrawTransform(detail::DrawTransform::OLD_MODEL_VIEW_PROJECTION);
         }
-        // Later, so that programs see the marks.
+        // After marking, so that programs see the marks.
         detail::shareProperty(context, "MOTION_BLUR_FACTOR", 1, 0.0f);
     }
 
@@ -46,7 +46,7 @@ struct MotionBlurRenderer::Properties
         return detail::shareProperty<Matrix4f>(context, name, 1, Matrix4f::IDENTITY);
     }
 
-    /// Whether there was memory for all that is written each frame.
+    /// Whether all properties written each frame could be allocated.
     bool isComplete() const
     {
         return joints.isComplete() && viewProjection && oldModelViewProjection && modelViewProjection &&
@@ -71,8 +71,8 @@ MotionBlurRenderer::MotionBlurRenderer(const SharedPtr<RenderContext>& context,
 {
     if (!m_pool || !m_velocity)
         return;
-    // Both go to the one appearance, on purpose: skinned solids are drawn with the program that is current.
-    // Guarded by MotionBlurTest.skinnedSolidsTakeTheCurrentProgram.
+    // Both are set on the same appearance, on purpose: skinned solids are drawn with the current program. Guarded by
+    // MotionBlurTest.skinnedSolidsTakeTheCurrentProgram.
     ShaderProgramCache& programs = *m_pool->getShaderProgramCache();
     m_velocity->setShaderProgram(programs.get("orv#gen_velocity.sp"));
     m_velocity->setShaderProgram(programs.get("orv#gen_velocity.sp$SKIN"));
@@ -90,7 +90,7 @@ void MotionBlurRenderer::render(Camera* camera, SceneNode& scene, const FlagMask
 {
     m_solids.clear();
     if (!m_properties->isComplete() || !m_velocity || !m_skinnedVelocity)
-        return; // the log said so when they were made
+        return; // logged when they were made
     visitScene(*this, scene, renderFlags, recursiveFlags);
 
     const RenderContext::DrawScope scope(*m_context);
@@ -121,14 +121,14 @@ void MotionBlurRenderer::drawEye(const Matrix4f& viewProjection, const Matrix4f&
 {
     Properties& properties = *m_properties;
     properties.viewProjection->set(viewProjection);
-    const detail::UniformSources* sources = nullptr; // of the velocity material, while it is ready
-    uint64_t revision = 0;                           // the last of all when it was
+    const detail::UniformSources* sources = nullptr; // of the velocity material; null unless it is ready
+    uint64_t revision = 0;                           // the process's last revision at that time
     bool turnsWinding = false;
     for (Solid* solid : m_solids)
     {
         const Matrix4f now = viewProjection * solid->getWorldTransform();
         const Matrix4f before = lastViewProjection * solid->getLastWorldTransform();
-        // The last one's values are to stay.
+        // The properties must end with the last solid's values.
         if (solid->hasSkin() || !solid->getMesh() || solid == m_solids.back())
         {
             properties.oldModelViewProjection->set(before);

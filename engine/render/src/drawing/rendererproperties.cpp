@@ -13,7 +13,7 @@ namespace orv::detail
 namespace
 {
 
-/// Material values that an appearance may leave out; what an appearance sets wins over these.
+/// Defaults for material values; an appearance's own values override them.
 template <class T>
 struct MaterialDefault
 {
@@ -29,7 +29,7 @@ constexpr MaterialDefault<Vector4f> VECTOR_DEFAULTS[] = {
     {"M_UV_OFFSET_SCALE", Vector4f(0.0f, 0.0f, 1.0f, 1.0f)},
 };
 
-/// Of the client framework's effects, which say what a value of zero means.
+/// Values of the luvane# effects, for which zero is a meaningful default.
 constexpr const char* ZERO_VECTORS[] = {"M_BLUR_STEP", "M_DEPTH_RANGE", "M_FADE", "M_FOCUS",
                                         "M_WEATHER_FALL"};
 
@@ -99,7 +99,7 @@ RendererProperties::RendererProperties(RenderContext& context, AssetCachePool* p
 {
     markTransforms();
     shareProperty(context, "FOG_DENSITY", 1, 0.0f);
-    m_sharers = shareProperty<int>(context, "SIMPLE_RENDERER", 1, 0); // later, so that programs see the marks
+    m_sharers = shareProperty<int>(context, "SIMPLE_RENDERER", 1, 0); // after the marks: programs see them
     shareProperty(context, "FOG_COLOUR", 1, Vector4f(0.0f, 0.0f, 0.0f, 1.0f));
 
     for (const MaterialDefault<Vector4f>& value : VECTOR_DEFAULTS)
@@ -122,7 +122,7 @@ RendererProperties::RendererProperties(RenderContext& context, AssetCachePool* p
     provideTexture(context, pool, BUMP_TEXTURE, nullptr);
 }
 
-/// Not without memory for all: then nothing is drawn.
+/// Does nothing unless all could be allocated: then nothing is drawn.
 void RendererProperties::markTransforms()
 {
     if (!isComplete())

@@ -18,8 +18,8 @@ namespace detail
 
 inline constexpr int MAX_LIGHTS = 5;
 
-/// The context's property of this name, made with every element at the initial value when there is none. One
-/// of another type or with fewer elements cannot serve (logged): what comes back is then in no context.
+/// The context's property of this name, made with every element at the initial value when there is none. If one of
+/// another type or with fewer elements exists (logged), a property outside of any context is returned.
 /// @return empty when there is no memory (logged).
 template <class T>
 SharedPtr<ShaderUniform<T>> shareProperty(RenderContext& context, const char* name, int size,
@@ -42,14 +42,14 @@ SharedPtr<ShaderUniform<T>> shareProperty(RenderContext& context, const char* na
     return property;
 }
 
-/// What skinning shaders are fed with.
+/// The properties for skinning shaders.
 struct JointProperties
 {
     explicit JointProperties(RenderContext& context);
 
     bool isComplete() const { return count && world && weightFilled; }
 
-    /// Sets all to what the solid's joints and mesh say. Elements of world beyond the count stay as they are.
+    /// Sets all from the solid's joints and mesh. Elements of world beyond the count are unchanged.
     void publish(const Solid& solid) const;
 
     SharedPtr<ShaderUniform<int>> count;
@@ -57,17 +57,17 @@ struct JointProperties
     SharedPtr<ShaderUniform<float>> weightFilled;
 };
 
-/// The global properties that SimpleRenderer writes or provides; see there for their meaning.
+/// The global properties that SimpleRenderer writes or provides; documented there.
 struct RendererProperties
 {
     /// @param pool  may be null: texture properties stay null then.
     RendererProperties(RenderContext& context, AssetCachePool* pool);
 
-    /// If no other renderer shares these properties, takes the textures that were there since construction
-    /// out of them, so that a context does not keep its pool's textures.
+    /// If no other renderer shares these properties, removes the textures set at construction, so that a context does
+    /// not keep its pool's textures alive.
     ~RendererProperties();
 
-    /// Whether there was memory for all that is written each frame.
+    /// Whether all properties written each frame could be allocated.
     bool isComplete() const;
 
     /// Sets the transforms to those of one solid.
@@ -111,7 +111,7 @@ private:
     void provideTexture(RenderContext& context, AssetCachePool* pool, const char* name, const char* asset);
 
     std::vector<HeldTexture> m_textures;
-    SharedPtr<ShaderUniform<int>> m_sharers; // no shader's: held by the context and by each renderer on it
+    SharedPtr<ShaderUniform<int>> m_sharers; // read by no shader: counts the renderers
 };
 
 } // namespace detail

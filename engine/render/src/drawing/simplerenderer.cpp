@@ -143,7 +143,7 @@ void SimpleRenderer::render(Camera* camera, SceneNode& scene, const FlagMask& re
                             const FlagMask& recursiveFlags)
 {
     if (!m_properties->isComplete())
-        return; // the log said so when they were made
+        return; // logged when they were made
     if (!m_counters)
         return drawFrame(camera, scene, renderFlags, recursiveFlags);
     const FrameCounters before = countGlCalls();
@@ -212,7 +212,7 @@ void SimpleRenderer::publishLight(const Light& light, int index)
         const float nearDistance = light.getAttenuationNear() * scale;
         const float range = light.getAttenuationFar() * scale - nearDistance;
         properties.lightAttenuationNear->set(nearDistance, index);
-        attenuationReciprocal = 1.0f / std::max(0.001f, range); // also of distances without a difference
+        attenuationReciprocal = 1.0f / std::max(0.001f, range); // also for equal distances
     }
     properties.lightAttenuationReciprocal->set(attenuationReciprocal, index);
 
@@ -263,7 +263,7 @@ void SimpleRenderer::sortTransparent(const Vector3f& eyeZ)
     for (Solid* const solid : m_transparent)
     {
         const float depth = dot(eyeZ, solid->getWorldTransform().columns[3].xyz());
-        // Sorting needs an order; what is nowhere counts as farthest.
+        // Sorting needs a total order; NaN counts as farthest.
         m_sortKeys.push_back({std::isnan(depth) ? -std::numeric_limits<float>::infinity() : depth, solid});
     }
     std::sort(m_sortKeys.begin(), m_sortKeys.end(),
@@ -286,14 +286,14 @@ bool SimpleRenderer::prepareMirrorTarget()
     if (m_pool && !isEmpty && !isLarge)
     {
         std::copy_n(surface, 2, m_mirrorSurface);
-        // Blocks of two shapes in turn must not have it made again in every frame, so it only grows.
+        // It only grows: blocks of alternating shapes must not make it again in every frame.
         makeMirrorTarget(std::max(least[0], isSame ? m_mirrorSize[0] : 0),
                          std::max(least[1], isSame ? m_mirrorSize[1] : 0));
     }
     return m_mirrorTarget && m_mirrorTarget->isComplete();
 }
 
-/// Keeps the target there is if GL has no other.
+/// Keeps the old target if GL refuses a new one.
 void SimpleRenderer::makeMirrorTarget(int width, int height)
 {
     m_mirrorSize[0] = width;
@@ -308,17 +308,17 @@ void SimpleRenderer::makeMirrorTarget(int width, int height)
     SharedPtr<RenderTarget> target = makeShared<RenderTarget>(texture, nullptr, true, false);
     if (!target || (m_mirrorTarget && !target->isComplete()))
     {
-        target.reset(); // before its texture, to know that the context is not lost
+        target.reset(); // before its texture, by which it detects a lost context
         texture->discard();
         return;
     }
     const SharedPtr<Texture2D> old = m_mirrorTarget ? m_mirrorTarget->getColourTexture() : nullptr;
     m_mirrorTarget = target;
     if (old)
-        old->discard(); // a window that is drawn larger would leave one behind for each step
+        old->discard(); // resizing a window would leave one behind for each size
 }
 
-/// Draws what the mirror shows into the mirror target; framebuffer and viewport come back.
+/// Draws the reflection into the mirror target; restores framebuffer and viewport.
 void SimpleRenderer::renderReflection(const Solid& mirror, const detail::Eye& eye,
                                       const detail::Viewport& viewport)
 {
@@ -327,14 +327,14 @@ void SimpleRenderer::renderReflection(const Solid& mirror, const detail::Eye& ey
     m_mirrorTarget->enable();
     m_context->setViewport(0, 0, static_cast<int>(texture.getWidth()), static_cast<int>(texture.getHeight()));
 
-    // Masks and scissor box are those of the last draw; they must not keep anything from being cleared.
+    // The last draw's masks and scissor box must not restrict clearing.
     m_context->setColourMask(true, true, true, true);
     m_context->setDepthWriteEnabled(true);
     setStencilMask(*m_context, 0xFFFFFFFF);
     m_context->setScissorTestEnabled(false);
     m_context->clear();
 
-    // The reflection and the upside-down picture each turn the winding, so front faces stay front faces.
+    // The reflection and the flipped picture each reverse the winding, so front faces stay front faces.
     const Matrix4f world = reflectionMatrix(mirror.getWorldTransform()) * eye.world;
     const Matrix4f view = inverse(world);
     Matrix4f projection = eye.projection;

@@ -107,8 +107,7 @@ Matrix4f SolidPainter::place(const Solid& solid) const
     return m_view * solid.getWorldTransform();
 }
 
-/// Projection * (view * the solid's world transform): in this order what is far from the origin and near the eye
-/// keeps its digits.
+/// Projection * (view * the solid's world transform): this order keeps precision far from the origin and near the eye.
 [[gnu::always_inline]] inline Matrix4f SolidPainter::project(const Solid& solid) const
 {
     const Matrix4f& world = solid.getWorldTransform();

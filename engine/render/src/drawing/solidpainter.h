@@ -22,8 +22,8 @@ namespace detail
 struct RendererProperties;
 struct UniformSources;
 
-/// Draws a list of solids for one eye. From solid to solid it looks only at what may have changed: a material and a
-/// mesh that the solid before had too are drawn again as they stand.
+/// Draws a list of solids for one eye. From solid to solid it checks only values that may have changed: the same
+/// material and mesh as before need no calls.
 class SolidPainter
 {
 public:
@@ -31,7 +31,7 @@ public:
     SolidPainter(RenderContext& context, const RendererProperties& properties, const Matrix4f& view,
                  const Matrix4f& projection);
 
-    /// In this order. The transform properties have the values of the last solid afterwards.
+    /// Draws in order. Afterwards the transform properties have the last solid's values.
     /// @param solids  each with an appearance and a program.
     void draw(Solid* const* solids, size_t count);
 
@@ -50,11 +50,11 @@ private:
     const Matrix4f m_projection;
     const ModelProjection m_modelProjection;
 
-    // Of the solid before; null where the next one has to be looked at in any case.
+    // Of the previous solid; null forces all checks.
     const Appearance* m_appearance = nullptr;
     const ShaderProgram* m_program = nullptr;
     const Mesh* m_mesh = nullptr; ///< bound for m_program
-    uint64_t m_revision = 0;      ///< the last of all revisions when its material was ready
+    uint64_t m_revision = 0;      ///< the process's last revision when its material was ready
     bool m_turnsWinding = false;
     bool m_hadJoints;
     const UniformSources* m_sources = nullptr;

@@ -64,7 +64,7 @@ Text::Text(AssetCachePool& pool, const Font::Ptr& font, const Colour4f& colour)
             m_overlay->getPropertyUniform("T_MODEL_VIEW_PROJECTION").get()));
     }
     if (!m_projection)
-        m_font = nullptr; // no memory, as the log said
+        m_font = nullptr; // no memory (logged)
 }
 
 Text::~Text() = default;
@@ -161,7 +161,7 @@ SharedPtr<Solid> Text::createSolid(AssetCachePool& pool) const
         ORV_LOG_ERROR("A text without glyphs makes no solid");
         return {};
     }
-    // Seen from afar, a blend of two mipmaps is the least ragged.
+    // Trilinear filtering looks smoothest from afar.
     if (m_font->getTexture()->hasMipmaps())
         m_font->getTexture()->setMinFilter(TextureParameters::FilterMode::LINEAR_MIPMAP_LINEAR);
     const SharedPtr<Appearance> appearance = makeAppearance();
@@ -171,7 +171,7 @@ SharedPtr<Solid> Text::createSolid(AssetCachePool& pool) const
     return makeSolid(appearance, -1.0f, *pool.getVertexBufferCache(), buffer);
 }
 
-/// The alpha of what is drawn over grows towards 1, so that a target's picture can be laid over another one.
+/// Blending raises the target's alpha towards 1, so that its picture can be composited over another one.
 SharedPtr<Appearance> Text::makeAppearance() const
 {
     const auto appearance = makeShared<Appearance>();
@@ -189,10 +189,10 @@ SharedPtr<Appearance> Text::makeAppearance() const
     return appearance;
 }
 
-/// Two triangles for each glyph: six vertices of place and texture coordinates.
+/// Two triangles for each glyph: six vertices of position and texture coordinates.
 /// @param ySign   1 for y downwards, -1 for y upwards.
-/// @param buffer  filled again, or made where it is empty or GL has refused memory for it.
-/// @return empty without glyphs, or, after an error, where memory lacks.
+/// @param buffer  filled again; made if it is empty or lost.
+/// @return empty without glyphs or, after an error, without memory.
 SharedPtr<Solid> Text::makeSolid(const SharedPtr<Appearance>& appearance, float ySign,
                                  VertexBufferCache& cache, SharedPtr<VertexBuffer>& buffer) const
 {

@@ -57,7 +57,7 @@ float readFloat(const uint8_t* bytes)
     return value;
 }
 
-/// Integers count as the numbers that they are.
+/// Integers are converted, not normalised.
 float readCoefficient(const uint8_t* bytes, uint32_t type)
 {
     switch (type)

@@ -79,7 +79,7 @@ SharedPtr<Glo> GloBuilder::build(const SharedPtr<SceneNode>& parent, MeshData wa
         return {};
     for (const AnimationData& animation : m_scene.animations)
     {
-        // Each is added while it is empty: adding looks through what is added.
+        // Groups are added while empty: adding searches the whole group.
         const SharedPtr<AnimationGroup> group = makeShared<AnimationGroup>();
         if (!group)
             return {};
@@ -101,7 +101,7 @@ SharedPtr<Glo> GloBuilder::build(const SharedPtr<SceneNode>& parent, MeshData wa
 
     if (top)
     {
-        // Coming under a parent rebuilds the local matrix from its components.
+        // Attaching rebuilds the local matrix from its components.
         const Matrix4f transform = top->getLocalTransform();
         top->setParent(parent, false);
         top->setLocalTransform(transform);
@@ -204,7 +204,7 @@ void GloBuilder::setTransform(SceneNode& node, const NodeData& data, bool top) c
         node.setRotation(quaternionFromAxisAngle(Vector3f(1.0f, 0.0f, 0.0f), -quarter));
 }
 
-/// What the filled reference slots stand for: the first is to be the node, the others its children.
+/// The objects of the filled reference slots: the first becomes the node, the others its children.
 bool GloBuilder::makeObjects(const NodeData& data, Objects& objects)
 {
     std::vector<SharedPtr<Solid>> solids;
@@ -304,7 +304,7 @@ GloBuilder::NameRange GloBuilder::findName(const Names& names, std::string_view 
     return {names.data() + (begin - names.begin()), names.data() + (end - names.begin())};
 }
 
-/// What a skin's joint names may mean is looked up once, however many nodes refer to the skin.
+/// A skin's joint names are looked up once, however many nodes refer to the skin.
 bool GloBuilder::linkSkins()
 {
     std::vector<std::vector<JointNodes>> known(m_scene.skins.size());
@@ -416,7 +416,7 @@ bool GloBuilder::makeCamera(const CameraReference& reference, Objects& objects)
     if (!made)
         return false;
     made->setProjectionType(Camera::ProjectionType(definition->projection));
-    // What the projection does not use is passed on only if it differs from what the camera has: the camera warns.
+    // Values that the projection does not use are only set if they differ, since the camera logs a warning.
     const bool perspective = definition->projection == projection::PERSPECTIVE;
     const Anglef fieldOfView = Anglef::fromRadians(definition->fieldOfView);
     if (perspective || std::abs(fieldOfView.radians() - made->getFieldOfView().radians()) > 1e-6f)

@@ -17,12 +17,12 @@
 namespace orv::detail
 {
 
-/// Makes engine objects of the records of a scene file. One per load; every failure is logged once.
+/// Makes engine objects from the records of a scene file. One per load; every failure is logged once.
 class GloBuilder
 {
 public:
-    /// @param scene     borrowed; its bulk data is given up on the way.
-    /// @param fileSize  in bytes; what it takes to build the scene is bounded by it.
+    /// @param scene     borrowed; its bulk data is freed in the process.
+    /// @param fileSize  in bytes; limits the cost of the scene.
     /// @param name      the file, for messages; borrowed.
     GloBuilder(AssetCachePool& pool, glo::GloScene& scene, glo::FileVersion version, glo::AuthoringTool tool,
                uint32_t fileSize, const char* name);
@@ -36,11 +36,11 @@ private:
     template <class Record>
     using RecordsByName = std::map<std::string_view, const Record*>; ///< the first of each name
 
-    /// A node that stands for one of the file's; kept alive by its tree.
+    /// A node made for a node of the file; kept alive by its tree.
     struct Place
     {
         SceneNode* node;
-        uint32_t end; ///< the place behind its last descendant; places are in the tree's order
+        uint32_t end; ///< the index after its last descendant; places are in the tree's order
     };
 
     struct NamedPlace

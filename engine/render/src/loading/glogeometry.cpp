@@ -80,7 +80,7 @@ std::vector<Vector4f> readAttribute(const Geometry& geometry, FileVersion versio
     return values;
 }
 
-/// @return without places if the geometry has none.
+/// @return without positions if the geometry has none.
 SharedPtr<MeshVertices> readVertices(const Geometry& geometry, FileVersion version)
 {
     const SharedPtr<MeshVertices> vertices = makeShared<MeshVertices>();
@@ -109,7 +109,7 @@ float getRadius(const MeshGeometry& geometry)
     return std::sqrt(largest);
 }
 
-/// @param vertices  empty where nothing is to be known of the mesh.
+/// @param vertices  empty if no geometry is kept.
 /// @return empty then.
 SharedPtr<MeshGeometry> makeMeshGeometry(const PrimitiveSet& set, const SharedPtr<MeshVertices>& vertices)
 {
@@ -134,7 +134,7 @@ SharedPtr<IndexBuffer> makeIndexBuffer(IndexBufferCache& cache, const PrimitiveS
     return buffer;
 }
 
-/// Eight at a time, by compilers' vector types: this is all that is done for each element of a large scene.
+/// Eight at a time, in compiler vectors: this is the only work for each index of a large scene.
 bool isBelow(const uint16_t* indices, size_t count, uint16_t limit)
 {
     typedef uint16_t Lanes __attribute__((vector_size(16)));

@@ -22,9 +22,9 @@ struct GloGeometry
     int jointCount = 0; ///< one more than the highest joint that a vertex names
 };
 
-/// @param geometry  its vertex bytes are given up once the GL has them.
+/// @param geometry  its vertex bytes are freed after the upload.
 /// @param fileName  for messages.
-/// @return false, after logging, if the GL would be led outside the vertices or cannot take them.
+/// @return false, after logging, if an index is out of range or GL refuses the data.
 bool makeGeometry(AssetCachePool& pool, glo::Geometry& geometry, glo::FileVersion version,
                   const char* fileName, MeshData wanted, GloGeometry& made);
 

@@ -21,7 +21,7 @@ bool isBuiltIn(const std::string& image)
     return image.compare(0, 4, "orv#") == 0 || image.compare(0, 7, "luvane#") == 0;
 }
 
-/// The sampler's settings, as far as there are such and the texture's size allows them.
+/// The sampler's settings, as far as they are valid and allowed for the texture's size.
 void setParameters(Texture2D& texture, const Sampler& sampler)
 {
     using FilterMode = TextureParameters::FilterMode;

@@ -19,8 +19,8 @@ namespace detail
 
 /// One material of a scene file.
 ///
-/// Skinned and plain geometry need different programs. A material that is used by both gets a second appearance,
-/// a copy of the first, which goes by the material's name; what is animated is animated in both.
+/// Skinned and plain geometry need different programs. A material that is used by both gets a second appearance, a copy
+/// of the first. The material's name refers to the first; animations change both.
 class GloMaterial
 {
 public:
@@ -30,13 +30,13 @@ public:
     /// The appearance for geometry of that kind.
     SharedPtr<Appearance> use(bool skinned);
 
-    /// The one that goes by the material's name; empty when there was no memory for it.
+    /// The one to which the material's name refers; empty without memory.
     const SharedPtr<Appearance>& getAppearance() const { return m_uses.front().appearance; }
 
-    /// Calls use with each appearance that there is, and whether it is for skinned geometry.
+    /// Calls use with each appearance, and whether it is for skinned geometry.
     void forEachAppearance(const std::function<void(const SharedPtr<Appearance>&, bool skinned)>& use) const;
 
-    /// A key of an animation: the programs and the blending are chosen for all that the material comes to.
+    /// Notes a key of an animation: program and blending must fit all values that the material takes.
     /// @param property  of the channel, "diffuse" or "opacity".
     template <class T>
     void reach(const std::string& property, const T& value)
@@ -63,7 +63,7 @@ private:
     glo::FileVersion m_version;
     glo::AuthoringTool m_tool;
     std::string m_name;
-    glo::StandardMaterial m_data; ///< colours and levels as far as animations take them
+    glo::StandardMaterial m_data; ///< colours and levels, including those of animations
     std::vector<Use> m_uses;
     bool m_used = false;
 };

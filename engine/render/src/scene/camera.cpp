@@ -34,7 +34,7 @@ ClipRange usableClipRange(float nearDistance, float farDistance)
     return range;
 }
 
-/// A view without extent becomes a projection onto nothing rather than one of infinities and NaN.
+/// 0 for 0: a view without extent gives a zero projection instead of infinities and NaN.
 float reciprocal(float x)
 {
     return x != 0.0f ? 1.0f / x : 0.0f;

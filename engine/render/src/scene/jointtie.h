@@ -6,10 +6,10 @@
 namespace orv::detail
 {
 
-/// Between a node and the solids that have it for a joint. The node holds one share of it, each attachment another.
+/// Connects a node with the solids that have it as a joint. The node and each attachment hold a share.
 ///
-/// A joint that a solid keeps alive must not keep that solid alive, by whatever path. Solids with joints are the
-/// only nodes that hold others than their children, so a joint without such a solid at or below it is safe to keep.
+/// A joint kept alive by a solid must not keep that solid alive, even indirectly. Only solids with joints hold nodes
+/// other than their children, so a joint without such a solid at or below it is safe to keep.
 class JointTie : public Shared
 {
 public:
@@ -21,14 +21,14 @@ public:
     SceneNode* getNode() const { return m_node; }
     void nodeDestroyed() { m_node = nullptr; }
 
-    /// Keeps the node alive from now on, or no longer; then this call may destroy it. A node that is being destroyed
-    /// already stays so.
+    /// Keeps the node alive, or stops doing so; then this call may destroy it. No effect on a node that is being
+    /// destroyed.
     void keep(bool kept)
     {
         m_kept = kept && m_node->sharedGetCount() > 0 ? SharedPtr<SceneNode>(m_node) : SharedPtr<SceneNode>();
     }
 
-    /// An attachment's end; with the last one the node is kept no longer.
+    /// Ends an attachment; after the last one the node is no longer kept alive.
     static void leave(SharedPtr<JointTie>& tie)
     {
         constexpr int NODE_AND_ONE_ATTACHMENT = 2;

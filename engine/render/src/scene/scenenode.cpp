@@ -31,8 +31,8 @@ SceneNode::~SceneNode()
         endChildren();
 }
 
-/// Descendants that die with this node are gathered here and die one by one: a chain of nodes as long as a damaged or
-/// generated scene likes must not recurse through as many destructors, nor marks.
+/// Collects the descendants that die with this node and destroys them one by one: a very long chain of nodes must not
+/// recurse through destructors or marks.
 void SceneNode::endChildren()
 {
     std::vector<SharedPtr<SceneNode>> orphans = m_children->getAll();
@@ -69,7 +69,7 @@ void SceneNode::accept(SceneNodeVisitor& visitor)
 void SceneNode::setName(const char* name)
 {
     const size_t length = name ? std::strlen(name) : 0;
-    std::unique_ptr<char[]> copy; // name may lie in the old one
+    std::unique_ptr<char[]> copy; // name may point into the old one
     if (length > 0)
     {
         copy = std::make_unique<char[]>(length + 1);
@@ -126,12 +126,12 @@ void SceneNode::updateMotionData()
 
 void SceneNode::setParent(const SharedPtr<SceneNode>& parent, bool preserveWorldTransform)
 {
-    // A node without children is above itself alone.
+    // A node without children is no other node's ancestor.
     if (parent && (parent.get() == this || (getChildCount() > 0 && parent->hasAncestor(this))))
         return;
 
-    // The caller's pointer may lie in the child list that is about to change, and the old parent's share of
-    // this node may be the last one: both are held until the end.
+    // The caller's pointer may be in the child list that changes, and the old parent may hold the last share of this
+    // node: both are held until the end.
     const SharedPtr<SceneNode> newParent = parent; // NOLINT(performance-unnecessary-copy-initialization)
     SharedPtr<SceneNode> self;
     const Matrix4f world = getWorldTransform();
@@ -143,7 +143,7 @@ void SceneNode::setParent(const SharedPtr<SceneNode>& parent, bool preserveWorld
 
     const Matrix4f toParent =
         newParent && preserveWorldTransform ? inverse(newParent->getWorldTransform()) : Matrix4f::IDENTITY;
-    // A parent squeezed flat has no inverse: then no local matrix keeps the node in place.
+    // A flattened parent has no inverse: then no local matrix keeps the node in place.
     if (preserveWorldTransform && !(toParent == Matrix4f()))
         setLocalTransform(toParent * world);
     else
@@ -235,7 +235,7 @@ SharedPtr<SceneNode> SceneNode::takeChild(const SceneNode* child)
     return taken;
 }
 
-/// For attachJoint(): the attachment that takes it is one more that may keep this node alive.
+/// For attachJoint(): counts one more attachment that may keep this node alive.
 SharedPtr<detail::JointTie> SceneNode::tie()
 {
     Extras* const extras = makeExtras();
@@ -248,12 +248,12 @@ SharedPtr<detail::JointTie> SceneNode::tie()
     return extras->tie;
 }
 
-/// Adds to the number of solids with joints at or below this node and those above it; less by wrapping round.
+/// Adds to the number of solids with joints at or below this node and its ancestors; wraps round to subtract.
 void SceneNode::countSkinned(uint32_t more)
 {
     for (SceneNode* node = more != 0 ? this : nullptr; node;)
     {
-        // A node that its tie alone has kept is a root, and may go here.
+        // A node kept only by its tie is a root, and may be destroyed here.
         SceneNode* const parent = node->m_parent;
         node->m_skinnedCount += more;
         detail::JointTie* const tie = node->m_extras ? node->m_extras->tie.get() : nullptr;

@@ -1,4 +1,4 @@
-// How a node finds its place in the world; the rest of the class is in scenenode.cpp.
+// World transforms of SceneNode; the rest of the class is in scenenode.cpp.
 
 #include "orv/scenenode.h"
 

@@ -1,4 +1,4 @@
-// How far the subtrees of a scene reach, for those who ask whether they can be seen.
+// Bounding spheres of subtrees, for culling.
 
 #include "orv/appearance.h"
 #include "orv/camera.h"
@@ -17,7 +17,7 @@ namespace orv
 namespace
 {
 
-// Spheres have the negative of their radius in w: above 0 there is nothing, and minus infinity is no limit.
+// A sphere's w is its negative radius: above 0 it is empty, at minus infinity unlimited.
 constexpr Vector4f NOTHING(0.0f, 0.0f, 0.0f, 1.0f);
 constexpr Vector4f UNLIMITED(0.0f, 0.0f, 0.0f, -std::numeric_limits<float>::infinity());
 
@@ -76,7 +76,7 @@ void SceneNode::forEachReach(const Use& use) const
     }
 }
 
-/// Goes through the children twice; what is below them is kept the first time.
+/// Visits the children twice; their own subtrees are cached the first time.
 Vector4f SceneNode::findReach() const
 {
     m_reachState = ReachState::KNOWN;
@@ -107,7 +107,8 @@ Vector4f SceneNode::findReach() const
     return extras->reach;
 }
 
-/// Nodes of other classes may hand anything to a visitor; lights shine from outside the view.
+/// Unlimited for lights, which shine from outside the view, and for other classes, which may pass anything to a
+/// visitor.
 Vector4f SceneNode::getOwnReach() const
 {
     switch (getNodeType())

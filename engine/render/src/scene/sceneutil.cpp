@@ -143,8 +143,8 @@ SharedPtr<Solid> createSphere(AssetCachePool& pool, unsigned int segments, unsig
 
 void point(SceneNode& node, const Vector3f& target, const Vector3f& up)
 {
-    // Straight lines stay straight between a parent's space and the world, so it is enough to meet the target
-    // in the parent's space, whatever the parents' scales are.
+    // Straight lines stay straight between a parent's space and the world, so it suffices to point at the target in the
+    // parent's space, whatever the parents' scales.
     const SceneNode* parent = node.getParent();
     const Matrix4f toParent = parent ? inverse(parent->getWorldTransform()) : Matrix4f::IDENTITY;
     const Vector3f localTarget = (toParent * Vector4f(target, 1.0f)).xyz();

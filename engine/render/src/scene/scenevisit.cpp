@@ -8,14 +8,14 @@ namespace orv::detail
 namespace
 {
 
-/// What the flag-restricted walk hands from a node to its children.
+/// State that the flag-restricted walk passes from a node to its children.
 struct WalkState
 {
     uint32_t accumulated = 0; ///< the recursive flags met on the way down, in stored polarity
     bool satisfied = false;   ///< whether the recursive condition held at the parent
 };
 
-/// What stays the same during one walk.
+/// Constants of one walk.
 struct Walk
 {
     SceneNodeVisitor& visitor;
@@ -31,7 +31,7 @@ void visitBelow(SceneNodeVisitor& visitor, ChildList& list)
     while (SceneNode* child = children.next())
     {
         child->accept(visitor);
-        if (child->getChildList()) // most have none, and need no call
+        if (child->getChildList()) // most have none
             visitBelow(visitor, *child->getChildList());
     }
 }
@@ -57,7 +57,7 @@ void visitAllGuided(WalkGuide& guide, SceneNode& node)
 }
 
 /// Visits the node, if its flags are right.
-/// @return whether those below it are to be looked at, with the state as it is then.
+/// @return whether to visit its children, with the updated state.
 [[gnu::always_inline]] inline bool visitOne(const Walk& walk, SceneNode& node, WalkState& state)
 {
     const FlagMask& render = walk.renderFlags;
@@ -78,7 +78,7 @@ void visitAllGuided(WalkGuide& guide, SceneNode& node)
     const uint32_t flags = (node.getFlags() | state.accumulated) ^ render.inverted;
     if ((flags & render.mask) == render.mask)
         node.accept(walk.visitor);
-    return !stop; // else the condition was lost here and cannot come back further down
+    return !stop; // otherwise no node below can meet the condition again
 }
 
 void visitRestrictedBelow(const Walk& walk, ChildList& list, const WalkState& state)

@@ -13,8 +13,8 @@ class SceneNodeVisitor;
 namespace detail
 {
 
-/// A walk through a scene by this thread. Nodes that leave their parents meanwhile, and the top of the walk, live
-/// until its end, so that a visitor may remove what it visits. Of walks within one another the outermost counts.
+/// A walk through a scene by this thread. Nodes that leave their parents during it, and its top node, live until its
+/// end, so that a visitor may remove nodes. Of nested walks the outermost counts.
 class SceneWalk
 {
 public:
@@ -28,11 +28,11 @@ public:
 
 private:
     bool m_isOutermost;
-    SharedPtr<SceneNode> m_top; ///< unless it is no node of SharedPtrs
+    SharedPtr<SceneNode> m_top; ///< empty if the node is not reference-counted
     std::vector<SharedPtr<SceneNode>> m_kept;
 };
 
-/// Says who visits the parts of a scene.
+/// Chooses the visitors of parts of a scene.
 class WalkGuide
 {
 public:
@@ -56,7 +56,7 @@ private:
 void visitGuided(WalkGuide& guide, SceneNode& node, const FlagMask& renderFlags,
                  const FlagMask& recursiveFlags);
 
-/// The walk of all nodes without a look at flags.
+/// The walk of all nodes, without checking flags.
 void visitAll(SceneNodeVisitor& visitor, SceneNode& node);
 
 /// That of visitScene() with flags.

@@ -115,8 +115,7 @@ void Solid::attachJoint(const SharedPtr<SceneNode>& joint, const Matrix4f& inver
         ORV_LOG_ERROR("Solid \"%s\" has more than %d joints; the others have no effect.", getName(),
                       MAX_JOINTS);
     if (getJointCount() == 1)
-        countSkinned(
-            1); // last: a joint above that nothing else holds dies now, and perhaps this solid with it
+        countSkinned(1); // last: may destroy a joint above and this solid
 }
 
 int Solid::getJointCount() const
@@ -154,7 +153,7 @@ bool Solid::turnsSkinWinding(const ShaderProgram* program) const
     return isSkinned ? isSkinMirrored() : getWorldMirrored();
 }
 
-/// Joints that disagree leave a part of the mesh inside out, so most of them count.
+/// By the majority of joints: where they disagree, a part of the mesh is inside out anyway.
 bool Solid::isSkinMirrored() const
 {
     const int count = std::min(getJointCount(), MAX_JOINTS);
@@ -196,7 +195,7 @@ detail::DrawCall Solid::bindMesh(RenderContext& context, ShaderProgram& program)
         return {};
     if (!context.getBindings().isVertexInputBound(program.getRevision(), vertices->getRevision()))
     {
-        // Whatever a lost context took along, drawing the rest would read garbage.
+        // After a lost context, drawing would read garbage.
         if (!program.getId() || vertices->isLost())
             return {};
         program.bind(context, *vertices);
