@@ -16,7 +16,7 @@ Bounds getWorldBounds(SceneNode& top, Animation& animation, int steps)
     std::sort(times.begin(), times.end());
     times.erase(std::unique(times.begin(), times.end()), times.end());
 
-    // The sphere of the whole has to be about the centre of the whole box: those of the moments are put into it.
+    // The total sphere is around the centre of the total box, and contains the sphere of each sample.
     std::vector<Bounds> moments;
     Box box;
     for (size_t i = 0; i < times.size(); ++i)

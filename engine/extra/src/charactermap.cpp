@@ -13,7 +13,7 @@ bool isUnicode(unsigned platform, unsigned encoding)
            (platform == MICROSOFT && (encoding == MICROSOFT_BMP || encoding == MICROSOFT_FULL));
 }
 
-/// The more characters a format can name, the more. @return 0 for one that is not read.
+/// Higher for formats that can hold more characters. @return 0 for unsupported formats.
 int rateFormat(unsigned format)
 {
     switch (format)
@@ -21,7 +21,7 @@ int rateFormat(unsigned format)
     case 12: return 5;
     case 10: return 4;
     case 4: return 3;
-    case 13: return 2; // one glyph for whole scripts: better than nothing
+    case 13: return 2; // one glyph for whole scripts: the last choice
     case 0:
     case 6: return 1;
     default: return 0;

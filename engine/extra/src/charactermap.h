@@ -5,16 +5,16 @@
 namespace orv::detail
 {
 
-/// Which glyph a character has, by the best map of a font: Unicode, beyond 16 bits where there is one of those.
+/// Maps characters to glyphs by a font's best map: Unicode, if possible beyond 16 bits.
 ///
-/// Read are the formats 0, 4, 6, 10, 12 and 13.
+/// Supports the formats 0, 4, 6, 10, 12 and 13.
 class CharacterMap
 {
 public:
     /// @param maps  the table "cmap". @return false if there is no map that can be read.
     bool read(FontBytes maps);
 
-    /// @return 0, the glyph for what is missing, for what is not in the map and for what is damaged there.
+    /// @return 0, the glyph for missing characters, if the character is not in the map or its entry is damaged.
     uint32_t find(uint32_t codePoint) const;
 
 private:

@@ -192,7 +192,7 @@ void DebugLines::draw(RenderContext& context, Camera& camera)
         detail::setViewport(context, viewport);
 }
 
-/// @return false where GL has no memory for them, which the log says.
+/// @return false if GL has no memory (logged).
 bool DebugLines::copyVertices()
 {
     if (m_isCopied)
@@ -214,7 +214,7 @@ void DebugLines::setMesh()
         makeShared<IndexBuffer>(IndexBuffer::Primitive::LINES, int(m_vertices.size()), false, nullptr);
     m_solid->setMesh(order ? makeShared<Mesh>(MeshHeader(), order, m_buffer) : nullptr);
     if (!m_solid->getMesh())
-        m_buffer = nullptr; // no memory, as the log said
+        m_buffer = nullptr; // no memory (logged)
 }
 
 bool DebugLines::makeBuffer(const unsigned char* data, unsigned size)

@@ -20,7 +20,7 @@ namespace
 
 using detail::FontBytes;
 
-/// @return where the tables of one font of a file are listed: 0 unless the file is a collection; -1 if it has no such font.
+/// @return the offset of a font's list of tables: 0 unless the file is a collection; -1 if it has no such font.
 int64_t findStart(FontBytes file, unsigned index)
 {
     const std::size_t COUNT_AT = 8, STARTS_AT = 12;
@@ -75,7 +75,7 @@ FontFace::Ptr FontFace::load(Stream& stream, const char* name, unsigned index)
     return face;
 }
 
-/// @return null, or what is wrong.
+/// @return null, or the fault.
 const char* FontFace::read()
 {
     if (!getData() || getSizeInBytes() > INT_MAX)

@@ -2,8 +2,8 @@
 
 #include "orv/detail/fonttables.h"
 
-// As in the engine's own baker: everything static, and no assertion stops the program; what they ask for of the file is
-// made sure of before the rasteriser sees a glyph.
+// As in the engine's own baker: all static, and assertions must not stop the program; their conditions on the file are
+// checked before.
 #define STB_TRUETYPE_IMPLEMENTATION
 #define STBTT_STATIC
 #define STBTT_assert(condition) ((void)0)
@@ -21,7 +21,7 @@ namespace orv::detail
 namespace
 {
 
-constexpr float MOST_REACH = 16384.0f; ///< pixels from the pen; the rasteriser keeps places in 16 bits
+constexpr float MOST_REACH = 16384.0f; ///< pixels from the pen; the rasteriser keeps positions in 16 bits
 
 /// A rectangle in the font's own units.
 struct Box
@@ -38,14 +38,14 @@ struct Box
     float getSides() const { return float(x1 - x0) + float(y1 - y0); }
 };
 
-/// What a shape costs to draw: edges are sorted, which is quadratic at its worst, and each edge takes a step for each pixel
-/// along its way, or, where it leaves the glyph's box, for each pixel of the rows that it crosses.
+/// Checks the cost of drawing a shape. Sorting its edges is quadratic in the worst case. Each edge takes a step for
+/// each pixel along it or, outside the glyph's box, for each pixel of the rows that it crosses.
 /// @return null, or why it must not be drawn.
 const char* findCostFault(const stbtt_vertex* points, int count, const Box& box, float scale)
 {
     const float FLATNESS = 0.35f; // pixels by which the edges may miss the curve
     const float MOST_EDGES = 8192.0f;
-    const float FEW_STEPS = 100000.0f; // that any glyph may take
+    const float FEW_STEPS = 100000.0f; // allowed for any glyph
     const float STEPS_PER_PIXEL = 16.0f;
 
     const float width = float(box.x1 - box.x0);
@@ -90,7 +90,7 @@ struct FontOutlines::Rasteriser
     stbtt_fontinfo info = {};
 };
 
-/// The rasteriser's own way to open a font reads tables that are not needed here and were not checked.
+/// Fills the rasteriser's record directly: its own function reads further, unchecked tables.
 FontOutlines::FontOutlines(unsigned char* file, const FontTables& tables)
     : m_rasteriser(new Rasteriser{tables})
 {
@@ -116,13 +116,13 @@ FontOutlines::~FontOutlines() = default;
 const char* FontOutlines::draw(uint32_t glyph, float scale, int mostSide, GlyphPicture& picture) const
 {
     picture.width = picture.height = 0;
-    FontTables tables = m_rasteriser->tables; // each glyph is asked of sound ones
+    FontTables tables = m_rasteriser->tables; // a copy: a fault in one glyph must not affect others
     if (const char* fault = tables.findGlyphFault(glyph))
         return fault;
     const stbtt_fontinfo& info = m_rasteriser->info;
     Box box;
     if (!stbtt_GetGlyphBox(&info, int(glyph), &box.x0, &box.y0, &box.x1, &box.y1))
-        return nullptr; // a blank
+        return nullptr; // a blank glyph
     Box reach = box;
     reach.add(0, 0);
     if (reach.getSides() * scale > MOST_REACH || float(box.x1 - box.x0) * scale > float(mostSide) ||

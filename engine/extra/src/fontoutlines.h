@@ -15,25 +15,25 @@ struct GlyphPicture
 {
     int width = 0; ///< pixels; 0 for a blank
     int height = 0;
-    int x = 0; ///< where the upper left corner goes, seen from the pen on the baseline; y counts downwards
+    int x = 0; ///< of the upper left corner, relative to the pen on the baseline; y downwards
     int y = 0;
     std::vector<unsigned char> ink; ///< width x height, top row first: 255 is full
 };
 
-/// Draws the glyphs of a font whose tables have been checked; each glyph is checked when it is asked for.
+/// Draws the glyphs of a font whose tables have been checked; each glyph is checked when it is drawn.
 ///
-/// What one glyph takes is bounded by the pixels that it has.
+/// The time for a glyph is limited by its number of pixels.
 class FontOutlines
 {
 public:
-    /// @param file    borrowed as long as this is, and not written to.
+    /// @param file    borrowed as long as this object exists; not written to.
     /// @param tables  of this file, without a fault; copied.
     FontOutlines(unsigned char* file, const FontTables& tables);
     ~FontOutlines();
 
     /// @param scale    pixels for a unit of the font.
-    /// @param mostSide  pixels that a picture may have each way.
-    /// @param picture   filled in; its memory is used again.
+    /// @param mostSide  limit of width and height, pixels.
+    /// @param picture   filled; its memory is reused.
     /// @return null, or why the glyph cannot be drawn.
     const char* draw(uint32_t glyph, float scale, int mostSide, GlyphPicture& picture) const;
 

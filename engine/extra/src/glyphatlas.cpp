@@ -22,7 +22,7 @@ namespace
 constexpr int CELL_SIDES[] = {8,  12,  16,  20,  24,  32,  40,   48,   64,  80,
                               96, 128, 192, 256, 384, 512, 1024, 2048, 4096};
 
-/// Of the smallest cell that holds a picture and a pixel without ink to its right and below it.
+/// Side of the smallest cell for a picture with an empty pixel to its right and below.
 int findCellSide(const GlyphPicture& picture, int pageSize)
 {
     const int wanted = std::max(picture.width, picture.height) + 1;
@@ -38,7 +38,7 @@ SharedPtr<Appearance> makeInkAppearance(const SharedPtr<ShaderProgram>& program,
     if (!appearance)
         return {};
     appearance->setShaderProgram(program);
-    // The alpha of what is drawn over grows towards 1, so that a target's picture can be laid over another one.
+    // Blending raises the target's alpha towards 1, so that its picture can be composited over another one.
     appearance->setBlendFactors(BlendFactor::SRC_ALPHA, BlendFactor::ONE, BlendFactor::ONE_MINUS_SRC_ALPHA,
                                 BlendFactor::ONE_MINUS_SRC_ALPHA);
     appearance->setCullingMode(CullingMode::CULL_NONE);
@@ -137,13 +137,13 @@ bool GlyphAtlas::addRow(int side)
     return true;
 }
 
-/// Somebody holds the texture besides this page, its appearance and the cache of textures.
+/// Whether others than this page, its appearance and the texture cache hold the texture.
 bool GlyphAtlas::isHeld(const Page& page)
 {
     return page.texture && page.texture->sharedGetCount() > page.ownShares;
 }
 
-/// Makes room. @return false if everything is in use.
+/// Drops old glyphs. @return false if everything is in use.
 bool GlyphAtlas::forget(int side)
 {
     const uint32_t entry = findOldest(side);
@@ -157,7 +157,7 @@ bool GlyphAtlas::forget(int side)
     return true;
 }
 
-/// @return the glyph in a cell of this size that was used, or else added, the longest ago; NONE if all are in use.
+/// @return the least recently used glyph in cells of this size, of equals the oldest; NONE if all are in use.
 uint32_t GlyphAtlas::findOldest(int side) const
 {
     uint32_t oldest = NONE;
@@ -195,7 +195,7 @@ void GlyphAtlas::forgetEntry(uint32_t number)
     entry = {};
 }
 
-/// Forgets all glyphs of a page, and the texture too if it is somebody else's as well.
+/// Drops all glyphs of a page, and its texture too if others hold it.
 void GlyphAtlas::clearPage(unsigned number)
 {
     for (uint32_t i = 0; i < m_entries.size(); ++i)
@@ -218,7 +218,7 @@ void GlyphAtlas::clearPage(unsigned number)
     std::fill(page.ink.begin(), page.ink.end(), static_cast<unsigned char>(0));
 }
 
-/// The whole cell: what was there before goes.
+/// Writes the whole cell, over older contents.
 void GlyphAtlas::draw(const Entry& entry, const GlyphPicture& picture)
 {
     Page& page = m_pages[entry.page];
@@ -252,7 +252,7 @@ bool GlyphAtlas::updateTexture(Page& page)
 {
     if (page.texture->getId() == 0)
         return false;              // lost with its context
-    RenderDevice::getError(false); // an older error is not taken for one of these calls
+    RenderDevice::getError(false); // an older error must not be taken for one of these calls
     page.texture->enable();
     glPixelStorei(GL_UNPACK_ALIGNMENT, 1);
     glTexSubImage2D(GL_TEXTURE_2D, 0, 0, page.changedTop, m_pageSize, page.changedEnd - page.changedTop,
@@ -287,7 +287,7 @@ bool GlyphAtlas::makeTexture(Page& page)
         return false;
     page.look.appearance = appearance;
     page.texture = texture;
-    page.ownShares = texture->sharedGetCount() - 1; // without the one here
+    page.ownShares = texture->sharedGetCount() - 1; // without the local one
     return true;
 }
 
@@ -296,7 +296,7 @@ SharedPtr<Texture2D> GlyphAtlas::takeTexture(unsigned number)
     Page& page = m_pages[number];
     if (page.texture && page.texture->getId() != 0 && !page.hasMipmaps)
     {
-        // It had mipmaps of what was there when it was made.
+        // Makes the mipmaps again: they were made from older contents.
         page.texture->setMinFilter(TextureParameters::FilterMode::LINEAR_MIPMAP_LINEAR);
         glGenerateMipmap(GL_TEXTURE_2D);
         page.hasMipmaps = true;

@@ -22,17 +22,17 @@ namespace detail
 
 struct GlyphPicture;
 
-/// Blended, seen from both sides, without a depth of its own; the texture's alpha is the ink.
-/// @return empty where memory lacks (logged).
+/// Blended, visible from both sides, without writing depth; the texture's alpha is the ink.
+/// @return empty without memory (logged).
 SharedPtr<Appearance> makeInkAppearance(const SharedPtr<ShaderProgram>& program,
                                         const SharedPtr<Texture2D>& ink, const Colour4f& colour);
 
 /// Pictures of glyphs in square textures, the pages.
 ///
-/// A page is filled by rows of square cells, each row as high as its cells, which come in few sizes. Where there is room for
-/// no more, whatever was used the longest ago is forgotten: a glyph in a cell of the size that is wanted, or a page, if
-/// all of it was used before that glyph. Nothing that was used since the last beginUse() is forgotten.
-/// A page that somebody else holds the texture of keeps its glyphs; instead of being cleared it is let go, and is theirs.
+/// A page is filled by rows of square cells, each row as high as its cells, which come in few sizes. When all pages are
+/// full, the least recently used is dropped: a glyph in a cell of the needed size, or a whole page if all of its glyphs
+/// are older. Glyphs used since the last beginUse() are kept. If others hold a page's texture, its glyphs stay: instead
+/// of clearing the page, the atlas gives the texture up to them.
 class GlyphAtlas
 {
 public:
@@ -42,7 +42,7 @@ public:
     {
         uint64_t key = 0;
         uint64_t lastUse = 0;
-        uint64_t id = 0; ///< of this glyph in this place, never given again; 0: nothing is here
+        uint64_t id = 0; ///< of this glyph in this cell, never reused; 0: empty
         uint16_t page = 0;
         uint16_t cell = 0;     ///< side of its cell
         uint16_t x = 0, y = 0; ///< upper left corner, of cell and glyph
@@ -50,10 +50,10 @@ public:
         int16_t offsetX = 0, offsetY = 0; ///< as GlyphPicture has them
     };
 
-    /// What a page is drawn with over a frame; the colour and projection of the next draw.
+    /// For drawing a page over a frame; colour and projection of the next draw.
     struct Look
     {
-        SharedPtr<Appearance> appearance; ///< empty as long as there is no texture
+        SharedPtr<Appearance> appearance; ///< empty without a texture
         SharedPtr<ShaderUniform<Matrix4f>> projection;
         Colour4f colour;
     };
@@ -65,22 +65,22 @@ public:
     int getPageSize() const { return m_pageSize; }
     unsigned getPageCount() const { return unsigned(m_pages.size()); }
     unsigned getGlyphCount() const { return unsigned(m_byKey.size()); }
-    uint64_t getDrawnCount() const { return m_lastId; } ///< pictures that were ever added
+    uint64_t getDrawnCount() const { return m_lastId; } ///< pictures added so far
 
-    /// From here on everything may be forgotten that is not used again.
+    /// Begins a new use: glyphs not used after this call may be dropped.
     void beginUse() { ++m_use; }
 
-    /// @return the number of a glyph, which is used by that, or NONE.
+    /// Marks a glyph as used. @return its number, or NONE.
     uint32_t find(uint64_t key);
 
-    /// Adds a glyph that is not there, and uses it.
+    /// Adds a new glyph and marks it as used.
     /// @param picture  not blank, and each side below that of a page.
-    /// @return NONE if everything there is room for is in use.
+    /// @return NONE if everything is in use.
     uint32_t add(uint64_t key, const GlyphPicture& picture);
 
     const Entry& getEntry(uint32_t number) const { return m_entries[number]; }
 
-    /// Uses a glyph again. @return false if it has been forgotten since it had that id.
+    /// Marks a glyph as used again. @return false if it has been dropped since it had that id.
     bool use(uint32_t number, uint64_t id)
     {
         Entry& entry = m_entries[number];
@@ -91,15 +91,14 @@ public:
         return true;
     }
 
-    /// Sends to GL what has been added. To be called before anything is drawn.
-    /// @param isTryingAgain  also what GL refused before.
+    /// Uploads new glyphs. Call it before drawing.
+    /// @param isTryingAgain  also pages that GL refused before.
     void upload(bool isTryingAgain);
 
-    /// What GL refused, or lost with its context, has no appearance or draws nothing.
+    /// A page that GL refused, or that was lost with the context, has no appearance or draws nothing.
     Look& getLook(unsigned page) { return m_pages[page].look; }
 
-    /// A page's texture, with mipmaps from here on; empty where GL has none. As long as somebody else holds it, its
-    /// glyphs stay.
+    /// A page's texture, from now on with mipmaps; empty if GL refuses it. Its glyphs stay as long as others hold it.
     SharedPtr<Texture2D> takeTexture(unsigned number);
 
 private:
@@ -110,9 +109,9 @@ private:
 
     struct Page
     {
-        std::vector<unsigned char> ink; ///< what the texture shows, or will
+        std::vector<unsigned char> ink; ///< the texture's current or next contents
         SharedPtr<Texture2D> texture;
-        int ownShares = 0; ///< of the texture, while nobody else holds it
+        int ownShares = 0; ///< reference count of the texture without others
         bool hasMipmaps = false;
         bool isRefused = false;
         int rowsEnd = 0;                    ///< below the last row of cells

@@ -18,7 +18,7 @@ namespace
 {
 
 constexpr uint32_t CODE_POINTS = 0x110000;
-constexpr std::size_t MOST_FAULTS = 16; ///< of one font that are named
+constexpr std::size_t MOST_FAULTS = 16; ///< logged for one font
 
 uint64_t pack(const GlyphCache::Key& key)
 {
@@ -104,7 +104,7 @@ GlyphCache::Key GlyphCache::findCharacter(uint32_t codePoint, uint32_t size)
     return {found.font, found.glyph, size};
 }
 
-/// Whether nothing would be seen of a glyph, at a size at which everything would be.
+/// Whether a glyph has no visible pixel at a large size.
 bool GlyphCache::isBlank(uint32_t font, uint32_t glyph)
 {
     const float SIZE = 32.0f;
@@ -124,7 +124,7 @@ void GlyphCache::reportMissing(uint32_t codePoint)
     m_missing[codePoint] = true;
 }
 
-/// Once for each glyph, and for few of them: a damaged font may have nothing else.
+/// Once for each glyph, and for a limited number: all glyphs of a font may be damaged.
 void GlyphCache::reportFault(const Key& key, const char* fault)
 {
     const FontFace& face = *m_fonts[key.font];
@@ -172,7 +172,7 @@ bool GlyphCache::place(const Key& key, uint32_t& number)
     return number != detail::GlyphAtlas::NONE;
 }
 
-/// What cannot be drawn becomes a plain box.
+/// Draws a plain box if the glyph cannot be drawn.
 void GlyphCache::drawGlyph(const Key& key)
 {
     if (key.font == BOX)

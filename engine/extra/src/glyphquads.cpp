@@ -20,10 +20,10 @@ namespace
 {
 
 constexpr unsigned VERTICES_PER_QUAD = 6; ///< two triangles
-constexpr unsigned FLOATS_PER_VERTEX = 4; ///< place and texture coordinates
+constexpr unsigned FLOATS_PER_VERTEX = 4; ///< position and texture coordinates
 constexpr unsigned FLOATS_PER_QUAD = VERTICES_PER_QUAD * FLOATS_PER_VERTEX;
 
-/// @return empty where memory lacks (logged).
+/// @return empty without memory (logged).
 VertexBuffer::Ptr makeBuffer(VertexBufferCache& cache, const VertexArray& vertices)
 {
     using Format = VertexBuffer::AttribFormat;

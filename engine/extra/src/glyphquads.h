@@ -15,35 +15,35 @@ class VertexBufferCache;
 namespace detail
 {
 
-/// The glyphs of one page that one draw takes: a square for each, with room for more of them.
+/// The glyphs of one page for one draw: a quad for each, with spare capacity.
 ///
-/// Over a frame they are in one GL buffer that is filled again: what there is no glyph for has no size. For a scene they go
-/// into a buffer once.
+/// Over a frame they are in one GL buffer that is filled again; unused quads have no area. For a scene they go into a
+/// new buffer once.
 class GlyphQuads
 {
 public:
-    /// @param count  that there is to be room for. Without memory (logged) there is none.
+    /// @param count  capacity; without memory (logged) it is 0.
     explicit GlyphQuads(unsigned count);
     ~GlyphQuads();
 
     unsigned getRoom() const { return m_room; }
 
-    /// Begins again, without glyphs. @param count  that will be added, up to getRoom().
+    /// Removes all glyphs. @param count  that will be added, up to getRoom().
     void start(unsigned page, unsigned count);
-    /// @param x,y  of its upper left corner; @param width,height  downwards and to the right of it, or else negative.
+    /// @param x,y  of its upper left corner; @param width,height  to the right and downwards, else negative.
     void add(const GlyphAtlas::Entry& entry, float pageSize, float x, float y, float width, float height);
     bool isFull() const { return m_count == m_wanted; }
-    /// Hides what is left of the time before.
+    /// Hides the remaining quads of the last time.
     void end();
 
     unsigned getPage() const { return m_page; }
 
-    /// Fills the buffer. @return false where memory lacks (logged).
+    /// Fills the buffer. @return false without memory (logged).
     bool send(VertexBufferCache& cache);
-    /// What shows over a frame what was sent.
+    /// The solid that draws the sent quads over a frame.
     const SharedPtr<Solid>& getSolid() const { return m_solid; }
 
-    /// @return a mesh in a buffer of the pool; the quads are of no use any more. Empty where memory lacks.
+    /// @return a mesh in a buffer of the pool, or empty without memory. The quads cannot be used afterwards.
     SharedPtr<Mesh> makeMesh(AssetCachePool& pool);
 
 private:
@@ -53,7 +53,7 @@ private:
     unsigned m_room = 0;
     unsigned m_wanted = 0;
     unsigned m_count = 0;
-    unsigned m_shown = 0; ///< of the time before
+    unsigned m_shown = 0; ///< the last time
 };
 
 } // namespace detail

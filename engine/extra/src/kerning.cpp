@@ -11,8 +11,8 @@ namespace
 
 constexpr int NOT_COVERED = -1;
 
-/// Looks for a glyph in sorted records that begin with their first and their last glyph.
-/// @return where the record is, 0 for none.
+/// Searches sorted records, each of which begins with its first and last glyph, for a glyph.
+/// @return the record's offset, 0 for none.
 std::size_t findRange(FontBytes& table, std::size_t records, std::size_t count, uint32_t glyph)
 {
     std::size_t low = 0;
@@ -31,7 +31,7 @@ std::size_t findRange(FontBytes& table, std::size_t records, std::size_t count, 
     return 0;
 }
 
-/// Looks for a number in sorted records that begin with it. @return where the record is, 0 for none.
+/// Searches sorted records that begin with a number. @return the record's offset, 0 for none.
 std::size_t findRecord(FontBytes& table, std::size_t records, std::size_t size, std::size_t count,
                        uint32_t number)
 {
@@ -51,7 +51,7 @@ std::size_t findRecord(FontBytes& table, std::size_t records, std::size_t size, 
     return 0;
 }
 
-/// @return the glyph's number among those that a table is about, or NOT_COVERED.
+/// @return the glyph's index among those that a table covers, or NOT_COVERED.
 int findCoverage(FontBytes coverage, uint32_t glyph)
 {
     const unsigned count = coverage.u16(2);
@@ -76,7 +76,7 @@ unsigned findClass(FontBytes classes, uint32_t glyph)
     return range == 0 ? 0 : classes.u16(range + 4);
 }
 
-/// Of what a table says about one glyph: two bytes for each bit that is set.
+/// Size of a value record: two bytes for each bit that is set.
 std::size_t getValueSize(unsigned format)
 {
     std::size_t size = 0;
@@ -85,7 +85,7 @@ std::size_t getValueSize(unsigned format)
     return size;
 }
 
-/// @param left  how many records may be looked at; counted down.
+/// @param left  how many records may still be read; counted down.
 /// @return the lookups that a script uses for kerning.
 std::set<unsigned> findKerning(FontBytes script, FontBytes& features, int& left)
 {
@@ -185,7 +185,7 @@ void Kerning::readPairs(FontBytes kern)
         const bool isWanted =
             (coverage & (HORIZONTAL | MINIMUM | CROSS_STREAM)) == HORIZONTAL && coverage >> 8 == 0;
         if (isWanted && pairs.isSound() && kern.isSound())
-            m_pairs.push_back(pairs); // whatever the length says, which is too short a number for many pairs
+            m_pairs.push_back(pairs); // ignores the length: its field is too small for many pairs
         if (!kern.isSound() || length < HEADER_SIZE)
             return;
         at += length;
@@ -228,7 +228,7 @@ int Kerning::find(uint32_t left, uint32_t right) const
     return sum;
 }
 
-/// @return whether the table decides about the pair; if so, advance is what it says.
+/// @return whether the table has the pair; advance is then its value.
 bool Kerning::findAdjustment(FontBytes table, uint32_t left, uint32_t right, int& advance) const
 {
     const unsigned PLACEMENTS = 3, ADVANCE = 4;

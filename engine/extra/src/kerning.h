@@ -7,16 +7,15 @@
 namespace orv::detail
 {
 
-/// How much closer two glyphs stand than their advances say.
+/// Kerning: corrections of advances by pairs of glyphs.
 ///
-/// Read are the pair adjustments of the font's feature "kern" (table GPOS); without any, the pairs of the table "kern". What
-/// is said for several scripts is asked script by script, for none in particular last: the first that moves a pair counts.
-/// Of a file with more than 128 tables of pairs the rest is left out, so that a question has a price. Damage makes a
-/// distance of 0.
+/// Reads the pair adjustments of the font's feature "kern" (table GPOS) or, without any, the table "kern". Scripts are
+/// searched one after the other, the default script last; the first one with a value for a pair counts. Only the first
+/// 128 tables of pairs are used, to limit the time of a query. Damaged tables give 0.
 class Kerning
 {
 public:
-    /// @param tables  a copy, which may become unsound.
+    /// @param tables  a copy: damage found here marks it as faulty.
     void read(FontTables tables);
 
     /// @return in the font's units.
@@ -24,14 +23,14 @@ public:
 
 private:
     static constexpr std::size_t MOST_TABLES = 128;
-    static constexpr int MOST_RECORDS = 4096; ///< looked at, of all scripts together
+    static constexpr int MOST_RECORDS = 4096; ///< read, for all scripts together
 
     /// Pairs, or pairs of classes.
     struct Table
     {
         FontBytes bytes;
-        unsigned script; ///< a number for those with the same lookups
-        unsigned lookup; ///< of those with the same number the first counts that has the left glyph
+        unsigned script; ///< the same number for scripts with the same lookups
+        unsigned lookup; ///< the first one that has the left glyph counts
     };
 
     void readScripts(FontBytes positions);

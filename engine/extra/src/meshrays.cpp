@@ -14,9 +14,9 @@ namespace orv
 namespace
 {
 
-constexpr uint32_t FEW = 4; ///< triangles that are not worth halving
+constexpr uint32_t FEW = 4; ///< triangles that are not divided further
 
-/// @param hit  changes to this triangle if the ray meets it sooner than what it holds, or as soon and it comes first.
+/// @param hit  replaced if the ray hits this triangle nearer, or as near and the triangle has a lower number.
 void meetTriangle(const Ray& ray, const Vector3f& a, const Vector3f& b, const Vector3f& c,
                   TriangleSides sides, uint32_t triangle, MeshHit& hit, bool& isMet)
 {
@@ -28,7 +28,7 @@ void meetTriangle(const Ray& ray, const Vector3f& a, const Vector3f& b, const Ve
         (sides == TriangleSides::BACK && determinant > 0.0f))
         return;
     const float reciprocal =
-        1.0f / determinant; // infinite for a ray in the plane: no comparison below holds then
+        1.0f / determinant; // infinite for a ray in the plane: then all comparisons below fail
     const Vector3f start = ray.position - a;
     const float u = dot(start, perpendicular) * reciprocal;
     if (!(u >= 0.0f && u <= 1.0f))
@@ -45,7 +45,7 @@ void meetTriangle(const Ray& ray, const Vector3f& a, const Vector3f& b, const Ve
     isMet = isMet || isFirst;
 }
 
-/// A ray made ready for many boxes. They count as a little larger than they are, so that what lies on their sides is inside.
+/// A ray prepared for many boxes. Boxes are slightly enlarged, so that points on their sides are inside.
 class BoxRay
 {
 public:
@@ -71,8 +71,7 @@ public:
             const float slack = ROUNDING * (std::fabs(low) + std::fabs(high) + std::fabs(m_start[axis]));
             const float first = (low - slack - m_start[axis]) * m_reciprocal[axis];
             const float second = (high + slack - m_start[axis]) * m_reciprocal[axis];
-            from = std::max(
-                from, std::min(first, second)); // what is no number, on the side of a box, changes nothing
+            from = std::max(from, std::min(first, second)); // NaN, for a ray in a box's side, changes nothing
             to = std::min(to, std::max(first, second));
         }
         return from <= to * (1.0f + ROUNDING) ? from : std::numeric_limits<float>::infinity();
@@ -99,7 +98,7 @@ public:
         for (uint32_t i = 0; i < count; ++i)
         {
             const Vector3f centre = findBox(i).getCentre();
-            if (std::isfinite(centre.x + centre.y + centre.z)) // else there is no order of them
+            if (std::isfinite(centre.x + centre.y + centre.z)) // NaN cannot be sorted
                 m_centres[i] = centre;
         }
         m_tree.nodes.reserve(count);
@@ -115,7 +114,7 @@ private:
         return box;
     }
 
-    /// By the middle one of the triangles, along the longest side of the box around their centres.
+    /// At the median triangle, along the longest side of the box around their centres.
     void split(uint32_t first, uint32_t count)
     {
         const std::size_t index = m_tree.nodes.size();
@@ -171,7 +170,7 @@ bool meet(const MeshGeometry& geometry, const Ray& ray, TriangleSides sides, Mes
     const std::vector<Vector3f>& places = geometry.getVertices().places;
     const BoxRay boxRay(ray);
     bool isMet = false;
-    uint32_t waiting[64]; // one for each level at most, and halves of halves have no more than 32
+    uint32_t waiting[64]; // at most one for each level; halving gives at most 32 levels
     int count = 0;
     waiting[count++] = 0;
     while (count > 0)
@@ -188,7 +187,7 @@ bool meet(const MeshGeometry& geometry, const Ray& ray, TriangleSides sides, Mes
         }
         if (node.count > 0)
             continue;
-        // The nearer half first: what it has may do without the other.
+        // The nearer half first: a hit there may make the other unnecessary.
         const bool isFirstNearer = boxRay.enter(tree.nodes[index + 1].box, hit.distance) <=
                                    boxRay.enter(tree.nodes[node.first].box, hit.distance);
         waiting[count++] = isFirstNearer ? node.first : index + 1;

@@ -20,7 +20,7 @@ namespace
 {
 
 /// The sides of a solid's triangles, as its mesh has them, that are drawn.
-/// @param isTurned  what takes the mesh to where the ray is turns its sides.
+/// @param isTurned  the transform to the ray's space mirrors.
 TriangleSides getDrawnSides(const Appearance& appearance, bool isMirrored, bool isTurned)
 {
     const RenderState& state = appearance.getRenderState();
@@ -57,7 +57,7 @@ public:
     std::vector<PickHit> hits;
 
 private:
-    /// A mesh without joints is met in its own space, where its triangles are sorted.
+    /// A mesh without joints is tested in its own space, where it has a tree of triangles.
     bool meetSolid(const Solid& solid, const MeshGeometry& geometry, MeshHit& hit)
     {
         const Appearance& appearance = *solid.getAppearance();

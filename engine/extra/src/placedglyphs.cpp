@@ -19,14 +19,14 @@ namespace orv::detail
 namespace
 {
 
-constexpr std::size_t FEWEST_QUADS = 32; ///< that room is made for
+constexpr std::size_t FEWEST_QUADS = 32; ///< capacity of a buffer
 
 bool isSame(const Colour4f& a, const Colour4f& b)
 {
     return a.r == b.r && a.g == b.g && a.b == b.b && a.a == b.a;
 }
 
-/// Room for a text that changes now and then, so that it is seldom made again.
+/// Capacity with a reserve, so that changing texts seldom need a new buffer.
 unsigned findRoom(std::size_t count)
 {
     std::size_t room = FEWEST_QUADS;
@@ -52,14 +52,14 @@ void PlacedGlyphs::add(const GlyphCache::Key& key, float x, float y)
     m_glyphs.push_back({key, x, y, GlyphAtlas::NONE});
 }
 
-/// @return false if a glyph has been forgotten that the quads show.
+/// @return false if a glyph of the quads has been dropped.
 bool PlacedGlyphs::useAgain(GlyphAtlas& atlas)
 {
     return std::all_of(m_used.begin(), m_used.end(),
                        [&atlas](const Used& used) { return atlas.use(used.number, used.id); });
 }
 
-/// Gets the glyphs into the atlas, and calls use(first, end) for as many of them as it has room for at a time.
+/// Puts the glyphs into the atlas, and calls use(first, end) for each range that fits at a time.
 /// @return how often.
 template <class Use>
 int PlacedGlyphs::forEachLot(GlyphCache& cache, const Use& use)
@@ -93,10 +93,10 @@ void PlacedGlyphs::noteUsed(const GlyphAtlas& atlas)
                  m_used.end());
 }
 
-/// @param isForScene  y upwards, and no more room than is needed.
-/// @param quads  those that are there are filled again where they have enough room.
+/// @param isForScene  y upwards, without spare capacity.
+/// @param quads  existing ones are filled again if their capacity suffices.
 /// @param count  how many of them are filled.
-/// @return false where memory lacks (logged).
+/// @return false without memory (logged).
 bool PlacedGlyphs::fillQuads(const GlyphAtlas& atlas, std::size_t first, std::size_t end, float scale,
                              bool isForScene, Quads& quads, std::size_t& count)
 {
@@ -150,7 +150,7 @@ void PlacedGlyphs::draw(GlyphCache& cache, RenderContext& context, const Colour4
     atlas.beginUse();
     if (m_isMade && useAgain(atlas))
     {
-        atlas.upload(false); // others' glyphs may be waiting on these pages
+        atlas.upload(false); // glyphs of other texts may be pending on these pages
         drawQuads(atlas, context, colour);
         return;
     }
@@ -169,7 +169,7 @@ void PlacedGlyphs::draw(GlyphCache& cache, RenderContext& context, const Colour4
         noteUsed(atlas);
 }
 
-/// @return false where memory lacks (logged).
+/// @return false without memory (logged).
 bool PlacedGlyphs::sendQuads()
 {
     bool isSent = true;

@@ -21,7 +21,7 @@ namespace detail
 
 class GlyphQuads;
 
-/// Glyphs on the pixels of a page, and what GL draws them with.
+/// Placed glyphs, and the quads that draw them.
 class PlacedGlyphs
 {
 public:
@@ -33,10 +33,10 @@ public:
     /// @param x,y  of the pen on the baseline, whole pixels; y downwards.
     void add(const GlyphCache::Key& key, float x, float y);
 
-    /// As TextLayout has it. @param cache  the same each time.
+    /// See TextLayout. @param cache  the same each time.
     void draw(GlyphCache& cache, RenderContext& context, const Colour4f& colour);
 
-    /// As TextLayout has it, but quietly. @param scale  units for a pixel.
+    /// See TextLayout, but without messages. @param scale  units for a pixel.
     SharedPtr<Solid> createSolid(GlyphCache& cache, AssetCachePool& pool,
                                  const SharedPtr<ShaderProgram>& program, const Colour4f& colour,
                                  float scale);
@@ -46,7 +46,7 @@ private:
     {
         GlyphCache::Key key;
         float x, y;
-        uint32_t number; ///< in the atlas, if it was there the last time
+        uint32_t number; ///< in the atlas, if it was there last time
     };
 
     /// A glyph of the atlas that is drawn.
@@ -69,9 +69,8 @@ private:
 
     SharedPtr<VertexBufferCache> m_cache;
     std::vector<Glyph> m_glyphs;
-    std::vector<Used> m_used; ///< each glyph of the atlas that m_glyphs has, once
-    std::vector<std::size_t>
-        m_next; ///< for each page: how many glyphs, then which quads the next one goes into
+    std::vector<Used> m_used;        ///< each glyph of m_glyphs once
+    std::vector<std::size_t> m_next; ///< for each page: the number of glyphs, then the quads for the next one
     Quads m_quads;
     std::size_t m_quadsCount = 0; ///< of m_quads that are drawn
     bool m_isMade = false;        ///< m_quads show all of m_glyphs, as long as m_used are where they were

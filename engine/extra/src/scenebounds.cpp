@@ -40,7 +40,7 @@ std::vector<Matrix4f> getJointTransforms(const Solid& solid)
     return transforms;
 }
 
-/// A joint that there is not is stood in for by the last one.
+/// The last joint replaces missing ones.
 const Matrix4f& getJoint(const std::vector<Matrix4f>& joints, size_t number)
 {
     return joints[std::min(number, joints.size() - 1)];
@@ -62,8 +62,7 @@ void addBoundsCorners(const Solid& solid, std::vector<Vector3f>& corners)
             addCorners(mesh.getBounds().box, solid.getWorldTransform(), corners);
         return;
     }
-    const int last =
-        std::min(solid.getJointCount(), Solid::MAX_JOINTS) - 1; // stands in for those that there are not
+    const int last = std::min(solid.getJointCount(), Solid::MAX_JOINTS) - 1; // replaces missing ones
     for (size_t i = 0; i < mesh.getJointBounds().size(); ++i)
     {
         if (mesh.getJointBounds()[i].isKnown())
@@ -77,7 +76,7 @@ void addBoundsCorners(const Solid& solid, std::vector<Vector3f>& corners)
 namespace
 {
 
-/// Places in the world around all that a solid draws, in place of those there are; none if that is not known.
+/// Replaces places by world positions around all that a solid draws; none if unknown.
 void findPlaces(const Solid& solid, std::vector<Vector3f>& places)
 {
     const Mesh* const mesh = solid.getMesh().get();
@@ -94,7 +93,7 @@ void findPlaces(const Solid& solid, std::vector<Vector3f>& places)
         places.resize(kept);
 }
 
-/// Goes through a scene twice, for the box and then for the sphere about its centre.
+/// Visits a scene twice: for the box, then for the sphere around its centre.
 class BoundsVisitor : public SceneNodeVisitor
 {
 public:

@@ -67,7 +67,7 @@ void ShadowCasters::draw(RenderContext& context, Solid& solid)
     solid.draw(context, *caster.material);
 }
 
-/// What there is for a material, as it is now: its program, its sides and its values.
+/// The caster of a material, updated to its current program, sides and values.
 ShadowCasters::Caster& ShadowCasters::find(const Appearance& appearance)
 {
     Caster& caster = m_casters[&appearance];
@@ -122,7 +122,7 @@ void ShadowCasters::make(const Appearance& appearance, Caster& caster) const
     addValues(appearance, caster);
 }
 
-/// Values that the material lacks come from the context here as there.
+/// Values that the material lacks come from the context.
 void ShadowCasters::addValues(const Appearance& appearance, Caster& caster) const
 {
     if (!caster.program->uniformExists("M_CUTOFF"))

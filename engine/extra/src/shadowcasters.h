@@ -21,21 +21,21 @@ namespace detail
 
 struct ShadowView;
 
-/// Draws solids into a shadow map: each material has one beside it that draws distances.
+/// Draws solids into a shadow map, with a second material for each material that draws distances.
 class ShadowCasters
 {
 public:
     explicit ShadowCasters(const ShadowPrograms& programs);
 
-    /// To be called before the solids of a frame.
+    /// Call it before the solids of a frame.
     void begin(const ShadowView& view);
     /// @param solid  with a mesh, and a material with a program.
     void draw(RenderContext& context, Solid& solid);
-    /// Forgets what the frame had no solids of.
+    /// Drops materials that the frame did not use.
     void finish();
 
 private:
-    /// One value that the map's material takes from the solid's.
+    /// A value that the map's material copies from the solid's.
     struct Value
     {
         SharedPtr<ShaderUniformBase> from;
@@ -46,8 +46,8 @@ private:
     struct Caster
     {
         SharedPtr<ShaderProgram>
-            program;           ///< the solid's; with the revision it tells whether all this still holds
-        uint64_t revision = 0; ///< of the properties of the solid's material, no other's
+            program;           ///< the solid's; with the revision it tells whether this is up to date
+        uint64_t revision = 0; ///< of the properties of the solid's material
         uint64_t frame = 0;
         SharedPtr<Appearance> material; ///< empty without a program for it
         SharedPtr<ShaderUniform<Matrix4f>> model;

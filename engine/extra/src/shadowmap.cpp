@@ -37,7 +37,7 @@ namespace
 {
 
 constexpr int MOST_LIGHTS = 5;     // that renderers take
-constexpr float SOFT_REACH = 1.5f; // texels that the programs look around by
+constexpr float SOFT_REACH = 1.5f; // radius of the soft edge, texels
 constexpr int SMALLEST = 16;
 constexpr int LARGEST = 8192;
 
@@ -66,7 +66,7 @@ bool throwsShadow(const Light& light)
     return light.getLightType() != Light::LightType::POINT;
 }
 
-/// What a frame's walk finds.
+/// Collects lights and casters in one walk.
 class ShadowWalk : public SceneNodeVisitor
 {
 public:
@@ -113,7 +113,7 @@ private:
     const Light* m_wanted = nullptr;
 };
 
-/// Calls a function for each material of a scene that has a program, for one of several solids several times.
+/// Calls a function for each solid's material that has a program; for shared materials several times.
 template <class Function>
 class MaterialWalk : public SceneNodeVisitor
 {
@@ -162,14 +162,14 @@ struct ShadowParts
     ShadowCasters casters;
     SharedPtr<Texture2D> texture;
     SharedPtr<RenderTarget> target;
-    SharedPtr<ShaderUniform<Vector4f>> map; // these and what follows are the context's
+    SharedPtr<ShaderUniform<Vector4f>> map; // this and the following are the context's
     SharedPtr<ShaderUniform<Vector4f>> rows[3];
     SharedPtr<ShaderUniform<float>> offset;
     SharedPtr<ShaderUniform<float>> index;
     SharedPtr<ShaderUniform<Vector4f>> light;
     SharedPtr<ShaderUniform<SharedPtr<Texture2D>>> depths;
     SharedPtr<Light> wanted;
-    FlagMask thrower; ///< without bits where all throw shadows
+    FlagMask thrower; ///< without bits: all cast shadows
     float distance = 0.0f;
     ShadowWalk walk;
     std::vector<Vector3f> corners;
@@ -201,7 +201,7 @@ ShadowParts::ShadowParts(const SharedPtr<RenderContext>& contextToUse, const Sha
         ORV_LOG_WARN("No shadows: fragment shaders of this device lack the precision.");
         return;
     }
-    const unsigned side = unsigned(size + 2 * ShadowView::BORDER); // no power of two, so without mipmaps
+    const unsigned side = unsigned(size + 2 * ShadowView::BORDER); // not a power of two, so without mipmaps
     texture = pool->getTexture2DCache()->create(side, side, Texture::Format::RGBA,
                                                 Texture::Type::UNSIGNED_BYTE, nullptr, nullptr);
     if (texture)
@@ -224,7 +224,7 @@ void ShadowParts::warn(bool& isSaid, const char* text) const
     isSaid = true;
 }
 
-/// The light, and what throws shadows.
+/// Finds the light and the casters.
 void ShadowParts::find(SceneNode& scene, const FlagMask& renderFlags, const FlagMask& recursiveFlags)
 {
     walk.begin(wanted.get());
@@ -238,7 +238,7 @@ void ShadowParts::find(SceneNode& scene, const FlagMask& renderFlags, const Flag
     visitScene(walk, scene, join(renderFlags, thrower), join(recursiveFlags, thrower));
 }
 
-/// Where the walk's solids are, and what a camera sees up to the distance.
+/// Finds the bounds of the casters, and of the camera's view up to the distance.
 void ShadowParts::findReach(Camera* camera)
 {
     reach = ShadowReach();
@@ -308,7 +308,7 @@ void ShadowParts::publish(const ShadowView& view, int lightIndex)
     depths->set(texture);
 }
 
-/// Programs ask no map for a light that there is not.
+/// Tells programs that no light has shadows.
 void ShadowParts::switchOff()
 {
     if (map)
@@ -329,7 +329,7 @@ ShadowMap::~ShadowMap()
     detach();
     m_parts->switchOff();
     if (m_parts->depths && m_parts->depths->get() == m_parts->texture)
-        m_parts->depths->set(nullptr); // a context does not keep its pool's textures
+        m_parts->depths->set(nullptr); // a context must not keep its pool's textures
 }
 
 bool ShadowMap::isComplete() const

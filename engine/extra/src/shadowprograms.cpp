@@ -17,7 +17,7 @@ namespace orv::detail
 namespace
 {
 
-constexpr int ROOMY_VERTICES = 129; // uniform vectors with which everything fits
+constexpr int ROOMY_VERTICES = 129; // enough uniform vectors for all features
 constexpr int ROOMY_FRAGMENTS = 32;
 
 bool hasFeature(const std::string& name, const char* feature)
@@ -38,14 +38,14 @@ bool hasFeatures(const std::string& name, std::initializer_list<const char*> fea
                        [&](const char* feature) { return hasFeature(name, feature); });
 }
 
-/// Whether a program that lights pixels or vertices has room for what shadows take; see ShaderAssets.fitTheSmallestDevice.
+/// Whether a lit program has room for shadows on this device; see ShaderAssets.fitTheSmallestDevice.
 bool hasRoom(const std::string& name, bool isByPixel)
 {
     if (!isByPixel)
         return RenderDevice::getMaxVertexUniformVectors() >= ROOMY_VERTICES || hasFeature(name, "CUBE") ||
                !hasFeatures(name, {"DIFF", "AMBI", "REFL", "LINEAR", "SKIN"});
     if (hasFeatures(name, {"BUMP", "DIFF", "SPEC", "AMBI", "REFL", "EMIS"}))
-        return false; // eight textures already
+        return false; // has eight textures already
     return RenderDevice::getMaxFragmentUniformVectors() >= ROOMY_FRAGMENTS ||
            !hasFeatures(name, {"DIFF", "SPEC", "EMIS"});
 }

@@ -18,12 +18,12 @@ namespace detail
 /// The built-in assets for shadows, "shadow#...", which are compiled in. @return empty without memory for the source.
 SharedPtr<MemoryStreamSource> createShadowAssets();
 
-/// What became of a material that was to take shadows.
+/// The result of asking for a material's shadow program.
 enum class ShadowAnswer
 {
     TAKES,     ///< with the program that was found
-    STAYS,     ///< nothing of it is lit, or its program is another
-    NO_ROOM,   ///< it has all textures that every device has, or too many values for this one
+    STAYS,     ///< it is not lit, or has another program
+    NO_ROOM,   ///< it uses all eight textures, or too many uniforms for this device
     NO_PROGRAM ///< the driver refuses it
 };
 
@@ -31,10 +31,10 @@ enum class ShadowAnswer
 class ShadowPrograms
 {
 public:
-    /// Registers the assets unless that was done.
+    /// Registers the assets once.
     explicit ShadowPrograms(const SharedPtr<AssetCachePool>& pool);
 
-    /// @param program  receives the one to draw the material with instead; of TAKES alone.
+    /// @param program  receives the program with shadows; only set for TAKES.
     ShadowAnswer findLit(const Appearance& appearance, SharedPtr<ShaderProgram>& program) const;
 
     /// The program to draw a material's solids into the map with.

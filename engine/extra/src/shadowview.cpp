@@ -11,13 +11,12 @@ namespace orv::detail
 namespace
 {
 
-/// The soft edge reads one and a half texels away along both sides: so far is a surface held off its own shadow.
+/// Offset of lookups against self-shadowing, texels: the soft edge reads 1.5 texels away along both axes.
 constexpr float TEXELS_OFF = 2.2f;
-constexpr float NEAREST =
-    0.01f; ///< of the reach: where a spot begins to throw shadows, for the depth buffer's sake
-constexpr float WIDEST = 170.0f; ///< degrees that a map can show
+constexpr float NEAREST = 0.01f; ///< of the range: the near plane of a spot's map
+constexpr float WIDEST = 170.0f; ///< field of view of a map, degrees
 
-/// Three directions at right angles to each other; z is given.
+/// Three orthogonal directions; z is given.
 struct Axes
 {
     explicit Axes(const Vector3f& zAxis) : z(zAxis)
@@ -50,7 +49,7 @@ Vector4f toTexture(const Vector4f& clip, const Vector4f& w, int size)
     return clip * (0.5f * share) + w * 0.5f;
 }
 
-/// The middle of a map moves by whole texels, so that edges do not swim when the eye moves.
+/// The centre of a map moves by whole texels, so that edges do not shimmer when the eye moves.
 float snap(float value, float texel)
 {
     return std::floor(value / texel + 0.5f) * texel;
@@ -95,7 +94,7 @@ bool makeDirectionalView(const Vector3f& toLight, const ShadowReach& reach, int 
     return true;
 }
 
-/// How far along its axis a spot's map reaches, and from where.
+/// The near and far distance of a spot's map along its axis.
 Vector2f findSpotRange(const Light& light, const ShadowReach& reach, const Vector3f& place,
                        const Vector3f& axis)
 {

@@ -14,30 +14,29 @@ class Light;
 namespace detail
 {
 
-/// What a light's map shows, and how the world gets there.
+/// The view of a light's map, and the transforms into it.
 struct ShadowView
 {
-    static constexpr int BORDER = 2; ///< texels around the map's own in which nothing ever stands
+    static constexpr int BORDER = 2; ///< empty texels around the map
 
     Matrix4f clip = Matrix4f::IDENTITY; ///< from the world, for drawing the map
-    Vector4f rows
-        [3]; ///< from the world to the map's texture: x and y, of one light from a place times depth; depth
-    Vector4f light;      ///< its place with w 1, or the direction towards it with w 0
-    float offset = 0.0f; ///< how far surfaces are held off their own shadow; below 0 for each unit of depth
+    Vector4f rows[3];    ///< from the world to the map's texture: x, y (for a spot times depth), depth
+    Vector4f light;      ///< its position with w 1, or the direction towards it with w 0
+    float offset = 0.0f; ///< of lookups along the normal; if negative, for each unit of depth
     bool isSpot = false;
 };
 
-/// What is known of where shadows are thrown and seen.
+/// The bounds of casters and of the visible part.
 struct ShadowReach
 {
-    const std::vector<Vector3f>* casters = nullptr; ///< corners of boxes around what throws shadows
-    bool isAllKnown = true;                         ///< these are all
-    Vector3f seenCentre;                            ///< of a sphere around what is seen
+    const std::vector<Vector3f>* casters = nullptr; ///< corners of boxes around casters
+    bool isAllKnown = true;                         ///< whether these are complete
+    Vector3f seenCentre;                            ///< of a sphere around the visible part
     float seenRadius = -1.0f;                       ///< below 0: anything may be seen
 };
 
 /// @param size  texels of the map along each side, without the border.
-/// @return false where the light throws no shadows there.
+/// @return false if the light casts no shadows there.
 bool makeShadowView(const Light& light, const ShadowReach& reach, int size, ShadowView& view);
 
 } // namespace detail

@@ -12,8 +12,8 @@ class Solid;
 namespace detail
 {
 
-/// Adds corners of boxes in the world around all that a solid draws, as far as its mesh has bounds: the eight of its box, or
-/// of one box for each joint. Of a solid without a mesh nothing.
+/// Adds corners of boxes in the world around a solid, if its mesh has bounds: the eight of its box, or those of a box
+/// for each joint. Nothing for a solid without a mesh.
 void addBoundsCorners(const Solid& solid, std::vector<Vector3f>& corners);
 
 } // namespace detail

@@ -21,7 +21,7 @@ namespace
 
 constexpr uint32_t REPLACEMENT = 0xFFFD;
 
-/// Characters that tell others how to be shown: soft hyphen, joiners, marks of direction, variation selectors and the like.
+/// Invisible formatting characters: soft hyphen, joiners, direction marks, variation selectors and the like.
 bool isHidden(uint32_t c)
 {
     struct Range
@@ -94,7 +94,7 @@ float TextLayout::getAscent(float size) const
     return isReady() && size > 0.0f ? getPixelAscent(toPixelSize(size)) / m_density : 0.0f;
 }
 
-/// Calls use(key, pen) for each glyph of a line, with the place of the pen from the start of the line.
+/// Calls use(key, pen) for each glyph of a line, with the pen's distance from the start of the line.
 /// @return the width of the line. All in pixels.
 template <class Use>
 float TextLayout::forEachGlyph(std::string_view line, uint32_t size, const Use& use) const

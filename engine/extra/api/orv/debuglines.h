@@ -22,18 +22,16 @@ class Solid;
 class VertexBuffer;
 class VertexBufferCache;
 
-/// Lines that show what cannot be seen: places, boxes, axes, joints, what a camera sees. All of them are one GL draw, over
-/// a frame.
+/// Lines for debugging: boxes, axes, grids, skeletons, joints, camera frustums. One GL draw for all, over a frame.
 ///
 ///     const auto lines = makeShared<DebugLines>(*pool);
 ///     lines->addAxes(node->getWorldTransform(), 0.5f);
 ///     block.render();
 ///     lines->draw(*context, *camera);
 ///
-/// Lines are copied as things stand when they are added, in world space, one pixel wide; what moves is added again after
-/// clear(). The alpha of a colour is its opacity; components count from 0 to 1.
-/// A lost context takes the program along: make other lines for the next one.
-/// Threads: draw() and the last release belong to the GL thread; no locks.
+/// Lines are added in world space, one pixel wide, and do not follow their objects: after a movement, clear() and add
+/// them again. The alpha of a colour is its opacity; components count from 0 to 1. After a lost context, make a new
+/// object: its program is lost. Threads: draw() and the last release belong to the GL thread; no locks.
 class ORV_API DebugLines : public Shared
 {
 public:
@@ -46,7 +44,7 @@ public:
 
     /// Adds a line in the world.
     void addLine(const Vector3f& from, const Vector3f& to, const Colour4f& colour);
-    /// From one colour to another.
+    /// A line from one colour to another.
     void addLine(const Vector3f& from, const Colour4f& fromColour, const Vector3f& to,
                  const Colour4f& toColour);
 
@@ -61,29 +59,28 @@ public:
     /// @param spacing  of the lines, in the space that transform leads from.
     void addGrid(const Matrix4f& transform, int cells, float spacing, const Colour4f& colour);
 
-    /// From each node below top to its parent: the bones of a skeleton, or how a tree hangs together.
+    /// Lines from each node below top to its parent: the bones of a skeleton, or a node hierarchy.
     void addSkeleton(const SceneNode& top, const Colour4f& colour);
 
     /// From each joint of a skinned solid to the next one above it that is a joint of it too.
     void addJoints(const Solid& solid, const Colour4f& colour);
 
-    /// What a camera sees: twelve edges, near to far.
-    /// @param camera  clipping distances that are no good are put right, see Camera::getProjection().
+    /// A camera's view volume: twelve edges, near to far.
+    /// @param camera  invalid clipping distances are corrected, see Camera::getProjection().
     /// @param aspect  width / height of the view.
     void addFrustum(Camera& camera, float aspect, const Colour4f& colour);
 
     int getLineCount() const { return int(m_vertices.size() / 2); } ///< Lines added since clear().
-    void clear();                                                   ///< Takes all lines out again.
+    void clear();                                                   ///< Removes all lines.
 
-    /// Whether what lies before a line in the depth buffer hides it, as at first, or lines go over everything. Depth is
-    /// never written.
+    /// Whether nearer surfaces hide lines (the default), or lines are drawn over everything. Depth is never written.
     void setDepthTested(bool tested);
 
-    /// Draws into the viewport as a renderer would for this camera, in stereo to both halves: right after the block, with
-    /// the target enabled if it had one. One GL draw for each eye, none without lines.
+    /// Draws into the viewport with this camera, in stereo into both halves. Call it after the block, with the block's
+    /// target enabled if it has one. One GL draw for each eye, none without lines.
     ///
-    /// The vertices have one GL buffer, which goes with the pool's flush() after the lines. As long as nothing is added or
-    /// taken out, nothing is copied or made again, and as long as their number stays, nothing is allocated.
+    /// The vertices have one GL buffer, which the pool's flush() deletes after the lines. Unchanged lines are not
+    /// uploaded again; an unchanged number of lines needs no allocation.
     void draw(RenderContext& context, Camera& camera);
 
 private:

@@ -21,12 +21,12 @@ namespace detail
 class FontOutlines;
 }
 
-/// One typeface of a font file, every glyph of it: which characters it has, how wide they are, how they are kerned.
+/// All glyphs of one typeface of a font file: its characters, their advances and kerning.
 ///
-/// Taken are TrueType files (.ttf, .otf with TrueType outlines) and each font of a collection of them (.ttc). Outlines in
-/// PostScript form (CFF) are refused. Files may come from strangers: nothing outside of the file is read, whatever it holds,
-/// and a damaged glyph is a glyph that is not drawn. The file stays in memory as long as the face.
-/// There is no GL in it, so a face outlives a lost context. Threads: no locks; nothing changes once it is made.
+/// Supported are TrueType files (.ttf, .otf with TrueType outlines) and each font of a TrueType collection (.ttc).
+/// Outlines in PostScript form (CFF) are refused. Untrusted files are safe: nothing outside of the file is read, and
+/// damaged glyphs are not drawn. The file stays in memory as long as the face. A face has no GL objects and survives a
+/// lost context. Threads: no locks; immutable.
 class ORV_API FontFace : public Shared
 {
 public:
@@ -39,7 +39,7 @@ public:
     /// @return empty, after logging why.
     static Ptr load(const AssetCachePool& pool, const char* name, unsigned index = 0);
 
-    /// The same from a stream, of which the rest is read. @param name  for messages.
+    /// The same from the rest of a stream. @param name  for messages.
     static Ptr load(Stream& stream, const char* name, unsigned index = 0);
 
     ~FontFace() override;
@@ -47,11 +47,11 @@ public:
     const char* getName() const { return m_name.c_str(); } ///< for messages
 
     /// @param codePoint  of Unicode.
-    /// @return the number of its glyph; 0, which is that of the box for what is missing, if the font does not have it.
+    /// @return the number of its glyph; 0, the glyph for missing characters (a box), if the font does not have it.
     unsigned findGlyph(uint32_t codePoint) const;
     unsigned getGlyphCount() const; ///< Glyphs are numbered from 0 up to this.
 
-    // In the font's own units, of which getUnitsPerEm() are one em.
+    // In the font's own units; getUnitsPerEm() of them are one em.
 
     int getUnitsPerEm() const { return m_unitsPerEm; } ///< 16 to 16384
     int getAscent() const { return m_ascent; }         ///< of a line above the baseline
@@ -61,7 +61,7 @@ public:
     /// How far the pen moves to the right. 0 for a number that is no glyph's.
     int getAdvance(unsigned glyph) const;
 
-    /// What is added to the advance of left if right follows; mostly negative or 0.
+    /// Added to the advance of left if right follows; usually negative or 0.
     ///
     /// From the pair adjustments of the font's "kern" feature (table GPOS), or else from its "kern" table.
     int getKerning(unsigned left, unsigned right) const;

@@ -24,25 +24,23 @@ struct GlyphCacheOptions
 {
     /// Pixels of a side of a page, 64 to 4096, rounded down to a power of two. The largest glyph is one pixel smaller.
     unsigned pageSize = 512;
-    /// 1 to 1024. A page takes its side squared in bytes, once in GL and once in memory: at most 4 MiB altogether, unless
-    /// told otherwise. Pages that solids draw from are not counted.
+    /// 1 to 1024. A page takes its side squared in bytes, once in GL and once in memory: by default at most 4 MiB in
+    /// all. Pages used by solids are not counted.
     unsigned mostPages = 8;
 };
 
-/// Glyphs of several fonts at any size, drawn when they are first used and kept in textures; those that were used the longest
-/// ago are forgotten when there is room for no more.
+/// Glyphs of several fonts at any size, drawn when they are first used and kept in textures. When these are full, the
+/// least recently used glyphs are dropped.
 ///
 ///     const auto glyphs = makeShared<GlyphCache>(*pool);
 ///     glyphs->addFont(FontFace::load(*pool, "DejaVuSans.ttf"));
-///     glyphs->addFont(FontFace::load(*pool, "DroidSansFallbackFull.ttf")); // for what the first one does not have
+///     glyphs->addFont(FontFace::load(*pool, "DroidSansFallbackFull.ttf")); // for characters that the first one lacks
 ///     const auto text = makeShared<TextLayout>(*pool, glyphs, Colour4f::WHITE);
 ///
-/// A character is taken from the first font that has it. One that no font has shows the box of the first font (or a plain
-/// one, where that is blank), and a warning names it, once. All fonts are drawn with the same em, that of the first one at
-/// the size that a text asks for. Any number of texts share a cache.
-/// A lost context takes the cache along, like everything that was made from assets: make another one for the next context.
-/// The faces may be kept. Uploads of glyphs are not among FrameCounters.
-/// Threads: the GL thread only.
+/// A character comes from the first font that has it. If no font has it, the box of the first font is shown (or a plain
+/// box, if that is blank), and one warning names the character. All fonts are scaled to the first one's em at the
+/// text's size. Any number of texts share a cache. After a lost context, make a new cache; faces may be kept.
+/// FrameCounters do not count uploads of glyphs. Threads: the GL thread only.
 class ORV_API GlyphCache : public Shared
 {
 public:
@@ -55,11 +53,11 @@ public:
     explicit GlyphCache(AssetCachePool& pool, const GlyphCacheOptions& options = GlyphCacheOptions());
     ~GlyphCache() override;
 
-    /// Adds a font behind those there are; texts are laid out again with it.
+    /// Adds a font as the last one; texts are laid out again.
     /// @return false, after an error, for an empty face or one too many.
     bool addFont(const FontFace::Ptr& face);
 
-    /// The fonts in the order in which they were added; characters are looked for in them in that order.
+    /// The fonts in the order in which they were added and are searched.
     unsigned getFontCount() const { return unsigned(m_fonts.size()); }
     const FontFace::Ptr& getFont(unsigned index) const
     {
@@ -69,11 +67,11 @@ public:
     /// The first font that has a character. @return getFontCount() if none has it.
     unsigned findFont(uint32_t codePoint);
 
-    unsigned getGlyphCount() const; ///< that are kept now
+    unsigned getGlyphCount() const; ///< now in the cache
     unsigned getPageCount() const;  ///< that they are on
-    uint64_t getDrawnCount() const; ///< of glyphs that were drawn since the start, forgotten ones again
+    uint64_t getDrawnCount() const; ///< of glyphs drawn so far, each drawing counted
 
-    // What follows is for TextLayout.
+    // For TextLayout.
 
     /// A glyph at a size. The size is that of a line of the first font, in 64ths of a pixel.
     struct Key
@@ -91,9 +89,9 @@ public:
     /// Pixels for a unit of a font. @param font  below getFontCount().
     float getScale(uint32_t font, uint32_t size) const;
 
-    /// Has a glyph drawn if it is not there, and uses it.
-    /// @param number  set to its place in the atlas, or to GlyphAtlas::NONE for what is blank.
-    /// @return false if there is no room, everything being in use.
+    /// Draws a glyph if it is not in the cache, and marks it as used.
+    /// @param number  set to its number in the atlas, or to GlyphAtlas::NONE for a blank glyph.
+    /// @return false if everything in the cache is in use.
     bool place(const Key& key, uint32_t& number);
 
     detail::GlyphAtlas& getAtlas() { return *m_atlas; } ///< where glyphs are drawn
@@ -116,7 +114,7 @@ private:
 
     std::vector<FontFace::Ptr> m_fonts;
     std::unique_ptr<detail::GlyphAtlas> m_atlas;
-    std::unique_ptr<detail::GlyphPicture> m_picture; ///< the last that was drawn
+    std::unique_ptr<detail::GlyphPicture> m_picture; ///< the last one drawn
     std::array<Found, 1024> m_found;                 ///< by the last bits of the character
     std::vector<bool> m_missing;                     ///< characters that a warning has named
     std::vector<std::vector<uint32_t>> m_faulty;     ///< glyphs of each font that a warning has named

@@ -12,24 +12,24 @@ namespace orv
 class SceneNode;
 class Solid;
 
-/// How far a subtree reaches in the world, as it stands: exactly where meshes keep their geometry (MeshData::GEOMETRY), else
-/// as the boxes of meshes and of what joints move reach when they are placed. Hidden nodes count too.
+/// The current bounds of a subtree in the world: exact if meshes keep their geometry (MeshData::GEOMETRY), otherwise
+/// from the transformed boxes of meshes and of the vertices of each joint. Hidden nodes count too.
 /// @param unknown  receives how many solids have meshes whose bounds are not known, which the result leaves out; may be
 ///                 null.
-/// @return unknown without any solid whose bounds are known.
+/// @return unknown if there is no solid of known bounds.
 ORV_API Bounds getWorldBounds(SceneNode& top, int* unknown = nullptr);
 
-/// How far a solid reaches in its own space: as its mesh or, where isMovedByJoints(), as what the joints make of it at the
-/// moment. That is exact where the mesh keeps its geometry; from the bounds of its joints alone it is wider.
-/// @return unknown where the mesh's are, and without a mesh.
+/// The bounds of a solid in its own space: those of its mesh or, if isMovedByJoints(), of its current pose. A pose is
+/// exact if the mesh keeps its geometry; from the bounds of its joints it is larger.
+/// @return unknown if the mesh's bounds are, or without a mesh.
 ORV_API Bounds getOwnBounds(const Solid& solid);
 
-/// Whether joints move the vertices of a solid when it is drawn: there are some, and its program takes J_WORLD.
+/// Whether joints move the vertices of a solid: it has joints, and its program reads J_WORLD.
 ORV_API bool isMovedByJoints(const Solid& solid);
 
-/// Where the vertices of a solid's mesh are in the world, as its transform or its joints put them at the moment.
-/// @param places  replaced; as many as the geometry has vertices.
-/// @return false, with no places, unless the mesh keeps its geometry.
+/// The current positions of a solid's vertices in the world, by its transform or its joints.
+/// @param places  replaced: one position for each vertex.
+/// @return false, with places empty, unless the mesh keeps its geometry.
 ORV_API bool placeVertices(const Solid& solid, std::vector<Vector3f>& places);
 
 } // namespace orv

@@ -29,16 +29,14 @@ struct ShadowParts;
 ///     shadows->render(*scene, camera.get());
 ///     block->render();
 ///
-/// render() draws into a texture how far away from the light is what it meets first, which the materials that attach() has
-/// changed look up. Everything opaque throws shadows, skinned solids as they stand at the moment, and cut-out ones
-/// (CUTOFF) with their holes. The sides of a solid that are not drawn (RenderState::cullingMode) let light through; so
-/// does what is blended, and mirrors do.
+/// render() draws the distances from the light to the nearest surfaces into a texture, which the materials changed by
+/// attach() look up. All opaque solids cast shadows, skinned ones in their current pose, cut-outs (CUTOFF) with their
+/// holes. Culled sides (RenderState::cullingMode), blended solids and mirrors cast none.
 ///
-/// A device without what it takes (highp in fragment shaders, a texture to draw into), or a scene without such a light, has
-/// the frames without shadows, and one message says why.
-/// A context has the shadows of one light at a time: those that were rendered last.
-/// A lost context takes the shadows along: drop them with the scene and make others.
-/// Threads: the GL thread only, the last release included.
+/// If the device lacks something (highp in fragment shaders, a texture to draw into), or the scene has no such light,
+/// frames have no shadows, and one message says why. A context has the shadows of one light at a time: those rendered
+/// last. After a lost context, drop the object with the scene and make a new one. Threads: the GL thread only, the last
+/// release included.
 class ORV_API ShadowMap : public Shared
 {
 public:
@@ -46,8 +44,8 @@ public:
     using Ptr = SharedPtr<ShadowMap>;
 
     /// @param context  shared; must not be empty.
-    /// @param pool     shared; must not be empty. It learns of the programs for shadows, called "shadow#...".
-    /// @param size     texels along each side of the map, 16 to 8192: more are finer. Four bytes each, and two for depths.
+    /// @param pool     shared; must not be empty. The programs for shadows, "shadow#...", are registered there.
+    /// @param size     texels along each side of the map, 16 to 8192. Each takes four bytes, and two for depth.
     ShadowMap(const SharedPtr<RenderContext>& context, const SharedPtr<AssetCachePool>& pool,
               int size = 1024);
     /// Detaches.
@@ -56,34 +54,37 @@ public:
     /// False, after a message, if the device cannot have shadows: then nothing here has an effect.
     bool isComplete() const;
 
-    /// Gives materials of a scene programs with which they take shadows: those that have orv#max_pvl.sp or orv#max_ppl.sp
-    /// with DIFF or SPEC. Others stay as they are, and so do those whose programs leave no room, which is logged once:
-    /// max_ppl with all of BUMP, DIFF, SPEC, AMBI, REFL and EMIS (eight textures) and, on the smallest devices, max_ppl with
-    /// DIFF, SPEC and EMIS and max_pvl with DIFF, AMBI, REFL, LINEAR and SKIN. Solids that come later need another call.
-    /// @return how many materials of the scene take shadows now, own programs that bind S_DEPTHS among them.
+    /// Gives the materials of a scene programs that receive shadows: those with orv#max_pvl.sp or orv#max_ppl.sp and
+    /// DIFF or SPEC. Other materials are unchanged. So are those whose programs have no room for it, which is logged
+    /// once: max_ppl with all of BUMP, DIFF, SPEC, AMBI, REFL and EMIS (eight textures) and, on the smallest devices,
+    /// max_ppl with DIFF, SPEC and EMIS and max_pvl with DIFF, AMBI, REFL, LINEAR and SKIN. Call it again after adding
+    /// solids.
+    /// @return how many materials of the scene receive shadows now, including programs of your own that bind S_DEPTHS.
     int attach(SceneNode& scene);
 
-    /// Gives all materials their programs back, but for those that have others by now.
+    /// Restores the programs of all materials, except those whose program was changed in the meantime.
     void detach();
 
-    /// @param light  directional or spot, and among the first five lights of the scene; empty, as at first: the first such
-    ///               light that render() comes across.
+    /// @param light  directional or spot, and among the first five lights of the scene; empty (the default): the first
+    ///               such light that render() finds.
     void setLight(const SharedPtr<Light>& light);
 
-    /// Which solids throw shadows, by their own flags and those above; at first all. A sky around everything is better left
-    /// out: it would make a directional light's map as wide as itself.
+    /// Which solids cast shadows, by their own flags and those above; by default all. Leave out a sky around the scene:
+    /// a directional light's map would cover all of it.
     void setThrowers(const FlagMask& flags);
 
-    /// How far from the eye a directional light's shadows reach at least, world units; 0, as at first: as far as the camera
-    /// sees. Where all that throws shadows is in less room than that, the map holds all of it and is finer.
+    /// The least distance from the eye at which a directional light's shadows are visible, world units; 0 (the
+    /// default): the camera's far distance. If all casters take less space than that, the map covers just them and is
+    /// finer.
     void setDistance(float distance);
 
-    /// Draws the map, for the next frames; before the blocks that show the scene. Framebuffer and viewport come back.
+    /// Draws the map for the next frames. Call it before the blocks that show the scene. Restores framebuffer and
+    /// viewport.
     ///
-    /// Of solids whose bounds are not known (see SimpleRenderer::setCulled()) it is not known how far they reach either: a
-    /// directional light's map then covers what is within the distance.
-    /// @param camera  borrowed: what it sees is where a directional light's shadows have to be. Null: everywhere.
-    /// @param renderFlags, recursiveFlags  which nodes take part; the block's, so that lights are counted alike.
+    /// If the bounds of some solids are unknown (see SimpleRenderer::setCulled()), a directional light's map covers
+    /// everything within the distance.
+    /// @param camera  borrowed: a directional light's map covers its view. Null: the whole scene.
+    /// @param renderFlags, recursiveFlags  which nodes take part; use the block's, so that lights are counted alike.
     void render(SceneNode& scene, Camera* camera, const FlagMask& renderFlags = FlagMask(),
                 const FlagMask& recursiveFlags = FlagMask());
 

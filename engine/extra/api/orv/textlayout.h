@@ -27,8 +27,8 @@ namespace detail
 class PlacedGlyphs;
 }
 
-/// Any number of strings in any script that the fonts of a GlyphCache have, in one colour, drawn together: over a frame, or
-/// in the scene.
+/// Any number of strings in one colour, in any script of a GlyphCache's fonts, drawn together over a frame or in the
+/// scene.
 ///
 ///     const auto text = makeShared<TextLayout>(*pool, glyphs, Colour4f::WHITE);
 ///     text->setDensity(2.5f);                  // of the display: 2.5 of its pixels are one unit
@@ -36,23 +36,22 @@ class PlacedGlyphs;
 ///     block->render();
 ///     text->draw(*context);
 ///
-/// Places and sizes are in units: x to the right, y downwards, from the upper left corner of the viewport. A unit is one
-/// pixel, or as many as setDensity() says: the same numbers then give a text of the same size on every display, with glyphs
-/// that were drawn for its pixels. Glyphs are put on whole pixels.
+/// Positions and sizes are in units: x to the right, y downwards, from the upper left corner of the viewport.
+/// setDensity() sets the pixels per unit (at first 1): the same numbers then give the same size on every display, with
+/// glyphs drawn for its pixels. Glyphs are placed on whole pixels.
 ///
-/// Strings are UTF-8. "\n" begins a new line. Bytes that are not UTF-8 show U+FFFD, one for each stretch that could have been
-/// the beginning of a character. Control characters, and characters that are not for showing (joiners, variation
-/// selectors, marks of direction), draw nothing. Each pair of glyphs of one font is kerned.
-/// Characters stand one behind the other from left to right, as they come. Scripts that join or reorder their letters (Arabic,
-/// Devanagari) or run from right to left are shaped by a library for that, whose glyphs addGlyphs() takes.
-/// Threads: draw() and createSolid() belong to the GL thread; no locks.
+/// Strings are UTF-8. "\n" begins a new line. Invalid bytes show U+FFFD, one for each sequence that could begin a
+/// character. Control characters and invisible ones (joiners, variation selectors, direction marks) draw nothing. Each
+/// pair of glyphs of one font is kerned. Characters are placed from left to right in the string's order. Scripts that
+/// join or reorder letters (Arabic, Devanagari) or run from right to left need a shaping library; pass its glyphs to
+/// addGlyphs(). Threads: draw() and createSolid() belong to the GL thread; no locks.
 class ORV_API TextLayout : public Shared
 {
 public:
     ORV_CLASS_NAME("TextLayout")
     using Ptr = SharedPtr<TextLayout>;
 
-    /// Which part of each line stands at the place that was given.
+    /// Which part of each line is at the given position.
     enum class Alignment : int32_t
     {
         LEFT = 0,
@@ -60,12 +59,12 @@ public:
         RIGHT = 2
     };
 
-    /// A glyph that somebody else has placed.
+    /// A glyph placed by the caller.
     struct Glyph
     {
         unsigned font;  ///< of the cache, counted from 0
         unsigned glyph; ///< its number in the font
-        float x;        ///< where the pen stands on the baseline, in units
+        float x;        ///< of the pen on the baseline, in units
         float y;        ///< the same, downwards
     };
 
@@ -77,7 +76,8 @@ public:
     TextLayout(AssetCachePool& pool, const GlyphCache::Ptr& glyphs, const Colour4f& colour);
     ~TextLayout() override;
 
-    /// Pixels for a unit, 1 at first. Strings that were added already follow. What is not above 0 is refused (logged).
+    /// Pixels for a unit, 1 at first. Strings already added are laid out again. Values not above 0 are refused
+    /// (logged).
     void setDensity(float pixelsPerUnit);
     float getDensity() const { return m_density; }
 
@@ -89,9 +89,9 @@ public:
     /// From the top of a line to its baseline, likewise.
     float getAscent(float size) const;
 
-    /// The room that a string takes, in units: as wide as its longest line, as high as its lines, the last without the gap
-    /// below it; 0, 0 for an empty or null one. Marks and slanted letters may reach out of it, and so may the glyphs of
-    /// fallback fonts.
+    /// The size of a string in units: the width of its longest line and the height of its lines, without the gap below
+    /// the last; 0, 0 for an empty or null one. Marks, slanted letters and glyphs of fallback fonts may extend beyond
+    /// it.
     Vector2f measure(const char* utf8, float size) const;
 
     /// Adds a string. One without a size above 0, or of more than MOST_SIZE pixels, is refused (logged).
@@ -99,32 +99,32 @@ public:
     /// @param y     top of its first line, not the baseline.
     void add(const char* utf8, float size, float x, float y, Alignment alignment = Alignment::LEFT);
 
-    /// Adds glyphs in places of their own. Numbers of no font or glyph are left out (logged).
+    /// Adds glyphs at given positions. Invalid fonts or glyph numbers are left out (logged).
     /// @param glyphs  count of them, copied.
-    /// @param x,y     added to each place.
+    /// @param x,y     added to each position.
     void addGlyphs(const Glyph* glyphs, std::size_t count, float size, float x, float y);
 
-    void clear(); ///< Takes everything out again.
+    void clear(); ///< Removes everything.
 
-    /// Straight, not premultiplied; a is the opacity. Solids made before keep their colour.
+    /// Straight, not premultiplied; a is the opacity. Existing solids keep their colour.
     void setColour(const Colour4f& colour) { m_colour = colour; }
 
-    const GlyphCache::Ptr& getGlyphs() const { return m_glyphs; } ///< what draws them
+    const GlyphCache::Ptr& getGlyphs() const { return m_glyphs; } ///< the glyphs' cache
 
-    /// Draws over what the viewport shows, blended, whatever the depth buffer holds; nothing is written there.
+    /// Draws over the viewport, blended; depth is neither tested nor written.
     ///
-    /// One GL draw for each page of the cache that glyphs are on (and for each MAX_GLYPHS glyphs there). As long as nothing
-    /// changes and nothing was forgotten, nothing is made or sent again. What all pages together cannot hold is drawn in
-    /// several goes, with glyphs forgotten in between: everything is seen, but the glyphs are drawn again in each frame.
+    /// One GL draw for each page of the cache that glyphs are on (and for each MAX_GLYPHS glyphs there). An unchanged
+    /// text whose glyphs are still cached needs no layout or upload. A text that needs more glyphs than all pages hold
+    /// is drawn in several passes: it is complete, but its glyphs are drawn again in each frame.
     void draw(RenderContext& context);
 
-    /// A copy as things are, to be put into a scene.
+    /// A copy of the current text for a scene.
     ///
-    /// One unit is a unit, x to the right, y upwards, in the plane z = 0: what was added at (x, y) is at (x, -y). Both
-    /// sides are visible; it blends and does not write depth. Glyphs of further pages are in unnamed children. Its pages
-    /// keep their glyphs, and their memory, as long as it is there.
-    /// @param pool  where the meshes are made, unnamed.
-    /// @return empty, after an error, without any glyph, or memory.
+    /// In the plane z = 0, x to the right, y upwards, in the same units: a string added at (x, y) is at (x, -y). Both
+    /// sides are visible; it blends and does not write depth. Glyphs of further pages are in unnamed children. Its
+    /// pages, with their glyphs and memory, are kept as long as it exists.
+    /// @param pool  in which the unnamed meshes are made.
+    /// @return empty, after an error, without glyphs or memory.
     SharedPtr<Solid> createSolid(AssetCachePool& pool);
 
 private:
@@ -132,7 +132,7 @@ private:
     struct Run
     {
         std::string text;
-        std::vector<Glyph> glyphs; ///< in place of a text
+        std::vector<Glyph> glyphs; ///< instead of a text
         float size, x, y;
         Alignment alignment;
     };

@@ -1,7 +1,7 @@
-// How far what a light meets is from it, for shadows: fragment stage. Distances from 0 to 1 go into red, green and blue,
-// each of which holds what is left of the one before it, 255 times.
+// Distances from a light, for shadow maps: fragment stage. Red, green and blue hold a distance from 0 to 1; each
+// channel holds the remainder of the one before, times 255.
 //
-// That needs precision; without it u_s_split is not used, by which a program can tell.
+// This needs highp. Without it u_s_split is unused, which the application can detect.
 
 #ifdef GL_FRAGMENT_PRECISION_HIGH
 precision highp float;

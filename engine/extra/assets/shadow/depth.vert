@@ -1,4 +1,4 @@
-// How far what a light meets is from it, for shadows: vertex stage. Distances are even, in units of the map's reach.
+// Distances from a light, for shadow maps: vertex stage. Distances are linear, in units of the map's range.
 //
 // Features are switched on by defines that stand in front of this text:
 //   SKIN    the vertex follows up to four joints
@@ -20,7 +20,7 @@ attribute vec4 a_weights;
 
 uniform int u_j_count;
 uniform mat4 u_j_world[20];
-uniform float u_j_weightFilled; // 1 where GL has filled in the last weight: the mesh has fewer than four
+uniform float u_j_weightFilled; // 1 if GL supplies the last weight, since the mesh has fewer than four
 #endif
 
 #ifdef CUTOFF
