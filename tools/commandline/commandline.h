@@ -11,15 +11,15 @@
 #include <cstring>
 #include <string>
 
-/// What the command lines of all tools have in common.
+/// Code shared by the command lines of all tools.
 namespace commandline
 {
 
 constexpr int FAILED = 1; ///< exit codes
 constexpr int MISUSED = 2;
 
-/// Gives a command line --version, errors that begin with the program's name, and what the build makes the manual page
-/// and the completions by: --manual, and --completion with bash, zsh or fish, which --help does not list.
+/// Adds --version, errors that begin with the program's name, and two hidden options for the build: --manual prints the
+/// manual page, --completion bash, zsh or fish prints completions.
 inline void addCommon(CLI::App& app)
 {
     const orv::Version& version = orv::getVersion();
@@ -40,9 +40,9 @@ inline void addCommon(CLI::App& app)
                         { return failed->get_name() + ": " + error.what() + "; --help shows how\n"; });
 }
 
-/// To be called when all is printed: what could not be written, to a full disk for instance, is an error.
+/// Call it after all output: output that could not be written, to a full disk for instance, is an error.
 /// @param exitCode  the program's otherwise.
-/// @return exitCode, FAILED in place of 0 where something is missing.
+/// @return exitCode, or FAILED instead of 0 if output is missing.
 inline int finishOutput(const char* program, int exitCode)
 {
     const bool wasLost = std::ferror(stdout) != 0;

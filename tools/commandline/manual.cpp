@@ -46,7 +46,7 @@ std::vector<std::string> getNames(const CLI::Option& option)
     return names;
 }
 
-/// What the option takes as --help says it, limits included; empty for a flag.
+/// The option's argument as --help shows it, limits included; empty for a flag.
 std::string getType(const CLI::Option& option)
 {
     if (option.get_type_size() == 0)
@@ -54,7 +54,7 @@ std::string getType(const CLI::Option& option)
     return option.get_option_text().empty() ? option.get_type_name() : option.get_option_text();
 }
 
-/// The words that an option takes, if those are all: of "TEXT:{stepped,sparse}" the two.
+/// The words that an option accepts, if it accepts only words: of "TEXT:{stepped,sparse}" the two.
 std::vector<std::string> getChoices(const CLI::Option& option)
 {
     std::vector<std::string> choices;
@@ -99,7 +99,7 @@ std::string join(const std::vector<std::string>& words, const char* between)
     return text;
 }
 
-/// As plain text that roff changes nothing of.
+/// Escapes text for roff.
 std::string escape(const std::string& text)
 {
     const std::string plain = replaceAll(replaceAll(text, "\\", "\\e"), "-", "\\-");
@@ -110,7 +110,7 @@ std::string escape(const std::string& text)
     return escaped;
 }
 
-/// The same of words that stand in a line with others.
+/// The same for words within a line.
 std::string escapeWords(const std::string& words)
 {
     std::string escaped = escape(words);
@@ -192,7 +192,7 @@ std::string makeBash(const CLI::App& app)
             break;
         case Value::FOLDER: cases += begin + "COMPREPLY=($(compgen -d -- \"$word\")); return ;;\n"; break;
         case Value::FILE:
-            cases += begin + "return ;;\n"; // what -o default adds
+            cases += begin + "return ;;\n"; // -o default completes files
             break;
         case Value::OTHER: cases += begin + "compopt +o default; return ;;\n"; break;
         case Value::NONE: break;
@@ -233,7 +233,7 @@ std::string makeZsh(const CLI::App& app)
                     : value == Value::FILE ? ":file:_files"
                                            : ":value: ";
         for (const std::string& name : getNames(*option))
-            text += " \\\n    " + quote("*" + name + what); // more than once, if it must be
+            text += " \\\n    " + quote("*" + name + what); // * allows repetition
     }
     return text + " \\\n    '*:file:_files'\n";
 }
@@ -292,7 +292,7 @@ std::string makeCompletion(const CLI::App& app, const std::string& shell)
     if (shell == "bash")
         return first + makeBash(app);
     if (shell == "zsh")
-        return makeZsh(app); // which looks at the first line
+        return makeZsh(app); // zsh reads the first line
     return shell == "fish" ? first + makeFish(app) : "";
 }
 

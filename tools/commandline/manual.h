@@ -10,11 +10,11 @@ class App;
 namespace commandline
 {
 
-/// The manual page of a program, for man(1), made of what its --help says.
+/// The manual page of a program, for man(1), made from its --help.
 /// @param version  as "1.0.0".
 std::string makeManual(const CLI::App& app, const std::string& version);
 
-/// What a shell needs to complete the program's options and what they take.
+/// A shell's completions of the program's options and their arguments.
 /// @param shell  "bash", "zsh" or "fish".
 /// @return empty for any other shell.
 std::string makeCompletion(const CLI::App& app, const std::string& shell);

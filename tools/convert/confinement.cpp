@@ -29,7 +29,7 @@ struct FilterReleaser
 };
 using Filter = std::unique_ptr<void, FilterReleaser>;
 
-/// What needs no look at its arguments: memory, time, what is open already, this process's own signals and end.
+/// Calls that are harmless with any arguments: memory, time, open files, this process's own signals and exit.
 constexpr int HARMLESS[] = {
     SCMP_SYS(brk),
     SCMP_SYS(mmap),
@@ -71,7 +71,7 @@ constexpr int HARMLESS[] = {
     SCMP_SYS(exit_group),
 };
 
-/// What is harmless with certain arguments alone.
+/// Calls that are harmless with certain arguments only.
 int allowWithArguments(void* filter, int socket)
 {
     const uint64_t end = uint64_t(socket);
@@ -87,7 +87,7 @@ int allowWithArguments(void* filter, int socket)
         {SCMP_SYS(ioctl), {1, SCMP_CMP_EQ, TCGETS, 0}},  // whether it is a terminal
         {SCMP_SYS(fcntl), {1, SCMP_CMP_EQ, F_GETFL, 0}}, // which fdopen looks at
         {SCMP_SYS(fcntl64), {1, SCMP_CMP_EQ, F_GETFL, 0}},
-        {SCMP_SYS(newfstatat), {3, SCMP_CMP_MASKED_EQ, AT_EMPTY_PATH, AT_EMPTY_PATH}}, // of what is open
+        {SCMP_SYS(newfstatat), {3, SCMP_CMP_MASKED_EQ, AT_EMPTY_PATH, AT_EMPTY_PATH}}, // for open files
         {SCMP_SYS(fstatat64), {3, SCMP_CMP_MASKED_EQ, AT_EMPTY_PATH, AT_EMPTY_PATH}},
         {SCMP_SYS(statx), {2, SCMP_CMP_MASKED_EQ, AT_EMPTY_PATH, AT_EMPTY_PATH}},
         {SCMP_SYS(kill), {0, SCMP_CMP_EQ, self, 0}},
@@ -105,7 +105,7 @@ int loadFilter(int socket)
     const Filter filter(seccomp_init(SCMP_ACT_ERRNO(EACCES)));
     if (!filter)
         return -ENOMEM;
-    int result = seccomp_attr_set(filter.get(), SCMP_FLTATR_API_SYSRAWRC, 1); // the system's own reasons
+    int result = seccomp_attr_set(filter.get(), SCMP_FLTATR_API_SYSRAWRC, 1); // system error codes
     for (const int call : HARMLESS)
         result = result < 0 ? result : seccomp_rule_add(filter.get(), SCMP_ACT_ALLOW, call, 0);
     result = result < 0 ? result : allowWithArguments(filter.get(), socket);

@@ -5,14 +5,13 @@
 namespace convert
 {
 
-/// False in a build that checks addresses, whose checks need more than a confined process has.
+/// False in a build with address checks, which need more than a confined process may do.
 extern const bool CAN_CONFINE;
 
-/// Takes every right from this process that converting does without, for good: from now on it opens no files and no
-/// connections, starts no programs and signals no other process. It reads and writes what is open, and has memory.
-/// Whatever else it tries fails (EACCES).
+/// Confines this process for good: it can no longer open files or connections, start programs or signal other
+/// processes. It can read and write open files and allocate memory. All other calls fail (EACCES).
 /// @param socket  the one over which it may still exchange messages.
-/// @param error   why the system does not do that.
+/// @param error   why the system refuses.
 bool confine(int socket, std::string& error);
 
 } // namespace convert

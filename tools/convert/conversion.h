@@ -12,24 +12,24 @@ namespace convert
 
 class ModelFiles;
 
-/// All that comes of converting a model; nothing is written yet.
+/// The result of converting a model; nothing is written yet.
 struct Conversion
 {
-    std::string error;             ///< why nothing comes of it; empty if something does
+    std::string error;             ///< why it failed; empty on success
     std::vector<OutputFile> files; ///< textures, then the scene
     std::string text;              ///< the report for a person
     std::string json;              ///< the report for a program
 };
 
 /// @param model  path of the model file.
-/// @param out    path of the scene file to be; textures come to lie beside it.
+/// @param out    path of the scene file; textures go beside it.
 Conversion convertFile(const std::string& model, ModelFiles& files, const std::string& out,
                        const Options& options);
 
-/// Hands it from process to process, by way of a file.
+/// Passes it between processes through a file.
 bool send(const Conversion& conversion, std::FILE* stream);
 
-/// The other end, which relies on nothing that the first one says.
+/// The receiving end; does not trust the sender.
 /// @param out  path of the scene file; other files lie beside it, and their names begin with its name.
 /// @return false if not all is there, or if it has files of other names.
 bool receive(Conversion& conversion, const std::string& out, std::FILE* stream);

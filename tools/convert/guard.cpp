@@ -42,7 +42,7 @@ constexpr int OUT_OF_MEMORY = 101;
 
 using Clock = std::chrono::steady_clock;
 
-/// Ends of a connection, of which the parent has the first and the child the second.
+/// A connection: the parent has the first end and the child the second.
 class Connection
 {
 public:
@@ -69,13 +69,13 @@ private:
     int m_ends[2] = {-1, -1};
 };
 
-/// What parent and child have in common.
+/// Shared by parent and child.
 struct Link
 {
     File handover;         ///< in memory
     Connection life;       ///< a pipe that the child closes by ending
     Connection files;      ///< a socket over which the child asks for files
-    Connection complaints; ///< a pipe that tells why the system does not confine the child, if so
+    Connection complaints; ///< a pipe with the reason if the system does not confine the child
 };
 
 File makeMemoryFile()
@@ -96,7 +96,7 @@ void setLimit(int resource, uint64_t value)
     setrlimit(resource, &limit);
 }
 
-/// Closes whatever this process has inherited but the standard streams and what is listed.
+/// Closes all inherited descriptors except the standard streams and the listed ones.
 void closeOthers(std::vector<unsigned> kept)
 {
     std::sort(kept.begin(), kept.end());
@@ -110,7 +110,7 @@ void closeOthers(std::vector<unsigned> kept)
     close_range(first, UINT_MAX, 0);
 }
 
-/// Bytes that this process takes up: the program and its libraries, before any work.
+/// Address space of this process before any work: the program and its libraries.
 uint64_t getAddressSpace()
 {
     unsigned long pages = 0;
@@ -118,8 +118,8 @@ uint64_t getAddressSpace()
     return file && std::fscanf(file.get(), "%lu", &pages) == 1 ? pages * uint64_t(sysconf(_SC_PAGESIZE)) : 0;
 }
 
-/// What libraries say when they die is no message for people; this process's parent has one. Checks of addresses, though,
-/// are to be heard.
+/// Silences standard error: the parent has a better message than a dying library. Not with address checks, whose
+/// reports are needed.
 /// @return the descriptor by which progress is still shown; -1 for none.
 int silence()
 {
@@ -149,13 +149,13 @@ int silence()
         write(link.complaints[1], error.data(), error.size()) != ssize_t(error.size()))
         _exit(INCOMPLETE);
     link.complaints.closeEnd(1);
-    // Before anybody catches the exception and makes something else of it.
+    // At once, before the importer catches the exception and reports another error.
     std::set_new_handler([] { _exit(OUT_OF_MEMORY); });
     const bool complete = work(handover, files) && std::fflush(handover) == 0;
-    _exit(complete ? 0 : INCOMPLETE); // without what the parent has registered for its own end
+    _exit(complete ? 0 : INCOMPLETE); // skips the parent's exit handlers
 }
 
-/// Once for a process, since it is so for every child.
+/// Once for a process: the reason is the same for every child.
 void complainOnce(int pipe)
 {
     static bool hasComplained = false;
@@ -168,7 +168,7 @@ void complainOnce(int pipe)
                  reason);
 }
 
-/// Answers the child's questions until it has closed its end of the pipe, which it does by ending.
+/// Answers the child's requests until its end of the pipe is closed, that is, until it ends.
 /// @param seconds  0: for ever.
 /// @return false if it has not ended in time.
 bool serveUntilEnd(const Link& link, FileGate& gate, double seconds)
@@ -195,7 +195,7 @@ bool serveUntilEnd(const Link& link, FileGate& gate, double seconds)
     }
 }
 
-/// What is known of libassimp's reader of a format.
+/// A known fault of libassimp's reader of a format.
 std::string getKnownFault(const std::string& model)
 {
     const std::string extension = toLowerCase(model.substr(model.find_last_of('.') + 1));
@@ -256,7 +256,7 @@ bool runGuarded(const Limits& limits, const std::string& model, FileGate& gate, 
     if (!link.handover || !link.life.openPipe() || !link.files.openSocket() || !link.complaints.openPipe())
         return failWithErrno("no handover file", error);
 
-    std::fflush(nullptr); // or the child has the same bytes to write again
+    std::fflush(nullptr); // or the child would write the same bytes again
     const pid_t parent = getpid();
     const pid_t child = fork();
     if (child == 0)

@@ -28,7 +28,7 @@ const char* const NOTHING = "holds nothing that can be drawn";
 
 std::string getFormatName(const Assimp::Importer& importer)
 {
-    const int index = importer.GetPropertyInteger("importerIndex", -1); // as the importer leaves it
+    const int index = importer.GetPropertyInteger("importerIndex", -1); // set by the importer
     const aiImporterDesc* format = index < 0 ? nullptr : importer.GetImporterInfo(size_t(index));
     return format ? format->mName : "";
 }
@@ -44,14 +44,14 @@ int getNumber(const aiScene& scene, const char* key, int fallback)
     return scene.mMetaData && scene.mMetaData->Get(key, number) ? number : fallback;
 }
 
-/// A row that takes a coordinate of the file's, with its sign, for one of the scene's.
+/// A matrix row that selects one of the file's axes, with its sign.
 void setRow(aiMatrix4x4& matrix, unsigned row, int axis, int sign)
 {
     for (unsigned column = 0; column < 3; ++column)
         matrix[row][column] = int(column) == axis ? (sign < 0 ? -1.0f : 1.0f) : 0.0f;
 }
 
-/// The importer only tells which axes and unit an FBX file is in, and passes its numbers on as they are.
+/// The importer reports an FBX file's axes and unit, but does not apply them.
 aiMatrix4x4 makeFbxTransform(const aiScene& scene, bool turns)
 {
     aiMatrix4x4 transform;
@@ -92,7 +92,7 @@ aiMatrix4x4 makeUpright(const std::string& axis)
 
 aiMatrix4x4 makeTransform(const aiScene& scene, const std::string& format, const Options& options)
 {
-    const bool isUpright = contains(format, "Blender") || contains(format, "SMD"); // where z is always up
+    const bool isUpright = contains(format, "Blender") || contains(format, "SMD"); // z is always up there
     const std::string up = options.up.empty() && isUpright ? "z" : options.up;
     aiMatrix4x4 scale;
     aiMatrix4x4::Scaling(aiVector3D(float(options.scale)), scale);
@@ -101,7 +101,7 @@ aiMatrix4x4 makeTransform(const aiScene& scene, const std::string& format, const
     return scale * makeUpright(up) * own;
 }
 
-/// Vertices go with those of their joints that there are.
+/// Drops missing joints; vertices follow the others.
 void dropLostJoints(aiScene& scene, Report& report)
 {
     for (unsigned i = 0; i < scene.mNumMeshes; ++i)
@@ -119,7 +119,7 @@ void dropLostJoints(aiScene& scene, Report& report)
     }
 }
 
-/// The importer of 3DS files forgets where cameras look as soon as the file has nodes.
+/// The importer of 3DS files loses camera directions if the file has nodes.
 void reportCameras(const aiScene& scene, Report& report)
 {
     for (unsigned i = 0; i < scene.mNumCameras; ++i)
@@ -127,7 +127,7 @@ void reportCameras(const aiScene& scene, Report& report)
                                             "\" looks, which libassimp does not tell of 3DS files");
 }
 
-/// A file of nothing but a skeleton gets a body from the library.
+/// The library makes a mesh for a file with only a skeleton.
 void reportSkeletonBody(const aiScene& scene, Report& report)
 {
     aiString name;
@@ -142,7 +142,7 @@ bool fail(const std::string& reason, std::string& error)
     return false;
 }
 
-/// Opens a glTF file; anything else comes back as another kind.
+/// Opens a glTF file; other files give another kind.
 gltf::Opened openGltf(const std::string& path, ModelFiles& files, const Assimp::Importer& importer)
 {
     gltf::Bytes bytes(64);
@@ -154,7 +154,7 @@ gltf::Opened openGltf(const std::string& path, ModelFiles& files, const Assimp::
     return gltf::openGltf(std::move(bytes), path);
 }
 
-/// The importer's own scene, held nowhere else.
+/// The importer's own scene, which nobody else holds.
 aiScene& getOwn(const ImportedModel& model)
 {
     return const_cast<aiScene&>(*model.scene); // NOLINT(cppcoreguidelines-pro-type-const-cast)
@@ -174,8 +174,8 @@ bool readByLibrary(const std::string& path, const gltf::Opened& opened, Imported
     return (scene.mRootNode && scene.mNumMeshes > 0) || fail(NOTHING, error);
 }
 
-/// Reads, and looks for faults as far as libassimp can. It finds some with sound files and then throws away what it has
-/// read, so that such a file is read again.
+/// Reads with libassimp's validation. If that fails, libassimp drops the scene; it also fails for some valid files, so
+/// the file is read again without it.
 bool readAndValidate(const std::string& path, const gltf::Opened& opened, ImportedModel& model,
                      Report& report, std::string& error)
 {
@@ -194,7 +194,7 @@ bool importOther(const std::string& path, ModelFiles& files, const Options& opti
                  const gltf::Opened& opened, ImportedModel& model, Report& report, std::string& error)
 {
     Assimp::Importer& importer = model.importer;
-    importer.SetIOHandler(new ModelIo(files));       // the importer's from now on
+    importer.SetIOHandler(new ModelIo(files));       // owned by the importer
     importer.SetProgressHandler(new ImportProgress); // as well
     importer.SetPropertyBool(AI_CONFIG_IMPORT_COLLADA_IGNORE_UP_DIRECTION, !options.up.empty());
     if (!readAndValidate(path, opened, model, report, error))
@@ -210,7 +210,7 @@ bool importOther(const std::string& path, ModelFiles& files, const Options& opti
         correctFbx(scene, report);
     if (contains(format, "Wavefront"))
         correctObj(scene, path, files, report);
-    model.hidesColours = contains(format, "Blender"); // where a material has to ask for them
+    model.hidesColours = contains(format, "Blender"); // there the material decides
     if (contains(format, "3DS"))
         reportCameras(scene, report);
     dropLostJoints(scene, report);

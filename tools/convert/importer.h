@@ -14,16 +14,15 @@ namespace convert
 
 class ModelFiles;
 
-/// A model in libassimp's terms, put right where the library is known to hand over something else than the file has.
-/// Faces have one to three corners, those of one mesh all the same number.
+/// A model as a libassimp scene, with the library's known faults corrected. Faces have one to three corners, the same
+/// number for all faces of a mesh.
 struct ImportedModel
 {
     Assimp::Importer importer;
-    std::unique_ptr<aiScene> own;   ///< of a format that is read without the importer
+    std::unique_ptr<aiScene> own;   ///< for a format with its own reader
     const aiScene* scene = nullptr; ///< the importer's, or own
-    bool hidesColours = false;      ///< those of vertices are not meant to be seen
-    aiMatrix4x4
-        toScene; ///< from the model's axes and unit to +y up and, where the file tells its unit, metres
+    bool hidesColours = false;      ///< vertex colours must not be shown
+    aiMatrix4x4 toScene; ///< from the model's axes and unit to +y up and, if the unit is known, metres
 };
 
 /// @param files  outlives the model.

@@ -1,4 +1,4 @@
-// orv-convert: makes a scene file, with its textures beside it, of a model file.
+// orv-convert: converts a model file to a scene file with its textures beside it.
 
 #include "batch/folder.h"
 
@@ -10,14 +10,14 @@
 namespace
 {
 
-constexpr int LARGEST_TEXTURE = 16384; // pixels, as far as the engine goes
+constexpr int LARGEST_TEXTURE = 16384; // pixels; the engine's limit
 constexpr int MOST_PROCESSES = 1024;
 constexpr unsigned MOST_SHARDS = 1000000;
 
 struct Command
 {
     convert::Job job;
-    convert::FolderJob folder; ///< where the model is one
+    convert::FolderJob folder; ///< if the model is a folder
     std::string shard;
     bool noAnimation = false;
     std::string keys = "stepped";
@@ -74,7 +74,7 @@ int runFolder(Command& command)
     return convert::convertFolder(folder) ? 0 : commandline::FAILED;
 }
 
-/// "2/5". @return "" or what is wrong, as CLI11 asks for.
+/// "2/5". @return "" or the error, as CLI11 expects.
 std::string parseShard(const std::string& text, convert::FolderJob& job)
 {
     char beyond = 0;
@@ -83,7 +83,7 @@ std::string parseShard(const std::string& text, convert::FolderJob& job)
     return isFine ? "" : text + ": not a part of how many, such as 2/5";
 }
 
-/// What CLI11 cannot say of options together. @return empty if all is well.
+/// Rules for combinations of options, which CLI11 cannot express. @return the error, or empty.
 std::string findConflict(const Command& command, bool isFolder)
 {
     const convert::FolderJob& folder = command.folder;
@@ -174,7 +174,7 @@ void addOptions(CLI::App& app, Command& command)
     app.footer(FOOTER);
 }
 
-/// The scene is named after the model, and its textures have what WebGL asks of them.
+/// The scene is named after the model, and its textures get sizes that WebGL supports.
 void usePage(convert::Job& job)
 {
     const std::string name = std::filesystem::path(job.model).stem().string() + ".glo";

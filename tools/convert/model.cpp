@@ -19,7 +19,7 @@ namespace convert
 namespace
 {
 
-/// Makes the records of a scene, in the order in which they need each other.
+/// Makes the records of a scene, in the order of their dependencies.
 class ModelConverter
 {
 public:
@@ -40,7 +40,7 @@ public:
     {
         convertMaterials();
         convertMeshes();
-        glo::NodeData top; // bare: what turns the model upright is below it
+        glo::NodeData top; // without a transform; the node below turns the model upright
         top.name = top.scopedName = m_nodeNames.make(m_stem, "scene");
         glo::NodeData upright = makeNode(m_nodeNames.make(m_stem + " upright", ""));
         nameNodes(*m_source.mRootNode);
@@ -128,7 +128,7 @@ private:
         }
     }
 
-    /// Parents first, so that of several nodes of one name the first keeps it, as in the model.
+    /// Parents first, so that the first node of a name keeps it.
     void nameNodes(const aiNode& node)
     {
         m_names[&node] = m_nodeNames.make(node.mName.C_Str(), "node");
@@ -177,7 +177,7 @@ private:
         return isHeld ? node : addShear(std::move(node), source);
     }
 
-    /// A node that shears becomes two. One that is animated never shears while it moves, but has to be one.
+    /// A node with shear becomes two. An animated node stays one: its keys have no shear.
     glo::NodeData addShear(glo::NodeData node, const aiNode& source)
     {
         if (m_animated.count(&source) > 0)
@@ -221,8 +221,8 @@ private:
         return node.mParent ? getWorld(*node.mParent) * node.mTransformation : node.mTransformation;
     }
 
-    /// Which sides of faces are seen follows from the node of a mesh, where its vertices are from the joints. So
-    /// where only one of them mirrors, the mesh gets a mirrored node.
+    /// A mesh's node determines the winding, its joints the vertices. So if only one of them mirrors, the mesh gets a
+    /// mirrored node.
     bool isTurnedBySkin(const aiMesh& mesh, const Part& part, const aiNode& source) const
     {
         const aiBone* bone = part.bones[0] < mesh.mNumBones ? mesh.mBones[part.bones[0]] : nullptr;
@@ -231,8 +231,8 @@ private:
         return skinned * getWorld(source).Determinant() < 0.0f;
     }
 
-    /// Joints take vertices from the mesh as it is in the file to where the scene has them: an assimp bone's matrix
-    /// leads from the mesh to the joint in the pose of binding.
+    /// Joints transform vertices from the file's mesh to the scene. An assimp bone's matrix leads from the mesh to the
+    /// joint in the bind pose.
     const std::string& addSkin(const aiMesh& mesh, const Part& part, const std::string& ownName)
     {
         glo::Skin& skin = m_model.scene.skins.emplace_back();
@@ -255,7 +255,7 @@ private:
         return node.children.emplace_back(makeNode(m_nodeNames.make(name, "part")));
     }
 
-    /// The node itself if the object sits in it as the engine has it, looking along -z; else a child that does.
+    /// The node itself if the object looks along its -z; else a child that does.
     glo::NodeData& addHolder(glo::NodeData& node, bool isFree, const std::string& name,
                              const aiMatrix4x4& transform)
     {
@@ -313,7 +313,7 @@ private:
 
     const aiScene& m_source;
     bool m_hidesColours;
-    bool m_isGltf; ///< 2.0, whose word is taken for all that it says
+    bool m_isGltf; ///< 2.0, whose values are used without guessing
     aiMatrix4x4 m_toScene;
     std::string m_stem;
     const Options& m_options;

@@ -14,7 +14,7 @@ namespace convert
 
 class ModelFiles;
 
-/// A model as it is to be written.
+/// A converted model, to be written.
 struct ConvertedModel
 {
     glo::GloScene scene;

@@ -7,11 +7,11 @@
 namespace convert
 {
 
-/// Makes names that a scene file can hold and that are borne only once.
+/// Makes unique names that a scene file can hold.
 class NameMaker
 {
 public:
-    /// @param wanted    as the model has it; taken if it is free.
+    /// @param wanted    the model's name; used if it is free.
     /// @param fallback  for an empty one.
     std::string make(const std::string& wanted, const std::string& fallback)
     {

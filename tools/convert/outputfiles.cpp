@@ -18,7 +18,7 @@ namespace fs = std::filesystem;
 namespace
 {
 
-/// Ctrl-C, a closed terminal and the like wait until this is gone.
+/// Blocks signals such as Ctrl-C while it exists.
 class Uninterrupted
 {
 public:
@@ -86,7 +86,7 @@ bool writeTemporaries(const std::vector<OutputFile>& files, const FileGate& inpu
     for (const OutputFile& file : files)
     {
         std::error_code ignored;
-        if (fs::is_directory(file.path, ignored)) // found out before the first file gets its name
+        if (fs::is_directory(file.path, ignored)) // checked before the first file is renamed
             return fail(file.path, std::strerror(EISDIR), error);
         if (inputs.wasOpened(file.path))
             return fail(file.path, "the model was read from this file; choose another name", error);

@@ -15,9 +15,9 @@ struct OutputFile
     std::vector<uint8_t> bytes;
 };
 
-/// Writes files, all of them or none: to temporary names in their folders first, and when all bytes are there under
-/// their own names, the last file of the list last. What interrupts a program waits meanwhile.
-/// @param inputs  a file that was opened there is not written over, by whatever name.
+/// Writes all files or none: first to temporary names in their folders; when all bytes are written, they are renamed in
+/// the list's order. Signals that interrupt the program are blocked meanwhile.
+/// @param inputs  files opened there are not overwritten, under any name.
 /// @param error   "path: reason".
 bool writeFiles(const std::vector<OutputFile>& files, const FileGate& inputs, std::string& error);
 

@@ -17,9 +17,9 @@ namespace
 /// The last is the one that a browser asks for.
 const char* const PARTS[] = {"orv.wasm",  "orv.js",     "files.js",  "input.js",
                              "viewer.js", "viewer.css", "index.html"};
-const char* const PLACES[] = {"../share/orv/web", "../../../web/page"}; // from the folder of the program
+const char* const PLACES[] = {"../share/orv/web", "../../../web/page"}; // relative to the program's folder
 
-/// What index.html has in place of a scene.
+/// The placeholder for a scene in index.html.
 const char* const NO_SCENE = ">{}</script>";
 
 fs::path findFolder()
@@ -42,7 +42,7 @@ bool read(const fs::path& path, std::vector<uint8_t>& bytes)
     return file.good() || file.eof();
 }
 
-/// As a page has it between the tags of a script: no text ends that.
+/// JSON for a script element: no text in it can end the element.
 std::string describeScene(const std::vector<OutputFile>& files)
 {
     nlohmann::ordered_json scene;

@@ -8,15 +8,15 @@
 namespace convert
 {
 
-/// The viewer for web browsers, to be written beside a scene so that any web server shows it.
+/// The viewer for web browsers, to be written beside a scene.
 class Page
 {
 public:
-    /// Looks for its files: where the tools are installed, or where a build puts them.
-    /// @return false, with the reason in error, if they are not all there.
+    /// Loads its files from where the tools are installed or built.
+    /// @return false, with the reason in error, if a file is missing.
     bool load(std::string& error);
 
-    /// Adds the page that shows a scene to what is to be written; what makes a page of a folder comes last.
+    /// Adds the page of a scene to the files to be written, index.html last.
     /// @param files  those of the scene, in the folder of the page, the scene last; at least that one.
     void addTo(std::vector<OutputFile>& files) const;
 

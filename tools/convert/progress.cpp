@@ -44,7 +44,7 @@ void showProgress(const std::string& what, float share)
     std::string line = what.substr(0, LONGEST);
     if (share >= 0.0f)
         line += " " + std::to_string(int(std::min(share, 1.0f) * 100.0f)) + " %";
-    std::fprintf(g_stream, "\r\033[K%s", line.c_str()); // to the line's start, and the old line away
+    std::fprintf(g_stream, "\r\033[K%s", line.c_str()); // goes to the line's start and clears the line
     std::fflush(g_stream);
 }
 

@@ -7,18 +7,18 @@
 namespace convert
 {
 
-/// Says on one line of standard error what goes on, if that is a terminal and it has taken a while.
+/// Shows progress on one line of standard error, if that is a terminal and some time has passed.
 /// @param share  0 to 1; below 0 if unknown.
 void showProgress(const std::string& what, float share = -1.0f);
 
-/// Goes on by another descriptor, so that standard error can be closed.
-/// @return that descriptor; -1 if there is nothing to say anyway.
+/// Continues on another descriptor, so that standard error can be closed.
+/// @return that descriptor; -1 if no progress is shown.
 int moveProgress();
 
-/// Takes the line away.
+/// Clears the line.
 void clearProgress();
 
-/// Tells how far an importer is.
+/// Shows an importer's progress.
 class ImportProgress : public Assimp::ProgressHandler
 {
 public:

@@ -9,10 +9,10 @@
 namespace convert
 {
 
-/// What became of a model: figures, and in sentences for a person what could not be carried over as it was.
+/// The report on a conversion: figures, and sentences about approximated and lost features.
 ///
-/// Codes and names of figures are for programs, stay as they are, and are listed in docs/convert.md: lower case,
-/// words joined by '-'.
+/// Codes and names of figures are for scripts and do not change; docs/convert.md lists them. Lower case, words joined
+/// by '-'.
 class Report
 {
 public:
@@ -22,22 +22,22 @@ public:
     /// A name in the plural, such as "vertices".
     using Figures = std::vector<std::pair<std::string, uint64_t>>;
 
-    /// Something of the model that the scene has not. The same again is only counted.
+    /// A feature that the scene lacks. Repetitions are only counted.
     void lose(const std::string& code, const std::string& sentence) { ++m_losses[{code, sentence}]; }
-    /// Something that the scene has in another form, which looks a little different.
+    /// A feature that the scene has in another form, which looks slightly different.
     void approximate(const std::string& code, const std::string& sentence)
     {
         ++m_approximations[{code, sentence}];
     }
     /// Adds to a figure of the conversion, such as "degenerate-faces"; one that is 0 is reported too.
     void count(const std::string& figure, uint64_t number) { m_figures[figure] += number; }
-    /// What the model has, and what the scene has, in the order of the calls.
+    /// Counts of the model and of the scene, in the order of the calls.
     void cameIn(const std::string& figure, uint64_t number) { m_in.emplace_back(figure, number); }
     void wentOut(const std::string& figure, uint64_t number) { m_out.emplace_back(figure, number); }
-    /// What reads files like the model.
+    /// The format's name.
     void setFormat(const std::string& name) { m_format = name; }
 
-    /// How often each.
+    /// The number of occurrences of each.
     const std::map<Finding, int>& getLosses() const { return m_losses; }
     const std::map<Finding, int>& getApproximations() const { return m_approximations; }
     const std::map<std::string, uint64_t>& getFigures() const { return m_figures; }

@@ -37,7 +37,7 @@ struct Model
     fs::path scene; ///< from the output folder, without its extension
 };
 
-/// What the processes have in common.
+/// Shared by the processes.
 struct Shared
 {
     std::atomic<size_t> next{0};
@@ -46,7 +46,7 @@ struct Shared
     std::atomic<unsigned> failed{0};
 };
 
-/// Of bytes, and the same everywhere (FNV-1a).
+/// Hash of bytes, the same on every machine (FNV-1a).
 uint64_t digest(const std::string& text)
 {
     uint64_t value = 14695981039346656037u;
@@ -55,7 +55,7 @@ uint64_t digest(const std::string& text)
     return value;
 }
 
-/// Models by what their names end in. Files of material and the like that a model names are none.
+/// Whether a name has a model's extension. Files that models refer to, such as materials, are not models.
 std::vector<Model> findModels(const FolderJob& job, std::string& error)
 {
     const Assimp::Importer importer;
@@ -93,7 +93,7 @@ std::vector<Model> findModels(const FolderJob& job, std::string& error)
     return models;
 }
 
-/// All that decides what becomes of the same files.
+/// Everything besides the files that decides the result.
 std::string describeSettings(const Job& job)
 {
     const Options& options = job.options;
@@ -106,7 +106,7 @@ std::string describeSettings(const Job& job)
     return json.dump(-1, ' ', true, Json::error_handler_t::replace);
 }
 
-/// Size and time of a file, which change with it; null if it is not there.
+/// Size and time of a file; null if it does not exist.
 Json describeFile(const fs::path& path)
 {
     std::error_code reason;
@@ -130,7 +130,7 @@ public:
         m_job.out = (fs::path(job.out) / model.scene).string() + ".glo";
     }
 
-    /// Whether the report of an earlier time still holds. @param error  what it says went wrong then.
+    /// Whether the report of an earlier run is still valid. @param error  the error in that report.
     bool isUnchanged(std::string& error) const
     {
         std::ifstream file(m_report);
@@ -259,7 +259,7 @@ bool convertFolder(const FolderJob& job)
         return false;
     }
     Shared& shared = *new (memory) Shared;
-    std::fflush(stdout); // or each process would have what is in it
+    std::fflush(stdout); // or each process would print its copy
     const bool areFine = workInProcesses(job, models, shared);
     const unsigned failed = shared.failed;
     std::printf("%zu %s: %u converted, %u unchanged, %u failed\n", models.size(),

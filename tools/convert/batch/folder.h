@@ -10,20 +10,19 @@ namespace convert
 /// Which models of a folder are converted, and how.
 struct FolderJob
 {
-    Job common;         ///< of every model; its paths are not used
-    std::string folder; ///< with all folders below it
-    std::string out;    ///< gets the same folders, with a scene and a report for each model
-    unsigned shard = 1; ///< 1 to shards
-    unsigned shards =
-        1; ///< of how many parts of the models this is one; a model's path decides which it is in
+    Job common;             ///< of every model; its paths are not used
+    std::string folder;     ///< with all folders below it
+    std::string out;        ///< gets the same folders, with a scene and a report for each model
+    unsigned shard = 1;     ///< 1 to shards
+    unsigned shards = 1;    ///< number of parts; a model's path decides its part
     unsigned processes = 1; ///< at a time
-    bool again = false;     ///< what has not changed too
+    bool again = false;     ///< unchanged models too
 };
 
-/// Converts what is new or has changed. A report says what a scene was made of and with which options; a scene whose report
-/// agrees with all of it is left alone, and so is a model that failed and is still as it was, which counts as failed again.
-/// The report is written last: what was interrupted is done again, and nothing else.
-/// Says a line for each model on standard output, each error on standard error.
+/// Converts new and changed models. A report lists a scene's inputs and options; a scene whose report is still valid is
+/// skipped. A model that failed and has not changed is skipped too, and counts as failed again. The report is written
+/// last, so that interrupted conversions are repeated. Prints a line for each model on standard output, errors on
+/// standard error.
 /// @return false if a model failed or there is none.
 bool convertFolder(const FolderJob& job);
 

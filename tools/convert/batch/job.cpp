@@ -30,7 +30,7 @@ bool convertGuarded(const Job& job, FileGate& gate, Conversion& made, std::strin
     return done && error.empty();
 }
 
-/// Whether a texture would get the place of a file that the model was read from.
+/// Whether a texture would overwrite a file that the model was read from.
 bool takesInput(const Conversion& made, const Job& job, const FileGate& gate)
 {
     return std::any_of(made.files.begin(), made.files.end(),
@@ -38,7 +38,7 @@ bool takesInput(const Conversion& made, const Job& job, const FileGate& gate)
                        { return file.path != job.out && gate.wasOpened(file.path); });
 }
 
-/// A path in the language of make.
+/// A path escaped for make.
 std::string quoteForMake(const std::string& path)
 {
     std::string quoted;
@@ -73,7 +73,7 @@ std::vector<OutputFile> listOutputs(const Job& job, const FileGate& gate, Conver
     return files;
 }
 
-/// Makes the folder of a page where there is none; one that stays empty is removed again.
+/// Makes the folder of a page if there is none, and removes it again if it stays empty.
 class PageFolder
 {
 public:
@@ -123,7 +123,7 @@ Outcome convertModel(Job job)
     if (!job.page.empty() && !page.load(outcome.error))
         return outcome;
     bool done = convertGuarded(job, gate, made, outcome.error);
-    if (done && takesInput(made, job, gate)) // which only shows when all has been read
+    if (done && takesInput(made, job, gate)) // only known after reading
     {
         for (const OutputFile& file : made.files)
         {

@@ -15,7 +15,7 @@ namespace fs = std::filesystem;
 namespace
 {
 
-constexpr size_t MOST_MISSING = 1000; // of a model that names files without end
+constexpr size_t MOST_MISSING = 1000; // limits the list of one model
 
 bool isWithin(const fs::path& path, const fs::path& folder)
 {
@@ -36,14 +36,14 @@ FileGate::FileGate(const std::string& model, const std::vector<std::string>& all
         if (!reason)
             m_folders.push_back(canonical);
     }
-    std::error_code ignored; // a model that is not there cannot be opened either
+    std::error_code ignored; // opening a missing model fails later
     m_model = fs::canonical(model, ignored);
 }
 
 int FileGate::open(const std::string& path, int& descriptor)
 {
     std::error_code reason;
-    const fs::path canonical = fs::canonical(path.c_str(), reason); // up to a NUL, as the system reads it
+    const fs::path canonical = fs::canonical(path.c_str(), reason); // up to a NUL, like the system
     if (reason)
     {
         std::error_code ignored;
@@ -75,7 +75,7 @@ std::vector<std::string> FileGate::list(const std::string& folder) const
         return names;
     for (const fs::directory_entry& entry : fs::directory_iterator(canonical, reason))
         names.push_back(entry.path().filename().string());
-    std::sort(names.begin(), names.end()); // a folder has no order of its own
+    std::sort(names.begin(), names.end()); // folders are unordered
     return names;
 }
 

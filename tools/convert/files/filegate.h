@@ -12,12 +12,12 @@ namespace convert
 {
 
 /// Decides which files a model may reach, and opens them: those in the model's own folder and below it, or in folders
-/// that the user allows. Symbolic links count by where they lead. Whatever reads a model asks here, in another process
-/// if need be (see runGuarded), so that a file from anywhere cannot have others read.
+/// that the user allows. The target of a symbolic link counts. All reading of models goes through this, even from
+/// another process (see runGuarded), so that an untrusted model cannot read other files.
 class FileGate
 {
 public:
-    /// What open() says of a file that lies elsewhere; everything else is 0 or a value of errno.
+    /// open()'s result for a file elsewhere; other results are 0 or values of errno.
     static constexpr int REFUSED = -1;
 
     /// @param model    the file that the user named, which may be a link to anywhere.
@@ -27,19 +27,19 @@ public:
     /// Opens a regular file for reading.
     /// @param path        absolute or from the current folder.
     /// @param descriptor  the file's, to be closed by the caller; unchanged unless it is open.
-    /// @return 0, REFUSED, EISDIR for what is there and is no file, or another value of errno.
+    /// @return 0, REFUSED, EISDIR if it is not a regular file, or another value of errno.
     int open(const std::string& path, int& descriptor);
 
-    /// @return the names in a folder, sorted; none if it is elsewhere or is not there.
+    /// @return the names in a folder, sorted; none if it is elsewhere or does not exist.
     std::vector<std::string> list(const std::string& folder) const;
 
-    /// Whether a path leads to a file that was opened here, by whatever name.
+    /// Whether a path leads to a file that was opened here, under any name.
     bool wasOpened(const std::string& path) const;
 
     /// Canonical paths of the files that were opened.
     const std::set<std::filesystem::path>& getOpened() const { return m_opened; }
 
-    /// Absolute paths at which a file of the model was looked for and was not; the first thousand of them.
+    /// Absolute paths of the model's missing files; the first thousand.
     const std::set<std::string>& getMissing() const { return m_missing; }
 
 private:

@@ -22,7 +22,7 @@ namespace
 constexpr char OPEN = 'o'; // kinds of requests
 constexpr char LIST = 'l';
 
-/// Names with a NUL behind each, in a file in memory.
+/// A file in memory with names, each followed by a NUL.
 int pack(const std::vector<std::string>& names, int& descriptor)
 {
     const int file = memfd_create("orv-convert", MFD_CLOEXEC);
@@ -138,7 +138,7 @@ void answerRequest(FileGate& gate, int socket)
     Message message(&reason);
     if (descriptor >= 0)
         message.attach(descriptor);
-    sendmsg(socket, &message.header, MSG_NOSIGNAL); // who asked may have ended
+    sendmsg(socket, &message.header, MSG_NOSIGNAL); // the asking process may have ended
     if (descriptor >= 0)
         close(descriptor);
 }

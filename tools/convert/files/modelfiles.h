@@ -18,8 +18,8 @@ struct FileCloser
 };
 using File = std::unique_ptr<std::FILE, FileCloser>;
 
-/// The files that belong to a model. Every file that is read for it, the model itself included, is opened by this
-/// object, which asks a FileGate in this process or in another one.
+/// The files of a model. This object opens every file that is read for it, including the model itself, through a
+/// FileGate in this process or another one.
 class ModelFiles
 {
 public:
@@ -40,11 +40,11 @@ public:
 
     /// Reads a whole file.
     /// @param most  bytes above which a file is not read.
-    /// @return false, with bytes empty, if it cannot be had.
+    /// @return false, with bytes empty, if it cannot be read.
     bool read(const std::string& path, std::vector<uint8_t>& bytes, uint64_t most = UINT64_MAX);
 
-    /// Reads a file as models name them: from the model's folder or absolute, as a path in the manner of any system or
-    /// as a URI ("my%20mesh.bin", "file:///tmp/mesh.bin"). As it stands is tried first.
+    /// Reads a file by a name from a model: relative to the model's folder or absolute, a path of any system or a URI
+    /// ("my%20mesh.bin", "file:///tmp/mesh.bin"). The unchanged name is tried first.
     bool readNamed(const std::string& name, std::vector<uint8_t>& bytes, uint64_t most = UINT64_MAX);
 
     /// See FileGate::list.
@@ -53,7 +53,7 @@ public:
     /// With a slash at its end; empty for the current one.
     const std::string& getFolder() const { return m_folder; }
 
-    /// Paths of what was refused, as they were asked for.
+    /// The refused paths, as requested.
     const std::set<std::string>& getRefused() const { return m_refused; }
 
 private:
@@ -65,14 +65,14 @@ private:
     std::set<std::string> m_refused;
 };
 
-/// "%20" and the like become what they stand for.
+/// Decodes "%20" and the like.
 std::string decodeUrl(const std::string& text);
 
-/// A name as models write it, a URI or a path in the manner of any system, as a path of this system.
+/// Converts a name from a model, a URI or a path of any system, to a path of this system.
 std::string toPath(const std::string& name);
 
 /// Receives one request of a ModelFiles in another process and answers it.
-/// @param socket  the other end of its socket, of the kind that keeps messages apart (SOCK_SEQPACKET).
+/// @param socket  the other end of its socket (SOCK_SEQPACKET, which keeps messages separate).
 void answerRequest(FileGate& gate, int socket);
 
 } // namespace convert

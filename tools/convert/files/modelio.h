@@ -7,7 +7,7 @@ namespace convert
 
 class ModelFiles;
 
-/// Lets libassimp read a model's files, and write none.
+/// Lets libassimp read a model's files, but write none.
 class ModelIo : public Assimp::IOSystem
 {
 public:

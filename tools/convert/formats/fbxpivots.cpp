@@ -37,7 +37,7 @@ bool isPartOf(const aiNode& part, const std::string& whole)
     return std::string(part.mName.C_Str()).compare(0, start.size(), start) == 0;
 }
 
-/// Gives the last of a node's parts all of the transform. Nothing else hangs on those above it.
+/// Gives the last of a node's parts the whole transform. The parts above have no other children.
 void gather(aiNode& node, const Names& targets)
 {
     const std::string name = node.mName.C_Str();
@@ -46,7 +46,7 @@ void gather(aiNode& node, const Names& targets)
     {
         top = top->mParent;
         if (targets.count(top->mName.C_Str()) > 0)
-            return; // it moves by its parts
+            return; // its parts are animated
     }
     for (aiNode* part = &node; part != top;)
     {
@@ -56,7 +56,7 @@ void gather(aiNode& node, const Names& targets)
     }
 }
 
-/// The library turns forth by what comes after a node's own rotation where it has to turn back.
+/// The library applies the post-rotation where it should apply its inverse.
 void turnBack(aiNodeAnim& channel, const aiNode& node)
 {
     const std::string name = node.mName.C_Str();

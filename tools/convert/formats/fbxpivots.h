@@ -7,10 +7,9 @@ namespace convert
 
 class Report;
 
-/// Puts right what libassimp makes of FBX nodes with rotations before and after their own (PreRotation, PostRotation):
-/// such a node is several, one in the other, and where it moves, the keys of the last have all of the transform, which
-/// the others would then apply again.
-/// Reports rotations whose keys lie so far apart that the way between them matters, which the file has by angles.
+/// Corrects FBX nodes with PreRotation and PostRotation. libassimp makes several nested nodes of such a node. If it is
+/// animated, the keys of the last one have the whole transform, so the others would apply their part twice. Reports
+/// rotations whose keys are so far apart that the path between them matters; the file defines it by Euler angles.
 void correctFbx(aiScene& scene, Report& report);
 
 } // namespace convert

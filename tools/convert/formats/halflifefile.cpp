@@ -17,7 +17,7 @@ namespace
 /// The numbers of the bones' parents, -1 for none. Bones come after their parents.
 std::vector<int32_t> readParents(const std::string& path, ModelFiles& files, size_t count)
 {
-    constexpr size_t BONE_COUNT = 140; // where the header has it, and next to it the place of the first bone
+    constexpr size_t BONE_COUNT = 140; // offset in the header; the first bone's offset follows
     constexpr size_t BONE_SIZE = 112;
     constexpr size_t PARENT = 32; // in a bone
     std::vector<uint8_t> bytes;
@@ -51,14 +51,14 @@ void giveChildren(aiNode& node, const std::vector<aiNode*>& children)
         child->mParent = &node;
 }
 
-/// The bones' own transforms are those of the file, from bone to parent, and their offsets lead from the mesh, which
-/// has been put together by the wrong tree too, to where the file has the vertices: in the bones. So skins are right
-/// as soon as the tree is.
+/// The bones' transforms, from bone to parent, are the file's. Their offset matrices lead from the mesh, which was
+/// built with the wrong tree too, back to the file's vertices in bone space. So correcting the tree also corrects the
+/// skins.
 void hangBones(aiNode& holder, const std::string& path, ModelFiles& files)
 {
     const std::vector<aiNode*> bones(holder.mChildren, holder.mChildren + holder.mNumChildren);
     const std::vector<int32_t> parents = readParents(path, files, bones.size());
-    if (parents.empty()) // a version of the library that does better would leave fewer here
+    if (parents.empty()) // a later version of the library may already be right
         return;
     for (int32_t i = -1; i < int32_t(parents.size()); ++i)
     {

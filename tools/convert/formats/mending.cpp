@@ -28,7 +28,7 @@ void dropNullChildren(aiNode& node)
     node.mNumChildren = unsigned(end - node.mChildren);
 }
 
-/// @param array  of pointers that are owned; those that are not wanted are deleted.
+/// @param array  owned pointers; unwanted objects are deleted.
 /// @return by old number the new one, or GONE.
 template <class Thing, class IsWanted>
 std::vector<unsigned> sift(Thing** array, unsigned& count, const IsWanted& isWanted)
@@ -72,8 +72,8 @@ void makePoints(aiMesh& mesh)
     mesh.mPrimitiveTypes = aiPrimitiveType_POINT;
 }
 
-/// Drops faces without corners or with corners that the mesh has not.
-/// @return false if no face is left of those that were there.
+/// Drops faces without corners or with invalid vertex numbers.
+/// @return false if all faces were dropped.
 bool dropBadFaces(aiMesh& mesh, Report& report)
 {
     const auto isBad = [&](const aiFace& face)
@@ -98,14 +98,14 @@ bool dropBadFaces(aiMesh& mesh, Report& report)
     return kept > 0;
 }
 
-/// Some importers forget a kind of face of those that a mesh has.
+/// Some importers forget to list a kind of face.
 void nameKinds(aiMesh& mesh)
 {
     for (unsigned i = 0; i < mesh.mNumFaces; ++i)
         mesh.mPrimitiveTypes |= AI_PRIMITIVE_TYPE_FOR_N_INDICES(mesh.mFaces[i].mNumIndices);
 }
 
-/// A material for meshes that name none that there is.
+/// A material for meshes whose material does not exist.
 void giveMaterials(aiScene& scene)
 {
     const unsigned count = scene.mNumMaterials;
@@ -136,7 +136,7 @@ double sortKeys(Key* keys, unsigned count)
     return count > 0 ? keys[count - 1].mTime : 0.0;
 }
 
-/// Some importers hand over keys in the order of the file, or say that an animation ends before its last key.
+/// Some importers return unsorted keys, or an end time before the last key.
 void sortKeys(aiAnimation& animation)
 {
     for (unsigned i = 0; i < animation.mNumChannels; ++i)

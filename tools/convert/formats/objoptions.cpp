@@ -18,12 +18,12 @@ namespace convert
 namespace
 {
 
-/// How a picture lies: texture coordinates are stretched, then moved.
+/// A texture transform: coordinates are scaled, then moved.
 struct MapOptions
 {
     aiVector2D scale{1.0f, 1.0f};
     aiVector2D offset{0.0f, 0.0f};
-    std::string file; ///< if there are options: libassimp takes a name for a number that has been left out
+    std::string file; ///< if there are options: libassimp reads the name as a missing number
 
     bool operator==(const MapOptions& other) const { return scale == other.scale && offset == other.offset; }
 };
@@ -50,7 +50,7 @@ aiTextureType getKind(const std::string& statement)
     return aiTextureType_NONE;
 }
 
-/// One to three numbers, of which the first two count; those that are missing stay.
+/// One to three numbers, of which the first two are used; missing ones keep their value.
 void readPair(std::istream& words, aiVector2D& pair)
 {
     float values[3];

@@ -10,8 +10,8 @@ namespace convert
 class ModelFiles;
 class Report;
 
-/// Applies how an OBJ file's material library has pictures stretched and moved (the options -s and -o of a map), which
-/// libassimp reads over. All pictures of a material lie as its first does; another one's own way is reported as lost.
+/// Applies the texture transforms of an OBJ file's material library (the options -s and -o of a map), which libassimp
+/// ignores. All pictures of a material use the first one's transform; a different one is reported as lost.
 /// @param path  of the OBJ file.
 void correctObj(aiScene& scene, const std::string& path, ModelFiles& files, Report& report);
 

@@ -7,14 +7,14 @@
 namespace convert::gltf
 {
 
-/// Where the numbers of an element lie.
+/// The layout of an element's numbers.
 struct Accessors::Layout
 {
     size_t count;
     unsigned components;
     unsigned rows;       ///< numbers of a matrix's column; those of a column begin at a multiple of 4 bytes
     size_t elementSize;  ///< bytes, to the end of the last number
-    size_t columnStride; ///< bytes; of what is no matrix, elementSize
+    size_t columnStride; ///< bytes; elementSize unless it is a matrix
     size_t stride;       ///< bytes
     Decoding decoding;
 };
@@ -22,7 +22,7 @@ struct Accessors::Layout
 namespace
 {
 
-constexpr size_t MOST_ZEROS = 1 << 20; // of elements for which the file has no bytes; or a byte each
+constexpr size_t MOST_ZEROS = 1 << 20; // elements without a buffer view, or one for each byte
 
 template <class T>
 void decodeAs(const uint8_t* bytes, size_t stride, size_t count, unsigned components, bool normalized,
@@ -72,7 +72,7 @@ Component getComponent(const Object& object)
     return Component(code);
 }
 
-/// @return how many columns and rows; an object that is no matrix has one column.
+/// @return the numbers of columns and rows; other types than matrices have one column.
 std::pair<unsigned, unsigned> getShape(const Object& accessor)
 {
     const struct
@@ -205,7 +205,7 @@ void Accessors::applySparse(const Object& accessor, const Layout& layout, Column
     if (!values.has("bufferView") || !indices.has("bufferView"))
         sparse.fail("has no values or no indices");
     const std::vector<uint32_t> places = readSparseIndices(indices, tight.count);
-    // The values' object has the fields of an accessor that tell where they lie.
+    // The object of the sparse values has an accessor's fields.
     const Span bytes = locate(values, tight);
     for (size_t i = 0; i < tight.count; ++i)
     {

@@ -5,7 +5,7 @@
 namespace convert::gltf
 {
 
-/// Kinds of number in a buffer, by the names that GL has for them.
+/// Types of numbers in a buffer, by GL's names.
 enum class Component
 {
     INT8 = 5120,
@@ -26,11 +26,11 @@ struct Column
     const float* operator[](size_t element) const { return values.data() + element * components; }
 };
 
-/// How to make numbers of bytes.
+/// How to decode bytes.
 struct Decoding
 {
     Component component = Component::FLOAT;
-    bool normalized = false; ///< whole numbers stand for 0 to 1, signed ones for -1 to 1
+    bool normalized = false; ///< integers stand for 0 to 1, signed ones for -1 to 1
 };
 
 /// @param bytes  of elements that lie stride bytes apart.
@@ -46,15 +46,15 @@ public:
     Accessors(const Document& document, Buffers& buffers) : m_document(document), m_buffers(buffers) {}
 
     /// @param user  the object that names the accessor.
-    /// @return the number of elements, all of which are there.
+    /// @return the number of elements, all of which are in the file.
     size_t count(size_t index, const Object& user);
     Decoding decoding(size_t index, const Object& user) const;
 
-    /// All elements, or those of the given numbers, all of which have to be below count.
+    /// All elements, or those of the given indices, which have to be below count.
     /// @param components  wanted; 0 for as many as there are.
     Column read(size_t index, const Object& user, unsigned components = 0,
                 const std::vector<uint32_t>* elements = nullptr);
-    /// Single whole numbers.
+    /// Single integers.
     std::vector<uint32_t> readIndices(size_t index, const Object& user);
 
 private:

@@ -14,7 +14,7 @@ namespace convert::gltf
 namespace
 {
 
-constexpr double MOST_SAMPLES = 200000.0; // as many as the conversion takes; a longer animation it leaves out
+constexpr double MOST_SAMPLES = 200000.0; // the conversion drops longer animations
 
 using Value = std::array<float, 4>;
 
@@ -31,7 +31,7 @@ struct Key
     Value value;
 };
 
-/// Keys to move between in straight lines.
+/// Keys for linear interpolation.
 class KeyMaker
 {
 public:
@@ -58,7 +58,7 @@ private:
         const double end = double(m_track.times[key + 1]);
         if (double(m_track.times.back()) * m_fps > MOST_SAMPLES)
             return;
-        // From 0 on, where sampling begins: damaged times may lie as far before it as numbers go.
+        // From 0 on, where sampling begins: damaged times may be far below 0.
         for (double i = std::max(0.0, std::floor(start * m_fps) + 1.0); i / m_fps < end; i += 1.0)
         {
             if (i / m_fps <= start)
@@ -153,7 +153,7 @@ public:
             const std::vector<aiNodeAnim*> shown = showShapes(shapes, m_number);
             channels.insert(channels.end(), shown.begin(), shown.end());
         }
-        if (channels.empty()) // libassimp would leave an array of none behind
+        if (channels.empty()) // libassimp would leak an empty array
             return std::move(m_made);
         m_made->mNumChannels = unsigned(channels.size());
         m_made->mChannels = new aiNodeAnim*[channels.size()];
@@ -162,7 +162,7 @@ public:
     }
 
 private:
-    /// A model that lacks a movement is better than none.
+    /// A damaged animation is left out, and the model is converted.
     void readOrLose(const Object& channel)
     {
         try
@@ -202,8 +202,8 @@ private:
                              what + " in animation \"" + std::string(m_made->mName.C_Str()) + "\"");
     }
 
-    /// A matrix does not tell the rotation of a node without size, nor which of its axes a mirroring one turns round. So
-    /// what such a node keeps while it moves comes from the file.
+    /// A matrix does not determine the rotation of a node of scale zero, nor the mirrored axis of a mirroring one. So
+    /// values that are not animated come from the file.
     static void fillRest(const Object& node, Movement& movement)
     {
         Value rotation = {0.0f, 0.0f, 0.0f, 1.0f};
@@ -219,7 +219,7 @@ private:
     }
 
     /// A channel without keys, for the report.
-    /// @param isShown  by meshes.
+    /// @param isShown  meshes replace the weights.
     void noteMorph(const Object& channel, bool isShown)
     {
         const Object sampler = m_animation.at("samplers", channel.size("sampler", 0));

@@ -11,10 +11,10 @@ namespace convert::gltf
 
 /// Reads an animation of nodes; its time is in seconds.
 ///
-/// Values that step get a key for their old value and one for the new at the same time; cubic splines a key wherever
-/// the conversion takes a sample.
+/// Stepped values get a key for the old and one for the new value at the same time; cubic splines get a key at each
+/// sample of the conversion.
 /// @param number     of the animation in the file.
-/// @param nodeNames  by number of node; empty for nodes that the scene has not.
+/// @param nodeNames  by number of node; empty for nodes that are not in the scene.
 /// @param shapes     by number of node, their nodes made. Weights of other nodes are noted as a channel without keys.
 std::unique_ptr<aiAnimation> readAnimation(Source& source, size_t number,
                                            const std::vector<std::string>& nodeNames,

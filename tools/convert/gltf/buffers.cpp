@@ -9,7 +9,7 @@ namespace convert::gltf
 namespace
 {
 
-/// A buffer view's compression, which has two names; one that has nothing if it is not compressed.
+/// A buffer view's compression, which has two names; an empty object if it is not compressed.
 Object getCompression(const Object& view)
 {
     const Object first = view.extension("EXT_meshopt_compression");

@@ -8,19 +8,19 @@
 namespace convert::gltf
 {
 
-/// Reads a file that a model names, by the uri that the model has.
-/// @return false if it cannot be had.
+/// Reads a file by its uri in the model.
+/// @return false if it cannot be read.
 using FileOpener = std::function<bool(const std::string& uri, Bytes& bytes)>;
 
-/// The bytes of a file's buffers and buffer views, read when they are first asked for. Throws a Fault for what is not
-/// there, is cut short or reaches over an end.
+/// The bytes of a file's buffers and buffer views, read at the first access. Throws a Fault for missing, truncated or
+/// out-of-range data.
 class Buffers
 {
 public:
     /// @param document  outlives this.
     Buffers(const Document& document, FileOpener open);
 
-    /// The bytes of a buffer view, decompressed. They stay as long as this.
+    /// The bytes of a buffer view, decompressed; valid as long as this object.
     Span view(size_t index, const Object& user);
     /// Bytes from one element to the next in a view; 0 where they lie without gaps.
     size_t stride(size_t index, const Object& user) const;

@@ -15,7 +15,7 @@ constexpr size_t GLB_HEADER = 12;
 constexpr size_t CHUNK_HEADER = 8;
 constexpr uint32_t JSON_CHUNK = 0x4e4f534a;
 constexpr uint32_t BINARY_CHUNK = 0x004e4942;
-constexpr double LARGEST = 9007199254740992.0; // whole number that a double still has
+constexpr double LARGEST = 9007199254740992.0; // integer that a double holds exactly
 
 uint32_t readWord(const Bytes& bytes, size_t at)
 {
@@ -225,7 +225,7 @@ Document::Document(Bytes file) : m_file(std::move(file))
     {
         throw Fault("is no JSON from byte " + std::to_string(error.byte) + " on");
     }
-    root(); // which has to be an object
+    root(); // fails unless it is an object
 }
 
 /// @return the JSON.

@@ -16,19 +16,19 @@ namespace convert::gltf
 using Bytes = std::vector<uint8_t>;
 using Span = std::span<const uint8_t>;
 
-/// What is wrong with a file, with the name of the field.
+/// A fault of a file, with the name of the field.
 class Fault : public std::runtime_error
 {
     using std::runtime_error::runtime_error;
 };
 
-/// An object of a file's JSON, which knows where it stands, such as "meshes[3].primitives[0]".
+/// An object of a file's JSON, which knows its path, such as "meshes[3].primitives[0]".
 ///
-/// What a getter does not find is the fallback; what is there and of another type is a Fault. Belongs to a Document.
+/// Getters return the fallback for a missing value, and throw a Fault for a wrong type. Belongs to a Document.
 class Object
 {
 public:
-    Object() = default; ///< one that has nothing
+    Object() = default; ///< empty
     Object(const nlohmann::json& value, std::string place);
 
     explicit operator bool() const { return m_value != nullptr; }
@@ -44,13 +44,13 @@ public:
     Object at(const char* key, size_t index) const;
 
     std::optional<size_t> index(const char* key) const;
-    size_t size(const char* key, size_t fallback) const; ///< a whole number, 0 or more
+    size_t size(const char* key, size_t fallback) const; ///< an integer, 0 or more
     double number(const char* key, double fallback) const;
     bool flag(const char* key) const;
     std::string text(const char* key) const;
-    std::string word(const char* key) const; ///< a text, or a number as if it were one: "2.0" or 2.0
+    std::string word(const char* key) const; ///< a string, or a number read as one: "2.0" or 2.0
 
-    /// @return false if there are none; values are as they were then.
+    /// @return false if there are none; values are unchanged then.
     bool numbers(const char* key, std::span<float> values) const;
     std::vector<float> numbers(const char* key) const;
     std::vector<size_t> indices(const char* key) const;
@@ -77,12 +77,12 @@ public:
     Object root() const { return Object(m_json, ""); }
     Span binaryChunk() const { return m_binary; }
 
-    /// An object that another one names by its number.
+    /// An object to which another one refers by index.
     /// @param array  such as "accessors".
-    /// @param user   for the Fault if there is none.
+    /// @param user   named in the Fault if there is none.
     Object get(const char* array, size_t index, const Object& user) const;
 
-    /// @return the object that user's field names; one that has nothing if there is no such field.
+    /// @return the object to which user's field refers; empty if there is no such field.
     Object find(const char* array, const Object& user, const char* key) const;
 
     size_t fileSize() const { return m_file.size(); }

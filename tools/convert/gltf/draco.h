@@ -7,7 +7,7 @@
 namespace convert::gltf
 {
 
-/// A primitive that KHR_draco_mesh_compression has packed.
+/// A primitive compressed with KHR_draco_mesh_compression.
 class DracoMesh
 {
 public:

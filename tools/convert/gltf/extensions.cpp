@@ -9,7 +9,7 @@ namespace convert::gltf
 namespace
 {
 
-/// What is read, or reported where it stands because the engine has nothing for it.
+/// Extensions that are read, or reported where they are used.
 const char* const KNOWN[] = {
     "EXT_mesh_gpu_instancing",
     "EXT_meshopt_compression",
@@ -34,7 +34,7 @@ const char* const KNOWN[] = {
     "KHR_node_visibility",
     "KHR_texture_basisu",
     "KHR_texture_transform",
-    // Nothing to see: which triangles were one polygon, notes about the file.
+    // Invisible: polygons of triangles, notes about the file.
     "FB_ngon_encoding",
     "KHR_xmp",
     "KHR_xmp_json_ld",

@@ -5,7 +5,7 @@
 namespace convert::gltf
 {
 
-/// Throws a Fault if the file needs extensions that are not known; reports those that it could do without.
+/// Throws a Fault for unknown required extensions; reports other unknown ones.
 void checkExtensions(Source& source);
 
 } // namespace convert::gltf

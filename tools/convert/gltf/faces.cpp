@@ -32,14 +32,14 @@ size_t countFaces(size_t mode, size_t count)
     return count < corners ? 0 : count - corners + 1;
 }
 
-/// Which of the indices a corner of a face takes.
+/// The position of a face's corner among the indices.
 size_t place(size_t mode, size_t face, unsigned corner, size_t count)
 {
     switch (mode)
     {
     case LINE_LOOP: return (face + corner) % count;
     case LINE_STRIP: return face + corner;
-    case TRIANGLE_STRIP: // every second one turns the other way round
+    case TRIANGLE_STRIP: // every second one has the opposite winding
         return face % 2 == 1 && corner > 0 ? face + 3 - corner : face + corner;
     case TRIANGLE_FAN: return corner == 2 ? 0 : face + corner + 1;
     default: return face * CORNERS[mode] + corner;

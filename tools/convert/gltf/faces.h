@@ -10,9 +10,9 @@ namespace convert::gltf
 /// Points, lines or triangles, corner by corner.
 struct Faces
 {
-    unsigned cornersPerFace = 0; ///< 0 if the mode is none
+    unsigned cornersPerFace = 0; ///< 0 for an invalid mode
     std::vector<uint32_t> corners;
-    size_t dropped = 0; ///< faces with an index over the end, or too few indices at the end to make one
+    size_t dropped = 0; ///< faces with an index out of range, or with missing indices at the end
 };
 
 /// @param mode         0 to 6: points, lines, a loop, a strip, triangles, a strip, a fan.

@@ -15,8 +15,7 @@ namespace convert::gltf
 namespace
 {
 
-/// @param node  with translation, rotation and scale, which the importer applies in this order instead of its
-///              reverse.
+/// @param node  with translation, rotation and scale, which the importer applies in the wrong order.
 void composeNode(aiNode& target, const Object& node)
 {
     std::array<float, 3> t = {0.0f, 0.0f, 0.0f};
@@ -36,7 +35,7 @@ void correctViews(aiScene& scene)
     {
         aiCamera& camera = *scene.mCameras[i];
         const float aspect = camera.mAspect > 0.0f ? camera.mAspect : 1.0f;
-        const float upright = camera.mHorizontalFOV / aspect; // which the importer stretches to the other
+        const float upright = camera.mHorizontalFOV / aspect; // the importer multiplies by the aspect ratio
         camera.mHorizontalFOV = 2.0f * std::atan(std::tan(upright * 0.5f) * aspect);
     }
     for (unsigned i = 0; i < scene.mNumLights; ++i)

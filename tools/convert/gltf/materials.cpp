@@ -14,7 +14,7 @@ namespace convert::gltf
 namespace
 {
 
-/// A kind of picture, by libassimp's names for it; the first is that of settings.
+/// A kind of picture, by libassimp's names; the first one has the settings.
 using Kinds = std::initializer_list<aiTextureType>;
 
 int toMapMode(size_t wrap)
@@ -141,7 +141,7 @@ private:
         add(float(m_object.number("alphaCutoff", 0.5)), AI_MATKEY_GLTF_ALPHACUTOFF);
     }
 
-    /// Often made for coordinates of its own, with which it would be wrong on those of the other pictures.
+    /// Often made for other texture coordinates: it would be wrong with those of the other pictures.
     void addOcclusion(const Object& occlusion)
     {
         if (!occlusion)
@@ -153,7 +153,7 @@ private:
             AI_MATKEY_GLTF_TEXTURE_STRENGTH(aiTextureType_LIGHTMAP, 0));
     }
 
-    /// What surfaces other than metals mirror: its strength, with the refraction's, and its colour.
+    /// Specular reflection of non-metals: strength, including the index of refraction, and colour.
     void readSpecular()
     {
         constexpr double USUAL = 0.04;
@@ -194,7 +194,7 @@ private:
             notePlacing(placing);
     }
 
-    /// One placing serves all pictures; of another channel the sampler's maker tells.
+    /// All pictures share one transform; a different channel is reported by the sampler's code.
     void notePlacing(const UvPlacing& placing)
     {
         if (!m_main)
@@ -228,7 +228,7 @@ private:
         const struct
         {
             const char* extension;
-            const char* factor; ///< does nothing where it is 0
+            const char* factor; ///< the picture has no effect if it is 0
         } others[] = {{"KHR_materials_iridescence", "iridescenceFactor"},
                       {"KHR_materials_anisotropy", "anisotropyStrength"},
                       {"KHR_materials_volume", "thicknessFactor"},
@@ -247,7 +247,7 @@ private:
     const Object& m_object;
     std::unique_ptr<aiMaterial> m_made;
     std::optional<UvPlacing> m_main;
-    bool m_isMean = false; ///< of the picture nothing but the mean counts, and not where it lies
+    bool m_isMean = false; ///< only the picture's mean is used, so its transform is irrelevant
 };
 
 } // namespace

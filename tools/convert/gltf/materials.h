@@ -9,7 +9,7 @@ struct aiMaterial;
 namespace convert::gltf
 {
 
-/// How a picture lies on a mesh.
+/// A texture transform.
 struct UvPlacing
 {
     unsigned channel = 0; ///< of texture coordinates
@@ -20,8 +20,8 @@ struct UvPlacing
     bool operator==(const UvPlacing& other) const;
     bool movesNothing() const;
 
-    /// As the file has it: scales, then turns, then moves.
-    /// @param uv  v going down.
+    /// As in the file: scales, then rotates, then moves.
+    /// @param uv  with v down.
     aiVector2D apply(const aiVector2D& uv) const;
 };
 
@@ -29,7 +29,7 @@ struct UvPlacing
 struct ReadMaterial
 {
     std::unique_ptr<aiMaterial> material;
-    UvPlacing placing; ///< of the first picture that counts, and so of all of them
+    UvPlacing placing; ///< of the first relevant picture, used for all
 };
 
 ReadMaterial readMaterial(Source& source, Textures& textures, const Object& material);

@@ -5,7 +5,7 @@
 namespace convert::gltf
 {
 
-/// Takes apart what EXT_meshopt_compression has packed. Throws a Fault.
+/// Decodes EXT_meshopt_compression. Throws a Fault.
 /// @param compression  the extension's object in the buffer view.
 /// @param packed       the bytes that it names.
 Bytes decompressMeshopt(const Object& compression, Span packed);

@@ -91,7 +91,7 @@ private:
             m_faces = makeFaces(mode, m_source.accessors.readIndices(*indices, m_primitive), m_vertexCount);
         else
         {
-            // Reading them first tells whether the file has that many.
+            // Read first, to check that the file has that many.
             m_positions = m_source.accessors.read(m_attributes.size("POSITION", 0), m_attributes, 3);
             std::vector<uint32_t> all(m_vertexCount);
             std::iota(all.begin(), all.end(), 0u);
@@ -103,7 +103,7 @@ private:
             m_source.report.lose("face", "faces of " + m_what + " that name vertices it has not, or too few");
     }
 
-    /// Files share long arrays of vertices among many primitives.
+    /// Only vertices in use: files share long arrays among many primitives.
     void compact()
     {
         std::vector<uint32_t> numbers;
@@ -134,7 +134,7 @@ private:
         return column;
     }
 
-    /// An attribute of the vertices in use; of no elements if there is none.
+    /// An attribute of the vertices in use; without elements if it is missing.
     /// @param components  wanted; 0 for as many as there are.
     Column readAttribute(const std::string& name, unsigned components)
     {
@@ -221,7 +221,7 @@ private:
         return changed;
     }
 
-    /// libassimp has v going up.
+    /// In libassimp, v points up.
     void readCoordinates()
     {
         for (unsigned channel = 0; channel < AI_MAX_NUMBER_OF_TEXTURECOORDS; ++channel)
@@ -306,7 +306,7 @@ private:
         }
     }
 
-    /// Nothing but how many there are, for figures and for what is reported as lost.
+    /// Only their number, for the report.
     void noteTargets()
     {
         const size_t count = m_use.isMoving ? 0 : m_primitive.length("targets");

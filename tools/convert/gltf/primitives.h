@@ -12,18 +12,18 @@
 namespace convert::gltf
 {
 
-/// What a primitive is to become.
+/// How to convert a primitive.
 struct PrimitiveUse
 {
     std::string name;           ///< of the mesh
-    std::vector<float> weights; ///< of the morph targets; those that are missing are 0
+    std::vector<float> weights; ///< of the morph targets; missing ones are 0
     UvPlacing placing;          ///< of the material's pictures
     const Skin* skin = nullptr; ///< null: none
-    bool isMoving = false;      ///< other shapes are other meshes, so that none are lost
+    bool isMoving = false;      ///< other shapes become other meshes, so none is reported as lost
 };
 
-/// Reads one primitive of a mesh: only vertices that it uses, in the shape that the weights of its morph targets give.
-/// @return null if there is nothing to draw in it (reported).
+/// Reads one primitive of a mesh: only vertices in use, deformed by the weights of its morph targets.
+/// @return null if it has nothing to draw (reported).
 std::unique_ptr<aiMesh> readPrimitive(Source& source, const Object& primitive, const PrimitiveUse& use);
 
 } // namespace convert::gltf

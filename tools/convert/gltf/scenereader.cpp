@@ -22,9 +22,9 @@ namespace convert::gltf
 namespace
 {
 
-constexpr size_t DEEPEST = 1000; // of nodes in nodes; a scene file holds fewer
+constexpr size_t DEEPEST = 1000; // levels of nodes; a scene file allows fewer
 
-/// What a node makes of its mesh.
+/// A node's variant of a mesh.
 struct MeshUse
 {
     size_t mesh = 0;
@@ -36,7 +36,7 @@ struct MeshUse
     bool operator<(const MeshUse& other) const { return tie() < other.tie(); }
 };
 
-/// Hands over what is in a vector to an array of libassimp's.
+/// Moves a vector's elements to an array of libassimp's.
 template <class T>
 void hand(std::vector<std::unique_ptr<T>>&& things, T**& array, unsigned& count)
 {
@@ -96,7 +96,7 @@ public:
     }
 
 private:
-    /// Nodes of the scene that the file wants shown, or of all that there are if it has no scenes.
+    /// Nodes of the file's default scene, or all nodes if it has no scenes.
     std::vector<size_t> listRoots()
     {
         const size_t count = m_root.length("scenes");
@@ -122,7 +122,7 @@ private:
         return roots;
     }
 
-    /// Parents first. Throws a Fault if the nodes are no tree.
+    /// Parents first. Throws a Fault if the nodes do not form a tree.
     void nameNodes(size_t index, size_t depth)
     {
         const Object node = m_source.document.get("nodes", index, m_root);
@@ -304,7 +304,7 @@ private:
         return made;
     }
 
-    /// Of a primitive that names no material, one more than the file has.
+    /// For a primitive without a material, one more than the file's last.
     size_t getMaterial(const Object& primitive)
     {
         const size_t count = m_root.length("materials");
@@ -332,8 +332,8 @@ private:
     Textures m_textures;
     std::unique_ptr<aiScene> m_scene;
     NameMaker m_nodeNames;
-    std::vector<std::string> m_names; ///< by number of node; empty for those that the scene has not
-    std::vector<bool> m_isOpen;       ///< nodes above the one at hand
+    std::vector<std::string> m_names; ///< by number of node; empty for nodes that are not in the scene
+    std::vector<bool> m_isOpen;       ///< ancestors of the current node
     std::vector<std::unique_ptr<aiMaterial>> m_materials;
     std::vector<UvPlacing> m_placings; ///< by material
     std::vector<std::unique_ptr<aiMesh>> m_meshes;

@@ -9,8 +9,8 @@ struct aiScene;
 namespace convert::gltf
 {
 
-/// Makes a scene of libassimp's of a file. Every node has a name of its own, faces have one to three corners, those of a
-/// mesh all the same number. Throws a Fault.
+/// Makes a libassimp scene from a file. Node names are unique; faces have one to three corners, the same number for all
+/// faces of a mesh. Throws a Fault.
 std::unique_ptr<aiScene> readScene(Source& source);
 
 } // namespace convert::gltf

@@ -13,18 +13,17 @@ namespace convert::gltf
 namespace
 {
 
-constexpr size_t MOST_SHAPES = 64;       // each is a solid to draw, seen or not
+constexpr size_t MOST_SHAPES = 64;       // each is drawn, visible or not
 constexpr size_t MOST_VERTICES = 65536;  // of all shapes of a file
 constexpr double MOST_SAMPLES = 20000.0; // of one clip
 constexpr double FEWEST_A_SECOND = 8.0;
 
-constexpr size_t TRIANGLES =
-    4; // of the kinds of primitives, the first of those that are nothing where they have no size
+constexpr size_t TRIANGLES = 4; // first primitive mode that is invisible at scale zero
 
-/// A node whose mesh changes, and by what.
+/// A node whose mesh changes, and the animations of its weights.
 struct Mover
 {
-    std::vector<float> rest; ///< none where meshes cannot stand in for the weights
+    std::vector<float> rest; ///< empty if meshes cannot replace the weights
     size_t vertexCount = 0;
     std::map<size_t, Track> tracks; ///< by number of the animation
 };
@@ -59,7 +58,7 @@ public:
     }
 
 private:
-    /// What is damaged is reported where the animation is read.
+    /// Damage is reported where the animation is read.
     void addOrPass(size_t number, const Object& animation, const Object& channel)
     {
         try
@@ -109,7 +108,7 @@ private:
         return mover;
     }
 
-    /// With fewer samples a second where there would be too many shapes.
+    /// With fewer samples a second if there would be too many shapes.
     bool sample(const Mover& mover, MovingShapes& shapes)
     {
         const double fps = m_source.options.fps;
@@ -155,7 +154,7 @@ private:
         return !changes.empty();
     }
 
-    /// As often as the conversion takes samples, or each step-th time; steps at their own times.
+    /// At the conversion's samples, or at every step-th of them; stepped tracks at their own times.
     /// @return none if there would be too many.
     std::vector<double> listTimes(const Track& track, size_t step) const
     {
@@ -176,7 +175,7 @@ private:
     Object m_root;
     const std::vector<std::string>& m_nodeNames;
     std::map<size_t, Mover> m_movers;
-    std::map<std::vector<float>, size_t> m_known; ///< shapes of the mover at hand
+    std::map<std::vector<float>, size_t> m_known; ///< shapes of the current mover
     size_t m_vertexCount = 0;                     ///< of all shapes so far
 };
 

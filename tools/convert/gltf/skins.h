@@ -13,14 +13,14 @@ namespace convert::gltf
 struct Skin
 {
     std::vector<std::string> joints;   ///< names of their nodes
-    std::vector<aiMatrix4x4> inverses; ///< from the mesh to each joint in the pose of binding
+    std::vector<aiMatrix4x4> inverses; ///< from the mesh to each joint in the bind pose
 };
 
 /// @param nodeNames  by number of node.
 Skin readSkin(Source& source, const Object& skin, const std::vector<std::string>& nodeNames);
 
 /// Gives a mesh the bones that move its vertices.
-/// @param joints, weights  four of each for a vertex, in as many sets as there are; of the same length.
+/// @param joints, weights  sets of four for each vertex; of the same length.
 void addBones(aiMesh& mesh, const Skin& skin, const std::vector<Column>& joints,
               const std::vector<Column>& weights, Report& report);
 

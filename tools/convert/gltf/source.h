@@ -10,7 +10,7 @@
 namespace convert::gltf
 {
 
-/// A file that is being read, for all who read a part of it.
+/// A file that is being read, shared by the readers of its parts.
 struct Source
 {
     Source(std::unique_ptr<Document> file, FileOpener open, const Options& choices, Report& findings)
@@ -31,7 +31,7 @@ struct Source
     Report& report;
 };
 
-/// What an object is called, or else such as "meshes[3]". No text of libassimp's holds more, nor a zero.
+/// An object's name, or else its path, such as "meshes[3]"; cut to the length of libassimp's strings and at a NUL.
 inline std::string getName(const Object& object)
 {
     constexpr size_t LONGEST = 1000;

@@ -22,7 +22,7 @@ std::unique_ptr<aiTexture> makeTexture(Span bytes)
 {
     auto texture = std::make_unique<aiTexture>();
     texture->mWidth = unsigned(bytes.size());
-    texture->mHeight = 0; // a file's bytes, no pixels
+    texture->mHeight = 0; // 0: a file's bytes, not pixels
     texture->pcData = new aiTexel[(bytes.size() + sizeof(aiTexel) - 1) / sizeof(aiTexel)];
     std::memcpy(texture->pcData, bytes.data(), bytes.size());
     return texture;
@@ -43,7 +43,7 @@ Textures::Textures(Source& source) : m_source(source)
 
 Textures::~Textures() = default;
 
-/// A picture in a format of an extension stands beside one for programs that do not know it, or alone.
+/// A picture in an extension's format may have a fallback in a common format.
 std::optional<size_t> Textures::chooseImage(const Object& texture)
 {
     const std::optional<size_t> webp = texture.extension("EXT_texture_webp").index("source");
@@ -84,7 +84,7 @@ std::string Textures::addImage(const Object& image)
         const std::optional<Bytes> bytes = readDataUri(uri);
         return embed(image, bytes ? Span(*bytes) : Span());
     }
-    catch (const Fault& fault) // a model without one of its pictures is better than none
+    catch (const Fault& fault) // the model is converted without this picture
     {
         m_source.report.lose("texture-missing", "texture \"" + getName(image) + "\": " + fault.what());
         return {};
@@ -93,7 +93,7 @@ std::string Textures::addImage(const Object& image)
 
 std::string Textures::addFile(const Object& image, const std::string& uri)
 {
-    constexpr size_t LONGEST = 1000; // text that libassimp holds
+    constexpr size_t LONGEST = 1000; // of libassimp's strings
     if (uri.empty())
         image.fail("has neither a uri nor a bufferView");
     if (uri.size() > LONGEST || uri.find('\0') != std::string::npos)
@@ -107,7 +107,7 @@ std::string Textures::embed(const Object& image, Span bytes)
         image.fail("holds no picture");
     const std::string path = "*" + std::to_string(m_embedded.size());
     m_embedded.push_back(makeTexture(bytes));
-    // libassimp takes an embedded picture for any file of its name.
+    // libassimp would use an embedded picture for every file of its name.
     const std::string name = lastPart(image.text("name"));
     const bool isFree = std::find(m_fileNames.begin(), m_fileNames.end(), name) == m_fileNames.end();
     m_embedded.back()->mFilename = aiString(isFree ? name.substr(0, name.find('\0')).substr(0, 200) : "");

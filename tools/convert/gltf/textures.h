@@ -9,7 +9,7 @@ struct aiTexture;
 namespace convert::gltf
 {
 
-/// The pictures of a file, as far as its materials use them.
+/// The pictures of a file that its materials use.
 class Textures
 {
 public:
@@ -19,11 +19,11 @@ public:
     Textures& operator=(const Textures&) = delete;
 
     /// @param texture  an element of "textures".
-    /// @return the picture's path for a material: a file's, or "*" and a number of those that the file holds; empty if
-    ///         there is no picture that can be had (reported).
+    /// @return the picture's path for a material: a file name, or "*" and the number of an embedded picture; empty if
+    /// it cannot be read (reported).
     std::string getPath(const Object& texture);
 
-    /// The pictures that the file holds, by number.
+    /// The embedded pictures, by number.
     std::vector<std::unique_ptr<aiTexture>> take();
 
 private:

@@ -25,7 +25,7 @@ Track readTrack(Source& source, const Object& animation, const Object& channel, 
     const Object sampler = animation.at("samplers", channel.size("sampler", 0));
     if (!sampler.has("input") || !sampler.has("output"))
         sampler.fail("has no input or no output");
-    const bool isWeights = channel.object("target").text("path") == "weights"; // which are single numbers
+    const bool isWeights = channel.object("target").text("path") == "weights"; // single numbers
     Track track;
     track.way = toWay(sampler.text("interpolation"));
     track.times = source.accessors.read(sampler.size("input", 0), sampler, 1).values;

@@ -5,7 +5,7 @@
 namespace convert::gltf
 {
 
-/// Values over time, in seconds, as a channel of an animation has them.
+/// The values of an animation channel over time, in seconds.
 struct Track
 {
     enum class Way
@@ -22,12 +22,12 @@ struct Track
     size_t getElement(size_t key) const { return way == Way::SPLINE ? 3 * key + 1 : key; }
 };
 
-/// Throws a Fault for what is missing or does not fit together.
+/// Throws a Fault for missing or inconsistent parts.
 /// @param components  of a value.
 Track readTrack(Source& source, const Object& animation, const Object& channel, unsigned components);
 
 /// @param key    the time is between this one's and the next one's.
-/// @param value  gets as many numbers as the track's values have components.
+/// @param value  receives the track's number of components.
 void evaluateSpline(const Track& track, size_t key, double time, float* value);
 
 /// The first key holds before its time, the last one after its.

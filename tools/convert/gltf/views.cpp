@@ -15,7 +15,7 @@ namespace convert::gltf
 namespace
 {
 
-/// A light falls off by the square of the distance, and has gone where its range ends.
+/// Inverse-square attenuation, zero at the end of the range.
 void setAttenuation(aiLight& light, double range)
 {
     light.mAttenuationConstant = light.mAttenuationLinear = light.mAttenuationQuadratic = 0.0f;
@@ -69,7 +69,7 @@ std::unique_ptr<aiLight> readLight(const Object& light, const std::string& nodeN
     made->mColorDiffuse = made->mColorSpecular =
         aiColor3D(colour[0], colour[1], colour[2]) * float(light.number("intensity", 1.0));
     setAttenuation(*made, light.number("range", 0.0));
-    const Object spot = light.object("spot"); // half angles, where libassimp's are whole ones
+    const Object spot = light.object("spot"); // half angles; libassimp has whole ones
     made->mAngleInnerCone = float(2.0 * spot.number("innerConeAngle", 0.0));
     made->mAngleOuterCone = float(2.0 * spot.number("outerConeAngle", QUARTER));
     return made;

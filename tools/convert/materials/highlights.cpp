@@ -13,9 +13,9 @@ using orv::Vector4f;
 namespace
 {
 
-constexpr float SMOOTHEST = 0.15f; // roughness below which a light would be a point on the surface
-constexpr float SHARPEST = 128.0f; // exponent that a mediump float still does well
-constexpr float NOT_METAL = 0.04f; // what surfaces other than metals mirror
+constexpr float SMOOTHEST = 0.15f; // least roughness: below it, highlights would be points
+constexpr float SHARPEST = 128.0f; // largest exponent that mediump computes well
+constexpr float NOT_METAL = 0.04f; // specular reflectance of non-metals
 
 float toShininess(float roughness)
 {
@@ -52,9 +52,9 @@ Highlight fromGlossiness(const Vector4f& specular, float glossiness)
 
 Highlight fromShininess(const Vector4f& specular, float level, float shininess)
 {
-    if (!(shininess > 0.0f) || !(level > 0.0f)) // an exponent of 0 would be a highlight all over
+    if (!(shininess > 0.0f) || !(level > 0.0f)) // an exponent of 0 would cover the whole surface
         return {};
-    // Below 1 it is no exponent: 3ds Max and others write a share there.
+    // Below 1 it is not an exponent but a fraction, as written by 3ds Max and others.
     return {specular, level, std::min(shininess < 1.0f ? shininess * SHARPEST : shininess, SHARPEST)};
 }
 

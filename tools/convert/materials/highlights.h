@@ -15,15 +15,15 @@ struct Highlight
 
 /// @param base  colour of the surface.
 /// @param metalness, roughness  0 to 1.
-/// @param mirrored  what the surface would mirror if it were no metal, as a share of the usual.
+/// @param mirrored  specular reflectance as a non-metal, relative to the usual one.
 Highlight fromMetalness(const orv::Vector4f& base, float metalness, float roughness,
                         const orv::Vector4f& mirrored = {1.0f, 1.0f, 1.0f, 1.0f});
 
-/// @param specular    what the surface mirrors head on, by colour.
+/// @param specular    reflectance at normal incidence, by colour.
 /// @param glossiness  0 to 1.
 Highlight fromGlossiness(const orv::Vector4f& specular, float glossiness);
 
-/// @param shininess  exponent of Phong or Blinn; at most 128 is left of it.
+/// @param shininess  exponent of Phong or Blinn; limited to 128.
 Highlight fromShininess(const orv::Vector4f& specular, float level, float shininess);
 
 } // namespace convert

@@ -13,7 +13,7 @@
 #include <algorithm>
 #include <cmath>
 
-// docs/convert.md says the same in tables.
+// docs/convert.md has the same in tables.
 
 namespace convert
 {
@@ -26,8 +26,8 @@ using Alpha = TextureWish::Alpha;
 namespace
 {
 
-constexpr float ALMOST_OPAQUE = 0.999f;     // blended, and looks opaque
-constexpr float ALMOST_BLACK = 1.0f / 4096; // not seen, and yet switches the diffuse picture's alpha on
+constexpr float ALMOST_OPAQUE = 0.999f;     // blended, but looks opaque
+constexpr float ALMOST_BLACK = 1.0f / 4096; // invisible, but makes the diffuse picture's alpha count
 
 const Vector4f BLACK(0.0f, 0.0f, 0.0f, 1.0f);
 const Vector4f WHITE(1.0f, 1.0f, 1.0f, 1.0f);
@@ -36,7 +36,7 @@ const std::initializer_list<aiTextureType> BASE = {aiTextureType_DIFFUSE, aiText
 const std::initializer_list<aiTextureType> NORMALS = {aiTextureType_NORMALS, aiTextureType_NORMAL_CAMERA};
 const std::initializer_list<aiTextureType> EMISSIVE = {aiTextureType_EMISSIVE, aiTextureType_EMISSION_COLOR};
 
-/// glTF's way to say whether alpha counts; empty for other formats.
+/// glTF's alpha mode; empty for other formats.
 std::string getAlphaMode(const aiMaterial& material)
 {
     aiString mode;
@@ -73,7 +73,7 @@ public:
             makeUnlit();
         else
         {
-            addFeature(m_made.doubleSided && !m_made.bump, surface::BACK); // which bumps have anyway
+            addFeature(m_made.doubleSided && !m_made.bump, surface::BACK); // bump mapping has it anyway
             addFeature(m_isLinear && isLit(), surface::LINEAR);
         }
         reportUnused();
@@ -93,12 +93,12 @@ private:
         if (picture.field && !m_isGltf && isBlack(colour))
             colour = WHITE; // black would hide the picture
         if (m_use.hasColours && isMadeUp())
-            colour = WHITE; // and not the library's grey
+            colour = WHITE; // instead of the library's grey
         if (m_isGltf)
             colour = toScreen(colour);
         colour.w = 1.0f;
         m_made.diffuse = {colour, picture.field};
-        m_made.ambient.colour = colour; // for lights that have an ambient part
+        m_made.ambient.colour = colour; // for lights with an ambient level
         const bool isCutOut = isMask() ? picture.hasAlpha || m_use.hasColours || m_threshold > 1.0f
                                        : picture.isAllOrNothing && opacity == 1.0f;
         addFeature(isCutOut, surface::CUTOFF);
@@ -121,7 +121,7 @@ private:
 
     bool isMask() const { return m_alphaMode == "MASK"; }
 
-    /// Of the whole surface.
+    /// For the whole surface.
     /// @param alpha  of the base colour.
     float getOpacity(float alpha)
     {
@@ -143,7 +143,7 @@ private:
         {
             m_threshold = getFloat(m_source, AI_MATKEY_GLTF_ALPHACUTOFF, 0.5f) / std::max(alpha, 1e-3f);
             wish.alpha = Alpha::CUT;
-            wish.threshold = m_use.hasColours ? 1.0f : m_threshold; // their alpha comes on top
+            wish.threshold = m_use.hasColours ? 1.0f : m_threshold; // vertex alpha is multiplied later
             return wish;
         }
         if (m_isGltf)
@@ -182,7 +182,7 @@ private:
         if (m_made.emissive.sampler && !m_isGltf && isBlack(colour))
             colour = WHITE;
         else if (!m_made.emissive.sampler && !m_isGltf && !isBlack(colour))
-            m_made.emissive.sampler = m_made.diffuse.sampler; // which lies over all light there
+            m_made.emissive.sampler = m_made.diffuse.sampler; // in the engine it multiplies all light
         colour.w = 1.0f;
         m_made.emissive.colour = colour;
     }
@@ -229,7 +229,7 @@ private:
         return highlight;
     }
 
-    /// A metal mirrors what of the light it does not spread, see dimMetal().
+    /// A metal mirrors the light that it does not scatter, see dimMetal().
     void mirrorSky(float metalness, float roughness, Highlight& highlight)
     {
         using orv::TextureParameters;
@@ -239,11 +239,11 @@ private:
         sampler.wrapHorizontal = sampler.wrapVertical = uint32_t(TextureParameters::WrapMode::CLAMP);
         sampler.image = m_textures.addMade("sky", makeSky);
         m_made.reflection.sampler = sampler;
-        m_made.specular.sampler = m_made.diffuse.sampler; // which tints what a metal mirrors
+        m_made.specular.sampler = m_made.diffuse.sampler; // tints a metal's reflection
         highlight.level = std::lerp(highlight.level, getSmoothness(roughness), std::min(metalness, 1.0f));
     }
 
-    /// What a surface other than metal mirrors, as a share of the usual.
+    /// The specular reflectance of a non-metal, relative to the usual one.
     Vector4f getMirrored() const
     {
         if (!m_isGltf || !hasFloat(m_source, AI_MATKEY_SPECULAR_FACTOR))
@@ -265,13 +265,12 @@ private:
         return 1.0f - std::clamp(roughness * roughness, 0.0f, 1.0f);
     }
 
-    /// What metals show instead of what is around them. Half of the light is as bright, on the whole of a ball, as all
-    /// of it where light is reckoned in the screen's values. The rougher they are, the more they spread light as other
-    /// surfaces do.
-    /// @param most  of the light: what a smooth one loses.
+    /// The diffuse light that metals show instead of their surroundings. On a whole ball, half of it in linear light is
+    /// as bright as all of it in sRGB values. Rough metals scatter more light, like other surfaces.
+    /// @param most  the share of light that a smooth one loses.
     void dimMetal(float metalness, float roughness, float most)
     {
-        constexpr float LEAST = 0.15f; // what a rough one loses beside three.js
+        constexpr float LEAST = 0.15f; // the share that a rough one loses, compared with three.js
         const float lost = std::lerp(LEAST, most, getSmoothness(roughness));
         const float share = 1.0f - lost * std::clamp(metalness, 0.0f, 1.0f);
         const float shown = toScreen(Vector4f(share, share, share, 1.0f)).x;
@@ -279,7 +278,7 @@ private:
             *colour = Vector4f(colour->x * shown, colour->y * shown, colour->z * shown, 1.0f);
     }
 
-    /// Mean colour of a map that the engine has no use for pixel by pixel; white if there is none.
+    /// Mean colour of a map that the engine cannot use as a picture; white if there is none.
     Vector4f getMapMean(aiTextureType type)
     {
         if (type == aiTextureType_NONE)
@@ -288,7 +287,7 @@ private:
         return m_textures.getMean(getTexturePath(m_source, type)).value_or(WHITE);
     }
 
-    /// The map's colour stays a picture; its alpha is gloss.
+    /// The map's colour becomes a picture; its alpha is gloss.
     Highlight getGlossHighlight()
     {
         const Vector4f specular = getColour(m_source, AI_MATKEY_COLOR_SPECULAR, WHITE);
@@ -331,7 +330,7 @@ private:
             m_report.approximate("gloss-map", "a map of gloss (seen only along with a normal map)");
     }
 
-    /// Where light from all around does not reach. Other formats do not say whether such a map is one of light.
+    /// Ambient occlusion. In other formats such a map may also be a light map.
     void setOcclusion()
     {
         if (!m_isGltf || isUnlit())
@@ -345,15 +344,15 @@ private:
         m_made.ambient.sampler = m_samplers.make({aiTextureType_LIGHTMAP}, wish).field;
     }
 
-    /// The base colour becomes light of its own, which no other light changes.
+    /// The base colour becomes emission, which does not depend on lights.
     void makeUnlit()
     {
         const bool hasOwnLight = m_made.emissive.sampler || !isBlack(m_made.emissive.colour);
         if (m_made.features != 0 && (m_isGltf || !hasOwnLight))
         {
-            m_made.features |= surface::UNLIT; // which colours of vertices and holes go with
+            m_made.features |= surface::UNLIT; // works with vertex colours and cut-outs
             m_made.emissive = {};
-            addFeature(m_isLinear && m_use.hasColours, surface::LINEAR); // for what is between the vertices
+            addFeature(m_isLinear && m_use.hasColours, surface::LINEAR); // for interpolation between vertices
         }
         else
             makeGlow(hasOwnLight);
@@ -364,7 +363,7 @@ private:
         m_made.gloss.reset();
     }
 
-    /// What readers without further features of materials show as well.
+    /// Values that older readers use too.
     void makeGlow(bool hasOwnLight)
     {
         if (m_isGltf || !hasOwnLight)

@@ -9,31 +9,31 @@
 namespace convert
 {
 
-/// What a material has to know besides.
+/// Context of a material.
 struct MaterialUse
 {
     std::string linear;      ///< see Options
     bool sky = false;        ///< the same
-    bool repeats = false;    ///< texture coordinates leave the pictures
-    bool hasColours = false; ///< some vertices have colours of their own
-    bool isSurface = false;  ///< some meshes have triangles or normals, so that light counts
+    bool repeats = false;    ///< texture coordinates go beyond the pictures
+    bool hasColours = false; ///< some vertices have colours
+    bool isSurface = false;  ///< some meshes have triangles or normals, so that they are lit
 };
 
-/// A material, and what its meshes need to know of it.
+/// A material, and values that its meshes need.
 struct ConvertedMaterial
 {
     glo::Material material;
-    bool hasLightColours = false; ///< colours of vertices are shares of light
+    bool hasLightColours = false; ///< vertex colours are linear
     bool usesVertexAlpha = false;
-    unsigned uvChannel = 0; ///< of the model's texture coordinates, the one to take
+    unsigned uvChannel = 0; ///< which of the model's texture coordinates to use
     bool hasNormalMap = false;
-    bool isFlat = false; ///< where a mesh has no normals; of most formats such meshes are smooth
+    bool isFlat = false; ///< for meshes without normals; in most formats they are smooth
 };
 
-/// @return the kind of the material's first picture, whose texture coordinates all of them have; NONE without one.
+/// @return the kind of the material's first picture, whose texture coordinates are used for all; NONE without one.
 aiTextureType findMainTexture(const aiMaterial& material);
 
-/// @return the channel of texture coordinates that the material's first picture asks for; 0 if it has none.
+/// @return the channel of texture coordinates of the material's first picture; 0 if it has none.
 unsigned findUvChannel(const aiMaterial& material);
 
 ConvertedMaterial convertMaterial(const aiMaterial& source, const MaterialUse& use, TextureStore& textures,

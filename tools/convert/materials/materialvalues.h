@@ -7,14 +7,13 @@
 namespace convert
 {
 
-// A material's values by libassimp's keys, each of which is a name, a kind of picture and a number. What is missing or
-// not finite is the fallback.
+// A material's values by libassimp's keys, each of which is a name, a kind of picture and a number. The fallback
+// replaces values that are missing or not finite.
 
 /// A colour of three components has alpha 1.
 orv::Vector4f getColour(const aiMaterial& material, const char* key, unsigned type, unsigned index,
                         const orv::Vector4f& fallback);
-/// From shares of light, in which glTF has its colours, to the values of pictures and screens (sRGB), in which the engine
-/// reckons; alpha stays.
+/// From linear light, as in glTF, to sRGB, as in the engine's materials; alpha stays.
 orv::Vector4f toScreen(const orv::Vector4f& light);
 
 float getFloat(const aiMaterial& material, const char* key, unsigned type, unsigned index, float fallback);

@@ -34,7 +34,7 @@ FoundPicture readEmbedded(const std::string& path, const aiTexture& texture)
 {
     FoundPicture found;
     found.isThere = true;
-    const bool isNumber = startsWith(path, "*"); // there may be no other name
+    const bool isNumber = startsWith(path, "*"); // the number may be the only name
     const std::string name = isNumber ? texture.mFilename.C_Str() : path;
     found.name = fs::path(lastPart(name)).stem().string();
     if (found.name.empty() || found.name[0] == '*')
@@ -69,8 +69,7 @@ FoundPicture PictureFinder::find(const std::string& path) const
     return {"texture", bytes ? std::move(*bytes) : std::vector<uint8_t>(), bytes.has_value()};
 }
 
-/// Where the path leads from the model's folder, or else where its last part does: paths of other machines and
-/// other cases of letters are common.
+/// By the path from the model's folder, or else by its file name, ignoring case: paths of other machines are common.
 FoundPicture PictureFinder::findOnDisk(const std::string& path) const
 {
     const std::string name = lastPart(toPath(path));
@@ -85,7 +84,7 @@ FoundPicture PictureFinder::findOnDisk(const std::string& path) const
     return found;
 }
 
-/// A file of the folder that has the name if one does not look at the case of letters.
+/// A file of the folder with the name, ignoring case.
 bool PictureFinder::readOthersCase(const std::string& folder, FoundPicture& found,
                                    const std::string& name) const
 {

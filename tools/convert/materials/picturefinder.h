@@ -11,7 +11,7 @@ namespace convert
 
 class ModelFiles;
 
-/// A picture as a model has it.
+/// A picture of a model.
 struct FoundPicture
 {
     std::string name;           ///< for people: a file name without folders and extension

@@ -39,7 +39,7 @@ namespace convert
 namespace
 {
 
-/// Decoded bytes that the engine always believes a byte of a JPEG or PNG to stand for.
+/// Decoded bytes that the engine always allows for each byte of a JPEG or PNG.
 constexpr size_t MOST_PER_BYTE = 1000;
 
 bool hasMark(const std::vector<uint8_t>& bytes, size_t offset, const char* mark)
@@ -50,13 +50,13 @@ bool hasMark(const std::vector<uint8_t>& bytes, size_t offset, const char* mark)
 
 bool endsWithMark(const std::vector<uint8_t>& bytes, const std::string& mark)
 {
-    constexpr size_t TAIL = 4096; // what some programs append is shorter
+    constexpr size_t TAIL = 4096; // longer than data that some programs append
     const auto start = bytes.end() - std::ptrdiff_t(std::min(bytes.size(), TAIL));
     return std::search(start, bytes.end(), mark.begin(), mark.end(),
                        [](uint8_t a, char b) { return a == uint8_t(b); }) != bytes.end();
 }
 
-/// A picture of three channels gets a fourth by a chunk that the decoder's header function does not look for.
+/// A chunk can add an alpha channel to three channels; the decoder's header function does not read it.
 bool mayHaveColourKey(const std::vector<uint8_t>& bytes)
 {
     const std::string mark = "tRNS";
@@ -64,7 +64,7 @@ bool mayHaveColourKey(const std::vector<uint8_t>& bytes)
                        [](uint8_t a, char b) { return a == uint8_t(b); }) != bytes.end();
 }
 
-/// The format that the bytes begin like, as an extension; "" for one that the engine does not read. TGA has no mark.
+/// The format by the first bytes, as an extension; "" for one that the engine does not read. TGA has no signature.
 std::string recognise(const std::vector<uint8_t>& bytes)
 {
     const struct
@@ -200,7 +200,7 @@ void resize(DecodedPicture& picture, int width, int height, bool wraps)
                                                 made.data.data(), width, height, 0, picture.channels, alpha,
                                                 0, wraps ? STBIR_EDGE_WRAP : STBIR_EDGE_CLAMP,
                                                 STBIR_FILTER_DEFAULT, STBIR_COLORSPACE_LINEAR, nullptr);
-    if (!done) // which is for want of memory alone
+    if (!done) // only without memory
         throw std::bad_alloc();
     picture = std::move(made);
 }
@@ -277,7 +277,7 @@ void makeOcclusion(DecodedPicture& picture, float strength, bool isShare)
 
 Transparency getTransparency(const DecodedPicture& picture)
 {
-    constexpr uint8_t MOST = 250; // compression and drawing programs leave a little here and there
+    constexpr uint8_t MOST = 250; // tolerates traces of compression and drawing programs
     constexpr uint8_t LEAST = 5;
     if (!picture.hasAlphaChannel())
         return Transparency::NONE;

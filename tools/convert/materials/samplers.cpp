@@ -27,7 +27,7 @@ WrapMode toWrapMode(aiTextureMapMode mode)
     }
 }
 
-/// @param name  GL's name of a filter; what is none gives the fallback.
+/// @param name  GL's name of a filter; others give the fallback.
 FilterMode toFilterMode(int name, FilterMode fallback)
 {
     switch (name)
@@ -67,7 +67,7 @@ MadeSampler SamplerMaker::make(std::initializer_list<aiTextureType> types, Textu
     const TextureUse use = m_textures.add(wish);
     if (use.name.empty())
         return {};
-    if (!use.isPowerOfTwo) // GL repeats no others, and nothing leaves this one
+    if (!use.isPowerOfTwo) // GL repeats no others, and no coordinate goes beyond this one
         sampler.wrapHorizontal = sampler.wrapVertical = clamp;
     if (!use.isPowerOfTwo && sampler.minFilter > uint32_t(FilterMode::LINEAR))
         m_report.approximate("mipmaps", "mipmaps of a texture whose sides are not powers of two (none; "
@@ -76,7 +76,7 @@ MadeSampler SamplerMaker::make(std::initializer_list<aiTextureType> types, Textu
     return {sampler, use.hasAlpha, use.isAllOrNothing};
 }
 
-/// Filters and wrapping; reports what there is besides.
+/// Sets filters and wrapping; reports other settings.
 glo::Sampler SamplerMaker::readSettings(aiTextureType type)
 {
     aiString path;

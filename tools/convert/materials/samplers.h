@@ -10,10 +10,10 @@
 namespace convert
 {
 
-/// What one of a material's pictures becomes.
+/// The result for one of a material's pictures.
 struct MadeSampler
 {
-    glo::SamplerField field; ///< empty if there is no picture, or it cannot be had
+    glo::SamplerField field; ///< empty without a readable picture
     bool hasAlpha = false;
     bool isAllOrNothing = false; ///< see TextureUse
 };
@@ -23,11 +23,11 @@ class SamplerMaker
 {
 public:
     /// @param uvChannel  of the texture coordinates that the scene will have.
-    /// @param repeats    these leave the pictures.
+    /// @param repeats    these go beyond the pictures.
     SamplerMaker(const aiMaterial& material, unsigned uvChannel, bool repeats, TextureStore& textures,
                  Report& report);
 
-    /// @param types  kinds of picture of the same meaning; the first that is there counts.
+    /// @param types  kinds of picture of the same meaning; the first one present is used.
     /// @param wish   what else to do with it.
     MadeSampler make(std::initializer_list<aiTextureType> types, TextureWish wish = {});
 

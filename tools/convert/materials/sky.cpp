@@ -15,7 +15,7 @@ namespace
 constexpr int SIDE = 64; // pixels of a face
 constexpr float GAMMA = 2.2f;
 
-const Vector3f ZENITH(111.0f, 159.0f, 216.0f); // as the screen has them
+const Vector3f ZENITH(111.0f, 159.0f, 216.0f); // sRGB
 const Vector3f HORIZON(230.0f, 236.0f, 242.0f);
 const Vector3f GROUND(92.0f, 84.0f, 76.0f);
 
@@ -34,7 +34,7 @@ uint8_t mix(float horizon, float zenith, float up)
 }
 
 /// @param right, down  where the pixel's middle is on the face, -1 to 1.
-/// @return how far up the direction goes, as a share of its length.
+/// @return the vertical component of the normalised direction.
 float getHeight(Face face, float right, float down)
 {
     const float across = -down / std::sqrt(1.0f + right * right + down * down);

@@ -5,7 +5,7 @@
 namespace convert
 {
 
-/// A plain sky for metals to mirror, as the engine takes cube maps: pale at the horizon, blue above, with a dark ground.
+/// A plain sky for metals to mirror, as a cube map in a grid: pale at the horizon, blue above, with a dark ground.
 DecodedPicture makeSky();
 
 } // namespace convert

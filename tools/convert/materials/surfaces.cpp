@@ -15,7 +15,7 @@ namespace
 
 constexpr float CREASE_COSINE = 0.4067366f; // of 66 degrees
 
-/// -1 where the picture lies on the face mirrored, else 1.
+/// -1 if the picture is mirrored on the face, else 1.
 float getSide(const aiVector3D* uvs, const Corners& corners, size_t first)
 {
     const aiVector3D ab = uvs[corners[first + 1]] - uvs[corners[first]];
@@ -43,7 +43,7 @@ aiVector3D getFaceNormal(const aiMesh& mesh, const Corners& corners, size_t firs
 
 std::vector<aiVector3D> makeNormals(const aiMesh& mesh, const Corners& corners)
 {
-    constexpr size_t MANY = 64; // corners in one place: no surface, and too many to compare all with all
+    constexpr size_t MANY = 64; // corners at one position: not a surface, and too many to compare all pairs
     std::vector<aiVector3D> faces;
     for (size_t i = 0; i < corners.size(); i += 3)
         faces.push_back(getFaceNormal(mesh, corners, i));

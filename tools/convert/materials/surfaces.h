@@ -9,7 +9,7 @@ struct aiMesh;
 namespace convert
 {
 
-/// At right angles to the triangle whose corners start there, towards its front, as long as twice its area.
+/// The triangle's normal, towards its front, of twice its area's length.
 aiVector3D getFaceNormal(const aiMesh& mesh, const Corners& corners, size_t first);
 
 /// Normals for a mesh that has none, one for each corner of its triangles: smooth where faces meet at less than 66
@@ -19,8 +19,8 @@ std::vector<aiVector3D> makeNormals(const aiMesh& mesh, const Corners& corners);
 /// The same with all edges sharp.
 std::vector<aiVector3D> makeFlatNormals(const aiMesh& mesh, const Corners& corners);
 
-/// The directions in which texture coordinates grow, at right angles to the normals, one for each corner. Corners
-/// share them where position, normal and coordinates are the same, but not where the picture is mirrored.
+/// The directions in which texture coordinates grow, at right angles to the normals, one for each corner. Corners of
+/// the same position, normal and coordinates share them, except across a mirrored seam.
 struct Tangents
 {
     std::vector<aiVector3D> alongU;

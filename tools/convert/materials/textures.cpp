@@ -14,7 +14,7 @@ namespace
 
 using Alpha = TextureWish::Alpha;
 
-constexpr int LARGEST_POWER = 4096; // of two, that sizes are raised to
+constexpr int LARGEST_POWER = 4096; // limit for raised sizes
 
 bool isPowerOfTwo(int size)
 {
@@ -30,8 +30,8 @@ int toPowerOfTwo(int size, int limit)
     return power;
 }
 
-/// Does with the alpha channel what is wanted.
-/// @param changed  set if the picture is not what it was.
+/// Changes the alpha channel as requested.
+/// @param changed  set if the picture was changed.
 /// @return whether some of the picture is transparent now.
 bool applyAlpha(const TextureWish& wish, DecodedPicture& pixels, bool& changed)
 {
@@ -56,7 +56,7 @@ bool applyAlpha(const TextureWish& wish, DecodedPicture& pixels, bool& changed)
     return false;
 }
 
-/// Names with '#', ';' or ':' mean something else to the engine, other signs to other systems' files.
+/// '#', ';' and ':' have a meaning in the engine's names, other signs in other file systems.
 std::string makePlain(std::string name)
 {
     for (char& c : name)
@@ -67,7 +67,7 @@ std::string makePlain(std::string name)
     return name;
 }
 
-/// For sentences; a data URI goes on for pages.
+/// For messages: a data URI may be very long.
 std::string shorten(const std::string& path)
 {
     return path.substr(0, 100);
@@ -159,7 +159,7 @@ TextureUse TextureStore::make(const TextureWish& wish)
     DecodedPicture& pixels = loaded->pixels;
     bool changed = treat(pixels, wish);
     const bool hasAlpha = applyAlpha(wish, pixels, changed);
-    const bool allOrNothing = hasAlpha && isAllOrNothing(pixels); // which another size would blur
+    const bool allOrNothing = hasAlpha && isAllOrNothing(pixels); // before resizing, which blurs alpha
     const Size size = getFittingSize(pixels.width, pixels.height, wish.repeats);
     if (size.width != pixels.width || size.height != pixels.height)
     {
@@ -174,7 +174,7 @@ TextureUse TextureStore::make(const TextureWish& wish)
     return {name, hasAlpha, allOrNothing, isPowerOfTwo(pixels.width) && isPowerOfTwo(pixels.height)};
 }
 
-/// Whether the pixels need not be looked at.
+/// Whether the pixels need not be decoded.
 bool TextureStore::canPassOn(const PictureHeader& header, const TextureWish& wish) const
 {
     if (header.extension == ".pvr")
@@ -197,8 +197,8 @@ TextureUse TextureStore::passOn(const Loaded& loaded, const TextureWish& wish)
             isPowerOfTwo(header.width) && isPowerOfTwo(header.height)};
 }
 
-/// Does everything that has nothing to do with the size or with the picture's own alpha.
-/// @return whether the picture is not what it was.
+/// Makes all changes except those of size and of the picture's own alpha.
+/// @return whether the picture was changed.
 bool TextureStore::treat(DecodedPicture& pixels, const TextureWish& wish)
 {
     bool changed = pixels.channels < 3;
@@ -222,7 +222,7 @@ bool TextureStore::treat(DecodedPicture& pixels, const TextureWish& wish)
     return changed;
 }
 
-/// A size that is wanted, and that GL can do with what is wanted.
+/// A size within the limits with which GL supports the wanted settings.
 TextureStore::Size TextureStore::getFittingSize(int width, int height, bool repeats) const
 {
     const int longer = std::max(width, height);
@@ -245,7 +245,7 @@ std::string TextureStore::makeName(const std::string& name, const std::string& e
 {
     const std::string wanted = m_stem + makePlain(name.substr(0, 100));
     std::string made = wanted;
-    // Without the extension: the engine takes a .pvr for any picture of the same name.
+    // Without the extension: the engine prefers a .pvr of the same name.
     for (int number = 2; !m_names.insert(toLowerCase(made)).second; ++number)
         made = wanted + "-" + std::to_string(number);
     return made + extension;

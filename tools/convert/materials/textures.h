@@ -19,22 +19,22 @@
 namespace convert
 {
 
-/// What a material wants of a picture.
+/// What a material needs from a picture.
 struct TextureWish
 {
     enum class Alpha
     {
-        AUTO, ///< opacity, unless the picture would be invisible all over
+        AUTO, ///< opacity, unless the whole picture would be invisible
         KEEP, ///< opacity
         DROP, ///< nothing
-        CUT   ///< opaque from the threshold on, invisible below; where all is opaque, nothing
+        CUT   ///< opaque from the threshold on, invisible below; removed if all is opaque
     };
 
     std::string path;    ///< as the material names it
     std::string opacity; ///< of a picture whose brightness is the opacity; empty for none
     Alpha alpha = Alpha::KEEP;
     float threshold = 0.0f;         ///< of CUT; 0 to 1
-    bool repeats = false;           ///< coordinates leave the picture
+    bool repeats = false;           ///< coordinates go beyond the picture
     bool isHeight = false;          ///< heights, wanted as normals
     std::optional<float> occlusion; ///< its strength: see makeOcclusion()
     bool isShare = false;           ///< of an occlusion: likewise
@@ -50,41 +50,41 @@ struct TextureWish
 
 struct TextureUse
 {
-    std::string name;      ///< of the file that the scene is to name; empty if the picture cannot be had
-    bool hasAlpha = false; ///< some of it is transparent
-    bool isAllOrNothing = false; ///< and hardly any of it in part; not known of what is not decoded
+    std::string name;            ///< of the file for the scene; empty if the picture cannot be read
+    bool hasAlpha = false;       ///< some of it is transparent
+    bool isAllOrNothing = false; ///< and hardly any of it partly; false if not decoded
     bool isPowerOfTwo = true;    ///< both sides are
 };
 
-/// What the names of a scene's pictures begin with.
+/// The prefix of the names of a scene's pictures.
 /// @param stem  the scene file's name without its extension.
 std::string getPictureStem(const std::string& stem);
 
-/// Finds the pictures of a model and makes them files that the engine shows right.
+/// Finds the pictures of a model and makes files that the engine can use.
 ///
-/// Pictures are passed on byte for byte where that will do; what the engine cannot read, grey ones, which it would
-/// take for opacity, unwanted alpha and sizes that GL cannot repeat become PNG.
+/// Pictures are copied byte for byte if possible. Rewritten as PNG are formats that the engine cannot read, grey
+/// pictures, which it would read as opacity, unwanted alpha, and sizes that GL cannot repeat.
 class TextureStore
 {
 public:
     /// @param files  the model's, as scene for as long as this lives.
-    /// @param stem   begins every name, so that two conversions into one folder keep apart.
+    /// @param stem   prefix of every name, so that conversions into one folder do not collide.
     TextureStore(const aiScene& scene, ModelFiles& files, const std::string& stem, const Options& options,
                  Report& report);
 
     TextureUse add(const TextureWish& wish);
 
     /// A picture that the model does not have.
-    /// @return the name of its file, the same for the same name.
+    /// @return the name of its file; the same for the same name.
     std::string addMade(const std::string& name, DecodedPicture (*paint)());
 
-    /// The mean red, green, blue and alpha of a picture, 0 to 1; nothing if it cannot be had.
+    /// The mean red, green, blue and alpha of a picture, 0 to 1; nothing if it cannot be read.
     std::optional<orv::Vector4f> getMean(const std::string& path);
 
     const std::vector<OutputFile>& getFiles() const { return m_files; }
 
 private:
-    /// A picture, as found and, where somebody needs them, its pixels.
+    /// A picture as found and, if needed, its pixels.
     struct Loaded
     {
         FoundPicture file;

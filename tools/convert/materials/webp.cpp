@@ -9,7 +9,7 @@ namespace convert
 
 bool isWebp(const std::vector<uint8_t>& bytes)
 {
-    constexpr size_t MARK = 8; // where the container's kind stands
+    constexpr size_t MARK = 8; // offset of the container's type
     return bytes.size() >= 12 && std::memcmp(bytes.data(), "RIFF", 4) == 0 &&
            std::memcmp(bytes.data() + MARK, "WEBP", 4) == 0;
 }

@@ -7,10 +7,10 @@ namespace convert
 
 bool isWebp(const std::vector<uint8_t>& bytes);
 
-/// @return false if it is damaged; so do all here.
+/// All functions here return false for a damaged file.
 bool readWebpHeader(const std::vector<uint8_t>& bytes, PictureHeader& header);
 
-/// Of a moving picture, none.
+/// Refuses animations.
 bool decodeWebp(const std::vector<uint8_t>& bytes, DecodedPicture& picture);
 
 } // namespace convert

@@ -12,8 +12,8 @@ namespace
 
 constexpr uint32_t NONE = std::numeric_limits<uint32_t>::max();
 
-/// Orders triangles for a GPU's cache of vertices: takes all triangles around a vertex, fan after fan, each about a vertex
-/// that is still in the cache.
+/// Orders triangles for a GPU's vertex cache: all triangles around one vertex, then those around another vertex that is
+/// still in the cache.
 class FanOrder
 {
 public:
@@ -72,7 +72,7 @@ private:
             m_stamps[vertex] = m_time++;
     }
 
-    /// Of the last fan's vertices the one that has been in the cache for longest, if its own fan still fits.
+    /// The vertex of the last fan that has been in the cache longest, if its own fan still fits.
     uint32_t findNext()
     {
         uint32_t best = NONE;
@@ -92,7 +92,7 @@ private:
         return best != NONE ? best : findAny();
     }
 
-    /// Back along the way that led here, then whatever is left.
+    /// The latest earlier vertex with triangles left, then any other.
     uint32_t findAny()
     {
         for (; !m_trail.empty(); m_trail.pop_back())

@@ -12,7 +12,7 @@ using Corners = std::vector<uint32_t>;
 /// One more than the highest number.
 uint32_t countVertices(const Corners& corners);
 
-/// Orders triangles so that a GPU finds most of their vertices among the last ones that it worked out.
+/// Orders triangles so that a GPU finds most of their vertices in its vertex cache.
 Corners orderForCache(const Corners& corners);
 
 } // namespace convert

@@ -20,7 +20,7 @@ namespace
 
 constexpr uint32_t NONE = std::numeric_limits<uint32_t>::max();
 
-/// What vertices have by one name.
+/// One attribute of the vertices.
 struct Column
 {
     const char* name;
@@ -82,7 +82,7 @@ private:
 
     void chooseColumns()
     {
-        if (getStrongestColour() > 2.0f) // bytes, as some files have them
+        if (getStrongestColour() > 2.0f) // some files have 0 to 255
             m_colourScale = 1.0f / 255.0f;
         m_columns.push_back({"a_position", 3, m_mesh.mVertices, false});
         const bool isSurface = m_cornersPerFace == 3;
@@ -109,13 +109,12 @@ private:
         for (unsigned i = 0; m_mesh.mColors[0] && i < m_mesh.mNumVertices; ++i)
         {
             const aiColor4D& colour = m_mesh.mColors[0][i];
-            strongest =
-                std::max({strongest, colour.r, colour.g, colour.b}); // what is no number is passed over
+            strongest = std::max({strongest, colour.r, colour.g, colour.b}); // skips NaN
         }
         return strongest;
     }
 
-    /// Some programs write normals that are all zero or that all point to the backs of their faces.
+    /// Some exporters write normals that are all zero or all point to the backs of their faces.
     bool hasNormals() const
     {
         if (!m_mesh.mNormals || m_cornersPerFace != 3)
@@ -233,7 +232,7 @@ private:
     float makeFinite(float value)
     {
         if (std::isfinite(value))
-            return value + 0.0f; // -0 becomes 0, which is the same to all but the joining
+            return value + 0.0f; // -0 becomes 0: joining compares bits
         m_hasBadValues = true;
         return 0.0f;
     }
@@ -264,7 +263,7 @@ private:
         const aiVector3D ac = places[2] - places[0];
         if (m_cornersPerFace == 2)
             return ab.SquareLength() == 0.0f;
-        if (!m_influences.empty()) // which may open what is a line at rest
+        if (!m_influences.empty()) // the pose may give area to a face without any at rest
             return face[0] == face[1] || face[1] == face[2] || face[2] == face[0];
         return (ab ^ ac).SquareLength() == 0.0f;
     }
@@ -275,7 +274,7 @@ private:
                                            glo::primitive::TRIANGLES};
         MeshPart made;
         made.bones = listJoints(part, m_joinedInfluences);
-        // Vertices in the order of their first use, which is how a GPU then reads them.
+        // Vertices in the order of their first use, in which a GPU reads them.
         std::vector<uint32_t> numbers(m_table->size(), NONE);
         std::vector<uint32_t> rows;
         glo::IndexData indices;

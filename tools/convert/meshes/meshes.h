@@ -10,24 +10,23 @@ struct aiMesh;
 namespace convert
 {
 
-/// A geometry and, if a skin moves it, the mesh's bones that its joint numbers count: the number after the last
-/// bone's is the mesh's own node.
+/// A geometry and, if it is skinned, the mesh's bones by joint number; the number after the last bone is the mesh's own
+/// node.
 struct MeshPart
 {
     glo::Geometry geometry; ///< without a name
     std::vector<uint16_t> bones;
 };
 
-/// Triangles, lines or points with positions and what else the mesh has: normals, two sets of texture coordinates,
-/// a colour, joints and weights; and tangents and binormals if the material has a normal map. Vertices that are the
-/// same all over are joined, faces that have no area are left out.
+/// Triangles, lines or points with positions and the mesh's other attributes: normals, two sets of texture coordinates,
+/// a colour, joints and weights; and tangents and binormals if the material has a normal map. Identical vertices are
+/// joined, faces without area are left out.
 /// @param mesh  all of its faces have the same number of corners, 1 to 3.
-/// @return in as many parts as the limits of geometries ask for; none if nothing is left.
+/// @return as many parts as the limits of geometries require; none if nothing is left.
 std::vector<MeshPart> convertMesh(const aiMesh& mesh, const ConvertedMaterial& material, Report& report);
 
-/// Whether the vertices have colours: not all of them white or all of them black, which some importers of the library
-/// put where there are none.
-/// @param mayBeBlack  black is a colour as any other.
+/// Whether the vertices have colours. All white or all black does not count: some importers add such colours.
+/// @param mayBeBlack  all black counts too.
 bool isColoured(const aiMesh& mesh, bool mayBeBlack);
 
 /// Whether texture coordinates of the channel lie outside 0 to 1.

@@ -10,11 +10,11 @@ namespace convert
 namespace
 {
 
-constexpr size_t MOST_VERTICES = 65536; // that 16-bit indices count
-constexpr size_t MOST_JOINTS = 20;      // that a shader takes
+constexpr size_t MOST_VERTICES = 65536; // limit of 16-bit indices
+constexpr size_t MOST_JOINTS = 20;      // limit of the shaders
 constexpr uint32_t NONE = std::numeric_limits<uint32_t>::max();
 
-/// Faces that have their joints in common.
+/// Faces with a common set of joints.
 struct JointGroup
 {
     std::vector<uint16_t> joints; ///< ascending
@@ -37,7 +37,7 @@ size_t countNew(const Joints& known, const Joints& wanted)
                                 { return !std::binary_search(known.begin(), known.end(), joint); }));
 }
 
-/// Puts each face where the fewest of its joints are new.
+/// Puts each face into the part to which it adds the fewest joints.
 std::vector<Corners> splitByJoints(const Corners& corners, unsigned cornersPerFace,
                                    const std::vector<Influences>& influences)
 {
@@ -102,7 +102,7 @@ std::vector<Corners> splitFaces(const Corners& corners, unsigned cornersPerFace,
     std::vector<Corners> groups = {faces};
     if (listJoints(faces, influences).size() > MOST_JOINTS)
     {
-        // Models often come limb by limb, which may be a better order to split them in.
+        // Models are often ordered by limbs, which may split better.
         groups = splitByJoints(corners, cornersPerFace, influences);
         std::vector<Corners> others = splitByJoints(faces, cornersPerFace, influences);
         if (others.size() < groups.size())

@@ -10,8 +10,8 @@ namespace convert
 {
 
 /// Splits faces into groups that one geometry each can hold: no more vertices than 16-bit indices count, no more
-/// joints than a shader takes. Triangles are ordered so that a GPU finds most of their vertices among the last ones
-/// that it worked out, and so that those of a group lie together. No face is lost and none is split.
+/// joints than a shader takes. Triangles are ordered for a GPU's vertex cache, and those of a group are adjacent. No
+/// face is lost or split.
 /// @param cornersPerFace  1 to 3.
 /// @param influences      by number of vertex; empty without a skin.
 std::vector<Corners> splitFaces(const Corners& corners, unsigned cornersPerFace,

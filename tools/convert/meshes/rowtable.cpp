@@ -36,7 +36,7 @@ RowTable::RowTable(size_t width, size_t expected) : m_width(width)
     m_slots.resize(slots, {EMPTY, 0});
 }
 
-/// That of an equal row, or the one where it is to be.
+/// The slot of an equal row, or the free slot for it.
 size_t RowTable::findSlot(const float* row, uint32_t hash) const
 {
     const size_t last = m_slots.size() - 1;

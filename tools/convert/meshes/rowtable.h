@@ -7,22 +7,22 @@
 namespace convert
 {
 
-/// Rows of floats, equal ones, bit by bit, only once.
+/// Unique rows of floats, compared bit by bit.
 class RowTable
 {
 public:
     /// @param width     floats of a row.
-    /// @param expected  number of rows that are likely to come.
+    /// @param expected  likely number of rows.
     RowTable(size_t width, size_t expected);
 
-    /// @return the number of the row; of an equal one if there is.
+    /// @return the number of the row, or of an equal one.
     uint32_t add(const float* row);
 
     const float* operator[](uint32_t number) const { return &m_values[number * m_width]; }
     size_t size() const { return m_count; }
 
 private:
-    /// Of a row; the hash tells most others from it without a look at them.
+    /// The slot of a row, with its hash to avoid most comparisons.
     struct Slot
     {
         uint32_t number;
@@ -35,7 +35,7 @@ private:
     size_t m_width;
     size_t m_count = 0;
     std::vector<float> m_values;
-    std::vector<Slot> m_slots; ///< of rows, from where their hashes point on; a power of two
+    std::vector<Slot> m_slots; ///< open addressing by hash; its size is a power of two
 };
 
 } // namespace convert

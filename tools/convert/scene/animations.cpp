@@ -18,7 +18,7 @@ namespace
 {
 
 constexpr double MOST_SAMPLES = 200000.0;       // of one clip: almost two hours at 30 a second
-constexpr double USUAL_TICKS_PER_SECOND = 25.0; // where the model does not say
+constexpr double USUAL_TICKS_PER_SECOND = 25.0; // if the model does not specify it
 constexpr float TOLERANCE = 1e-6f;              // relative to the value
 
 enum class Property
@@ -68,7 +68,7 @@ Values toValues(const orv::Vector4f& v)
     return {v.x, v.y, v.z, v.w};
 }
 
-/// What the node has in the model as it stands.
+/// The node's values at rest.
 Values getRest(const glo::NodeData& rest, Property property)
 {
     switch (property)
@@ -100,7 +100,7 @@ Values sample(const aiNodeAnim& channel, Property property, double ticks, const 
     return getRest(rest, property);
 }
 
-/// Times of keys that follow another one of the same time.
+/// Times of keys that have the same time as the key before.
 template <class Key>
 std::vector<double> findJumps(const Key* keys, unsigned count)
 {
@@ -125,7 +125,7 @@ std::vector<double> listJumps(const aiNodeAnim& channel, Property property)
     return findJumps(channel.mScalingKeys, channel.mNumScalingKeys);
 }
 
-/// Which of a model's keys to look at: those in a clip, of many within a sample's time the first, and all of those that have
+/// Selects the relevant keys of a model: those in a clip; of several within a sample's time the first; and all keys of
 /// the same time as the one before.
 struct KeyRange
 {
@@ -137,7 +137,7 @@ template <class Key, class Convert>
 void appendKeys(const Key* keys, unsigned count, const KeyRange& range, const Convert& toValue,
                 std::vector<Sample>& samples)
 {
-    double last = 0.0; // earlier ones, and those that go back in time, are passed over
+    double last = 0.0; // earlier keys, and those that go back in time, are skipped
     double lastSample = -1.0;
     for (unsigned i = 0; i < count; ++i)
     {
@@ -182,7 +182,7 @@ Values toValues(const Sample& sample, Property property)
     return toValues(sample.value.xyz());
 }
 
-/// Lengths of a model as it stands.
+/// Sizes of a model at rest.
 struct Extent
 {
     aiVector3D low = aiVector3D(HUGE_VALF);
@@ -196,7 +196,7 @@ struct Extent
             high[i] = std::max(high[i], place[i]);
         }
     }
-    /// Of the diagonal; 0 without a place.
+    /// The diagonal; 0 without vertices.
     float getLength() const { return low.x <= high.x ? (high - low).Length() : 0.0f; }
 };
 
@@ -215,7 +215,7 @@ void measure(const aiScene& scene, const aiNode& node, const aiMatrix4x4& above,
         measure(scene, *node.mChildren[i], world, nodes, vertices);
 }
 
-/// The factor by which a node's children are larger in the world than by themselves, where they are largest.
+/// The largest factor by which the world scales a node's children.
 float findScale(const aiNode* node)
 {
     aiMatrix4x4 world;
@@ -294,7 +294,7 @@ public:
         }
         motion.usesClipNode = m_sources.size() > 1 || m_all.channels.empty();
         m_all.name = m_sources.size() > 1 ? m_names.make("all clips", "") : m_sources[0].clip.name;
-        if (m_all.channels.empty()) // nothing moves, but for so long
+        if (m_all.channels.empty()) // nothing moves, but it has a length
             m_all.channels = makeMark({"", 0.0f, m_sources.back().clip.end}).channels;
         else
             extend(m_all.channels.front());
@@ -359,7 +359,7 @@ private:
             addTracks(*node.mChildren[i]);
     }
 
-    /// A track that stays as it is has one key, and none if it stays as the node is anyway.
+    /// A constant track has one key, or none if its value is the node's own.
     void addTrack(const aiNode& node, Property property, const glo::NodeData& rest)
     {
         glo::Channel track = makeChannel(m_nodeNames.at(&node), PROPERTY_NAMES[size_t(property)]);
@@ -409,7 +409,7 @@ private:
         if (property == Property::TRANSLATION)
             error *= m_length / double(findScale(node.mParent));
         std::vector<size_t> keys = chooseKeys(samples, property == Property::ROTATION, error);
-        // What holds to the end holds after its first key as well.
+        // A value constant to the end needs only its first key.
         while (keys.size() > 1 && isSame(toValues(samples[keys[keys.size() - 2]], property),
                                          toValues(samples[keys.back()], property)))
             keys.pop_back();
@@ -419,7 +419,7 @@ private:
         return toValues(samples[keys.back()], property);
     }
 
-    /// What a clip has the node do, to be approached: the model's keys, and its value at both ends.
+    /// The samples to approximate: the model's keys, and the values at both ends of a clip.
     void appendSamples(const Source& source, const aiNode& node, Property property, const glo::NodeData& rest,
                        std::vector<Sample>& samples) const
     {
@@ -437,12 +437,12 @@ private:
             samples.insert(samples.begin() + std::ptrdiff_t(first), {0.0, evaluateAt(0.0)});
         if (samples.back().seconds < source.duration)
             samples.push_back({source.duration, evaluateAt(source.duration)});
-        for (size_t i = first; i < samples.size(); ++i) // to seconds on the time line, as they will be read
+        for (size_t i = first; i < samples.size(); ++i) // seconds on the time line, rounded as in the file
             samples[i].seconds =
                 double(float(double(source.clip.start) + samples[i].seconds / source.ticksPerSecond));
     }
 
-    /// Seconds at which a value is taken: evenly through each second, the end, and where the value jumps.
+    /// Times of samples in seconds: evenly spaced, the end, and jumps.
     std::vector<double> listTimes(const Source& source, const aiNodeAnim& channel, Property property) const
     {
         const double end = source.duration / source.ticksPerSecond;
@@ -455,7 +455,7 @@ private:
         return times;
     }
 
-    /// Repeats the last key at the end of everything, which tells how long that is.
+    /// Repeats the last key at the end of the time line, to give it its length.
     void extend(glo::Channel& track) const
     {
         if (m_sources.back().clip.end > 0.0f)
@@ -481,7 +481,7 @@ private:
     double m_fps;
     bool m_isSparse;
     double m_keyError;
-    double m_length = 1.0; ///< of the model's diagonal, as it stands
+    double m_length = 1.0; ///< the model's diagonal at rest
     Report& m_report;
     NameMaker m_names;
     std::vector<Source> m_sources;

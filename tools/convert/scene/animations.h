@@ -23,7 +23,7 @@ struct ModelClip
     float end = 0.0f;
 };
 
-/// How a scene moves.
+/// A scene's animations.
 struct Motion
 {
     std::vector<ModelClip> clips;
@@ -31,16 +31,16 @@ struct Motion
     bool usesClipNode = false; ///< see convertAnimations
 };
 
-/// What the model's nodes are called in the scene.
+/// Names of the model's nodes in the scene.
 using NodeNames = std::map<const aiNode*, std::string>;
 
 /// Samples the movement of nodes to stepped keys, or chooses keys to interpolate between; the clips one after the other with
 /// a sample's time between.
 ///
 /// A single clip is an animation of its name. Of several, all movement is in one animation "all clips", since of
-/// several channels for one node the last would win at all times; before it comes an animation for each clip, which
-/// has the clip's name and start and end and moves nothing but a node of its own.
-/// @param clipNode  the name of that node, which is to be empty.
+/// several channels for one node the last would always win. Before it comes an animation for each clip, with the clip's
+/// name, start and end, that moves only a special node.
+/// @param clipNode  the name of that empty node.
 Motion convertAnimations(const aiScene& scene, const NodeNames& nodeNames, const std::string& clipNode,
                          const Options& options, Report& report);
 

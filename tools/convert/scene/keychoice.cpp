@@ -70,7 +70,7 @@ public:
     }
 
 private:
-    /// About the farthest sample to which one line leads; behind the last one after that.
+    /// Roughly the farthest sample that one line can reach; for the last key, the number of samples.
     size_t findNext(size_t key) const
     {
         const size_t last = m_times.size() - 1;

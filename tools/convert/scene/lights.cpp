@@ -14,9 +14,9 @@ namespace convert
 namespace
 {
 
-constexpr float PHYSICAL = 4.0f; ///< a light that is brighter is in physical units, which the engine has not
+constexpr float PHYSICAL = 4.0f; ///< a brighter light is in physical units, which the engine lacks
 
-/// Where a light of this strength has gone, by the model's three factors: k + l d + q d^2 = strength / SPENT.
+/// The distance at which a light has faded, by the model's attenuation: k + l d + q d^2 = strength / SPENT.
 float findEnd(const aiLight& light, float strength)
 {
     constexpr double NEAREST = 1e-3;
@@ -26,11 +26,11 @@ float findEnd(const aiLight& light, float strength)
     const double q = std::max(0.0, double(light.mAttenuationQuadratic));
     if (k >= 0.0)
         return float(NEAREST);
-    const double end = -2.0 * k / (l + std::sqrt(l * l - 4.0 * q * k)); // which holds for q = 0, too
+    const double end = -2.0 * k / (l + std::sqrt(l * l - 4.0 * q * k)); // also valid for q = 0
     return float(std::clamp(end, NEAREST, FARTHEST));
 }
 
-/// 1 at the distance where the light's own strength is 1, and stronger nearer by, where both light in full.
+/// 1 at the distance where the light's own strength is 1; at smaller distances both saturate.
 void setSquare(float strength, float factor, glo::LightDefinition& made)
 {
     made.intensity = SQUARE_END / (SQUARE_END - 1.0f);
@@ -107,7 +107,7 @@ glo::CameraDefinition convertCamera(const aiCamera& camera)
         made.width = 2.0f * float(camera.mOrthographicWidth);
         return made;
     }
-    // The model's angle is from left to right, the engine's spans the shorter side.
+    // The model's angle is horizontal, the engine's spans the shorter side.
     const float angle = float(camera.mHorizontalFOV);
     if (!(angle > 0.0f && angle < 3.1f))
         return made;
@@ -118,8 +118,8 @@ glo::CameraDefinition convertCamera(const aiCamera& camera)
 
 aiMatrix4x4 placeCamera(const aiCamera& camera, const aiMatrix4x4& node)
 {
-    // Some importers repeat the node's position, and some leave what a new aiCamera has, though in their formats (ASE,
-    // LWS, OpenGEX) cameras look along -z.
+    // Some importers repeat the node's position; some keep a new aiCamera's defaults, although cameras of their formats
+    // (ASE, LWS, OpenGEX) look along -z.
     const bool isRepeated = camera.mPosition == aiVector3D(node.a4, node.b4, node.c4);
     const bool isUntouched = camera.mLookAt == aiVector3D(0, 0, 1) && camera.mUp == aiVector3D(0, 1, 0);
     return lookingAlong(isRepeated ? aiVector3D() : camera.mPosition,

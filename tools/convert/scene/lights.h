@@ -11,10 +11,10 @@ struct aiLight;
 namespace convert
 {
 
-constexpr float SPENT = 0.02f; ///< of a light's strength: where it ends
+constexpr float SPENT = 0.02f; ///< share of a light's strength at which it counts as faded
 
-/// Where a light ends that falls off by the square of the distance alone, in distances at which it lights in full (its
-/// strength there is 1). The engine's lights fall in a straight line; this one lies near that curve.
+/// The end of a light with inverse-square attenuation, in multiples of the distance at which its strength is 1. The
+/// engine's linear attenuation to this end is close to that curve.
 constexpr float SQUARE_END = 2.5f;
 
 /// @return false, with the loss reported, for a kind of light that the engine does not have.
@@ -22,7 +22,7 @@ bool convertLight(const aiLight& light, glo::LightDefinition& made, Report& repo
 
 glo::CameraDefinition convertCamera(const aiCamera& camera);
 
-/// From where it is to be, looking along -z, to its node.
+/// The transform from a camera or light that looks along -z to its node.
 /// @param node  the node's transform.
 aiMatrix4x4 placeCamera(const aiCamera& camera, const aiMatrix4x4& node);
 

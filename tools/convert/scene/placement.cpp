@@ -16,20 +16,20 @@ using orv::Vector4f;
 namespace
 {
 
-/// Any direction across v.
+/// Any direction perpendicular to v.
 aiVector3D across(const aiVector3D& v)
 {
     const aiVector3D axis = std::fabs(v.x) < 0.7f ? aiVector3D(1, 0, 0) : aiVector3D(0, 1, 0);
     return (v ^ axis).NormalizeSafe();
 }
 
-/// Makes columns of length 1 at right angles, right-handed, of whatever they are.
+/// Makes the columns orthonormal and right-handed.
 void orthonormalise(aiVector3D columns[3])
 {
     const bool isNothing = std::all_of(
         columns, columns + 3, [](const aiVector3D& column) { return column.SquareLength() == 0.0f; });
     for (unsigned i = 0; isNothing && i < 3; ++i)
-        columns[i][i] = 1.0f; // what has no size is not turned, either: it may grow
+        columns[i][i] = 1.0f; // of scale zero: no rotation either, since it may grow
     columns[0] = columns[0].SquareLength() > 0.0f ? columns[0].Normalize() : across(columns[1] ^ columns[2]);
     columns[1] -= columns[0] * (columns[0] * columns[1]);
     if (columns[1].Length() < 1e-6f)
@@ -73,7 +73,7 @@ Matrix4f toMatrix(const aiMatrix4x4& m)
 
 Vector4f toAxisAngle(const aiQuaternion& rotation)
 {
-    // Of the two quaternions of a rotation the one that turns by no more than half a circle.
+    // Of the two quaternions of a rotation, the one of at most half a turn.
     const float sign = rotation.w < 0.0f ? -1.0f : 1.0f;
     const aiVector3D part(rotation.x * sign, rotation.y * sign, rotation.z * sign);
     const float length = float(part.Length());
@@ -100,7 +100,7 @@ bool place(glo::NodeData& node, const aiMatrix4x4& transform)
         columns[i] = columns[i].NormalizeSafe();
     if ((columns[0] ^ columns[1]) * columns[2] < 0.0f)
     {
-        // Of the three axes that could be turned round, the one that leaves the least to rotate.
+        // Of the three axes that could be mirrored, the one that leaves the smallest rotation.
         unsigned turned = 0;
         for (unsigned i = 1; i < 3; ++i)
             turned = columns[i][i] < columns[turned][turned] ? i : turned;
@@ -131,8 +131,8 @@ bool place(glo::NodeData& node, const aiMatrix4x4& transform)
 
 Nested splitShear(const aiMatrix4x4& transform)
 {
-    // Turning the space in front of the transform so that the axes come out at right angles to each other: two at a
-    // time until all do. Then what is left is a turn and a scale.
+    // Jacobi's method: rotations before the transform make its axes orthogonal, two at a time. Then the rest is a
+    // rotation and a scale.
     Nested nested{transform, {}};
     const auto column = [&](unsigned i)
     {
@@ -149,7 +149,7 @@ Nested splitShear(const aiMatrix4x4& transform)
             const float difference = float(column(a).SquareLength() - column(b).SquareLength());
             const float product = float(column(a) * column(b));
             const float angle = 0.5f * std::atan2(difference < 0.0f ? -2.0f * product : 2.0f * product,
-                                                  std::fabs(difference)); // at most an eighth of a circle
+                                                  std::fabs(difference)); // at most an eighth of a turn
             aiMatrix4x4 turn;
             turn[a][a] = turn[b][b] = std::cos(angle);
             turn[b][a] = std::sin(angle);

@@ -10,8 +10,8 @@ namespace convert
 namespace
 {
 
-/// Keeps the four strongest; of equals, the earlier one.
-/// @return whether one had to go.
+/// Keeps the four strongest; of equal ones the earlier.
+/// @return whether one was dropped.
 bool addInfluence(Influences& influences, uint16_t joint, float weight)
 {
     auto& [joints, weights] = influences;
