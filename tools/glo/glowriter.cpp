@@ -37,7 +37,7 @@ private:
     std::vector<uint8_t>& m_bytes;
 };
 
-/// What fields() needs to write; see glofields.h. Records are constant here.
+/// The writing Io for fields(); see glofields.h. Records are constant here.
 class GloWriter
 {
 public:
@@ -176,7 +176,7 @@ private:
         return false;
     }
 
-    /// A chunk around what content writes.
+    /// Writes a chunk around content.
     template <class Content>
     bool sized(uint32_t id, Content&& content)
     {
@@ -201,7 +201,7 @@ private:
         return sized(Record::LIST_ID, [&] { return listFields(*this, records); });
     }
 
-    /// What an older version has no slot for would be lost.
+    /// Refuses records that an older version cannot hold.
     bool fitsVersion(const NodeData& node)
     {
         if (node.skin && !hasSkinReferences(m_version))

@@ -14,8 +14,7 @@ using namespace orv::detail::glo;
 
 /// Writes a scene in the version that its info names.
 /// @param file   replaced by the bytes of the whole file.
-/// @param error  what cannot be written: a version that is not known, something that the version does not have,
-///               a text that is too long.
+/// @param error  the reason: an unknown version, a feature that the version lacks, a text that is too long.
 /// @return false on an error; file is not to be used then.
 bool writeGlo(const GloScene& scene, std::vector<uint8_t>& file, std::string& error);
 

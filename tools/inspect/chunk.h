@@ -19,7 +19,7 @@ struct Field
     nlohmann::ordered_json value;
 };
 
-/// One chunk as it stands in the file.
+/// One chunk of the file.
 struct Chunk
 {
     static constexpr size_t NO_RECORD = size_t(-1);
@@ -29,7 +29,7 @@ struct Chunk
     uint32_t size = 0;   ///< of the data, as the header says
     bool known = true;
     std::string path;
-    size_t record = NO_RECORD; ///< its place in the vector of records that it was read into
+    size_t record = NO_RECORD; ///< index in the vector of records that it was read into
     std::vector<Field> fields;
     std::vector<Chunk> children; ///< see add()
 
@@ -38,10 +38,10 @@ struct Chunk
 
     void add(Chunk&& child);
 
-    /// How many children of that kind it has so far.
+    /// The number of children of that kind so far.
     size_t count(uint32_t childId) const;
 
-    /// The child of that kind that was read into that place, or that is the only one; this chunk if there is none.
+    /// The child of that kind with that record, or the only one of that kind; this chunk if there is none.
     const Chunk& find(uint32_t childId, size_t childRecord = NO_RECORD) const;
 
 private:

@@ -10,8 +10,8 @@ namespace inspect
 enum class Severity
 {
     ERROR,   ///< the engine refuses the file
-    WARNING, ///< the engine takes something else instead, or what is seen is hardly what was meant
-    NOTE     ///< harmless, but unlikely to be on purpose
+    WARNING, ///< the engine substitutes something, or the result probably looks wrong
+    NOTE     ///< harmless, but probably not intended
 };
 
 /// Everything that can be found. The codes are for scripts and do not change.
@@ -100,7 +100,7 @@ struct KindInfo
     const char* meaning; ///< for the list that --codes prints
 };
 
-/// Of a number of things, for sentences: "1 node", "2 nodes".
+/// A count with a noun: "1 node", "2 nodes".
 std::string counted(uint64_t count, const char* one, const char* many);
 
 const KindInfo& getInfo(Kind kind);
@@ -115,18 +115,18 @@ struct Finding
     std::string sentence; ///< for a person
 };
 
-/// What was found so far, in the order in which it was met.
+/// The findings so far, in the order of reading.
 class Findings
 {
 public:
     void add(Kind kind, uint64_t offset, const std::string& path, const std::string& sentence);
 
-    /// The worst that was found; NOTE if nothing was.
+    /// The worst severity; NOTE without findings.
     Severity getWorst() const;
 
     int count(Severity severity) const;
 
-    /// Sorted by offset; those at the same place in the order in which they were met.
+    /// Sorted by offset; at the same offset in the order of reading.
     std::vector<Finding> getSorted() const;
 
 private:

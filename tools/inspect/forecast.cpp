@@ -159,7 +159,7 @@ private:
             addTexture(*field, nullptr);
     }
 
-    /// @param otherwise  what stands for none; may be null.
+    /// @param otherwise  the replacement for none; may be null.
     void addTexture(const SamplerField& field, const char* otherwise)
     {
         if (!hasImage(field) && !otherwise)
@@ -177,10 +177,10 @@ private:
     const ScannedFile& m_file;
     ByName<Geometry> m_geometries;
     ByName<Skin> m_skins;
-    bool m_isAffordable; ///< or else nothing is drawn
+    bool m_isAffordable; ///< if false, nothing is drawn
     Images m_images;
     Forecast m_forecast;
-    std::map<std::string, StandardMaterial> m_materials; ///< with what animations take them to
+    std::map<std::string, StandardMaterial> m_materials; ///< including values reached by animations
     std::map<std::string, int> m_programs;
     std::set<std::string> m_textures;
 };

@@ -10,7 +10,7 @@
 namespace inspect
 {
 
-/// What the engine will make of a scene file.
+/// What the engine will create from a scene file.
 struct Forecast
 {
     struct Program
@@ -22,10 +22,10 @@ struct Forecast
     std::vector<Program> programs; ///< by name
     int nodes = 0;                 ///< of the file; those with several objects become more
     int draws = 0;                 ///< one for each primitive set of each reference
-    uint64_t triangles = 0;        ///< drawn when everything is in view
+    uint64_t triangles = 0;        ///< drawn with everything in view
     uint64_t vertices = 0;         ///< kept, not drawn
     uint64_t keys = 0;             ///< of all channels
-    uint64_t interpolated = 0;     ///< keys of channels between whose keys the engine interpolates
+    uint64_t interpolated = 0;     ///< keys of interpolated channels
     uint64_t vertexBytes = 0;      ///< of GPU buffers
     uint64_t indexBytes = 0;
     uint64_t textureBytes = 0; ///< with mipmaps; compressed pictures as their files hold them

@@ -187,7 +187,7 @@ private:
 
     void checkNumbers(const Chunk& chunk, const VertexAttribute& attribute, const VertexSet& vertices)
     {
-        // Attributes that share their bytes would be as much work as all of them times all vertices.
+        // Attributes that share bytes could multiply the work.
         const uint64_t values = uint64_t(vertices.vertexCount) * uint32_t(attribute.componentCount);
         if (values > m_valuesLeft)
             return;
@@ -212,7 +212,7 @@ private:
         uint64_t count = 0;
         for (const float sum : sums)
             count += std::fabs(sum - 1.0f) > 0.02f ? 1 : 0;
-        // One joint moves vertices whose weights are left out.
+        // Without weights, one joint moves each vertex.
         if (count > 0 && weights->componentCount == 4)
             report(Kind::WEIGHT_SUM, chunk,
                    "the weights of " + counted(count, "vertex", "vertices") + " do not add up to 1");
@@ -279,7 +279,7 @@ private:
             {"gloss", data.gloss, false},
             {"specular-level", data.specularLevelMap, false},
         };
-        size_t sampler = 0; // the samplers' chunks follow each other in this order but for two
+        size_t sampler = 0; // the samplers' chunks have this order except for two
         for (const Slot& slot : slots)
         {
             if (!slot.field)
@@ -415,7 +415,7 @@ private:
             checkNode(chunk.find(NodeData::ID, i), node.children[i], false);
     }
 
-    /// The matrix is what counts; the engine goes by the components as soon as one of them is animated.
+    /// The engine uses the matrix until a component is animated, then the components.
     void checkTransform(const Chunk& chunk, const NodeData& node, bool top)
     {
         if (!hasNodeTransform(m_file.version) || (top && m_scene.upAxis != uint32_t(UpAxis::Y)))
@@ -576,7 +576,7 @@ private:
     }
 
     const ScannedFile& m_file;
-    static constexpr uint64_t VALUES_PER_BYTE = 4; ///< that are looked at; a sound file has one at most
+    static constexpr uint64_t VALUES_PER_BYTE = 4; ///< limit of values read; a valid file has at most one
 
     const GloScene& m_scene;
     ByName<Geometry> m_geometries;

@@ -7,8 +7,7 @@
 namespace inspect
 {
 
-/// What only shows when the records are held against each other: references, bounds, values that will not be seen
-/// as they were meant.
+/// Checks that compare records with each other: references, bounds, values that will look wrong.
 /// @param folder  where the pictures lie.
 void checkGlo(const ScannedFile& file, const std::filesystem::path& folder, Findings& findings);
 

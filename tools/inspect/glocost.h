@@ -5,7 +5,7 @@
 namespace inspect
 {
 
-/// Whether the engine makes all that the file's references ask for; see orv::detail::glo::GloCredit.
+/// Whether the engine accepts the number of objects made by reference; see orv::detail::glo::GloCredit.
 bool isAffordable(const ScannedFile& file);
 
 } // namespace inspect

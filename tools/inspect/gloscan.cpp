@@ -94,7 +94,7 @@ private:
     ordered_json& m_values;
 };
 
-/// What fields() asks for. An operation that fails has reported why and ends its chunk; chunk() goes on behind it.
+/// The Io for fields(). An operation that fails has reported why and ends its chunk; chunk() continues after it.
 class GloScanner
 {
 public:
@@ -334,7 +334,7 @@ public:
         return true;
     }
 
-    /// The three faults that fields() itself sees.
+    /// The three faults that fields() itself detects.
     bool fail(const char* format)
     {
         if (std::strcmp(format, UNEXPECTED_INDEX_BUFFERS) == 0)
@@ -352,7 +352,7 @@ private:
         m_findings.add(kind, offset, m_chunk->path, sentence);
     }
 
-    /// Reports at the field that was just met.
+    /// Reports at the last field.
     bool refuse(Kind kind, const std::string& sentence)
     {
         report(kind, m_chunk->fields.empty() ? m_position : m_chunk->fields.back().offset, sentence);
@@ -411,7 +411,7 @@ private:
     {
         if (child.size <= m_end - m_position)
             return m_position + child.size;
-        if (!std::exchange(m_cut, true)) // once, at the outermost
+        if (!std::exchange(m_cut, true)) // once, for the outermost chunk
             report(Kind::CHUNK_CUT, child.offset,
                    "the " + name(child.id) + " chunk of " + counted(child.size, "byte", "bytes") +
                        " reaches " + counted(child.size - (m_end - m_position), "byte", "bytes") +
@@ -485,7 +485,7 @@ private:
     Chunk* m_chunk = nullptr; ///< the present one
     uint64_t m_position = 0;
     uint64_t m_end = 0; ///< of the present chunk
-    bool m_cut = false; ///< that end is not the one that the header says
+    bool m_cut = false; ///< that end differs from the header's
     int m_depth = 0;
     bool m_hasInfo = false;
     bool m_sawList = false;

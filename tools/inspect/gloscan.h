@@ -16,13 +16,13 @@ struct ScannedFile
 {
     Chunk top;
     orv::detail::glo::GloScene scene;
-    orv::detail::glo::FileVersion version; ///< what the engine takes it for
+    orv::detail::glo::FileVersion version; ///< as the engine reads it
     orv::detail::glo::AuthoringTool tool = orv::detail::glo::AuthoringTool::MAX;
     uint64_t size = 0; ///< of the file in bytes
 };
 
-/// Reads chunk by chunk by the engine's own field lists. Where the engine stops at the first fault, this reports
-/// it and goes on behind the damaged chunk.
+/// Reads chunk by chunk by the engine's own field lists. The engine stops at the first fault; this reports it and
+/// continues after the damaged chunk.
 ScannedFile scanGlo(const std::vector<uint8_t>& bytes, Findings& findings);
 
 } // namespace inspect

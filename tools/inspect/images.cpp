@@ -19,7 +19,7 @@ bool isPowerOfTwo(unsigned value)
     return value != 0 && (value & (value - 1)) == 0;
 }
 
-/// Of all levels down to a single pixel, or of the first alone.
+/// Of all levels down to a single pixel, or only of the first.
 unsigned countPixels(unsigned width, unsigned height, bool mipmaps)
 {
     unsigned pixels = width * height;
@@ -52,7 +52,7 @@ const ImageSize& Images::measure(const std::string& name, bool cube)
         return known->second;
 
     ImageSize size;
-    if (!cube && !orv::endsWith(name.c_str(), ".pvr")) // the engine looks for a compressed twin first
+    if (!cube && !orv::endsWith(name.c_str(), ".pvr")) // the engine prefers a .pvr of the same name
         size = measureFile(name.substr(0, name.rfind('.')) + ".pvr", cube);
     if (size.state == ImageState::MISSING)
         size = measureFile(name, cube);
@@ -79,7 +79,7 @@ ImageSize Images::measureFile(const std::string& name, bool cube) const
     {
         const unsigned bytes = unsigned(stream->size());
         size.state = bytes > PVR_HEADER ? ImageState::READABLE : ImageState::UNREADABLE;
-        size.width = size.height = 1; // of no concern: a compressed picture comes with its own mipmaps
+        size.width = size.height = 1; // irrelevant: a compressed picture has its own mipmaps
         size.gpuBytes = bytes > PVR_HEADER ? bytes - PVR_HEADER : 0;
         return size;
     }

@@ -29,7 +29,7 @@ struct ImageSize
     bool isPowerOfTwo() const;
 };
 
-/// The pictures beside a scene and those that the engine brings along, decoded as the engine does.
+/// The pictures beside a scene and the engine's built-in ones, decoded by the engine.
 class Images
 {
 public:

@@ -1,5 +1,4 @@
-// orv-inspect: says what is in a scene file, a material or a shader program file, what the engine will make of it,
-// and what is wrong with it.
+// orv-inspect: reports the contents, cost and faults of scene files, materials and shader program files.
 
 #include "glochecks.h"
 #include "print.h"

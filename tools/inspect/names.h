@@ -7,7 +7,7 @@
 namespace inspect
 {
 
-/// Records by their names, of equal ones the first.
+/// Records by name; of equal names the first.
 template <class Record>
 using ByName = std::map<std::string, const Record*>;
 

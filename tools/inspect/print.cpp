@@ -33,7 +33,7 @@ std::string toText(const ordered_json& value)
     return text;
 }
 
-/// The code point that begins there; its length is 0 if that is no sound UTF-8.
+/// The code point that begins there; its length is 0 if it is invalid UTF-8.
 uint32_t readCodePoint(const std::string& text, size_t at, size_t& length)
 {
     const auto byte = [&](size_t i) { return i < text.size() ? uint32_t(uint8_t(text[i])) : 0u; };
@@ -54,7 +54,7 @@ uint32_t readCodePoint(const std::string& text, size_t at, size_t& length)
     return point;
 }
 
-/// What moves the cursor, colours, begins a line or turns the direction of writing.
+/// Characters that move the cursor, set colours, begin a line or change the direction of writing.
 bool isControl(uint32_t point)
 {
     return point < 0x20 || (point >= 0x7f && point < 0xa0) || point == 0x61c || point == 0x200e ||
@@ -62,7 +62,7 @@ bool isControl(uint32_t point)
            (point >= 0xd800 && point < 0xe000);
 }
 
-/// Safe for a terminal and for what reads lines: names come from files. Other bytes are written as "\x1b".
+/// Escapes text from files for terminals and line-based readers: control characters and invalid bytes become "\x1b".
 std::string escape(const std::string& text)
 {
     std::string escaped;

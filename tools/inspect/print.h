@@ -12,7 +12,7 @@
 namespace inspect
 {
 
-/// Everything that is known of one file, in the two forms that people and scripts read.
+/// All results for one file, for people and for scripts.
 struct Report
 {
     std::string path;

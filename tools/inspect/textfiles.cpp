@@ -24,7 +24,7 @@ using orv::CharRange;
 namespace
 {
 
-/// How the arguments of a statement read: one letter for each.
+/// The arguments of a statement, one letter for each:
 struct StatementKind
 {
     const char* tag;
@@ -108,7 +108,7 @@ private:
     orv::SharedPtr<orv::StreamSource> m_sources[3];
 };
 
-/// What both formats have in common. The engine's reader takes its text apart in place, so does this.
+/// The common part of both formats. Like the engine's reader, it modifies its text.
 class TextChecker
 {
 public:
@@ -241,7 +241,7 @@ private:
         }
     }
 
-    /// The engine takes a number off and leaves what follows it to be the next argument.
+    /// The engine reads a number; any rest of the word becomes the next argument.
     void checkNumber(const std::string& what, bool real)
     {
         orv::eatWhite(m_text);
@@ -277,7 +277,7 @@ private:
     }
 };
 
-/// Uniforms that a shader source declares. A comment or a piece that is switched off may hold some too many.
+/// Uniforms declared in a shader source, including those in comments and disabled parts.
 std::set<std::string> findUniforms(std::string source)
 {
     source = std::regex_replace(source, std::regex("//[^\n]*"), "");

@@ -10,7 +10,7 @@
 namespace inspect
 {
 
-/// What a material file or a shader program file says, statement by statement.
+/// The statements of a material or shader program file.
 struct TextFile
 {
     struct Statement
@@ -22,7 +22,7 @@ struct TextFile
     std::vector<Statement> statements;
 };
 
-/// @param folder  where what the file names is looked for, besides the engine's own assets.
+/// @param folder  searched for files that it names, besides the engine's own assets.
 TextFile checkAppearanceFile(const std::string& text, const std::filesystem::path& folder,
                              Findings& findings);
 TextFile checkProgramFile(const std::string& text, const std::filesystem::path& folder, Findings& findings);

@@ -12,7 +12,7 @@ namespace pvr
 namespace
 {
 
-/// A channel of 8 bits brought to fewer, to the nearest value.
+/// An 8-bit channel rounded to fewer bits.
 uint32_t reduce(unsigned value, unsigned bits)
 {
     const unsigned most = (1u << bits) - 1;
@@ -68,8 +68,8 @@ std::vector<uint8_t> encodeEtc1(const SourcePicture& picture)
     return blocks;
 }
 
-/// Where the block of a column and row is stored: the bits of row and column by turns, the row's first, and the
-/// rest of the longer side above them.
+/// The index of a block: the bits of row and column interleaved, the row's first, and the longer side's remaining bits
+/// above.
 uint32_t getBlockIndex(uint32_t column, uint32_t row, uint32_t across, uint32_t down)
 {
     uint32_t index = 0;
@@ -89,7 +89,7 @@ int getBrightness(const uint8_t* rgba)
     return 2 * rgba[0] + 4 * rgba[1] + rgba[2] + 7 * rgba[3];
 }
 
-/// The half word of a block that holds its darker (A) or brighter (B) colour. A has one bit of blue less.
+/// The half word of a block's darker (A) or brighter (B) colour. A has one bit of blue less.
 uint32_t packColour(const uint8_t* rgba, bool isB)
 {
     if (rgba[3] == 255)
@@ -97,7 +97,7 @@ uint32_t packColour(const uint8_t* rgba, bool isB)
     return isB ? pack(rgba, "argb", {3, 4, 4, 4}) : pack(rgba, "argb", {3, 4, 4, 3}) << 1;
 }
 
-/// A PVRTC image in the making: a word of modulation and one of colours for each block.
+/// A PVRTC image under construction: a word of modulation and one of colours for each block.
 class PvrtcImage
 {
 public:
@@ -163,7 +163,7 @@ private:
         return packColour(brightest, true) << 16 | packColour(darkest, false) | mode;
     }
 
-    /// What the picture would be with one modulation word for all blocks: colour A alone, or B alone.
+    /// The picture with one modulation word for all blocks: only colour A, or only B.
     std::vector<uint8_t> decodeAll(uint32_t modulation)
     {
         for (uint32_t row = 0; row < m_down; ++row)
@@ -177,8 +177,8 @@ private:
         return rgba;
     }
 
-    /// The code whose mix of A and B comes nearest to a pixel.
-    /// \param step 1 for all codes, 3 for A or B alone
+    /// The code whose mix of A and B is nearest to a pixel.
+    /// \param step 1 for all codes, 3 for only A or B
     uint32_t chooseCode(uint32_t x, uint32_t y, const std::vector<uint8_t>& a, const std::vector<uint8_t>& b,
                         uint32_t step) const
     {
@@ -206,8 +206,8 @@ private:
         return best;
     }
 
-    /// With 4 bits two for each pixel. With 2 bits two for every other one, as on a chequerboard, from which the
-    /// decoder interpolates the rest; the lowest bit says so, and leaves the first pixel a choice of two.
+    /// With 4 bits, a two-bit code for each pixel. With 2 bits, codes for every other pixel in a chequerboard, from
+    /// which the decoder interpolates the rest; the lowest bit marks this mode, so the first pixel has only two codes.
     uint32_t chooseModulation(uint32_t column, uint32_t row, const std::vector<uint8_t>& a,
                               const std::vector<uint8_t>& b) const
     {

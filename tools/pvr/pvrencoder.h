@@ -20,8 +20,8 @@ struct SourcePicture
 
 /// The picture's pixels in a format: what a level of a PVR file holds.
 ///
-/// Luminance is weighed as the eye does. ETC1 comes out as libetc1 makes it. PVRTC is made simply: the darkest and
-/// the brightest colour of each block, and for each pixel the nearest mix of what becomes of them.
+/// Luminance is perceptual. ETC1 is encoded by libetc1. PVRTC is encoded simply: the darkest and the brightest colour
+/// of each block, and for each pixel the nearest mix of the decoded colours.
 /// @param picture  for PVRTC, of power-of-two sides.
 std::vector<uint8_t> encode(const SourcePicture& picture, Format format, bool bigEndian);
 
