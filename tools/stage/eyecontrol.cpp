@@ -14,7 +14,7 @@ namespace
 constexpr size_t FRAMED_MOMENTS = 8;
 constexpr float CLOSER_STEPS = 5.0f;
 
-/// The whole scene in sight, over the whole clip.
+/// Shows the whole scene over the whole clip.
 Orbit findView(Stage& stage, Player& player, int width, int height)
 {
     const float time = player.getTime();

@@ -5,14 +5,14 @@
 namespace view
 {
 
-/// What drawing takes: of the last frame, and frames per second over about the last half second.
+/// Statistics of the last frame, and frames per second over about the last half second.
 class FrameStats
 {
 public:
-    uint64_t draws = 0;   ///< of the last frame, without what is written over it
+    uint64_t draws = 0;   ///< of the last frame, without the overlay
     uint64_t glCalls = 0; ///< likewise
 
-    /// @param seconds  since any fixed moment, when a frame was shown.
+    /// @param seconds  time of the frame, since any fixed moment.
     void addFrame(double seconds)
     {
         if (m_count == 0 || seconds - m_last > LONGEST_FRAME)
@@ -30,7 +30,7 @@ public:
         m_last = seconds;
     }
 
-    /// Nothing moves, so that frames are only drawn now and then.
+    /// Nothing moves: frames are drawn only occasionally.
     void rest()
     {
         m_count = 0;
@@ -43,7 +43,7 @@ private:
     static constexpr double SPAN = 0.5;
     static constexpr double LONGEST_FRAME = 2.0;
 
-    int m_count = 0; ///< since m_first, which is that of a frame
+    int m_count = 0; ///< frames since m_first
     double m_first = 0.0;
     double m_last = 0.0;
     double m_perSecond = 0.0;

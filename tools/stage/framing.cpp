@@ -22,11 +22,11 @@ namespace
 const Vector3f VIEW_DIRECTION(0.5f, 0.4f, 1.0f); // towards the eye
 
 constexpr float FILLED_SHARE = 0.9f;  // of the view, by the scene
-constexpr float GOOD_ENOUGH = 0.005f; // off the centre and off that share together
+constexpr float GOOD_ENOUGH = 0.005f; // sum of the errors of centre and share
 constexpr int MAX_ROUNDS = 8;
 constexpr size_t MAX_SHOTS = 8;
 
-/// Evenly spread, along a spiral from pole to pole.
+/// Evenly distributed on a sphere, along a spiral from pole to pole.
 void spreadOverSphere(float radius, std::vector<Vector3f>& positions)
 {
     constexpr int COUNT = 400;
@@ -40,7 +40,7 @@ void spreadOverSphere(float radius, std::vector<Vector3f>& positions)
     }
 }
 
-/// Where a solid's vertices are in the world now; for one whose mesh keeps none, places all over its bounding sphere.
+/// The current positions of a solid's vertices in the world; if its mesh keeps none, points on its bounding sphere.
 void findPlaces(const orv::Solid& solid, std::vector<Vector3f>& places)
 {
     if (orv::placeVertices(solid, places) || !solid.getMesh())
@@ -50,7 +50,7 @@ void findPlaces(const orv::Solid& solid, std::vector<Vector3f>& places)
         place = (solid.getWorldTransform() * Vector4f(place, 1.0f)).xyz();
 }
 
-/// A box along axes around everything that was added.
+/// An axis-aligned box around everything added.
 struct Extent
 {
     Vector3f lowest;
@@ -73,7 +73,7 @@ struct Extent
     float radius() const { return length(highest - lowest) * 0.5f; } ///< of the sphere around the box
 };
 
-/// Finds the view step by step: what is nearer is larger, so that each step changes what the next one has to fit.
+/// Finds the view iteratively, since perspective changes with each step.
 class Framer
 {
 public:
@@ -134,7 +134,7 @@ void Framer::forEachPlace(const Shot& shot, const Operation& operation)
                  });
 }
 
-/// Where the scene shows in the view: from -1 to 1 from left to right and from bottom to top.
+/// The scene's extent in the view: -1 to 1 from left to right and from bottom to top.
 Extent Framer::findCoverage()
 {
     Extent seen;
@@ -147,7 +147,7 @@ Extent Framer::findCoverage()
         const Vector3f right = axes[0].xyz() / m_halfWidth;
         const Vector3f up = axes[1].xyz() / m_halfHeight;
         const Vector3f back = axes[2].xyz();
-        const float nearest = orbit.distance / 100.0f; // where a camera in this place begins to see
+        const float nearest = orbit.distance / 100.0f; // the near distance of a camera there
         forEachPlace(shot,
                      [&](const Vector3f& place)
                      {
@@ -156,7 +156,7 @@ Extent Framer::findCoverage()
                          seen.add(Vector3f(dot(seenFrom, right) / depth, dot(seenFrom, up) / depth, 0.0f));
                      });
     }
-    if (m_goesAround && !seen.isEmpty) // what it goes around stays in the middle
+    if (m_goesAround && !seen.isEmpty) // the orbited point stays in the centre
     {
         seen.highest.x = std::max(seen.highest.x, -seen.lowest.x);
         seen.lowest.x = -seen.highest.x;

@@ -17,7 +17,7 @@ namespace
 
 constexpr float PI = 3.14159265f;
 constexpr float RADIANS_PER_PIXEL = PI / 360.0f;
-constexpr float MAX_PITCH = PI / 2.0f - 0.001f; // straight from above, left and right have no meaning
+constexpr float MAX_PITCH = PI / 2.0f - 0.001f; // left and right are undefined straight from above
 constexpr float STEP = 0.9f;
 
 } // namespace

@@ -8,7 +8,7 @@
 namespace view
 {
 
-/// A part of the time line that has a name.
+/// A named part of the time line.
 struct Clip
 {
     std::string name;
@@ -23,20 +23,20 @@ public:
     /// @param clips  the first is the whole time line; there is at least that one.
     Player(const orv::SharedPtr<orv::Animation>& animation, std::vector<Clip> clips);
 
-    /// Goes on where another player is, as far as this one has the clip: for a scene that was loaded again.
+    /// Continues at another player's clip and time, if this one has the clip: for a scene that was loaded again.
     void continueFrom(const Player& other);
 
     const std::vector<Clip>& getClips() const { return m_clips; }
     const Clip& getClip() const { return m_clips[m_clip]; }
 
-    /// @return false, with nothing changed, if there is no clip of that name; error then says which there are.
+    /// @return false, with nothing changed, if there is no clip of that name; error then lists the clips.
     bool chooseClip(const std::string& name);
     bool chooseClip(const std::string& name, std::string& error);
-    /// Goes on by a number of clips, round and round, and to the start of that one.
+    /// Goes forward by a number of clips, cyclically, to the start of that clip.
     void stepClip(int count);
 
     float getTime() const { return m_controller.getProgress(); } ///< seconds
-    float getShare() const;                                      ///< of the clip that is over, 0 to 1
+    float getShare() const;                                      ///< elapsed part of the clip, 0 to 1
     bool isPaused() const { return m_controller.isPaused(); }
     bool isLooping() const { return m_controller.isLooping(); }
     float getSpeed() const { return m_controller.getSpeed(); }
@@ -45,12 +45,12 @@ public:
     void update(float seconds); ///< since the last call
     void setPaused(bool paused);
     void setLooping(bool looping) { m_controller.setLooping(looping); }
-    void togglePaused(); ///< at the end of what does not loop: from the start again
+    void togglePaused(); ///< at the end without looping: starts again
     void scaleSpeed(float factor);
 
-    /// Stops and goes a number of frames on, or back, 30 a second; beyond the end at the start while it loops.
+    /// Pauses and goes a number of frames (of 30 a second) forward or back; wraps while it loops.
     void step(int frames);
-    /// Goes a number of seconds on, or back, without stopping; likewise.
+    /// Goes a number of seconds forward or back without pausing; wraps likewise.
     void skip(float seconds);
     void seek(float time);       ///< clamped to the clip
     void seekShare(float share); ///< 0 to 1

@@ -9,7 +9,7 @@
 namespace view
 {
 
-/// The files below a folder, and which of them were asked for: what a scene depends on, whether it is there or not.
+/// The files below a folder, and a record of requests: the files that a scene depends on, missing ones too.
 class RecordingSource : public orv::StreamSource
 {
 public:
@@ -33,7 +33,7 @@ public:
     const std::set<std::string>& getAsked() const { return m_asked; } ///< paths, since the last forget()
     void forget() { m_asked.clear(); }
 
-    /// One that is not used has no files.
+    /// An unused one has no files.
     bool isUsed() const { return m_isUsed; }
     void setUsed(bool used) { m_isUsed = used; }
 

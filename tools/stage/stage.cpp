@@ -27,14 +27,14 @@ const orv::Colour4f BACKGROUND(0.84f, 0.86f, 0.89f, 1.0f);
 constexpr unsigned BALL_SEGMENTS = 48;
 constexpr unsigned BALL_WEDGES = 96;
 
-/// Makes a light shine from a direction to the middle of the world.
+/// Makes a light shine from a direction towards the origin.
 void turnFrom(orv::Light& light, const Vector3f& direction)
 {
     light.setPosition(direction);
     orv::point(light, Vector3f());
 }
 
-/// Whether what a solid looks like changes by itself.
+/// Whether a solid's look changes with time.
 bool takesTime(const orv::Solid& solid)
 {
     const orv::Appearance* appearance = solid.getAppearance().get();
@@ -120,7 +120,7 @@ std::unique_ptr<Stage> Stage::load(Studio& studio, const SceneFile& file, std::s
     forEachSolid(*stage->m_scene, [&](orv::Solid& solid)
                  { stage->m_usesShaderTime = stage->m_usesShaderTime || takesTime(solid); });
     const auto renderer = makeShared<orv::SimpleRenderer>(studio.getContext(), studio.getPool());
-    renderer->setOpaqueGrouped(true);                         // a model's parts come in any order
+    renderer->setOpaqueGrouped(true);                         // a model's parts are in no useful order
     renderer->setCulled(file.dressings.empty() && !isOnBall); // other programs may move vertices about
     stage->m_block = makeShared<orv::RenderBlock>(renderer, stage->m_scene, stage->m_freeCamera);
     stage->m_block->setRenderFlags(orv::SceneNode::VISIBLE);

@@ -17,7 +17,7 @@
 namespace view
 {
 
-/// What the suffix of a file says that it is.
+/// The kind of a file, by its suffix.
 enum class FileKind
 {
     SCENE,    ///< .glo
@@ -28,64 +28,63 @@ enum class FileKind
 
 FileKind getFileKind(const std::string& path);
 
-/// What to show: a scene file, or a material (.ap) or shader program (.sp), which is shown on a ball.
+/// The file to show: a scene, or a material (.ap) or shader program (.sp), which is shown on a ball.
 struct SceneFile
 {
     struct Dressing
     {
         std::string material; ///< of the scene
-        std::string path;     ///< of an appearance file that is put over it
+        std::string path;     ///< of an appearance file that is applied to it
     };
 
     std::string path;
     std::vector<Dressing> dressings;
 };
 
-/// A scene, loaded, with all that it takes to draw it into the current GL context.
+/// A loaded scene with everything needed to draw it into the current GL context.
 ///
-/// A scene without lights gets two of its own. One with lights is left as it is through its own cameras;
-/// through the free one, which those lights may not reach, a weak light comes along with the camera.
+/// A scene without lights gets two of its own. One with lights is unchanged through its own cameras; the free camera,
+/// which may look at unlit places, has a weak light.
 class Stage
 {
 public:
-    /// @param studio  has to stay; textures and programs are looked for beside the files.
+    /// @param studio  has to outlive it; textures and programs are searched beside the files.
     /// @param error   set to "path: reason" on failure; the engine's log has the details.
     static std::unique_ptr<Stage> load(Studio& studio, const SceneFile& file, std::string& error);
 
-    /// Lets go of everything while the GL context is still there.
+    /// Releases everything while the GL context still exists.
     ~Stage();
 
     Stage(const Stage&) = delete;
     Stage& operator=(const Stage&) = delete;
 
-    /// The cameras of the file. @param index  0 up to, without, the count.
+    /// The cameras of the file. @param index  below the count.
     int getCameraCount() const { return m_glo ? m_glo->getCameraCount() : 0; }
     std::string getCameraName(int index) const { return m_glo->getCamera(index)->getName(); }
     void useCamera(int index);
-    /// @return its index; -1, with the cameras that there are in error, if none has that name.
+    /// @return its index; -1, with a list of the cameras in error, if none has that name.
     int findCamera(const std::string& name, std::string& error) const;
 
-    /// The one that is not of the file, to be put anywhere in the world. Looked through at first.
+    /// The free camera, which can be anywhere in the world. Active at first.
     orv::Camera& getFreeCamera() { return *m_freeCamera; }
     void useFreeCamera();
 
-    orv::Camera& getCamera() { return *m_block->getCamera(); } ///< looked through now
+    orv::Camera& getCamera() { return *m_block->getCamera(); } ///< the active one
 
-    /// What shows where the scene does not; a light grey at first.
+    /// The background colour; a light grey at first.
     const orv::Colour4f& getBackground() const { return m_block->getBackground().getColour(); }
     void setBackground(const orv::Colour4f& colour) { m_block->setBackgroundColour(colour); }
 
-    /// All movement of the file.
+    /// All animations of the file.
     const orv::SharedPtr<orv::Animation>& getAnimation() const { return m_animation; }
 
-    /// The whole time line, by the name of an animation that lasts as long or else "all", and the file's other
-    /// animations.
+    /// The whole time line, named after an animation of its length or else "all", and the file's other animations.
     const std::vector<Clip>& getClips() const { return m_clips; }
 
-    /// Whether shaders may show other things as time goes by.
+    /// Whether shaders may change with time.
     bool usesShaderTime() const { return m_usesShaderTime; }
 
-    /// What TIME is in shaders, in seconds.
+    /// TIME in shaders, in seconds.
     void setShaderTime(float time) { m_block->update(time); }
 
     /// Clears and draws a viewport of that size at the lower left.
@@ -93,7 +92,7 @@ public:
 
     orv::SceneNode& getScene() { return *m_scene; }
     Studio& getStudio() { return m_studio; }
-    /// The top of what the file holds, without lights and cameras of the viewer's own.
+    /// The top node of the file, without the viewer's own lights and cameras.
     orv::SceneNode& getTopNode() { return m_glo && m_glo->getTopNode() ? *m_glo->getTopNode() : *m_scene; }
 
 private:
@@ -104,7 +103,7 @@ private:
     bool dress(const SceneFile::Dressing& dressing, std::string& error);
     void findClips();
 
-    /// Adds a light from far away, on the +z side of parent.
+    /// Adds a directional light from the +z side of parent.
     orv::Light::Ptr addLight(const orv::SceneNode::Ptr& parent, float intensity, float ambientLevel);
 
     Studio& m_studio;
@@ -114,7 +113,7 @@ private:
     orv::SharedPtr<orv::Animation> m_animation;
     std::vector<Clip> m_clips;
     orv::Camera::Ptr m_freeCamera;
-    orv::Light::Ptr m_cameraLight; ///< the free camera's; empty where the scene needs none
+    orv::Light::Ptr m_cameraLight; ///< the free camera's; empty if the scene needs none
     bool m_usesShaderTime = false;
 };
 

@@ -13,13 +13,13 @@
 namespace view
 {
 
-/// What there is one of for a GL context, whichever scenes are shown in it one after another.
+/// The objects shared by all scenes of a GL context.
 class Studio
 {
 public:
     Studio();
 
-    /// Deletes all GL objects; every stage is gone by then.
+    /// Deletes all GL objects; all stages must be deleted before.
     ~Studio();
 
     Studio(const Studio&) = delete;
@@ -28,21 +28,21 @@ public:
     const orv::RenderContext::Ptr& getContext() const { return m_context; }
     const orv::SharedPtr<orv::AssetCachePool>& getPool() const { return m_pool; }
 
-    /// Assets are looked for in this folder too from now on, after those that were added before.
+    /// Adds a folder to the search path of assets, as the last one.
     void addFolder(const std::string& folder);
 
-    /// The folders in which assets are looked for.
+    /// The search path of assets.
     std::set<std::string> getFolders() const;
-    /// Assets are looked for in those of the added folders alone that are among these.
+    /// Restricts the search path to these of the added folders.
     void limitFolders(const std::set<std::string>& folders);
 
-    /// What is asked for from now on is read from its file again. Assets that a stage holds stay with it.
+    /// From now on, assets are read from their files again. A stage keeps the assets that it holds.
     void forgetAssets();
 
-    /// Deletes the GL objects of what is no longer held.
+    /// Deletes the GL objects of unused assets.
     void flush();
 
-    /// The files that were asked for since forgetAssets(), those that do not exist as well.
+    /// The files requested since forgetAssets(), missing ones too.
     std::set<std::string> getAskedFiles() const;
 
 private:

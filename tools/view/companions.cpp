@@ -15,8 +15,8 @@ namespace
 {
 
 constexpr int MAX_DEPTH = 2;                 // folders within folders
-constexpr size_t MAX_FILES = 2000;           // a folder with more is not one of a model alone
-constexpr uintmax_t MAX_TEXT_SIZE = 1 << 20; // bytes of a file other than the model that is looked into
+constexpr size_t MAX_FILES = 2000;           // a folder with more is not a model's folder
+constexpr uintmax_t MAX_TEXT_SIZE = 1 << 20; // bytes of a text file that is searched
 
 std::string read(const fs::path& path)
 {

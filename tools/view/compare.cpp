@@ -19,7 +19,7 @@ namespace view
 namespace
 {
 
-constexpr int GAIN = 8; // a channel that is off by 32 shows as white
+constexpr int GAIN = 8; // a difference of 32 shows as full intensity
 
 } // namespace
 

@@ -36,7 +36,7 @@ std::string findConverter()
     return CONVERTER;
 }
 
-/// An interrupt from the keyboard reaches the child as well: this program waits for its end and clears up.
+/// Ignores keyboard interrupts, which reach the child too: this program waits for its end and cleans up.
 class InterruptsIgnored
 {
 public:
@@ -64,7 +64,7 @@ private:
 /// @return its exit code; 0 to 255, more for a signal that ended it, negative with errno for no program.
 int runProgram(const std::vector<std::string>& words)
 {
-    std::vector<std::string> copies = words; // the function wants them writable
+    std::vector<std::string> copies = words; // posix_spawn takes writable strings
     std::vector<char*> arguments;
     arguments.reserve(copies.size() + 1);
     for (std::string& word : copies)

@@ -7,8 +7,7 @@
 namespace view
 {
 
-/// A model that is no scene file, and the scene that orv-convert makes of it in a folder of its own, which goes
-/// away with this object.
+/// A model, and the scene that orv-convert makes from it in a temporary folder, which this object removes.
 class ConvertedModel
 {
 public:
@@ -27,7 +26,7 @@ public:
 
     const std::string& getScenePath() const { return m_scene; }
 
-    /// Whether a path is that of something in the folder.
+    /// Whether a path is inside the folder.
     bool isMade(const std::string& path) const
     {
         return path.compare(0, m_folder.size() + 1, m_folder + "/") == 0;

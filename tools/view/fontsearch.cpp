@@ -13,7 +13,7 @@ namespace fs = std::filesystem;
 namespace
 {
 
-/// The first is the one to take.
+/// In order of preference.
 const char* const KNOWN_FILES[] = {"DejaVuSans.ttf",
                                    "LiberationSans-Regular.ttf",
                                    "NotoSans-Regular.ttf",

@@ -120,7 +120,7 @@ void HeadsUp::draw(int width, int height)
         layOut();
     const orv::RenderContext::DrawScope scope(*m_context);
     if (!m_rows.empty())
-        m_panel.enable(*m_context); // the table is read, not looked through
+        m_panel.enable(*m_context); // a background, so that the table is readable
     m_shadow->draw(*m_context);
     m_ink->draw(*m_context);
 }

@@ -13,7 +13,7 @@
 namespace view
 {
 
-/// What is written over the picture: lines at the top, a message at the bottom, and a table over all that.
+/// The text over the picture: lines at the top, a message at the bottom, and a table over everything.
 class HeadsUp
 {
 public:
@@ -25,8 +25,8 @@ public:
 
     /// @param context  of the picture; shared.
     /// @param font     a TrueType file.
-    /// @param size     of the writing in pixels.
-    /// @return empty, after the log has told why, if the font cannot be used.
+    /// @param size     of the text in pixels.
+    /// @return empty, after logging why, if the font cannot be used.
     static std::unique_ptr<HeadsUp> create(const orv::RenderContext::Ptr& context, const std::string& font,
                                            unsigned size);
 
@@ -34,15 +34,15 @@ public:
     HeadsUp(const HeadsUp&) = delete;
     HeadsUp& operator=(const HeadsUp&) = delete;
 
-    /// @return whether that is something else than before, so that it has to be drawn.
+    /// @return whether it has changed and has to be drawn.
     bool setLines(const std::string& lines);
     bool setMessage(const std::string& message);
     void setTable(const std::vector<Row>& rows); ///< empty for none
 
-    /// How many rows a table of that height has room for.
+    /// The number of rows of a table of that height.
     int countRows(int height) const;
 
-    /// Draws over a viewport of that size. Only what has changed since is laid out again.
+    /// Draws over a viewport of that size. Only changed parts are laid out again.
     void draw(int width, int height);
 
 private:
@@ -51,11 +51,11 @@ private:
     void write(const char* text, float x, float y);
 
     orv::RenderContext::Ptr m_context;
-    orv::SharedPtr<orv::AssetCachePool> m_pool; ///< of its own: that of the scene comes and goes
+    orv::SharedPtr<orv::AssetCachePool> m_pool; ///< a separate one: the scene's may be replaced
     orv::Background m_panel;
     orv::Font::Ptr m_font;
     orv::Text::Ptr m_ink;
-    orv::Text::Ptr m_shadow; ///< around it, so that it can be read on anything
+    orv::Text::Ptr m_shadow; ///< outline, so that it is readable on any background
     std::string m_lines;
     std::string m_message;
     std::vector<Row> m_rows;

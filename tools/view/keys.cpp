@@ -26,7 +26,7 @@ struct Binding
     std::vector<int32_t> keys;
 };
 
-/// Keys that are told about in one row.
+/// Keys listed in one row.
 struct Group
 {
     HeadsUp::Row row;
@@ -49,7 +49,7 @@ const std::vector<Group>& getGroups()
           {Command::GO_TO_END, {key::END}},
           {Command::GO_TO_TENTH, {'0', '1', '2', '3', '4', '5', '6', '7', '8', '9'}}}},
         {{"+ -", "twice and half as fast"},
-         {{Command::FASTER, {'+', '=', key::KEYPAD_PLUS}}, // = where the + is on the same key
+         {{Command::FASTER, {'+', '=', key::KEYPAD_PLUS}}, // = for keyboards that have + on the same key
           {Command::SLOWER, {'-', key::KEYPAD_MINUS}}}},
         {{"l", "loop, or stop at the end"}, {{Command::TOGGLE_LOOPING, {'l'}}}},
         {{"n, shift + n", "next and previous clip"}, {{Command::STEP_CLIP, {'n'}}}},

@@ -8,7 +8,7 @@
 namespace view
 {
 
-/// What a key of the viewer's window does.
+/// The commands of keys in the viewer's window.
 enum class Command
 {
     NONE,
@@ -21,12 +21,12 @@ enum class Command
     SKIP_BACK,
     GO_TO_START,
     GO_TO_END,
-    GO_TO_TENTH, ///< by the digit
+    GO_TO_TENTH, ///< the pressed digit
     FASTER,
     SLOWER,
     TOGGLE_LOOPING,
     STEP_CLIP,       ///< backwards with shift
-    SAVE_SCREENSHOT, ///< with the writing, with shift
+    SAVE_SCREENSHOT, ///< with shift: including the text
     STEP_BACKGROUND,
     TOGGLE_BOUNDS,
     TOGGLE_SKELETONS,
@@ -34,7 +34,7 @@ enum class Command
     TOGGLE_GRID,
     TOGGLE_WIREFRAME,
     TOGGLE_SHADOWS,
-    HIDE, ///< what is under the pointer; everything shown again, with shift
+    HIDE, ///< the node under the pointer; with shift: show all again
     TOGGLE_TREE,
     TREE_UP,
     TREE_DOWN,
@@ -48,7 +48,7 @@ enum class Command
 /// @param key  of a window::Event.
 Command findCommand(int32_t key);
 
-/// Every key, and what the mouse does, with what they mean, as the window shows them. docs/view.md has the same rows.
+/// All keys and mouse actions with their meanings, as shown in the window. docs/view.md has the same rows.
 std::vector<HeadsUp::Row> listKeys();
 
 } // namespace view

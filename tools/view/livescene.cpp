@@ -39,7 +39,7 @@ bool LiveScene::open(const SceneFile& file, ConvertedModel* conversion, std::str
         before.path = m_model;
     ConvertedModel* const conversionBefore = m_conversion;
     const std::set<std::string> folders = m_studio.getFolders();
-    m_studio.limitFolders({}); // files of the same name in the other file's folder are others
+    m_studio.limitFolders({}); // the other file's folder may have files of the same name
     setFile(file, conversion);
     std::unique_ptr<Stage> stage = loadStage(error);
     if (!stage)
@@ -59,7 +59,7 @@ std::unique_ptr<Stage> LiveScene::loadStage(std::string& error)
     m_studio.forgetAssets();
     loadlog::reset();
     std::unique_ptr<Stage> stage = Stage::load(m_studio, m_file, error);
-    m_studio.flush(); // what a load that failed has left
+    m_studio.flush(); // left over from a failed load
     return stage;
 }
 
@@ -77,7 +77,7 @@ void LiveScene::takeStage(std::unique_ptr<Stage> stage)
     m_errorCount = loadlog::getErrorCount();
 }
 
-/// @param isLoaded  all that the scene needs is known; otherwise what was needed before may be needed again.
+/// @param isLoaded  if false, the files needed before may be needed again.
 void LiveScene::watchFiles(bool isLoaded)
 {
     std::set<std::string> files = isLoaded ? std::set<std::string>() : m_watched;

@@ -15,31 +15,30 @@
 namespace view
 {
 
-/// What is shown, as its files are at the moment: loaded again when they change, unless they are broken.
-/// GL thread only; the GL context has to outlive it.
+/// The shown scene, loaded again when its files change, unless they are broken. GL thread only; the GL context has to
+/// outlive it.
 class LiveScene
 {
 public:
-    /// @param conversion  of a model that is no scene file, null for others; borrowed.
+    /// @param conversion  for a model that is converted, else null; borrowed.
     LiveScene(const SceneFile& file, ConvertedModel* conversion);
     ~LiveScene() = default;
 
     LiveScene(const LiveScene&) = delete;
     LiveScene& operator=(const LiveScene&) = delete;
 
-    /// The first time. @return false if there is nothing to show; nothing else may be asked for then.
+    /// The first load. @return false if there is nothing to show; no other function may be called then.
     bool load(std::string& error);
 
-    /// Shows another file from now on, played from its start.
-    /// @return false, with everything as it was, if it cannot be loaded.
+    /// Shows another file, played from its start.
+    /// @return false, with nothing changed, if it cannot be loaded.
     bool open(const SceneFile& file, ConvertedModel* conversion, std::string& error);
 
-    /// Whether a file that matters has changed since the last load. Ask a few times a second.
+    /// Whether a file of the scene has changed since the last load. Call it a few times a second.
     bool hasChanged() { return m_watcher.hasChanged(); }
 
-    /// Stage and player are others afterwards. What was played goes on where it was, as far as the new scene has it;
-    /// the background stays.
-    /// @return false, with everything as it was, if the files are broken, or have more wrong with them than before.
+    /// Replaces stage and player. Playing continues at the same place if the new scene has it; the background stays.
+    /// @return false, with nothing changed, if the load fails or logs more errors than the last one.
     bool reload(std::string& error);
 
     Studio& getStudio() { return m_studio; }
@@ -60,7 +59,7 @@ private:
     std::unique_ptr<Stage> m_stage;
     std::unique_ptr<Player> m_player;
     uint64_t m_triangleCount = 0;
-    int m_errorCount = 0; ///< logged by the load of what is shown
+    int m_errorCount = 0; ///< logged by the load of the shown scene
     Watcher m_watcher;
     std::set<std::string> m_watched;
 };

@@ -2,13 +2,13 @@
 
 #include <string>
 
-/// The engine's log, as a viewer wants it: errors and warnings go on to standard error, what is merely of interest
-/// does not, and errors are counted, since a material that cannot be read fails no load.
+/// The viewer's log function: passes errors and warnings, but not information, to standard error, and counts errors,
+/// since a bad material does not fail a load.
 namespace view::loadlog
 {
 
-void start();             ///< sends the engine's log through here
-void reset();             ///< none counted
+void start();             ///< installs it
+void reset();             ///< sets the count to 0
 int getErrorCount();      ///< since reset()
 std::string getMessage(); ///< the first of them; "" if there was none
 

@@ -34,7 +34,7 @@ constexpr int MOST_GRID_CELLS = 200;
 constexpr const char* NAMES[] = {"bounds", "skeletons", "axes", "grid", "wireframe", "shadows"};
 static_assert(std::size(NAMES) == size_t(Marking::COUNT));
 
-/// The same place and directions, a unit long each.
+/// The same position and directions, with unit length.
 Matrix4f withoutScale(const Matrix4f& transform)
 {
     Matrix4f made = transform;
@@ -170,7 +170,7 @@ void Markings::draw(Stage& stage, int width, int height)
     m_above->draw(*m_context, stage.getCamera());
 }
 
-/// Materials take shadows for as long as they are shown.
+/// Materials receive shadows while they are shown.
 void Markings::drawShadows(Stage& stage)
 {
     if (!shows(Marking::SHADOWS))
@@ -183,7 +183,7 @@ void Markings::drawShadows(Stage& stage)
     m_shadows->render(stage.getScene(), &stage.getCamera(), SceneNode::VISIBLE, SceneNode::VISIBLE);
 }
 
-/// Solids have their edges for as long as the picture is drawn, so that materials, joints and all else are as ever.
+/// Replaces the meshes of solids by their edges during drawing; materials, joints and all else are unchanged.
 void Markings::drawWireframe(Stage& stage, int width, int height)
 {
     std::vector<std::pair<Solid*, orv::SharedPtr<orv::Mesh>>> changed;
@@ -254,7 +254,7 @@ void Markings::addAxes(Stage& stage)
                 { m_above->addAxes(withoutScale(node.getWorldTransform()), length); });
 }
 
-/// At the height of 0, or below a scene that stands higher.
+/// At height 0, or directly below a scene above that.
 void Markings::addGrid()
 {
     const float cell = findCell(m_low, m_high);

@@ -17,23 +17,23 @@ namespace view
 
 class Stage;
 
-/// What can be shown of a scene beside its picture.
+/// Debug views of a scene.
 enum class Marking
 {
     BOUNDS,    ///< a box around each solid
-    SKELETONS, ///< joints, or nodes where there are none
+    SKELETONS, ///< joints, or nodes if there are none
     AXES,      ///< of each node
     GRID,      ///< the ground
-    WIREFRAME, ///< the edges of triangles in place of the triangles
+    WIREFRAME, ///< the edges of triangles instead of the triangles
     SHADOWS,   ///< of the first directional or spot light
     COUNT
 };
 
-/// By its name on the command line. @return COUNT if there is none of that name.
+/// By its name on the command line. @return COUNT for an unknown name.
 Marking findMarking(const std::string& name);
 std::string listMarkings(); ///< "bounds, skeletons, ..."
 
-/// Draws a stage, and over it what was asked for. GL thread only; the GL context has to outlive it.
+/// Draws a stage and the selected views over it. GL thread only; the GL context has to outlive it.
 class Markings
 {
 public:
@@ -53,14 +53,14 @@ public:
     /// Clears and draws a viewport of that size at the lower left.
     void draw(Stage& stage, int width, int height);
 
-    /// Lets go of what it knows of a stage, which is about to be replaced by another one.
+    /// Drops all references to a stage that is about to be replaced.
     void forget();
 
 private:
-    /// The same vertices once more, as the edges of their triangles.
+    /// The same vertices with indices of the triangles' edges.
     struct Edges
     {
-        orv::SharedPtr<orv::Mesh> triangles; ///< held, so that its address stays its own
+        orv::SharedPtr<orv::Mesh> triangles; ///< held, so that its address is not reused
         orv::SharedPtr<orv::Mesh> lines;
     };
 
@@ -74,14 +74,14 @@ private:
     void measure(Stage& stage);
 
     orv::RenderContext::Ptr m_context;
-    orv::SharedPtr<orv::AssetCachePool> m_pool; ///< of its own: that of the scene comes and goes
-    orv::DebugLines::Ptr m_inside;              ///< what solids may hide
-    orv::DebugLines::Ptr m_above;               ///< what they may not
+    orv::SharedPtr<orv::AssetCachePool> m_pool; ///< a separate one: the scene's may be replaced
+    orv::DebugLines::Ptr m_inside;              ///< may be hidden by solids
+    orv::DebugLines::Ptr m_above;               ///< drawn over everything
     orv::ShadowMap::Ptr m_shadows;              ///< of the stage, while they are shown
     std::array<bool, size_t(Marking::COUNT)> m_shown{};
     std::map<const orv::Mesh*, Edges> m_edges;
     bool m_isMeasured = false;
-    orv::Vector3f m_low; ///< of the stage in the world, as it stood when it was measured
+    orv::Vector3f m_low; ///< of the stage in the world, when it was measured
     orv::Vector3f m_high;
 };
 

@@ -39,7 +39,7 @@ Examples:
 
 Exit codes: 0 done, 1 failed or too different, 2 wrong command line.)";
 
-/// "800x600". @return "" or what is wrong, as CLI11 asks for.
+/// "800x600". @return "" or the error, as CLI11 expects.
 std::string parsePair(const std::string& text, const char* what, int most, int& first, int& second)
 {
     char beyond = 0;
@@ -180,7 +180,7 @@ void addPictureOptions(CLI::App& app, Options& options)
         option->needs(out)->group(group);
 }
 
-/// What CLI11 cannot say of options together.
+/// Rules for combinations of options, which CLI11 cannot express.
 std::string findConflict(const Options& options)
 {
     const bool isNumbered = options.columns == 0 && options.frames + options.turntable > 0;

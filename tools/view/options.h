@@ -14,10 +14,10 @@
 namespace view
 {
 
-/// What a command line asks for.
+/// The options of a command line.
 struct Options
 {
-    SceneFile scene; ///< as it was named; a model until it is converted
+    SceneFile scene; ///< as named; a model until it is converted
     std::vector<std::string> converterArguments;
 
     int width = 800; ///< of the window, or of a picture, in pixels
@@ -26,7 +26,7 @@ struct Options
     std::string camera;   ///< "" for the free one
     std::string clip;     ///< "" for the whole time line
     std::optional<orv::Colour4f> background;
-    std::vector<Marking> markings; ///< to be shown, each once
+    std::vector<Marking> markings; ///< to show, each once
 
     std::string out;   ///< "" opens a window, "-" is standard output
     float time = 0.0f; ///< seconds from the start of the clip
@@ -39,11 +39,11 @@ struct Options
     Tolerance tolerance;
     bool wantsStats = false;
 
-    std::string font; ///< "" for the best there is
+    std::string font; ///< "" for the best available
 };
 
-/// @param exitCode  of the program, if there is nothing to be done: help was asked for, or the line was wrong.
-/// @return whether there is something to be done.
+/// @param exitCode  of the program if there is nothing to do, after --help or an error.
+/// @return whether there is something to do.
 bool parseCommandLine(int argumentCount, char** arguments, Options& options, int& exitCode);
 
 /// "#rrggbb", "#rgb", or one of a few names. @return false if it is none of them.

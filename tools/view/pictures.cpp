@@ -217,11 +217,11 @@ bool Session::draw(const Shot& shot, PngPicture& picture, std::string& error)
     }
     picture = {m_options.width, m_options.height, m_context.readPixels()};
     for (size_t i = 3; i < picture.rgba.size(); i += 4)
-        picture.rgba[i] = 255; // what blending leaves in alpha would show as holes
+        picture.rgba[i] = 255; // blending may leave alpha below 1, which would show as holes
     return true;
 }
 
-/// @param whole  set to the one picture that there is in the end, or to the last of those with numbers.
+/// @param whole  set to the only picture, or to the last of several.
 bool Session::drawAll(PngPicture& whole, std::string& error)
 {
     const bool isSheet = m_options.columns > 0;

@@ -21,10 +21,10 @@ namespace view
 /// "60 fps   3 draws   4,212 triangles   20 GL calls"
 std::string describeFrame(const FrameStats& stats, uint64_t triangleCount);
 
-/// The clip, where in it the player is, and how it goes on; "" for what does not move.
+/// The clip, the player's position and state; "" if nothing moves.
 std::string describeClip(const Player& player);
 
-/// A row for each node of a tree, its name indented below its parent's; what it is, and whether it or one above is hidden.
+/// A row for each node of a tree: its indented name, its kind, and whether it or an ancestor is hidden.
 std::vector<HeadsUp::Row> listNodes(const orv::SceneNode& top);
 
 } // namespace view

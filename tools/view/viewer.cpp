@@ -27,12 +27,12 @@ using namespace std::chrono_literals;
 namespace
 {
 
-constexpr auto LOOK_INTERVAL = 150ms;    // at the files
-constexpr auto WRITING_INTERVAL = 200ms; // what stands over the picture, while it moves
+constexpr auto LOOK_INTERVAL = 150ms;    // between polls of the files
+constexpr auto WRITING_INTERVAL = 200ms; // between updates of the text, while something moves
 constexpr auto MESSAGE_TIME = 4s;
-constexpr auto SHORTEST_FRAME = 4ms;        // where the driver does not wait for the screen
+constexpr auto SHORTEST_FRAME = 4ms;        // if the driver does not wait for the display
 constexpr float SKIP_SHARE = 0.05f;         // of the clip, with the arrow keys
-constexpr float LONGEST_STEP = 0.25f;       // seconds, of what is played
+constexpr float LONGEST_STEP = 0.25f;       // seconds of playing
 constexpr float SHADER_TIME_SPAN = 3600.0f; // seconds; more would be too coarse for floats
 constexpr unsigned FONT_SIZE = 17;
 
@@ -41,7 +41,7 @@ const orv::Colour4f BACKGROUNDS[] = {{0.84f, 0.86f, 0.89f, 1.0f},
                                      {1.0f, 1.0f, 1.0f, 1.0f},
                                      {0.0f, 0.0f, 0.0f, 1.0f}};
 
-/// The first name on the way up, since the parts of a node have none.
+/// The first name upwards, since the parts of a node have none.
 const char* findName(const orv::SceneNode& node)
 {
     for (const orv::SceneNode* above = &node; above; above = above->getParent())
@@ -62,7 +62,7 @@ Viewer::Viewer(const Options& options, ConvertedModel* conversion)
 
 Viewer::~Viewer()
 {
-    m_headsUp.reset(); // all before the window, with whose GL they are
+    m_headsUp.reset(); // before the window, which has their GL context
     m_markings.reset();
     m_underPointer.reset();
     m_scene.reset();
@@ -256,7 +256,7 @@ void Viewer::scrollTree(int rows)
     fillTable();
 }
 
-/// The keys, or that part of the tree that the window has room for.
+/// The keys, or the visible part of the tree.
 void Viewer::fillTable()
 {
     if (!m_headsUp)
@@ -275,7 +275,7 @@ void Viewer::fillTable()
     m_headsUp->setTable(rows);
 }
 
-/// Shows another file. What is shown stays if that one cannot be.
+/// Shows another file, or keeps the current one if that fails.
 void Viewer::open(const std::string& path)
 {
     std::string error;

@@ -18,13 +18,13 @@
 namespace view
 {
 
-/// The window and what can be done in it.
+/// The window and its commands.
 ///
-/// It draws only while something moves: the scene, a hand, or what is written over the picture.
+/// It draws only while something changes: the scene, the view, or the text.
 class Viewer
 {
 public:
-    /// @param conversion  of the model that is looked at, null for a scene; borrowed.
+    /// @param conversion  of the shown model, null for a scene; borrowed.
     Viewer(const Options& options, ConvertedModel* conversion);
     ~Viewer();
 
@@ -76,7 +76,7 @@ private:
 
     Options m_options;
     ConvertedModel* m_conversion;
-    std::unique_ptr<ConvertedModel> m_dropped; ///< of the file that was dropped last, if it is a model
+    std::unique_ptr<ConvertedModel> m_dropped; ///< of the last dropped file, if it is a model
     std::unique_ptr<window::Window> m_window;
     std::unique_ptr<LiveScene> m_scene;
     std::unique_ptr<Markings> m_markings;

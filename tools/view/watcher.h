@@ -8,16 +8,16 @@
 namespace view
 {
 
-/// Tells when files have changed on disk, by their times, sizes and identities.
+/// Detects changes of files on disk, by their times, sizes and inode numbers.
 class Watcher
 {
 public:
-    /// These files from now on, which need not exist. One that was watched before counts as changed if it has
-    /// changed since hasChanged() was last asked; so nothing is missed that happens while files are loaded.
+    /// Watches these files from now on; they need not exist. A file watched before counts as changed if it has changed
+    /// since the last hasChanged(); so no change during a load is missed.
     void watch(const std::set<std::string>& paths);
 
-    /// Looks at the files. A change counts once nothing has happened between two looks, so that a file which is
-    /// written in pieces is not taken half. Ask a few times a second.
+    /// Polls the files. A change is reported when two polls in a row see the same state, so that half-written files are
+    /// not read. Call it a few times a second.
     bool hasChanged();
 
 private:
@@ -25,7 +25,7 @@ private:
     {
         int64_t seconds = 0;
         int64_t nanoseconds = 0;
-        int64_t size = -1; ///< there is no such file
+        int64_t size = -1; ///< -1: there is no such file
         uint64_t identity = 0;
 
         bool operator==(const Stamp&) const = default;
