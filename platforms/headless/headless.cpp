@@ -73,7 +73,7 @@ struct Made
     EGLContext context = EGL_NO_CONTEXT;
 };
 
-/// Destroys what there is of it. The display stays initialised: it is shared by all contexts of the process.
+/// Destroys its objects. The display stays initialised: all contexts of the process share it.
 void destroy(const Made& made)
 {
     if (made.context != EGL_NO_CONTEXT)
@@ -121,7 +121,7 @@ bool makeOn(EGLDisplay display, const Options& options, Made& made, std::string&
     return false;
 }
 
-/// Tries the platforms in order; error tells what went wrong on each.
+/// Tries the platforms in order; error has the reason for each.
 bool makeAnywhere(const Options& options, Made& made, std::string& error)
 {
     struct Platform
@@ -150,12 +150,12 @@ bool makeAnywhere(const Options& options, Made& made, std::string& error)
     return false;
 }
 
-/// Reads a surface with several samples per pixel by way of a texture: a copy mixes the samples, whereas
-/// glReadPixels on Mesa's off-screen surfaces picks one of them. Leaves another framebuffer bound.
+/// Reads a multisampled surface through a texture: a copy resolves the samples, whereas glReadPixels on Mesa's
+/// off-screen surfaces picks one of them. Leaves another framebuffer bound.
 std::vector<uint8_t> readResolved(int width, int height)
 {
     GLint boundTexture = 0;
-    GLint alphaBits = 0; // a window's surface may have none, and what it lacks cannot be copied
+    GLint alphaBits = 0; // a window's surface may have none; then alpha cannot be copied
     GLuint texture = 0;
     GLuint framebuffer = 0;
     glGetIntegerv(GL_TEXTURE_BINDING_2D, &boundTexture);
@@ -181,7 +181,7 @@ std::unique_ptr<Context> Context::create(const Options& options, std::string& er
     if (options.width <= 0 || options.height <= 0)
     {
         error = "a surface of " + std::to_string(options.width) + " x " + std::to_string(options.height) +
-                " pixels cannot be";
+                " pixels cannot be made";
         return nullptr;
     }
     Made made;

@@ -1,4 +1,4 @@
-// What the page's script calls. Strings that are returned stay until the next call that returns one.
+// The functions for the page's script. A returned string is valid until the next call that returns one.
 
 #include "webviewer.h"
 
@@ -24,7 +24,7 @@ std::string& getAnswer()
     return answer;
 }
 
-/// Adds a text as JSON has it. What is no UTF-8 is left to the script, which puts a mark in its place.
+/// Adds a JSON string. The script replaces invalid UTF-8.
 void addText(std::string& json, const std::string& text)
 {
     static const char HEX[] = "0123456789abcdef";
@@ -41,7 +41,7 @@ void addText(std::string& json, const std::string& text)
     json += '"';
 }
 
-/// Adds an array of what write(i) adds for each number below count.
+/// Adds an array of count elements, each written by write(i).
 template <class Write>
 void addArray(std::string& json, int count, const Write& write)
 {
@@ -88,7 +88,7 @@ void addScene(std::string& json)
              [&](int i) { addText(json, viewer.getStage().getCameraName(i)); });
 }
 
-/// Does nothing where no scene is open, so that the script need not ask each time.
+/// Does nothing without an open scene, so that the script need not check.
 template <class Operation>
 void withScene(const Operation& operation)
 {
@@ -134,7 +134,7 @@ extern "C"
         getViewer().close();
     }
 
-    /// What is open, as JSON: error and remarks of the load, files that it missed; of a scene also parts, triangles, clips and
+    /// The result of the load as JSON: error, remarks and missing files; for a scene also parts, triangles, clips and
     /// cameras.
     EMSCRIPTEN_KEEPALIVE const char* orvDescribe()
     {
@@ -200,7 +200,7 @@ extern "C"
         getViewer().setBackground(orv::Colour4f(r, g, b, 1.0f));
     }
 
-    /// @param index  of the file's; -1, or any that there is not, for the free one.
+    /// @param index  of the file's cameras; any other number selects the free one.
     EMSCRIPTEN_KEEPALIVE void orvUseCamera(int index)
     {
         withScene(
@@ -213,7 +213,7 @@ extern "C"
         return getViewer().isOpen() ? getViewer().getCamera() : -1;
     }
 
-    /// Goes on by a number of clips, round and round.
+    /// Goes forward by a number of clips, cyclically.
     EMSCRIPTEN_KEEPALIVE void orvStepClip(int count)
     {
         withScene([=](web::WebViewer& viewer) { viewer.getPlayer().stepClip(count); });

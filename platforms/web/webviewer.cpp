@@ -18,7 +18,7 @@ namespace
 {
 
 constexpr size_t MOST_REMARKS = 50;
-constexpr float LONGEST_STEP = 0.25f;       // seconds, of what is played
+constexpr float LONGEST_STEP = 0.25f;       // seconds of playing
 constexpr float SHADER_TIME_SPAN = 3600.0f; // seconds; more would be too coarse for floats
 const orv::Colour4f BACKGROUND(0.84f, 0.86f, 0.89f, 1.0f);
 
@@ -53,7 +53,7 @@ bool WebViewer::makeContext()
 {
     EmscriptenWebGLContextAttributes attributes;
     emscripten_webgl_init_context_attributes(&attributes);
-    attributes.alpha = false; // the page does not show through
+    attributes.alpha = false; // the canvas is opaque
     attributes.stencil = true;
     attributes.majorVersion = 1;
     m_context = int(emscripten_webgl_create_context(m_canvas.c_str(), &attributes));
@@ -66,7 +66,7 @@ bool WebViewer::makeContext()
 void WebViewer::loseContext()
 {
     if (m_studio)
-        m_studio->getPool()->forgetContext(); // so that nothing is deleted that is not there
+        m_studio->getPool()->forgetContext(); // so that no lost object is deleted
     m_stage.reset();
     m_studio.reset();
     if (m_context > 0)
@@ -78,7 +78,7 @@ bool WebViewer::restoreContext()
 {
     if (!makeContext())
     {
-        m_error = "the browser does not give the graphics back";
+        m_error = "the browser does not restore the WebGL context";
         return false;
     }
     return m_path.empty() || load();
@@ -89,7 +89,7 @@ bool WebViewer::open(const std::string& path)
     close();
     if (!m_studio)
     {
-        m_error = "there are no graphics at the moment";
+        m_error = "the WebGL context is lost";
         return false;
     }
     m_path = path;
@@ -112,7 +112,7 @@ void WebViewer::close()
     m_shaderTime = 0.0f;
     if (!m_studio)
         return;
-    m_studio->limitFolders({}); // files of the same name in another scene's folder are others
+    m_studio->limitFolders({}); // another scene's folder may have files of the same name
     m_studio->forgetAssets();
     m_studio->flush();
 }
@@ -123,7 +123,7 @@ bool WebViewer::load()
     m_remarks.clear();
     m_studio->forgetAssets();
     m_stage = view::Stage::load(*m_studio, {m_path, {}}, m_error);
-    m_studio->flush(); // what a load that failed has left
+    m_studio->flush(); // left over from a failed load
     if (!m_stage)
     {
         m_player.reset();

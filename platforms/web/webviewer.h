@@ -14,14 +14,14 @@
 namespace web
 {
 
-/// One scene on the canvas of a page, and the eye that looks at it.
+/// One scene on the canvas of a page, and its camera.
 ///
-/// The files of a scene are put into the file system of the program's memory first. Nothing is drawn but by draw(): the
-/// page asks for a frame where something has changed or moves.
+/// The page first writes the files of a scene into the program's in-memory file system. Only draw() draws: the page
+/// requests a frame when something changes or moves.
 class WebViewer
 {
 public:
-    /// What the engine had to say about a load.
+    /// The engine's messages about a load.
     struct Remark
     {
         bool isError;
@@ -34,18 +34,18 @@ public:
     WebViewer(const WebViewer&) = delete;
     WebViewer& operator=(const WebViewer&) = delete;
 
-    /// Makes the canvas draw. @param canvas  a CSS selector, of an element without a context so far.
+    /// Makes the canvas's context. @param canvas  a CSS selector, of an element without a context.
     /// @return false if the browser has no WebGL for it.
     bool start(const std::string& canvas);
 
-    /// The context is gone, with all that it held; draw() does nothing from here on.
+    /// The context is lost; draw() does nothing from now on.
     void loseContext();
-    /// It is there again: loads the scene once more and goes on where it was, eye, clip, time and all.
+    /// The context is restored: loads the scene again and continues with the same eye, clip and time.
     /// @return false, with nothing shown, if that failed.
     bool restoreContext();
 
-    /// Shows a scene, a material or a shader program in place of what was shown.
-    /// @param path  in the program's memory; what the file names is looked for beside it.
+    /// Shows a scene, a material or a shader program.
+    /// @param path  in the in-memory file system; files that it names are searched beside it.
     /// @return false, with the reason in getError() and nothing shown, if it cannot be loaded.
     bool open(const std::string& path);
     void close();
@@ -53,21 +53,21 @@ public:
 
     const std::string& getError() const { return m_error; }
     const std::vector<Remark>& getRemarks() const { return m_remarks; }
-    /// Files that the scene asked for and that were not there: what to look for elsewhere, and variants that need not be.
+    /// Missing files that the scene requested, including optional variants.
     std::vector<std::string> listMissing() const;
 
     void setSize(int width, int height); ///< of the canvas, in pixels
 
-    /// Goes on by some time and draws. @param seconds  since the last call; less is played where that is long ago.
-    /// @return whether something moves, so that the next frame would show something else.
+    /// Advances the time and draws. @param seconds  since the last call; long times are shortened.
+    /// @return whether something moves, so that the next frame would differ.
     bool draw(float seconds);
 
-    /// What the last draw() took.
+    /// Statistics of the last draw().
     const orv::FrameCounters& getCounters() const { return m_counters; }
     long getTriangleCount() const { return m_triangles; }
     int getPartCount() const { return m_parts; }
 
-    // For what follows, a scene has to be open.
+    // The following functions need an open scene.
 
     view::Stage& getStage() { return *m_stage; }
     view::Player& getPlayer() { return *m_player; }

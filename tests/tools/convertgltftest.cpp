@@ -302,8 +302,9 @@ TEST_F(GltfReader, meshoptCompression)
 
     json& compression = writer.file["bufferViews"][0]["extensions"]["EXT_meshopt_compression"];
     compression["count"] = 1u << 30;
-    EXPECT_EQ("bufferViews[0].extensions.EXT_meshopt_compression.count is more than so few bytes can hold",
-              getFault(writer.write()));
+    EXPECT_EQ(
+        "bufferViews[0].extensions.EXT_meshopt_compression.count is more than the compressed bytes can hold",
+        getFault(writer.write()));
 }
 
 TEST_F(GltfReader, dracoCompression)
@@ -537,12 +538,12 @@ TEST_F(GltfReader, refusesWithThePlace)
         const char* message;
     } cases[] = {
         {R"({"extensionsRequired":["KHR_mesh_quantization","VENDOR_a","VENDOR_b"]})",
-         "needs extensions that are not known: VENDOR_a, VENDOR_b"},
+         "requires unknown extensions: VENDOR_a, VENDOR_b"},
         {R"({"asset":{"version":"3.0"}})", "is of glTF 3.0, which is not read"},
         {R"({"asset":{"minVersion":"2.1"}})", "is of glTF 2.1, which is not read"},
         {R"({"asset":null})", "does not say which version of glTF it is"},
         {R"({"scene":7})", "the file asks for scenes[7], which is not there"},
-        {R"({"nodes":[{"children":[0]}]})", "nodes[0] is in itself"},
+        {R"({"nodes":[{"children":[0]}]})", "nodes[0] contains itself"},
         {R"({"nodes":[{"mesh":-1}]})", "nodes[0].mesh is not a whole number of 0 or more"},
         {R"({"nodes":[{"mesh":0,"scale":[1,2]}]})", "nodes[0].scale has 2 numbers instead of 3"},
         {R"({"meshes":[{"primitives":[{"attributes":{"POSITION":9}}]}]})",
@@ -552,11 +553,11 @@ TEST_F(GltfReader, refusesWithThePlace)
         {R"({"accessors":[{"bufferView":0,"componentType":5124,"count":3,"type":"VEC3"}]})",
          "accessors[0].componentType is 5124, which is no kind of number"},
         {R"({"accessors":[{"bufferView":0,"componentType":5126,"count":4,"type":"VEC3"}]})",
-         "accessors[0] has 4 elements, which reach over the end of its buffer view"},
+         "accessors[0] has 4 elements, which reach beyond its buffer view"},
         {R"({"accessors":[{"componentType":5126,"count":4000000000,"type":"VEC3"}]})",
          "accessors[0].count is more than the file has bytes"},
         {R"({"bufferViews":[{"buffer":0,"byteOffset":4,"byteLength":36}]})",
-         "bufferViews[0] reaches over the end of its buffer, which has 36 bytes"},
+         "bufferViews[0] reaches beyond its buffer, which has 36 bytes"},
         {R"({"bufferViews":[{"buffer":0,"byteLength":36,"byteStride":8}]})",
          "accessors[0] has elements that overlap, by the stride of its buffer view"},
         {R"({"buffers":[{"uri":"none.bin"}]})", "buffers[0] is file \"none.bin\", which cannot be opened"},

@@ -307,7 +307,7 @@ TEST_F(ConvertMaterialTest, occlusionAndSky)
 
     const Glo::Ptr loaded = convertAndLoad("model.gltf out.glo --sky", "out.glo");
     ASSERT_TRUE(loaded);
-    EXPECT_TRUE(reports("lost: an occlusion map with coordinates of its own")) << m_outcome.output;
+    EXPECT_TRUE(reports("lost: an occlusion map with its own coordinates")) << m_outcome.output;
     const auto getWidth = [&](const char* name, const char* property)
     { return getValue<SharedPtr<Texture2D>>(loaded->getAppearance(name), property)->getWidth(); };
     EXPECT_EQ(8u, getWidth("dim", "M_AMBIENT_TEXTURE"));

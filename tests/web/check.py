@@ -352,9 +352,9 @@ def damage(bench):
     says = lambda: browser.run("return [document.getElementById('message').hidden, document.getElementById('message').innerText].join(' ')")
 
     browser.run("orvPage.openFiles([{ name: 'a.txt', bytes: new Uint8Array(3) }])")
-    expect("a.txt is no .glo scene" in says(), says())
+    expect("a.txt is not a .glo scene" in says(), says())
     browser.run("orvPage.openFiles([{ name: 'duck.glo', bytes: new Uint8Array(await (await fetch('/duck/duck.glo')).arrayBuffer()) }])")
-    expect("not all of it could be loaded" in says() and "duck" in browser.run("return document.getElementById('remarks').textContent"), says())
+    expect("some of its files could not be loaded" in says() and "duck" in browser.run("return document.getElementById('remarks').textContent"), says())
     for wish, words in {"model=/duck/none.glo": "none.glo cannot be fetched: 404", "model=http://127.0.0.1:1/a.glo": "its own server",
                         "model=/page/viewer.css": "cannot be opened", "model=/duck/duck.glo&camera=nobody": "no camera \"nobody\""}.items():
         bench.show("page", wish)

@@ -205,7 +205,7 @@ std::string getKnownFault(const std::string& model)
 std::string describe(int status, const std::string& model, const Limits& limits)
 {
     if (WIFSIGNALED(status) && WTERMSIG(status) == SIGKILL)
-        return "the conversion was killed, as systems do that run out of memory";
+        return "the conversion was killed, perhaps because the system ran out of memory";
     if (WIFSIGNALED(status))
     {
         const int signal = WTERMSIG(status);

@@ -124,7 +124,7 @@ void reportCameras(const aiScene& scene, Report& report)
 {
     for (unsigned i = 0; i < scene.mNumCameras; ++i)
         report.lose("camera-direction", "where camera \"" + std::string(scene.mCameras[i]->mName.C_Str()) +
-                                            "\" looks, which libassimp does not tell of 3DS files");
+                                            "\" looks, which libassimp does not read from 3DS files");
 }
 
 /// The library makes a mesh for a file with only a skeleton.
@@ -186,7 +186,7 @@ bool readAndValidate(const std::string& path, const gltf::Opened& opened, Import
         return true;
     const std::string finding = model.importer.GetErrorString();
     report = before;
-    report.approximate("validation", "what libassimp finds fault with: " + finding);
+    report.approximate("validation", "a fault found by libassimp: " + finding);
     return readByLibrary(path, opened, model, report, error);
 }
 

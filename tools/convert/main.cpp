@@ -34,11 +34,11 @@ const char* const FOOTER =
     "  orv-convert walk.fbx walk.glo --keys sparse          smooth animations, smaller file\n"
     "  orv-convert part.stl part.glo --up z --scale 0.001   from millimetres with z up\n"
     "  orv-convert house.gltf house.glo --max-texture-size 1024 --power-of-two\n"
-    "  orv-convert big.ifc big.glo --dry-run                only say what would come of it\n"
+    "  orv-convert big.ifc big.glo --dry-run                only report what would be written\n"
     "  orv-convert a.glb a.glo --report a.json              for a script (docs/convert.md)\n"
     "  orv-convert walk.glb --page walk                     a folder that any web server shows\n"
-    "  orv-convert source/car.fbx car.glo --allow textures  a model whose pictures lie elsewhere\n"
-    "  orv-convert models scenes --jobs 8                   a folder, and again what has changed since\n"
+    "  orv-convert source/car.fbx car.glo --allow textures  a model with pictures elsewhere\n"
+    "  orv-convert models scenes --jobs 8                   a folder; later only changed models\n"
     "  orv-convert models scenes --shard 2/5                on the second of five machines\n"
     "  orv-convert city.obj city.glo --time-limit 0 --memory-limit 16384";
 
@@ -80,7 +80,7 @@ std::string parseShard(const std::string& text, convert::FolderJob& job)
     char beyond = 0;
     const int found = std::sscanf(text.c_str(), "%u/%u%c", &job.shard, &job.shards, &beyond);
     const bool isFine = found == 2 && job.shard >= 1 && job.shard <= job.shards && job.shards <= MOST_SHARDS;
-    return isFine ? "" : text + ": not a part of how many, such as 2/5";
+    return isFine ? "" : text + ": not a part and a number of parts, such as 2/5";
 }
 
 /// Rules for combinations of options, which CLI11 cannot express. @return the error, or empty.
@@ -124,7 +124,7 @@ void addOptions(CLI::App& app, Command& command)
     CLI::Option* const out = app.add_option("OUT.glo", command.job.out,
                                             "the scene file to write, or a folder for scenes and reports");
     app.add_option("--page", command.job.page,
-                   "in place of OUT.glo: a folder for the scene and a page that shows it in browsers, with "
+                   "instead of OUT.glo: a folder for the scene and a web page that shows it, with "
                    "--power-of-two")
         ->option_text("DIR")
         ->excludes(out);
@@ -142,24 +142,24 @@ void addOptions(CLI::App& app, Command& command)
     app.add_flag("--no-animation", command.noAnimation, "leave animations out");
     app.add_option("--up", options.up, "the axis that points up in the model, if its file has it wrong")
         ->check(CLI::IsMember({"x", "y", "z"}));
-    app.add_option("--scale", options.scale, "makes everything larger by this factor")
+    app.add_option("--scale", options.scale, "scales everything by this factor")
         ->check(CLI::Range(1e-6, 1e6))
         ->capture_default_str();
     app.add_option("--max-texture-size", options.maxTextureSize, "makes larger textures smaller; in pixels")
         ->check(CLI::Range(1, LARGEST_TEXTURE));
     app.add_flag("--power-of-two", options.powerOfTwo,
-                 "gives all textures sizes that can have mipmaps and repeat");
+                 "gives all textures sizes that can repeat and have mipmaps");
     app.add_option("--allow", command.job.allowed,
-                   "another folder that the model may have files in, with what is below it; may be repeated")
+                   "another folder, with all below it, that the model may read files from; may be repeated")
         ->allow_extra_args(false)
         ->check(CLI::ExistingDirectory)
         ->option_text("DIR");
     app.add_option("--linear", options.linear,
-                   "whether materials reckon in shares of light; by default those of glTF do")
+                   "whether materials use linear light; by default those of glTF do")
         ->check(CLI::IsMember({"on", "off"}));
     app.add_flag("--sky", options.sky, "gives metals a plain sky to mirror");
     app.add_option("--report", command.job.report,
-                   "also write what is reported as JSON to this file; - for standard output alone")
+                   "also write the report as JSON to this file; - prints only that")
         ->option_text("FILE");
     app.add_flag("--dry-run", command.job.dryRun, "write no scene and no textures");
     app.add_option("--time-limit", command.job.limits.seconds, "seconds after which to give up; 0 for never")
@@ -167,7 +167,7 @@ void addOptions(CLI::App& app, Command& command)
         ->capture_default_str();
     app.add_option("--memory-limit", command.job.limits.mebibytes,
                    convert::CAN_LIMIT_MEMORY ? "MiB of memory above which to give up; 0 for no limit"
-                                             : "without effect in this build, which checks addresses")
+                                             : "without effect in this build with address checks")
         ->check(CLI::Range(0, 1 << 24))
         ->capture_default_str();
     addFolderOptions(app, command);
@@ -186,7 +186,7 @@ void usePage(convert::Job& job)
 
 int main(int argc, char** argv)
 {
-    CLI::App app("Makes a scene file of a model (glTF, Collada, FBX, OBJ, 3DS, PLY and many more).",
+    CLI::App app("Converts a model to a scene file (glTF, Collada, FBX, OBJ, 3DS, PLY and many more).",
                  "orv-convert");
     Command command;
     addOptions(app, command);

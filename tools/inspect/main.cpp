@@ -138,25 +138,25 @@ int run(const Options& options)
 
 int main(int argc, char** argv)
 {
-    CLI::App app("Says what is in scene files, materials (.ap) and shader programs (.sp), and what is wrong "
+    CLI::App app("Reports the contents and faults of scene files, materials (.ap) and shader programs "
                  "with them.",
                  "orv-inspect");
     app.footer(
         "Exit code: 0 nothing worse than notes, 1 errors (the engine refuses the file), 2 wrong usage,\n"
         "3 warnings.\n\n"
         "Examples:\n"
-        "  orv-inspect duck.glo                  what it holds, what it costs, what is wrong\n"
+        "  orv-inspect duck.glo                  contents, cost and faults\n"
         "  orv-inspect --tree duck.glo | less    every chunk and field\n"
-        "  orv-inspect --check *.glo *.ap        only what is wrong, one line each\n"
+        "  orv-inspect --check *.glo *.ap        only faults, one line each\n"
         "  orv-inspect --json duck.glo           everything, for a script (docs/inspect.md)\n"
-        "  orv-inspect --codes                   all that can be wrong");
+        "  orv-inspect --codes                   a list of all findings");
     Options options;
     bool codes = false;
     app.add_option(
         "FILE", options.files,
-        "what to look at, - for a scene on standard input; pictures and sources are looked for beside it");
+        "the files to read, - for a scene on standard input; pictures and sources are searched beside them");
     app.add_flag("--tree", options.tree, "print every chunk with its fields, every statement of a text file");
-    app.add_flag("--check", options.check, "print nothing but what is wrong");
+    app.add_flag("--check", options.check, "print only findings");
     app.add_flag("--json", options.json, "print one JSON array with an object for each file");
     commandline::addCommon(app);
     app.add_flag("--codes", codes, "list every code with its meaning");

@@ -25,12 +25,12 @@ const char* const EXAMPLES = R"(Keys in the window: press h there.
 Examples:
   orv-view duck.glo                              open a window and turn the duck with the mouse
   orv-view walk.fbx                              convert a model on the fly, and again when it is saved
-  orv-view walk.fbx -- --up z --fps 60           the same; what follows -- is for orv-convert
+  orv-view walk.fbx -- --up z --fps 60           the same; options after -- are for orv-convert
   orv-view chrome.ap                             a material on a ball, drawn again as you edit it
   orv-view duck.glo --material body=chrome.ap    try a material on a scene
 
   orv-view duck.glo --out duck.png               draw a picture, without a window
-  orv-view walk.glo --out walk.png --sheet 4x3   twelve moments of the animation on one sheet
+  orv-view walk.glo --out walk.png --sheet 4x3   twelve times of the animation on one sheet
   orv-view walk.glo --out run.png --frames 24 --clip run      run-000.png to run-023.png
   orv-view duck.glo --out duck.png --turntable 36             once around the duck
   orv-view duck.glo --out - --thumbnail 128 >icon.png          a small square one
@@ -97,9 +97,10 @@ void addSceneOptions(CLI::App& app, Options& options, std::vector<std::string>& 
                 options.hasSize = true;
                 return parsePair(text, "a size is WIDTHxHEIGHT", MAX_EDGE, options.width, options.height);
             });
-    app.add_option("--camera", options.camera, "Look through this camera of the file, not at the whole scene")
+    app.add_option("--camera", options.camera,
+                   "Use this camera of the file instead of a view of the whole scene")
         ->type_name("NAME");
-    app.add_option("--clip", options.clip, "Play or draw this animation of the file, not all of them")
+    app.add_option("--clip", options.clip, "Play or draw this animation of the file instead of all")
         ->type_name("NAME");
     app.add_option("--background", "#rrggbb, black, grey or white")
         ->type_name("COLOUR")
@@ -110,16 +111,15 @@ void addSceneOptions(CLI::App& app, Options& options, std::vector<std::string>& 
                            ? std::string()
                            : text + ": not a colour (#rrggbb, black, grey, white)";
             });
-    app.add_option("--show", "Beside the picture: bounds, skeletons, axes, grid, wireframe, shadows")
+    app.add_option("--show", "Also draw: bounds, skeletons, axes, grid, wireframe, shadows")
         ->type_name("WHAT,...")
         ->check([&options](const std::string& text) { return checkMarkings(text, options.markings); });
-    app.add_option("--material", dressings, "Put an appearance file over a material of the scene")
+    app.add_option("--material", dressings, "Apply an appearance file to a material of the scene")
         ->type_name("NAME=FILE.ap")
         ->expected(1)
         ->multi_option_policy(CLI::MultiOptionPolicy::TakeAll)
         ->check(checkDressing);
-    app.add_option("--font", options.font, "TrueType file for what is written in the window")
-        ->type_name("FILE.ttf");
+    app.add_option("--font", options.font, "TrueType file for the text in the window")->type_name("FILE.ttf");
 }
 
 void addPictureOptions(CLI::App& app, Options& options)
@@ -128,7 +128,7 @@ void addPictureOptions(CLI::App& app, Options& options)
     auto* out = app.add_option("--out", options.out, "Picture to write; - for standard output")
                     ->type_name("FRAME.png")
                     ->group(group);
-    auto* time = app.add_option("--time", options.time, "Moment to draw, from the start of the clip")
+    auto* time = app.add_option("--time", options.time, "Time to draw, from the start of the clip")
                      ->type_name("SECONDS")
                      ->check(checkTime);
     auto* frames = app.add_option("--frames", options.frames,
@@ -137,12 +137,12 @@ void addPictureOptions(CLI::App& app, Options& options)
                        ->check(CLI::Range(1, MAX_PICTURES))
                        ->excludes(time);
     auto* turntable = app.add_option("--turntable", options.turntable,
-                                     "N pictures evenly spaced around the scene, at one moment")
+                                     "N pictures evenly spaced around the scene, at one time")
                           ->type_name("N")
                           ->check(CLI::Range(1, MAX_PICTURES))
                           ->excludes(frames);
     auto* sheet =
-        app.add_option("--sheet", "One picture of many: over the clip, or those of the turntable")
+        app.add_option("--sheet", "One sheet of many pictures: over the clip, or around the scene")
             ->type_name("COLSxROWS")
             ->excludes(frames)
             ->check(
@@ -172,10 +172,10 @@ void addPictureOptions(CLI::App& app, Options& options)
                 {
                     return parseTolerance(text, options.tolerance)
                                ? std::string()
-                               : text + ": not a number from 0 to 255, nor two";
+                               : text + ": not a number from 0 to 255, nor two with a comma";
                 });
     auto* stats =
-        app.add_flag("--stats", options.wantsStats, "Print what the scene holds and what drawing it took");
+        app.add_flag("--stats", options.wantsStats, "Print what the scene holds and what drawing it costs");
     for (CLI::Option* option : {time, frames, turntable, sheet, thumbnail, compare, tolerance, stats})
         option->needs(out)->group(group);
 }

@@ -262,7 +262,7 @@ bool GlyphAtlas::updateTexture(Page& page)
         glGenerateMipmap(GL_TEXTURE_2D);
     const bool isTaken = RenderDevice::getError(false) == RenderDevice::ErrorCode::NO_ERROR;
     if (!isTaken)
-        ORV_LOG_ERROR("GL takes no glyphs now");
+        ORV_LOG_ERROR("GL refuses a texture for glyphs");
     return isTaken;
 }
 

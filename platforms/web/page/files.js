@@ -1,6 +1,6 @@
-// Where files come from: chosen, dropped, or from the server.
+// Sources of files: chosen, dropped, or from the server.
 
-/// @return 0 for what is not looked at by itself; the smaller the number, the sooner it is shown.
+/// @return 0 for files that are not shown by themselves; otherwise smaller numbers are preferred.
 export function isModel(name) {
     return 1 + [".glo", ".ap", ".sp"].findIndex((suffix) => name.toLowerCase().endsWith(suffix));
 }
@@ -9,12 +9,12 @@ async function readFile(file, name) {
     return { name, bytes: new Uint8Array(await file.arrayBuffer()) };
 }
 
-/// @param list  of a file chooser; files of a folder keep the path in there.
+/// @param list  of a file chooser; files of a folder keep their paths in it.
 export function readChosen(list) {
     return Promise.all([...list].map((file) => readFile(file, file.webkitRelativePath || file.name)));
 }
 
-/// Calls back until there are no more: a reader gives some hundred entries at a time.
+/// Calls back for all entries: a reader returns some hundred at a time.
 function listFolder(folder) {
     const reader = folder.createReader();
     return new Promise((resolve, reject) => {
@@ -39,7 +39,7 @@ async function readEntry(entry, path) {
     return (await Promise.all(inside.map((each) => readEntry(each, `${path}${entry.name}/`)))).flat();
 }
 
-/// @param transfer  of a drop; to be asked while the event is handled.
+/// @param transfer  of a drop; only valid while the event is handled.
 export async function collectDropped(transfer) {
     const entries = [...transfer.items].filter((item) => item.kind === "file")
         .map((item) => (item.webkitGetAsEntry ? item.webkitGetAsEntry() : null));

@@ -1,8 +1,8 @@
-// Hands and keys, as commands of the page.
+// Translates pointers, wheel and keys to commands of the page.
 
-const STEP = 0.9; // what one step of zooming leaves of the distance
+const STEP = 0.9; // factor of the distance for one zoom step
 const WHEEL_STEP = 100; // pixels
-const LINE = 16; // pixels that a wheel means by a line
+const LINE = 16; // pixels of a line, for wheels that scroll by lines
 const KEY_TURN = 12; // pixels
 const DOUBLE_TAP_MS = 300;
 const DOUBLE_TAP_PIXELS = 25;
@@ -12,8 +12,8 @@ const middle = (one, other) => ({ x: (one.x + other.x) / 2, y: (one.y + other.y)
 
 /// One pointer turns, with another button or shift it moves; two move and pinch.
 export function listenToHands(canvas, run) {
-    const pointers = new Map(); // where they are
-    let pinched = null; // where two were when they were followed last
+    const pointers = new Map(); // their positions
+    let pinched = null; // the last positions of two pointers
     let tap = { time: -Infinity, x: 0, y: 0 };
 
     const place = (event) => {
@@ -21,7 +21,7 @@ export function listenToHands(canvas, run) {
         return { x: event.clientX - box.left, y: event.clientY - box.top, pans: event.shiftKey || (event.buttons & 6) !== 0 };
     };
     const moveOne = (from, to) => run(to.pans ? "pan" : "turn", to.x - from.x, to.y - from.y);
-    // Both at once: one after the other would move what only comes nearer.
+    // Both together: one after the other would move the view during a pinch.
     const followTwo = () => {
         const now = [...pointers.values()];
         if (!pinched || now.length !== 2)
@@ -53,7 +53,7 @@ export function listenToHands(canvas, run) {
         if (pointers.size === 1)
             moveOne(from, to);
         else
-            requestAnimationFrame(followTwo); // of several in one frame the first does all
+            requestAnimationFrame(followTwo); // once per frame
     });
     const end = (event) => {
         followTwo();
@@ -79,7 +79,7 @@ export function listenToHands(canvas, run) {
     canvas.addEventListener("wheel", (event) => {
         event.preventDefault();
         const pixels = event.deltaY * (event.deltaMode === WheelEvent.DOM_DELTA_LINE ? LINE : 1);
-        run("zoom", -pixels / (event.ctrlKey ? WHEEL_STEP / 10 : WHEEL_STEP)); // ctrl: a trackpad that is pinched
+        run("zoom", -pixels / (event.ctrlKey ? WHEEL_STEP / 10 : WHEEL_STEP)); // ctrl: a pinched trackpad
     }, { passive: false });
 }
 
@@ -98,7 +98,7 @@ function findCommand(event) {
     return keys[event.key] || (event.key.length === 1 && keys[event.key.toLowerCase()]);
 }
 
-/// Keys go to the view, but for those that the button, slider or list with the focus has a use for itself.
+/// Keys go to the view, except those that the focused button, slider or list uses itself.
 export function listenToKeys(run) {
     addEventListener("keydown", (event) => {
         const command = findCommand(event);

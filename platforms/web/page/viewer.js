@@ -1,11 +1,11 @@
-// The page around the engine: files come in, hands and keys go to the engine, and what it says is shown.
+// The page around the engine: passes files and input to the engine, and shows its messages.
 
 import { collectDropped, fetchFile, isModel, readChosen } from "./files.js";
 import { listenToHands, listenToKeys } from "./input.js";
 
 const FOLDER = "/scene";
 const BACKGROUNDS = [[0.84, 0.86, 0.89], [0.2, 0.22, 0.25], [1, 1, 1], [0, 0, 0]];
-const ROUNDS = 8; // of files that name files
+const ROUNDS = 8; // of files that refer to files
 const COUNTS_INTERVAL = 200; // milliseconds
 
 const find = (id) => document.getElementById(id);
@@ -54,7 +54,7 @@ function hideMessage() {
 
 function stop(reason) {
     state.stopped = true;
-    showMessage(`${reason} Load the page again to go on.`);
+    showMessage(`${reason} Load the page again to continue.`);
 }
 
 // --- frames
@@ -172,18 +172,18 @@ function show(model, scene) {
     find("welcome").hidden = isOpen;
     find("all").hidden = !isOpen;
     find("bar").hidden = true;
-    canvas.classList.toggle("empty", !isOpen); // else it goes on showing what was there last
+    canvas.classList.toggle("empty", !isOpen); // otherwise it would still show the last frame
     find("name").textContent = isOpen ? name : "orv viewer";
     document.title = isOpen ? `${name} - orv viewer` : "orv viewer";
     if (!isOpen) {
         canvas.setAttribute("aria-label", "Nothing is open");
         call("orvClose");
-        showMessage(`${name} cannot be opened: it is damaged, or no scene.`, remarks);
+        showMessage(`${name} cannot be opened: it is damaged, or not a scene.`, remarks);
         return;
     }
     const errors = scene.remarks.filter((remark) => remark.error).length;
     if (errors > 0)
-        showMessage(`${name} is open, but not all of it could be loaded. Files that are missing can be dropped here too.`, remarks);
+        showMessage(`${name} is open, but some of its files could not be loaded. Drop missing files here.`, remarks);
     else
         hideMessage();
     call("orvSetLooping", state.loops ? 1 : 0);
@@ -205,7 +205,7 @@ function labelView() {
         `${count(scene.triangles, "triangle")}, ${camera ? `through camera ${camera}` : "seen freely"}`);
 }
 
-/// Shows what is among some files, or adds them to what is shown.
+/// Shows the scene among some files, or adds the files to the open scene.
 /// @param files  of {name, bytes}; names may have folders.
 function openFiles(files) {
     if (files.length === 0 || state.stopped)
@@ -214,8 +214,8 @@ function openFiles(files) {
         isModel(one) - isModel(other) || one.split("/").length - other.split("/").length || (one < other ? -1 : 1));
     if (models.length === 0 && !state.model) {
         showMessage(files.length === 1
-            ? `${files[0].name} is no .glo scene. orv-convert model.glb --page folder makes one of a model.`
-            : `There is no .glo scene among these ${files.length} files. orv-convert model.glb --page folder makes one of a model.`);
+            ? `${files[0].name} is not a .glo scene. orv-convert model.glb --page folder converts a model to one.`
+            : `There is no .glo scene among these ${files.length} files. orv-convert model.glb --page folder converts a model to one.`);
         return;
     }
     const model = models.length > 0 ? models[0] : state.model;
@@ -227,9 +227,10 @@ function openFiles(files) {
     show(model, load(model));
 }
 
-/// Shows a scene of the server that the page came from.
+/// Shows a scene from the page's own server.
 /// @param address  relative to the page.
-/// @param names    the files that it needs, relative to the scene; without them they are asked for one after another.
+/// @param names    the files that it needs, relative to the scene; without them they are requested as they are found
+///                 missing.
 async function openAddress(address, names) {
     const url = new URL(address, location.href);
     if (url.origin !== location.origin)
@@ -290,7 +291,7 @@ function toggleScreen() {
     if (document.fullscreenElement)
         document.exitFullscreen();
     else
-        document.documentElement.requestFullscreen().catch(() => say("The browser does not offer the full screen."));
+        document.documentElement.requestFullscreen().catch(() => say("The browser does not allow full screen."));
 }
 
 const commands = {
@@ -356,13 +357,13 @@ function listenToContext() {
         event.preventDefault(); // so that it may be restored
         state.lost = true;
         call("orvLoseContext");
-        showMessage("The browser has taken the graphics away for now. The view comes back with them.");
+        showMessage("The WebGL context is lost. The view returns when the browser restores it.");
     });
     canvas.addEventListener("webglcontextrestored", () => {
         state.lost = false;
         moves = false;
         if (call("orvRestoreContext") === 0) {
-            stop("The graphics came back, but the scene could not be loaded again.");
+            stop("The WebGL context is restored, but the scene could not be loaded again.");
             return;
         }
         hideMessage();
@@ -370,7 +371,7 @@ function listenToContext() {
     });
 }
 
-/// Opens what comes of a promise of files, and says why where nothing does.
+/// Opens the files of a promise, or shows the reason of its failure.
 async function openWhenRead(promise) {
     try {
         openFiles(await promise);
@@ -420,7 +421,7 @@ function listenToButtons() {
     find("camera").addEventListener("change", () => run("camera", find("camera").selectedIndex - 1 - call("orvGetCamera")));
 }
 
-/// What the address asks for beside the scene: ?camera=name&clip=name&time=seconds&play=0&bars=0
+/// The address's other parameters: ?camera=name&clip=name&time=seconds&play=0&bars=0
 function applyAddress(wishes) {
     const clip = wishes.has("clip") ? state.scene.clips.findIndex(({ name }) => name === wishes.get("clip")) : 0;
     const camera = wishes.has("camera") ? state.scene.cameras.indexOf(wishes.get("camera")) : -1;
@@ -441,13 +442,13 @@ function applyAddress(wishes) {
 
 async function start() {
     if (location.protocol === "file:") {
-        showMessage("A browser runs this page only when a web server sends it. In its folder: python3 -m http.server");
+        showMessage("Browsers run this page only from a web server. In its folder: python3 -m http.server");
         return;
     }
     engine = await startOrv({ print: () => {}, printErr: () => {}, onAbort: (why) => stop(`The engine has stopped: ${why}.`) });
     engine.FS.mkdir(FOLDER);
     if (callWithText("orvStart", "#view") === 0) {
-        stop("This browser offers no WebGL, which the view is drawn with.");
+        stop("This browser has no WebGL, which the view needs.");
         return;
     }
     listenToContext();
@@ -469,7 +470,7 @@ async function start() {
         applyAddress(wishes);
 }
 
-/// For scripts that go with the page: when it is ready, what it shows, files of {name, bytes}, a frame at once, commands.
+/// For other scripts: ready, state, opening files of {name, bytes}, drawing a frame at once, commands.
 window.orvPage = {
     ready: start().catch((error) => {
         find("welcome").hidden = false;

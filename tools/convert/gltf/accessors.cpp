@@ -87,7 +87,7 @@ std::pair<unsigned, unsigned> getShape(const Object& accessor)
         if (type == shape.name)
             return {shape.columns, shape.rows};
     }
-    accessor.fail("type", "is \"" + type + "\", which is none");
+    accessor.fail("type", "is \"" + type + "\", which is no accessor type");
 }
 
 /// The bytes that a number of elements take.
@@ -167,7 +167,7 @@ Span Accessors::locate(const Object& accessor, const Layout& layout)
     const std::optional<size_t> extent = getExtent(layout.count, layout.stride, layout.elementSize);
     if (!extent || offset > bytes.size() || *extent > bytes.size() - offset)
         accessor.fail("has " + std::to_string(layout.count) +
-                      " elements, which reach over the end of its buffer view");
+                      " elements, which reach beyond its buffer view");
     return bytes.subspan(offset);
 }
 
@@ -229,7 +229,7 @@ std::vector<uint32_t> Accessors::readSparseIndices(const Object& indices, size_t
     case Component::UINT8: readWhole<uint8_t>(bytes.data(), 1, count, places); break;
     case Component::UINT16: readWhole<uint16_t>(bytes.data(), 2, count, places); break;
     case Component::UINT32: readWhole<uint32_t>(bytes.data(), 4, count, places); break;
-    default: indices.fail("componentType", "is none of an index");
+    default: indices.fail("componentType", "is not an index type");
     }
     return places;
 }
@@ -272,7 +272,7 @@ std::vector<uint32_t> Accessors::readIndices(size_t index, const Object& user)
         accessor.fail("type", "is not SCALAR, which indices are");
     const Component component = layout.decoding.component;
     if (component != Component::UINT8 && component != Component::UINT16 && component != Component::UINT32)
-        accessor.fail("componentType", "is none of an index");
+        accessor.fail("componentType", "is not an index type");
     if (!accessor.has("bufferView") || accessor.has("sparse"))
     {
         const Column column = read(index, user, 1);

@@ -39,7 +39,7 @@ Span Buffers::part(const Object& user, size_t defaultBuffer)
     const size_t offset = user.size("byteOffset", 0);
     const size_t length = user.size("byteLength", 0);
     if (offset > whole.size() || length > whole.size() - offset)
-        user.fail("reaches over the end of its buffer, which has " + std::to_string(whole.size()) + " bytes");
+        user.fail("reaches beyond its buffer, which has " + std::to_string(whole.size()) + " bytes");
     return whole.subspan(offset, length);
 }
 

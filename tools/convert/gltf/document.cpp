@@ -223,7 +223,7 @@ Document::Document(Bytes file) : m_file(std::move(file))
     }
     catch (const json::parse_error& error)
     {
-        throw Fault("is no JSON from byte " + std::to_string(error.byte) + " on");
+        throw Fault("is not JSON from byte " + std::to_string(error.byte) + " on");
     }
     root(); // fails unless it is an object
 }

@@ -43,7 +43,7 @@ DracoMesh::DracoMesh(const Object& extension, Span packed)
     for (const uint32_t index : readIndices())
     {
         if (index >= vertexCount())
-            extension.fail("has an index over the end of its vertices");
+            extension.fail("has an index beyond its vertices");
     }
 }
 
@@ -79,7 +79,7 @@ Column DracoMesh::read(const char* attribute, bool normalized) const
         id <= UINT32_MAX ? m_decoded->mesh->GetAttributeByUniqueId(uint32_t(id)) : nullptr;
     const std::optional<Component> component = found ? toComponent(found->data_type()) : std::nullopt;
     if (!component)
-        m_attributes.fail(attribute, "is not among what has been unpacked");
+        m_attributes.fail(attribute, "is missing from the compressed mesh");
     const unsigned components = unsigned(found->num_components());
     const int64_t stride = found->byte_stride();
     const size_t stored = found->size();

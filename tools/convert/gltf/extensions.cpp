@@ -57,7 +57,7 @@ void checkExtensions(Source& source)
             missing += (missing.empty() ? "" : ", ") + name.substr(0, 100);
     }
     if (!missing.empty())
-        throw Fault("needs extensions that are not known: " + missing);
+        throw Fault("requires unknown extensions: " + missing);
     for (const std::string& name : root.texts("extensionsUsed"))
     {
         if (!isKnown(name))

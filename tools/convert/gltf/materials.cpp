@@ -147,7 +147,7 @@ private:
         if (!occlusion)
             return;
         if (!(readPlacing(occlusion) == m_main.value_or(UvPlacing())))
-            return m_source.report.lose("light-map", "an occlusion map with coordinates of its own");
+            return m_source.report.lose("light-map", "an occlusion map with its own coordinates");
         addTexture(occlusion, {aiTextureType_LIGHTMAP});
         add(float(occlusion.number("strength", 1.0)),
             AI_MATKEY_GLTF_TEXTURE_STRENGTH(aiTextureType_LIGHTMAP, 0));
@@ -169,7 +169,7 @@ private:
         for (const char* map : {"specularTexture", "specularColorTexture"})
         {
             if (specular.has(map))
-                m_source.report.lose("specular-map", "a map of what a surface mirrors");
+                m_source.report.lose("specular-map", "a map of a surface's reflectance");
         }
     }
 

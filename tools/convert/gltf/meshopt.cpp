@@ -21,7 +21,7 @@ int decode(const Object& compression, const std::string& mode, Span packed, size
         return meshopt_decodeIndexBuffer(target.data(), count, stride, packed.data(), packed.size());
     if (mode == "INDICES" && isIndex)
         return meshopt_decodeIndexSequence(target.data(), count, stride, packed.data(), packed.size());
-    compression.fail("has a mode, count and stride that do not belong together");
+    compression.fail("has a mode, count and stride that do not match");
 }
 
 void filter(const Object& compression, size_t count, size_t stride, Bytes& target)
@@ -46,7 +46,7 @@ Bytes decompressMeshopt(const Object& compression, Span packed)
     if (stride == 0 || stride > LARGEST_STRIDE)
         compression.fail("byteStride", "is not from 1 to 256");
     if (count / MOST_PER_BYTE * stride > packed.size())
-        compression.fail("count", "is more than so few bytes can hold");
+        compression.fail("count", "is more than the compressed bytes can hold");
     Bytes target(count * stride);
     const std::string mode = compression.text("mode");
     if (count > 0 && decode(compression, mode, packed, count, stride, target) != 0)

@@ -100,7 +100,7 @@ private:
         if (m_faces.cornersPerFace == 0)
             m_primitive.fail("mode", "is none");
         if (m_faces.dropped > 0)
-            m_source.report.lose("face", "faces of " + m_what + " that name vertices it has not, or too few");
+            m_source.report.lose("face", "faces of " + m_what + " with missing or too few vertices");
     }
 
     /// Only vertices in use: files share long arrays among many primitives.

@@ -101,7 +101,8 @@ private:
     {
         const size_t count = m_root.length("scenes");
         if (count > 1)
-            m_source.report.lose("scene", "all but one of the file's scenes (" + std::to_string(count) + ")");
+            m_source.report.lose("scene", "all but the default one of the file's scenes (" +
+                                              std::to_string(count) + ")");
         if (count > 0)
             return m_source.document.get("scenes", m_root.size("scene", 0), m_root).indices("nodes");
         std::vector<bool> isChild(m_root.length("nodes"));
@@ -127,11 +128,11 @@ private:
     {
         const Object node = m_source.document.get("nodes", index, m_root);
         if (m_isOpen[index])
-            node.fail("is in itself");
+            node.fail("contains itself");
         if (!m_names[index].empty())
-            node.fail("is in two places");
+            node.fail("has two parents");
         if (depth > DEEPEST)
-            node.fail("is too many nodes deep");
+            node.fail("is nested too deeply");
         m_names[index] = m_nodeNames.make(getName(node), "");
         m_isOpen[index] = true;
         for (const size_t child : node.indices("children"))

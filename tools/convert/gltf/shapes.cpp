@@ -128,7 +128,7 @@ private:
             m_vertexCount += shapes.weights.size() * mover.vertexCount;
             m_source.report.count("moving-shapes", shapes.weights.size());
             if (step > 1)
-                m_source.report.approximate("shape-steps", "shapes that move (a new one " +
+                m_source.report.approximate("shape-steps", "moving shapes (a new one " +
                                                                std::to_string(int(fps / double(step))) +
                                                                " times a second)");
             return true;

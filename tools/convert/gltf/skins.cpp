@@ -58,7 +58,7 @@ void addBones(aiMesh& mesh, const Skin& skin, const std::vector<Column>& joints,
     }
     if (isOver)
         report.lose("joint",
-                    "joints of mesh \"" + std::string(mesh.mName.C_Str()) + "\" that its skin has not");
+                    "joints of mesh \"" + std::string(mesh.mName.C_Str()) + "\" that its skin lacks");
     std::vector<aiBone*> bones;
     for (size_t i = 0; i < byJoint.size(); ++i)
     {

@@ -33,7 +33,7 @@ Track readTrack(Source& source, const Object& animation, const Object& channel, 
     track.values.components = components;
     const size_t perTime = track.way == Track::Way::SPLINE ? 3 : 1;
     if (track.values.count() / perTime < track.times.size())
-        sampler.fail("output", "has fewer elements than its times ask for");
+        sampler.fail("output", "has fewer elements than its times need");
     for (size_t i = 0; i < track.times.size(); ++i)
     {
         if (!std::isfinite(track.times[i]) || (i > 0 && track.times[i] < track.times[i - 1]))

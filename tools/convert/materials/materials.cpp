@@ -130,7 +130,8 @@ private:
         const float opacity = getFloat(m_source, AI_MATKEY_OPACITY, 1.0f);
         if (opacity > 0.0f)
             return std::min(opacity, 1.0f);
-        m_report.approximate("opacity-zero", "an opacity of 0, which some programs write for none (opaque)");
+        m_report.approximate("opacity-zero",
+                             "an opacity of 0, which some programs write for opaque (opaque)");
         return 1.0f;
     }
 
@@ -283,7 +284,7 @@ private:
     {
         if (type == aiTextureType_NONE)
             return WHITE;
-        m_report.approximate("surface-map", "a map of roughness, metalness or gloss (its mean all over)");
+        m_report.approximate("surface-map", "a map of roughness, metalness or gloss (its mean instead)");
         return m_textures.getMean(getTexturePath(m_source, type)).value_or(WHITE);
     }
 
@@ -325,9 +326,9 @@ private:
         const float strength =
             getFloat(m_source, AI_MATKEY_GLTF_TEXTURE_SCALE(aiTextureType_NORMALS, 0), 1.0f);
         if (m_made.bump && strength != 1.0f)
-            m_report.approximate("normal-strength", "the strength of a normal map (1)");
+            m_report.approximate("normal-strength", "the strength of a normal map (1 instead)");
         if (m_made.gloss && !m_made.bump)
-            m_report.approximate("gloss-map", "a map of gloss (seen only along with a normal map)");
+            m_report.approximate("gloss-map", "a gloss map (visible only with a normal map)");
     }
 
     /// Ambient occlusion. In other formats such a map may also be a light map.
@@ -389,7 +390,7 @@ private:
             {aiTextureType_DISPLACEMENT, "displacement-map", "a map that moves the surface"},
             {aiTextureType_SHEEN, "sheen", "a sheen"},
             {aiTextureType_CLEARCOAT, "clear-coat", "a clear coat"},
-            {aiTextureType_TRANSMISSION, "transmission", "light that comes through a surface"},
+            {aiTextureType_TRANSMISSION, "transmission", "the transmission of a surface"},
         };
         const std::string base = getTexturePath(m_source, findTextureType(m_source, BASE));
         for (const auto& kind : kinds)
@@ -402,9 +403,9 @@ private:
         if (getFloat(m_source, AI_MATKEY_CLEARCOAT_FACTOR, 0.0f) > 0.0f)
             m_report.lose("clear-coat", "a clear coat");
         if (getFloat(m_source, AI_MATKEY_TRANSMISSION_FACTOR, 0.0f) > 0.0f)
-            m_report.lose("transmission", "light that comes through a surface");
+            m_report.lose("transmission", "the transmission of a surface");
         if (getInt(m_source, AI_MATKEY_BLEND_FUNC) == aiBlendMode_Additive)
-            m_report.approximate("additive-blending", "a surface that adds its light (blended as usual)");
+            m_report.approximate("additive-blending", "additive blending (ordinary blending instead)");
     }
 
     const aiMaterial& m_source;

@@ -87,9 +87,9 @@ glo::Sampler SamplerMaker::readSettings(aiTextureType type)
         m_report.lose("texture-layers", "a material's further layers of one kind of texture");
     if (channel != m_uvChannel)
         m_report.lose("texture-uv-set",
-                      "coordinates of a texture's own (it has those of the material's first)");
+                      "a texture's own coordinates (it uses those of the material's first)");
     if (modes[0] == aiTextureMapMode_Decal || modes[1] == aiTextureMapMode_Decal)
-        m_report.approximate("texture-decal", "a texture that ends at its edge (the edge goes on for ever)");
+        m_report.approximate("texture-decal", "a texture that ends at its edge (the edge is continued)");
 
     glo::Sampler sampler;
     sampler.minFilter = uint32_t(toFilterMode(getInt(m_material, AI_MATKEY_GLTF_MAPPINGFILTER_MIN(type, 0)),

@@ -132,7 +132,7 @@ std::optional<TextureStore::Loaded> TextureStore::load(const std::string& path)
     if (!loaded.file.isThere)
         m_report.lose("texture-missing", "texture \"" + shown + "\", which is not there");
     else if (!readHeader(loaded.file.bytes, loaded.header))
-        m_report.lose("texture-unreadable", "texture \"" + shown + "\", which is in no format known here");
+        m_report.lose("texture-unreadable", "texture \"" + shown + "\", which is in an unknown format");
     else
         return loaded;
     return {};
@@ -190,7 +190,7 @@ TextureUse TextureStore::passOn(const Loaded& loaded, const TextureWish& wish)
 {
     const PictureHeader& header = loaded.header;
     if (header.width == 0 && (m_options.maxTextureSize > 0 || m_options.powerOfTwo))
-        m_report.approximate("texture-compressed", "a compressed texture (its size is left alone)");
+        m_report.approximate("texture-compressed", "a compressed texture (not resized)");
     const std::string name = makeName(loaded.file.name, header.extension);
     m_files.push_back({name, loaded.file.bytes});
     return {name, header.channels == 4 && wish.alpha == Alpha::KEEP, false,
@@ -216,7 +216,7 @@ bool TextureStore::treat(DecodedPicture& pixels, const TextureWish& wish)
     }
     if (wish.isHeight && makeNormals(pixels))
     {
-        m_report.approximate("height-map", "a map of heights (made a map of normals)");
+        m_report.approximate("height-map", "a height map (converted to a normal map)");
         changed = true;
     }
     return changed;

@@ -321,7 +321,7 @@ private:
         const double start = m_sources.empty() ? 0.0 : double(m_sources.back().clip.end) + 1.0 / m_fps;
         source.clip = {name, float(start), float(start + seconds)};
         if (animation.mNumMeshChannels + animation.mNumMorphMeshChannels > 0)
-            m_report.lose("morph-animation", "how animation \"" + name + "\" changes the shape of meshes");
+            m_report.lose("morph-animation", "how animation \"" + name + "\" morphs meshes");
         for (unsigned i = 0; i < animation.mNumChannels; ++i)
             addChannel(*animation.mChannels[i], source);
         m_sources.push_back(std::move(source));

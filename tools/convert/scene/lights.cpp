@@ -61,7 +61,9 @@ bool convertLight(const aiLight& light, glo::LightDefinition& made, Report& repo
         made.type = glo::light::POINT;
         report.approximate("area-light", "the extent of an area light (a point light instead)");
         break;
-    default: report.lose("ambient-light", "an ambient light (the engine's lights have places)"); return false;
+    default:
+        report.lose("ambient-light", "an ambient light (the engine's lights have positions)");
+        return false;
     }
     const aiColor3D& colour = light.mColorDiffuse;
     const float strength = std::max({float(colour.r), float(colour.g), float(colour.b)});

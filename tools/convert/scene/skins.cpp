@@ -70,7 +70,7 @@ std::vector<Influences> gatherInfluences(const aiMesh& mesh, Report& report)
     const auto cut = uint64_t(std::count(isCut.begin(), isCut.end(), true));
     if (cut > 0)
         report.approximate("joint-weights", "vertices of mesh \"" + std::string(mesh.mName.C_Str()) +
-                                                "\" that more than four joints move (the strongest four)");
+                                                "\" with more than four joints (the strongest four)");
     report.count("vertices-with-more-than-four-joints", cut);
     return vertices;
 }

@@ -132,7 +132,7 @@ const char* CharacterTables::findCharacterFault(int c)
     if (!m_map.isSound())
         return "its character map is damaged";
     if (glyph >= getGlyphCount())
-        return "its character map names a glyph that is not there";
+        return "its character map refers to a missing glyph";
     return findGlyphFault(glyph);
 }
 

@@ -19,7 +19,7 @@ bool allowSize(const char* of, int width, int height)
 {
     if (width >= 0 && height >= 0)
         return true;
-    ORV_LOG_ERROR("%s of %d x %d is less than nothing; the old one is kept.", of, width, height);
+    ORV_LOG_ERROR("%s of %d x %d is negative; the old one is kept.", of, width, height);
     return false;
 }
 

@@ -200,7 +200,7 @@ inline const char* FontTables::findGlyphFault(uint32_t glyph)
 inline FontTables::Outline FontTables::measureGlyph(uint32_t glyph, int depth)
 {
     if (glyph >= m_glyphCount)
-        return {0.0f, "a composite glyph names one that is not there"};
+        return {0.0f, "a composite glyph refers to a missing one"};
     const std::size_t start =
         m_hasWideLocations ? m_locations.u32(4 * std::size_t(glyph)) : 2 * m_locations.u16(2 * glyph);
     const std::size_t end = m_hasWideLocations ? m_locations.u32(4 * std::size_t(glyph) + 4)
