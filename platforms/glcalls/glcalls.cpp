@@ -39,7 +39,7 @@ struct State
     std::string extensions;
     std::map<std::string, Address> procAddresses;
     std::map<std::pair<EGLContext, Kind>, std::set<GLuint>> liveNames;
-    uint64_t callsToRefusal = 0; ///< the last of them is refused; 0 for none
+    uint64_t callsToRefusal = 0; ///< the last of them is refused; 0: none is
     std::string refusedCall;
 };
 
@@ -159,7 +159,7 @@ void note(const Maker& maker, const GLuint* names, GLsizei count)
     }
 }
 
-/// Called with what the entry point was given (names given or filled in), by the shape of its signature.
+/// Called with the entry point's arguments (names passed in or filled in), by its kind of signature.
 template <class... Arguments>
 void noteArguments(const Maker&, Arguments...)
 {
@@ -177,7 +177,7 @@ void noteArguments(const Maker& maker, GLsizei count, const GLuint* names)
 
 void noteArguments(const Maker& maker, GLuint name)
 {
-    if (!maker.makes) // glCreateShader takes no name but a kind of shader
+    if (!maker.makes) // glCreateShader takes a kind of shader, not a name
         note(maker, &name, 1);
 }
 
@@ -203,7 +203,7 @@ std::vector<std::string> splitParameters(const char* parameters)
     return parts;
 }
 
-/// How many values an input array of this call holds; 0 where that is not known.
+/// The number of values in an input array of this call; 0 if unknown.
 int arrayLength(const std::string& entryName, const std::vector<long>& integers)
 {
     const auto startsWith = [&](const char* start) { return entryName.rfind(start, 0) == 0; };
@@ -325,7 +325,7 @@ int getReal(GLenum name)
     return value;
 }
 
-/// What a call can have been wrong about without being wrong in itself.
+/// State that can make a correct call fail.
 std::string describeBindings()
 {
     char text[200];
@@ -339,7 +339,7 @@ std::string describeBindings()
     return text;
 }
 
-/// Says which call GL has found an error in; the caller's own glGetError still gets it.
+/// Reports the call in which GL found an error; the caller's own glGetError still returns it.
 template <class... Arguments>
 void check(const Entry& entry, Arguments... arguments)
 {
@@ -357,7 +357,7 @@ void check(const Entry& entry, Arguments... arguments)
 
 // --- Calls -------------------------------------------------------------------------------------------------
 
-/// Dropping goes the fast way, so that the cost of everything around the calls can be measured.
+/// Dropped calls take a fast path, so that the cost of the code around them can be measured.
 void updateWay(Entry& entry)
 {
     const bool drops = state().dropsAll || entry.isDropped;
@@ -372,12 +372,12 @@ void updateAllWays()
         updateWay(*row.entry);
 }
 
-// The first call of anything prepares every entry: makers of names are slow from the start.
+// The first call of any function prepares all entries: makers of names take the slow path from the start.
 [[maybe_unused]] const bool g_prepared = (updateAllWays(), true);
 
 // --- Refusing ----------------------------------------------------------------------------------------------
 
-/// What a refused call leaves in its outputs: nothing, but for names.
+/// Outputs of a refused call: unchanged, except names.
 template <class... Arguments>
 void refuseOutputs(Arguments...)
 {
@@ -427,7 +427,7 @@ Result callSlowly(TypedEntry<Result(Arguments...)>& entry, Arguments... argument
     const Maker* maker = drops ? nullptr : findMaker(entry);
     if constexpr (std::is_void_v<Result>)
     {
-        if (maker && !maker->makes) // names can be reused from here on, so note first
+        if (maker && !maker->makes) // names can be reused after the call, so note it first
             noteArguments(*maker, arguments...);
         run();
         if (maker && maker->makes)

@@ -34,7 +34,7 @@ namespace glcalls
 template <class Result, class... Arguments>
 using EntryPoint = Result (*)(Arguments...);
 
-/// Nothing counted, recorded, dropped, replaced or alive.
+/// Clears counts, records, drops, replacements and live names.
 void reset();
 
 /// Resets at both ends of a block.
@@ -57,7 +57,7 @@ uint64_t count(const std::string& name);
 namespace detail
 {
 
-/// What is known of one entry point.
+/// One entry point.
 struct Entry
 {
     const char* name;
@@ -66,7 +66,7 @@ struct Entry
     void (*nothing)(); ///< of the same signature
     void (*target)();  ///< where the call goes: to one of these two
     uint64_t calls = 0;
-    bool isSlow = false; ///< there is more to do than to count and to go to the target
+    bool isSlow = false; ///< more to do than counting and calling the target
     bool isDropped = false;
     bool isReplaced = false;
 };
@@ -101,7 +101,7 @@ uint64_t count(EntryPoint<Result, Arguments...> entry)
     return detail::find(entry).calls;
 }
 
-/// Sets the counts alone to 0.
+/// Sets only the counts to 0.
 void resetCounts();
 
 // --- Recording ---------------------------------------------------------------------------------------------
@@ -119,7 +119,7 @@ const std::vector<std::string>& recorded();
 /// The recorded calls of one entry point.
 std::vector<std::string> recorded(const std::string& name);
 
-// --- Dropping: the real library never hears of the call; 0 or null is returned, outputs stay unwritten. ----
+// --- Dropping: the real library is not called; 0 or null is returned, outputs are not written. -------------
 
 void setDropped(const std::string& name, bool dropped = true);
 void dropAll(bool dropped = true);
@@ -161,29 +161,29 @@ void restore(EntryPoint<Result, Arguments...> entry)
 /// and glCreateShader: setDropped.)
 void refuseNames(EntryPoint<void, GLsizei, GLuint*> entry);
 
-/// Every shader says that it did not compile, every program that it did not link, for the reason in log.
+/// Every shader fails to compile and every program fails to link, with the reason in log.
 void failCompiling(const std::string& log);
 void failLinking(const std::string& log);
 
-/// The call of that number from here on (1 is the next) fails as if memory had run out: it does nothing, yields
-/// no name and no answer, and glGetError then says GL_OUT_OF_MEMORY. 0 ends it. Calls that have no way to fail in
-/// a driver do not count: glGetError, and those without which the next draw would read vertices from nowhere
-/// (glBindBuffer, glVertexAttribPointer, glDisableVertexAttribArray).
+/// The call of that number from here on (1 is the next) fails as if out of memory: it does nothing, returns no name or
+/// value, and glGetError then returns GL_OUT_OF_MEMORY. 0 ends this. Calls that cannot fail in a driver are not
+/// counted: glGetError, and calls without which the next draw would read invalid memory (glBindBuffer,
+/// glVertexAttribPointer, glDisableVertexAttribArray).
 void refuseCall(uint64_t number);
 
-/// The entry point that refuseCall() has hit; "" if there were fewer calls.
+/// The entry point that refuseCall() made fail; "" if there were fewer calls.
 const std::string& refusedCall();
 
-/// glCheckFramebufferStatus answers status.
+/// glCheckFramebufferStatus returns status.
 void setFramebufferStatus(GLenum status);
 
-/// The next glGetError calls answer these codes, first come first served, before the real ones.
+/// The next glGetError calls return these codes in order, before the real ones.
 void queueError(GLenum code);
 
-/// glGetString(GL_EXTENSIONS) answers text. (The engine asks for some extensions once per process only.)
+/// glGetString(GL_EXTENSIONS) returns text. (The engine asks for some extensions once per process only.)
 void setExtensions(const std::string& text);
 
-/// eglGetProcAddress(name) answers function, null for "there is none".
+/// eglGetProcAddress(name) returns function, or null for a missing one.
 void setProcAddress(const std::string& name, void (*function)());
 
 // --- GL objects made and not yet deleted since reset() -----------------------------------------------------
@@ -198,8 +198,8 @@ enum class Kind
     PROGRAM
 };
 
-/// The names alive in the current context, ascending. A shader or program counts as gone once its deletion
-/// was asked for. What a destroyed context held is gone.
+/// The names alive in the current context, ascending. A shader or program counts as deleted once its deletion was
+/// requested. Names of a destroyed context do not count.
 std::vector<GLuint> liveNames(Kind kind);
 
 /// "" if none is alive, else the live names by kind: "buffers 1 2, textures 7".

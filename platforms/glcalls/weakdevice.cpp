@@ -60,7 +60,7 @@ bool isWordCharacter(char c)
     return std::isalnum(static_cast<unsigned char>(c)) || c == '_';
 }
 
-/// Where word stands alone in text, from position on; npos if nowhere.
+/// The position of word as a whole word in text, from position on; npos if there is none.
 size_t findWord(const std::string& text, const std::string& word, size_t position = 0)
 {
     for (; (position = text.find(word, position)) != std::string::npos; ++position)
@@ -93,7 +93,7 @@ std::string listExtensions(const Device& device)
     {
         const bool isMissing = std::any_of(
             std::begin(offers),
-            std::end(offers), // GL_OES_depth_texture_cube_map goes with GL_OES_depth_texture
+            std::end(offers), // GL_OES_depth_texture_cube_map requires GL_OES_depth_texture
             [&word](const auto& offer) { return !offer.first && word.rfind(offer.second, 0) == 0; });
         if (!isMissing)
             list += (list.empty() ? "" : " ") + word;
@@ -162,7 +162,7 @@ struct UniformShape
     int rows, columns;
 };
 
-/// In the order in which they are packed. A type that is not here is a scalar or a sampler.
+/// In packing order. Other types are scalars or samplers.
 constexpr UniformShape UNIFORM_SHAPES[] = {
     {GL_FLOAT_MAT4, 4, 4}, {GL_FLOAT_MAT2, 2, 4}, {GL_FLOAT_VEC4, 1, 4}, {GL_INT_VEC4, 1, 4},
     {GL_BOOL_VEC4, 1, 4},  {GL_FLOAT_MAT3, 3, 3}, {GL_FLOAT_VEC3, 1, 3}, {GL_INT_VEC3, 1, 3},
@@ -213,7 +213,7 @@ std::string findVertexSource(GLuint program)
     return "";
 }
 
-/// Why the device does not link a program that the driver has linked; "" if it does.
+/// Why the device refuses to link a program that the driver has linked; "" if it does not.
 std::string findRefusal(GLuint program)
 {
     const Device& device = g_emulation.device;
@@ -289,7 +289,7 @@ void useProgram(GLuint program)
         queueError(GL_INVALID_OPERATION);
 }
 
-/// Without highp the preprocessor announces it in neither stage, and in fragments the word is a syntax error.
+/// Without highp, its macro is undefined in both stages, and in fragment shaders the word is a syntax error.
 void takeSource(GLuint shader, GLsizei count, const GLchar* const* strings, const GLint* lengths)
 {
     GLint kind = 0;
@@ -332,8 +332,8 @@ bool isNpot(GLuint texture)
            !(isPowerOfTwo(found->second.width) && isPowerOfTwo(found->second.height));
 }
 
-/// Notes the size of level 0 and raises the error of what the device does not take.
-/// @return whether the call may go on.
+/// Notes the size of level 0 and raises the error of a texture that the device does not support.
+/// @return whether to make the call.
 bool takeImage(GLenum target, GLint level, GLenum format, GLsizei width, GLsizei height)
 {
     const Device& device = g_emulation.device;
@@ -354,7 +354,7 @@ bool takeImage(GLenum target, GLint level, GLenum format, GLsizei width, GLsizei
     return false;
 }
 
-/// What samples black on a device for which only clamped sizes without mipmaps need not be powers of two.
+/// Whether a texture is incomplete, and so black, on a device without NPOT textures.
 bool isIncomplete(GLenum target)
 {
     GLint filter = 0;
@@ -385,7 +385,7 @@ void bindBlack(GLenum target)
     real(glTexParameteri)(target, GL_TEXTURE_MIN_FILTER, GL_NEAREST);
 }
 
-/// Draws with black in place of every incomplete texture.
+/// Draws with black instead of every incomplete texture.
 template <class Draw>
 void drawWithoutIncomplete(const Draw& draw)
 {

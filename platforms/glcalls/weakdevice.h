@@ -2,11 +2,11 @@
 
 #include "glcalls/glcalls.h"
 
-/// Makes the driver below look and refuse like one of the weaker ones that OpenGL ES 2.0 allows.
+/// Makes the driver behave like one of the weakest devices that OpenGL ES 2.0 allows.
 namespace glcalls
 {
 
-/// What a device offers. Where the driver below has less, that remains.
+/// The features of a device. Missing features of the driver stay missing.
 struct Device
 {
     const char* name = "";
@@ -20,8 +20,8 @@ struct Device
     bool hasFragmentHighp = true;
 };
 
-/// Each lack on its own, and then all together; of texture units and vertex uniform vectors the fewest that
-/// OpenGL ES 2.0 allows.
+/// Devices that lack one feature each, and one that lacks all; with the fewest texture units and vertex uniform vectors
+/// that OpenGL ES 2.0 allows.
 extern const Device WEAK_DEVICES[9];
 
 /// Until reset(), the driver answers questions as this device would, and refuses what the device lacks:

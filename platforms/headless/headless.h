@@ -15,23 +15,22 @@ struct Options
     int height = 64;
     int depthBits = 24; ///< at least this many, 0 for none
     int stencilBits = 8;
-    int samples = 0; ///< per pixel, for smooth edges; where the driver has none, there are none
+    int samples = 0; ///< per pixel, for smooth edges; none if the driver does not support them
 };
 
 /// A GL context with an off-screen surface (RGBA, 8 bits each) of its own.
 ///
-/// It is made on Mesa's surfaceless platform, or on the default display where that is not offered. Any
-/// number may exist at a time; each is a GL of its own that shares no objects with the others.
-/// Threads: as EGL has it, a context is current on one thread at a time.
+/// It uses Mesa's surfaceless platform or, without that, the default display. Any number may exist at a time; they
+/// share no objects. Threads: as EGL has it, a context is current on one thread at a time.
 class Context
 {
 public:
     /// Makes a context and makes it current.
     /// @param error  set to the reason, one line, on failure.
-    /// @return null on failure; whatever was current before still is.
+    /// @return null on failure; the current context is unchanged then.
     static std::unique_ptr<Context> create(const Options& options, std::string& error);
 
-    /// The GL objects go with the context. If it is current, none is afterwards.
+    /// Deletes the GL objects with the context. If it was current, no context is current afterwards.
     ~Context();
 
     Context(const Context&) = delete;
@@ -45,7 +44,7 @@ public:
     int getWidth() const { return m_width; }
     int getHeight() const { return m_height; }
 
-    /// Waits for the drawing and reads the surface (whatever framebuffer is bound is bound again after).
+    /// Waits for drawing and reads the surface; restores the bound framebuffer.
     /// @return width x height x 4 bytes RGBA, top row first; empty if the context is not current.
     std::vector<uint8_t> readPixels() const;
 
@@ -62,7 +61,7 @@ private:
     int m_height = 0;
 };
 
-/// Reads the lower left of the current context's surface, wherever that was made; see Context::readPixels().
+/// Reads the lower left of the current context's surface, whatever made it; see Context::readPixels().
 std::vector<uint8_t> readSurface(int width, int height);
 
 /// Reads from the bound framebuffer of the current context.

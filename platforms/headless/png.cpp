@@ -21,8 +21,7 @@ namespace headless
 namespace
 {
 
-constexpr int PNG_FILTER =
-    3; // average; trying all of them on each line takes longer than what it saves is worth
+constexpr int PNG_FILTER = 3; // average; trying all filters on each line is not worth the time
 
 /// @param file  stays open. @return false, with errno or 0, if not all of it is written.
 bool writeTo(std::FILE* file, int width, int height, const uint8_t* rgba)

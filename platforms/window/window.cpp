@@ -14,7 +14,7 @@ struct Window::Native
 {
     SDL_Window* window = nullptr;
     SDL_GLContext context = nullptr;
-    bool shift = false; ///< as of the last event taken, which the keyboard may be ahead of
+    bool shift = false; ///< at the last event taken; the keyboard's state may be newer
 
     ~Native()
     {
@@ -27,8 +27,8 @@ struct Window::Native
 
     void destroyWindow()
     {
-        // SDL ends its own waiting by an event that it sends to the window on a second connection. The X server takes
-        // that for an error, and SDL ends the program, if the window is gone by the time it gets there.
+        // SDL ends its waiting with an event sent to the window on a second connection. If the window is already gone,
+        // the X server reports an error, and SDL ends the program.
         SDL_PumpEvents();
         SDL_Delay(50);
         SDL_DestroyWindow(window);
@@ -62,7 +62,7 @@ struct Window::Native
 namespace
 {
 
-/// Where there is no screen, SDL falls back on windows that are not shown.
+/// Without a screen, SDL falls back to windows that are not shown.
 bool isVisible()
 {
     const char* driver = SDL_GetCurrentVideoDriver();
@@ -140,7 +140,7 @@ Event translate(const SDL_Event& native, float scale)
 
 std::unique_ptr<Window> Window::create(const Options& options, std::string& error)
 {
-    SDL_SetHint(SDL_HINT_OPENGL_ES_DRIVER, "1"); // EGL, which the engine asks for entry points
+    SDL_SetHint(SDL_HINT_OPENGL_ES_DRIVER, "1"); // EGL, from which the engine gets entry points
     SDL_SetHint(SDL_HINT_VIDEO_X11_NET_WM_BYPASS_COMPOSITOR, "0");
     auto native = std::make_unique<Native>();
     const bool isReady = SDL_Init(SDL_INIT_VIDEO) == 0;

@@ -4,7 +4,7 @@
 #include <memory>
 #include <string>
 
-/// A window on the screen with OpenGL ES 2.0 in it. Knows nothing of the engine.
+/// A window with an OpenGL ES 2.0 context. Does not depend on the engine.
 namespace window
 {
 
@@ -15,10 +15,10 @@ struct Options
     int height = 600;
     int depthBits = 24;
     int stencilBits = 8;
-    int samples = 4; ///< per pixel, for smooth edges; where the driver has none, there are none
+    int samples = 4; ///< per pixel, for smooth edges; none if the driver does not support them
 };
 
-/// Keys that stand for no character. Others are known by the character on them, in lower case.
+/// Keys without a character. Others are identified by their character in lower case.
 namespace key
 {
 constexpr int32_t ESCAPE = 27;
@@ -46,9 +46,9 @@ struct Event
 {
     enum class Type
     {
-        OTHER, ///< nothing that matters here
+        OTHER, ///< irrelevant
         QUIT,  ///< the window was closed, or the program told to end
-        SHOW,  ///< the window has another size, or what it showed is gone: draw it again
+        SHOW,  ///< the window's size or contents changed: draw again
         KEY,   ///< pressed, or repeated by itself
         PRESS,
         RELEASE,
@@ -65,7 +65,7 @@ struct Event
     int clicks = 0;               ///< 2 for the second press of a double click
     float x = 0.0f;               ///< of the pointer, in pixels from the upper left corner
     float y = 0.0f;
-    float turns = 0.0f; ///< steps of the wheel, away from the hand is more than 0
+    float turns = 0.0f; ///< steps of the wheel, positive away from the user
     std::string path;   ///< of DROP
 };
 
@@ -77,7 +77,7 @@ public:
     /// @param error  set to the reason on failure.
     static std::unique_ptr<Window> create(const Options& options, std::string& error);
 
-    /// The GL objects go with the window.
+    /// Deletes the GL objects with the window.
     ~Window();
 
     Window(const Window&) = delete;
@@ -89,7 +89,7 @@ public:
 
     void setTitle(const std::string& title);
 
-    /// Takes the whole screen, without a change of its resolution, or gives it back. A SHOW follows.
+    /// Switches full screen on or off, without changing the resolution. A SHOW follows.
     void setFullScreen(bool isFull);
     bool isFullScreen() const;
 
@@ -98,7 +98,7 @@ public:
     /// Waits for an event so long at most.
     bool wait(Event& event, int milliseconds);
 
-    /// Shows what was drawn, at the screen's next refresh where the driver can tell.
+    /// Shows the drawn frame, at the next vertical sync if the driver supports it.
     void show();
 
 private:
