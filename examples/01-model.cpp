@@ -1,4 +1,4 @@
-// A windmill from a scene file, its sails one second on.
+// A windmill from a scene file, with its sails turned.
 //
 //   build/default/examples/01-model --out model.png
 
@@ -15,10 +15,9 @@ static bool draw(Canvas& canvas)
     if (!model)
         return false; // the log says why
     AnimationController player(model->getAnimationGroup());
-    if (const auto turn =
-            model->getAnimation("turn")) // a clip of it; without these lines all movement there is
+    if (const auto turn = model->getAnimation("turn")) // one clip; without these lines, all of them
         setLoopRange(player, turn->getStart(), turn->getEnd());
-    player.setInterpolated(true); // and not from key to key
+    player.setInterpolated(true); // between keys
 
     player.update(1.0f / 3.0f); // each frame: the seconds since the last one
     // cookbook]

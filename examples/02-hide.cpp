@@ -1,4 +1,4 @@
-// Three cubes, of which the one in the middle is hidden with the ball that stands on it.
+// Three cubes; the middle one is hidden, together with the ball on it.
 //
 //   build/default/examples/02-hide --out hide.png
 
@@ -24,7 +24,7 @@ static bool draw(Canvas& canvas)
     block.setBackgroundColour(Colour4f(0.9f, 0.9f, 0.88f, 1.0f));
     // [cookbook
     block.setRenderFlags(SceneNode::VISIBLE); // once: this block leaves out what is hidden
-    cubes[1]->setVisible(false);              // with all that hangs from it; true shows it again
+    cubes[1]->setVisible(false);              // and everything below it; true shows it again
     block.render();
     // cookbook]
     return true;

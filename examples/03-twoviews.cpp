@@ -24,7 +24,7 @@ static bool draw(Canvas& canvas)
     RenderBlock map(canvas.renderer, scene, mapCamera);
     map.setViewport(10, 10, 120, 90); // pixels, from the lower left
     map.setBackgroundColour(Colour4f(0.2f, 0.25f, 0.3f, 1.0f));
-    map.getBackground().setViewportOnly(true); // or it would clear the large view away
+    map.getBackground().setViewportOnly(true); // otherwise it would clear the large view
 
     block.render(); // each frame
     map.render();

@@ -1,4 +1,4 @@
-// A scene drawn into a texture, which is on the sides of a cube.
+// A scene drawn into a texture that is shown on the sides of a cube.
 //
 //   build/default/examples/04-texture --out texture.png
 
@@ -19,7 +19,7 @@ static bool draw(Canvas& canvas)
     if (!cube)
         return false;
     const auto camera = canvas.addCamera(scene, Vector3f(3.2f, 2.4f, 4.0f), {});
-    RenderBlock block(canvas.renderer, scene, camera); // takes the viewport of now, that of the surface
+    RenderBlock block(canvas.renderer, scene, camera); // uses the current viewport, that of the surface
     block.setBackgroundColour(Colour4f(0.88f, 0.88f, 0.85f, 1.0f));
     // [cookbook
     const auto picture = pool.getTexture2DCache()->create(256, 256, Texture::Format::RGB,
@@ -28,13 +28,13 @@ static bool draw(Canvas& canvas)
         makeShared<RenderTarget>(picture, nullptr, true, false); // with depth, without stencil
     if (!picture || !target->isComplete())
         return false;                                     // the log says why
-    picture->setMinFilter(Texture2D::FilterMode::LINEAR); // its mipmaps do not follow what is drawn
+    picture->setMinFilter(Texture2D::FilterMode::LINEAR); // mipmaps are not updated
     cube->getAppearance()->setProperty("M_DIFFUSE_TEXTURE", picture);
 
     RenderBlock into(canvas.renderer, inner, innerCamera);
     into.setRenderTarget(target); // fills it; no viewport is needed
     into.setBackgroundColour(Colour4f(0.1f, 0.3f, 0.5f, 1.0f));
-    into.render(); // each frame, or whenever the picture is to change; before what shows it
+    into.render(); // each frame, or when the picture changes; before the block that shows it
     block.render();
     // cookbook]
     return true;

@@ -18,13 +18,13 @@ static bool draw(Canvas& canvas)
                     {1.0f, 0.7f, 0.6f}, 1.4f))
         return false;
     // [cookbook
-    // A mirror is a flat solid whose shader program asks for M_MIRROR_TEXTURE; mirror.sp of the samples is such a one.
+    // A mirror is a flat solid whose shader program binds M_MIRROR_TEXTURE, such as mirror.sp of the samples.
     const auto mirror = createSquare(pool, Vector2f(1.0f, 1.0f));
     if (!mirror)
         return false;
     mirror->setAppearance(loadAppearance(pool, "mirror.ap"));
     mirror->setScale(Vector3f(6.0f, 3.0f, 1.0f));
-    mirror->setPosition(Vector3f(0.0f, 1.5f, -1.5f)); // it reflects what is on its +z side
+    mirror->setPosition(Vector3f(0.0f, 1.5f, -1.5f)); // it reflects on its +z side
     mirror->setParent(scene);
     // cookbook]
     const auto camera = canvas.addCamera(scene, Vector3f(1.5f, 2.4f, 7.5f), Vector3f(0.0f, 1.0f, 0.0f));

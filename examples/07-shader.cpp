@@ -1,4 +1,4 @@
-// Rings that run over a ball and lift it, by a shader program of one's own: samples/ripple.
+// Waves that run over a ball, by a shader program of one's own: samples/ripple.
 //
 //   build/default/examples/07-shader --out shader.png
 
@@ -18,9 +18,8 @@ static bool draw(Canvas& canvas)
     const auto ball = createSphere(pool, 64, 128, Vector2f(1.0f, 1.0f));
     const auto ripple = loadAppearance(pool, "ripple.ap");
     if (!ball || !ripple->getShaderProgram())
-        return false; // the log says why
-    ripple->setProperty("M_RIPPLE_COLOUR",
-                        Vector4f(0.2f, 0.65f, 0.85f, 1.0f)); // what the program calls by this name
+        return false;                                                           // the log says why
+    ripple->setProperty("M_RIPPLE_COLOUR", Vector4f(0.2f, 0.65f, 0.85f, 1.0f)); // bound in ripple.sp
     ball->setAppearance(ripple);
     // cookbook]
     ball->setRotation(quaternionFromAxisAngle(Vector3f::Y_AXIS, Anglef::fromDegrees(-90.0f)));

@@ -1,4 +1,4 @@
-// Textures that no file holds: a loader of one's own makes chequers of any number of fields.
+// Textures without files: a loader of one's own makes chequers of any number of fields.
 //
 //   build/default/examples/08-loader --out loader.png
 
@@ -41,8 +41,7 @@ static bool draw(Canvas& canvas)
         return false;
     // [cookbook
     pool.getTexture2DCache()->registerLoader(makeShared<ChequerLoader>());
-    const auto texture =
-        pool.getTexture2DCache()->get("chequers:8"); // in .ap files as well, by the same name
+    const auto texture = pool.getTexture2DCache()->get("chequers:8"); // .ap files can use this name too
     // cookbook]
     if (!texture)
         return false;

@@ -8,7 +8,7 @@
 
 using namespace orv;
 
-/// All that holds assets, in one place: so it can be dropped and made again.
+/// All objects that hold assets, together, so that they can be dropped and made again.
 struct Show
 {
     SharedPtr<SceneNode> scene;
@@ -43,7 +43,7 @@ static bool draw(Canvas& canvas)
     canvas.renderer = nullptr;
     canvas.context = nullptr;
     canvas.pool->forgetContext(); // makes no GL call
-    if (!show.start(canvas))      // what made them the first time
+    if (!show.start(canvas))      // makes everything again
         return false;
     show.block->render();
     // cookbook]

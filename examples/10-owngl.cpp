@@ -1,4 +1,4 @@
-// Triangles by GL calls of one's own, between two frames of the engine.
+// Triangles drawn by your own GL calls, between two frames of the engine.
 //
 //   build/default/examples/10-owngl --out owngl.png
 
@@ -8,7 +8,7 @@
 
 using namespace orv;
 
-/// A program that draws corners in their places, coloured by where they are.
+/// A program that draws corners coloured by their position.
 static GLuint makeProgram()
 {
     const char* const sources[] = {
@@ -38,22 +38,22 @@ static bool draw(Canvas& canvas)
         return false;
     const auto camera = canvas.addCamera(scene, Vector3f(2.5f, 2.0f, 5.0f), {});
     RenderBlock block(canvas.renderer, scene, camera);
-    block.render(); // one frame, which leaves GL's state as its last draw needs it
+    block.render(); // one frame, which leaves the GL state of its last draw
     const GLuint program = makeProgram();
     const float corners[] = {-0.95f, -0.9f, -0.55f, -0.9f, -0.75f, -0.3f,
                              0.95f,  0.9f,  0.55f,  0.9f,  0.75f,  0.3f};
     // [cookbook
     block.render();
-    glUseProgram(program); // programs, buffers, textures and attributes: whatever you like
+    glUseProgram(program); // bindings need not be restored
     glBindBuffer(GL_ARRAY_BUFFER, 0);
     glVertexAttribPointer(0, 2, GL_FLOAT, GL_FALSE, 0, corners);
     glEnableVertexAttribArray(0);
-    glDisable(GL_DEPTH_TEST); // render state: put back what you change
+    glDisable(GL_DEPTH_TEST); // render state has to be restored
     glDrawArrays(GL_TRIANGLES, 0, 6);
     glEnable(GL_DEPTH_TEST);
     // cookbook]
     glDeleteProgram(program);
-    RenderBlock inset(canvas.renderer, scene, camera); // the engine goes on as if nothing had been
+    RenderBlock inset(canvas.renderer, scene, camera); // the engine draws as before
     inset.setViewport(canvas.getWidth() - 130, 10, 120, 70);
     inset.setBackgroundColour(Colour4f(0.3f, 0.35f, 0.45f, 1.0f));
     inset.getBackground().setViewportOnly(true);

@@ -1,4 +1,4 @@
-// What is under the pointer: a ray through a pixel, and a box around what it meets first.
+// Picking: a ray through a pixel, and a box around the nearest solid that it hits.
 //
 //   build/default/examples/11-picking --out picking.png
 
@@ -11,7 +11,7 @@
 using namespace orv;
 
 // [cookbook
-/// From the eye through a pixel. @param x,y  from the upper left.
+/// A ray from the eye through a pixel. @param x,y  from the upper left.
 static Ray makeRay(const Camera& camera, float x, float y, int width, int height)
 {
     // The field of view spans the shorter side, here at a distance of 1.
@@ -36,7 +36,7 @@ static bool draw(Canvas& canvas)
     block.render();
     const auto lines = makeShared<DebugLines>(pool);
     // [cookbook
-    // loaded with MeshData::GEOMETRY, so that its triangles are in memory
+    // the model was loaded with MeshData::GEOMETRY
     const Ray ray = makeRay(*camera, 190.0f, 60.0f, canvas.getWidth(), canvas.getHeight());
     const auto hits = pick(*scene, ray); // the nearest first
     if (hits.empty())

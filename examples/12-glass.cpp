@@ -1,4 +1,4 @@
-// A ball of glass before others: what is behind it shows through.
+// A transparent ball before two others.
 //
 //   build/default/examples/12-glass --out glass.png
 
@@ -19,12 +19,12 @@ static bool draw(Canvas& canvas)
     if (!ball)
         return false;
     // [cookbook
-    // An appearance blends as soon as its blend factors are not those of opaque ones. Such solids are drawn after all
-    // others, the farthest first.
+    // An appearance blends if its blend factors differ from the defaults. Blended solids are drawn after all
+    // others, farthest first.
     Appearance& glass = *ball->getAppearance();
     glass.setBlendFactors(BlendFactor::SRC_ALPHA, BlendFactor::SRC_ALPHA, BlendFactor::ONE_MINUS_SRC_ALPHA,
                           BlendFactor::ONE_MINUS_SRC_ALPHA);
-    glass.setDepthWriteEnabled(false); // so that it does not hide glass behind it
+    glass.setDepthWriteEnabled(false); // does not hide glass behind it
     glass.setProperty("M_OPACITY", 0.4f);
     glass.setProperty("M_SPECULAR_COLOUR", Vector4f(1.0f, 1.0f, 1.0f, 1.0f));
     glass.setProperty("M_SHININESS", 60.0f);

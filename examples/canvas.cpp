@@ -70,7 +70,7 @@ int Canvas::run(int argc, char** argv, const char* name, bool (*draw)(Canvas& ca
     canvas.m_options.width = 400;
     canvas.m_options.height = 240;
     canvas.m_options.samples = 4;
-    if (!canvas.loseContext()) // at first there is none to lose
+    if (!canvas.loseContext()) // the first call makes the first context
         return 1;
     canvas.pool = makeShared<AssetCachePool>();
     canvas.context = makeShared<RenderContext>();
@@ -86,7 +86,7 @@ int Canvas::run(int argc, char** argv, const char* name, bool (*draw)(Canvas& ca
     else
         std::printf("wrote %s\n", path.c_str());
     canvas.renderer = nullptr;
-    canvas.pool->flush(); // the GL objects go while their context is there
+    canvas.pool->flush(); // deletes GL objects while their context exists
     canvas.pool->flush();
     return isDrawn && error.empty() ? 0 : 1;
 }

@@ -6,8 +6,8 @@
 
 #include <memory>
 
-/// What the numbered examples share, so that each shows one idea: a GL context that draws to memory, what the engine
-/// draws with, and a few things to draw.
+/// Shared by the numbered examples, so that each shows one idea: a GL context that draws to memory, the engine's
+/// objects for drawing, and a few solids.
 class Canvas
 {
 public:
@@ -25,7 +25,7 @@ public:
     orv::SharedPtr<orv::Camera> addCamera(const orv::SharedPtr<orv::SceneNode>& scene,
                                           const orv::Vector3f& eye, const orv::Vector3f& target) const;
 
-    /// Gives a solid a colour and a place, and hangs it into the scene.
+    /// Gives a solid a colour and a position, and attaches it to the scene.
     /// @return the solid; empty if it was.
     orv::SharedPtr<orv::Solid> add(const orv::SharedPtr<orv::Solid>& solid,
                                    const orv::SharedPtr<orv::SceneNode>& scene, const orv::Colour4f& colour,
@@ -34,13 +34,13 @@ public:
     /// The whole surface, top row first, 4 bytes a pixel.
     std::vector<uint8_t> readPixels() const { return m_gl->readPixels(); }
 
-    /// What a phone does whenever it likes: every GL object is gone, and a new context begins without any.
+    /// Replaces the GL context by a new one without objects, as can happen on a phone at any time.
     /// @return false, with a line on standard error, if there is none.
     bool loseContext();
 
     /// The main function of an example: makes a canvas, draws, writes what was drawn. Takes "--out FILE.png".
-    /// @param name  of the file otherwise, without its extension.
-    /// @param draw  returns whether all is drawn; the log says why not.
+    /// @param name  default name of the file, without its extension.
+    /// @param draw  returns false if drawing failed; the log says why.
     /// @return the program's exit code.
     static int run(int argc, char** argv, const char* name, bool (*draw)(Canvas& canvas));
 

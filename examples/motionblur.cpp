@@ -1,7 +1,7 @@
 // Motion blur: a wheel spins and a crate passes, while a ball and another crate stay where they are.
 //
-// Each frame is drawn in three steps, one render block each: the sharp picture into a texture, how fast every pixel
-// moves into another, and both together, as the program "orv#motionblur.sp" composes them, to the surface.
+// Each frame takes three render blocks: the sharp picture into a texture, the velocities of all pixels into another,
+// and the composition of both by "orv#motionblur.sp" to the surface.
 //
 //   build/default/examples/motionblur --out blur [--factor 1] [--stereo] [--size 960x540]
 //
@@ -26,8 +26,8 @@ constexpr int FRAMES = 12; // the last one is written
 
 struct Arguments
 {
-    std::string out = "blur"; ///< what the names of the pictures begin with
-    float factor = 1.0f;      ///< how long the shutter is open, in sixtieths of a second
+    std::string out = "blur"; ///< prefix of the pictures' names
+    float factor = 1.0f;      ///< shutter time in sixtieths of a second
     bool stereo = false;
     int width = 960;
     int height = 540;
@@ -55,7 +55,7 @@ bool parse(int argc, char** argv, Arguments& arguments)
     return arguments.width > 0 && arguments.height > 0;
 }
 
-/// What moves, and what it moves in.
+/// The scene and its moving nodes.
 struct Scene
 {
     SharedPtr<SceneNode> root = makeShared<SceneNode>("scene");
@@ -64,7 +64,7 @@ struct Scene
     SharedPtr<Camera> camera = makeShared<Camera>("camera");
 };
 
-/// Puts a solid below a node, wearing the appearance file of that name.
+/// Attaches a solid to a node, with the appearance file of that name.
 bool place(AssetCachePool& pool, const SharedPtr<Solid>& solid, const char* appearance,
            const SharedPtr<SceneNode>& parent, const Vector3f& position, const Vector3f& scale)
 {
@@ -134,7 +134,7 @@ SharedPtr<RenderTarget> createTarget(AssetCachePool& pool, const Arguments& argu
     return target->isComplete() ? target : nullptr;
 }
 
-/// A scene of one square, which the program of the composition stretches over the view.
+/// A scene of one square, which the composition's program stretches over the view.
 SharedPtr<Solid> createComposition(AssetCachePool& pool, const RenderTarget& sharp,
                                    const RenderTarget& velocity, bool stereo)
 {
@@ -171,7 +171,7 @@ bool writeTarget(const std::string& path, const Arguments& arguments, RenderTarg
     return write(path, arguments, pixels);
 }
 
-/// Draws to the current GL context; what it makes is gone again when it returns.
+/// Draws to the current GL context, and releases everything it made.
 bool draw(const SharedPtr<AssetCachePool>& pool, const Arguments& arguments, const headless::Context& gl)
 {
     Scene scene;
@@ -196,7 +196,7 @@ bool draw(const SharedPtr<AssetCachePool>& pool, const Arguments& arguments, con
     sharpBlock->setRenderTarget(sharp);
     const auto velocityBlock = makeShared<RenderBlock>(velocityRenderer, scene.root, scene.camera);
     velocityBlock->setRenderTarget(velocity);
-    velocityBlock->setBackgroundColour(Colour4f::BLACK); // nothing there, so nothing moves
+    velocityBlock->setBackgroundColour(Colour4f::BLACK); // black: nothing drawn
     const auto composedBlock = makeShared<RenderBlock>(renderer, composition, nullptr);
     composedBlock->setViewport(0, 0, arguments.width, arguments.height);
 
@@ -207,7 +207,7 @@ bool draw(const SharedPtr<AssetCachePool>& pool, const Arguments& arguments, con
     if (arguments.stereo)
         scene.camera->setStereo(9.0f, 0.4f);
 
-    for (int i = 1; i <= FRAMES; ++i) // the first has none before it, so its velocities mean nothing
+    for (int i = 1; i <= FRAMES; ++i) // the first frame has no previous one, so its velocities are wrong
     {
         const float time = float(i) * FRAME_SECONDS;
         move(scene, time);
@@ -246,7 +246,7 @@ int main(int argc, char** argv)
     registerSource(*pool, SAMPLES_FOLDER "/showpiece", false);
     const bool drawn = draw(pool, arguments, *gl);
 
-    // Nothing uses the assets any more: the first flush drops them, the second what they were made of.
+    // The first flush deletes unused assets, the second the assets that those used.
     pool->flush();
     pool->flush();
     return drawn ? 0 : 1;

@@ -1,5 +1,5 @@
-// A page in eight scripts, with fonts of the packages fonts-dejavu-core and fonts-droid-fallback. Built where HarfBuzz is
-// (packages libharfbuzz-dev, fonts-lohit-deva), it shows three more, which that library shapes.
+// A page in eight scripts, with fonts of the packages fonts-dejavu-core and fonts-droid-fallback. Built with HarfBuzz
+// (packages libharfbuzz-dev, fonts-lohit-deva), it shows three more scripts shaped by that library.
 //
 //   build/default/examples/scripts --out scripts.png [--density 2]
 
@@ -64,7 +64,7 @@ constexpr Line LINES[] = {
 
 #ifdef WITH_HARFBUZZ
 
-/// Each of one script and direction; a text that mixes them is cut into such pieces first.
+/// Lines of one script and direction each; split texts that mix them into such pieces first.
 constexpr Line SHAPED_LINES[] = {
     {"Arabic", "مرحبا بالعالم"},
     {"Hebrew", "שלום, עולם"},

@@ -1,5 +1,5 @@
-// Shadows: a figure that walks by a fence in the light of a spot, at four moments of its walk. The fence is a sheet with
-// holes, a cut-out.
+// Shadows: a figure that walks past a fence in the light of a spot, in four poses. The fence is a cut-out, a sheet with
+// holes.
 //
 //   build/default/examples/shadows --out shadows.png
 
@@ -83,7 +83,7 @@ void walk(Figure& figure, float time)
     }
 }
 
-/// A lattice of bars, opaque where its picture is and with holes where that has an alpha of 0.
+/// A lattice of bars: holes where its picture has alpha 0.
 void addFence(AssetCachePool& pool, const SharedPtr<SceneNode>& scene)
 {
     constexpr int SIDE = 32;

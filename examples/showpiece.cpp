@@ -1,6 +1,6 @@
-// The show-piece: what the engine can do, in one picture. A bumpy tiled floor, crates, a chrome ball that reflects
-// the sky, glass, a planar mirror with a program of its own, a spot light and a point light, and two converted
-// models: a duck that slides past, and a figure that moves as its file says.
+// The show-piece: the engine's features in one picture. A bumpy tiled floor, crates, a chrome ball that reflects the
+// sky, glass, a planar mirror with a program of its own, a spot light and a point light, and two converted models: a
+// duck that slides past, and a figure that plays its own animation.
 //
 //   build/default/examples/showpiece --out showpiece.png [--duck duck.glo] [--dancer motion.glo] [--time 3.2]
 //                                    [--stereo] [--size 960x540] [--shadows sun|spot] [--far 2]
@@ -27,8 +27,8 @@ struct Arguments
     std::string dancer; ///< path of a .glo that plays its own animation; none leaves it out
     float time = 2.5f;  ///< seconds
     bool stereo = false;
-    std::string shadows;   ///< the light that throws them; none without a name
-    float distance = 1.0f; ///< of the camera, in times the usual one
+    std::string shadows;   ///< the light that casts them; empty for none
+    float distance = 1.0f; ///< of the camera, relative to the usual one
     int width = 960;
     int height = 540;
 };
@@ -63,7 +63,7 @@ bool parse(int argc, char** argv, Arguments& arguments)
     return arguments.width > 0 && arguments.height > 0;
 }
 
-/// Puts a solid into the scene, wearing the appearance file of that name.
+/// Attaches a solid to the scene, with the appearance file of that name.
 bool place(const SharedPtr<Solid>& solid, const char* appearance, AssetCachePool& pool,
            const SharedPtr<SceneNode>& parent, const Vector3f& position, const Vector3f& scale)
 {
@@ -174,7 +174,7 @@ bool addSolids(AssetCachePool& pool, const SharedPtr<SceneNode>& scene)
     return complete;
 }
 
-/// Loads a model as it stands on the floor at that place, turned and scaled, and plays its own animation up to now.
+/// Loads a model, places it on the floor, turned and scaled, and plays its animation to the current time.
 bool addModel(AssetCachePool& pool, const SharedPtr<SceneNode>& scene, const std::string& path, float time,
               const Vector3f& position, float turnRadians, float scale)
 {
@@ -277,7 +277,7 @@ int main(int argc, char** argv)
     registerSource(*pool, SAMPLES_FOLDER "/showpiece", false);
     const bool drawn = draw(pool, arguments);
 
-    // Nothing uses the assets any more: the first flush drops them, the second what they were made of.
+    // The first flush deletes unused assets, the second the assets that those used.
     pool->flush();
     pool->flush();
     if (!drawn)

@@ -1,7 +1,7 @@
-// Smooth motion: one figure at ten moments of a second, from left to right, three times.
+// Smooth motion: one figure at ten times of a second, from left to right, in three rows.
 //
 // Its walk has three keys. The upper row plays them as they are, in steps; the middle row interpolates between them; in the
-// lower row a second controller, limited to one arm, fades in and waves. Lines show how the nodes hang together.
+// lower row a second controller, limited to one arm, fades in and waves. Lines show the node hierarchy.
 //
 //   build/default/examples/smoothmotion --out figures.png
 
@@ -105,7 +105,7 @@ void drawRow(int row, const SharedPtr<RenderContext>& context, const SharedPtr<A
     for (int i = 0; i < MOMENTS; ++i)
     {
         walking.update(i > 0 ? 1.0f / MOMENTS : 0.0f);
-        waving.update(i > 0 ? 1.0f / MOMENTS : 0.0f); // after the one that it goes over
+        waving.update(i > 0 ? 1.0f / MOMENTS : 0.0f); // after the controller below it
         block.setViewport(i * WIDTH, (2 - row) * HEIGHT, WIDTH, HEIGHT);
         block.render();
         lines->clear();

@@ -24,11 +24,11 @@ const Colour4f PAPER(0.96f, 0.95f, 0.91f, 1.0f);
 const Colour4f INK(0.1f, 0.12f, 0.2f, 1.0f);
 const Colour4f RED_INK(0.7f, 0.1f, 0.1f, 1.0f);
 
-/// A font file, of which the sizes are loaded as they are asked for.
+/// A font file whose sizes are loaded when they are needed.
 struct Typeface
 {
     AssetCachePool& pool;
-    std::string file; ///< as the sources of the pool have it
+    std::string file; ///< its name in the pool's sources
 
     Text::Ptr createText(unsigned size, const Colour4f& colour) const
     {
@@ -37,7 +37,7 @@ struct Typeface
     }
 };
 
-/// One text for each size and colour: each is drawn at once, wherever on the page its strings are.
+/// One text for each size and colour: each takes one draw.
 bool writePage(const Typeface& face, std::vector<Text::Ptr>& page)
 {
     float y = MARGIN;
@@ -88,7 +88,7 @@ bool addLabel(const Typeface& face, const char* words, const Colour4f& colour, c
     return true;
 }
 
-/// A cube with words on two sides, and more of them that lead away from the viewer.
+/// A cube with words on two sides, and more words that recede from the viewer.
 bool buildScene(const Typeface& face, const SceneNode::Ptr& scene)
 {
     const Solid::Ptr cube = createCube(face.pool, Vector2f(1.0f, 1.0f));
