@@ -1,10 +1,10 @@
-// What motion blur costs: a frame drawn straight to the surface beside one that is blurred, and beside the three parts of
-// that: the scene into a texture, its velocities into another, and the composition of the two.
+// The cost of motion blur: a frame drawn directly to the surface, a blurred frame, and the three parts of the latter:
+// the scene into a texture, its velocities into another, and the composition of the two.
 //
 //   blurbench [cubes]
 //
-// "Driver" times are whole frames up to glFinish; in "alone" times every GL call is dropped, which leaves what the engine
-// costs itself. Medians of many frames.
+// "Driver" times are whole frames up to glFinish; for "alone" times every GL call is dropped, which leaves the engine's
+// own cost. Medians of many frames.
 
 #include "glcalls/glcalls.h"
 #include "headless/headless.h"
@@ -35,7 +35,7 @@ constexpr int COLUMNS = 25;
     std::exit(EXIT_FAILURE);
 }
 
-/// A wall of cubes, of which every other one spins, and what draws it in both ways.
+/// A wall of cubes, every other one spinning, and the blocks that draw it in both ways.
 class Wall
 {
 public:

@@ -18,16 +18,16 @@
 namespace callgrind
 {
 
-// Named without C++ decoration, as callgrind's options want it.
+// Without C++ name mangling, for callgrind's options.
 extern "C" [[gnu::noinline]] void callgrindMeasure(Work work, void* object, int number)
 {
     work(object, number);
-    asm volatile(""); // no tail call: the function is to be left after the work
+    asm volatile(""); // no tail call: the work must run inside this function
 }
 
 void measure(Work work, void* object, int number)
 {
-    CALLGRIND_START_INSTRUMENTATION; // what leads here takes ten times as long while it is watched
+    CALLGRIND_START_INSTRUMENTATION; // code before this would take ten times as long
     callgrindMeasure(work, object, number);
     CALLGRIND_STOP_INSTRUMENTATION;
 }

@@ -33,5 +33,5 @@ std::unique_ptr<Contender> makeWalkContender(const DrawScene& scene);       ///<
 std::unique_ptr<Contender> makeByMaterialContender(const DrawScene& scene); ///< whose order is by material
 std::unique_ptr<Contender> makeGroupedContender(const DrawScene& scene);    ///< grouped by the renderer
 
-/// The floor: what a programmer would write who knows this scene and nothing else.
+/// The reference: code written by hand for this scene only.
 std::unique_ptr<Contender> makeHandContender(const DrawScene& scene);

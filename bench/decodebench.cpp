@@ -1,9 +1,9 @@
-// What decoding compressed textures in software costs: millions of texels a second of each decoder, ETC1's beside
-// that of Android's libETC1 where it was found when this was built.
+// The cost of decoding compressed textures in software: millions of texels a second of each decoder, ETC1 beside
+// Android's libETC1 if it was installed at build time.
 //
 // "Noise" is random blocks, the worst case for code with branches; "picture" is what libETC1's encoder made of a
-// smooth picture. libETC1 writes three bytes a texel, these decoders four. The best of several runs counts: what
-// else the machine does can only add.
+// smooth picture. libETC1 writes three bytes a texel, these decoders four. The best of several runs counts, since other
+// work on the machine can only add time.
 
 #include "pvr/etc1.h"
 #include "pvr/pvrtc.h"

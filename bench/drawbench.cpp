@@ -1,9 +1,9 @@
-// What a draw costs: the engine's frame beside a hand-written OpenGL ES 2.0 loop that draws the same picture.
+// The cost of a draw: the engine's frame beside a hand-written OpenGL ES 2.0 loop that draws the same picture.
 //
 // The scene is described in drawscene.h. Both sides draw through the same table of GL calls (glcalls).
 // "GL calls" are those of one frame per draw. "User ms" is processor time of a whole frame on the real driver, all
 // its threads. "Instructions" are those of one frame per draw with every GL call dropped, so that the driver is not
-// counted; callgrind counts them where valgrind is installed. "Heap" is what a cube takes once it was drawn.
+// counted; callgrind counts them where valgrind is installed. "Heap" is the memory of a cube after it was drawn.
 //
 // Arguments: numbers of cubes; 1000 5000 50000 without any. "--table" before them prints the engine's instructions alone,
 // a line "name count" each, for ./run bench --check.
@@ -46,7 +46,7 @@ constexpr MakeContender CONTENDERS[] = {makeWalkContender, makeByMaterialContend
                                         makeHandContender};
 constexpr size_t CONTENDER_COUNT = std::size(CONTENDERS);
 
-/// In the table; what is written by hand is not in it.
+/// Name in the table; null for the hand-written loop.
 constexpr const char* CONTENDER_NAMES[CONTENDER_COUNT] = {"walk", "by-material", "grouped", nullptr};
 
 size_t getHeapBytes()
@@ -107,7 +107,7 @@ void drawDropped(Contender& contender, int frame)
     glcalls::dropAll(false);
 }
 
-/// The heap that each further cube takes once it was drawn; the driver takes nothing, since it is not called.
+/// The heap for each further cube after it was drawn; without the driver, which is not called.
 double measureHeap(MakeContender make)
 {
     size_t bytes[2];
@@ -139,7 +139,7 @@ void forEachRun(const std::vector<int>& counts, Use use)
     }
 }
 
-/// What runs under callgrind.
+/// Runs under callgrind.
 void drawForCounting(const std::vector<int>& counts)
 {
     forEachRun(counts,

@@ -8,15 +8,15 @@
 #include <cstdint>
 #include <vector>
 
-/// What both sides of drawbench draw: cubes in a block, lit by a lamp far away, ten materials of different colour
-/// and texture taken in turn, so that in the order of the scene each draw changes the material.
+/// The scene of drawbench: cubes in a block, lit by a directional light, with ten materials of different colour and
+/// texture in turn, so that in the order of the scene each draw changes the material.
 struct DrawScene
 {
     static constexpr int MATERIALS = 10;
     static constexpr int TURNS = 64;
     static constexpr int TEXTURE_SIZE = 4;
 
-    /// What moves from frame to frame, beside the camera, which always does.
+    /// What moves from frame to frame, besides the camera.
     enum class Motion
     {
         STILL,
@@ -41,7 +41,7 @@ struct DrawScene
     /// One cube of this many turns; 0 for none.
     size_t getTurningStep() const;
 
-    /// RGB, TEXTURE_SIZE by TEXTURE_SIZE, of one colour, so that filters make no difference.
+    /// RGB, TEXTURE_SIZE by TEXTURE_SIZE, of one colour, so that filters have no effect.
     std::vector<uint8_t> makeTexture(int material) const;
 
     Motion motion;
@@ -49,5 +49,5 @@ struct DrawScene
     orv::Quaternionf turns[TURNS]; ///< rotations about an axis, a small step apart
     orv::Vector4f colours[MATERIALS];
     orv::Vector4f lightDirection; ///< towards the light
-    float reach;                  ///< of the block, from the middle
+    float reach;                  ///< of the block, from its centre
 };

@@ -1,10 +1,9 @@
-// What the static library beside liborv costs: a frame with shadows beside the same frame without, lines over a frame, and
-// picking.
+// The cost of engine/extra: a frame with and without shadows, lines over a frame, and picking.
 //
 //   extrabench [cubes]
 //
-// "Driver" times are whole frames up to glFinish; in "alone" times every GL call is dropped, which leaves what the engine
-// costs itself. Medians.
+// "Driver" times are whole frames up to glFinish; for "alone" times every GL call is dropped, which leaves the engine's
+// own cost. Medians.
 
 #include "glcalls/glcalls.h"
 #include "headless/headless.h"

@@ -1,5 +1,5 @@
-// What else runs in each frame, beside the same written by hand: skins, animation, text, sorting, mirrors, stereo, motion
-// blur, large trees. Instructions of one frame, with every GL call dropped; callgrind counts them.
+// Other work of a frame, beside the same written by hand: skins, animation, text, sorting, mirrors, stereo, motion
+// blur, large trees. Instructions of one frame, with every GL call dropped, counted by callgrind.
 //
 //   framebench           the figures
 //   framebench --table   "name count" of the engine, a line each, for ./run bench --check
@@ -73,7 +73,7 @@ Vector3f findPlace(int i)
 /// One way of doing one frame's work; drawn again and again.
 using Frame = std::function<void(int frame)>;
 
-/// What the engine's sides share.
+/// Shared by the engine's sides.
 struct Engine
 {
     SharedPtr<AssetCachePool> pool = makeShared<AssetCachePool>();
@@ -129,7 +129,7 @@ struct Engine
     }
 };
 
-/// A plain array of transforms, as programs have that know what they draw.
+/// A plain array of transforms, as in code for a known scene.
 struct Hand
 {
     std::vector<Matrix4f> worlds;
@@ -282,7 +282,7 @@ Frame makeAnimationHand()
     };
 }
 
-/// Interpolates, and mixes two moments into one rotation where there are two.
+/// Interpolates; with two times, mixes both rotations.
 Frame makeMixHand(int moments)
 {
     struct Channel
@@ -470,7 +470,7 @@ Frame makeStereoEngine()
     };
 }
 
-/// A thousand cubes in sight, which a look at each finds out, since one beside them is not.
+/// A thousand visible cubes, tested one by one, since another cube is not visible.
 Frame makeCubesEngine(bool isCulled)
 {
     const auto engine = std::make_shared<Engine>();
@@ -657,8 +657,8 @@ constexpr Case CASES[] = {
 
 void count(Frame (*make)(), bool isEngine)
 {
-    glcalls::dropAll(!isEngine);      // the engine's first frame makes what it needs
-    Frame& draw = *new Frame(make()); // GL objects go with the process
+    glcalls::dropAll(!isEngine);      // the engine's first frame makes GL objects
+    Frame& draw = *new Frame(make()); // GL objects end with the process
     draw(0);
     glcalls::dropAll();
     for (int i = 1; i < WARM_FRAMES; ++i)

@@ -37,7 +37,7 @@ GLuint compile(GLenum kind, const char* source)
     return shader;
 }
 
-/// Material after material, each bound once a frame; rotations are rigid, so they serve as normal matrices.
+/// Material after material, each bound once a frame; rotations are used as normal matrices.
 class HandContender : public Contender
 {
 public:

@@ -1,10 +1,10 @@
-// What loading costs: a scene file of 200,000 triangles beside read() and glBufferData() of the same bytes, and the way
-// from a program's start to its first frame beside a bare context that links one program.
+// The cost of loading: a scene file of 200,000 triangles beside read() and glBufferData() of the same bytes, and the
+// time from a program's start to its first frame beside a bare context that links one program.
 //
-// "ms" are medians of wall time on the real driver, the shader program being there already. "Instructions" are the
+// "ms" are medians of wall time on the real driver, with the shader program already loaded. "Instructions" are the
 // engine's in one load, without GL calls and without the C library's copying and filling of memory, which callgrind
 // tells apart where valgrind is installed; files of the same number of chunks and a quarter of the triangles show what
-// depends on the size. "Heap peak" is the most that C++ code holds during a load beyond what it held before.
+// depends on the size. "Heap peak" is the largest heap use of C++ code during a load, relative to the start.
 
 #include "callgrind.h"
 
@@ -63,7 +63,7 @@ size_t g_heapPeak = 0;
 
 } // namespace
 
-// Not to be put in place of calls: the compiler would find free() on what came from new.
+// Not inlined: the compiler would warn of free() on memory from new.
 [[gnu::noinline]] void* operator new(size_t size, const std::nothrow_t&) noexcept
 {
     void* memory = std::malloc(std::max<size_t>(size, 1));
@@ -184,7 +184,7 @@ File writeFile(const std::string& folder, int columns)
     return file;
 }
 
-/// What is to be beaten: the whole file in one piece, then every buffer from there.
+/// The reference: reads the whole file at once, then fills every buffer from it.
 void loadByHand(const std::string& folder, const File& file)
 {
     const std::unique_ptr<char[]> bytes(new char[file.size]);
@@ -256,7 +256,7 @@ void drawEngineFrame()
     makeShared<Light>()->setParent(scene);
     RenderBlock(makeShared<SimpleRenderer>(makeShared<RenderContext>(), pool), scene, camera).render();
     glFinish();
-    _exit(EXIT_SUCCESS); // the end of a program is not its start
+    _exit(EXIT_SUCCESS); // exit is not part of the start
 }
 
 GLuint compile(GLenum kind, const char* source)
@@ -307,7 +307,7 @@ double measureStartMs(const char* argument)
 
 void compareLoads(AssetCachePool& pool, const std::string& folder, const File& large)
 {
-    loadByEngine(pool, large); // what stays is there, and the file in memory
+    loadByEngine(pool, large); // loads everything that stays, and warms the file cache
     loadByHand(folder, large);
     const double engineMs = measureMedianMs([&] { loadByEngine(pool, large); });
     const double handMs = measureMedianMs([&] { loadByHand(folder, large); });

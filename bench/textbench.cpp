@@ -1,7 +1,7 @@
-// What text costs: glyphs a second laid out, and laid out and drawn again each time, with GL's calls dropped so that
-// the engine's part alone counts; and what drawing an unchanged page takes. Then the same of a thousand different
-// ideographs from a glyph cache, beside what a program takes that keeps its glyphs in a table of its own. The best of
-// several runs counts: what else the machine does can only add.
+// The cost of text: glyphs a second laid out, and laid out and drawn, with GL calls dropped so that only the engine
+// counts; and drawing an unchanged page. Then the same for a thousand different ideographs from a glyph cache, beside a
+// program with a glyph table of its own. The best of several runs counts, since other work on the machine can only add
+// time.
 
 #include "glcalls/glcalls.h"
 #include "headless/headless.h"
@@ -102,7 +102,7 @@ std::string makeIdeographs(uint32_t first)
     return text;
 }
 
-/// What somebody would write for this page alone: a table of glyphs, an array of corners, one draw.
+/// Code for this page only: a table of glyphs, an array of corners, one draw.
 class HandWritten
 {
 public:

@@ -1,12 +1,12 @@
-// What the tools cost: converting models beside libassimp's own reading of them, and the way from a scene file to a
+// The cost of the tools: converting models beside libassimp's own reading of them, and the time from a scene file to a
 // finished PNG and to a first frame.
 //
 //     toolbench [FOLDER]
 //
 // FOLDER holds models, Debian's assimp-testmodels if none is given. All times are wall time from a process's start to its
-// exit, in ms, medians of several. "Read" is a process that reads the file by libassimp as it is, "for drawing" one that
-// also lets libassimp do what a program needs that draws it (its preset TargetRealtime_Quality). The difference between
-// the first and the converter is the converter's own work: normals, tangents, joining, ordering, textures and writing.
+// exit, in ms, medians of several. "Read" is a process that only reads the file with libassimp, "for drawing" one that
+// also applies libassimp's preset TargetRealtime_Quality. The difference between the first and the converter is the
+// converter's own work: normals, tangents, joining, ordering, textures and writing.
 
 #include "glo/glowriter.h"
 #include "headless/headless.h"
@@ -49,11 +49,11 @@ constexpr int CONVERSIONS = 7;
 constexpr int STARTS = 15;
 constexpr int TEXTURE_SIDE = 512;
 
-const char* const READ = "--read"; // MODEL: read it and leave
+const char* const READ = "--read"; // MODEL: read it and exit
 const char* const READ_FOR_DRAWING = "--read-for-drawing";
-const char* const DRAW = "--draw"; // FOLDER SCENE: draw one frame and leave
+const char* const DRAW = "--draw"; // FOLDER SCENE: draw one frame and exit
 
-// Those of the collection that are large, and whichever kinds of file there are.
+// The large models of the collection, and one of each kind of file.
 const char* const MODELS[] = {
     "glTF2/2CylinderEngine-glTF-Binary/2CylinderEngine.glb",
     "glTF2/ClearCoat-glTF/ClearCoatTest.gltf",
@@ -254,7 +254,7 @@ int readModel(const char* path, unsigned steps)
     Assimp::Importer importer;
     const bool isRead = importer.ReadFile(path, steps);
     std::fflush(nullptr);
-    _exit(isRead ? EXIT_SUCCESS : EXIT_FAILURE); // freeing is no part of reading
+    _exit(isRead ? EXIT_SUCCESS : EXIT_FAILURE); // freeing memory is not part of reading
 }
 
 int drawFirstFrame(const char* folder, const char* file)
