@@ -85,7 +85,7 @@ void addCostlyScenes(std::vector<Seed>& files)
     const char* const noJoint = "Joint node \"none\" not found.";
 
     add("solids", false, beyond, makeSolids(500, 5000));
-    add("nodes", true, "", makeSolids(50000, 1)); // as many as a real scene may have
+    add("nodes", true, "", makeSolids(50000, 1)); // a real scene may have that many
 
     for (const size_t sets : {size_t(0), size_t(1)})
     {

@@ -90,7 +90,7 @@ void makeTextures(GLsizei count, GLuint* names)
         g_state.textures.insert(names[i] = ++g_state.lastNames[1]);
 }
 
-/// A buffer that goes is bound nowhere any more.
+/// Unbinds a deleted buffer.
 void deleteBuffers(GLsizei count, const GLuint* names)
 {
     for (const GLuint* name = names; name < names + count; ++name)
@@ -118,7 +118,7 @@ void deleteProgram(GLuint name)
 {
     if (name != 0 && g_state.programs.erase(name) == 0)
         fail("deleted program " + std::to_string(name) + ", which is none of this context");
-    g_state.program = g_state.program == name ? 0 : g_state.program; // sooner than a real one, which draws on
+    g_state.program = g_state.program == name ? 0 : g_state.program; // earlier than real GL
 }
 
 // --- Programs ----------------------------------------------------------------------------------------------

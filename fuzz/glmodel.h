@@ -7,11 +7,11 @@
 #include <string>
 #include <vector>
 
-/// A GL that keeps names, bindings and the sizes of buffers as the real one does and draws nothing: what a draw call
-/// would have used is noted instead, and what would crash it or read beyond a buffer is a fault.
+/// A GL that tracks names, bindings and buffer sizes and draws nothing: it notes the objects that a draw call would
+/// use, and reports calls that would crash or read beyond a buffer.
 ///
-/// Programs take their inputs from what their vertex shaders name: a_position, a_normal, a_uv0. All have two uniforms:
-/// u_float and u_texture.
+/// Programs have the inputs that their vertex shaders name: a_position, a_normal, a_uv0. All have two uniforms: u_float
+/// and u_texture.
 namespace glmodel
 {
 
@@ -23,15 +23,15 @@ struct Draw
     GLuint positionBuffer;
     GLsizei count;
     float value;    ///< of u_float
-    GLuint texture; ///< where u_texture looks
+    GLuint texture; ///< bound for u_texture
 
     auto operator<=>(const Draw&) const = default;
 };
 
-/// Puts it in place of the real one, over nulldriver; until glcalls::reset(). Nothing is alive or bound then.
+/// Replaces the real GL until glcalls::reset(), on top of nulldriver. At first nothing is alive or bound.
 void install();
 
-/// The context and all in it is gone, and another one in its place: names begin with 1 again.
+/// Replaces the context by a new one: names begin with 1 again.
 void loseContext();
 
 /// The draw calls since the last call.
@@ -40,7 +40,7 @@ std::vector<Draw> takeDraws();
 /// The first wrong use since the last call; empty for none.
 std::string takeFault();
 
-/// How many buffers, textures, shaders and programs there are.
+/// The number of buffers, textures, shaders and programs.
 size_t countLiveNames();
 
 } // namespace glmodel

@@ -1,6 +1,6 @@
-// The fuzzing target for the converter and its reader of glTF: a file of any bytes either gives a scene or a reason, and
-// crashes, hangs and exhausts nothing. It is read and converted in this process, where the checks are, without the limits
-// that orv-convert has. Pictures and other files are not there but for those inside the file.
+// The fuzzing target for the converter and its reader of glTF: any file must give a scene or a reason, without a crash,
+// a hang or exhausted memory. It is converted in this process, where the sanitizers are, without the limits of
+// orv-convert. Other files are missing, except those inside the file.
 
 #include "convert/conversion.h"
 #include "convert/files/filegate.h"
@@ -16,7 +16,7 @@
 namespace
 {
 
-/// A file in a folder of its own, removed in the end.
+/// A file in a temporary folder.
 class Scratch
 {
 public:

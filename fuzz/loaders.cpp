@@ -41,7 +41,7 @@ using namespace orv;
 namespace
 {
 
-/// Counts what is asked of a stream in memory.
+/// Counts the calls and bytes of a stream in memory.
 class CountedStream : public MemoryStream
 {
 public:
@@ -65,17 +65,17 @@ private:
     size_t& m_bytesRead;
 };
 
-/// What a load may ask for while files are attacked: little, so that small files reach the limits.
+/// Low limits for loads, so that small files reach them.
 constexpr LoadLimits LIMITS = {1 << 20, 1 << 20, 1 << 18};
 
 constexpr size_t LOADS = 2; ///< in one attack, as a picture and as a cube
 constexpr int MOST_RECORDS = 100;
-constexpr size_t BUILT_IN_BYTES = 49500; ///< of all built-in files, which are read as well
+constexpr size_t BUILT_IN_BYTES = 49500; ///< of the built-in files, which count as read
 
 } // namespace
 
-/// The file under attack, under every name that begins with "file." and as the stored binary of "sound.sp$", and
-/// sound ones for it to name. Names may be spelled with any number of "./" before them.
+/// The attacked file, under every name that begins with "file." and as the stored binary of "sound.sp$", and valid
+/// files to which it can refer. Names may have any number of "./" before them.
 class Files : public StreamSource
 {
 public:
@@ -94,7 +94,7 @@ public:
 
     void attackWith(const Bytes& file)
     {
-        m_attacker = Bytes(file.begin(), file.end()); // no spare room, so that reading beyond it is found
+        m_attacker = Bytes(file.begin(), file.end()); // no spare capacity: detects reads beyond it
         m_reads = 0;
         m_bytesRead = 0;
         m_opened.clear();
@@ -134,7 +134,7 @@ namespace
 
 // --- Loaders -----------------------------------------------------------------------------------------------
 
-/// As one picture and, where that divides, as the six of a cube.
+/// As one picture and, if its size divides, as the six of a cube.
 bool loadImage(Session& session, const Bytes&, std::string& fault)
 {
     const SharedPtr<Texture2D> texture = session.pool().getTexture2DCache()->get("file.png");
@@ -200,7 +200,7 @@ bool loadScene(Session& session, const Bytes&, std::string& fault)
     return true;
 }
 
-/// Every glyph of some characters and of the first numbers, at two sizes, on pages that hold few of them.
+/// The glyphs of some characters and of the first numbers, at two sizes, on small pages.
 void drawFace(Session& session, const Bytes& file, std::string& fault)
 {
     MemoryStream stream(file.data(), int(file.size()));
@@ -232,7 +232,7 @@ void drawFace(Session& session, const Bytes& file, std::string& fault)
     context->setViewport(0, 0, 64, 64);
     const std::size_t vertices = nulldriver::given().vertices;
     text->draw(*context);
-    nulldriver::given().vertices = vertices; // the text is the program's and not the file's
+    nulldriver::given().vertices = vertices; // the text's vertices do not come from the file
     if (cache->getPageCount() > 2)
         fault = "more pages than allowed";
 }
@@ -284,7 +284,7 @@ bool loadVertexStream(Session& session, const Bytes& file, std::string& fault)
     return loaded;
 }
 
-/// A stored binary of a sound program, which is compiled if the binary is of no use.
+/// A stored binary of a valid program, which is compiled if the binary cannot be used.
 bool loadProgramBinary(Session& session, const Bytes&, std::string& fault)
 {
     const SharedPtr<ShaderProgram> program = session.pool().getShaderProgramCache()->get("sound.sp$");
@@ -293,7 +293,7 @@ bool loadProgramBinary(Session& session, const Bytes&, std::string& fault)
     return bool(program);
 }
 
-/// A digest as stored, and one of the file that must not depend on how it is cut.
+/// A stored digest, and the file's own digest, which must not depend on how it is read in pieces.
 bool loadDigest(Session& session, const Bytes& file, std::string& fault)
 {
     const char* text = reinterpret_cast<const char*>(file.data());
@@ -329,7 +329,7 @@ size_t getImageHeap(const Bytes& file)
     return std::min(density, allowed) * 7;
 }
 
-/// Two bits a pixel become four bytes. What is no PVR file is tried as another image, TGA being the most patient.
+/// Two bits a pixel become four bytes. Other files are tried as other images; TGA accepts most.
 size_t getPvrHeap(const Bytes& file)
 {
     const bool mayBeImage = file.size() > 2 && file[2] != 0 && file[2] != 'R';
@@ -346,14 +346,14 @@ size_t heapOf(const Bytes&)
 
 const std::vector<Loader> LOADERS = {
     {"image", loadImage, getImageHeap, 1 << 17, false},
-    // And a picture of 256 KB, four times over while it is unpacked.
+    // And a picture of 256 KB, which takes four times that during decoding.
     {"cubename", loadCubeName, heapOf<64>, 5 << 18, false},
     {"program", loadShaderProgram, heapOf<64>, 1 << 16, false},
     // "property a int 0" takes 16 bytes and makes a uniform, its name and its place in two tables.
     {"appearance", loadAppearanceFile, heapOf<64>, 5 << 18, false},
-    // What references make has the same bounds in any file, see GloCredit.
+    // Objects made by references have the same limit in any file, see GloCredit.
     {"scene", loadScene, heapOf<64>, 6 << 20, false},
-    // The atlas is as large as the size asked for makes it, at most 512 x 4096 here.
+    // The requested size determines the atlas, here at most 512 x 4096.
     {"font", loadFont, heapOf<64>, 4 << 20, false},
     {"pvr", loadPvr, getPvrHeap, 1 << 17, false},
     {"vertices", loadVertexStream, heapOf<8>, 1 << 12, false},
@@ -409,7 +409,7 @@ std::string Session::attack(const Loader& loader, const Bytes& file)
     m_loaded = loader.load(*this, file, fault);
     const size_t peak = heap().peak - std::min(heap().peak, liveBefore);
     m_pool->flush();
-    m_pool->flush(); // what the assets of the first round held
+    m_pool->flush(); // assets used by those of the first round
 
     if (fault.empty())
         fault = findFault(loader, file, peak);
@@ -436,7 +436,7 @@ std::string Session::findFault(const Loader& loader, const Bytes& file, size_t p
     return {};
 }
 
-/// What holds for every loader: the work, counted instead of timed, follows from the bytes that were read.
+/// The rule for every loader: the work, counted instead of timed, is limited by the bytes that were read.
 std::string Session::findCost() const
 {
     const size_t size = m_files->size();

@@ -8,7 +8,7 @@
 #include <string>
 #include <vector>
 
-/// Everything in the engine that reads what others wrote, and the rules that hold whatever they wrote.
+/// All loaders of the engine, and the rules that hold for any file.
 namespace hostile
 {
 
@@ -16,17 +16,17 @@ using Bytes = std::vector<uint8_t>;
 
 class Files;
 
-/// A pool and what else a loader needs, used for one file after another.
+/// A pool and other objects for loaders, used for one file after another.
 class Session
 {
 public:
     Session();
     ~Session();
 
-    /// Gives a loader a file, uses what it makes of it and drops that again.
-    /// @return what rule was broken, empty for none: a refusal says why (at least one error) and leaves nothing
-    /// behind, an asset is sound, every message can be read, no GL name is left when the caches are flushed,
-    /// the heap, the reads, the log and what GL is given are bounded by the size of the files read.
+    /// Gives a loader a file, uses the asset and drops it again.
+    /// @return the broken rule, or empty. The rules: a refusal logs at least one error and leaves nothing behind; an
+    /// asset is valid; every message can be formatted; no GL name is left after flushing; heap, reads, log and data for
+    /// GL are limited by the size of the files read.
     std::string attack(const struct Loader& loader, const Bytes& file);
 
     bool wasLoaded() const { return m_loaded; } ///< the file of the last attack
@@ -51,19 +51,19 @@ struct Loader
 {
     const char* name; ///< also of its fuzzing target and its folder in the corpus
 
-    /// Loads the session's file and uses what came.
-    /// @param fault  set when what came is not sound.
-    /// @return whether an asset came.
+    /// Loads the session's file and uses the asset.
+    /// @param fault  set if the asset is not valid.
+    /// @return whether an asset was loaded.
     bool (*load)(Session& session, const Bytes& file, std::string& fault);
 
-    size_t (*heapPerByte)(const Bytes& file); ///< what one byte of the file may lead to
-    size_t spareHeap;                         ///< and what any file may
-    bool mayBeSilent;                         ///< gives an answer in place of a message
+    size_t (*heapPerByte)(const Bytes& file); ///< bytes allowed for each byte of the file
+    size_t spareHeap;                         ///< bytes allowed for any file
+    bool mayBeSilent;                         ///< returns a result instead of a message
 };
 
 extern const std::vector<Loader> LOADERS;
 
-/// @return null for a name that is none.
+/// @return null for an unknown name.
 const Loader* findLoader(const std::string& name);
 
 } // namespace hostile

@@ -6,15 +6,15 @@
 namespace nulldriver
 {
 
-/// Puts it in place of the real one until glcalls::reset(). No context may be current: what is not replaced is
-/// then a call that the real library ignores.
+/// Replaces the real GL until glcalls::reset(). No context may be current, so that the real library ignores calls that
+/// are not replaced.
 ///
 /// Names are handed out, and glcalls counts them. Shaders compile unless their source holds "#error"; programs
 /// link and have three uniforms, u_float, u_texture and u_cube, and one attribute, a_position. A program binary
 /// is taken if its format is 1 and it starts with "binary".
 void install();
 
-/// What was handed to it, in bytes.
+/// The data given to it, in bytes.
 struct Given
 {
     size_t pixels = 0;   ///< of textures

@@ -1,6 +1,6 @@
-// How the target "scene" changes its inputs: as records, by the same list of fields that reads and writes them, so that
-// sizes and counts stay true and names are mostly those of something in the file. One input in four, and whatever
-// cannot be read, has its bytes changed as libFuzzer does it.
+// The mutator of the target "scene": changes records, with the same list of fields as reader and writer, so that sizes
+// and counts stay correct and most names exist in the file. One input in four, and unreadable ones, have their bytes
+// changed by libFuzzer.
 
 #include "glo/glowriter.h"
 #include "orv/detail/gloreader.h"
@@ -60,8 +60,8 @@ constexpr const char* TEXTS[] = {"",          "face.png",  "grid.png",  "none.pn
 constexpr const char* VERSIONS[] = {"0.14.0", "0.13.0", "0.12.0", "0.11.0", "0.10.0", "0.9.0", "0.6.0"};
 constexpr size_t MOST_KEY_BYTES = 1024;
 
-/// What fields() asks for (see glofields.h), to walk over the places of a scene where something can be changed.
-/// A walk counts them and gathers the names; the next changes one.
+/// The Io for fields() (see glofields.h) that visits all values of a scene that can be changed. A walk counts them and
+/// gathers the names; the next changes one.
 class SceneWalk
 {
 public:
@@ -92,7 +92,7 @@ public:
         return true;
     }
 
-    /// Counts come out right by themselves, and flags by optionalChunk(), but for what is not there yet.
+    /// Counts are written correctly anyway, and flags by optionalChunk(), except for missing chunks.
     bool u32(const char* label, uint32_t& value)
     {
         const std::string name = label;
@@ -252,7 +252,7 @@ private:
         return true;
     }
 
-    /// Something that channels can move, with as many values as it takes.
+    /// A valid channel target with its number of values.
     bool changeWhole(Channel& channel)
     {
         if (!isChosen())
@@ -326,7 +326,7 @@ extern "C" size_t LLVMFuzzerCustomMutator(uint8_t* data, size_t size, size_t mos
     return LLVMFuzzerMutate(data, size, mostSize);
 }
 
-/// The first scene with some of what the second defines, and sometimes its nodes.
+/// The first scene with some definitions of the second, and sometimes its nodes.
 extern "C" size_t LLVMFuzzerCustomCrossOver(const uint8_t* data1, size_t size1, const uint8_t* data2,
                                             size_t size2, uint8_t* out, size_t mostSize, unsigned seed)
 {

@@ -54,8 +54,7 @@ Bytes counting(size_t count, int step = 1)
 
 Bytes pngChunk(const char* type, const Bytes& data)
 {
-    return join(
-        {big(uint32_t(data.size())), toBytes(type), data, big(0)}); // the decoder looks at no checksum
+    return join({big(uint32_t(data.size())), toBytes(type), data, big(0)}); // the decoder ignores checksums
 }
 
 /// Uncompressed rows.
@@ -272,7 +271,7 @@ glo::GloScene makeOldScene(const char* version)
     return scene;
 }
 
-/// Every sampler, blending, all that channels can move.
+/// Every sampler, blending, and every channel target.
 glo::GloScene makeAnimatedScene()
 {
     glo::GloScene scene;
@@ -332,20 +331,20 @@ Bytes repeat(const Bytes& piece, int count)
     return join(std::vector<Bytes>(size_t(count), piece));
 }
 
-/// Nodes, the outermost first, that each say that they hold one more.
+/// Nested nodes, each with one child.
 Bytes nestNodes(int count)
 {
     const Bytes start = join({gloText(""), Bytes(4 * 10 + 4 * 2), little(1)});
     return repeat(gloChunk("NODE", start, 0x7fffffff), count);
 }
 
-/// Animations nested as deep as they say.
+/// Nested animations.
 Bytes nestAnimations(int count)
 {
     return repeat(gloChunk("ANIM", join({gloText(""), little(0), little(0), little(1)}), 0x7fffffff), count);
 }
 
-/// One geometry of many sets, used by many nodes: there are as many solids as the product.
+/// One geometry of many sets, used by many nodes: the number of solids is the product.
 Bytes multiplySolids(int sets, int nodes)
 {
     const Bytes vertices = gloChunk("VSET", join({little(0), little(0), gloChunk("VBUF", {})}));
@@ -423,7 +422,7 @@ Bytes makeKerning()
     return join({bigs({0, 1, 0, 14 + 12, 1, 2, 12, 1, 0}), bigs({1, 2, -50, 2, 1, 30})});
 }
 
-/// The same by a list of pairs, and by classes behind an extension.
+/// The same as a list of pairs, and as classes in an extension table.
 Bytes makePositions()
 {
     const Bytes listed =
@@ -586,7 +585,7 @@ void addOthers(std::vector<Seed>& seeds)
 
 // --- Files that cost ------------------------------------------------------------------------------------------
 
-/// Scans that each go over the whole picture and hold no data, so that the decoder makes it up.
+/// Scans over the whole picture without data, so that the decoder has to invent it.
 Bytes makeJpegOfScans(bool isProgressive, int side, int scans)
 {
     const int last = isProgressive ? 0 : 63;
@@ -604,7 +603,7 @@ Bytes makeJpegOfScans(bool isProgressive, int side, int scans)
     return join({file, {0xff, 0xd9}});
 }
 
-/// A text that says a line over and over, with another number in the place of each "%".
+/// A text that repeats a line, with another number for each "%".
 Bytes repeatLine(const std::string& start, const std::string& line, int count)
 {
     std::string text = start;

@@ -19,7 +19,7 @@ struct Seed
 /// Small files of every kind, at most 4 KB each, made by the project's own writers.
 std::vector<Seed> makeSeeds();
 
-/// Larger ones that ask for as much as they can: pictures, programs, time, records.
+/// Larger files that demand as much as possible: pictures, programs, time, records.
 std::vector<Seed> makeCostlyFiles();
 void addCostlyScenes(std::vector<Seed>& files); ///< for makeCostlyFiles()
 

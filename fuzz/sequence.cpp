@@ -28,7 +28,7 @@ using namespace orv;
 namespace
 {
 
-// --- What is watched ---------------------------------------------------------------------------------------
+// --- Observed events ---------------------------------------------------------------------------------------
 
 std::set<int> g_aliveNodes; ///< of the engine
 
@@ -156,7 +156,7 @@ private:
 
     int& chooseSlot() { return m_slots[choose(SLOTS)]; }
 
-    /// A node that the application holds: what is in a slot, or the root.
+    /// A node that the application holds: one in a slot, or the root.
     int chooseNode()
     {
         const int node = chooseSlot();
@@ -222,7 +222,7 @@ private:
             attach(id, ROOT, false);
     }
 
-    /// Gives a solid a mesh and an appearance of those there are.
+    /// Gives a solid an existing mesh and appearance.
     void dress(int id)
     {
         Solid& solid = *findSolid(id);
@@ -351,7 +351,7 @@ private:
         m_nodes[id].joints.push_back(joint);
     }
 
-    /// What an application does of its own between two frames.
+    /// GL calls of the application between two frames.
     void callGl()
     {
         const GLuint number = GLuint(choose(8));
@@ -374,7 +374,7 @@ private:
         }
     }
 
-    /// What was made in it is kept, and draws nothing and deletes nothing from now on.
+    /// Keeps objects of the lost context, which draw nothing and delete nothing from now on.
     void loseContext()
     {
         m_block = nullptr;
@@ -398,7 +398,7 @@ private:
 
     // --- Drawing -------------------------------------------------------------------------------------------
 
-    /// What a solid is to be drawn with. @return false for nothing.
+    /// The objects that a solid must be drawn with. @return false if it is not drawn.
     bool findDraw(const ModelNode& node, glmodel::Draw& draw) const
     {
         if (!node.isSolid || node.mesh == NO_NODE || node.appearance == NO_NODE)
@@ -443,7 +443,7 @@ private:
             return;
         std::vector<glmodel::Draw> wanted(1);
         if (!findDraw(m_nodes[id], wanted[0]))
-            return; // a lost program leaves the one that is current
+            return; // a lost program does not change the current one
         glmodel::takeDraws();
         solid->draw(*m_context);
         compare("a solid", wanted);
@@ -488,7 +488,7 @@ private:
         return world;
     }
 
-    /// The same, as the engine has it where the model cannot know: below what a joint may or may not keep.
+    /// The same, or the engine's value where the model cannot know: below nodes that a joint may keep.
     float findWorldNow(int id)
     {
         const bool isCertain = findReached(false).count(findTop(id)) != 0;
@@ -509,7 +509,7 @@ private:
         }
     }
 
-    /// What the application holds, with all below it; with what solids there may keep alive as their joints.
+    /// The nodes that the application holds, everything below them, and joints that their solids may keep alive.
     std::set<int> findReached(bool byJoints) const
     {
         std::set<int> reached;

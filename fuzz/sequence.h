@@ -4,13 +4,13 @@
 #include <string>
 #include <vector>
 
-/// Random sequences of what an application can do with the engine, held against a naive model of it: which nodes are
-/// alive, where they are, what is drawn with which program, buffers, texture and value, and that nothing is left.
+/// Random sequences of an application's calls, compared with a naive model: which nodes are alive, where they are, what
+/// is drawn with which program, buffers, texture and value, and that nothing is left.
 namespace sequence
 {
 
-/// Plays a sequence, whose bytes say what is done to what. A program runs one after another.
-/// @return what the engine and the model disagree on, after how many steps; empty for nothing.
+/// Runs a sequence given as bytes. One at a time.
+/// @return the difference between engine and model, with the number of steps; empty for none.
 std::string play(const std::vector<uint8_t>& bytes);
 
 } // namespace sequence

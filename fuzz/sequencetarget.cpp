@@ -1,5 +1,5 @@
-// The fuzzing target for sequences of the public interface. What the engine and the model disagree on ends the program,
-// as a crash does.
+// The fuzzing target for sequences of the public interface. A difference between engine and model ends the program like
+// a crash.
 
 #include "sequence.h"
 

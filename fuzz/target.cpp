@@ -1,5 +1,4 @@
-// One fuzzing target: a loader, named by FUZZ_TARGET, that is given whatever libFuzzer thinks of. A broken rule
-// ends the program, as a crash does.
+// One fuzzing target: libFuzzer's inputs for the loader FUZZ_TARGET. A broken rule ends the program like a crash.
 
 #include "loaders.h"
 #include "nulldriver.h"
@@ -8,7 +7,7 @@
 #include <cstdio>
 #include <cstdlib>
 
-// Not there in a build without address checks, which then does not watch the heap.
+// Missing in a build without address checks, which does not watch the heap.
 extern "C" __attribute__((weak)) int
 __sanitizer_install_malloc_and_free_hooks(void (*taken)(const volatile void* block, size_t size),
                                           void (*given)(const volatile void* block));

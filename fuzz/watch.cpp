@@ -39,7 +39,7 @@ void Heap::note(const void* block, size_t asked)
 void Heap::noteGone(const void* block)
 {
     const size_t size = block ? malloc_usable_size(const_cast<void*>(block)) : 0;
-    live -= std::min(live, size); // it may have been had before anybody counted
+    live -= std::min(live, size); // it may have been allocated before counting began
 }
 
 } // namespace hostile

@@ -3,12 +3,12 @@
 #include <cstddef>
 #include <string>
 
-/// What is watched while a loader is given a hostile file: the engine's messages and the heap.
+/// Observes the engine's messages and the heap while a loader reads a hostile file.
 namespace hostile
 {
 
-/// Messages of the engine since clear(). Programs that link orv_hostile have them come here and not to the
-/// platform's log.
+/// Messages of the engine since clear(). In programs that link orv_hostile they come here instead of the platform's
+/// log.
 struct Messages
 {
     int errors = 0;
@@ -27,8 +27,8 @@ struct Heap
     bool isReported = false;
     size_t live = 0;
     size_t peak = 0;    ///< of live, since start()
-    size_t largest = 0; ///< block asked for since start(), had or not
-    size_t blocks = 0;  ///< asked for since start()
+    size_t largest = 0; ///< block requested since start(), even if refused
+    size_t blocks = 0;  ///< requested since start()
 
     void start();
     void note(const void* block, size_t asked);
