@@ -1,5 +1,5 @@
-# Sets ORV_CHANGE_ID to the source-control change that is being built, and ORV_CHANGE_TIME to when that was made, in
-# seconds since 1970: empty where it is not known.
+# Sets ORV_CHANGE_ID to the revision that is built, and ORV_CHANGE_TIME to its time in seconds since 1970; empty if
+# unknown.
 set(ORV_CHANGE_ID unknown)
 set(ORV_CHANGE_TIME "")
 find_package(Git QUIET)

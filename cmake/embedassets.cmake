@@ -1,4 +1,4 @@
-# Turns files into one C++ source: their bytes, read-only, and the table of them all.
+# Turns files into one C++ source with their bytes, read-only, and a table of them.
 #
 #   cmake -DFILES=a;b -DNAMESPACE=orv -DOUTPUT=file.cpp [-DSHADOWS=ON] -P embedassets.cmake
 #
@@ -6,8 +6,8 @@
 #            opens them and leave other comments, indentation and blanks around operators out; their lines stay
 # NAMESPACE  asset namespace; the archive is called NAMESPACE_ARCHIVE, in upper case
 # OUTPUT     replaced when the assets have changed
-# SHADOWS    with what is for shadows: in shaders what stands between "#ifdef SHADOW" and "#endif // SHADOW", in program
-#            files the uniforms u_s_..., and references to NAMESPACE in place of "orv". Without it these are left out.
+# SHADOWS    keeps the code for shadows: in shaders the text between "#ifdef SHADOW" and "#endif // SHADOW", in program
+#            files the uniforms u_s_...; and changes references from "orv" to NAMESPACE. Without it this code is left out.
 cmake_minimum_required(VERSION 3.22)
 
 foreach(argument FILES NAMESPACE OUTPUT)
@@ -18,7 +18,7 @@ endforeach()
 
 list(SORT FILES COMPARE STRING) # byte order
 
-# Takes what is for shadows out of a shader, but for what stands after "#else // SHADOW".
+# Removes the code for shadows from a shader, except the text after "#else // SHADOW".
 function(leave_shadows_out variable)
     set(text "${${variable}}")
     set(kept "")

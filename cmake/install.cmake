@@ -1,6 +1,5 @@
-# What `cmake --install` puts where, for programs that find the library by CMake or pkg-config; and the packages
-# that cpack makes of it. Components: runtime (the shared library, which a static build has not), development, and
-# tools where they are built.
+# Rules of `cmake --install`, for programs that find the library with CMake or pkg-config, and of cpack's packages.
+# Components: runtime (the shared library, not in a static build), development, and tools if they are built.
 include(CMakePackageConfigHelpers)
 set(CMAKE_SKIP_INSTALL_ALL_DEPENDENCY ON) # the library is enough
 
@@ -8,8 +7,7 @@ install(TARGETS orv orv_extra EXPORT orvTargets
     LIBRARY DESTINATION ${CMAKE_INSTALL_LIBDIR} COMPONENT runtime NAMELINK_COMPONENT development
     ARCHIVE DESTINATION ${CMAKE_INSTALL_LIBDIR} COMPONENT development)
 
-# The interface, with those of its inner headers that it includes itself; an installed-tree test holds the two
-# against each other.
+# The interface, and the inner headers that it includes; a test of the installed tree checks this list.
 foreach(room common maths pss facility render extra)
     install(DIRECTORY engine/${room}/api/orv DESTINATION ${CMAKE_INSTALL_INCLUDEDIR} COMPONENT development
         FILES_MATCHING PATTERN "*.h"
@@ -43,7 +41,8 @@ write_basic_package_version_file(${CMAKE_CURRENT_BINARY_DIR}/orvConfigVersion.cm
 install(FILES ${CMAKE_CURRENT_BINARY_DIR}/orvConfig.cmake ${CMAKE_CURRENT_BINARY_DIR}/orvConfigVersion.cmake
     cmake/orvScenes.cmake DESTINATION ${package} COMPONENT development)
 
-# A static library needs what it calls named along with it, with --static or without. The prefix is found from where the file lies, so that the tree may be moved.
+# For a static library its dependencies are listed, with --static or without. The prefix is relative to the file, so
+# that the tree may be moved.
 file(RELATIVE_PATH prefixFromPc /${CMAKE_INSTALL_LIBDIR}/pkgconfig /)
 file(CONFIGURE OUTPUT orv.pc @ONLY CONTENT
 "prefix=\${pcfiledir}/@prefixFromPc@
@@ -58,7 +57,7 @@ Libs: -L\${libdir} -lorvextra -lorv -lGLESv2 @ORV_STATIC_LIBS@
 ")
 install(FILES ${CMAKE_CURRENT_BINARY_DIR}/orv.pc DESTINATION ${CMAKE_INSTALL_LIBDIR}/pkgconfig COMPONENT development)
 
-# The pages lie as they do in the tree, so that what they link to is where they say.
+# The pages are installed with the tree's folders, so that their links work.
 set(pages share/doc/liborv-dev)
 install(FILES README.md CHANGELOG.md CONTRIBUTING.md SECURITY.md cmake/copyright DESTINATION ${pages}
     COMPONENT development)
@@ -73,7 +72,7 @@ if(TARGET orv_convert)
 endif()
 include(sbom)
 
-# Packages: cpack in the build folder, divided as Debian divides its own libraries.
+# Packages, made by cpack in the build folder and divided like Debian's own libraries.
 set(CPACK_GENERATOR DEB)
 set(CPACK_PACKAGE_VENDOR orv)
 set(CPACK_PACKAGE_CONTACT "the orv developers <orv@localhost>")
@@ -81,7 +80,7 @@ set(CPACK_PACKAGE_DESCRIPTION_SUMMARY "compact real-time 3D engine for OpenGL ES
 set(CPACK_PACKAGING_INSTALL_PREFIX /usr)
 set(CPACK_STRIP_FILES ON)
 set(CPACK_COMPONENTS_ALL development)
-set(CPACK_DEBIAN_DEVELOPMENT_PACKAGE_DEPENDS libgles-dev) # orvextra is linked with it
+set(CPACK_DEBIAN_DEVELOPMENT_PACKAGE_DEPENDS libgles-dev) # needed by orvextra
 if(NOT ORV_STATIC)
     list(APPEND CPACK_COMPONENTS_ALL runtime)
     string(PREPEND CPACK_DEBIAN_DEVELOPMENT_PACKAGE_DEPENDS "liborv${PROJECT_VERSION_MAJOR} (= ${PROJECT_VERSION}), ")
@@ -106,7 +105,7 @@ set(CPACK_DEBIAN_TOOLS_PACKAGE_SHLIBDEPS ON)
 set(CPACK_DEBIAN_TOOLS_PACKAGE_RECOMMENDS fonts-dejavu-core)
 set(CPACK_COMPONENT_TOOLS_DESCRIPTION "Programs that convert models to scenes, look at them and look into them.")
 
-# Packing the same change gives the same bytes: files in a package are as old as the change.
+# Files in packages have the time of the revision, so that packing it again gives the same bytes.
 file(CONFIGURE OUTPUT packagetime.cmake @ONLY CONTENT
 "if(NOT DEFINED ENV{SOURCE_DATE_EPOCH} AND NOT \"@ORV_CHANGE_TIME@\" STREQUAL \"\")
     set(ENV{SOURCE_DATE_EPOCH} @ORV_CHANGE_TIME@)

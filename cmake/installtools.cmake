@@ -1,5 +1,5 @@
-# The programs under tools/, with what they say of themselves as manual pages and completions, and what a desktop needs
-# to open scenes and to show small pictures of them.
+# The programs under tools/, with manual pages and completions made from their --help, and files for desktops that open
+# scenes and show thumbnails.
 install(TARGETS orv_convert orv_view orv_inspect RUNTIME DESTINATION ${CMAKE_INSTALL_BINDIR} COMPONENT tools)
 
 set(made "")
@@ -27,5 +27,5 @@ install(FILES ${desktop}/orv-view.thumbnailer DESTINATION share/thumbnailers COM
 install(FILES ${desktop}/orv.xml DESTINATION share/mime/packages COMPONENT tools)
 install(FILES cmake/copyright DESTINATION share/doc/orv-tools COMPONENT tools)
 
-# What orv-convert --page copies, if ./run web has built it.
+# The page for orv-convert --page, if ./run web has built it.
 install(DIRECTORY build/web/page/ DESTINATION share/orv/web COMPONENT tools OPTIONAL)

@@ -2,17 +2,17 @@
 #
 #   orv_add_scenes(TARGET model... [OUT folder] [OPTIONS option...])
 #
-# Makes a scene file of each model, by orv-convert, whenever the model or a file that it was made of has changed; a build
-# of many jobs converts as many models at a time.
+# Converts each model with orv-convert, whenever the model or a file that it uses has changed; parallel builds convert
+# several models at a time.
 #
-# TARGET   a target that there is, such as the program that shows the scenes: they are made before it. Otherwise a new
-#          one, which a build of everything makes. Its property ORV_SCENES lists the scene files.
+# TARGET   an existing target, such as the program that shows the scenes, which are made before it; otherwise the name
+#          of a new target that is part of ALL. Its property ORV_SCENES lists the scene files.
 # model    a file, from the current source folder; "duck.dae" becomes "duck.glo". Two of one name are refused.
-# OUT      where the scenes and their textures lie; the current build folder otherwise.
+# OUT      the folder for scenes and textures; by default the current build folder.
 # OPTIONS  for orv-convert, such as --fps 60.
 #
-# The converter is the one of this build, or the one that is installed beside the library, or on the PATH; the variable
-# ORV_CONVERT names another.
+# The converter is that of this build, or the one installed beside the library, or one on the PATH; the variable
+# ORV_CONVERT overrides it.
 function(orv_add_scenes target)
     cmake_policy(PUSH)
     cmake_policy(VERSION 3.22)

@@ -1,8 +1,8 @@
-# The bill of materials: what the library and the tools hold and call, as SPDX 2.3 in JSON, for those who have to know what
-# they ship. Versions are those of the Debian packages that this build takes its headers from; where there are none,
-# NOASSERTION stands in their place. The same change on the same distribution gives the same bytes.
+# The bill of materials: the libraries that liborv and the tools contain and link with, as SPDX 2.3 in JSON. Versions
+# are those of the Debian packages of the headers used by this build, or NOASSERTION. The same revision on the same
+# distribution gives the same bytes.
 #
-# A test holds the list against what the binaries ask the dynamic linker for.
+# A test compares the list with the dynamic dependencies of the binaries.
 set(sbom ${CMAKE_CURRENT_BINARY_DIR}/orv.spdx.json)
 set(sbomPackages "")
 set(sbomRelations "")
@@ -35,8 +35,8 @@ function(orv_sbom_relation from kind to)
     set(sbomRelations "${sbomRelations}" PARENT_SCOPE)
 endfunction()
 
-# orv_sbom_part(name header licence KIND user...): something of others, by a header of it, that these of ours hold
-# (CONTAINS) or call (DYNAMIC_LINK).
+# orv_sbom_part(name header licence KIND user...): a third-party library, found by a header, that the users contain
+# (CONTAINS) or link with (DYNAMIC_LINK).
 function(orv_sbom_part name header licence kind)
     set(version NOASSERTION)
     set(purl "")

@@ -1,5 +1,5 @@
-# Builds for another architecture by Debian's cross compiler, with packages of that architecture from a root of their
-# own, and runs what was built under qemu. See makeroot; `./run test --arch` puts both together.
+# Builds for another architecture with Debian's cross compiler and packages of that architecture from a separate root,
+# and runs programs under qemu. See makeroot; `./run test --arch` uses both.
 #
 # ORV_FOREIGN   arm64 or armhf
 # ORV_ROOT      folder that makeroot has filled
