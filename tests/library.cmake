@@ -1,7 +1,6 @@
-# Faults caught: a name or a library dependency that leaks out of liborv; a library that devices with large pages
-# cannot load, that attackers would like, or that has grown.
-# Called with -DLIBRARY=path of liborv.so -DNM=nm -DREADELF=readelf -DSTRIP=strip -DLIMIT=bytes of the stripped library,
-# 0 for any.
+# Faults caught: an unintended export or dependency of liborv; a library that devices with large pages cannot load, that
+# lacks protections, or that is too large. Called with -DLIBRARY=path of liborv.so -DNM=nm -DREADELF=readelf
+# -DSTRIP=strip -DLIMIT=bytes of the stripped library, 0 for any.
 cmake_minimum_required(VERSION 3.22)
 
 execute_process(COMMAND ${NM} -D --defined-only --format=posix ${LIBRARY} OUTPUT_VARIABLE symbols COMMAND_ERROR_IS_FATAL ANY)

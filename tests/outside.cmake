@@ -1,6 +1,6 @@
-# Fault caught: a library that builds here and nowhere else. Copies examples/firstframe.cpp out of the tree, builds it
-# the way that a stranger would, runs it and looks at the middle of its picture.
-# Called with -DWAY=find_package, pkg-config, add_subdirectory or static, and
+# Fault caught: a library that can only be used in this tree. Copies examples/firstframe.cpp out of the tree, builds it
+# like a user, runs it and checks the middle of its picture. Called with -DWAY=find_package, pkg-config,
+# add_subdirectory or static, and
 #   -DSOURCE=this project -DPREFIX=where it was installed -DWORK=scratch folder -DCOMPILER=c++ -DGENERATOR=cmake's
 cmake_minimum_required(VERSION 3.22)
 

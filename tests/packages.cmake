@@ -1,4 +1,4 @@
-# Fault caught: a Debian package that lacks what it is for, holds what it must not, or names no dependencies.
+# Fault caught: a Debian package with missing or wrong files, or without dependencies.
 # Called with -DBUILD=build folder -DWORK=scratch folder -DCPACK=cpack.
 file(REMOVE_RECURSE ${WORK})
 execute_process(COMMAND ${CPACK} --config ${BUILD}/CPackConfig.cmake -B ${WORK} OUTPUT_QUIET COMMAND_ERROR_IS_FATAL ANY)

@@ -39,8 +39,8 @@ bool isInvalid(const uint8_t* block)
                                          });
 }
 
-/// Noise whose invalid blocks are made ones with two colours of their own. These blocks are undefined, and Mesa
-/// does not make of them what libETC1 does: its sums overflow eight bits, not five.
+/// Noise whose invalid blocks are changed to the mode of two individual colours. Invalid blocks are undefined; Mesa
+/// decodes them otherwise than libETC1: its sums overflow eight bits, not five.
 Bytes makeValidNoise(size_t size)
 {
     Bytes data = makeNoise(size, 2);
@@ -96,7 +96,7 @@ GLuint makeProgram()
 class Etc1Test : public support::GlTest
 {
 protected:
-    /// What the driver makes of it, drawn pixel by pixel. Needs a current context of this size or larger.
+    /// The driver's result, drawn pixel by pixel. Needs a current context of this size or larger.
     Bytes decodeWithDriver(const Bytes& data, uint32_t width, uint32_t height)
     {
         GLuint texture = 0;

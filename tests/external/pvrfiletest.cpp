@@ -141,7 +141,7 @@ TEST(PvrFile, pixelsByHand)
     }
 }
 
-// Fault caught: a field that is trusted. Where a value is refused the reason names the field or the format.
+// Fault caught: a field that is trusted. The reason of a refusal names the field or the format.
 TEST(PvrFile, everyFieldOutOfRange)
 {
     using namespace legacy;

@@ -9,7 +9,7 @@
 
 using Calls = std::vector<std::string>;
 
-/// What GL hears while something is done.
+/// Records GL calls in a scope.
 template <class Function>
 Calls callsOf(const Function& function)
 {
@@ -19,14 +19,14 @@ Calls callsOf(const Function& function)
     return glcalls::recorded();
 }
 
-/// A GL test of caches: names that live in GL when they have been flushed fail it.
+/// A GL test of caches: fails if names are alive after flushing.
 class FacilityTest : public support::GlTest
 {
 protected:
     void TearDown() override
     {
         flush();
-        flush(); // what the assets of the first round held
+        flush(); // assets used by those of the first round
         EXPECT_EQ("", glcalls::describeLiveNames());
         GlTest::TearDown();
     }
@@ -34,7 +34,7 @@ protected:
     /// Drops what the test still holds, and flushes its caches.
     virtual void flush() = 0;
 
-    /// A driver with another value than the real one's.
+    /// Replaces one value of the driver.
     static void replaceInteger(GLenum changed, GLint changedValue)
     {
         glcalls::replace(

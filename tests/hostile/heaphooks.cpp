@@ -1,5 +1,5 @@
-// Puts the heap under hostile::heap()'s eyes: what this program takes by new and what its C code takes by malloc(),
-// not what libraries take. The linker puts the __wrap_ functions in place.
+// Reports allocations to hostile::heap(): those by new and by malloc() in this program, not in libraries. The linker
+// installs the __wrap_ functions.
 
 #include "watch.h"
 
@@ -42,7 +42,7 @@ extern "C"
     }
 }
 
-// None is to be put in place of its calls: the compiler would find free() on what came from new.
+// Not inlined: the compiler would warn of free() on memory from new.
 
 [[gnu::noinline]] void* operator new(size_t size, const std::nothrow_t&) noexcept
 {

@@ -81,7 +81,7 @@ std::vector<const char*> getLoaderNames()
 
 constexpr size_t LARGEST_SEED = 4096; ///< that is damaged; larger ones are nested deep already
 
-/// So that no seed is damaged in more than about 400 places, but for cuts.
+/// Limits the damaged places of a seed to about 400, except for cuts.
 size_t getStep(const Bytes& file)
 {
     return 1 + file.size() / 400;
@@ -157,7 +157,7 @@ TEST_P(HostileTest, corpus)
     EXPECT_LT(0, count);
 }
 
-// Fault caught: rules that nothing can break, so that all of the above passes whatever happens.
+// Fault caught: rules that cannot fail.
 class HostileRules : public testing::Test
 {
 protected:
@@ -171,7 +171,7 @@ protected:
 
     ~HostileRules() override { glcalls::reset(); }
 
-    /// What is found wrong with a loader that is given eight bytes.
+    /// The broken rule of a loader with an input of eight bytes.
     static std::string faultOf(Load load)
     {
         const auto little = [](const Bytes&) { return size_t(1); };
@@ -233,7 +233,7 @@ TEST_F(HostileRules, filesCostWhatTheyWeigh)
     EXPECT_PRED2(startsWith, faultOf(takeMuch), "took 10");
 }
 
-/// What the driver takes is not counted.
+/// The driver's allocations are not counted.
 class HostileDriverTest : public support::GlTest
 {
 protected:

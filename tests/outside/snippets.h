@@ -1,5 +1,5 @@
-// What the snippets of the pages take for granted: names that their text has introduced. tests/snippets.py puts each of
-// them into a function of its own; nothing is linked or run.
+// Names that the snippets of the pages use and that their text has introduced. tests/snippets.py puts each snippet into
+// a function; nothing is linked or run.
 #include <GLES2/gl2.h>
 #include <cstdio>
 #include <orv/orv.h>

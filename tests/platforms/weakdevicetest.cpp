@@ -35,7 +35,7 @@ protected:
         return linked;
     }
 
-    /// What a square over everything shows of the bound texture of 3 x 2 white texels.
+    /// The colour of a square with the bound texture of 3 x 2 white texels.
     static support::Rgba sampleNpot(GLint filter, GLint wrap)
     {
         const std::vector<uint8_t> white(3 * 2 * 4, 255);
@@ -62,7 +62,7 @@ const glcalls::Device& NONE = glcalls::WEAK_DEVICES[8]; // has none of these
 
 } // namespace
 
-// Fault caught: a limit that is told but not kept, so that what needs more is never found out.
+// Fault caught: a limit that is reported but not enforced.
 TEST_F(WeakDeviceTest, keepsToItsLimits)
 {
     // Full matrices, and three columns of 8 beside each other: indices that only a draw knows keep arrays whole.
@@ -112,7 +112,7 @@ TEST_F(WeakDeviceTest, keepsToItsLimits)
     }
 }
 
-// Fault caught: a format that goes through although the device has no such thing.
+// Fault caught: a format that is accepted although the device lacks it.
 TEST_F(WeakDeviceTest, refusesWhatItLacks)
 {
     constexpr GLenum depth = GL_DEPTH_COMPONENT;

@@ -9,7 +9,7 @@
 #include <cstdint>
 #include <vector>
 
-/// What GL has heard of these functions since the beginning of the scope.
+/// The number of calls of these functions since the beginning of the scope.
 inline uint64_t count(const std::vector<const char*>& names)
 {
     uint64_t sum = 0;

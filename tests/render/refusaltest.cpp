@@ -112,7 +112,7 @@ enum class Size
     FULL   ///< and a scene file, lights, shadows, text in the scene, a mirror, motion blur
 };
 
-/// A little of everything that can be shown, by an application that looks at what it gets.
+/// A scene with a little of everything, by an application that checks its results.
 class Show
 {
 public:
@@ -282,7 +282,7 @@ constexpr Refusal FILE_ACCESS = {[](uint64_t number)
                                  },
                                  [] { return *g_refusedTransfer != '\0'; }};
 
-/// Whether the engine must say in its own words that this call was refused.
+/// Whether the engine must log a message for this refused call.
 bool isForTheEngineToTell(const std::string& call)
 {
     const char* const calls[] = {"glGen",
@@ -318,7 +318,7 @@ class RefusalTest : public support::GlTest
 protected:
     RefusalTest() : GlTest({.width = 24, .height = 24}) {}
 
-    /// A driver that does not compile for each draw, trusts what it is given and has no objects of C++.
+    /// Settings for a driver without compiling for each draw, validation or C++ objects.
     static void SetUpTestSuite() { setenv("GALLIUM_DRIVER", "softpipe", 0); }
 
     void SetUp() override
@@ -486,7 +486,7 @@ protected:
 
 INSTANTIATE_TEST_SUITE_P(, RefusalSweep, testing::Range<uint64_t>(0, PARTS));
 
-// Fault caught by the three: a refusal that crashes, leaks, goes unsaid, or spoils what is loaded after it.
+// Fault caught by the three: a refusal that crashes, leaks, is not logged, or spoils later loads.
 TEST_P(RefusalSweep, everyGlCall)
 {
     sweep(GL_CALLS, Size::SMALL, 1);
@@ -505,7 +505,7 @@ TEST_P(RefusalSweep, everyAllocation)
     sweep(ALLOCATIONS, Size::FULL, 197);
 }
 
-// Faults caught: a kind of refusal that goes unsaid, and one that is remembered when it is over.
+// Faults caught: a kind of refusal that is not logged, and one that has effects after it ended.
 TEST_F(RefusalTest, kindsThatLast)
 {
     const auto refuseMemory = [](auto entry)

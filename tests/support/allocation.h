@@ -2,7 +2,7 @@
 
 #include <cstdint>
 
-/// Watches operator new of the program that uses this; what a GL driver takes from malloc() does not count.
+/// Watches operator new of the program; a GL driver's malloc() is not counted.
 namespace support
 {
 
@@ -12,11 +12,11 @@ uint64_t countAllocations();
 /// Those of all threads that were not given back.
 int64_t countLiveAllocations();
 
-/// The allocation of that number from here on (1 is the next) yields null; only those count that ask for null
-/// instead of an exception, in the program's own code. 0 ends it.
+/// The allocation of that number from here on (1 is the next) returns null; only nothrow allocations in the program's
+/// own code count. 0 ends it.
 void refuseAllocation(uint64_t number);
 
-/// Whether refuseAllocation() has hit one.
+/// Whether refuseAllocation() has refused one.
 bool isAllocationRefused();
 
 } // namespace support

@@ -15,7 +15,7 @@ namespace support
 ///     EXPECT_EQ(1, log.count('E'));
 ///     EXPECT_TRUE(log.contains("missing.png"));
 ///
-/// On leaving, what is not a log record goes on to the real standard error. Captures nest.
+/// At the end, text that is not a log record goes to the real standard error. Captures nest.
 class LogCapture
 {
 public:

@@ -39,7 +39,7 @@ struct Picture
     Rgba average() const;
 };
 
-/// What the current context has drawn: its surface, whole, whatever framebuffer is bound.
+/// The whole surface of the current context, whatever framebuffer is bound.
 Picture readFrame();
 
 /// A region of the bound framebuffer; x, y its lower left corner, as GL counts.
@@ -67,7 +67,7 @@ testing::AssertionResult comparePictures(const std::string& name, const Picture&
 testing::AssertionResult compareWithKept(const std::string& path, const Picture& actual,
                                          const Tolerance& tolerance = {});
 
-/// The means of square blocks of side x side pixels; what is left over at the right and lower edges is dropped.
+/// The means of square blocks of side x side pixels; remainders at the right and lower edges are dropped.
 Picture shrink(const Picture& picture, int side);
 
 /// For a failed check of single pixels: writes NAME-actual.png and says where.

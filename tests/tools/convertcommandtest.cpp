@@ -138,7 +138,7 @@ TEST_F(ConvertTest, options)
     EXPECT_EQ(0, convertAndLoad(moving + " --no-animation", "out.glo")->getAnimationCount());
 }
 
-// Fault caught: codes and figures that scripts rely on and that are written down nowhere.
+// Fault caught: codes and figures for scripts that are not documented.
 TEST(ConvertReport, documentsEveryCode)
 {
     const std::filesystem::path source(ORV_SOURCE_FOLDER);

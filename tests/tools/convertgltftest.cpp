@@ -77,7 +77,7 @@ protected:
     std::unique_ptr<aiScene> m_scene;
 };
 
-/// A triangle's positions at which whole numbers and shares of them differ.
+/// Positions of a triangle for which integers and normalised integers differ.
 template <class T>
 std::vector<T> getExtremes()
 {
@@ -109,7 +109,7 @@ GltfWriter writeExtremes(bool normalized)
 
 } // namespace
 
-// Fault caught: whole numbers taken for floats, or shares for whole numbers; signs lost; -128 that becomes less than -1.
+// Fault caught: integers read as floats, or normalised ones as plain ones; signs lost; -128 that becomes less than -1.
 TEST_F(GltfReader, everyKindOfNumber)
 {
     const struct
@@ -137,8 +137,8 @@ TEST_F(GltfReader, everyKindOfNumber)
     }
 }
 
-// Fault caught: elements that lie apart read as if they lay together; sparse values that are dropped or land in the
-// wrong place; an accessor without bytes that is refused; indices of one size read as another's.
+// Fault caught: strides ignored; sparse values dropped or in the wrong place; an accessor without a buffer view
+// refused; indices read with the wrong size.
 TEST_F(GltfReader, everyPlaceOfNumbers)
 {
     const Numbers moved = {0, 0, 0, 7, 8, 9, 0, 1, 0};
@@ -577,7 +577,7 @@ TEST_F(GltfReader, refusesWithThePlace)
         EXPECT_NE("", getFault({bytes.begin(), bytes.begin() + std::ptrdiff_t(size)})) << size;
 }
 
-// Fault caught: damage that the reader runs into instead of refusing it or leaving it out. What comes is sound.
+// Fault caught: damage that the reader neither refuses nor leaves out. Scenes that it makes are valid.
 TEST_F(GltfReader, damagedFiles)
 {
     const std::filesystem::path seeds = std::filesystem::path(ORV_SOURCE_FOLDER) / "fuzz/corpus/gltf";

@@ -249,7 +249,7 @@ void expectSeen(const PhysicalCase& item, const Picture& picture, int x)
 
 } // namespace
 
-// Fault caught: features of a material that are dropped, or that switch on what the model did not ask for.
+// Fault caught: features of a material that are dropped, or switched on without being in the model.
 TEST_F(ConvertMaterialTest, physicalMaterials)
 {
     std::vector<std::string> materials;
@@ -282,8 +282,8 @@ TEST_F(ConvertMaterialTest, physicalMaterials)
     EXPECT_LT(length(metal - Vector4f(1, 0.73536f, 0, 1)), 1e-4f) << metal.y; // half of the light
 }
 
-// Fault caught: occlusion that comes from another channel than red, in other shares than the rest or at full strength;
-// one for coordinates of its own drawn with others; metals that lose their colour to the sky, or whose sky is upside down.
+// Fault caught: occlusion from a channel other than red, in the wrong colour space or at full strength; a map with its
+// own coordinates drawn with others; metals that lose their colour to the sky, or whose sky is upside down.
 TEST_F(ConvertMaterialTest, occlusionAndSky)
 {
     std::vector<uint8_t> packed;
@@ -331,8 +331,8 @@ TEST_F(ConvertMaterialTest, occlusionAndSky)
             << place.x << " " << place.y << " " << sky.pixel(place.x, place.y);
 }
 
-// Fault caught: colours of vertices that are not shown, in other shares than the rest, or whose alpha counts where it
-// should not.
+// Fault caught: vertex colours that are not shown, in the wrong colour space, or whose alpha is used where it should
+// not be.
 TEST_F(ConvertMaterialTest, coloursOfVertices)
 {
     const Rgba GREEN{124, 255, 0}, BACKGROUND{214, 219, 227}, MIXED{169, 237, 114};
@@ -394,8 +394,7 @@ TEST_F(ConvertMaterialTest, coloursOfVertices)
               appearance->getShaderProgram());
 }
 
-// Fault caught: pictures in another format, size or place than the engine can do with, or that are written again
-// without need.
+// Fault caught: pictures in a format, size or place that the engine cannot use, or rewritten without need.
 TEST_F(ConvertMaterialTest, pictures)
 {
     const std::vector<uint8_t> pixels(12 * 10 * 4, 200);

@@ -52,7 +52,7 @@ float getDeviation(const Posed& posed, const Posed& wanted)
     return largest;
 }
 
-/// A model as libassimp hands it over, posed and skinned here.
+/// A model from libassimp, posed and skinned here.
 class Reference
 {
 public:
@@ -502,8 +502,8 @@ TEST_F(ConvertMotionTest, clipsLieEndToEnd)
     EXPECT_EQ(first, write(m_model.scene));
 }
 
-// Fault caught: what libassimp is known to hand over wrong: nodes of glTF 1.0, the bones of Half-Life models, the axes
-// and the unit of FBX; and options that do not put right what a file has wrong.
+// Fault caught: libassimp's known faults: nodes of glTF 1.0, the bones of Half-Life models, the axes and the unit of
+// FBX; and options that do not correct a file's own.
 TEST_F(ConvertMotionTest, nodesAreWhereTheFileHasThem)
 {
     const std::string models = MODELS;
@@ -622,8 +622,8 @@ Vector3f findSeen(SceneNode& node)
 
 } // namespace
 
-// Fault caught: nodes that mirror or have no size at rest and turn another way while they move, since a matrix does not
-// tell which axis is turned round, and tells no rotation where there is no size.
+// Fault caught: wrong orientation of animated nodes that mirror or have scale zero at rest: a matrix determines neither
+// the mirrored axis nor, at scale zero, the rotation.
 TEST_F(ConvertTest, nodesThatMatricesDoNotTell)
 {
     const std::vector<float> half = {0, 1, 0, 0}; // a turn by half a circle around y

@@ -340,7 +340,7 @@ TEST_F(InspectTest, findsEachFault)
         EXPECT_TRUE(found.count(info.code)) << info.code;
 }
 
-// Fault caught: an inspector that takes a file for good that the engine refuses, or the other way about.
+// Fault caught: an inspector that accepts a file which the engine refuses, or the other way round.
 TEST_F(InspectTest, agreesWithTheEngine)
 {
     GloScene scene = makeFullScene();

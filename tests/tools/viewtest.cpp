@@ -230,7 +230,7 @@ TEST_F(ViewPictureTest, showsWhatIsNoScene)
     EXPECT_TRUE(m_temporary.list().empty()) << "what a model was converted to";
 }
 
-// Faults caught: markings that are not drawn, in other places than where things are, or in pictures that did not ask.
+// Faults caught: debug views that are not drawn, in the wrong place, or in pictures without them.
 TEST_F(ViewPictureTest, marksWhatIsAskedFor)
 {
     const auto draw = [&](const std::string& name, const std::string& options)

@@ -254,7 +254,8 @@ TEST_F(ViewWindowTest, drawsWhatPicturesShow)
     leave();
 }
 
-// Faults caught: a key that marks nothing, or not what it says; marks that stay; what is hidden and seen, or pointed at.
+// Faults caught: a key of a debug view without effect or with the wrong one; views that stay on; hidden nodes drawn or
+// found by the pointer.
 TEST_F(ViewWindowTest, marksAndHidesWhatIsAskedFor)
 {
     view("scene.glo --camera eye --clip rest");

@@ -1,5 +1,5 @@
-// What the examples draw with elsewhere is a context without a window: here it is that of a canvas, and pictures go to
-// the page's script in place of files.
+// Replaces the examples' context without a window by that of a canvas; pictures go to the page's script instead of
+// files.
 
 #include "headless/headless.h"
 #include "headless/png.h"

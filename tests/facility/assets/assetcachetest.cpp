@@ -23,7 +23,7 @@ struct Note : public Shared
 
 using NoteCache = AssetCache<Note>;
 
-/// Claims names that begin with its letter, makes those that it is told to, and tells what it was asked.
+/// Claims names that begin with its letter, loads selected ones, and records the requests.
 class NoteLoader : public AssetLoader<Note>
 {
 public:
@@ -70,7 +70,7 @@ TEST(AssetCache, loadersThatClaimTheNameGoFirst)
         EXPECT_EQ(std::string(test.order) + test.order, asked) << "a failure was remembered";
     }
 
-    // Of two that claim it the one registered last goes first.
+    // Of two loaders that claim a name, the one registered last is asked first.
     std::string asked;
     const auto cache = makeShared<NoteCache>();
     const auto first = makeShared<NoteLoader>('A', asked), last = makeShared<NoteLoader>('A', asked);

@@ -29,7 +29,7 @@ namespace
 
 constexpr uint64_t MEGABYTE = uint64_t(1) << 20;
 
-/// Files in memory under any spelling of their name, and what is asked of them.
+/// Files in memory under any spelling of their name, with a record of requests.
 class SpelledSource : public StreamSource
 {
 public:
@@ -88,7 +88,7 @@ protected:
 
     void flush() override { pool->flush(); }
 
-    /// An appearance file that says a line over and over, with the number of the repetition in the place of each "%".
+    /// An appearance file that repeats a line, with the number of the repetition for each "%".
     SharedPtr<Appearance> loadLines(const std::string& line, int count)
     {
         std::string text = "1.0\n";
@@ -106,7 +106,7 @@ protected:
     SharedPtr<SpelledSource> files;
 };
 
-/// Says what it likes of its size, its place and what it read.
+/// Returns arbitrary sizes, positions and counts of bytes read.
 class LyingStream : public Stream
 {
 public:
@@ -266,7 +266,7 @@ TEST_F(LoadTest, logStaysShort)
     EXPECT_TRUE(log.contains("492 more records like this while loading uniforms.sp")) << log.text();
 }
 
-// Faults caught: one picture decoded as often as it can be spelled; what is refused kept as if it were loaded.
+// Faults caught: a picture decoded once for each spelling of its name; a refused one kept as if it were loaded.
 TEST_F(LoadTest, picturesOfOneLoadAreCountedTogether)
 {
     setLoadLimits({64 * MEGABYTE, 70000, MEGABYTE});
@@ -286,7 +286,7 @@ TEST_F(LoadTest, picturesOfOneLoadAreCountedTogether)
     EXPECT_TRUE(pool->getTexture2DCache()->get("19/a.png")) << "another load";
 }
 
-// Faults caught: programs made as long as there are names for them; one that was refused kept under its name.
+// Faults caught: an unlimited number of programs from one file; a refused one kept under its name.
 TEST_F(LoadTest, programsOfOneLoadAreCountedTogether)
 {
     setLoadLimits({MEGABYTE, MEGABYTE, 20000});
@@ -306,11 +306,11 @@ TEST_F(LoadTest, sameContentIsNotReadWithoutEnd)
     LogCapture log;
     files->opened = 0;
     loadLines("property a Texture2D %/big.bin", 500);
-    EXPECT_GE(1 + 2 * 32, files->opened); // 2 MiB, and 8 times what there is
+    EXPECT_GE(1 + 2 * 32, files->opened); // 2 MiB, and 8 times the size
     EXPECT_TRUE(log.contains("lines.ap reads the same files over and over")) << log.text();
 }
 
-// Faults caught: six copies of one picture at once; a GL name left by a cube that did not come to be.
+// Faults caught: six copies of one picture at once; a GL name left by an incomplete cube.
 TEST_F(LoadTest, cubesTakeTheirPicturesOneByOne)
 {
     files->add("face.png", imagefiles::encodeFlat("png", 64, 64, 3));
@@ -324,8 +324,8 @@ TEST_F(LoadTest, cubesTakeTheirPicturesOneByOne)
     EXPECT_EQ(before, glcalls::describeLiveNames());
 }
 
-// Faults caught: the list of sources used after it has moved, a source after it is gone; a failure kept although there
-// is one more place to look.
+// Faults caught: the list of sources used after it was reallocated, or a source after it was deleted; a failure
+// remembered although a source was added.
 TEST_F(LoadTest, sourcesThatChangeTheListOfSources)
 {
     const auto late = makeShared<SpelledSource>();

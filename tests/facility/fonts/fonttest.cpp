@@ -34,7 +34,7 @@ protected:
         textures->flush();
     }
 
-    /// The bitmaps that GL is given from here on.
+    /// Records the bitmaps given to GL.
     void keepAtlas()
     {
         glcalls::replace(glTexImage2D,
@@ -174,7 +174,7 @@ TEST_F(FontTest, loadsByFileAndSize)
 TEST_F(FontTest, atlasHoldsEachGlyphByItself)
 {
     addFile("sans.ttf", sans);
-    // Worked out from the boxes in the file by hand.
+    // Computed by hand from the boxes in the file.
     for (const auto& [size, height] : std::map<int, int>{
              {1, 8}, {12, 32}, {16, 64}, {32, 128}, {40, 256}, {64, 512}, {100, 1024}, {300, 8192}})
     {
@@ -212,7 +212,7 @@ TEST_F(FontTest, atlasHoldsEachGlyphByItself)
     }
 }
 
-// Fault caught: an atlas that the GL cannot take, found out after it was made.
+// Fault caught: an atlas too large for GL, detected only after it was made.
 TEST_F(FontTest, refusesWhatTheGlCannotTake)
 {
     addFile("sans.ttf", sans);

@@ -54,7 +54,7 @@ TEST_F(BindingsTest, texturesAreBoundOncePerUnitAndTarget)
     EXPECT_EQ((Calls{"glActiveTexture(0x84c0)", bindingTexture()}), bindTexture(0, GL_TEXTURE_2D, m_texture));
 }
 
-// Fault caught: one buffer's place taken for the other's.
+// Fault caught: the two buffer bindings exchanged.
 TEST_F(BindingsTest, buffersAndProgramsAreBoundOnce)
 {
     const RenderContext::DrawScope scope(m_context);

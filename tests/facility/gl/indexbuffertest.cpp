@@ -36,7 +36,7 @@ protected:
 
 } // namespace
 
-// Fault caught: the engine's own order of primitives taken for GL's.
+// Fault caught: the engine's primitive numbers sent to GL.
 TEST_F(IndexBufferTest, primitives)
 {
     const struct
@@ -103,13 +103,13 @@ TEST_F(IndexBufferTest, drawPathBindsOnChangeOnly)
     EXPECT_EQ((Calls{"glBindBuffer(0x8893, 0)", "glDrawElements(0x0001, 6, 0x1403, " + address + ")"}),
               callsOfDraw(*inMemory, context.get()));
     EXPECT_EQ((Calls{bind, drawCommitted}), callsOfDraw(*committed, context.get()));
-    committed->draw(); // unbinds behind the context's back
+    committed->draw(); // unbinds without the context
     EXPECT_EQ((Calls{bind, drawCommitted}), callsOfDraw(*committed, context.get()));
     committed->setEnabled(false);
     EXPECT_EQ(Calls{}, callsOfDraw(*committed, context.get()));
 }
 
-// Fault caught: indices that are gone drawn as vertices in order, which reads beyond the vertex buffer.
+// Fault caught: lost indices drawn as vertices in order, which reads beyond the vertex buffer.
 TEST_F(IndexBufferTest, lostBufferDrawsNothing)
 {
     const auto context = makeShared<RenderContext>();

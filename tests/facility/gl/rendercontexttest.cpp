@@ -16,7 +16,7 @@ namespace
 using RenderContextTest = support::GlTest;
 using Set = std::function<void(RenderContext&)>;
 
-/// One thing that is done, and what GL hears of it.
+/// An action and the GL calls that it makes.
 struct Step
 {
     Set set;
@@ -163,7 +163,7 @@ TEST_F(RenderContextTest, sequencesOfSettings)
         EXPECT_EQ(steps[i].expected, callsOf([&] { steps[i].set(target); })) << "step " << i;
 }
 
-// Faults caught: reading past a table, or an invalid value that GL never gets to refuse.
+// Faults caught: reading past a table, or an invalid value that is not reported.
 TEST_F(RenderContextTest, invalidEnumsAreLoggedAndRefusedByGl)
 {
     const struct
@@ -194,7 +194,7 @@ TEST_F(RenderContextTest, invalidEnumsAreLoggedAndRefusedByGl)
     EXPECT_EQ(BlendFunction(7), target.getState().blendFunctionColour);
 }
 
-// Faults caught: a stamp trusted after a setter, a mirrored solid inside out, the lagging offset moved on.
+// Faults caught: a revision trusted after a setter, a mirrored solid inside out, the lagging offset moved on.
 TEST_F(RenderContextTest, applySendsDifferencesAndSkipsWhatWasApplied)
 {
     RenderContext target;

@@ -68,7 +68,7 @@ TEST_F(ResourceTest, refusedNamesAreReleased)
     }
 }
 
-// Fault caught: a live object dropped without a word, or deleted behind its owner's back.
+// Fault caught: a live object dropped without a message, or deleted while its owner uses it.
 TEST_F(ResourceTest, flushDeletesWhatOnlyTheCacheHolds)
 {
     LogCapture log;
@@ -104,7 +104,7 @@ TEST_F(ResourceTest, flushDeletesWhatOnlyTheCacheHolds)
     glDeleteProgram(lostName);
 }
 
-// Fault caught: a program that fails to start, whose log is full of assertions about what it left behind.
+// Fault caught: a program that fails to start and logs an assertion for each remaining object.
 TEST_F(ResourceTest, droppingACacheTellsOnceWhatIsLeft)
 {
     auto cache = makeShared<detail::ResourceCache>();

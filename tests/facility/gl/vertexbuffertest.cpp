@@ -160,7 +160,7 @@ TEST_F(VertexBufferTest, lostBufferHasNoAttributes)
     glDeleteBuffers(2, names);
 }
 
-// Fault caught: per-draw calls for what GL holds already, and a set-up kept although something changed it.
+// Fault caught: redundant calls for each draw, and a set-up kept although something changed it.
 TEST_F(VertexBufferTest, drawPathSetsUpOnlyWhatChanged)
 {
     addTwoAttribs();
@@ -198,7 +198,7 @@ TEST_F(VertexBufferTest, drawPathSetsUpOnlyWhatChanged)
         EXPECT_EQ(program % 2 ? 4 : 3, read(0, GL_VERTEX_ATTRIB_ARRAY_SIZE)) << program;
     }
 
-    // An attribute added later is found although the pair has met.
+    // An attribute added later is found although the program has used the buffer before.
     buffer->addAttrib(makeFloats(2, {1, 2, 3, 4}), "a_uv0", Format::FLOAT, Usage::CLIENT_MEMORY, false);
     EXPECT_LT(0u, callsOfBind(*buffer, 2));
     EXPECT_TRUE(read(1, GL_VERTEX_ATTRIB_ARRAY_ENABLED));
@@ -309,7 +309,7 @@ TEST_F(VertexBufferTest, saveRefuses)
     EXPECT_EQ(3, log.count('E'));
 }
 
-// Fault caught: counts and sizes of a damaged file believed; reads beyond a buffer, pointers out of a file.
+// Fault caught: counts and sizes of a damaged file trusted; reads beyond a buffer, pointers from a file.
 TEST_F(VertexBufferTest, loadRefusesDamage)
 {
     addTwoAttribs();

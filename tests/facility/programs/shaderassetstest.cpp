@@ -104,7 +104,7 @@ Words everyProgram()
             requests.push_back(request);
         }
     }
-    // What a scene file's SURF chunk asks for goes with everything.
+    // The features of a scene file's SURF chunk can be combined with all others.
     for (const char* base : {"orv#max_pvl", "orv#max_ppl"})
     {
         for (const char* usual : {"", "$DIFF", "$SPEC$AMBI", "$DIFF$SPEC$AMBI$REFL$EMIS$SKIN",
@@ -150,7 +150,7 @@ std::string run(const std::string& command)
     return output;
 }
 
-/// What is left of a shader's text without its comments and blanks and what is for shadows.
+/// A shader's text without comments, blanks and code for shadows.
 Words codeOf(const std::string& text)
 {
     Words lines;
@@ -177,8 +177,8 @@ const std::string VALIDATOR =
 
 } // namespace
 
-// Fault caught: a built-in asset that is missing, misnamed, cut or changed on its way into the library, which leaves
-// only the comments and blanks of shaders out.
+// Fault caught: a built-in asset that is missing, misnamed, truncated or changed by the build, which may only remove
+// comments and blanks of shaders.
 TEST(BuiltInAssets, areTheFilesOfTheirFolders)
 {
     for (const auto& [space, count] : std::map<std::string, size_t>{{"orv", 34}, {"luvane", 37}})
@@ -250,7 +250,7 @@ TEST(BuiltInAssets, picturesHaveTheirSizesAndKinds)
     }
 }
 
-// Fault caught: what a forgiving driver takes but the language does not allow.
+// Fault caught: source that a tolerant driver accepts but the language does not allow.
 TEST(ShaderAssets, compileByTheRulesOfTheLanguage)
 {
     std::set<std::array<std::string, 2>> stages; // suffix and text
@@ -348,8 +348,8 @@ bool fits(std::vector<Declaration> declarations, size_t rows)
     return true;
 }
 
-/// The numbers that a preprocessed stage is written with, each once: they take room among the uniforms, whatever the
-/// compiler makes of them. Sizes of arrays do not, nor does what a constant is worked out from.
+/// The distinct literals of a preprocessed stage: they may take space among the uniforms. Array sizes and operands of
+/// constants do not.
 std::vector<Declaration> readLiterals(std::string source)
 {
     source = std::regex_replace(source, std::regex(R"((uniform|attribute|varying|const int|#)[^\n]*)"), "");
@@ -370,8 +370,8 @@ size_t packedRows(const std::vector<Declaration>& declarations)
 
 } // namespace
 
-// Fault caught: a program that only the roomy drivers of desktops take. 128 vertex and 16 fragment vectors, 8 varyings,
-// 8 attributes and 8 textures are what every device has.
+// Fault caught: a program that only fits on desktop drivers. 128 vertex and 16 fragment vectors, 8 varyings, 8
+// attributes and 8 textures are what every device has.
 TEST(ShaderAssets, fitTheSmallestDevice)
 {
     EXPECT_EQ(2u, packedRows({{"", "vec3", "a"}, {"", "float", "b"}, {"", "vec2", "c"}, {"", "vec2", "d"}}));
@@ -399,7 +399,7 @@ TEST(ShaderAssets, fitTheSmallestDevice)
         const std::string vertex = run(VALIDATOR + "-E " + folder.write("a.vert", sources[0]));
         const std::string fragment = run(VALIDATOR + "-E " + folder.write("a.frag", sources[1]));
         auto vertexUniforms = readDeclarations(vertex, "uniform", 5);
-        std::smatch lights; // how many the constant comes to on a device with 16 vectors
+        std::smatch lights; // the constant's value on a device with 16 vectors
         std::regex_search(fragment, lights, std::regex(R"(gl_MaxFragmentUniformVectors < 32 \? (\d+) :)"));
         auto fragmentUniforms =
             readDeclarations(fragment, "uniform", lights.empty() ? 0 : std::stoi(lights[1]));

@@ -28,7 +28,7 @@ TEST(ShaderUniform, indexIsCheckedLoudlyOnWritingAndQuietlyOnReading)
     }
 }
 
-// Fault caught: a stamp that stays although a value changed, or that moves without a change.
+// Fault caught: a revision that stays although a value changed, or that changes without need.
 TEST(ShaderUniform, revisionFollowsTheValues)
 {
     ShaderUniform<Vector4f> uniform(2);

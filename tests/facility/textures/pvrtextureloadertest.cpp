@@ -99,7 +99,7 @@ TEST_F(PvrTextureLoaderTest, everyFormatShowsItsPicture)
     {
         const pvr::FormatInfo& info = pvr::FORMATS[i];
         const std::string name = info.name + std::string(".pvr");
-        const int width = info.isPvrtc() ? 32 : 30; // where rows may end anywhere, they do
+        const int width = info.isPvrtc() ? 32 : 30; // an odd row length where the format allows it
         const pvr::SourcePicture picture = makePicture(unsigned(width), 32, false);
         LogCapture log;
         for (const bool isTurned : {false, true})

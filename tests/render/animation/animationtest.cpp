@@ -139,7 +139,8 @@ TEST(Animation, controllerAdvances)
     }
 }
 
-// Fault caught: a loop that is tiny beside the step, or below the precision of the progress, running for ever.
+// Fault caught: an endless loop if the loop range is tiny compared with the step, or below the precision of the
+// progress.
 TEST(Animation, loopsOfAnySizeEnd)
 {
     for (const float size : {1e-30f, 1e-6f, 1e30f})
@@ -216,7 +217,7 @@ TEST(Animation, animatorsWriteTheirTargets)
         opacity.apply(written);
         ASSERT_TRUE(appearance->getPropertyUniform("M_OPACITY")->getValue(value, 0));
         EXPECT_EQ(written, value);
-        appearance->addProperty<float>("M_OPACITY", 2); // replaced: what was remembered of it is no good
+        appearance->addProperty<float>("M_OPACITY", 2); // replaced: the remembered property is stale
     }
 }
 

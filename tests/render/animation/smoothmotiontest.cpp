@@ -58,7 +58,7 @@ float applyAt(const Animation::Ptr& animation, float time, const SceneNode& node
     return node.getPosition().x;
 }
 
-/// A rotation in double, as a matrix: nothing of how the engine does it.
+/// A rotation in double, as a matrix, independent of the engine's method.
 using Rotation = std::array<std::array<double, 3>, 3>;
 
 Rotation rotate(const std::array<double, 3>& axis, double angle)
@@ -94,7 +94,7 @@ Rotation transpose(const Rotation& a)
     return r;
 }
 
-/// The way from a to b as one turn, of which a share is gone.
+/// The rotation from a to b, of which a share is done.
 Rotation goFromTo(const Rotation& a, const Rotation& b, double share)
 {
     const Rotation way = multiply(transpose(a), b);
@@ -372,7 +372,7 @@ TEST(SmoothMotion, aClipPlaysOnASubtree)
 namespace
 {
 
-/// Fades as one would write them down: every clip ever faded to, with its share of the whole.
+/// A naive model of fades: every clip ever faded to, with its share of the whole.
 class NaiveFades
 {
 public:
@@ -482,7 +482,8 @@ TEST(SmoothMotion, theOldClipPlaysOn)
     EXPECT_FLOAT_EQ(0.0f, node->getPosition().x) << "a stopped one shows its start alone";
 }
 
-// Fault caught: shares of clips and weight that are multiplied the wrong way round, so that the base shows through or not.
+// Fault caught: shares of clips and weight multiplied in the wrong order, so that the base has too much or too little
+// share.
 TEST(SmoothMotion, fadesHappenAtAWeight)
 {
     const auto node = makeShared<SceneNode>();
@@ -499,7 +500,7 @@ TEST(SmoothMotion, fadesHappenAtAWeight)
     }
 }
 
-// Faults caught: more clips than a figure can be paid for, a jump when one is let go, one that is used after its end.
+// Faults caught: an unlimited number of clips, a jump when one is dropped, a dropped one used.
 TEST(SmoothMotion, fadesWithoutEndAreBounded)
 {
     const auto node = makeShared<SceneNode>();

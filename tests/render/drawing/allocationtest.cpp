@@ -54,7 +54,7 @@ TEST_F(AllocationTest, framesAllocateNothing)
     EXPECT_EQ(before, support::countAllocations());
 }
 
-// Fault caught: a still frame that works out world matrices again, or tells GL what GL holds.
+// Fault caught: a still frame that computes world matrices again, or sends values that GL has.
 TEST_F(AllocationTest, stillFramesDoNothingTwice)
 {
     const auto red = makePaint(Colour4f(1.0f, 0.0f, 0.0f, 1.0f));
@@ -65,7 +65,7 @@ TEST_F(AllocationTest, stillFramesDoNothingTwice)
     renderFrame();
     renderFrame();
 
-    // Only a matrix that is left alone keeps such a mark.
+    // Only a matrix that is not recomputed keeps such a mark.
     Matrix4f& world = const_cast<Matrix4f&>(solid->getWorldTransform());
     world.columns[3].y += 0.25f;
     const Matrix4f marked = world;

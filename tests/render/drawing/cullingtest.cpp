@@ -64,8 +64,8 @@ Transform findWorld(const SceneNode& node)
 
 } // namespace
 
-/// Random frames, each held against the vertices as they are: what is not drawn must lie outside of one of the planes of the
-/// picture that it is missing in. Solids are told apart by the count of indices that they draw.
+/// Random frames, each checked against the vertices: a solid that is not drawn must be outside of one plane of the
+/// picture that lacks it. Solids are identified by the number of indices that they draw.
 class CullingTest : public SceneTest
 {
 protected:
@@ -284,7 +284,7 @@ protected:
                                             Vector4f(vector(1.0f), 0), Vector4f(vector(12.0f), 1)));
     }
 
-    /// In most frames nothing, so that there is something to remember from frame to frame.
+    /// Changes nothing in most frames, so that caches between frames are used.
     void changeScene()
     {
         const auto anyNode = [this]() -> SceneNode& { return *nodes[size_t(pick(int(nodes.size())))]; };
@@ -466,8 +466,8 @@ protected:
     int leftOutCount = 0;
 };
 
-// Faults caught: a solid left out that can be seen: by spheres that do not follow a move, a stretch, a shear or a joint;
-// by what is remembered of a subtree after a change below it; by planes of another eye.
+// Faults caught: a visible solid left out, because spheres do not follow a move, a scale, a shear or a joint, because a
+// subtree's cached bounds are stale, or because of another eye's planes.
 TEST_F(CullingTest, leavesNothingOutThatMayBeSeen)
 {
     makeScene();
@@ -480,7 +480,8 @@ TEST_F(CullingTest, leavesNothingOutThatMayBeSeen)
     EXPECT_LT(0.8 * outsideCount, leftOutCount) << outsideCount; // spheres reach further than what is in them
 }
 
-// Faults caught: what only a mirror shows, left out by the eye's planes; by the walk of the first frame with a mirror.
+// Faults caught: solids visible only in a mirror left out, by the eye's planes or by the walk of the first frame with a
+// mirror.
 TEST_F(CullingTest, leavesNothingOutThatAMirrorMayShow)
 {
     makeScene();

@@ -37,7 +37,7 @@ FontFace::Ptr load(const Bytes& file, unsigned index = 0)
     return FontFace::load(stream, "test", index);
 }
 
-/// What FreeType makes of the same file.
+/// FreeType's result for the same file.
 class Judge
 {
 public:

@@ -292,7 +292,7 @@ protected:
 
 } // namespace
 
-// Fault caught: something bound that is taken to be bound still, though the application bound something else.
+// Fault caught: a binding trusted although the application has changed it.
 TEST_F(OwnGlTest, framesAreTheSameWhateverWasBoundBetweenThem)
 {
     for (const OwnCalls& calls : makeOwnCalls())
@@ -302,7 +302,7 @@ TEST_F(OwnGlTest, framesAreTheSameWhateverWasBoundBetweenThem)
     }
 }
 
-// Fault caught: what two kinds of calls do together and neither does alone.
+// Fault caught: faults that only appear with two kinds of calls together.
 TEST_F(OwnGlTest, framesAreTheSameAfterCallsInAnyOrder)
 {
     const std::vector<OwnCalls> all = makeOwnCalls();

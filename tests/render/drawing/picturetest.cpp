@@ -8,7 +8,7 @@ using namespace orv;
 using support::Picture;
 using support::Rgba;
 
-/// What a user sees, through the built-in materials.
+/// Pictures of the built-in materials.
 class PictureTest : public SceneTest
 {
 protected:
@@ -87,8 +87,8 @@ TEST_F(PictureTest, squaresShowTheirFrontFaces)
     expectQuarters(support::readFrame(), BLACK, BLACK, BLACK, BLACK);
 }
 
-// Faults caught: normals turned by the model matrix itself, 114 instead of 228; materials that leave values out
-// turned black by what they lack.
+// Faults caught: normals transformed by the model matrix itself, 114 instead of 228; materials without some values
+// drawn black.
 TEST_F(PictureTest, litMaterials)
 {
     const auto sun = makeShared<Light>(); // from the camera, white
@@ -209,7 +209,7 @@ TEST_F(MirrorPictureTest, reflectedEyeStandsBehindTheMirror)
     EXPECT_EQ(GREEN, support::readFrame().pixel(48, 16));
 }
 
-// Fault caught: everything inside out before a camera that mirrors, directly or in a mirror.
+// Fault caught: everything inside out with a mirroring camera, directly or in a mirror.
 TEST_F(MirrorPictureTest, mirroringCamerasSeeTheRightSide)
 {
     addSquare(Vector3f(-1.5f, -1.0f, 1.0f), 0.5f, makePaint(Colour4f::GREEN));

@@ -7,8 +7,8 @@
 
 using namespace orv;
 
-/// Random frames held against the simplest way of drawing: look every uniform up by its name for every draw. Each draw
-/// asks GL what the uniforms of its program are.
+/// Random frames compared with the simplest method: every uniform looked up by name for every draw. Each draw reads the
+/// uniforms of its program from GL.
 class SentTest : public SceneTest
 {
 protected:
@@ -200,7 +200,7 @@ protected:
         }
     }
 
-    /// What the renderer is to work out for the solid, if the holder is one that it does that for.
+    /// The value that the renderer has to compute for the solid, if the holder is one of its transforms.
     bool findTransform(const ShaderUniformBase* holder, const Solid& solid, Matrix4f& transform) const
     {
         Matrix4f projection;
@@ -295,8 +295,8 @@ protected:
     bool isRendering = false;
 };
 
-// Fault caught: a uniform taken for ready that is not: fed from elsewhere, set twice, read by two names, left by another
-// material, by a direct draw or by the application.
+// Fault caught: a stale uniform taken as up to date: fed from elsewhere, set twice, read by two names, or set by
+// another material, a direct draw or the application.
 TEST_F(SentTest, uniformsAreWhatTheirNamesSay)
 {
     support::LogCapture log; // arrays of two that take one matrix are asserted

@@ -324,8 +324,8 @@ protected:
 
 } // namespace
 
-// Faults caught: shadows in the wrong place, on the wrong side or of the wrong light; surfaces that throw shadows on
-// themselves; light that leaks where things touch; shadows that end at the border of the map.
+// Faults caught: shadows in the wrong place, on the wrong side or of the wrong light; self-shadowing; light leaks at
+// contacts; shadows that end at the border of the map.
 TEST_F(ShadowModel, rayToTheLightDecides)
 {
     const struct
@@ -373,8 +373,8 @@ TEST_F(ShadowModel, rayToTheLightDecides)
     EXPECT_LT(5000, dark);
 }
 
-// Faults caught: holes that are closed in the shadow; what covers them upside down; values of the material that do not
-// reach the map, or not when they change.
+// Faults caught: holes missing in the shadow, or upside down; values of the material that do not reach the map, or not
+// when they change.
 TEST_F(ShadowTest, cutOutsThrowTheirHoles)
 {
     const auto white = makeWhite("orv#max_ppl.sp$DIFF");
@@ -406,7 +406,7 @@ TEST_F(ShadowTest, cutOutsThrowTheirHoles)
     picture = drawShadowed();
     EXPECT_FALSE(isDark(picture, -2.2f, -1.0f)) << support::savePicture("opacity", picture);
 
-    // What is seen from the other side alone, what is blended, and what is told not to, lets light through.
+    // Culled sides, blended solids and excluded ones let light through.
     material->setProperty("M_CUTOFF", 0.0f);
     sheet->setRotation(quaternionFromAxisAngle(Vector3f::X_AXIS, Anglef::fromDegrees(90.0f)));
     EXPECT_FALSE(isDark(drawShadowed(), -4.0f, 1.0f));
@@ -422,7 +422,7 @@ TEST_F(ShadowTest, cutOutsThrowTheirHoles)
     EXPECT_FALSE(isDark(drawShadowed(), -4.0f, 1.0f));
 }
 
-// Faults caught: skins that throw the shadow of their rest pose, or of the moment before.
+// Faults caught: skins that cast the shadow of their rest pose, or of the last frame.
 TEST_F(ShadowTest, skinsThrowTheShadowOfTheMoment)
 {
     makeStage(makeWhite("orv#max_pvl.sp$DIFF"));
@@ -523,7 +523,7 @@ TEST_F(ShadowTest, framesCostWhatTheyShow)
     EXPECT_TRUE(support::comparePictures("detached", plain, support::readFrame(), {.perChannel = 0}));
 }
 
-// Faults caught: shadows that use what lost contexts leave behind, or that look otherwise in the next one.
+// Faults caught: shadows that use objects of lost contexts, or that look different in the next one.
 TEST_F(ShadowTest, nextContextHasTheSameShadows)
 {
     Picture pictures[2];

@@ -271,7 +271,7 @@ TEST_F(TextLayoutTest, forgettingGlyphsIsNotSeen)
     }
 }
 
-// Fault caught: something else forgotten than what was used the longest ago. Against a list.
+// Fault caught: glyphs dropped that are not the least recently used. Compared with a list.
 TEST_F(TextLayoutTest, forgetsWhatWasUsedTheLongestAgo)
 {
     const auto cache = makeCache(64, 2);
@@ -457,7 +457,7 @@ TEST_F(TextLayoutTest, standsInTheScene)
     EXPECT_EQ(1, log.count('E'));
 }
 
-// Faults caught: a frame after a lost context that is another one; calls of GL for what is lost.
+// Faults caught: a different frame after a lost context; GL calls for lost objects.
 TEST_F(TextLayoutTest, comesBackAfterALostContext)
 {
     Picture before;

@@ -15,8 +15,8 @@
 
 using namespace orv;
 
-// The files of the folder "kept" were written by the tools of one day, the converter's scenes among them, and are never
-// written again: what is added later must leave them as they are.
+// The files of the folder "kept", some of them converted, were written once and are never written again: later
+// additions must not change how they are read.
 
 namespace
 {
@@ -105,7 +105,7 @@ protected:
 
 } // namespace
 
-// Fault caught: an addition that changes what is written for a scene without it.
+// Fault caught: an addition to the format that changes files which do not use it.
 TEST_F(KeptFilesTest, sameBytes)
 {
     EXPECT_EQ(support::readFile(FOLDER + "old-0.6.0.glo"), write(makeOldScene("0.6.0", "3ds_max2012")));
@@ -113,7 +113,7 @@ TEST_F(KeptFilesTest, sameBytes)
     EXPECT_EQ(support::readFile(FOLDER + "old-0.14.0.glo"), write(makeOldScene("0.14.0", "blender2.63.0")));
 }
 
-// Fault caught: an addition that changes what a file means that is already out there.
+// Fault caught: an addition to the format that changes the meaning of existing files.
 TEST_F(KeptFilesTest, samePictures)
 {
     const struct

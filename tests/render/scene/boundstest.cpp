@@ -192,8 +192,8 @@ TEST_F(BoundsTest, clipsReachAsFarAsTheirKeys)
     EXPECT_LT(getVolume(wide.box), 1.5f * getVolume(bounds.box));
 }
 
-// Faults caught: halves that lose triangles, boxes that a ray passes by, the wrong one of two; all against a look at every
-// triangle.
+// Faults caught: tree nodes that lose triangles, boxes that a ray misses, the wrong one of two hits; compared with a
+// test of every triangle.
 TEST_F(BoundsTest, raysFindTheNearestTriangle)
 {
     const auto vertices = makeShared<MeshVertices>();

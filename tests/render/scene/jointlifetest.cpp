@@ -117,8 +117,8 @@ TEST(JointLife, scenes)
 namespace
 {
 
-/// Plays at random with the real nodes and with a model that only has the rule: what is held lives, so do children of
-/// what lives, and so do joints of solids that live unless a solid with joints is at or below the joint.
+/// Random operations on real nodes and on a model that only has the rule: held nodes live, children of living nodes
+/// live, and joints of living solids live unless a solid with joints is at or below the joint.
 class RandomScene
 {
 public:

@@ -52,8 +52,8 @@ struct Tree
 
 } // namespace
 
-// Fault caught: a node class that hands itself over as another one, children before parents, or flags read in
-// the wrong polarity. The tree is A with the children B (with the child C) and D.
+// Fault caught: a node class visited as another one, children before parents, or flags read in the wrong polarity. The
+// tree is A with the children B (with the child C) and D.
 TEST(SceneWalk, visitsWhatTheFlagsAdmit)
 {
     const FlagMask none;
