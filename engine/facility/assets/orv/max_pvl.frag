@@ -115,7 +115,11 @@ varying mediump vec2 v_reflection;
 float arrivingShare()
 {
     highp float k = abs(u_s_map.z);
-    highp vec2 place = vec2(v_shadowX, v_shadowY) / (u_s_map.y * (u_s_map.z > 0.0 ? v_shadowDepth : 1.0));
+    highp float depth = u_s_map.z > 0.0 ? v_shadowDepth : 1.0;
+    highp vec2 place = vec2(v_shadowX, v_shadowY);
+    if (!all(greaterThan(place, vec2(0.0))) || !all(lessThan(place, vec2(depth))))
+        return 1.0; // beside the map. Beside a lamp, where the depth is 0, nothing below would be a number
+    place /= u_s_map.y * depth;
     highp vec2 middle = floor(place) + 0.5;
     float share = 0.0;
     for (int y = -1; y <= 1; y++)
