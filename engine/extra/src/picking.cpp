@@ -11,6 +11,7 @@
 #include "orv/solid.h"
 
 #include <algorithm>
+#include <cmath>
 #include <limits>
 
 namespace orv
@@ -35,9 +36,20 @@ TriangleSides getDrawnSides(const Appearance& appearance, bool isMirrored, bool 
     return drawsFront != (isClockwise != isTurned) ? TriangleSides::FRONT : TriangleSides::BACK;
 }
 
+/// Whether what is moved by a transform becomes so flat that the way back is little but rounding.
+bool isFlattening(const Matrix4f& transform)
+{
+    constexpr float LEAST = 1e-4f;
+    const Vector3f x = normalize(transform.columns[0].xyz());
+    const Vector3f y = normalize(transform.columns[1].xyz());
+    const Vector3f z = normalize(transform.columns[2].xyz());
+    return !(std::fabs(dot(x, cross(y, z))) > LEAST);
+}
+
 class Picker : public SceneNodeVisitor
 {
 public:
+    /// @param ray  with a direction of length 1.
     explicit Picker(const Ray& ray) : m_ray(ray) {}
 
     using SceneNodeVisitor::visit;
@@ -50,8 +62,7 @@ public:
         if (!geometry || !solid->getAppearance() || !meetSolid(*solid, *geometry, hit))
             return;
         hits.push_back({SharedPtr<Solid>(solid), hit.triangle,
-                        m_ray.position + m_ray.direction * hit.distance,
-                        hit.distance * length(m_ray.direction)});
+                        m_ray.position + m_ray.direction * hit.distance, hit.distance});
     }
 
     std::vector<PickHit> hits;
@@ -62,11 +73,10 @@ private:
     {
         const Appearance& appearance = *solid.getAppearance();
         const bool isMirrored = solid.turnsWinding(appearance.getShaderProgram().get());
-        const Matrix4f toMesh = inverse(solid.getWorldTransform());
-        const bool isFlat = toMesh == Matrix4f(); // it has no inverse
-        if (!isMovedByJoints(solid) && !isFlat)
-            return meet(geometry, transform(m_ray, toMesh), getDrawnSides(appearance, isMirrored, isMirrored),
-                        hit);
+        const Matrix4f& world = solid.getWorldTransform();
+        if (!isMovedByJoints(solid) && !isFlattening(world))
+            return meet(geometry, transform(m_ray, inverse(world)),
+                        getDrawnSides(appearance, isMirrored, isMirrored), hit);
         placeVertices(solid, m_places);
         return meet(geometry, m_ray, getDrawnSides(appearance, isMirrored, false), m_places, hit);
     }
@@ -79,9 +89,13 @@ private:
 
 std::vector<PickHit> pick(SceneNode& scene, const Ray& ray, const FlagMask& flags)
 {
-    Picker picker(ray);
-    if (ray.direction == Vector3f())
+    // The square of a long or a short direction leaves the range of a float.
+    const Vector3f& way = ray.direction;
+    const float largest = std::max({std::fabs(way.x), std::fabs(way.y), std::fabs(way.z)});
+    const Ray unit{ray.position, normalize(Vector3f(way.x / largest, way.y / largest, way.z / largest))};
+    if (!(length(unit.direction) > 0.5f)) // none, or not made of numbers
         return {};
+    Picker picker(unit);
     visitScene(picker, scene, flags, flags);
     std::stable_sort(picker.hits.begin(), picker.hits.end(),
                      [](const PickHit& a, const PickHit& b) { return a.distance < b.distance; });

@@ -349,6 +349,41 @@ TEST_F(BoundsTest, picksTheSidesThatAreDrawn)
     }
 }
 
+// Faults caught: a squeezed and then turned solid, whose transform has no inverse but for rounding, taken back by one;
+// directions whose squares are too large or too small to be numbers.
+TEST_F(BoundsTest, picksFlatSolidsByRaysOfAnyLength)
+{
+    const auto vertices = makeShared<MeshVertices>();
+    vertices->places = {{-2, -1, 0}, {3, -1, 1}, {0, 2, -1}};
+    const auto mesh = makeShared<Mesh>(MeshHeader(), nullptr, nullptr);
+    mesh->setGeometry(makeShared<MeshGeometry>(vertices, IndexBuffer::Primitive::TRIANGLES, nullptr, 0));
+    for (int i = 0; i < 300; ++i)
+    {
+        const auto turned = makeShared<SceneNode>();
+        const auto squeezed = makeShared<SceneNode>();
+        const auto solid = makeShared<Solid>(mesh, makeShared<Appearance>());
+        turned->setRotation(rotation());
+        squeezed->setScale(Vector3f(1.0f, i % 2 ? 0.0f : 1e-7f, i % 3 ? 1.0f : -1.0f));
+        squeezed->setParent(turned);
+        solid->setRotation(rotation());
+        solid->setParent(squeezed);
+        solid->getAppearance()->setCullingMode(CullingMode::CULL_NONE);
+        const Matrix4f& world = solid->getWorldTransform();
+        const float share = number(0.2f, 0.7f);
+        const std::vector<Vector3f>& corners = vertices->places;
+        const Vector3f inside = corners[0] * 0.2f + corners[1] * share + corners[2] * (0.8f - share);
+        const Vector3f aim = (world * Vector4f(inside, 1.0f)).xyz();
+        const Vector3f normal = normalize((turned->getWorldTransform() * Vector4f(0, 1, 0, 0)).xyz());
+        const Vector3f start = aim + normal * 4.0f;
+        const float lengths[] = {1.0f, 1e-30f, 1e25f};
+        const std::vector<PickHit> hits = pick(*turned, {start, normal * -lengths[i % 3]});
+        ASSERT_EQ(1u, hits.size()) << i;
+        EXPECT_NEAR(4.0f, hits[0].distance, 0.02f) << i;
+        EXPECT_LT(length(hits[0].point - aim), 0.02f) << i;
+    }
+    EXPECT_TRUE(pick(*makeShared<Solid>(mesh, makeShared<Appearance>()), {{}, {NAN, 0, 1}}).empty());
+}
+
 // Fault caught: triangles that GL draws but that cannot be pointed at, and indices beyond the vertices.
 TEST_F(BoundsTest, knowsTrianglesAsTheyAreDrawn)
 {
