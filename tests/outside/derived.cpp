@@ -41,3 +41,11 @@ bool isInSight(orv::AssetCachePool& pool, orv::RenderContext& context, orv::Came
     lines.draw(context, camera);
     return !orv::getWorldBounds(scene).box.isEmpty() && !orv::pick(scene, orv::Ray()).empty();
 }
+
+orv::SharedPtr<orv::MeshGeometry> makeGeometry(const orv::Vector4f& joints, const orv::Vector4f& weights)
+{
+    const auto vertices = orv::makeShared<orv::MeshVertices>();
+    vertices->places.push_back(orv::Vector3f());
+    vertices->influences.push_back(orv::makeInfluence(joints, weights));
+    return orv::makeShared<orv::MeshGeometry>(vertices, orv::IndexBuffer::Primitive::POINTS, nullptr, 0);
+}

@@ -37,7 +37,7 @@ public:
 /// The shares that the built-in programs compute from weights: they add up to 1. Where the weights add up to
 /// 0 or less, the first joint has all of it. Joint numbers beyond 255 become 255.
 /// @param joints  numbers; the nearest whole ones count.
-MeshVertices::Influence makeInfluence(const Vector4f& joints, const Vector4f& weights);
+ORV_API MeshVertices::Influence makeInfluence(const Vector4f& joints, const Vector4f& weights);
 
 /// What a mesh draws, in memory: for exact bounds, and for rays that look for triangles (see meet()).
 class ORV_API MeshGeometry : public Shared
