@@ -16,6 +16,7 @@
 #include <fstream>
 #include <map>
 #include <new>
+#include <set>
 
 #include <sys/mman.h>
 #include <sys/prctl.h>
@@ -72,7 +73,7 @@ std::vector<Model> findModels(const FolderJob& job, std::string& error)
         const bool isModel = extension == ".gltf" || extension == ".glb" ||
                              (extension != ".xml" && importer.IsExtensionSupported(extension));
         if (isModel && entry->is_regular_file(ignored))
-            paths.push_back(fs::relative(entry->path(), job.folder, ignored));
+            paths.push_back(entry->path().lexically_relative(job.folder)); // a link stays where it is
     }
     if (reason)
         error = job.folder + ": " + reason.message();
@@ -81,11 +82,14 @@ std::vector<Model> findModels(const FolderJob& job, std::string& error)
     std::map<fs::path, unsigned> stems;
     for (const fs::path& path : paths)
         ++stems[fs::path(path).replace_extension()];
+    std::set<fs::path> taken;
+    for (const auto& [stem, count] : stems)
+        taken.insert(stem);
     std::vector<Model> models;
     for (const fs::path& path : paths)
     {
         fs::path scene = fs::path(path).replace_extension();
-        if (stems[scene] > 1)
+        for (bool isTaken = stems[scene] > 1; isTaken; isTaken = !taken.insert(scene).second)
             scene += "-" + path.extension().string().substr(1); // duck.obj beside duck.dae
         if (digest(path.generic_string()) % job.shards == job.shard - 1)
             models.push_back({path, scene});
@@ -135,8 +139,8 @@ public:
     {
         std::ifstream file(m_report);
         const Json report = Json::parse(file, nullptr, false);
-        if (!report.is_object() || report.value("settings", "") != m_settings || !report.contains("inputs") ||
-            !report["inputs"].is_array() || report["inputs"].empty())
+        if (!report.is_object() || !report.contains("settings") || report["settings"] != m_settings ||
+            !report.contains("inputs") || !report["inputs"].is_array() || report["inputs"].empty())
             return false;
         for (const Json& input : report["inputs"])
         {
@@ -152,8 +156,7 @@ public:
         }
         if (report.contains("error") && report["error"].is_string())
             error = report["error"].get<std::string>();
-        std::error_code ignored;
-        return !error.empty() || fs::is_regular_file(m_job.out, ignored);
+        return !error.empty() || areWritten(report);
     }
 
     bool convert(std::string& error) const
@@ -169,6 +172,22 @@ public:
     }
 
 private:
+    /// Whether the scene and its textures are there.
+    bool areWritten(const Json& report) const
+    {
+        std::error_code ignored;
+        const fs::path folder = fs::path(m_job.out).parent_path();
+        const Json textures = report.value("textures", Json::array());
+        for (const Json& texture : textures)
+        {
+            const Json file = texture.is_object() ? texture.value("file", Json()) : Json();
+            if (!file.is_string() ||
+                !fs::is_regular_file(folder / fs::path(file.get<std::string>()).filename(), ignored))
+                return false;
+        }
+        return fs::is_regular_file(m_job.out, ignored);
+    }
+
     bool writeReport(const Outcome& outcome, std::string& error) const
     {
         Json report = Json::parse(outcome.json, nullptr, false);
