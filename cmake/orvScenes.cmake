@@ -7,6 +7,7 @@
 #
 # TARGET   an existing target, such as the program that shows the scenes, which are made before it; otherwise the name
 #          of a new target that is part of ALL. Its property ORV_SCENES lists the scene files.
+#          Another call with the same target adds to them, with options of its own.
 # model    a file, from the current source folder; "duck.dae" becomes "duck.glo". Two of one name are refused.
 # OUT      the folder for scenes and textures; by default the current build folder.
 # OPTIONS  for orv-convert, such as --fps 60.
@@ -35,11 +36,15 @@ function(orv_add_scenes target)
     endif()
     file(MAKE_DIRECTORY ${folder})
     set(scenes "")
+    set(others "") # of calls before
+    if(TARGET ${target})
+        get_property(others TARGET ${target} PROPERTY ORV_SCENES)
+    endif()
     foreach(model IN LISTS SCENES_UNPARSED_ARGUMENTS)
         get_filename_component(model ${model} ABSOLUTE)
         get_filename_component(name ${model} NAME_WLE)
         set(scene ${folder}/${name}.glo)
-        if(scene IN_LIST scenes)
+        if(scene IN_LIST scenes OR scene IN_LIST others)
             message(FATAL_ERROR "orv_add_scenes(${target}): two models would become ${scene}")
         endif()
         add_custom_command(OUTPUT ${scene}
@@ -49,8 +54,13 @@ function(orv_add_scenes target)
     endforeach()
 
     if(TARGET ${target})
-        add_custom_target(${target}_scenes DEPENDS ${scenes})
-        add_dependencies(${target} ${target}_scenes)
+        list(LENGTH others number)
+        set(name ${target}_scenes)
+        if(TARGET ${name})
+            string(APPEND name ${number})
+        endif()
+        add_custom_target(${name} DEPENDS ${scenes})
+        add_dependencies(${target} ${name})
     else()
         add_custom_target(${target} ALL DEPENDS ${scenes})
     endif()

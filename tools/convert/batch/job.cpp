@@ -51,10 +51,30 @@ std::string quoteForMake(const std::string& path)
     return quoted;
 }
 
+/// Folders that change when a file comes that was looked for and was not there; but for the one that the scene goes into,
+/// which each conversion changes.
+std::set<std::filesystem::path> findFoldersOfMissing(const Job& job, const FileGate& gate)
+{
+    std::set<std::filesystem::path> folders;
+    std::error_code ignored;
+    const std::filesystem::path out = std::filesystem::absolute(job.out, ignored).parent_path();
+    for (std::filesystem::path path : gate.getMissing())
+    {
+        do
+            path = path.parent_path();
+        while (path.has_relative_path() && !std::filesystem::is_directory(path, ignored));
+        if (!std::filesystem::equivalent(path, out, ignored))
+            folders.insert(path);
+    }
+    return folders;
+}
+
 std::vector<uint8_t> makeDepfile(const Job& job, const FileGate& gate)
 {
+    std::set<std::filesystem::path> inputs = gate.getOpened();
+    inputs.merge(findFoldersOfMissing(job, gate));
     std::string text = quoteForMake(job.out) + ":";
-    for (const std::filesystem::path& input : gate.getOpened())
+    for (const std::filesystem::path& input : inputs)
         text += " \\\n  " + quoteForMake(input.string());
     text += "\n";
     return {text.begin(), text.end()};
