@@ -11,6 +11,7 @@
 #include "orv/solid.h"
 
 #include <algorithm>
+#include <cmath>
 
 namespace orv
 {
@@ -84,13 +85,13 @@ void findPlaces(const Solid& solid, std::vector<Vector3f>& places)
         detail::addBoundsCorners(solid, places);
     const MeshGeometry* const geometry = mesh ? mesh->getGeometry().get() : nullptr;
     size_t kept = 0;
-    for (size_t i = 0; geometry && i < places.size(); ++i)
+    for (size_t i = 0; i < places.size(); ++i)
     {
-        if (geometry->getDrawn()[i])
+        const bool isDrawn = !geometry || geometry->getDrawn()[i];
+        if (isDrawn && std::isfinite(places[i].x + places[i].y + places[i].z)) // as computeBounds() has it
             places[kept++] = places[i];
     }
-    if (geometry)
-        places.resize(kept);
+    places.resize(kept);
 }
 
 /// Visits a scene twice: for the box, then for the sphere around its centre.
@@ -150,13 +151,16 @@ bool placeVertices(const Solid& solid, std::vector<Vector3f>& places)
         return false;
     const MeshVertices& vertices = geometry->getVertices();
     places.resize(vertices.places.size());
-    const bool isSkinned = isMovedByJoints(solid) && !vertices.influences.empty();
+    const bool isMoved = isMovedByJoints(solid);
+    const bool isSkinned = isMoved && !vertices.influences.empty();
     const std::vector<Matrix4f> joints =
-        isSkinned ? getJointTransforms(solid) : std::vector<Matrix4f>{solid.getWorldTransform()};
+        isMoved ? getJointTransforms(solid) : std::vector<Matrix4f>{solid.getWorldTransform()};
+    const Matrix4f& whole =
+        getJoint(joints, 1); // joints that a mesh does not name are all 1, as every missing attribute
     for (size_t i = 0; i < places.size(); ++i)
     {
         if (!isSkinned)
-            places[i] = place(joints.front(), vertices.places[i]);
+            places[i] = place(whole, vertices.places[i]);
         for (int j = 0; isSkinned && j < 4; ++j)
         {
             const MeshVertices::Influence& influence = vertices.influences[i];

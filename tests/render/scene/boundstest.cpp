@@ -146,6 +146,15 @@ TEST_F(BoundsTest, subtreesReachAsFarAsWhatIsInThem)
     expectNear(Vector3f(-1, -2, 99), bounds.box.lowest, "lowest");
     expectNear(Vector3f(10.5f, 2, 101), bounds.box.highest, "highest");
 
+    const auto damaged = makeShared<MeshVertices>();
+    damaged->places = {{1, 1, 1}, {NAN, 500, 0}, {INFINITY, 0, 0}, {1, 1.5f, 1}};
+    const auto broken = makeShared<Solid>(makeShared<Mesh>(MeshHeader(), nullptr, nullptr), nullptr);
+    broken->getMesh()->setGeometry(
+        makeShared<MeshGeometry>(damaged, IndexBuffer::Primitive::POINTS, nullptr, 0));
+    broken->setParent(glo->getTopNode());
+    EXPECT_EQ(bounds.box.highest, getWorldBounds(top, &unknown).box.highest);
+    EXPECT_NEAR(0.25f, getWorldBounds(*broken).radius, 1e-6f);
+
     const auto strange = makeShared<Solid>(makeShared<Mesh>(MeshHeader(), nullptr, nullptr), nullptr);
     strange->setParent(glo->getTopNode());
     EXPECT_FALSE(getOwnBounds(*strange).isKnown());
@@ -296,6 +305,16 @@ TEST_F(BoundsTest, picksSkinnedSolidsAsTheyStand)
     top.find("elbow")->setRotation(quaternionFromAxisAngle(Vector3f(0, 0, 1), Anglef::fromDegrees(90.0f)));
     EXPECT_FALSE(isMet(3.0f, 0.0f));
     EXPECT_TRUE(isMet(2.0f, 1.0f));
+
+    const auto plain = makeShared<MeshVertices>(); // without a_joints: all of it follows joint 1
+    plain->places = {{-1, -1, 0}, {1, -1, 0}, {0, 1, 0}};
+    figure.getMesh()->setGeometry(
+        makeShared<MeshGeometry>(plain, IndexBuffer::Primitive::TRIANGLES, nullptr, 0));
+    figure.setPosition(Vector3f(50, 0, 0));
+    top.find("elbow")->setRotation(Quaternionf());
+    top.find("elbow")->setPosition(Vector3f(2, 8, 0));
+    EXPECT_TRUE(isMet(0.0f, 8.0f));
+    EXPECT_FALSE(isMet(0.0f, 0.0f));
 }
 
 // Fault caught: a side that is not drawn, or one that is drawn and cannot be pointed at.
