@@ -138,10 +138,7 @@ struct ShadowParts
     ShadowParts(const SharedPtr<RenderContext>& contextToUse, const SharedPtr<AssetCachePool>& pool,
                 int sizeToUse);
 
-    bool isComplete() const
-    {
-        return target && map && rows[0] && rows[1] && rows[2] && offset && index && light && depths;
-    }
+    bool isComplete() const { return bool(target); }
     void warn(bool& isSaid, const char* text) const;
     void find(SceneNode& scene, const FlagMask& renderFlags, const FlagMask& recursiveFlags);
     void findReach(Camera* camera);
@@ -195,6 +192,11 @@ ShadowParts::ShadowParts(const SharedPtr<RenderContext>& contextToUse, const Sha
     , depths(shareProperty<SharedPtr<Texture2D>>(*context, "S_DEPTHS"))
 {
     switchOff();
+    if (!map || !rows[0] || !rows[1] || !rows[2] || !offset || !index || !light || !depths)
+    {
+        ORV_LOG_WARN("No shadows: properties of the context called S_... are of other types.");
+        return;
+    }
     const SharedPtr<ShaderProgram> plain = pool->getShaderProgramCache()->get("shadow#depth.sp");
     if (!plain || !plain->uniformExists("S_SPLIT"))
     {

@@ -474,6 +474,18 @@ TEST_F(ShadowTest, skinsThrowTheShadowOfTheMoment)
     }
 }
 
+// Fault caught: shadows that are refused without a word.
+TEST_F(ShadowTest, saysWhyThereAreNone)
+{
+    renderContext->addProperty(makeShared<ShaderUniform<float>>(1),
+                               "S_MAP"); // the program's own, of another type
+    LogCapture log;
+    makeShadows();
+    EXPECT_FALSE(shadows->isComplete());
+    EXPECT_EQ(1, log.count('W')) << log.text();
+    drawShadowed();
+}
+
 // Faults caught: a device that draws nothing, or wrongly, where it could do without shadows; more messages than one.
 TEST_F(ShadowTest, weakDevicesDoWithout)
 {
