@@ -5,6 +5,7 @@
 #include <cstdio>
 #include <cstring>
 
+#include <sys/stat.h>
 #include <unistd.h>
 
 #define STBIW_ZLIB_COMPRESS headless::compressForPng
@@ -34,6 +35,15 @@ bool writeTo(std::FILE* file, int width, int height, const uint8_t* rgba)
     return std::fflush(file) == 0 && !std::ferror(file) && isMade; // a full disk may show only here
 }
 
+/// Whether it is a device, a pipe or an open file, which is written to and never replaced, by root neither.
+bool isDevice(const std::string& path)
+{
+    struct stat status = {};
+    const auto begins = [&path](const char* with) { return path.rfind(with, 0) == 0; };
+    return begins("/dev/std") || begins("/dev/fd/") || begins("/proc/") ||
+           (stat(path.c_str(), &status) == 0 && !S_ISREG(status.st_mode) && !S_ISDIR(status.st_mode));
+}
+
 bool fail(const std::string& path, std::string& error)
 {
     error = path + ": cannot be written: " + (errno ? std::strerror(errno) : "the picture is too large");
@@ -46,18 +56,20 @@ bool writePng(const std::string& path, int width, int height, const uint8_t* rgb
 {
     if (path == "-")
         return writeTo(stdout, width, height, rgba) || fail("standard output", error);
-    const std::string temporary = path + ".tmp" + std::to_string(getpid());
+    const bool isReplaced = !isDevice(path);
+    const std::string temporary = isReplaced ? path + ".tmp" + std::to_string(getpid()) : path;
     std::FILE* file = std::fopen(temporary.c_str(), "wb");
     if (!file)
         return fail(path, error);
     bool isWritten = writeTo(file, width, height, rgba);
     isWritten = std::fclose(file) == 0 && isWritten;
-    isWritten = isWritten && std::rename(temporary.c_str(), path.c_str()) == 0;
+    isWritten = isWritten && (!isReplaced || std::rename(temporary.c_str(), path.c_str()) == 0);
     if (isWritten)
         return true;
 
     fail(path, error);
-    std::remove(temporary.c_str());
+    if (isReplaced)
+        std::remove(temporary.c_str());
     return false;
 }
 

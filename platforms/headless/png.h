@@ -6,7 +6,8 @@
 namespace headless
 {
 
-/// Writes a PNG completely or not at all: first to a temporary name beside it, then renamed.
+/// Writes a PNG completely or not at all: first to a temporary name beside it, then renamed; a device or
+/// pipe is written to directly.
 /// @param path   "-" for standard output, which is flushed; on failure a part may have been written.
 /// @param rgba   width x height x 4 bytes, top row first.
 /// @param error  set to "path: reason" on failure.

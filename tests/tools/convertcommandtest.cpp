@@ -10,6 +10,10 @@
 
 #include <filesystem>
 
+#include <fcntl.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
 using namespace orv;
 
 // Fault caught: a failure that exits with 0, does not name the file, or leaves something behind.
@@ -65,6 +69,25 @@ TEST_F(ConvertTest, allOrNothing)
     const std::vector<std::string> before = m_folder.list();
     EXPECT_EQ(1, convert("tri.obj out.glo").exitCode);
     EXPECT_EQ(before, m_folder.list());
+}
+
+// Fault caught: a pipe or a device (/dev/null, for root) whose place a file takes, pictures of other tools included.
+TEST_F(ConvertTest, pipesAreWrittenTo)
+{
+    m_folder.write("tri.obj", std::string("v 0 0 0\nv 1 0 0\nv 0 1 0\nf 1 2 3\n"));
+    ASSERT_EQ(0, mkfifo(m_folder.path("pipe").c_str(), 0600));
+    const int end =
+        open(m_folder.path("pipe").c_str(), O_RDWR | O_NONBLOCK); // so that nobody waits for the other
+    char bytes[4096];
+    EXPECT_EQ(0, convert("tri.obj out.glo --report pipe").exitCode);
+    EXPECT_LT(100, read(end, bytes, sizeof bytes));
+    EXPECT_EQ('{', bytes[0]);
+    const uint8_t pixel[] = {255, 0, 0, 255};
+    std::string error;
+    EXPECT_TRUE(headless::writePng(m_folder.path("pipe"), 1, 1, pixel, error)) << error;
+    EXPECT_LT(50, read(end, bytes, sizeof bytes));
+    EXPECT_TRUE(std::filesystem::is_fifo(m_folder.path("pipe")));
+    close(end);
 }
 
 // Fault caught: a memory limit that stops the converter instead of the conversion.

@@ -65,9 +65,20 @@ bool fail(const std::string& path, const std::string& reason, std::string& error
     return false;
 }
 
-bool writeFile(const fs::path& path, const std::vector<uint8_t>& bytes)
+/// Whether it is a device, a pipe or an open file, which is written to and never replaced, by root neither.
+bool isDevice(const std::string& path)
 {
-    std::FILE* file = std::fopen(path.c_str(), "wbx");
+    std::error_code ignored;
+    const fs::file_status status = fs::status(path, ignored);
+    const auto begins = [&path](const char* with) { return path.rfind(with, 0) == 0; };
+    return begins("/dev/std") || begins("/dev/fd/") || begins("/proc/") ||
+           (fs::exists(status) && !fs::is_regular_file(status) && !fs::is_directory(status));
+}
+
+/// @param mode  of fopen().
+bool writeFile(const fs::path& path, const std::vector<uint8_t>& bytes, const char* mode)
+{
+    std::FILE* file = std::fopen(path.c_str(), mode);
     if (!file)
         return false;
     const bool written = bytes.empty() || std::fwrite(bytes.data(), 1, bytes.size(), file) == bytes.size();
@@ -90,9 +101,11 @@ bool writeTemporaries(const std::vector<OutputFile>& files, const FileGate& inpu
             return fail(file.path, std::strerror(EISDIR), error);
         if (inputs.wasOpened(file.path))
             return fail(file.path, "the model was read from this file; choose another name", error);
-        const fs::path path = getTemporaryPath(file.path);
-        temporaries.add(path);
-        if (!writeFile(path, file.bytes))
+        const bool isReplaced = !isDevice(file.path);
+        const fs::path path = isReplaced ? getTemporaryPath(file.path) : fs::path(file.path);
+        if (isReplaced)
+            temporaries.add(path);
+        if (!writeFile(path, file.bytes, isReplaced ? "wbx" : "wb"))
             return fail(file.path, std::strerror(errno), error);
     }
     return true;
@@ -109,6 +122,8 @@ bool writeFiles(const std::vector<OutputFile>& files, const FileGate& inputs, st
         return false;
     for (const OutputFile& file : files)
     {
+        if (isDevice(file.path))
+            continue; // done
         std::error_code reason;
         const bool isNew = !fs::exists(file.path, reason);
         fs::rename(getTemporaryPath(file.path), file.path, reason);
