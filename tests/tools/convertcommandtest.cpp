@@ -42,6 +42,7 @@ TEST_F(ConvertTest, failuresWriteNothing)
         {"tri.obj out.glo --report nowhere/out.json", 1, "nowhere/out.json: No such file"},
         {"tri.obj out.glo --up w", 2, "up"},
         {"tri.obj out.glo --scale 0", 2, "scale"},
+        {"tri.obj out.glo --scale nan", 2, "scale"},
         {"tri.obj out.glo --max-texture-size 0", 2, "max-texture-size"},
         {"tri.obj out.glo --time-limit 0.000001", 1,
          "tri.obj: not done after 1e-06 seconds (see --time-limit)"},

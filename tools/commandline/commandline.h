@@ -7,7 +7,9 @@
 #include <CLI/CLI.hpp>
 
 #include <cerrno>
+#include <cmath>
 #include <cstdio>
+#include <cstdlib>
 #include <cstring>
 #include <string>
 
@@ -38,6 +40,15 @@ inline void addCommon(CLI::App& app)
         ->group("");
     app.failure_message([](const CLI::App* failed, const CLI::Error& error)
                         { return failed->get_name() + ": " + error.what() + "; --help shows how\n"; });
+}
+
+/// For options that take numbers with a fraction: CLI::Range lets "nan" pass.
+inline CLI::Validator refuseNan()
+{
+    return CLI::Validator(
+        [](const std::string& text)
+        { return std::isnan(std::strtod(text.c_str(), nullptr)) ? text + ": not a number" : ""; },
+        "");
 }
 
 /// Call it after all output: output that could not be written, to a full disk for instance, is an error.

@@ -130,6 +130,7 @@ void addOptions(CLI::App& app, Command& command)
         ->excludes(out);
     app.add_option("--fps", options.fps, "samples per second of animations")
         ->check(CLI::Range(1.0, 1000.0))
+        ->check(commandline::refuseNan())
         ->capture_default_str();
     app.add_option("--keys", command.keys,
                    "stepped: a key for each change; sparse: keys where movement bends, to be interpolated")
@@ -138,12 +139,14 @@ void addOptions(CLI::App& app, Command& command)
     app.add_option("--key-error", options.keyError,
                    "of sparse keys: a share of the model's size, radians, a share of 1 for scales")
         ->check(CLI::Range(1e-6, 0.1))
+        ->check(commandline::refuseNan())
         ->capture_default_str();
     app.add_flag("--no-animation", command.noAnimation, "leave animations out");
     app.add_option("--up", options.up, "the axis that points up in the model, if its file has it wrong")
         ->check(CLI::IsMember({"x", "y", "z"}));
     app.add_option("--scale", options.scale, "scales everything by this factor")
         ->check(CLI::Range(1e-6, 1e6))
+        ->check(commandline::refuseNan())
         ->capture_default_str();
     app.add_option("--max-texture-size", options.maxTextureSize, "makes larger textures smaller; in pixels")
         ->check(CLI::Range(1, LARGEST_TEXTURE));
@@ -164,6 +167,7 @@ void addOptions(CLI::App& app, Command& command)
     app.add_flag("--dry-run", command.job.dryRun, "write no scene and no textures");
     app.add_option("--time-limit", command.job.limits.seconds, "seconds after which to give up; 0 for never")
         ->check(CLI::Range(0.0, 1e6))
+        ->check(commandline::refuseNan())
         ->capture_default_str();
     app.add_option("--memory-limit", command.job.limits.mebibytes,
                    convert::CAN_LIMIT_MEMORY ? "MiB of memory above which to give up; 0 for no limit"
