@@ -511,6 +511,37 @@ TEST_F(CullingTest, leavesNothingOutThatAMirrorMayShow)
     mirror = nullptr;
 }
 
+// Fault caught: a mirror that takes the place in a list of those before it, which are hidden and have none.
+TEST_F(CullingTest, drawsAMirrorBehindHiddenOnes)
+{
+    const auto program = makeProgram(
+        "attribute vec3 a_position; uniform mat4 u_transform;"
+        "void main() { gl_Position = u_transform * vec4(a_position, 1.0); }",
+        "uniform sampler2D u_mirror; void main() { gl_FragColor = texture2D(u_mirror, vec2(0.5)); }",
+        {{"u_transform", "T_MODEL_VIEW_PROJECTION"}, {"u_mirror", "M_MIRROR_TEXTURE"}});
+    SharedPtr<Appearance> last;
+    for (int i = 0; i < 9; ++i)
+    {
+        last = makeShared<Appearance>();
+        last->setShaderProgram(program);
+        const auto square = createSquare(*pool, Vector2f(1, 1));
+        square->setAppearance(last);
+        square->setPosition(Vector3f(0, 0, i < 8 ? 50.0f : -5.0f)); // behind the eye, and before it
+        square->setParent(scene);
+    }
+    camera->setPosition(Vector3f());
+    renderer->setCounted(true);
+    for (int frame = 0; frame < 2; ++frame)
+    {
+        renderFrame();
+        const SharedPtr<ShaderUniformBase> property = last->getPropertyUniform("M_MIRROR_TEXTURE");
+        SharedPtr<Texture2D> texture;
+        ASSERT_TRUE(property && property->getValue(texture, 0));
+        EXPECT_TRUE(texture);
+        EXPECT_EQ(8u, renderer->getCounters().culled);
+    }
+}
+
 // Faults caught: a look at each solid of a subtree that cannot be seen; lights that go out with it.
 TEST_F(CullingTest, hiddenSubtreesAreNotWalked)
 {

@@ -241,7 +241,7 @@ void SimpleRenderer::renderEye(const detail::Eye& eye, const detail::Viewport& v
         {
             renderReflection(*mirror, eye, viewport);
             publishEye(eye.world, view);
-            if (m_mirrorProperties.size() <= i)
+            while (m_mirrorProperties.size() <= i) // several, where mirrors before this one were hidden
                 m_mirrorProperties.emplace_back("M_MIRROR_TEXTURE");
             m_mirrorProperties[i].set(*mirror->getAppearance(), m_mirrorTarget->getColourTexture());
         }
