@@ -1,6 +1,7 @@
 #include "orv/picking.h"
 
 #include "orv/appearance.h"
+#include "orv/indexbuffer.h"
 #include "orv/mesh.h"
 #include "orv/meshgeometry.h"
 #include "orv/meshrays.h"
@@ -46,6 +47,11 @@ bool isFlattening(const Matrix4f& transform)
     return !(std::fabs(dot(x, cross(y, z))) > LEAST);
 }
 
+bool isSwitchedOff(const Mesh& mesh)
+{
+    return mesh.getIndexBuffer() && !mesh.getIndexBuffer()->isEnabled();
+}
+
 class Picker : public SceneNodeVisitor
 {
 public:
@@ -59,7 +65,8 @@ public:
         hit.distance = std::numeric_limits<float>::max();
         const MeshGeometry* const geometry =
             solid->getMesh() ? solid->getMesh()->getGeometry().get() : nullptr;
-        if (!geometry || !solid->getAppearance() || !meetSolid(*solid, *geometry, hit))
+        if (!geometry || !solid->getAppearance() || isSwitchedOff(*solid->getMesh()) ||
+            !meetSolid(*solid, *geometry, hit))
             return;
         hits.push_back({SharedPtr<Solid>(solid), hit.triangle,
                         m_ray.position + m_ray.direction * hit.distance, hit.distance});

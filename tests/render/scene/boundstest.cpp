@@ -284,6 +284,9 @@ TEST_F(BoundsTest, picksWhatIsDrawn)
     second.setVisible(false);
     EXPECT_EQ(2u, pick(top, ray).size());
     EXPECT_EQ(1u, pick(top, ray, SceneNode::VISIBLE).size());
+    first.getMesh()->getIndexBuffer()->setEnabled(false);
+    EXPECT_TRUE(pick(top, ray, SceneNode::VISIBLE).empty());
+    first.getMesh()->getIndexBuffer()->setEnabled(true);
     first.getMesh()->setGeometry(nullptr);
     EXPECT_TRUE(pick(top, ray, SceneNode::VISIBLE).empty());
     EXPECT_TRUE(pick(top, {Vector3f(), Vector3f()}).empty());

@@ -25,8 +25,8 @@ struct PickHit
 };
 
 /// Finds the nearest triangle of each solid that a ray hits, skinned ones in their current pose. Culled sides
-/// (RenderState::cullingMode), points, lines, and meshes that do not keep their geometry (Mesh::getGeometry()) are
-/// ignored. A mesh of 100,000 triangles takes some microseconds; the first call builds a tree of its triangles. For
+/// (RenderState::cullingMode), points, lines, and meshes that do not keep their geometry (Mesh::getGeometry()) or whose
+/// index buffer is disabled are ignored. A mesh of 100,000 triangles takes some microseconds; the first call builds a tree of its triangles. For
 /// skinned solids each triangle is tested.
 /// @param ray  in the world, with a direction of any length; one without direction hits nothing.
 /// @param flags  which nodes take part, by their own flags and those above; as RenderBlock::setRenderFlags() has them.
