@@ -25,6 +25,8 @@
 
 #include <algorithm>
 #include <limits>
+#include <mutex>
+#include <unordered_map>
 #include <vector>
 
 namespace orv
@@ -113,6 +115,27 @@ private:
     const Light* m_wanted = nullptr;
 };
 
+/// A material that receives shadows. The last of its maps restores its program.
+struct Attachment
+{
+    SharedPtr<ShaderProgram> before;
+    SharedPtr<ShaderProgram> now;
+    int mapCount = 0;
+};
+
+/// The materials of all maps of all contexts. Never destroyed, since an application's global maps may outlive it.
+struct Attachments
+{
+    std::mutex mutex; ///< each context may have a thread of its own
+    std::unordered_map<const Appearance*, Attachment> byAppearance;
+
+    static Attachments& getAll()
+    {
+        static Attachments& all = *new Attachments;
+        return all;
+    }
+};
+
 /// Calls a function for each solid's material that has a program; for shared materials several times.
 template <class Function>
 class MaterialWalk : public SceneNodeVisitor
@@ -146,12 +169,8 @@ struct ShadowParts
     void publish(const ShadowView& view, int lightIndex);
     void switchOff();
 
-    struct Changed
-    {
-        SharedPtr<Appearance> appearance;
-        SharedPtr<ShaderProgram> before;
-        SharedPtr<ShaderProgram> now;
-    };
+    void take(const SharedPtr<Appearance>& appearance, const SharedPtr<ShaderProgram>& program);
+    void giveBack();
 
     SharedPtr<RenderContext> context;
     int size;
@@ -171,7 +190,7 @@ struct ShadowParts
     ShadowWalk walk;
     std::vector<Vector3f> corners;
     ShadowReach reach;
-    std::vector<Changed> changed;
+    std::unordered_map<const Appearance*, SharedPtr<Appearance>> attached; ///< materials
     bool isRoomSaid = false;
     bool isProgramSaid = false;
     bool isLightSaid = false;
@@ -310,6 +329,36 @@ void ShadowParts::publish(const ShadowView& view, int lightIndex)
     depths->set(texture);
 }
 
+void ShadowParts::take(const SharedPtr<Appearance>& appearance, const SharedPtr<ShaderProgram>& program)
+{
+    Attachments& all = Attachments::getAll();
+    const std::lock_guard<std::mutex> lock(all.mutex);
+    Attachment& attachment = all.byAppearance[appearance.get()];
+    if (attached.emplace(appearance.get(), appearance).second)
+        ++attachment.mapCount;
+    if (attachment.now && program == appearance->getShaderProgram())
+        return;
+    attachment.before = appearance->getShaderProgram();
+    attachment.now = program;
+    appearance->setShaderProgram(program);
+}
+
+void ShadowParts::giveBack()
+{
+    Attachments& all = Attachments::getAll();
+    const std::lock_guard<std::mutex> lock(all.mutex);
+    for (const auto& [key, appearance] : attached)
+    {
+        const auto found = all.byAppearance.find(key);
+        if (--found->second.mapCount > 0)
+            continue;
+        if (appearance->getShaderProgram() == found->second.now)
+            appearance->setShaderProgram(found->second.before);
+        all.byAppearance.erase(found);
+    }
+    attached.clear();
+}
+
 /// Tells programs that no light has shadows.
 void ShadowParts::switchOff()
 {
@@ -329,9 +378,10 @@ ShadowMap::ShadowMap(const SharedPtr<RenderContext>& context, const SharedPtr<As
 ShadowMap::~ShadowMap()
 {
     detach();
+    if (!m_parts->depths || m_parts->depths->get() != m_parts->texture)
+        return; // another map's shadows
     m_parts->switchOff();
-    if (m_parts->depths && m_parts->depths->get() == m_parts->texture)
-        m_parts->depths->set(nullptr); // a context must not keep its pool's textures
+    m_parts->depths->set(nullptr); // a context does not keep its pool's textures
 }
 
 bool ShadowMap::isComplete() const
@@ -356,10 +406,7 @@ int ShadowMap::attach(SceneNode& scene)
         {
         case detail::ShadowAnswer::TAKES:
             ++count;
-            if (program == appearance->getShaderProgram())
-                break;
-            parts.changed.push_back({appearance, appearance->getShaderProgram(), program});
-            appearance->setShaderProgram(program);
+            parts.take(appearance, program);
             break;
         case detail::ShadowAnswer::NO_ROOM:
             parts.warn(parts.isRoomSaid, "A material takes no shadows: its program has no room for them.");
@@ -377,12 +424,7 @@ int ShadowMap::attach(SceneNode& scene)
 
 void ShadowMap::detach()
 {
-    for (const detail::ShadowParts::Changed& changed : m_parts->changed)
-    {
-        if (changed.appearance->getShaderProgram() == changed.now)
-            changed.appearance->setShaderProgram(changed.before);
-    }
-    m_parts->changed.clear();
+    m_parts->giveBack();
 }
 
 void ShadowMap::setLight(const SharedPtr<Light>& light)

@@ -561,6 +561,27 @@ TEST_F(ShadowTest, framesCostWhatTheyShow)
     EXPECT_TRUE(support::comparePictures("detached", plain, support::readFrame(), {.perChannel = 0}));
 }
 
+// Fault caught: a map that takes the shadows along of the one that has taken its place.
+TEST_F(ShadowTest, mapsTakeTurns)
+{
+    const auto white = makeWhite("orv#max_ppl.sp$DIFF");
+    const auto before = white->getShaderProgram();
+    makeStage(white);
+    addCube(Vector3f(0, 2, 0), Vector3f(1, 1, 1), white);
+    light->setPosition(Vector3f(3, 3, 0));
+    point(*light, Vector3f());
+    makeShadows();
+    const Picture first = drawShadowed();
+    const ShadowMap::Ptr next = makeShared<ShadowMap>(renderContext, pool, 1024);
+    EXPECT_EQ(1, next->attach(*scene));
+    next->render(*scene, camera.get());
+    shadows = nullptr;
+    renderFrame();
+    EXPECT_TRUE(support::comparePictures("turns", first, support::readFrame(), {.perChannel = 0}));
+    next->detach();
+    EXPECT_EQ(before, white->getShaderProgram());
+}
+
 // Faults caught: shadows that use objects of lost contexts, or that look different in the next one.
 TEST_F(ShadowTest, nextContextHasTheSameShadows)
 {

@@ -62,7 +62,8 @@ public:
     /// @return how many materials of the scene receive shadows now, including programs of your own that bind S_DEPTHS.
     int attach(SceneNode& scene);
 
-    /// Restores the programs of all materials, except those whose program was changed in the meantime.
+    /// Restores the programs of all materials, except those whose program was changed in the meantime, or
+    /// that another map is attached to.
     void detach();
 
     /// @param light  directional or spot, and among the first five lights of the scene; empty (the default): the first
