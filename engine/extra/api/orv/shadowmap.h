@@ -84,7 +84,8 @@ public:
     ///
     /// If the bounds of some solids are unknown (see SimpleRenderer::setCulled()), a directional light's map covers
     /// everything within the distance.
-    /// @param camera  borrowed: a directional light's map covers its view. Null: the whole scene.
+    /// @param camera  borrowed: a directional light's map covers its view. Null: the whole scene. The aspect
+    ///                ratio is that of the context's viewport: set it first if the block has its own.
     /// @param renderFlags, recursiveFlags  which nodes take part; use the block's, so that lights are counted alike.
     void render(SceneNode& scene, Camera* camera, const FlagMask& renderFlags = FlagMask(),
                 const FlagMask& recursiveFlags = FlagMask());
