@@ -200,13 +200,14 @@ bool loadScene(Session& session, const Bytes&, std::string& fault)
     return true;
 }
 
-/// The glyphs of some characters and of the first numbers, at two sizes, on small pages.
-void drawFace(Session& session, const Bytes& file, std::string& fault)
+/// Every glyph of some characters and of the first numbers, at two sizes, on pages that hold few of them.
+/// @return whether there is such a face.
+bool drawFace(Session& session, const Bytes& file, std::string& fault)
 {
     MemoryStream stream(file.data(), int(file.size()));
     const FontFace::Ptr face = FontFace::load(stream, "file.ttf");
     if (!face)
-        return;
+        return false;
     const auto cache = makeShared<GlyphCache>(session.pool(), GlyphCacheOptions{64, 2});
     cache->addFont(face);
     const auto text = makeShared<TextLayout>(session.pool(), cache, Colour4f::WHITE);
@@ -235,14 +236,15 @@ void drawFace(Session& session, const Bytes& file, std::string& fault)
     nulldriver::given().vertices = vertices; // the text's vertices do not come from the file
     if (cache->getPageCount() > 2)
         fault = "more pages than allowed";
+    return true;
 }
 
 bool loadFont(Session& session, const Bytes& file, std::string& fault)
 {
     const Font::Ptr font = session.pool().getFontCache()->get("file.ttf;16");
-    drawFace(session, file, fault);
+    const bool hasFace = drawFace(session, file, fault);
     if (!font)
-        return false;
+        return hasFace;
     const float height = float(font->getTexture()->getHeight());
     for (int c = font->getFirstChar(); c < font->getFirstChar() + font->getCharCount(); ++c)
     {

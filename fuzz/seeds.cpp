@@ -1,5 +1,7 @@
 #include "seeds.h"
 
+#include "seedbytes.h"
+
 #include "facility/imagefiles.h"
 #include "render/gloscenes.h"
 
@@ -14,33 +16,6 @@ namespace hostile
 
 namespace
 {
-
-Bytes toBytes(const std::string& text)
-{
-    return Bytes(text.begin(), text.end());
-}
-
-Bytes join(const std::vector<Bytes>& pieces)
-{
-    Bytes all;
-    for (const Bytes& piece : pieces)
-        all.insert(all.end(), piece.begin(), piece.end());
-    return all;
-}
-
-Bytes little(uint32_t value, int size = 4)
-{
-    Bytes bytes;
-    for (int i = 0; i < size; ++i)
-        bytes.push_back(uint8_t(value >> (8 * i)));
-    return bytes;
-}
-
-Bytes big(uint32_t value, int size = 4)
-{
-    Bytes bytes = little(value, size);
-    return Bytes(bytes.rbegin(), bytes.rend());
-}
 
 Bytes counting(size_t count, int step = 1)
 {
@@ -388,116 +363,6 @@ void addScenes(std::vector<Seed>& seeds)
     add("tooManySolids", "References in file.glo ask for more", multiplySolids(400, 60));
 }
 
-// --- Fonts ---------------------------------------------------------------------------------------------------
-
-Bytes bigs(const std::vector<int>& values, int size = 2)
-{
-    Bytes bytes;
-    for (const int value : values)
-        bytes = join({bytes, big(uint32_t(value), size)});
-    return bytes;
-}
-
-/// Every character is one of the three glyphs of makeFont().
-Bytes makeCharacterMap(int format)
-{
-    Bytes glyphs;
-    for (int i = 0; i < 96; ++i)
-        glyphs.push_back(uint8_t(i % 4));
-    std::vector<int> wide(glyphs.begin(), glyphs.end());
-    switch (format)
-    {
-    case 0: return join({bigs({0, 262, 0}), Bytes(32), glyphs, Bytes(128)});
-    case 4:
-        return join(
-            {bigs({4, 32 + 2 * 96, 0, 4, 4, 1, 0, 127, 0xffff, 0, 32, 0xffff, 0, 1, 4, 0}), bigs(wide)});
-    case 6: return join({bigs({6, 10 + 2 * 96, 0, 32, 96}), bigs(wide)});
-    default: return join({bigs({12, 0}), bigs({16 + 24, 0, 2, 32, 33, 1, 65, 66, 2}, 4)});
-    }
-}
-
-/// Glyph 1 followed by 2, and 2 by 1.
-Bytes makeKerning()
-{
-    return join({bigs({0, 1, 0, 14 + 12, 1, 2, 12, 1, 0}), bigs({1, 2, -50, 2, 1, 30})});
-}
-
-/// The same as a list of pairs, and as classes in an extension table.
-Bytes makePositions()
-{
-    const Bytes listed =
-        join({bigs({2, 0, 1, 8}), bigs({1, 12, 4, 0, 1, 18}), bigs({1, 1, 1}), bigs({1, 2, -50})});
-    const Bytes classes = join({bigs({2, 32, 5, 0, 42, 50, 2, 2}), bigs({0, 0, 0, 0, 0, 0, 0, -30}),
-                                bigs({2, 1, 2, 2, 0}), bigs({1, 2, 1, 1}), bigs({2, 1, 1, 1, 1})});
-    const Bytes extended = join({bigs({9, 0, 1, 8}), bigs({1, 2}), big(8), classes});
-    const Bytes features = join({bigs({1}), toBytes("kern"), bigs({8}), bigs({0, 2, 0, 1})});
-    const int lookups = 10 + int(features.size());
-    return join(
-        {bigs({1, 0, 0, 10, lookups}), features, bigs({2, 6, 6 + int(listed.size())}), listed, extended});
-}
-
-using Tables = std::vector<std::pair<const char*, Bytes>>;
-
-/// A triangle, a shape with curves, and one made of both.
-/// @param more   further tables.
-/// @param start  of the font in its file.
-Bytes makeFont(int mapFormat, const Tables& more = {}, uint32_t start = 0)
-{
-    const Bytes triangle =
-        join({bigs({1, 0, 0, 500, 700, 2, 0}), {1, 1, 1}, bigs({0, 500, -250, 0, 0, 700}), {0}});
-    const Bytes curves = join({bigs({1, 0, -100, 255, 200, 3, 0}),
-                               {0x09, 1, 0x26, 0x30},
-                               bigs({0, 200}),
-                               {55},
-                               bigs({0, -100}),
-                               {100}});
-    const Bytes both =
-        join({bigs({-1, 0, -100, 600, 720, 0x2a, 1}), {10, 20}, bigs({0x3000, 0x03, 2, 300, -40})});
-    const int first = int(triangle.size()), second = int(curves.size()), third = int(both.size());
-
-    Bytes head(54), hhea(36);
-    const auto put = [](Bytes& table, size_t at, int value)
-    {
-        table[at] = uint8_t(value >> 8);
-        table[at + 1] = uint8_t(value);
-    };
-    put(head, 18, 1000); // units of the em square
-    put(hhea, 4, 800);
-    put(hhea, 6, -200);
-    put(hhea, 34, 2); // glyphs with a width of their own
-    Tables tables = {
-        {"cmap", join({bigs({0, 1, 3, mapFormat == 12 ? 10 : 1}), big(12), makeCharacterMap(mapFormat)})},
-        {"glyf", join({triangle, curves, both})},
-        {"head", head},
-        {"hhea", hhea},
-        {"hmtx", bigs({500, 0, 550, 0, 0, 0})},
-        {"loca", bigs({0, 0, first / 2, (first + second) / 2, (first + second + third) / 2})},
-        {"maxp", join({big(0x00010000), bigs({4})})},
-    };
-    tables.insert(tables.end(), more.begin(), more.end());
-    Bytes directory = join({big(0x00010000), bigs({int(tables.size()), 0, 0, 0})});
-    Bytes data;
-    for (const auto& [tag, table] : tables)
-    {
-        const uint32_t offset = start + uint32_t(12 + 16 * tables.size() + data.size());
-        directory = join({directory, toBytes(tag), big(0), big(offset), big(uint32_t(table.size()))});
-        data = join({data, table});
-    }
-    return join({directory, data});
-}
-
-void addFonts(std::vector<Seed>& seeds)
-{
-    for (const int format : {0, 4, 6, 12})
-        seeds.push_back({"font", "map" + std::to_string(format), makeFont(format), "", true});
-    seeds.push_back({"font", "kern", makeFont(4, {{"kern", makeKerning()}}), "", true});
-    seeds.push_back({"font", "gpos", makeFont(4, {{"GPOS", makePositions()}}), "", true});
-    seeds.push_back({"font", "collection",
-                     join({toBytes("ttcf"), big(0x00010000), big(1), big(16), makeFont(12, {}, 16)}),
-                     "Error reading Font \"file.ttf\"", false});
-    seeds.push_back({"font", "none", {}, "Error reading Font \"file.ttf\"", false});
-}
-
 // --- PVR -----------------------------------------------------------------------------------------------------
 
 Bytes joinWords(const std::vector<uint32_t>& words, bool isBig)
@@ -676,6 +541,7 @@ std::vector<Seed> makeCostlyFiles()
     add("appearance", "spellings of itself", true, "Image failed to load texture",
         repeatSpelling("property a Texture2D ", "file.ap", 300));
     addCostlyScenes(files);
+    addCostlyFonts(files);
     return files;
 }
 

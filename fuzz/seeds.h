@@ -22,6 +22,8 @@ std::vector<Seed> makeSeeds();
 /// Larger files that demand as much as possible: pictures, programs, time, records.
 std::vector<Seed> makeCostlyFiles();
 void addCostlyScenes(std::vector<Seed>& files); ///< for makeCostlyFiles()
+void addCostlyFonts(std::vector<Seed>& files);  ///< likewise
+void addFonts(std::vector<Seed>& seeds);        ///< for makeSeeds()
 
 /// Files by name that seeds may refer to.
 std::map<std::string, Bytes> makeSoundFiles();

@@ -25,6 +25,7 @@ CALLS = re.compile(
 REASONS = {
     "engine/facility/src/fonts/fonttables.cpp", "engine/facility/src/fonts/fontbaker.cpp",
     "engine/facility/api/orv/detail/fonttables.h", "engine/extra/src/fontface.cpp", "engine/extra/src/fontoutlines.cpp",
+    "engine/extra/src/cfftable.cpp", "engine/extra/src/glyphprogram.cpp",
     "engine/facility/src/fonts/fontloader.cpp", "engine/facility/src/text/textstatement.cpp",
     "tools/view/options.cpp", "tools/convert/main.cpp", "tools/convert/guard.cpp", "tools/inspect/main.cpp",
 }

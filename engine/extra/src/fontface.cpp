@@ -1,5 +1,6 @@
 #include "orv/fontface.h"
 
+#include "cfftable.h"
 #include "charactermap.h"
 #include "fontoutlines.h"
 #include "kerning.h"
@@ -30,6 +31,22 @@ int64_t findStart(FontBytes file, unsigned index)
         return -1;
     const uint32_t start = file.u32(STARTS_AT + 4 * std::size_t(index));
     return file.isSound() && start <= INT_MAX ? int64_t(start) : -1;
+}
+
+/// @param outlines  filled in if they are in PostScript form.
+/// @return null, or what is wrong.
+const char* findOutlinesFault(detail::FontTables& tables, detail::CffTable& outlines)
+{
+    if (!tables.isPostScript())
+        return tables.findTablesFault();
+    detail::FontTables others = tables;
+    FontBytes table;
+    if (others.findTable(detail::makeFontTag("CFF2"), table))
+        return "its outlines are in the form CFF2, of variable fonts";
+    if (!tables.findTable(detail::makeFontTag("CFF "), table))
+        return detail::FontTables::MISSING_TABLE;
+    const char* const fault = tables.findHeadersFault();
+    return fault ? fault : outlines.read(table);
 }
 
 } // namespace
@@ -84,7 +101,8 @@ const char* FontFace::read()
     if (start < 0)
         return "the file has no such font";
     detail::FontTables tables(getData(), getSizeInBytes(), std::size_t(start));
-    if (const char* fault = tables.findTablesFault())
+    detail::CffTable postScript;
+    if (const char* fault = findOutlinesFault(tables, postScript))
         return fault;
 
     FontBytes head, hhea;
@@ -102,7 +120,8 @@ const char* FontFace::read()
         return "it has no character map that can be read";
     m_tables->kerning.read(tables);
     auto* const file = reinterpret_cast<unsigned char*>(m_file.getStart());
-    m_outlines = std::make_unique<detail::FontOutlines>(file, tables);
+    m_outlines = tables.isPostScript() ? std::make_unique<detail::FontOutlines>(tables, postScript)
+                                       : std::make_unique<detail::FontOutlines>(file, tables);
     return nullptr;
 }
 

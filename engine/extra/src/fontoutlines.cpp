@@ -1,5 +1,7 @@
 #include "fontoutlines.h"
 
+#include "glyphprogram.h"
+
 #include "orv/detail/fonttables.h"
 
 // As in the engine's own baker: all static, and assertions must not stop the program; their conditions on the file are
@@ -21,7 +23,8 @@ namespace orv::detail
 namespace
 {
 
-constexpr float MOST_REACH = 16384.0f; ///< pixels from the pen; the rasteriser keeps positions in 16 bits
+constexpr float MOST_REACH = 16384.0f; ///< pixels from the pen; the rasteriser keeps places in 16 bits
+constexpr float FLATNESS = 0.35f;      ///< pixels by which edges may miss the curve
 
 /// A rectangle in the font's own units.
 struct Box
@@ -35,51 +38,118 @@ struct Box
         x1 = std::max(x1, x);
         y1 = std::max(y1, y);
     }
-    float getSides() const { return float(x1 - x0) + float(y1 - y0); }
+    float getWidth() const { return float(x1 - x0); }
+    float getHeight() const { return float(y1 - y0); }
+    float getSides() const { return getWidth() + getHeight(); }
 };
 
-/// Checks the cost of drawing a shape. Sorting its edges is quadratic in the worst case. Each edge takes a step for
-/// each pixel along it or, outside the glyph's box, for each pixel of the rows that it crosses.
-/// @return null, or why it must not be drawn.
-const char* findCostFault(const stbtt_vertex* points, int count, const Box& box, float scale)
+/// What one glyph draws.
+struct Shape
 {
-    const float FLATNESS = 0.35f; // pixels by which the edges may miss the curve
+    Box box;
+    std::vector<stbtt_vertex> points; ///< none: a blank
+};
+
+/// Into how many edges a curve is cut, at most.
+float countEdges(const stbtt_vertex& from, const stbtt_vertex& to, float scale)
+{
+    const float ROUNDING = 1024.0f;
+    const auto measure = [scale](int x, int y) { return std::hypot(float(x), float(y)) * scale / FLATNESS; };
+    if (to.type == STBTT_vcurve)
+        return 1.0f + 2.0f * std::sqrt(0.25f * measure(from.x - 2 * to.cx + to.x, from.y - 2 * to.cy + to.y));
+    if (to.type != STBTT_vcubic)
+        return 1.0f;
+    // Each halving leaves a quarter of the bend. The rasteriser stops where the squares of the way along the control points
+    // and of the straight way are near enough. They differ by at most 6 squares of the bend, and by what is rounded off.
+    const float bend = std::max(measure(from.x - 2 * to.cx + to.cx1, from.y - 2 * to.cy + to.cy1),
+                                measure(to.cx - 2 * to.cx1 + to.x, to.cy - 2 * to.cy1 + to.y));
+    const float way = measure(to.cx - from.x, to.cy - from.y) + measure(to.cx1 - to.cx, to.cy1 - to.cy) +
+                      measure(to.x - to.cx1, to.y - to.cy1);
+    const float edges = std::max({1.0f, std::sqrt(std::sqrt(12.0f) * bend), way / ROUNDING});
+    return std::exp2(std::ceil(std::log2(edges)));
+}
+
+/// What a shape costs to draw: edges are sorted, which is quadratic at its worst, and each edge takes a step for each pixel
+/// along its way, or, where it leaves the glyph's box, for each pixel of the rows that it crosses.
+/// @return null, or why it must not be drawn.
+const char* findCostFault(const Shape& shape, float scale)
+{
     const float MOST_EDGES = 8192.0f;
     const float FEW_STEPS = 100000.0f; // allowed for any glyph
     const float STEPS_PER_PIXEL = 16.0f;
 
-    const float width = float(box.x1 - box.x0);
-    const float height = float(box.y1 - box.y0);
-    const float margin = std::max(width, height);
+    const Box& box = shape.box;
+    const float margin = std::max(box.getWidth(), box.getHeight());
     float edges = 0.0f;
     float steps = 0.0f;
-    for (int i = 0; i < count; ++i)
+    for (std::size_t i = 0; i < shape.points.size(); ++i)
     {
-        const stbtt_vertex& to = points[i];
-        const stbtt_vertex& from = points[std::max(0, i - 1)];
+        const stbtt_vertex& to = shape.points[i];
+        const stbtt_vertex& from = shape.points[i == 0 ? 0 : i - 1];
         Box reach = {to.x, to.y, to.x, to.y};
         reach.add(from.x, from.y);
-        edges += 1.0f;
-        if (to.type == STBTT_vcurve)
-        {
+        if (to.type == STBTT_vcurve || to.type == STBTT_vcubic)
             reach.add(to.cx, to.cy);
-            const auto dx = float(from.x + to.x - 2 * to.cx);
-            const auto dy = float(from.y + to.y - 2 * to.cy);
-            edges += 2.0f * std::sqrt(std::hypot(dx, dy) * 0.25f * scale / FLATNESS);
-        }
+        if (to.type == STBTT_vcubic)
+            reach.add(to.cx1, to.cy1);
+        edges += countEdges(from, to, scale);
         Box both = box;
         both.add(reach.x0, reach.y0);
         both.add(reach.x1, reach.y1);
         const bool isInside = both.getSides() <= box.getSides();
         if (both.getSides() > box.getSides() + 4.0f * margin)
             return "it reaches far out of its box";
-        const float rows = float(reach.y1 - reach.y0) * scale + 1.0f;
-        steps += isInside ? rows + float(reach.x1 - reach.x0) * scale : rows * (width * scale + 1.0f);
+        const float rows = reach.getHeight() * scale + 1.0f;
+        steps += isInside ? rows + reach.getWidth() * scale : rows * (box.getWidth() * scale + 1.0f);
     }
-    const float pixels = (width * scale + 1.0f) * (height * scale + 1.0f);
+    const float pixels = (box.getWidth() * scale + 1.0f) * (box.getHeight() * scale + 1.0f);
     return edges > MOST_EDGES || steps > FEW_STEPS + STEPS_PER_PIXEL * pixels
                ? "its outline is too complicated"
                : nullptr;
+}
+
+/// @return null, or why there is none.
+const char* readShape(const stbtt_fontinfo& info, FontTables tables, uint32_t glyph, Shape& shape)
+{
+    if (const char* fault = tables.findGlyphFault(glyph))
+        return fault;
+    Box& box = shape.box;
+    if (!stbtt_GetGlyphBox(&info, int(glyph), &box.x0, &box.y0, &box.x1, &box.y1))
+        return nullptr;
+    stbtt_vertex* points = nullptr;
+    const int count = stbtt_GetGlyphShape(&info, int(glyph), &points);
+    shape.points.assign(points, points + std::max(0, count));
+    stbtt_FreeShape(&info, points);
+    return nullptr;
+}
+
+/// The same of PostScript outlines; the box is that of all points.
+const char* readShape(const CffTable& outlines, FontTables tables, uint32_t glyph, Shape& shape)
+{
+    if (!tables.hasMetrics(glyph))
+        return "widths are missing";
+    std::vector<OutlineStep> steps;
+    if (const char* fault = GlyphProgram().run(outlines.getProgram(glyph), steps))
+        return fault;
+    shape.points.reserve(steps.size());
+    for (const OutlineStep& step : steps)
+    {
+        const bool isCurve = step.kind == OutlineStep::Kind::CURVE;
+        if (shape.points.empty())
+            shape.box = {step.x, step.y, step.x, step.y};
+        shape.box.add(step.x, step.y);
+        if (isCurve)
+        {
+            shape.box.add(step.x1, step.y1);
+            shape.box.add(step.x2, step.y2);
+        }
+        const int type = isCurve                                ? STBTT_vcubic
+                         : step.kind == OutlineStep::Kind::LINE ? STBTT_vline
+                                                                : STBTT_vmove;
+        shape.points.push_back(
+            {step.x, step.y, step.x1, step.y1, step.x2, step.y2, static_cast<unsigned char>(type), 0});
+    }
+    return nullptr;
 }
 
 } // namespace
@@ -87,7 +157,15 @@ const char* findCostFault(const stbtt_vertex* points, int count, const Box& box,
 struct FontOutlines::Rasteriser
 {
     FontTables tables;
-    stbtt_fontinfo info = {};
+    bool isPostScript = false;
+    stbtt_fontinfo info = {}; ///< of TrueType outlines alone: the rasteriser never sees tables of others
+    CffTable outlines = {};
+
+    const char* read(uint32_t glyph, Shape& shape) const
+    {
+        return isPostScript ? readShape(outlines, tables, glyph, shape)
+                            : readShape(info, tables, glyph, shape);
+    }
 };
 
 /// Fills the rasteriser's record directly: its own function reads further, unchecked tables.
@@ -111,48 +189,48 @@ FontOutlines::FontOutlines(unsigned char* file, const FontTables& tables)
     info.numGlyphs = int(tables.getGlyphCount());
 }
 
+FontOutlines::FontOutlines(const FontTables& tables, const CffTable& outlines)
+    : m_rasteriser(new Rasteriser{tables, true, {}, outlines})
+{
+}
+
 FontOutlines::~FontOutlines() = default;
 
 const char* FontOutlines::draw(uint32_t glyph, float scale, int mostSide, GlyphPicture& picture) const
 {
     picture.width = picture.height = 0;
-    FontTables tables = m_rasteriser->tables; // a copy: a fault in one glyph must not affect others
-    if (const char* fault = tables.findGlyphFault(glyph))
+    Shape shape;
+    if (const char* fault = m_rasteriser->read(glyph, shape))
         return fault;
-    const stbtt_fontinfo& info = m_rasteriser->info;
-    Box box;
-    if (!stbtt_GetGlyphBox(&info, int(glyph), &box.x0, &box.y0, &box.x1, &box.y1))
-        return nullptr; // a blank glyph
+    if (shape.points.empty())
+        return nullptr;
+    const Box& box = shape.box;
     Box reach = box;
     reach.add(0, 0);
-    if (reach.getSides() * scale > MOST_REACH || float(box.x1 - box.x0) * scale > float(mostSide) ||
-        float(box.y1 - box.y0) * scale > float(mostSide))
+    const auto most = float(mostSide);
+    if (reach.getSides() * scale > MOST_REACH || box.getWidth() * scale > most ||
+        box.getHeight() * scale > most)
         return "it is too large at this size";
-    Box pixels;
-    stbtt_GetGlyphBitmapBox(&info, int(glyph), scale, scale, &pixels.x0, &pixels.y0, &pixels.x1, &pixels.y1);
-    const int width = pixels.x1 - pixels.x0;
-    const int height = pixels.y1 - pixels.y0;
+    const int left = int(std::floor(float(box.x0) * scale));
+    const int top = int(std::floor(float(-box.y1) * scale));
+    const int width = int(std::ceil(float(box.x1) * scale)) - left;
+    const int height = int(std::ceil(float(-box.y0) * scale)) - top;
     if (width > mostSide || height > mostSide)
         return "it is too large at this size";
     if (width <= 0 || height <= 0)
         return nullptr;
+    if (const char* fault = findCostFault(shape, scale))
+        return fault;
 
-    stbtt_vertex* points = nullptr;
-    const int count = stbtt_GetGlyphShape(&info, int(glyph), &points);
-    const char* fault = findCostFault(points, count, box, scale);
-    if (!fault && count > 0)
-    {
-        picture.width = width;
-        picture.height = height;
-        picture.x = pixels.x0;
-        picture.y = pixels.y0;
-        picture.ink.assign(std::size_t(width) * std::size_t(height), 0);
-        stbtt__bitmap bitmap = {width, height, width, picture.ink.data()};
-        stbtt_Rasterize(&bitmap, 0.35f, points, count, scale, scale, 0.0f, 0.0f, pixels.x0, pixels.y0, 1,
-                        info.userdata);
-    }
-    stbtt_FreeShape(&info, points);
-    return fault;
+    picture.width = width;
+    picture.height = height;
+    picture.x = left;
+    picture.y = top;
+    picture.ink.assign(std::size_t(width) * std::size_t(height), 0);
+    stbtt__bitmap bitmap = {width, height, width, picture.ink.data()};
+    stbtt_Rasterize(&bitmap, FLATNESS, shape.points.data(), int(shape.points.size()), scale, scale, 0.0f,
+                    0.0f, left, top, 1, nullptr);
+    return nullptr;
 }
 
 } // namespace orv::detail

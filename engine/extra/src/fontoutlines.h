@@ -8,6 +8,7 @@
 namespace orv::detail
 {
 
+class CffTable;
 class FontTables;
 
 /// A glyph at one size, drawn.
@@ -26,9 +27,14 @@ struct GlyphPicture
 class FontOutlines
 {
 public:
+    /// TrueType outlines.
     /// @param file    borrowed as long as this object exists; not written to.
     /// @param tables  of this file, without a fault; copied.
     FontOutlines(unsigned char* file, const FontTables& tables);
+
+    /// PostScript outlines.
+    /// @param outlines  of the same file, which stays; copied.
+    FontOutlines(const FontTables& tables, const CffTable& outlines);
     ~FontOutlines();
 
     /// @param scale    pixels for a unit of the font.

@@ -23,8 +23,9 @@ class FontOutlines;
 
 /// All glyphs of one typeface of a font file: its characters, their advances and kerning.
 ///
-/// Supported are TrueType files (.ttf, .otf with TrueType outlines) and each font of a TrueType collection (.ttc).
-/// Outlines in PostScript form (CFF) are refused. Untrusted files are safe: nothing outside of the file is read, and
+/// Supported are fonts with TrueType outlines (.ttf), with PostScript outlines (.otf: CFF, version 1), and each font of a
+/// collection of either (.ttc). Variable fonts with PostScript outlines (CFF2) are refused; of other variable fonts the
+/// default shapes are used. Untrusted files are safe: nothing outside of the file is read, and
 /// damaged glyphs are not drawn. The file stays in memory as long as the face. A face has no GL objects and survives a
 /// lost context. Threads: no locks; immutable.
 class ORV_API FontFace : public Shared

@@ -68,6 +68,8 @@ private:
 class FontTables
 {
 public:
+    static constexpr const char* MISSING_TABLE = "a table is missing or reaches beyond the file";
+
     /// @param start  of its directory of tables: 0, but for a font of a collection.
     FontTables(const unsigned char* file, std::size_t size, std::size_t start = 0)
         : m_file(file, size)
@@ -79,6 +81,12 @@ public:
     /// @return null, or what is wrong, for a log.
     const char* findTablesFault();
 
+    /// The same for a font whose outlines are not TrueType: of what is read besides them.
+    const char* findHeadersFault();
+
+    /// @return false if a glyph's width and bearing are not within their table.
+    bool hasMetrics(uint32_t glyph);
+
     /// Whether the rasteriser may draw a glyph: metrics and outline lie within their tables, composite glyphs end, no
     /// coordinate leaves 16 bits, and there are at most 16384 points.
     /// @return null, or what is wrong, for a log.
@@ -87,6 +95,12 @@ public:
     /// The first entry of the name counts. @return false if it is missing or reaches beyond the file.
     bool findTable(uint32_t tag, FontBytes& table);
 
+    /// Whether the outlines are in PostScript form (CFF), by the font's first bytes.
+    bool isPostScript() const
+    {
+        FontBytes file = m_file;
+        return file.u32(m_start) == makeFontTag("OTTO");
+    }
     const FontBytes& getCharacterMaps() const { return m_cmap; }
     unsigned getGlyphCount() const { return m_glyphCount; }
 
@@ -105,7 +119,6 @@ private:
         const char* fault = nullptr;
     };
 
-    bool hasMetrics(uint32_t glyph);
     Outline measureGlyph(uint32_t glyph, int depth);
     Outline measureContours(FontBytes& glyph, unsigned contourCount);
     Outline measureComponents(FontBytes& glyph, int depth);
@@ -158,19 +171,26 @@ inline const char* FontTables::findTablesFault()
     if (version != 0x00010000 && version != makeFontTag("true"))
         return "it is no TrueType font";
 
+    if (!findTable(makeFontTag("loca"), m_locations) || !findTable(makeFontTag("glyf"), m_glyphs))
+        return MISSING_TABLE;
+    return findHeadersFault();
+}
+
+inline const char* FontTables::findHeadersFault()
+{
     FontBytes head, hhea, maxp;
     if (!findTable(makeFontTag("head"), head) || !findTable(makeFontTag("hhea"), hhea) ||
         !findTable(makeFontTag("maxp"), maxp) || !findTable(makeFontTag("hmtx"), m_metrics) ||
-        !findTable(makeFontTag("loca"), m_locations) || !findTable(makeFontTag("glyf"), m_glyphs) ||
         !findTable(makeFontTag("cmap"), m_cmap))
-        return "a table is missing or reaches beyond the file";
+        return MISSING_TABLE;
 
     const unsigned locationFormat = head.u16(50);
     m_hasWideLocations = locationFormat == 1;
     m_glyphCount = maxp.u16(4);
     m_metricCount = hhea.u16(34);
     const int lineHeight = hhea.s16(4) - hhea.s16(6);
-    if (!head.isSound() || !maxp.isSound() || !hhea.isSound() || locationFormat > 1)
+    const bool isLocationKnown = locationFormat <= 1 || !m_glyphs.start();
+    if (!head.isSound() || !maxp.isSound() || !hhea.isSound() || !isLocationKnown)
         return "a header is damaged";
     if (lineHeight <= 0)
         return "its lines have no height";
