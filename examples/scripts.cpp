@@ -71,6 +71,7 @@ constexpr Line SHAPED_LINES[] = {
     {"Devanagari", "नमस्ते, दुनिया"},
 };
 
+// [cookbook
 /// Shapes a line with one font of the cache. @param size  as TextLayout has it. @return glyphs from left to right.
 std::vector<TextLayout::Glyph> shape(const GlyphCache& glyphs, unsigned font, const char* utf8, float size)
 {
@@ -106,6 +107,7 @@ std::vector<TextLayout::Glyph> shape(const GlyphCache& glyphs, unsigned font, co
     hb_blob_destroy(file);
     return shaped;
 }
+// cookbook]
 
 /// @param codePoint  one of the line's, by which its font is chosen.
 void addShaped(TextLayout& text, const char* utf8, uint32_t codePoint, float y)

@@ -1,10 +1,10 @@
 #!/usr/bin/env python3
-"""Holds the snippets of docs/cookbook.md against the examples that they are cut from.
+"""Holds the snippets of docs/cookbook.md, and one of docs/text.md, against the examples that they are cut from.
 
 cookbook.py [--write | --draw FOLDER_OF_EXAMPLES OUT]
 
 A snippet is what stands between the lines "// [cookbook" and "// cookbook]" of an example, all such parts of it one
-after the other. In the page it follows the line that links the example. With --write the page is brought up to date.
+after the other. In the page it follows the line that links the example. With --write the pages are brought up to date.
 With --draw the examples draw their pictures again, which are compared with those of the page.
 
 Faults caught: a snippet that no longer is what the example does, an example or picture that the page leaves out, one that
@@ -19,7 +19,7 @@ import textwrap
 import zlib
 
 SOURCE = os.path.dirname(os.path.dirname(os.path.abspath(__file__)))
-PAGE = os.path.join(SOURCE, "docs/cookbook.md")
+PAGES = ("docs/cookbook.md", "docs/text.md")
 ENTRY = re.compile(r"(\[examples/([\w-]+)\.cpp\]\([^)]*\)[^\n]*\n\n```cpp\n)(.*?)(^```$)", flags=re.M | re.S)
 
 
@@ -80,22 +80,26 @@ def draw(examples, out):
 def main():
     if sys.argv[1:2] == ["--draw"]:
         return draw(sys.argv[2], sys.argv[3])
-    with open(PAGE, encoding="utf-8") as file:
-        page = file.read()
-    current = ENTRY.sub(lambda entry: entry.group(1) + cut(entry.group(2)) + entry.group(4), page)
+    failures, pages = [], []
+    for name in PAGES:
+        with open(os.path.join(SOURCE, name), encoding="utf-8") as file:
+            pages.append(file.read())
+        current = ENTRY.sub(lambda entry: entry.group(1) + cut(entry.group(2)) + entry.group(4), pages[-1])
+        if "--write" in sys.argv:
+            with open(os.path.join(SOURCE, name), "w", encoding="utf-8") as file:
+                file.write(current)
+        elif pages[-1] != current:
+            failures.append(f"{name} differs from the examples; tests/cookbook.py --write renews it")
     if "--write" in sys.argv:
-        with open(PAGE, "w", encoding="utf-8") as file:
-            file.write(current)
         return 0
-    failures = []
-    if page != current:
-        failures.append("docs/cookbook.md differs from the examples; tests/cookbook.py --write renews it")
+    page = pages[0]
     listed = {entry.group(2) for entry in ENTRY.finditer(page)}
     numbered = {name[:-4] for name in os.listdir(os.path.join(SOURCE, "examples")) if re.match(r"\d\d-.*\.cpp$", name)}
     failures += [f"docs/cookbook.md leaves out examples/{name}.cpp" for name in sorted(numbered - listed)]
     failures += [f"docs/cookbook.md shows no picture of {name}" for name in sorted(numbered)
                  if f"](pictures/cookbook/{name}.png)" not in page]
     failures += [f"examples/{name}.cpp has no part for the page" for name in sorted(listed) if not cut(name)]
+    failures += [f"{name} shows no example" for name, text in zip(PAGES, pages) if not ENTRY.search(text)]
     print("\n".join(failures) or f"{len(listed)} recipes are what the examples do.")
     return 1 if failures else 0
 

@@ -4,7 +4,8 @@
 snippets.py WORK COMPILER FLAG...
 
 A snippet that defines a function of a class stands by itself; any other is the body of a function, with the names of
-tests/outside/snippets.h. Whole programs and the snippets of docs/cookbook.md are built elsewhere.
+tests/outside/snippets.h. Whole programs are built elsewhere, as are snippets cut from an example, which the line in front
+of them links.
 
 Fault caught: a snippet of a call that has another name by now, or never was right.
 """
@@ -21,6 +22,7 @@ const auto model = loadGloFile(*pool, scene, "model.glo");
 AnimationController player(model->getAnimationGroup());
 Text text(*pool, font, Colour4f::WHITE);
 """
+FROM_EXAMPLE = re.compile(r"\[examples/[\w-]+\.cpp\]\([^)]*\)[^\n]*\n\n\Z")
 BLOCK = "const auto block = makeShared<RenderBlock>(renderer, scene, camera);\n"
 BLOCKS = {"docs/guide.md": "RenderBlock block(renderer, scene, camera);\n"}
 
@@ -29,12 +31,11 @@ def snippets():
     root = pathlib.Path(SOURCE)
     for path in sorted([*root.glob("*.md"), *root.glob("docs/**/*.md")]):
         page = path.relative_to(root).as_posix()
-        if page == "docs/cookbook.md":
-            continue
         with open(os.path.join(SOURCE, page), encoding="utf-8") as file:
             text = file.read()
         for match in re.finditer(r"^```cpp\n(.*?)^```$", text, flags=re.M | re.S):
-            if "#include" not in match.group(1):
+            is_cut = FROM_EXAMPLE.search(text, 0, match.start()) is not None
+            if "#include" not in match.group(1) and not is_cut:
                 yield page, text.count("\n", 0, match.start()) + 2, match.group(1)
 
 

@@ -3,6 +3,7 @@
 #include <GLES2/gl2.h>
 #include <cstdio>
 #include <orv/orv.h>
+#include <orv/textlayout.h>
 #include <vector>
 
 using namespace orv;
@@ -22,6 +23,9 @@ extern SharedPtr<VertexArray> positions;
 extern SharedPtr<Font> font;
 extern SharedPtr<Glo> glo;
 extern std::vector<SharedPtr<Solid>> solids;
+extern GlyphCache::Ptr glyphs;
+extern TextLayout::Ptr layout;
+std::vector<TextLayout::Glyph> shape(const GlyphCache& glyphs, unsigned font, const char* utf8, float size);
 extern Vector3f eye;
 extern Vector3f target;
 extern float width;
