@@ -8,7 +8,9 @@ a scene that a desktop takes for something else, a thumbnailer whose command lin
 """
 import configparser
 import os
+import pty
 import re
+import select
 import struct
 import subprocess
 import sys
@@ -57,11 +59,49 @@ def check_completions():
         offered = set(complete(tool, tool, "--"))
         expect("--help" in offered and offered <= list_options(tool), f"{tool} -- completes to {offered}")
     expect(complete("orv-convert", "orv-convert", "--keys", "sp") == ["sparse"], "--keys sp")
-    for shell, arguments, folder, name in (("zsh", ["-n"], "zsh/vendor-completions", "_orv-view"),
-                                           ("fish", ["-n"], "fish/vendor_completions.d", "orv-view.fish")):
-        path = os.path.join(SHARE, folder, name)
-        if os.path.exists("/usr/bin/" + shell):
-            expect(run(shell, *arguments, path)[0] == 0, f"{shell} does not take {path}")
+    check_zsh()
+    check_fish()
+
+
+def check_zsh():
+    """What zsh makes of a line with the tabulator in it: completion needs a terminal."""
+    lines = {"orv-convert --keys sp\t": "--keys sparse", "orv-view --thumb\t 9": "--thumbnail 9",
+             "orv-inspect --che\t x": "--check x"}
+    environment = dict(os.environ, TERM="dumb", PS1="", HOME="/nonexistent")
+    terminal, end = pty.openpty()
+    with subprocess.Popen(["zsh", "-f", "-i"], stdin=end, stdout=end, stderr=end, env=environment,
+                          start_new_session=True) as shell:
+        os.close(end)
+        said = [""]
+
+        def say(line, answer):
+            """@return whether the shell answered so, within a while."""
+            before = len(said[0])
+            os.write(terminal, (line + "\r").encode())
+            while answer not in said[0][before:] and select.select([terminal], [], [], 30)[0]:
+                said[0] += os.read(terminal, 65536).decode(errors="replace")
+            return answer in said[0][before:]
+
+        tools = "; ".join(f"{tool}() {{ print -r -- GOT $* }}" for tool in TOOLS)
+        say(f"fpath=({SHARE}/zsh/vendor-completions $fpath); autoload -U compinit; compinit -u -D; "
+            f"{tools}; print REA''DY", "READY")
+        for line, wanted in lines.items():
+            expect(say(line, "GOT " + wanted), f"zsh makes of {line!r}: {said[0][-300:]!r}")
+        shell.kill()
+    os.close(terminal)
+
+
+def check_fish():
+    with tempfile.TemporaryDirectory() as home:
+        environment = dict(os.environ, HOME=home, PATH=BIN + ":" + os.environ["PATH"])
+        for tool in TOOLS:
+            script = f"set -g fish_complete_path {SHARE}/fish/vendor_completions.d; complete -C '{tool} --'"
+            code, text = run("fish", "--no-config", "-c", script, env=environment)
+            offered = {line.split("\t")[0] for line in text.splitlines()}
+            expect(code == 0 and "--help" in offered and offered <= list_options(tool), f"fish, {tool}: {text}")
+        code, text = run("fish", "--no-config", "-c", f"set -g fish_complete_path {SHARE}/fish/vendor_completions.d; "
+                         "complete -C 'orv-convert --keys sp'", env=environment)
+        expect([line.split("\t")[0] for line in text.splitlines()] == ["sparse"], f"fish, --keys sp: {text}")
 
 
 def make_model(path):
