@@ -4,8 +4,10 @@
 
 int showpiece_main(int argc, char** argv);
 int textpage_main(int argc, char** argv);
+int scripts_main(int argc, char** argv);
 int motionblur_main(int argc, char** argv);
 int smoothmotion_main(int argc, char** argv);
+int shadows_main(int argc, char** argv);
 
 int main(int argc, char** argv)
 {
@@ -15,8 +17,10 @@ int main(int argc, char** argv)
         int (*run)(int, char**);
     } examples[] = {{"showpiece", showpiece_main},
                     {"textpage", textpage_main},
+                    {"scripts", scripts_main},
                     {"motionblur", motionblur_main},
-                    {"smoothmotion", smoothmotion_main}};
+                    {"smoothmotion", smoothmotion_main},
+                    {"shadows", shadows_main}};
     for (const auto& example : examples)
     {
         if (argc > 1 && !std::strcmp(argv[1], example.name))
