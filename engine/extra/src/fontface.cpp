@@ -45,7 +45,7 @@ const char* findOutlinesFault(detail::FontTables& tables, detail::CffTable& outl
         return "its outlines are in the form CFF2, of variable fonts";
     if (!tables.findTable(detail::makeFontTag("CFF "), table))
         return detail::FontTables::MISSING_TABLE;
-    const char* const fault = tables.findHeadersFault();
+    const char* const fault = tables.findHeadersFault<false>();
     return fault ? fault : outlines.read(table);
 }
 

@@ -81,7 +81,8 @@ public:
     /// @return null, or what is wrong, for a log.
     const char* findTablesFault();
 
-    /// The same for a font whose outlines are not TrueType: of what is read besides them.
+    /// The same for a font of a known kind; unless it is TrueType, without the tables of its outlines.
+    template <bool IS_TRUE_TYPE>
     const char* findHeadersFault();
 
     /// @return false if a glyph's width and bearing are not within their table.
@@ -171,16 +172,17 @@ inline const char* FontTables::findTablesFault()
     if (version != 0x00010000 && version != makeFontTag("true"))
         return "it is no TrueType font";
 
-    if (!findTable(makeFontTag("loca"), m_locations) || !findTable(makeFontTag("glyf"), m_glyphs))
-        return MISSING_TABLE;
-    return findHeadersFault();
+    return findHeadersFault<true>();
 }
 
-inline const char* FontTables::findHeadersFault()
+template <bool IS_TRUE_TYPE>
+const char* FontTables::findHeadersFault()
 {
     FontBytes head, hhea, maxp;
     if (!findTable(makeFontTag("head"), head) || !findTable(makeFontTag("hhea"), hhea) ||
         !findTable(makeFontTag("maxp"), maxp) || !findTable(makeFontTag("hmtx"), m_metrics) ||
+        (IS_TRUE_TYPE &&
+         (!findTable(makeFontTag("loca"), m_locations) || !findTable(makeFontTag("glyf"), m_glyphs))) ||
         !findTable(makeFontTag("cmap"), m_cmap))
         return MISSING_TABLE;
 
@@ -189,8 +191,7 @@ inline const char* FontTables::findHeadersFault()
     m_glyphCount = maxp.u16(4);
     m_metricCount = hhea.u16(34);
     const int lineHeight = hhea.s16(4) - hhea.s16(6);
-    const bool isLocationKnown = locationFormat <= 1 || !m_glyphs.start();
-    if (!head.isSound() || !maxp.isSound() || !hhea.isSound() || !isLocationKnown)
+    if (!head.isSound() || !maxp.isSound() || !hhea.isSound() || (IS_TRUE_TYPE && locationFormat > 1))
         return "a header is damaged";
     if (lineHeight <= 0)
         return "its lines have no height";
