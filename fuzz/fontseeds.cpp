@@ -143,7 +143,9 @@ struct PostScript
     std::vector<Bytes> programs; ///< of glyphs
     std::vector<Bytes> global;   ///< subroutines; the first has the number -107
     std::vector<Bytes> local;
-    Bytes selection; ///< which of two parts of the font a glyph belongs to; none: it is in one piece
+    Bytes
+        selection; ///< which of two parts of the font, of which the second has the local subroutines, a glyph belongs
+                   ///< to; none: the font is in one piece
 };
 
 /// The table "CFF ".
@@ -172,7 +174,8 @@ Bytes makeOutlines(const PostScript& font)
                     makeEntry({selectionAt}, {12, 37}), makeEntry({partsAt}, {12, 36})});
     else
         top = join({top, ownEntry});
-    const Bytes parts = isInParts ? makeIndex({ownEntry, ownEntry}) : Bytes();
+    const Bytes parts =
+        isInParts ? makeIndex({makeEntry({ownEntries.size(), ownAt}, {18}), ownEntry}) : Bytes();
     return join({header, name, makeIndex({top}), behindTop, programs, own, font.selection, parts});
 }
 
@@ -261,9 +264,9 @@ void addFonts(std::vector<Seed>& seeds)
         seeds.push_back({"font", name, makePostScriptFont(drawing), OTHER_KIND, true});
     };
     add("postscript");
-    drawing.selection = {0, 0, 0, 1, 0}; // a part for each glyph
+    drawing.selection = {0, 0, 0, 0, 1}; // a part for each glyph
     add("postscriptparts");
-    drawing.selection = join({{3}, bigs({2, 0}), {0}, bigs({2}), {1}, bigs({4})});
+    drawing.selection = join({{3}, bigs({2, 0}), {0}, bigs({3}), {1}, bigs({4})});
     add("postscriptranges");
 }
 
