@@ -216,14 +216,16 @@ PostScript makeDrawing()
                                numbers({1, 2, 3, 4, 5, 6, 7, 8}, {25})});
     const Bytes flexes = join({numbers({9, 8, 7, 6, 5, 4, 3}, {12, 34}),
                                numbers({9, 8, 7, 6, 5, 4, 3, 2, 1, 2, 3, 4, 50}, {12, 35}),
-                               numbers({9, 8, 7, 6, 5, 4, 3, 2, 1}, {12, 36}),
+                               numbers({90, 80, 70, 60, 50, 40, 30, 80, 10}, {12, 36}),
                                numbers({9, 8, 7, 6, 5, 4, 3, 2, 1, 2, 3}, {12, 37})});
     const Bytes hints = join({numbers({0, 20}, {18}), numbers({0, 20, 30, 20}, {19, 0xE0})});
     const Bytes fraction = {255, 0, 100, 128, 0, 22};
-    font.programs = {{END},
-                     join({hints, move, lines, {END}}),
-                     join({move, {FIRST_SUBROUTINE, CALL_GLOBAL, END}}),
-                     join({numbers({10}, {4}), fraction, {FIRST_SUBROUTINE, CALL_LOCAL}, flexes})};
+    font.programs = {
+        {END},
+        join({hints, move, lines, {END}}),
+        join({move, {FIRST_SUBROUTINE, CALL_GLOBAL, END}}),
+        join({numbers({10}, {4}), fraction, {FIRST_SUBROUTINE, CALL_LOCAL}, flexes}),
+        join({move, numbers({0, 300, 400, 150, -400, 150}, {8, END})})}; // reaches beyond its ends
     font.global = {join({curves, {RETURN}})};
     font.local = {join({{FIRST_SUBROUTINE, CALL_GLOBAL}, lines})};
     return font;
@@ -264,9 +266,9 @@ void addFonts(std::vector<Seed>& seeds)
         seeds.push_back({"font", name, makePostScriptFont(drawing), OTHER_KIND, true});
     };
     add("postscript");
-    drawing.selection = {0, 0, 0, 0, 1}; // a part for each glyph
+    drawing.selection = {0, 0, 0, 0, 1, 1}; // a part for each glyph
     add("postscriptparts");
-    drawing.selection = join({{3}, bigs({2, 0}), {0}, bigs({3}), {1}, bigs({4})});
+    drawing.selection = join({{3}, bigs({2, 0}), {0}, bigs({3}), {1}, bigs({5})});
     add("postscriptranges");
 }
 
