@@ -1,13 +1,13 @@
 #!/usr/bin/env python3
-"""Tells doxygen how comments of the headers are meant; the target docs reads every header through this.
+"""Adapts the headers' comments to doxygen; the target docs reads every header through this filter.
 
-docfilter.py HEADER > what doxygen reads
+docfilter.py HEADER > filtered header
 
-In the headers a comment stands for the declaration below it and for those that follow up to the next blank line: what is
-said of getNear() holds for setNear(). Doxygen takes it for the first alone, so its first sentences are repeated before the
-others, on the same line, which keeps the numbers of lines in warnings. What stands behind `///<` is the line's own, and
-that of those that follow without one. Operators without a comment do what they do for built-in types. Declarations of
-friends are no part of the interface and are left out.
+In the headers a comment applies to the declaration below it and to those that follow up to the next blank line: that of
+getNear() also applies to setNear(). Doxygen applies it only to the first, so its first sentences are repeated before the
+others, on the same line, which keeps line numbers in warnings. A comment after `///<` applies to its line and to the
+following lines without one. Operators without a comment do what they do for built-in types. Friend declarations are not
+part of the interface and are left out.
 """
 import re
 import sys

@@ -1,14 +1,13 @@
 #!/usr/bin/env python3
-"""Holds the snippets of docs/cookbook.md, and one of docs/text.md, against the examples that they are cut from.
+"""Compares the snippets of docs/cookbook.md, and one of docs/text.md, with the examples that they are cut from.
 
 cookbook.py [--write | --draw FOLDER_OF_EXAMPLES OUT]
 
-A snippet is what stands between the lines "// [cookbook" and "// cookbook]" of an example, all such parts of it one
-after the other. In the page it follows the line that links the example. With --write the pages are brought up to date.
-With --draw the examples draw their pictures again, which are compared with those of the page.
+A snippet is the text between the lines "// [cookbook" and "// cookbook]" of an example, all such parts joined. In the
+page it follows the line that links the example. --write updates the pages. --draw has the examples draw their pictures
+and compares them with those of the page.
 
-Faults caught: a snippet that no longer is what the example does, an example or picture that the page leaves out, one that
-draws something else by now.
+Faults caught: a snippet or picture that differs from the example, an example that the page leaves out.
 """
 import os
 import re
@@ -53,7 +52,7 @@ def read_png(path):
 
 
 def compare(name, examples, out):
-    """Draws an example. @return what is wrong, or nothing."""
+    """Draws an example. @return the fault, or nothing."""
     path = os.path.join(out, name + ".png")
     done = subprocess.run([os.path.join(examples, name), "--out", path], stdout=subprocess.PIPE, check=False,
                           stderr=subprocess.STDOUT, timeout=100)

@@ -1,10 +1,10 @@
 #!/usr/bin/env python3
-"""Uses the installed tools as a desktop and a shell do.
+"""Uses the installed tools like a desktop and a shell.
 
 installedtools.py PREFIX
 
-Faults caught: a manual page that readers find fault with or that lacks an option, a completion that completes nothing,
-a scene that a desktop takes for something else, a thumbnailer whose command line the viewer refuses.
+Faults caught: a manual page that is invalid or lacks an option, a completion without effect, a scene with a wrong file
+type, a thumbnailer whose command line the viewer refuses.
 """
 import configparser
 import os
@@ -48,7 +48,7 @@ def check_manual(tool):
 
 
 def complete(tool, *words):
-    """What bash offers for the last of the words."""
+    """Bash's completions of the last word."""
     script = (f"source {SHARE}/bash-completion/completions/{tool}; COMP_WORDS=({' '.join(map(repr, words))}); "
               f"COMP_CWORD={len(words) - 1}; compopt() {{ :; }}; _{tool.replace('-', '_')}; echo \"${{COMPREPLY[@]}}\"")
     return run("bash", "-c", script)[1].split()

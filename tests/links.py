@@ -1,5 +1,5 @@
 #!/usr/bin/env python3
-"""Holds the links of Markdown pages against what lies there: files, and headings within pages.
+"""Checks the links of Markdown pages to files and headings.
 
 links.py FOLDER...
 
@@ -29,7 +29,7 @@ def anchors(path):
 
 
 def check(page):
-    """The links of a page that lead nowhere."""
+    """The broken links of a page."""
     with open(page, encoding="utf-8") as file:
         text = strip_code(file.read())
     for link in re.findall(r"\]\(([^)\s]+)\)", text):

@@ -1,13 +1,14 @@
 #!/usr/bin/env python3
-"""Holds docs/troubleshooting.md against the messages of the engine and the tools.
+"""Compares docs/troubleshooting.md with the messages of the engine and the tools.
 
 messages.py [--list]
 
-Messages are taken out of the sources: the texts of log calls, and of the functions and variables by which readers and
-tools say why they fail. What stands between the values of a message has to be in the page, in a code span, with the
-values as an ellipsis: "Cannot open %s" is `Cannot open …`. Single words, which are values themselves, are left out.
+Messages are extracted from the sources: the texts of log calls, and of functions and variables that hold reasons of
+failures. The texts between the values of a message have to be in the page, in a code span, with an ellipsis for each
+value: "Cannot open %s" is `Cannot open …`. Single words, which are values themselves, are left out.
 
-Faults caught: a message that the page does not explain, and an explanation of one that no longer exists. With --list all of them are printed.
+Faults caught: a message that the page does not explain, and an explanation of one that no longer exists. With --list
+all of them are printed.
 """
 import os
 import pathlib
@@ -16,7 +17,7 @@ import sys
 
 SOURCE = os.path.dirname(os.path.dirname(os.path.abspath(__file__)))
 LITERAL = r'"(?:[^"\\\n]|\\.)*"'
-# What says an error: log calls, functions that return after saying it, exceptions of the readers, variables of that name.
+# Sources of messages: log calls, functions that log and return, exceptions of the readers, variables for reasons.
 CALLS = re.compile(
     r"(?:\bORV_(?:LOG|GLO)_(?:ERROR|WARN)|\b(?:pssL|l)og(?:Error|Warn)|\b(?:fail|failAt|refuse|refuseFile|damaged|Fault|"
     r"ValidationError|failWithErrno|findConflict)|\bfprintf)\s*\(|\b(?:error|reason|m_error|fault|problem|failure)(?:->|\.)?\w*\s*\+?=(?!=)|"

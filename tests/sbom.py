@@ -1,11 +1,11 @@
 #!/usr/bin/env python3
-"""Holds the bill of materials against the binaries.
+"""Compares the bill of materials with the binaries.
 
 sbom.py SPDX.json READELF NAME=BINARY...
 
-Faults caught: a library that a program is linked with and the list has not, or the other way round; an entry without what
-SPDX 2.3 asks for; a relationship to nothing. Of the run-time libraries of the compiler, libm and libgcc_s count as parts
-of libc and libstdc++.
+Faults caught: a library that a program is linked with and the list has not, or the other way round; an entry without
+fields that SPDX 2.3 requires; a relationship to a missing entry. Of the run-time libraries of the compiler, libm and
+libgcc_s count as parts of libc and libstdc++.
 """
 import json
 import re

@@ -3,10 +3,10 @@
 
 scenes.py PREFIX WORK GENERATOR
 
-Faults caught: a scene that is not made again when a file that its model names has changed, or is made again for nothing; a
-folder of which a broken model stops the rest, is forgotten or is taken for new each time; models that no shard converts,
-or two; a converter that was interrupted and believes to be done; a picture that comes later and is not looked for again;
-scenes of two models in one place, or beside what a link leads to.
+Faults caught: a scene that is not made again when a file of its model has changed, or is made again without need; a
+broken model that stops the others of a folder, is forgotten or is converted each time; models that no shard converts, or
+two do; an interrupted conversion that counts as done; a missing picture that is not looked for again; two models with
+one scene, or scenes beside the target of a link.
 """
 import json
 import os

@@ -1,5 +1,5 @@
 #!/usr/bin/env python3
-"""Compiles the snippets of the pages, as far as a compiler reads without making code.
+"""Compiles the snippets of the pages, without generating code.
 
 snippets.py WORK COMPILER FLAG...
 
@@ -7,7 +7,7 @@ A snippet that defines a function of a class stands by itself; any other is the 
 tests/outside/snippets.h. Whole programs are built elsewhere, as are snippets cut from an example, which the line in front
 of them links.
 
-Fault caught: a snippet of a call that has another name by now, or never was right.
+Fault caught: a snippet that does not compile, because an interface was renamed or the snippet was never right.
 """
 import os
 import pathlib
@@ -16,7 +16,7 @@ import subprocess
 import sys
 
 SOURCE = os.path.dirname(os.path.dirname(os.path.abspath(__file__)))
-# Names that stand for what earlier snippets have made; a snippet may make them itself, in its own braces.
+# Names of objects from earlier snippets; a snippet may define them itself, in its own braces.
 BEFORE = """RenderBlock inset(renderer, scene, mapCamera);
 const auto model = loadGloFile(*pool, scene, "model.glo");
 AnimationController player(model->getAnimationGroup());

@@ -1,4 +1,4 @@
-// A planar mirror: hands the clip position on, by which the fragment stage finds its place in the mirror image.
+// A planar mirror: passes on the clip position, with which the fragment stage looks up the mirror image.
 
 attribute vec3 a_position;
 

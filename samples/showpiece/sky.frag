@@ -1,4 +1,4 @@
-// The sky: looks its cube map up in the direction of the point.
+// The sky: looks up its cube map in the direction of the point.
 
 precision mediump float;
 

@@ -1,4 +1,4 @@
-// The sky: a sphere about the scene whose every point shows what the sky looks like in its direction.
+// The sky: a sphere around the scene that shows the cube map in each direction.
 
 attribute vec3 a_position;
 

@@ -1,11 +1,11 @@
 #!/usr/bin/env python3
-"""Makes a shell script of a page: what somebody does who follows it word for word.
+"""Makes a shell script of the commands and files of a page.
 
 pagescript.py PAGE.md > script
 
 In the page, a fenced block without a language holds commands. One with a language is a file if the paragraph before it
 has "Save this as `NAME`" or "is the whole `NAME`"; it is written where the commands have led. Other blocks are not run.
-After every command that writes a .ppm, the middle of that picture is looked at: it may not be black.
+After every command that writes a .ppm, the middle of that picture is checked: it must not be black.
 """
 import re
 import sys

@@ -126,7 +126,8 @@ bool canConfine()
 
 } // namespace
 
-// Fault caught: a system without confinement, as containers are, where nothing can be converted or nobody is told.
+// Fault caught: a system without confinement, such as a container, where nothing can be converted or no message says
+// so.
 TEST(Guard, saysWhereTheSystemRefuses)
 {
     if (!convert::CAN_CONFINE)

@@ -1,4 +1,4 @@
-"""What the checks of the page need: a web server, a real browser, and pictures to compare."""
+"""Helpers for the checks of the page: a web server, a real browser, and comparing pictures."""
 import base64
 import functools
 import http.server
@@ -12,7 +12,7 @@ from selenium.webdriver.chrome.service import Service
 
 
 class Server:
-    """Serves a folder on a free local port, as a thread, and remembers what was asked for."""
+    """Serves a folder on a free local port, in a thread, and records the requests."""
 
     def __init__(self, folder):
         answers = self.answers = []
@@ -69,7 +69,7 @@ class Browser:
         return outcome["answer"]
 
     def open(self, address):
-        """Opens a page of the viewer and waits until what its address names is shown."""
+        """Opens the viewer's page and waits until the scene of its address is shown."""
         self.driver.get(address)
         self.run("await orvPage.ready")
 
@@ -79,7 +79,7 @@ class Browser:
         return decode(base64.b64decode(data.split(",")[1]))
 
     def severe(self):
-        """What the console has complained of since it was asked last."""
+        """The console's errors since the last call."""
         return [entry["message"] for entry in self.driver.get_log("browser") if entry["level"] == "SEVERE"]
 
 

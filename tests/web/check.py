@@ -39,7 +39,7 @@ MOMENTS = 8  # of a clip: those that the view is fitted to
 
 
 class Bench:
-    """Everything that the checks share."""
+    """Shared by the checks."""
 
     def __init__(self, build, web, models):
         self.build, self.web, self.models = build, web, models
@@ -88,7 +88,7 @@ class Bench:
 
 
 def run_here(words, folder=None):
-    """A program for this machine, whose output matters only where it fails."""
+    """Runs a program for this machine; its output is only shown if it fails."""
     done = subprocess.run(words, cwd=folder, capture_output=True, text=True)
     expect(done.returncode == 0, f"{words[0].name}: {done.stdout}{done.stderr}")
 
@@ -99,7 +99,7 @@ def expect(condition, message):
 
 
 def hold(name, native, drawn, tolerance=TOLERANCE, share=ALLOWED_SHARE):
-    """@return what to say of two pictures that are near enough."""
+    """@return a text for two pictures that are close enough."""
     found, most = compare(native, drawn, tolerance)
     if found > share:
         Image.fromarray(numpy.hstack([native, drawn, abs(native - drawn)]).astype("uint8")).save(f"{name}-differs.png")
@@ -171,7 +171,7 @@ def examples(bench):
 
 
 def hands(bench):
-    """Fault caught: a drag, a wheel, a key or a finger that does nothing, or something else."""
+    """Fault caught: a drag, a wheel, a key or a finger without effect or with a wrong one."""
     browser = bench.browser
     driver = browser.driver
     browser.resize(WIDTH, HEIGHT)
@@ -324,7 +324,7 @@ def growth(bench):
 
 
 def damage(bench):
-    """Fault caught: a file that is no scene, or a bad one, and a page that stops, or says nothing."""
+    """Fault caught: a page that stops or shows no message for a damaged scene or another file."""
     browser = bench.browser
     browser.resize(WIDTH, HEIGHT)
     bench.show("page")
@@ -370,7 +370,7 @@ def damage(bench):
 
 
 def pages(bench):
-    """Fault caught: a page of a model with an odd name that shows nothing; half a page, or none, without a word."""
+    """Fault caught: an empty page for a model with an odd name; an incomplete or missing page without a message."""
     convert = bench.build / "tools/convert/orv-convert"
     folder = bench.native / "pages"
     folder.mkdir()
@@ -435,7 +435,7 @@ def files(bench):
 
 
 def requests(bench):
-    """Fault caught: a page that asks another server for something, or its own for what is not there."""
+    """Fault caught: a page that sends requests to another server, or requests missing files."""
     bench.server.answers.clear()
     bench.browser.severe()
     for page in MODELS:

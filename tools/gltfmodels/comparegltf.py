@@ -1,14 +1,14 @@
 #!/usr/bin/python3
-"""Converts glTF files and holds every triangle, line and point of the scenes against what three.js reads.
+"""Converts glTF files and compares every triangle, line and point of the scenes with three.js.
 
     comparegltf.py CONVERTER NODE_MODULES FOLDER PAGE.md [OTHER_CONVERTER]
 
-At rest and at four moments of each clip (samples of the conversion), each triangle of one reader has to have one of the
+At rest and at four times of each clip (samples of the conversion), each triangle of one reader has to have one of the
 other within 1/5,000 of the model's size, its corners in the same order round, and there have to be as many. Nothing but
 the file is shared between the two: scene files are read and posed by posedglo.py, without the engine.
 
-The outcome becomes the part of PAGE.md below its marker; how often there was which is printed, also of another converter,
-such as an older one. Exit code 1 if any file came out wrong.
+The results are written to PAGE.md below its marker; their counts are printed, also for another converter, such as an
+older one. Exit code 1 if any file came out wrong.
 """
 import concurrent.futures
 import json
@@ -105,7 +105,7 @@ def areas(faces):
 
 
 def deviation(faces, others, counted):
-    """How far the face furthest from all others is from them, corner by corner in any turn."""
+    """The largest distance of a face from its nearest counterpart, corner by corner in any rotation."""
     corners = faces.shape[1]
     if not counted.any():
         return 0.0
@@ -117,7 +117,7 @@ def deviation(faces, others, counted):
 
 
 def compare(ours, theirs):
-    """The largest deviation as a share of the size, and what is wrong, "" for nothing."""
+    """The largest deviation relative to the size, and the fault, "" for none."""
     everything = np.concatenate([faces.reshape(-1, 3) for faces in theirs.values()] or [np.zeros((0, 3))])
     size = np.linalg.norm(np.ptp(everything, axis=0)) if len(everything) else 1.0
     largest = 0.0
@@ -153,7 +153,7 @@ def find_ranges(clips, report):
 
 
 def add_options(converter):
-    """A converter with what it needs to find pictures of libassimp's test models; old ones went everywhere."""
+    """A converter with its options to find pictures of libassimp's test models."""
     known = subprocess.run([converter, "--help"], capture_output=True, text=True).stdout
     return [converter] + (["--allow", "/usr/share/assimp"] if "--allow" in known else [])
 

@@ -151,7 +151,7 @@ function write(gltf, out) {
   fs.writeFileSync(out, Buffer.concat([head, text, ...floats]));
 }
 
-process.on('unhandledRejection', () => {}); // of a part that nobody waits for any more, once another has failed
+process.on('unhandledRejection', () => {}); // of parts that are no longer awaited after another one has failed
 for await (const line of readline.createInterface({ input: process.stdin })) {
   const { model, out } = JSON.parse(line);
   let fault = '';

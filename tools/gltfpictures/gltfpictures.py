@@ -1,10 +1,10 @@
 #!/usr/bin/python3
-"""Draws glTF models that differ in kind beside three.js in Chromium, and holds outlines and colours against each other.
+"""Draws glTF models of different kinds beside three.js in Chromium, and compares outlines and colours.
 
     gltfpictures.py CONVERTER VIEWER NODE_MODULES CHROMIUM FOLDER DOCS [NAME...]
 
 FOLDER is what makevariants.py made; MADE/ is added to it. A camera is put into a copy of each file, and two lamps beside
-it, so that both see the same by the file alone. Writes sheets of pairs to DOCS/pictures/gltf (orv left, three.js right)
+it, so that both use the same view and light. Writes sheets of pairs to DOCS/pictures/gltf (orv left, three.js right)
 and DOCS/gltfpictures.md. With names, only those are drawn, and their pairs go to FOLDER/pairs. Exit code 1 if a picture
 is missing or an outline overlaps by less than is allowed.
 
@@ -197,7 +197,7 @@ class Painter:
             return json.load(file)
 
     def draw(self, model):
-        """Ours, as PNG files; what three.js has to do for the other side."""
+        """Draws our side as PNG files. @return the work for three.js."""
         source = os.path.join(self.folder, model.file or "MADE/%s/model.gltf" % model.name)
         home = os.path.join(self.scratch, model.name)
         if source.endswith(".glb"):

@@ -12,7 +12,7 @@ SHAPES = {1: "SCALAR", 2: "VEC2", 3: "VEC3", 4: "VEC4", 16: "MAT4"}
 
 
 class Gltf:
-    """A file in the making; what is added is known by its number."""
+    """A file under construction; parts are identified by their index."""
 
     def __init__(self):
         self.root = {"asset": {"version": "2.0"}, "nodes": [], "meshes": [], "materials": [], "accessors": []}
@@ -87,7 +87,7 @@ class Gltf:
 
 
 def grid(columns, rows, place, normal=None):
-    """Faces over a grid, whose corners place(u, v) tells."""
+    """Faces over a grid with corners at place(u, v)."""
     at = [(u / columns, v / rows) for v in range(rows + 1) for u in range(columns + 1)]
     faces = []
     for v in range(rows):
@@ -121,7 +121,7 @@ def tube(rings, sides=16, radius=0.3):
 
 
 def draw_letters(folder, name="letters.png", size=128):
-    """A picture of which every corner differs, so that any turn of it shows."""
+    """A picture with four different corners, so that every rotation is visible."""
     image = Image.new("RGB", (size, size), (200, 180, 140))
     pen = ImageDraw.Draw(image)
     half = size // 2
@@ -151,7 +151,7 @@ def draw_bumps(folder):
 
 
 def make_coloured(folder):
-    """Colours of vertices as bytes with alpha, as shares of 16 bits without, unlit, and those that no material wants."""
+    """Vertex colours as bytes with alpha, as 16 bits without, unlit, and unused ones."""
     gltf = Gltf()
     shape = ball()
     rainbow = np.array(shape["NORMAL"]) * 0.5 + 0.5
@@ -205,7 +205,7 @@ def make_blended(folder):
 
 
 def make_backs(folder):
-    """Sheets seen from behind: two-sided, and one-sided, of which nothing is seen."""
+    """Sheets seen from behind: two-sided, and one-sided, which are invisible."""
     gltf = Gltf()
     for i, sides in enumerate((True, False, True)):
         shape = grid(16, 16, lambda u, v: (2 * u - 1, 1 - 2 * v, 0.4 * math.sin(6 * u)),
@@ -257,7 +257,7 @@ def bind(gltf, rings, joints, parent=None, step=1.0):
 
 
 def attach(gltf, shape, step):
-    """Each vertex goes with the joint below it and the one above."""
+    """Each vertex follows the joint below it and the one above."""
     heights = np.array(shape["POSITION"])[:, 1] / step
     low = np.floor(heights).astype(int)
     share = heights - low
@@ -340,7 +340,7 @@ def make_second_uv(folder):
 
 
 def make_wraps(folder):
-    """Pictures that end, repeat and turn back at their edges, coarse ones, and one that is moved."""
+    """Pictures that are clamped, repeated and mirrored, unfiltered ones, and one with a transform."""
     gltf = Gltf()
     name = draw_letters(folder, size=64)
     gltf.use("KHR_texture_transform")
@@ -415,7 +415,7 @@ def make_own_camera(folder):
 
 
 def make_plastics(folder):
-    """Roughness from left to right; below, what mirrors less or in a colour."""
+    """Roughness from left to right; below, weaker or coloured specular reflection."""
     gltf = Gltf()
     gltf.use("KHR_materials_specular", "KHR_materials_ior")
     shape = ball()
@@ -441,7 +441,7 @@ def make_metals(folder):
 
 
 def make_bare(folder):
-    """Without indices and normals, which makes facets; with a stride, and without bytes at all."""
+    """Without indices and normals, so faceted; with a stride; without a buffer view."""
     gltf = Gltf()
     shape = ball(12, 8)
     corners = np.array(shape["POSITION"], "f4")[np.ravel(shape["faces"])]

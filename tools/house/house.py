@@ -1,10 +1,10 @@
 #!/usr/bin/python3
-"""Holds the includes of all sources against the rooms that docs/house.md lists, and draws the rooms into that page.
+"""Checks the includes of all sources against the rooms in docs/house.md, and draws the rooms into that page.
 
     house.py [--check]
 
-A row of the page's first table names a room, a row of the others a floor of a large room; the last column says what it
-stands on. A room may include what it stands on and what those stand on. Without --check the drawing on the page is
+A row of the page's first table names a room, a row of the others a floor of a large room; the last column lists the
+rooms that it stands on. A room may include these and the rooms below them. Without --check the drawing on the page is
 made again; with it, a drawing that differs is an error, as is an include that the tables do not allow, a room that they
 do not list, an include of another room's src folder, and a folder of more than 25 sources. Exit code 1 then.
 """
@@ -36,7 +36,7 @@ def read_table(page, heading):
 
 
 def find_below(rooms, name):
-    """Everything that a room stands on, whatever is between."""
+    """All rooms below a room."""
     below = set()
     for lower in rooms[name].stands_on:
         if lower not in rooms:
@@ -88,7 +88,7 @@ class House:
 
 
 def draw(title, arrows):
-    """Mermaid's text for arrows between names; what follows from two others is left out."""
+    """Mermaid's text for arrows between names; arrows that follow from others are left out."""
     def reaches(start, end, without):
         return any((middle, end) != without and (middle == end or reaches(middle, end, without))
                    for first, middle in arrows if first == start and (first, middle) != without)

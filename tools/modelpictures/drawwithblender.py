@@ -1,4 +1,4 @@
-"""Draws a model with Blender's own reader and its Cycles renderer, seen as orv-view sees it.
+"""Draws a model with Blender's own reader and its Cycles renderer, from orv-view's viewpoint.
 
     blender --background --factory-startup --python drawwithblender.py -- MODEL PICTURE.png WIDTH HEIGHT TIME UP
 
@@ -44,7 +44,7 @@ def read(model):
 
 
 def make_visible():
-    """Blender takes the opacity of 0 that some programs write into FBX files for none at its word."""
+    """Makes materials visible whose FBX file has an opacity of 0, which some programs write for opaque."""
     for material in bpy.data.materials:
         for node in material.node_tree.nodes if material.use_nodes else ():
             alpha = node.inputs.get("Alpha") if node.type == "BSDF_PRINCIPLED" else None
@@ -67,7 +67,7 @@ def show_vertex_colours():
 
 
 def find_places():
-    """Every vertex where it is at this moment."""
+    """The current position of every vertex."""
     graph = bpy.context.evaluated_depsgraph_get()
     places = []
     for instance in graph.object_instances:

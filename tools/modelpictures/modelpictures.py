@@ -1,5 +1,5 @@
 #!/usr/bin/python3
-"""Draws models of other people beside the same models as another renderer draws them.
+"""Draws models of other people beside pictures of the same models by other renderers.
 
     modelpictures.py CONVERTER VIEWER FOLDER DOCS [NAME...]
 
@@ -123,7 +123,7 @@ def run(command):
 
 
 def write_wavy_torus(path):
-    """A mesh of more vertices than 16-bit indices count; the waves show where a seam or a wrong index would be."""
+    """A mesh of more vertices than 16-bit indices allow; seams or wrong indices would show in its waves."""
     rings, sides = 640, 160
     with open(path, "w", encoding="ascii") as file:
         for ring in range(rings):
@@ -162,7 +162,7 @@ def write_gltf(path, root, arrays):
 
 
 def write_tentacle(path):
-    """A tube along 30 joints, each of which turns a little against the one before it."""
+    """A tube along 30 joints, each slightly rotated relative to the one before."""
     joints, sides = 30, 12
     places, normals, owners, weights, faces = [], [], [], [], []
     for ring in range(joints):
@@ -227,7 +227,7 @@ MADE = {
 
 
 def find_model(pair, folder, scratch):
-    """What both sides read, unpacked where only one of them can."""
+    """The file for both sides, decompressed if one of them cannot read it."""
     if pair.file == "(made)":
         model = os.path.join(scratch, MADE[pair.name][0])
         MADE[pair.name][1](model)
@@ -258,7 +258,7 @@ def draw_with_blender(pair, model, picture):
 
 
 def draw_with_f3d(pair, model, picture):
-    """Drawn large, since f3d leaves much room, and cut to what is there."""
+    """Drawn large, since f3d leaves wide margins, and cropped."""
     command = ["xvfb-run", "-a", "f3d", model, "--output=" + picture, "--resolution=%d,%d" % (WIDTH * 3, HEIGHT * 3)]
     command += ["--camera-azimuth-angle=26.6", "--camera-elevation-angle=19.7", "--no-background", "--quiet"]
     command += ["--depth-peeling", "--fxaa", "--up=+" + pair.up.upper()]

@@ -1,5 +1,5 @@
 #!/usr/bin/python3
-"""Converts every model of a folder and writes what became of each as a Markdown page.
+"""Converts every model of a folder and writes the results as a Markdown page.
 
     modeltable.py CONVERTER FOLDER PAGE.md
 

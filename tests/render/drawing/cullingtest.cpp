@@ -165,7 +165,7 @@ protected:
             float total = 0.0f;
             for (auto& [joint, weight] : shares)
             {
-                joint = pick(6); // three of which there are; the last one stands in for what is beyond
+                joint = pick(6); // there are three; higher numbers use the last one
                 weight = pick(2) ? number(0.0f, 1.0f) : 0.0f;
                 joints.push_back(float(joint));
                 weights.push_back(weight);

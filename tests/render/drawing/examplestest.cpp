@@ -83,8 +83,8 @@ TEST_P(ExamplesTest, takeTheseCalls)
     EXPECT_EQ(GetParam().textures, counters.textures);
 }
 
-// Fault caught: a change of the engine that nobody meant to be seen. Drivers round in ways of their own, and at edges
-// a pixel more or less is drawn: over the blocks of six by six pixels that are kept, little of that is left.
+// Fault caught: an unintended visible change. Drivers round in ways of their own, and at edges a pixel more or less is
+// drawn: over the blocks of six by six pixels that are kept, little of that is left.
 TEST_P(ExamplesTest, lookAsKept)
 {
     if (!GetParam().picture)

@@ -69,7 +69,7 @@ public:
     const Vector4f& getSphere() const { return m_sphere; }
     /// Draw path: whether the origin is inside of that sphere.
     bool isAroundOrigin() const { return m_isAroundOrigin; }
-    /// Draw path: a mesh whose origin is at least so far inside of a plane is not outside of it.
+    /// Draw path: a mesh whose origin is inside of a plane by at least this distance is not outside of it.
     float getSafeDistance() const { return m_safeDistance; }
     ORV_LOCAL static Vector4f makeSphere(const Bounds& bounds);
 

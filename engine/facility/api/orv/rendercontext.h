@@ -119,11 +119,11 @@ public:
     /// Draw path: sends a material's whole state through the setters above, in their order.
     ///
     /// The stencil comparison mask that is sent is the state's write mask.
-    /// @param stateRevision  stamp of state: the same stamp, blendEnabled and turnWinding as last time, with
-    ///                       no setter having changed anything since, return at once.
+    /// @param stateRevision  revision of state: returns at once if it, blendEnabled and turnWinding are those of
+    ///                       the last call, and no setter has changed anything since.
     /// @param turnWinding    sends the opposite winding order, for geometry that a transform mirrors.
-    /// @return a stamp of state that serves from now on as well: that of the state applied before, if both are
-    ///         equal, so that materials that differ in properties alone come to share one.
+    /// @return a revision for later calls: that of the state applied before if both states are equal, so that
+    ///         materials with equal states share one.
     uint64_t apply(const RenderState& state, uint64_t stateRevision, bool blendEnabled,
                    bool turnWinding = false)
     {

@@ -146,7 +146,7 @@ public:
     uint32_t countReach() const { return m_extras ? m_extras->reachSolids : 0; }
     /// Draw path: an upper limit of what the world transform does to lengths; infinite if it is not affine.
     float getWorldStretch() const { return isWorldRigid() ? 1.0f : findStretch(); }
-    /// The same where it is known already, and the world transform too; else NaN.
+    /// The same if it and the world transform are up to date; else NaN.
     float getKnownStretch() const;
     const Matrix4f& peekWorldTransform() const { return m_worldTransform; } ///< perhaps of an earlier place
 

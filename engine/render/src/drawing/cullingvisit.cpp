@@ -1,4 +1,4 @@
-// What culling does for each solid; the rest of the class is in culling.cpp.
+// The part of Culling that runs for each solid; the rest of the class is in culling.cpp.
 
 #include "culling.h"
 
@@ -11,7 +11,7 @@ namespace orv::detail
 namespace
 {
 
-/// Whether it is plain that a solid is not hidden, as it is of most that are not.
+/// A quick test that finds most of the visible solids.
 [[gnu::always_inline]] inline bool isSeen(const Frustum& frustum, const Solid& solid)
 {
     const Mesh* const mesh = solid.getMesh().get();
@@ -21,7 +21,7 @@ namespace
     return frustum.contains(solid.peekWorldTransform().columns[3], distance);
 }
 
-/// The same of meshes whose origin is elsewhere.
+/// The same for meshes whose sphere is not centred on the origin.
 bool isSphereSeen(const Frustum& frustum, const Solid& solid)
 {
     const Mesh* const mesh = solid.getMesh().get();
@@ -31,7 +31,7 @@ bool isSphereSeen(const Frustum& frustum, const Solid& solid)
     return frustum.contains(solid.peekWorldTransform(), sphere.xyz(), sphere.w * solid.getKnownStretch());
 }
 
-/// Of those that are not plainly seen.
+/// For solids that the quick test does not find.
 [[gnu::noinline]] bool isHidden(const Frustum& frustum, const Solid& solid)
 {
     return !isSphereSeen(frustum, solid) && hides(frustum, solid);
@@ -58,7 +58,7 @@ Solid* const* Culling::select(Solid* const* solids, size_t& count, const Matrix4
                               const Matrix4f& projection)
 {
     if (m_eyeCount == 1 && !m_hasMirrors)
-        return solids; // the walk has seen to it
+        return solids; // the walk has culled already
     const Frustum frustum(view, projection);
     m_selected.clear();
     for (Solid* const* next = solids; next != solids + count; ++next)

@@ -36,7 +36,7 @@ public:
         return areAll(getLeastDistances(load(point.data())) >= fill(distance));
     }
 
-    /// The same of a point that has to be transformed first.
+    /// The same for a point that has to be transformed first.
     [[gnu::always_inline]] bool contains(const Matrix4f& transform, const Vector3f& point,
                                          float distance) const
     {

@@ -84,7 +84,7 @@ void SceneNode::buildLocal() const
     m_localMirrored = (m_scale.x < 0.0f) != ((m_scale.y < 0.0f) != (m_scale.z < 0.0f));
 }
 
-/// Of a node that has moved: its local transform goes from registers to the product.
+/// For a node that has moved: multiplies its local transform without storing it in between.
 [[gnu::always_inline]] inline void SceneNode::placeRigidly(const Matrix4f& parentWorld) const
 {
     const detail::LaneMatrix local = detail::makeRigid(m_rotation, m_position);

@@ -10,9 +10,8 @@ using LogEntryPoint = void (*)(const char* file, const char* function, int line,
 
 /// Keeps the log short while it exists: fewer than 100 records, whatever a file makes the engine say.
 ///
-/// The first record of each of MOST_KINDS kinds is written and a few more; a kind is a place in the sources. What
-/// comes beyond them is counted, and the destructor writes one record for each kind of which there was more. The
-/// oldest budget of a thread counts, those made while it exists do nothing.
+/// Writes the first records of each of MOST_KINDS kinds; a kind is a line of the sources. Further records are counted,
+/// and the destructor writes their number, one record for each kind. Only the oldest budget of a thread has an effect.
 class LogBudget
 {
 public:

@@ -8,7 +8,7 @@
 namespace orv::detail
 {
 
-/// A new stamp whenever something outside the draw path has changed a GL binding; bindingsChanged() alone writes it.
+/// A new revision whenever code outside the draw path has changed a GL binding; only bindingsChanged() writes it.
 extern ORV_API uint64_t g_bindingEpoch;
 
 /// To be called after every glBind*, glUseProgram, glDelete* or vertex array call that does not go through a

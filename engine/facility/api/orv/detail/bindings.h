@@ -36,7 +36,7 @@ public:
             sendProgram(name);
     }
 
-    /// Whether the program of this stamp was made ready and nothing else has been used since by way of this object.
+    /// Whether the program of this revision was made ready and this object has not used another one since.
     bool isProgramReady(uint64_t programRevision) const { return m_readyProgram == programRevision; }
 
     void setProgramReady(uint64_t programRevision) { m_readyProgram = programRevision; }

@@ -1,7 +1,7 @@
 #pragma once
 
-/// GL's texture targets, for headers of the interface, which include none of GL's. rendercontext.cpp holds them against
-/// GL's own names.
+/// GL's texture targets, for headers of the interface, which include none of GL's. rendercontext.cpp checks them
+/// against GL's own names.
 namespace orv::detail
 {
 

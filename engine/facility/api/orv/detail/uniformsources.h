@@ -24,7 +24,7 @@ struct DrawnUniform
 };
 
 /// Where the uniforms of a program take their values from, found out once, so that a draw follows pointers and
-/// compares no names. The pointers are borrowed; the program renews its own stamp when they no longer hold.
+/// compares no names. The pointers are borrowed; the program renews its revision when they are stale.
 struct UniformSources
 {
     struct Value
@@ -45,7 +45,7 @@ struct UniformSources
         unsigned name; ///< of the texture, as of readyRevision
     };
 
-    uint64_t revision = 0;     ///< the program's stamp; 0 to have everything looked up again
+    uint64_t revision = 0;     ///< the program's; 0 makes it look up everything again
     std::vector<Value> values; ///< but for samplers and transforms; those that were handed to enable() first
     std::size_t ownCount = 0;  ///< of values: those handed to enable()
     uint64_t ownUniforms = 0;  ///< a bit for each uniform of these

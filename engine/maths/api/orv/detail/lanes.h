@@ -8,10 +8,10 @@
 namespace orv::detail
 {
 
-/// Four floats that are worked on together, where the processor has registers for that.
+/// Four floats that are processed together, in vector registers if the processor has them.
 typedef float Lanes __attribute__((vector_size(16)));
 
-/// Of comparisons: all bits of a lane, or none.
+/// Result of comparisons: all bits of a lane set, or none.
 typedef int LaneAnswers __attribute__((vector_size(16)));
 
 #ifdef __SSE__
@@ -42,7 +42,7 @@ typedef int LaneAnswers __attribute__((vector_size(16)));
     return Lanes{value, value, value, value};
 }
 
-/// The same in memory, where floats are.
+/// The same in memory, as floats.
 typedef float StoredLanes __attribute__((vector_size(16), aligned(4), may_alias));
 
 [[gnu::always_inline]] inline Lanes load(const float* values)
@@ -62,7 +62,7 @@ template <int A, int B, int C, int D>
     return Lanes(__builtin_shufflevector(LaneAnswers(lanes), LaneAnswers(lanes), A, B, C, D));
 }
 
-/// One lane in all four.
+/// Copies one lane to all four.
 template <int LANE>
 [[gnu::always_inline]] inline Lanes spread(Lanes lanes)
 {

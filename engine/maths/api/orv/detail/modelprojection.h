@@ -13,7 +13,7 @@ class ModelProjection
 public:
     ModelProjection(const Matrix4f& view, const Matrix4f& projection);
 
-    /// Whether view and projection are of that kind.
+    /// Whether view and projection have this form.
     bool isUsable() const { return m_isUsable; }
 
     /// @param world  affine.
@@ -31,7 +31,7 @@ public:
 private:
     Matrix4f multiplySkewed(const Matrix4f& world) const;
 
-    LaneMatrix m_view; ///< its last row is a second third one
+    LaneMatrix m_view; ///< its last row repeats the third
     Lanes m_scale;
     Lanes m_skew; ///< not 0 for an eye of two
     Lanes m_last;
