@@ -37,7 +37,7 @@ TriangleSides getDrawnSides(const Appearance& appearance, bool isMirrored, bool 
     return drawsFront != (isClockwise != isTurned) ? TriangleSides::FRONT : TriangleSides::BACK;
 }
 
-/// Whether what is moved by a transform becomes so flat that the way back is little but rounding.
+/// Whether a transform flattens so much that its inverse would be mostly rounding errors.
 bool isFlattening(const Matrix4f& transform)
 {
     constexpr float LEAST = 1e-4f;
@@ -96,11 +96,11 @@ private:
 
 std::vector<PickHit> pick(SceneNode& scene, const Ray& ray, const FlagMask& flags)
 {
-    // The square of a long or a short direction leaves the range of a float.
+    // Squares of very long or short directions overflow or underflow.
     const Vector3f& way = ray.direction;
     const float largest = std::max({std::fabs(way.x), std::fabs(way.y), std::fabs(way.z)});
     const Ray unit{ray.position, normalize(Vector3f(way.x / largest, way.y / largest, way.z / largest))};
-    if (!(length(unit.direction) > 0.5f)) // none, or not made of numbers
+    if (!(length(unit.direction) > 0.5f)) // no direction, or NaN
         return {};
     Picker picker(unit);
     visitScene(picker, scene, flags, flags);

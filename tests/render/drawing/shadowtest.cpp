@@ -373,7 +373,7 @@ TEST_F(ShadowModel, rayToTheLightDecides)
     EXPECT_LT(5000, dark);
 }
 
-// Fault caught: nothing divided by nothing beside a lamp, which makes a ceiling that it hangs from black.
+// Fault caught: 0 / 0 at the height of a lamp, which draws a ceiling there black.
 TEST_F(ShadowTest, ceilingsAtTheHeightOfALampKeepTheirLight)
 {
     light->setLightType(Light::LightType::SPOT);
@@ -474,7 +474,7 @@ TEST_F(ShadowTest, skinsThrowTheShadowOfTheMoment)
     }
 }
 
-// Fault caught: shadows that are refused without a word.
+// Fault caught: shadows refused without a message.
 TEST_F(ShadowTest, saysWhyThereAreNone)
 {
     renderContext->addProperty(makeShared<ShaderUniform<float>>(1),

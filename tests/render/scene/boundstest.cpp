@@ -371,8 +371,8 @@ TEST_F(BoundsTest, picksTheSidesThatAreDrawn)
     }
 }
 
-// Faults caught: a squeezed and then turned solid, whose transform has no inverse but for rounding, taken back by one;
-// directions whose squares are too large or too small to be numbers.
+// Faults caught: the inverse of a singular transform (flattened, then rotated) used for picking; directions whose
+// squares are too large or too small to be numbers.
 TEST_F(BoundsTest, picksFlatSolidsByRaysOfAnyLength)
 {
     const auto vertices = makeShared<MeshVertices>();

@@ -73,7 +73,7 @@ std::vector<Model> findModels(const FolderJob& job, std::string& error)
         const bool isModel = extension == ".gltf" || extension == ".glb" ||
                              (extension != ".xml" && importer.IsExtensionSupported(extension));
         if (isModel && entry->is_regular_file(ignored))
-            paths.push_back(entry->path().lexically_relative(job.folder)); // a link stays where it is
+            paths.push_back(entry->path().lexically_relative(job.folder)); // links are not resolved
     }
     if (reason)
         error = job.folder + ": " + reason.message();

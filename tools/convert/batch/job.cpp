@@ -51,8 +51,8 @@ std::string quoteForMake(const std::string& path)
     return quoted;
 }
 
-/// Folders that change when a file comes that was looked for and was not there; but for the one that the scene goes into,
-/// which each conversion changes.
+/// Folders whose time changes when a missing file appears; without the scene's own folder, which each conversion
+/// changes.
 std::set<std::filesystem::path> findFoldersOfMissing(const Job& job, const FileGate& gate)
 {
     std::set<std::filesystem::path> folders;

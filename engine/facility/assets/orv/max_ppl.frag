@@ -179,7 +179,7 @@ float arrivingShare()
     float depth = u_s_map.z > 0.0 ? v_shadowDepth : 1.0;
     vec2 place = vec2(v_shadowX, v_shadowY);
     if (!all(greaterThan(place, vec2(0.0))) || !all(lessThan(place, vec2(depth))))
-        return 1.0; // beside the map. Beside a lamp, where the depth is 0, nothing below would be a number
+        return 1.0; // outside of the map; also avoids NaN at depth 0
     place /= u_s_map.y * depth;
     vec2 middle = floor(place) + 0.5;
     float share = 0.0;
