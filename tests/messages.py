@@ -20,7 +20,7 @@ LITERAL = r'"(?:[^"\\\n]|\\.)*"'
 # Sources of messages: log calls, functions that log and return, exceptions of the readers, variables for reasons.
 CALLS = re.compile(
     r"(?:\bORV_(?:LOG|GLO)_(?:ERROR|WARN)|\b(?:pssL|l)og(?:Error|Warn)|\b(?:fail|failAt|refuse|refuseFile|damaged|Fault|"
-    r"ValidationError|failWithErrno|findConflict)|\bfprintf)\s*\(|\b(?:error|reason|m_error|fault|problem|failure)(?:->|\.)?\w*\s*\+?=(?!=)|"
+    r"ValidationError|failWithErrno|findConflict|setError)|\bfprintf)\s*\(|\b(?:error|reason|m_error|fault|problem|failure)(?:->|\.)?\w*\s*\+?=(?!=)|"
     r"\bconst char\* const (?!FOOTER|EXAMPLES)[A-Z_]+\s*=")
 # Functions whose results are reasons.
 REASONS = {

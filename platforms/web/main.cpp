@@ -116,7 +116,7 @@ extern "C"
 
     EMSCRIPTEN_KEEPALIVE void orvLoseContext()
     {
-        getViewer().loseContext();
+        getViewer().dropContext();
     }
 
     EMSCRIPTEN_KEEPALIVE int orvRestoreContext()
@@ -126,7 +126,7 @@ extern "C"
 
     EMSCRIPTEN_KEEPALIVE int orvOpen(const char* path)
     {
-        return getViewer().open(path);
+        return getViewer().open({path, {}});
     }
 
     EMSCRIPTEN_KEEPALIVE void orvClose()
@@ -154,7 +154,7 @@ extern "C"
 
     EMSCRIPTEN_KEEPALIVE void orvSetSize(int width, int height)
     {
-        getViewer().setSize(width, height);
+        getViewer().setCanvasSize(width, height);
     }
 
     EMSCRIPTEN_KEEPALIVE int orvDraw(float seconds)

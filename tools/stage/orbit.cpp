@@ -18,7 +18,6 @@ namespace
 constexpr float PI = 3.14159265f;
 constexpr float RADIANS_PER_PIXEL = PI / 360.0f;
 constexpr float MAX_PITCH = PI / 2.0f - 0.001f; // left and right are undefined straight from above
-constexpr float STEP = 0.9f;
 
 } // namespace
 
@@ -49,7 +48,7 @@ void Orbit::pan(float right, float down, float viewHeight)
 
 void Orbit::zoom(float steps)
 {
-    distance = std::clamp(distance * std::pow(STEP, steps), radius * 1e-6f, radius * 1e3f);
+    distance = std::clamp(distance * std::pow(ZOOM_STEP, steps), radius * 1e-6f, radius * 1e3f);
 }
 
 void Orbit::continueFrom(const orv::Camera& camera)

@@ -14,6 +14,8 @@ namespace view
 /// +x) and raised by `pitch`. Angles in radians, lengths in world units.
 struct Orbit
 {
+    static constexpr float ZOOM_STEP = 0.9f; ///< what one step of zooming leaves of the distance
+
     orv::Vector3f middle;
     float yaw = 0.0f;
     float pitch = 0.0f;

@@ -84,11 +84,13 @@ Stage::Stage(Studio& studio)
 
 std::unique_ptr<Stage> Stage::load(Studio& studio, const SceneFile& file, std::string& error)
 {
-    if (!isFile(file.path, error))
+    if (!file.isAsset && !isFile(file.path, error))
         return nullptr;
     const fs::path path(file.path);
-    const std::string name = path.filename().string();
-    studio.addFolder(getFolder(path));
+    const std::string name = file.isAsset ? file.path : path.filename().string();
+    studio.useSources(file.isAsset);
+    if (!file.isAsset)
+        studio.addFolder(getFolder(path));
 
     std::unique_ptr<Stage> stage(new Stage(studio));
     const FileKind kind = getFileKind(file.path);

@@ -39,6 +39,8 @@ struct SceneFile
 
     std::string path;
     std::vector<Dressing> dressings;
+    bool isAsset =
+        false; ///< the path is a name in the studio's sources, where all that the file names is looked for
 };
 
 /// A loaded scene with everything needed to draw it into the current GL context.

@@ -49,6 +49,18 @@ void Studio::limitFolders(const std::set<std::string>& folders)
         m_sources[i]->setUsed(folders.count(m_folders[i]) > 0);
 }
 
+void Studio::addSource(const orv::SharedPtr<orv::StreamSource>& source)
+{
+    m_otherSources.push_back(makeShared<SwitchedSource>(source));
+    m_pool->registerSource(m_otherSources.back());
+}
+
+void Studio::useSources(bool used)
+{
+    for (const orv::SharedPtr<SwitchedSource>& source : m_otherSources)
+        source->setUsed(used);
+}
+
 void Studio::forgetAssets()
 {
     m_pool->getMeshCache()->clear();

@@ -1,6 +1,7 @@
 #pragma once
 
 #include "recordingsource.h"
+#include "switchedsource.h"
 
 #include "orv/assetcachepool.h"
 #include "orv/rendercontext.h"
@@ -36,6 +37,10 @@ public:
     /// Restricts the search path to these of the added folders.
     void limitFolders(const std::set<std::string>& folders);
 
+    /// A further place of assets, searched while useSources(true) holds.
+    void addSource(const orv::SharedPtr<orv::StreamSource>& source);
+    void useSources(bool used); ///< those of addSource(); off at first
+
     /// From now on, assets are read from their files again. A stage keeps the assets that it holds.
     void forgetAssets();
 
@@ -49,7 +54,8 @@ private:
     orv::RenderContext::Ptr m_context;
     orv::SharedPtr<orv::AssetCachePool> m_pool;
     std::vector<std::string> m_folders;
-    std::vector<orv::SharedPtr<RecordingSource>> m_sources;
+    std::vector<orv::SharedPtr<RecordingSource>> m_sources; ///< one for each folder
+    std::vector<orv::SharedPtr<SwitchedSource>> m_otherSources;
 };
 
 } // namespace view
