@@ -20,7 +20,7 @@ LITERAL = r'"(?:[^"\\\n]|\\.)*"'
 # Sources of messages: log calls, functions that log and return, exceptions of the readers, variables for reasons.
 CALLS = re.compile(
     r"(?:\bORV_(?:LOG|GLO)_(?:ERROR|WARN)|\b(?:pssL|l)og(?:Error|Warn)|\b(?:fail|failAt|refuse|refuseFile|damaged|Fault|"
-    r"ValidationError|failWithErrno|findConflict|setError)|\bfprintf)\s*\(|\b(?:error|reason|m_error|fault|problem|failure)(?:->|\.)?\w*\s*\+?=(?!=)|"
+    r"ValidationError|failWithErrno|findConflict|setError|IOException)|\bfprintf)\s*\(|\b(?:error|reason|m_error|fault|problem|failure)(?:->|\.)?\w*\s*\+?=(?!=)|"
     r"\bconst char\* const (?!FOOTER|EXAMPLES)[A-Z_]+\s*=")
 # Functions whose results are reasons.
 REASONS = {
@@ -30,14 +30,16 @@ REASONS = {
     "engine/facility/src/fonts/fontloader.cpp", "engine/facility/src/text/textstatement.cpp",
     "tools/view/options.cpp", "tools/convert/main.cpp", "tools/convert/guard.cpp", "tools/inspect/main.cpp",
 }
+# What the application for Android shows: its strings of such names are messages.
+APPLICATION = re.compile(r'<string name="no_\w+">(.*?)</string>')
 RETURN = re.compile(r"\breturn\b")
 SPEC = re.compile(r"%(?:-?\d*\.?\d*\*?(?:ll|z|l|h)?[a-zA-Z])|%%")
 
 
 def files():
     paths = [path for room in ("engine", "tools", "platforms") for path in sorted(pathlib.Path(SOURCE, room).rglob("*"))]
-    names = [path.relative_to(SOURCE).as_posix() for path in paths if path.suffix in (".cpp", ".h")]
-    return [name for name in names if "/sanitize/" not in name]
+    names = [path.relative_to(SOURCE).as_posix() for path in paths if path.suffix in (".cpp", ".h", ".java", ".xml")]
+    return [name for name in names if "/sanitize/" not in name and (not name.endswith(".xml") or "/res/values/" in name)]
 
 
 def statement(text, begin):
@@ -72,6 +74,8 @@ def messages():
     for name in files():
         with open(os.path.join(SOURCE, name), encoding="utf-8") as file:
             text = re.sub(r"^\s*//.*$|(?<=[;{,)]) //.*$", "", file.read(), flags=re.M)
+        for string in APPLICATION.findall(text):
+            found.setdefault(string.strip(": "), name)
         places = [match.end() for match in CALLS.finditer(text)]
         if name in REASONS:
             places += [match.end() for match in RETURN.finditer(text)]
@@ -85,7 +89,9 @@ def all_literals():
     """Every text of the sources, to find explanations of messages that do not exist."""
     for name in files():
         with open(os.path.join(SOURCE, name), encoding="utf-8") as file:
-            for run in re.findall(rf"{LITERAL}(?:\s*{LITERAL})*", file.read()):
+            text = file.read()
+            yield from APPLICATION.findall(text)
+            for run in re.findall(rf"{LITERAL}(?:\s*{LITERAL})*", text):
                 whole = "".join(unescape(part[1:-1]) for part in re.findall(LITERAL, run))
                 yield " ".join(SPEC.sub("\0", whole).split())
 

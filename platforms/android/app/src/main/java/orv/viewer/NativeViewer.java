@@ -1,0 +1,139 @@
+package orv.viewer;
+
+import android.content.res.AssetManager;
+import java.nio.charset.StandardCharsets;
+
+/**
+ * The native viewer. One call at a time; {@link #replaceContext}, {@link #open} and {@link #draw} on the thread whose GL
+ * context is current, the others on any. After {@link #release}, which may come at any time, nothing happens any more.
+ */
+final class NativeViewer {
+    static {
+        System.loadLibrary("orvviewer");
+    }
+
+    private final AssetManager assets; // the native side reads from it as long as it lives
+    private long handle;
+
+    NativeViewer(AssetManager assets) {
+        this.assets = assets;
+        handle = create(this.assets);
+    }
+
+    /** A new context is current; one that there was before is gone. What was shown is loaded again. */
+    synchronized boolean replaceContext() {
+        return replaceContext(handle);
+    }
+
+    /** Of the surface, in pixels. */
+    synchronized void setSize(int width, int height) {
+        setSize(handle, width, height);
+    }
+
+    /** Goes on by some seconds and draws. Returns whether the next frame would show something else. */
+    synchronized boolean draw(float seconds) {
+        return draw(handle, seconds);
+    }
+
+    /** Shows a file, or an asset of the package, in place of what was shown. Returns false where it cannot be loaded. */
+    synchronized boolean open(Shown shown) {
+        return open(handle, shown.path.getBytes(StandardCharsets.UTF_8), shown.isAsset);
+    }
+
+    synchronized boolean isOpen() {
+        return isOpen(handle);
+    }
+
+    /** What was wrong at the last load, a line for each thing; empty where nothing was. */
+    synchronized String getMessage() {
+        byte[] text = getMessage(handle);
+        return text == null ? "" : new String(text, StandardCharsets.UTF_8);
+    }
+
+    /** Turns what is seen, half a degree for each unit. */
+    synchronized void turn(float right, float down) {
+        turn(handle, right, down);
+    }
+
+    /** Moves what is seen, in pixels. */
+    synchronized void pan(float right, float down) {
+        pan(handle, right, down);
+    }
+
+    /** Makes things as many times as large. */
+    synchronized void zoom(float factor) {
+        zoom(handle, factor);
+    }
+
+    /** The whole scene, from the front. */
+    synchronized void frameAll() {
+        frameAll(handle);
+    }
+
+    synchronized int getCameraCount() {
+        return getCameraCount(handle);
+    }
+
+    synchronized void stepCamera() {
+        stepCamera(handle);
+    }
+
+    synchronized int getClipCount() {
+        return getClipCount(handle);
+    }
+
+    synchronized void stepClip() {
+        stepClip(handle);
+    }
+
+    synchronized void togglePaused() {
+        togglePaused(handle);
+    }
+
+    /** Also where there is nothing that could play. */
+    synchronized boolean isPaused() {
+        return isPaused(handle);
+    }
+
+    /** Needs no context, and leaves what is in one to go with it. */
+    synchronized void release() {
+        destroy(handle);
+        handle = 0;
+    }
+
+    private static native long create(AssetManager assets);
+
+    private static native void destroy(long handle);
+
+    private static native boolean replaceContext(long handle);
+
+    private static native void setSize(long handle, int width, int height);
+
+    private static native boolean draw(long handle, float seconds);
+
+    private static native boolean open(long handle, byte[] path, boolean isAsset);
+
+    private static native boolean isOpen(long handle);
+
+    private static native byte[] getMessage(long handle);
+
+    private static native void turn(long handle, float right, float down);
+
+    private static native void pan(long handle, float right, float down);
+
+    private static native void zoom(long handle, float factor);
+
+    private static native void frameAll(long handle);
+
+    private static native int getCameraCount(long handle);
+
+    private static native void stepCamera(long handle);
+
+    private static native int getClipCount(long handle);
+
+    private static native void stepClip(long handle);
+
+    private static native void togglePaused(long handle);
+
+    private static native boolean isPaused(long handle);
+}

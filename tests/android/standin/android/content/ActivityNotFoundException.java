@@ -1,0 +1,6 @@
+package android.content;
+
+@SuppressWarnings("serial")
+public class ActivityNotFoundException extends RuntimeException {
+    public ActivityNotFoundException() {}
+}

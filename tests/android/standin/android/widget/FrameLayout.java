@@ -1,0 +1,14 @@
+package android.widget;
+
+import android.content.Context;
+import android.view.ViewGroup;
+
+public class FrameLayout extends ViewGroup {
+    public static class LayoutParams extends ViewGroup.LayoutParams {
+        public LayoutParams(int width, int height, int gravity) {}
+    }
+
+    public FrameLayout(Context context) {
+        super(context);
+    }
+}
