@@ -173,6 +173,7 @@ def run_java(androidbuild, package, folder):
         for line in checking.stdout:
             print(line, end="", flush=True)
             said += line
+    print(run(*command[:2], f"-Djava.library.path={folder}", *command[4:-3], "orv.viewer.NoLibrary", *command[-2:]), end="")
     said += log.read_text(errors="replace")
     for complaint in ("WARNING in native method", "WARNING: JNI", "FATAL ERROR"):
         if complaint in said:

@@ -49,7 +49,7 @@ final class ActivityChecks {
             MainThread.run(() -> activity.standInCreate(intent, state));
             ViewGroup root = (ViewGroup) activity.standInContent;
             view = (ViewerView) root.standInChildren.get(0);
-            message = (TextView) root.standInChildren.get(1);
+            message = (TextView) overlay().standInChildren.get(0);
             MainThread.run(activity::standInResume);
         }
 
@@ -59,6 +59,10 @@ final class ActivityChecks {
             MainThread.run(activity::standInDestroy);
             view.queueEvent(view::togglePaused); // too late, and harmless
             view.standInDetach();
+        }
+
+        private ViewGroup overlay() {
+            return (ViewGroup) ((ViewGroup) activity.standInContent).standInChildren.get(1);
         }
 
         byte[] picture() throws Exception {
@@ -81,7 +85,7 @@ final class ActivityChecks {
         }
 
         Button button(int index) {
-            ViewGroup bar = (ViewGroup) ((ViewGroup) activity.standInContent).standInChildren.get(2);
+            ViewGroup bar = (ViewGroup) overlay().standInChildren.get(1);
             return (Button) bar.standInChildren.get(index);
         }
 

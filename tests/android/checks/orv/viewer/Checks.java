@@ -15,7 +15,7 @@ import java.awt.image.BufferedImage;
 /**
  * Runs the checks, a line for each:
  *
- * <p>Checks FOLDER STRINGS.xml, where FOLDER has app.apk (what aapt packed), test.apk (duck.glo with its picture, windmill.glo), 
+ * <p>Checks FOLDER STRINGS.xml, where FOLDER has app.apk (what aapt packed), test.apk (duck.glo with its picture, windmill.glo),
  * windmill.glo, duck.glo, duck.png and windmill.png as orv-view draws them. Exit code 1 if one fails.
  */
 public final class Checks {
@@ -119,7 +119,7 @@ public final class Checks {
         return Files.readAllBytes(folder.resolve(name));
     }
 
-    private static Map<Integer, String> readStrings(File file) throws Exception {
+    static Map<Integer, String> readStrings(File file) throws Exception {
         Map<Integer, String> strings = new HashMap<>();
         var list = javax.xml.parsers.DocumentBuilderFactory.newInstance()
                 .newDocumentBuilder().parse(file).getElementsByTagName("string");

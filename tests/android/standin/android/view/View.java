@@ -6,6 +6,7 @@ import standin.MainThread;
 public class View {
     public static final int VISIBLE = 0;
     public static final int GONE = 8;
+    public static final int ACCESSIBILITY_LIVE_REGION_POLITE = 1;
 
     public interface OnClickListener {
         void onClick(View view);
@@ -30,6 +31,8 @@ public class View {
     public void setContentDescription(CharSequence text) {
         standInDescription = text;
     }
+
+    public void setAccessibilityLiveRegion(int mode) {}
 
     public void setOnClickListener(OnClickListener listener) {
         this.listener = listener;

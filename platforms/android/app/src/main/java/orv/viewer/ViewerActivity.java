@@ -41,16 +41,20 @@ public final class ViewerActivity extends Activity implements ViewerView.Listene
         message.setTextColor(0xFF202020);
         message.setPadding(24, 24, 24, 24);
         message.setVisibility(View.GONE);
+        message.setAccessibilityLiveRegion(View.ACCESSIBILITY_LIVE_REGION_POLITE); // read aloud when it comes
         try {
             view = new ViewerView(this, this);
-        } catch (UnsatisfiedLinkError reason) {
+        } catch (LinkageError reason) { // at the first try, and another kind of it at every further one
             say(getString(R.string.no_library) + " " + reason.getMessage());
         }
         if (view != null) {
             root.addView(view);
         }
-        root.addView(message, place(Gravity.TOP));
-        root.addView(makeBar(), place(Gravity.BOTTOM));
+        FrameLayout overlay = new FrameLayout(this);
+        overlay.setFitsSystemWindows(true); // else parts of it lie below the system's own
+        overlay.addView(message, place(Gravity.TOP));
+        overlay.addView(makeBar(), place(Gravity.BOTTOM));
+        root.addView(overlay);
         setContentView(root);
         if (state != null && state.getString(PATH) != null) {
             show(new Shown(state.getString(PATH), state.getBoolean(IS_ASSET)));
@@ -124,7 +128,6 @@ public final class ViewerActivity extends Activity implements ViewerView.Listene
     private View makeBar() {
         LinearLayout bar = new LinearLayout(this);
         bar.setGravity(Gravity.CENTER);
-        bar.setFitsSystemWindows(true); // else it lies below the system's own
         addButton(bar, R.string.open, this::choose);
         play = addButton(bar, R.string.pause, () -> view.togglePaused());
         clip = addButton(bar, R.string.clip, () -> view.stepClip());
