@@ -257,7 +257,7 @@ TEST_F(FontTest, refusesDamagedTables)
         {"no height", {{"hhea", 4, 2, 0x8000}}},
         {"no widths", {{"hhea", 34, 2, 0}}},
         {"widths are missing", {{"", 12 + 16 * 13 + 12, 4, 100}}}, // how long hmtx is
-        {"character map names a glyph that is not there", {{"maxp", 4, 2, 30}}},
+        {"character map refers to a missing glyph", {{"maxp", 4, 2, 30}}},
         {"character map is damaged", {{"cmap", cmap + 12, 4, 0x15555556}}}, // groups; their size wraps
         {"no character map", {{"cmap", cmap, 2, 2}}},
         {"no character map", {{"cmap", 2, 2, 0}}},
@@ -273,7 +273,7 @@ TEST_F(FontTest, refusesDamagedTables)
         {"outline is damaged",
          {{"glyf", glyph, 2, 1}, {"glyf", glyph + 10, 4, 0}, {"glyf", glyph + 14, 1, 0x30}}},
         {"nested too deeply", component(2, 36)},
-        {"glyph names one that is not there", component(2, 0xFFFF)},
+        {"glyph refers to a missing one", component(2, 0xFFFF)},
         {"matching points", component(0, 40)},
         {"too far away", component(3, 40, 0x7FFF7FFF)},
         {"too large", {{"hhea", 4, 4, 1 << 16}}}, // a line is one unit high
