@@ -155,7 +155,7 @@ TEST_F(ConvertTest, classicMaterials)
     EXPECT_FALSE(worn->isOpaque());
     EXPECT_EQ(8u * 8u * 4u, getTexture(worn)->getSizeInBytes());
     EXPECT_TRUE(loaded->getAppearance("bumpy")->getPropertyUniform("M_BUMP_TEXTURE"));
-    EXPECT_TRUE(reports("approximated: a map of heights")) << m_outcome.output;
+    EXPECT_TRUE(reports("approximated: a height map")) << m_outcome.output;
     SharedPtr<Texture2D> glow; // fixed-function light goes through the picture
     const SharedPtr<Appearance> glowing = loaded->getAppearance("glow");
     EXPECT_TRUE(glowing->getPropertyUniform("M_EMISSIVE_TEXTURE")->getValue(glow, 0));
