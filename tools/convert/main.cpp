@@ -24,8 +24,8 @@ struct Command
 };
 
 const char* const FOOTER =
-    "Textures are written beside the scene, their names beginning with its name. Files of these names are\n"
-    "replaced; on failure nothing is written. Of a folder, models that are new or have changed are "
+    "Textures are written beside the scene; their names begin with its name. Existing files are\n"
+    "replaced; on failure nothing is written. In a folder, only new and changed models are "
     "converted, each with\n"
     "a report beside its scene. Exit code: 0 converted, 1 not (or not all), 2 wrong usage.\n\n"
     "Examples:\n"
@@ -104,16 +104,15 @@ std::string findConflict(const Command& command, bool isFolder)
 
 void addFolderOptions(CLI::App& app, Command& command)
 {
-    app.add_option("--jobs", command.folder.processes, "of a folder: the number of models at a time")
+    app.add_option("--jobs", command.folder.processes, "for a folder: how many models to convert in parallel")
         ->check(CLI::Range(1, MOST_PROCESSES))
         ->capture_default_str();
     app.add_option("--shard", command.shard,
-                   "of a folder: the first, second... of N parts of its models, for N machines")
+                   "for a folder: convert only part I of N, to share the work among machines")
         ->option_text("I/N")
         ->check([&command](const std::string& text) { return parseShard(text, command.folder); });
-    app.add_flag("--again", command.folder.again, "of a folder: convert what has not changed too");
-    app.add_option("--depfile", command.job.depfile,
-                   "also write which files the scene was made of, for make and ninja")
+    app.add_flag("--again", command.folder.again, "for a folder: convert unchanged models too");
+    app.add_option("--depfile", command.job.depfile, "also write a dependency file for make and ninja")
         ->option_text("FILE");
 }
 
@@ -137,18 +136,19 @@ void addOptions(CLI::App& app, Command& command)
         ->check(CLI::IsMember({"stepped", "sparse"}))
         ->capture_default_str();
     app.add_option("--key-error", options.keyError,
-                   "of sparse keys: a share of the model's size, radians, a share of 1 for scales")
+                   "error limit of sparse keys: fraction of the model's size, radians, difference of scales")
         ->check(CLI::Range(1e-6, 0.1))
         ->check(commandline::refuseNan())
         ->capture_default_str();
     app.add_flag("--no-animation", command.noAnimation, "leave animations out");
-    app.add_option("--up", options.up, "the axis that points up in the model, if its file has it wrong")
+    app.add_option("--up", options.up, "the model's up axis, if the file's own is wrong")
         ->check(CLI::IsMember({"x", "y", "z"}));
     app.add_option("--scale", options.scale, "scales everything by this factor")
         ->check(CLI::Range(1e-6, 1e6))
         ->check(commandline::refuseNan())
         ->capture_default_str();
-    app.add_option("--max-texture-size", options.maxTextureSize, "makes larger textures smaller; in pixels")
+    app.add_option("--max-texture-size", options.maxTextureSize,
+                   "limit of the longer side of textures, in pixels")
         ->check(CLI::Range(1, LARGEST_TEXTURE));
     app.add_flag("--power-of-two", options.powerOfTwo,
                  "gives all textures sizes that can repeat and have mipmaps");
@@ -165,12 +165,12 @@ void addOptions(CLI::App& app, Command& command)
                    "also write the report as JSON to this file; - prints only that")
         ->option_text("FILE");
     app.add_flag("--dry-run", command.job.dryRun, "write no scene and no textures");
-    app.add_option("--time-limit", command.job.limits.seconds, "seconds after which to give up; 0 for never")
+    app.add_option("--time-limit", command.job.limits.seconds, "time limit in seconds; 0 for none")
         ->check(CLI::Range(0.0, 1e6))
         ->check(commandline::refuseNan())
         ->capture_default_str();
     app.add_option("--memory-limit", command.job.limits.mebibytes,
-                   convert::CAN_LIMIT_MEMORY ? "MiB of memory above which to give up; 0 for no limit"
+                   convert::CAN_LIMIT_MEMORY ? "memory limit in MiB; 0 for none"
                                              : "without effect in this build with address checks")
         ->check(CLI::Range(0, 1 << 24))
         ->capture_default_str();
