@@ -15,7 +15,7 @@ namespace
 {
 
 constexpr size_t MOST_REMARKS = 50;
-constexpr float LONGEST_STEP = 0.25f;       // seconds, of what is played
+constexpr float LONGEST_STEP = 0.25f;       // seconds of playing
 constexpr float SHADER_TIME_SPAN = 3600.0f; // seconds; more would be too coarse for floats
 const orv::Colour4f BACKGROUND(0.84f, 0.86f, 0.89f, 1.0f);
 
@@ -59,7 +59,7 @@ bool SceneViewer::takeContext()
 void SceneViewer::loseContext()
 {
     if (m_studio)
-        m_studio->getPool()->forgetContext(); // so that nothing is deleted that is not there
+        m_studio->getPool()->forgetContext(); // so that no lost object is deleted
     m_stage.reset();
     m_studio.reset();
 }
@@ -69,7 +69,7 @@ bool SceneViewer::open(const SceneFile& file)
     close();
     if (!m_studio)
     {
-        m_error = "there are no graphics at the moment";
+        m_error = "the GL context is lost";
         return false;
     }
     m_file = file;
@@ -92,7 +92,7 @@ void SceneViewer::close()
     m_shaderTime = 0.0f;
     if (!m_studio)
         return;
-    m_studio->limitFolders({}); // files of the same name in another scene's folder are others
+    m_studio->limitFolders({}); // another scene's folder may have files of the same name
     m_studio->forgetAssets();
     m_studio->flush();
 }
@@ -103,7 +103,7 @@ bool SceneViewer::load()
     m_remarks.clear();
     m_studio->forgetAssets();
     m_stage = Stage::load(*m_studio, m_file, m_error);
-    m_studio->flush(); // what a load that failed has left
+    m_studio->flush(); // left over from a failed load
     if (!m_stage)
     {
         m_player.reset();

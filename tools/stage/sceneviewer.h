@@ -15,14 +15,14 @@
 namespace view
 {
 
-/// One scene, the eye that looks at it, and the GL context that it is drawn in, which can be lost at any time.
+/// One scene, its camera, and its GL context, which can be lost at any time.
 ///
-/// Who derives from it or holds it makes contexts current. There is one of them at a time, since it takes the engine's
-/// log. Nothing is drawn but by draw(): a frame is asked for where something has changed or moves.
+/// The owner makes contexts current. One object at a time, since it takes the engine's log. Only draw() draws: the
+/// owner calls it when something changes or moves.
 class SceneViewer
 {
 public:
-    /// What the engine had to say about a load.
+    /// The engine's messages about a load.
     struct Remark
     {
         bool isError;
@@ -37,17 +37,16 @@ public:
     SceneViewer(const SceneViewer&) = delete;
     SceneViewer& operator=(const SceneViewer&) = delete;
 
-    /// Where scenes that are assets come from, with all that they name; from the next context on.
+    /// The source of scenes that are assets, with all files that they name; used from the next context on.
     void addSource(const orv::SharedPtr<orv::StreamSource>& source);
 
-    /// A new context is current from here on. What was shown is loaded once more and goes on where it was, eye, clip, time
-    /// and all.
+    /// A new context is current: loads the scene again and continues with the same eye, clip and time.
     /// @return false, with the reason in getError() and nothing shown, if that failed.
     bool takeContext();
-    /// The context is gone, with all that it held; draw() does nothing from here on. Makes no call of GL.
+    /// The context is lost; draw() does nothing from now on. Makes no GL call.
     void loseContext();
 
-    /// Shows a scene, a material or a shader program in place of what was shown.
+    /// Shows a scene, a material or a shader program.
     /// @return false, with the reason in getError() and nothing shown, if it cannot be loaded.
     bool open(const SceneFile& file);
     void close();
@@ -55,21 +54,21 @@ public:
 
     const std::string& getError() const { return m_error; }
     const std::vector<Remark>& getRemarks() const { return m_remarks; }
-    /// Files that the scene asked for and that were not there: what to look for elsewhere, and variants that need not be.
+    /// Missing files that the scene requested, including optional variants.
     std::vector<std::string> listMissing() const;
 
-    void setSize(int width, int height); ///< of what is drawn into, in pixels
+    void setSize(int width, int height); ///< of the surface, in pixels
 
-    /// Goes on by some time and draws. @param seconds  since the last call; less is played where that is long ago.
-    /// @return whether something moves, so that the next frame would show something else.
+    /// Advances the time and draws. @param seconds  since the last call; long times are shortened.
+    /// @return whether something moves, so that the next frame would differ.
     bool draw(float seconds);
 
-    /// What the last draw() took.
+    /// Statistics of the last draw().
     const orv::FrameCounters& getCounters() const { return m_counters; }
     long getTriangleCount() const { return m_triangles; }
     int getPartCount() const { return m_parts; }
 
-    // For what follows, a scene has to be open.
+    // The following functions need an open scene.
 
     Stage& getStage() { return *m_stage; }
     Player& getPlayer() { return *m_player; }
@@ -95,7 +94,7 @@ private:
 
     orv::LogFunction m_log;
     std::vector<orv::SharedPtr<orv::StreamSource>> m_sources;
-    SceneFile m_file; ///< without a path where nothing is shown
+    SceneFile m_file; ///< without a path if nothing is shown
     std::string m_error;
     std::vector<Remark> m_remarks;
     std::unique_ptr<Studio> m_studio;

@@ -206,7 +206,7 @@ final class NativeChecks {
     private static void misuse() throws Exception {
         NativeViewer bare = new NativeViewer(new AssetManager(path("test.apk")));
         expect(!bare.open(asset("duck.glo")) && !bare.draw(1), "without a context");
-        expect(bare.getMessage().equals("there are no graphics at the moment"), bare.getMessage());
+        expect(bare.getMessage().equals("the GL context is lost"), bare.getMessage());
         bare.release();
         with("test.apk", viewer -> {
             byte[] first = open(viewer, asset("duck.glo"));

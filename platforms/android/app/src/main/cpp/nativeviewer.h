@@ -19,7 +19,7 @@ public:
     /// @return as SceneViewer::takeContext().
     bool replaceContext();
 
-    /// What went wrong with the last load, one line for each thing, the error first; "" where nothing did.
+    /// The errors of the last load, one a line, the most important first; "" for none.
     std::string getMessage() const;
 };
 

@@ -2,7 +2,7 @@ package orv.viewer;
 
 import android.view.MotionEvent;
 
-/** What fingers mean: one turns, two move and pinch, two taps begin anew. */
+/** Gestures: one finger turns, two move and pinch, a double tap resets the view. */
 final class Gestures {
     interface Hand {
         /** In units that are as large on every screen. */
@@ -11,7 +11,7 @@ final class Gestures {
         /** In pixels. */
         void pan(float right, float down);
 
-        /** How many times as large things get. */
+        /** The factor of the zoom. */
         void zoom(float factor);
 
         void reset();

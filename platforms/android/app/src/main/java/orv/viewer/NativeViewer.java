@@ -20,7 +20,7 @@ final class NativeViewer {
         handle = create(this.assets);
     }
 
-    /** A new context is current; one that there was before is gone. What was shown is loaded again. */
+    /** A new context is current, and the old one is lost: loads the scene again. */
     synchronized boolean replaceContext() {
         return replaceContext(handle);
     }
@@ -30,12 +30,12 @@ final class NativeViewer {
         setSize(handle, width, height);
     }
 
-    /** Goes on by some seconds and draws. Returns whether the next frame would show something else. */
+    /** Advances the time and draws. Returns whether the next frame would differ. */
     synchronized boolean draw(float seconds) {
         return draw(handle, seconds);
     }
 
-    /** Shows a file, or an asset of the package, in place of what was shown. Returns false where it cannot be loaded. */
+    /** Shows a file, or an asset of the package. Returns false if it cannot be loaded. */
     synchronized boolean open(Shown shown) {
         return open(handle, shown.path.getBytes(StandardCharsets.UTF_8), shown.isAsset);
     }
@@ -44,7 +44,7 @@ final class NativeViewer {
         return isOpen(handle);
     }
 
-    /** What was wrong at the last load, a line for each thing; empty where nothing was. */
+    /** The errors of the last load, one a line; empty for none. */
     synchronized String getMessage() {
         byte[] text = getMessage(handle);
         return text == null ? "" : new String(text, StandardCharsets.UTF_8);
@@ -60,7 +60,7 @@ final class NativeViewer {
         pan(handle, right, down);
     }
 
-    /** Makes things as many times as large. */
+    /** Zooms by a factor. */
     synchronized void zoom(float factor) {
         zoom(handle, factor);
     }

@@ -11,7 +11,7 @@ import javax.microedition.khronos.opengles.GL10;
  * context is current: events run without one while the application is paused.
  */
 final class ViewerView extends GLSurfaceView implements GLSurfaceView.Renderer, Gestures.Hand {
-    /** Hears of changes, on the thread of the user interface. */
+    /** Receives changes, on the user interface's thread. */
     interface Listener {
         /** Something was loaded, or could not be. */
         void onLoaded(boolean isOpen, String message, int clips, int cameras);
@@ -23,7 +23,7 @@ final class ViewerView extends GLSurfaceView implements GLSurfaceView.Renderer, 
     private final Listener listener;
     private final Gestures gestures;
     private Shown wish; // to be loaded at the next frame
-    private long lastFrame; // in nanoseconds; 0 where time begins anew
+    private long lastFrame; // in nanoseconds; 0 to start timing again
     private boolean wasPaused;
 
     ViewerView(Context context, Listener listener) {
