@@ -511,6 +511,36 @@ TEST_F(CullingTest, leavesNothingOutThatAMirrorMayShow)
     mirror = nullptr;
 }
 
+// Fault caught: points that vanish when their centre leaves the view, though half of each is still in it.
+TEST_F(CullingTest, largePointsAreDrawn)
+{
+    const auto large = makeShared<Appearance>();
+    large->setShaderProgram(makeProgram("attribute vec3 a_position; uniform mat4 u_transform;"
+                                        "void main() { gl_Position = u_transform * vec4(a_position, 1.0);"
+                                        " gl_PointSize = 40.0; }",
+                                        "void main() { gl_FragColor = vec4(1.0); }",
+                                        {{"u_transform", "T_MODEL_VIEW_PROJECTION"}}));
+    const auto places = makeShared<VertexArray>(1, 4, 3);
+    std::fill_n(places->getData<float>(), 3, 0.0f);
+    const auto vertices = makeShared<VertexBuffer>(nullptr);
+    vertices->addAttrib(places, "a_position", VertexBuffer::AttribFormat::FLOAT,
+                        VertexBuffer::AttribUsage::CLIENT_MEMORY, false);
+    const auto mesh = makeShared<Mesh>(
+        MeshHeader(), makeShared<IndexBuffer>(IndexBuffer::Primitive::POINTS, 1, false, nullptr), vertices);
+    Box box;
+    box.add(Vector3f());
+    mesh->setBounds(Bounds(box, 0.0f));
+    const auto solid = makeShared<Solid>(mesh, large);
+    solid->setParent(scene);
+    camera->setPosition(Vector3f());
+    camera->setProjectionType(Camera::ProjectionType::ORTHOGRAPHIC);
+    camera->setWidth(2.0f);
+    solid->setPosition(Vector3f(1.1f, 0, -5)); // the view ends at 1
+    renderer->setCounted(true);
+    renderFrame();
+    EXPECT_EQ(0u, renderer->getCounters().culled);
+}
+
 // Fault caught: a mirror that takes the place in a list of those before it, which are hidden and have none.
 TEST_F(CullingTest, drawsAMirrorBehindHiddenOnes)
 {

@@ -46,7 +46,9 @@ Vector4f Mesh::makeSphere(const Bounds& bounds)
 void Mesh::takeBounds(const Bounds& bounds)
 {
     m_bounds = bounds;
-    m_sphere = makeSphere(bounds);
+    // A point is larger than its place: part of it may be in the view where that is outside.
+    const bool drawsPoints = m_indexBuffer && m_indexBuffer->getPrimitive() == IndexBuffer::Primitive::POINTS;
+    m_sphere = makeSphere(drawsPoints ? Bounds() : bounds);
     const float offset = length(m_sphere.xyz());
     m_isAroundOrigin = offset <= -m_sphere.w;
     m_safeDistance =

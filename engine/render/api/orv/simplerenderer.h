@@ -93,7 +93,7 @@ public:
     ///
     /// A solid is tested by the sphere around its mesh (Mesh::getBounds()), a skinned one by spheres around
     /// what each joint moves (Mesh::getJointBounds()), so that nothing visible is left out. Solids of unknown
-    /// bounds are always drawn, and so are those whose program takes no model transform. Bounds are known for
+    /// bounds are always drawn, and so are points and those whose program takes no model transform. Bounds are known for
     /// the built-in shapes, for scene files loaded with MeshData::BOUNDS, and where Mesh::setBounds() set
     /// them; programs that move vertices need the latter. Pictures stay the same; the transform properties
     /// end up with the values of the last solid drawn.

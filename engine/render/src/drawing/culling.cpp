@@ -31,6 +31,8 @@ const ShaderProgram* getProgram(const Solid& solid)
 [[gnu::noinline]] bool hidesSkin(const Frustum& frustum, const Solid& solid, const Mesh& mesh)
 {
     const int last = std::min(solid.getJointCount(), Solid::MAX_JOINTS) - 1;
+    const IndexBuffer* const indices = mesh.getIndexBuffer().get();
+    const bool drawsPoints = indices && indices->getPrimitive() == IndexBuffer::Primitive::POINTS;
     const std::vector<Bounds>& bounds = mesh.getJointBounds();
     HullSight sight(frustum);
     for (size_t i = 0; i < bounds.size(); ++i)
@@ -41,7 +43,7 @@ const ShaderProgram* getProgram(const Solid& solid)
         const Vector4f sphere = Mesh::makeSphere(bounds[i]);
         sight.add(place(transform, sphere), sphere.w * getStretch(transform));
     }
-    return !bounds.empty() && sight.isHidden();
+    return !bounds.empty() && !drawsPoints && sight.isHidden();
 }
 
 } // namespace
