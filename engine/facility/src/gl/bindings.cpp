@@ -67,7 +67,8 @@ void Bindings::forget()
     m_arrayBuffer = UNKNOWN;
     m_elementBuffer = UNKNOWN;
     m_activeUnit = UNKNOWN;
-    std::fill(std::begin(m_textures), std::end(m_textures), UNKNOWN);
+    for (; m_usedUnits != 0; m_usedUnits &= m_usedUnits - 1u)
+        std::fill_n(m_textures + std::countr_zero(m_usedUnits) * TEXTURE_TARGETS, TEXTURE_TARGETS, UNKNOWN);
 }
 
 /// Arrays left enabled would be read by the application's own draws, perhaps from deleted buffers.
@@ -119,6 +120,8 @@ void Bindings::selectUnit(unsigned unit)
     glActiveTexture(GL_TEXTURE0 + unit);
     m_activeUnit = unit;
     m_isUsed = true;
+    if (unit < unsigned(TEXTURE_UNITS))
+        m_usedUnits |= 1u << unit;
 }
 
 void Bindings::sendArrayBuffer(unsigned name)

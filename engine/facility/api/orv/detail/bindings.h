@@ -148,6 +148,7 @@ private:
     unsigned m_arrayBuffer = UNKNOWN;
     unsigned m_elementBuffer = UNKNOWN;
     unsigned m_activeUnit = UNKNOWN;
+    uint32_t m_usedUnits = ~0u; ///< whose textures may not be UNKNOWN
     unsigned m_textures[TEXTURE_UNITS * TEXTURE_TARGETS];
 };
 
