@@ -168,12 +168,12 @@ File writeFile(const std::string& folder, int columns)
     size_t start = 0;
     for (const glo::Geometry& geometry : scene.geometries)
     {
-        const std::vector<uint8_t>& vertices = geometry.vertices.data.bytes;
+        const auto& vertices = geometry.vertices.data.bytes;
         start =
             size_t(std::search(bytes.begin() + long(start), bytes.end(), vertices.begin(), vertices.end()) -
                    bytes.begin());
         file.chunks.push_back({GL_ARRAY_BUFFER, start, vertices.size()});
-        const std::vector<uint16_t>& indices = geometry.primitiveSets[0].indices->indices;
+        const auto& indices = geometry.primitiveSets[0].indices->indices;
         const size_t indexBytes = indices.size() * sizeof(uint16_t);
         start = start + vertices.size() + 32; // the count of sets, a set and the head of its IBUF
         file.chunks.push_back({GL_ELEMENT_ARRAY_BUFFER, start, indexBytes});

@@ -11,14 +11,17 @@ namespace glo
 namespace
 {
 
-void appendWord(std::vector<uint8_t>& bytes, uint32_t word)
+/// @param Bytes  a vector of them.
+template <class Bytes>
+void appendWord(Bytes& bytes, uint32_t word)
 {
     uint8_t parts[4];
     orv::detail::writeLittleEndian(parts, word);
     bytes.insert(bytes.end(), parts, parts + 4);
 }
 
-void appendFloat(std::vector<uint8_t>& bytes, float value)
+template <class Bytes>
+void appendFloat(Bytes& bytes, float value)
 {
     uint32_t word;
     std::memcpy(&word, &value, sizeof(word));
@@ -243,7 +246,7 @@ VertexSet makeVertexSet(const std::vector<FloatAttribute>& attributes)
     }
     for (VertexAttribute& attribute : set.attributes)
         attribute.stride = stride;
-    std::vector<uint8_t>& bytes = set.data.bytes;
+    auto& bytes = set.data.bytes;
     bytes.reserve(size_t(set.vertexCount) * size_t(stride));
     for (size_t vertex = 0; vertex < set.vertexCount; ++vertex)
     {

@@ -225,7 +225,7 @@ private:
                    "the unknown primitive type " + number(set.primitive) + " is drawn as a triangle fan");
         if (!set.indices)
             return;
-        const std::vector<uint16_t>& indices = set.indices->indices;
+        const auto& indices = set.indices->indices;
         uint64_t beyond = 0;
         for (const uint16_t index : indices)
             beyond += index >= vertexCount ? 1 : 0;

@@ -341,20 +341,11 @@ bool GloReader::each(uint32_t count, std::vector<Element>& elements, Fields&& el
     return true;
 }
 
-/// Copies elements unchanged, through the stack: resizing a vector would first fill it with zeros.
 template <class Element>
-bool GloReader::readElements(std::vector<Element>& elements, uint32_t count)
+bool GloReader::readElements(RawVector<Element>& elements, uint32_t count)
 {
-    Element block[16384 / sizeof(Element)];
-    elements.reserve(count);
-    while (elements.size() < count)
-    {
-        const size_t step = std::min(count - elements.size(), std::size(block));
-        if (!readExactly(block, uint32_t(step * sizeof(Element))))
-            return false;
-        elements.insert(elements.end(), block, block + step);
-    }
-    return true;
+    elements.resize(count);
+    return readExactly(elements.data(), count * uint32_t(sizeof(Element)));
 }
 
 bool GloReader::bytes(VertexData& data)

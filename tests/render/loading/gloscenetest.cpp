@@ -391,7 +391,7 @@ TEST_F(GloSceneTest, formatsAndRadii)
         glo::VertexSet& vertices = scene.geometries[0].vertices;
         const int components = item.type == 2 ? 4 : 3;
         vertices.attributes = {{"a_position", components, item.type, 0, 0, item.normalize}};
-        vertices.data.bytes = item.vertex;
+        vertices.data.bytes.assign(item.vertex.begin(), item.vertex.end());
         vertices.vertexCount = 1;
         scene.geometries[0].primitiveSets = {{glo::primitive::POINTS, {}}};
         const Glo::Ptr loaded = expectLoad(scene, "", std::to_string(item.type));

@@ -52,6 +52,12 @@ public:
     /// (logged), nothing changes.
     void commit();
 
+    /// The same with getCount() indices elsewhere in memory, for a buffer without any. Where GL has no buffer it keeps a
+    /// copy of them.
+    /// @param indices  borrowed for the call.
+    /// @return false, after logging, if there is no memory for that.
+    ORV_LOCAL bool commit(const unsigned short* indices);
+
     /// Draws with the vertex inputs that are set up. An unknown primitive is logged and drawn as points.
     void draw();
 
@@ -79,6 +85,8 @@ public:
     unsigned int getId() const; ///< GL buffer name, 0 if there is none.
 
 private:
+    ORV_LOCAL bool upload(const unsigned short* indices);
+
     Primitive m_primitive;
     std::unique_ptr<unsigned short[]> m_indices;
     int m_count;

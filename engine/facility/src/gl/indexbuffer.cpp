@@ -47,21 +47,40 @@ IndexBuffer::~IndexBuffer() = default;
 
 void IndexBuffer::commit()
 {
-    if (!m_indices || !m_resource || !m_resource->allocate())
-        return;
+    if (m_indices && upload(m_indices.get()))
+        m_indices.reset();
+}
+
+bool IndexBuffer::commit(const unsigned short* indices)
+{
+    if (upload(indices))
+        return true;
+    m_indices.reset(new (std::nothrow) unsigned short[unsigned(m_count)]);
+    if (m_indices)
+        std::copy_n(indices, m_count, m_indices.get());
+    else
+        detail::logNoMemory(className());
+    return m_indices != nullptr;
+}
+
+/// @return false where GL has no buffer: draws go on from an array.
+bool IndexBuffer::upload(const unsigned short* indices)
+{
+    if (!m_resource || !m_resource->allocate())
+        return false;
     RenderDevice::getError(false);
     glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, getId());
-    glBufferData(GL_ELEMENT_ARRAY_BUFFER, GLsizeiptr(m_count) * 2, m_indices.get(), GL_STATIC_DRAW);
+    glBufferData(GL_ELEMENT_ARRAY_BUFFER, GLsizeiptr(m_count) * 2, indices, GL_STATIC_DRAW);
     const bool isRefused = detail::reportGLError(detail::sourcePathText<__FILE__>, __func__, __LINE__);
     glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, 0);
     detail::bindingsChanged();
-    if (isRefused) // no memory: draws go on from the array
+    if (isRefused)
     {
         m_resource->deallocate();
-        return;
+        return false;
     }
-    m_indices.reset();
     m_committed = true;
+    return true;
 }
 
 void IndexBuffer::draw()

@@ -117,7 +117,7 @@ SharedPtr<MeshGeometry> makeMeshGeometry(const PrimitiveSet& set, const SharedPt
         return {};
     if (!set.indices)
         return makeShared<MeshGeometry>(vertices, getPrimitive(set.primitive), nullptr, 0);
-    const std::vector<uint16_t>& indices = set.indices->indices;
+    const RawVector<uint16_t>& indices = set.indices->indices;
     return makeShared<MeshGeometry>(vertices, getPrimitive(set.primitive), indices.data(), indices.size());
 }
 
@@ -126,33 +126,42 @@ SharedPtr<IndexBuffer> makeIndexBuffer(IndexBufferCache& cache, const PrimitiveS
     const Primitive primitive = getPrimitive(set.primitive);
     if (!set.indices)
         return create(cache, primitive, vertexCount, nullptr);
-    const std::vector<uint16_t>& indices = set.indices->indices;
+    const RawVector<uint16_t>& indices = set.indices->indices;
     const SharedPtr<IndexBuffer> buffer =
-        cache.create(primitive, static_cast<unsigned int>(indices.size()), indices.data(), nullptr);
-    if (buffer)
-        buffer->commit();
-    return buffer;
+        create(cache, primitive, static_cast<unsigned int>(indices.size()), nullptr);
+    return buffer && buffer->commit(indices.data()) ? buffer : nullptr;
 }
 
-/// Eight at a time, in compiler vectors: this is the only work for each index of a large scene.
+/// Eight at a time, in compiler vectors: this is the only work for each index of a large scene. The highest bit is
+/// flipped, since some processors compare signed numbers only.
 bool isBelow(const uint16_t* indices, size_t count, uint16_t limit)
 {
-    typedef uint16_t Lanes __attribute__((vector_size(16)));
+    typedef int16_t Lanes __attribute__((vector_size(16)));
     constexpr size_t WIDTH = sizeof(Lanes) / sizeof(uint16_t);
-    Lanes largest = {};
+    constexpr int16_t FLIP = INT16_MIN;
+    const Lanes flip = {FLIP, FLIP, FLIP, FLIP, FLIP, FLIP, FLIP, FLIP};
+    Lanes largest = flip;
     const uint16_t* next = indices;
-    const auto takeSome = [&largest, &next ]() __attribute__((always_inline))
+    const auto takeSome = [&largest, &next, flip ]() __attribute__((always_inline))
     {
         Lanes some;
         std::memcpy(&some, next, sizeof some);
+        some ^= flip;
         largest = some > largest ? some : largest;
         next += WIDTH;
     };
-    for (size_t steps = count / (8 * WIDTH); steps > 0; --steps)
+    const auto takeMore = [&takeSome]() __attribute__((always_inline))
     {
         takeSome(), takeSome(), takeSome(), takeSome();
-        takeSome(), takeSome(), takeSome(), takeSome();
+    };
+    size_t steps = count / (16 * WIDTH);
+    if (steps > 0)
+    {
+        do
+            takeMore(), takeMore(), takeMore(), takeMore();
+        while (--steps > 0);
     }
+    largest ^= flip;
     const auto isBelowLimit = [limit](uint16_t index) { return index < limit; };
     uint16_t lanes[WIDTH];
     std::memcpy(lanes, &largest, sizeof lanes);
@@ -164,7 +173,7 @@ bool isInside(const PrimitiveSet& set, uint32_t vertexCount)
 {
     if (!set.indices)
         return true;
-    const std::vector<uint16_t>& indices = set.indices->indices;
+    const RawVector<uint16_t>& indices = set.indices->indices;
     return vertexCount > UINT16_MAX || isBelow(indices.data(), indices.size(), uint16_t(vertexCount));
 }
 
@@ -174,7 +183,7 @@ bool makeGeometry(AssetCachePool& pool, Geometry& geometry, FileVersion version,
                   MeshData wanted, GloGeometry& made)
 {
     VertexSet& vertices = geometry.vertices;
-    std::vector<uint8_t>& bytes = vertices.data.bytes;
+    RawVector<uint8_t>& bytes = vertices.data.bytes;
     std::vector<VertexBuffer::AttribDescription> descriptions;
     if (!describe(geometry, version, fileName, descriptions))
         return false;

@@ -73,7 +73,7 @@ private:
     bool skipChunk(uint32_t id, uint32_t size);
     bool readExactly(void* buffer, uint32_t size);
     template <class Element>
-    bool readElements(std::vector<Element>& elements, uint32_t count);
+    bool readElements(RawVector<Element>& elements, uint32_t count);
     bool readField(const char* label, void* buffer, uint32_t size);
     uint32_t position() const;
     uint32_t remaining() const;

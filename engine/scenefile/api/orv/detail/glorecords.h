@@ -1,6 +1,7 @@
 #pragma once
 
 #include "orv/detail/gloformat.h"
+#include "orv/detail/rawvector.h"
 #include "orv/matrix.h"
 #include "orv/vector.h"
 
@@ -48,7 +49,7 @@ struct VertexData
 {
     static constexpr uint32_t ID = chunkId("VBUF");
 
-    std::vector<uint8_t> bytes;
+    RawVector<uint8_t> bytes;
 };
 
 struct VertexSet
@@ -65,7 +66,7 @@ struct IndexData
     static constexpr uint32_t ID = chunkId("IBUF");
 
     uint32_t type = type::UINT16; ///< nothing else is accepted
-    std::vector<uint16_t> indices;
+    RawVector<uint16_t> indices;
 };
 
 struct PrimitiveSet
