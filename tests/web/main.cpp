@@ -15,12 +15,9 @@ int main(int argc, char** argv)
     {
         const char* name;
         int (*run)(int, char**);
-    } examples[] = {{"showpiece", showpiece_main},
-                    {"textpage", textpage_main},
-                    {"scripts", scripts_main},
-                    {"motionblur", motionblur_main},
-                    {"smoothmotion", smoothmotion_main},
-                    {"shadows", shadows_main}};
+    } examples[] = {{"showpiece", showpiece_main},       {"textpage", textpage_main},
+                    {"scripts", scripts_main},           {"motionblur", motionblur_main},
+                    {"smoothmotion", smoothmotion_main}, {"shadows", shadows_main}};
     for (const auto& example : examples)
     {
         if (argc > 1 && !std::strcmp(argv[1], example.name))
