@@ -64,12 +64,14 @@ int32_t FileInputStream::seek(unsigned int position)
 {
     m_isAtEnd = false;
     m_file.seekg(position, std::ios::beg);
+    m_position = toInt32(m_file.tellg());
     return tell();
 }
 
+/// Asking the file takes a call of the system.
 int32_t FileInputStream::tell() const
 {
-    return toInt32(m_file.tellg());
+    return m_file.fail() ? -1 : m_position;
 }
 
 int32_t FileInputStream::read(void* buffer, unsigned int count)
@@ -81,6 +83,7 @@ int32_t FileInputStream::read(void* buffer, unsigned int count)
     m_isAtEnd = m_file.eof();
     if (m_isAtEnd)
         m_file.clear(m_file.rdstate() & std::ios::badbit); // a short read is no failure: the stream goes on
+    m_position += int32_t(m_file.gcount());
     return int32_t(m_file.gcount());
 }
 

@@ -24,8 +24,9 @@ public:
     int32_t write(const void* buffer, unsigned int count) override;
 
 private:
-    mutable std::ifstream m_file; ///< asking a standard stream for its position is not const
+    std::ifstream m_file;
     int32_t m_size = 0;
+    int32_t m_position = 0; ///< -1 if it does not fit
     bool m_isAtEnd = false;
 };
 
