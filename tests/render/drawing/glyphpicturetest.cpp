@@ -69,7 +69,7 @@ private:
 class GlyphPictureTest : public SceneTest
 {
 protected:
-    /// Holds every so many glyphs of a font against FreeType's.
+    /// Compares each step-th glyph of a font with FreeType's.
     void compareWithFreeType(const std::string& path, unsigned step)
     {
         const int ALLOWED = 96; // of 255, where curves are cut into straight lines, or contours overlap

@@ -27,12 +27,12 @@ public:
         times.insert(times.end(), {getStart(), getEnd()});
     }
 
-    /// Whether applying this applies other: true for itself, for a group also for its members' members. A class that
-    /// holds further animations asks them.
+    /// Whether applying this applies other: true for itself, for a group also for its members and their members. A class
+    /// that holds animations has to override it.
     virtual bool contains(const Animation& other) const { return this == &other; }
 
-    /// apply() as a controller wants it that was asked for smooth motion. An animation that does not know of it (this one)
-    /// is applied with a weight of a half or more, and not at all on a subtree.
+    /// apply() for a controller with smooth motion. Without an override, the animation is applied with a weight of a half or
+    /// more, and never for a subtree.
     virtual void applyMixed(float progress, const AnimationMix& mix)
     {
         if (mix.isMostly())

@@ -17,9 +17,10 @@ public:
 
     virtual void apply(const T& value) = 0; ///< Sets what it stands for to a value.
 
-    /// Writes what lies share of the way between two keys' values, as a controller wants it that was asked for smooth
-    /// motion. An animator that does not override this writes with a weight of a half or more, and not at all on a
-    /// subtree; the value lies straight between the two (for types of your own, it is the first).
+    /// Writes a value between those of two keys, for a controller with smooth motion. Without an override it writes with
+    /// a weight of a half or more, and never for a subtree; the value is interpolated linearly (for types of your own it
+    /// is the first one).
+    /// @param share  0 to 1, from the first value to the second.
     virtual void applyMixed(const T& from, const T& to, float share, const AnimationMix& mix)
     {
         if (!mix.isMostly())
