@@ -53,7 +53,7 @@ FontBytes CffIndex::get(unsigned number) const
     return start >= 1 && start <= end ? data.part(start, end - start) : makeUnsound();
 }
 
-/// Of what a dictionary says, what leads to programs: places in the table, 0 for nowhere.
+/// The entries of a dictionary that lead to programs: offsets in the table, 0 for none.
 struct CffTable::Dictionary
 {
     uint32_t programs = 0;
@@ -62,10 +62,10 @@ struct CffTable::Dictionary
     uint32_t selection = 0;
     uint32_t privateSize = 0;
     uint32_t privateAt = 0;
-    uint32_t subroutines = 0; ///< from privateAt on
+    uint32_t subroutines = 0; ///< relative to privateAt
 };
 
-/// Numbers, and behind them the operator that they belong to.
+/// Operands come before their operator.
 bool CffTable::readDictionary(FontBytes bytes, Dictionary& dictionary)
 {
     const unsigned ESCAPE = 12, WORD = 28, LONG = 29, REAL = 30;
@@ -145,7 +145,7 @@ const char* CffTable::read(FontBytes table)
     return at != 0 && m_programs.read(table, at) && readParts(table, top) ? nullptr : DAMAGED;
 }
 
-/// A font for many scripts is in parts, with subroutines for each.
+/// A font of many scripts has parts, each with its own subroutines.
 bool CffTable::readParts(FontBytes table, const Dictionary& top)
 {
     m_local.resize(1);

@@ -7,41 +7,41 @@
 namespace orv::detail
 {
 
-/// A numbered list of stretches of bytes, as PostScript outlines have them for programs and dictionaries.
+/// An INDEX: a numbered list of byte ranges, used for programs and dictionaries.
 class CffIndex
 {
 public:
-    /// @param at  where the list begins in the table; moved behind it.
-    /// @return false if it does not end within the table.
+    /// @param at  in: where the list begins in the table; out: its end.
+    /// @return false if the list ends beyond the table.
     bool read(FontBytes table, std::size_t& at);
 
     unsigned getCount() const { return m_count; }
 
-    /// @return an unsound stretch for a number that is not there, or one that lies outside of the list.
+    /// @return unsound bytes for a number or a range outside of the list.
     FontBytes get(unsigned number) const;
 
 private:
     std::size_t readOffset(FontBytes& offsets, unsigned number) const;
 
     FontBytes m_offsets;
-    FontBytes m_data; ///< from the byte before the first, since offsets count from 1
+    FontBytes m_data; ///< begins one byte early, since offsets count from 1
     unsigned m_count = 0;
     unsigned m_offsetSize = 1;
 };
 
-/// The table "CFF ", version 1: a program for each glyph, in the font's own units, and the subroutines that they call.
+/// The table "CFF ", version 1: a program for each glyph, in the font's own units, and their subroutines.
 ///
-/// Whatever the file says, nothing outside of the table is read, and reading it takes no longer than its size accounts for.
+/// Nothing outside of the table is read, and the time is linear in its size.
 class CffTable
 {
 public:
-    /// @return null, or what is wrong, for a log.
+    /// @return null, or the fault.
     const char* read(FontBytes table);
 
-    /// A program, and what it may call.
+    /// A program and the subroutines that it may call.
     struct Program
     {
-        FontBytes bytes; ///< unsound if the glyph is not there
+        FontBytes bytes; ///< unsound for a missing glyph
         const CffIndex* global = nullptr;
         const CffIndex* local = nullptr; ///< null: none
     };
@@ -58,8 +58,8 @@ private:
 
     CffIndex m_programs;
     CffIndex m_global;
-    std::vector<CffIndex> m_local; ///< for each part of the font; a font that is in one piece has one
-    FontBytes m_selection;         ///< which part a glyph belongs to: nothing if there is one
+    std::vector<CffIndex> m_local; ///< one for each part of the font
+    FontBytes m_selection;         ///< the part of each glyph; empty if there is only one
     unsigned m_selectionFormat = 0;
 };
 

@@ -23,8 +23,8 @@ namespace orv::detail
 namespace
 {
 
-constexpr float MOST_REACH = 16384.0f; ///< pixels from the pen; the rasteriser keeps places in 16 bits
-constexpr float FLATNESS = 0.35f;      ///< pixels by which edges may miss the curve
+constexpr float MOST_REACH = 16384.0f; ///< pixels from the pen; the rasteriser keeps positions in 16 bits
+constexpr float FLATNESS = 0.35f;      ///< the most pixels between a curve and its edges
 
 /// A rectangle in the font's own units.
 struct Box
@@ -43,14 +43,14 @@ struct Box
     float getSides() const { return getWidth() + getHeight(); }
 };
 
-/// What one glyph draws.
+/// The outline of a glyph.
 struct Shape
 {
     Box box;
-    std::vector<stbtt_vertex> points; ///< none: a blank
+    std::vector<stbtt_vertex> points; ///< empty for a blank
 };
 
-/// Into how many edges a curve is cut, at most.
+/// The most edges that the rasteriser makes of a curve.
 float countEdges(const stbtt_vertex& from, const stbtt_vertex& to, float scale)
 {
     const float ROUNDING = 1024.0f;
@@ -59,8 +59,8 @@ float countEdges(const stbtt_vertex& from, const stbtt_vertex& to, float scale)
         return 1.0f + 2.0f * std::sqrt(0.25f * measure(from.x - 2 * to.cx + to.x, from.y - 2 * to.cy + to.y));
     if (to.type != STBTT_vcubic)
         return 1.0f;
-    // Each halving leaves a quarter of the bend. The rasteriser stops where the squares of the way along the control points
-    // and of the straight way are near enough. They differ by at most 6 squares of the bend, and by what is rounded off.
+    // Each halving leaves a quarter of the bend. The rasteriser stops when the squared lengths of the control polygon and of
+    // the chord are close. They differ by at most 6 squares of the bend, and by rounding.
     const float bend = std::max(measure(from.x - 2 * to.cx + to.cx1, from.y - 2 * to.cy + to.cy1),
                                 measure(to.cx - 2 * to.cx1 + to.x, to.cy - 2 * to.cy1 + to.y));
     const float way = measure(to.cx - from.x, to.cy - from.y) + measure(to.cx1 - to.cx, to.cy1 - to.cy) +

@@ -12,7 +12,7 @@ constexpr const char* DAMAGED_OUTLINE = "a glyph's outline is damaged";
 constexpr const char* TOO_COMPLICATED = "its outline is too complicated";
 constexpr int64_t ONE = 65536;
 
-/// Added to the number by which a subroutine is called: short programs have small numbers.
+/// Added to the operand of a call, so that small operands reach more subroutines.
 int getBias(unsigned count)
 {
     return count < 1240 ? 107 : count < 33900 ? 1131 : 32768;
@@ -39,7 +39,7 @@ void GlyphProgram::fail(const char* fault)
     m_fault = m_fault ? m_fault : fault;
 }
 
-/// A number or a command. A program or subroutine that ends without saying so is taken as if it did.
+/// Reads a number or a command. A program or subroutine may end without endchar or return.
 void GlyphProgram::step()
 {
     const unsigned WORD = 28, FIRST_NUMBER = 32;
@@ -82,7 +82,7 @@ void GlyphProgram::readNumber(unsigned first)
         fail(DAMAGED_OUTLINE);
 }
 
-/// What is no call and no return uses up all operands.
+/// Every command but call and return uses all operands.
 void GlyphProgram::perform(unsigned command)
 {
     switch (command)
@@ -143,7 +143,7 @@ void GlyphProgram::addStems()
     m_stems += m_count / 2;
 }
 
-/// A bit for each stem. The last stems are those of the numbers before the first mask.
+/// The mask has a bit for each stem. Operands before the first mask are stems too.
 void GlyphProgram::skipMask()
 {
     addStems();
@@ -160,7 +160,7 @@ bool GlyphProgram::needs(unsigned count)
     return m_count >= count;
 }
 
-/// The first move may have the glyph's width in front, which is known from elsewhere.
+/// The first move may have an extra operand in front, the glyph's width, which is not used.
 void GlyphProgram::drawMove(unsigned count, bool isUpright)
 {
     if (!needs(count))
@@ -196,7 +196,7 @@ void GlyphProgram::drawCurves(unsigned end)
     }
 }
 
-/// Curves that begin along one axis and end along the other, in turns; the last one may end askew.
+/// Curves that begin along one axis and end along the other, alternating; the last may end at any angle.
 void GlyphProgram::drawAxisCurves(bool isUpright)
 {
     for (; m_next + 4 <= m_count; m_next += 4)
@@ -211,7 +211,7 @@ void GlyphProgram::drawAxisCurves(bool isUpright)
     }
 }
 
-/// Curves that begin and end along the same axis; the first one may begin askew.
+/// Curves that begin and end along the same axis; the first may begin at any angle.
 void GlyphProgram::drawTangentCurves(bool isUpright)
 {
     int64_t askew = m_count % 2 == 1 ? m_operands[m_next++] : 0;
@@ -226,7 +226,7 @@ void GlyphProgram::drawTangentCurves(bool isUpright)
     }
 }
 
-/// What is known of these are pairs of curves that are nearly a line.
+/// Of these commands the four flexes are supported: pairs of curves that are nearly a line.
 void GlyphProgram::performEscaped()
 {
     Call& now = m_calls[m_depth];
@@ -250,7 +250,7 @@ void GlyphProgram::performEscaped()
         fail(DAMAGED_OUTLINE);
 }
 
-/// The last point is as high, or as far to the right, as the first: whichever is the shorter way.
+/// The last point returns to the first one's y if the flex is wider than high, else to its x.
 void GlyphProgram::drawLongFlex()
 {
     const int64_t* const d = m_operands.data();
@@ -261,7 +261,7 @@ void GlyphProgram::drawLongFlex()
     addCurve(d[6], d[7], d[8], d[9], isLevel ? d[10] : -dx, isLevel ? -dy : d[10]);
 }
 
-/// Where the pen is when something is drawn.
+/// Begins a contour at the pen, unless one has begun.
 void GlyphProgram::beginContour()
 {
     if (!m_isOpen)
@@ -294,7 +294,7 @@ void GlyphProgram::addCurve(int64_t dx1, int64_t dy1, int64_t dx2, int64_t dy2, 
         {OutlineStep::Kind::CURVE, round(m_x), round(m_y), round(x1), round(y1), round(x2), round(y2)});
 }
 
-/// To a unit of the font; what is beyond 16 bits is a fault.
+/// To units of the font. A result beyond 16 bits is a fault.
 int16_t GlyphProgram::round(int64_t fixed)
 {
     const int64_t rounded = (fixed + ONE / 2) >> 16;

@@ -20,19 +20,19 @@ struct OutlineStep
     };
     Kind kind;
     int16_t x, y;
-    int16_t x1, y1; ///< of a curve, the control point next to where it begins
+    int16_t x1, y1; ///< of a curve: the first control point
     int16_t x2, y2;
 };
 
-/// Runs the program of a glyph (a Type 2 charstring) and notes the outline that it draws.
+/// Runs the program of a glyph (a Type 2 charstring) and records the outline that it draws.
 ///
-/// Subroutines call others ten deep, so that a few bytes can ask for any number of steps: those are counted, and so are points.
-/// Hints are passed over. Arithmetic in programs, and letters put together with accents by four numbers at the end, are faults:
-/// of 208 fonts that were tried none has them.
+/// Subroutines can be nested ten deep, so a few bytes can ask for any number of steps: steps and points are limited.
+/// Hints are skipped. Arithmetic operators and accented letters composed by endchar count as faults: none of the 208 fonts
+/// that were tried has them.
 class GlyphProgram
 {
 public:
-    /// @param steps  filled in; its memory is used again. Each contour begins with a move.
+    /// @param steps  receives the outline; its memory is reused. Each contour begins with a move.
     /// @return null, or why there is no outline.
     const char* run(const CffTable::Program& program, std::vector<OutlineStep>& steps);
 
@@ -44,9 +44,8 @@ private:
     };
 
     static constexpr unsigned MOST_OPERANDS = 48;
-    static constexpr unsigned MOST_CALLS = 11; ///< the glyph's own included
-    static constexpr unsigned MOST_STEPS =
-        32768; ///< the most that a font took of those that were tried: 6,923
+    static constexpr unsigned MOST_CALLS = 11;    ///< including the glyph's program
+    static constexpr unsigned MOST_STEPS = 32768; ///< the fonts that were tried need up to 6,923
     static constexpr std::size_t MOST_POINTS = 16384;
 
     void step();
@@ -73,15 +72,15 @@ private:
     CffTable::Program m_program;
     std::vector<OutlineStep>* m_steps = nullptr;
     const char* m_fault = nullptr;
-    std::array<int64_t, MOST_OPERANDS> m_operands = {}; ///< 65536 to the unit, as are the pen's
-    unsigned m_count = 0;                               ///< of operands
-    unsigned m_next = 0;                                ///< of them, the first that is not used up
+    std::array<int64_t, MOST_OPERANDS> m_operands = {}; ///< 16.16 fixed point, as are m_x and m_y
+    unsigned m_count = 0;                               ///< operands
+    unsigned m_next = 0;                                ///< the first unused operand
     std::array<Call, MOST_CALLS> m_calls = {};
     unsigned m_depth = 0;
     unsigned m_stems = 0;
     unsigned m_stepsDone = 0;
     int64_t m_x = 0, m_y = 0;
-    bool m_isOpen = false; ///< a contour has been begun
+    bool m_isOpen = false; ///< a contour has begun
     bool m_isFinished = false;
 };
 
