@@ -137,6 +137,15 @@ protected:
         point(*camera, Vector3f(), Vector3f(0, 0, -1));
     }
 
+    /// The stage with a cube over its middle, and light from the upper right.
+    void makeCubeInSlantedLight(const SharedPtr<Appearance>& material)
+    {
+        makeStage(material);
+        addCube(Vector3f(0, 2, 0), Vector3f(1, 1, 1), material);
+        light->setPosition(Vector3f(3, 3, 0));
+        point(*light, Vector3f());
+    }
+
     static support::Rgba at(const Picture& picture, float x, float z)
     {
         return picture.pixel(32 + int(std::floor(x * 4.0f)), 32 + int(std::floor(z * 4.0f)));
@@ -533,10 +542,7 @@ TEST_F(ShadowTest, framesCostWhatTheyShow)
 {
     const auto white = makeWhite("orv#max_ppl.sp$DIFF");
     const auto before = white->getShaderProgram();
-    makeStage(white);
-    addCube(Vector3f(0, 2, 0), Vector3f(1, 1, 1), white);
-    light->setPosition(Vector3f(3, 3, 0));
-    point(*light, Vector3f());
+    makeCubeInSlantedLight(white);
     renderFrame();
     const Picture plain = support::readFrame();
     makeShadows();
@@ -566,10 +572,7 @@ TEST_F(ShadowTest, mapsTakeTurns)
 {
     const auto white = makeWhite("orv#max_ppl.sp$DIFF");
     const auto before = white->getShaderProgram();
-    makeStage(white);
-    addCube(Vector3f(0, 2, 0), Vector3f(1, 1, 1), white);
-    light->setPosition(Vector3f(3, 3, 0));
-    point(*light, Vector3f());
+    makeCubeInSlantedLight(white);
     makeShadows();
     const Picture first = drawShadowed();
     const ShadowMap::Ptr next = makeShared<ShadowMap>(renderContext, pool, 1024);
