@@ -29,6 +29,9 @@ endif()
 # Keeps the build folder out of debug information, and so out of the build ID: see docs/releasing.md.
 # The folders of the tools use these as well.
 set(ORV_PREFIX_MAPS "-fdebug-prefix-map=${PROJECT_SOURCE_DIR}/=" "-fdebug-prefix-map=${PROJECT_BINARY_DIR}=build")
+if(CMAKE_CXX_COMPILER_ID STREQUAL GNU) # its assembler names the folder itself, and build IDs depend on that
+    list(APPEND ORV_PREFIX_MAPS "-Wa,--debug-prefix-map=${PROJECT_BINARY_DIR}=build")
+endif()
 target_compile_options(orv_engine_options INTERFACE ${ORV_PREFIX_MAPS})
 target_link_options(orv_engine_options INTERFACE ${ORV_PREFIX_MAPS})
 
