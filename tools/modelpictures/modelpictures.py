@@ -37,8 +37,8 @@ PAIRS = (
     Pair("boxtextured", "glTF2/BoxTextured-glTF/BoxTextured.gltf", "blender", "glTF 2.0, textured",
          "The same. Cycles softens with 16 samples a pixel, the engine with four along edges."),
     Pair("engine", "glTF2/2CylinderEngine-glTF-Binary/2CylinderEngine.glb", "blender", "GLB, 83 nodes, 35 materials",
-         "Every part in its place and colour. Parts that face away from the lamps are darker in Blender, where other parts "
-         "shade them."),
+         "Every part in its place and colour. The gaps between the ribs are darker in Blender, where parts shade each "
+         "other."),
     Pair("clearcoat", "glTF2/ClearCoat-glTF/ClearCoatTest.gltf", "blender", "glTF 2.0, normal maps, a blended material",
          "Colours and bumps agree. The report lists the clear coats as lost. In Blender they are all that the third "
          "column shows; here it is black except for highlights, and the background shows through the second one."),
@@ -52,8 +52,7 @@ PAIRS = (
     Pair("simpleskin", "glTF2/simple_skin/simple_skin.gltf", "blender", "glTF 2.0, skin, animated, at 1 s",
          "The same bend at the same time. Brighter here: the lamp faces the flat sheet.", 1.0),
     Pair("tentacle", "(made)", "blender", "glTF 2.0, skin of 30 joints, animated, at 1 s",
-         "The same curve, here in two parts because of the limit of 20 joints, without a seam. The engine's highlight for "
-         "a roughness of 0.6 is narrower than that of Cycles.", 1.0),
+         "The same curve in the same shades, here in two parts because of the limit of 20 joints, without a seam.", 1.0),
     Pair("morphcube", "glTF2/glTF-Sample-Models/AnimatedMorphCube-glTF/AnimatedMorphCube.gltf", "blender",
          "glTF 2.0, morph targets", "The same shape at rest. While the animation plays, one mesh for each shape is shown "
          "in turn."),
@@ -77,8 +76,8 @@ PAIRS = (
     Pair("human", "Collada/human.zae", "blender", "Collada in an archive, 28,796 triangles",
          "The same shape. Paler in Blender: the file's colours again."),
     Pair("vertexcolours", "Collada/kwxport_test_vcolors.dae", "blender", "Collada, three materials, vertex colours",
-         "The pictures have the same orientation. Brighter here: the file has a strong highlight, which Blender does not "
-         "read. The vertex colours are kept but not shown, as the report says."),
+         "The pictures have the same orientation. Here the file's vertex colours (red, white, green) multiply them; "
+         "Blender's reader ignores those."),
     Pair("spiderobj", "OBJ/spider.obj", "blender", "OBJ, 6 materials, 4 pictures",
          "The same pictures in the same places."),
     Pair("manyvertices", "(made)", "blender", "OBJ, 102,400 vertices in one mesh",
@@ -307,19 +306,20 @@ def write_page(page):
 
 INTRODUCTION = """# Other people's models beside another renderer
 
-Made by `./run modelpictures`: models of Debian's `assimp-testmodels`, and some made by the script where it has none of a kind. On the left the picture
-by `orv-convert` and `orv-view`, on the right the same file from the same viewpoint,
+Made by `./run modelpictures`: models of Debian's `assimp-testmodels`, and some made by the script where it has none of
+a kind. On the left the picture by `orv-convert` and `orv-view`, on the right the same file from the same viewpoint,
 
-- by **Blender** 3.4, its own readers (or those of OpenCOLLADA) and Cycles, with two lamps and a grey sky in place of the
-  file's lights;
+- by **Blender** 3.4, its own readers (or those of OpenCOLLADA) and Cycles, with two lamps and a grey sky in place of
+  the file's lights;
 - by **f3d**, VTK's own readers and renderer, for what Blender does not read.
 
-Neither uses libassimp for these files. Blender lights in linear light and shows sRGB, the engine lights in sRGB values; so
-slanted surfaces are brighter in Blender. The texts were written after looking at each pair.
+Neither uses libassimp for these files. Blender lights in linear light and shows sRGB. So does the engine for glTF; other
+formats are lit in sRGB values, and slanted surfaces are darker than in Blender. The texts were written after looking at
+each pair.
 
-These pairs showed faults, now mended: glTF texture transforms turned around a wrong point, linear glTF colours read as sRGB,
-STL normals of no length or pointing to the back, Collada exponents below 1 drawn as highlights all over, and SMD files that
-lay on their backs.
+These pairs showed faults, now mended: glTF texture transforms turned around a wrong point, linear glTF colours read as
+sRGB, STL normals of no length or pointing to the back, Collada exponents below 1 drawn as highlights all over, and SMD
+files that lay on their backs.
 """
 
 
