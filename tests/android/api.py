@@ -1,7 +1,6 @@
-"""Holds what Java classes use of Android against declarations of Android that others made: the npm package
-@nativescript/types-android, which its authors generate from Android's own class files. They are TypeScript, so that all kinds of
-numbers are one there; names, classes, results, what is static, values of constants and the level that something came with are
-compared.
+"""Compares what Java classes use of Android with the declarations of the npm package @nativescript/types-android, which its
+authors generate from Android's own class files. The declarations are TypeScript, which has one type for all numbers. Compared are
+names, classes, parameters, results, what is static, the values of constants, and the level at which something was added.
 """
 import pathlib
 import re
@@ -10,7 +9,6 @@ import sys
 
 NUMBERS = {"int", "long", "float", "double", "short", "byte", "char"}
 PLATFORM = re.compile(r"(?:android|javax/microedition)/")
-# What the declarations leave out: types of the platform that are no more than a mark there.
 MEMBER = re.compile(r"public (static )?(?:constructor|(\w+))(\(.*\))?(?:: (.*?))?;$")
 
 
@@ -85,7 +83,7 @@ class Android:
         self.used = 0
 
     def ancestors(self, name):
-        """A type and all that it is; empty where it is not declared."""
+        """@return a type and all types that it derives from; nothing if it is not declared."""
         found, queue = [], [name]
         while queue:
             name = queue.pop(0)
@@ -103,7 +101,7 @@ class Android:
                 [simple(part) for part in found] == parameters
             if alike and (static is None or is_static == static) and (found is None or simple(returned) == result or member == "<init>"):
                 if since > self.level:
-                    return f"there from level {since}"
+                    return f"added at level {since}"
                 self.used += 1
                 return None
         shown = "; ".join(f"{'static ' if entry[0] else ''}{entry[1]}: {entry[2]}" for entry in candidates)
@@ -147,7 +145,7 @@ def read_own(said):
 
 
 def check_overrides(android, java, own, standin):
-    """What our classes take over from the platform's has to be there as the stand-ins have it."""
+    """The platform must have each method that our classes override, as the stand-ins declare it."""
     for name, bases in own.items():
         for base in bases if not name.endswith("!") else []:
             binary = base.replace("/", ".")
@@ -162,7 +160,7 @@ def check_overrides(android, java, own, standin):
 
 
 def check_constants(android, said):
-    """The compiler copies constants of the stand-ins into our classes: their values have to be Android's."""
+    """The compiler copies constants of the stand-ins into our classes, so their values must be Android's."""
     count = 0
     for part in re.split(r"(?m)^Classfile ", said)[1:]:
         owner = re.search(r"this_class: #\d+\s+// (\S+)", part).group(1)
@@ -181,7 +179,7 @@ def check_constants(android, said):
 
 
 def check(java, classes, standin, package, level):
-    """@return a line that says how much was compared; ends the program where something differs."""
+    """@return a line that says how much was compared. Ends the program if something differs."""
     file = next(iter(pathlib.Path(package).glob("lib/android/android-platform-*merged.d.ts")))
     android = Android(read_declarations(file), level)
     said = javap(java, classes, *class_names(classes))
@@ -191,4 +189,4 @@ def check(java, classes, standin, package, level):
     faults += sorted(check_constants(android, javap(java, standin, *class_names(standin))))
     if faults or used < 60:
         sys.exit("\n".join(faults) + f"\n{len(faults)} differences from {file.name}, {used} uses compared")
-    return f"{used} uses of Android's classes are declared as such by {file.name}, at level {level}; constants have its values."
+    return f"{used} uses of Android's classes are declared as such by {file.name}, at level {level}; the constants have its values."

@@ -1,12 +1,12 @@
 #!/usr/bin/env python3
-"""The application for Android, as far as Linux takes it.
+"""Checks the application for Android, as far as Linux can.
 
     check.py [--only-package] BUILD ANDROIDBUILD MODELS [TYPES]
 
 Packs the resources and the manifest, compiles the Java sources against the stand-ins for Android's classes, aligns and signs
-the package. Unless that is all: holds what the Java sources use against what TYPES declares of Android (the folder of the
-npm package @nativescript/types-android), compiles the native sources with Clang too, and runs the application's Java on
-this machine's virtual machine with the native side of ANDROIDBUILD. BUILD has the converter and the viewer, MODELS is the
+the package. Without --only-package, it also compares what the Java sources use of Android with the declarations in TYPES (the
+folder of the npm package @nativescript/types-android), compiles the native sources with Clang, and runs the application's
+Java on this machine's virtual machine with the native side of ANDROIDBUILD. BUILD has the converter and the viewer, MODELS is the
 folder of models that other people made. Exit code 1 if anything fails.
 """
 import argparse
@@ -33,7 +33,7 @@ PASSWORD = "pass:throwaway"
 
 
 def run(*command, **options):
-    """Prints what it says and ends everything where it fails."""
+    """@return the output. Ends this script with the output if the command fails."""
     done = subprocess.run([str(part) for part in command], stdout=subprocess.PIPE, stderr=subprocess.STDOUT, text=True, **options)
     if done.returncode != 0:
         sys.exit(f"{shlex.join(str(part) for part in command)}\n{done.stdout}\nexit code {done.returncode}")
@@ -57,7 +57,7 @@ def compile_java(folder, classpath, files, release, lint="all"):
 
 
 class Package:
-    """What is made of the application, in a folder."""
+    """The application's package, made in a folder."""
 
     def __init__(self, folder):
         self.folder = folder
@@ -75,7 +75,7 @@ class Package:
         self.sign()
 
     def pack(self):
-        """The manifest gets what Gradle puts into it."""
+        """Adds to the manifest what Gradle would add."""
         manifest = self.folder / "AndroidManifest.xml"
         manifest.write_text((MAIN / "AndroidManifest.xml").read_text().replace(
             "<manifest ", f'<manifest package="{gradle("namespace")}" ', 1))
@@ -86,7 +86,7 @@ class Package:
             "-o", self.folder / "unaligned.apk", self.folder / "resources.zip")
 
     def sign(self):
-        """With a key that nobody keeps."""
+        """With a key that is made and deleted here."""
         aligned, key = self.folder / "aligned.apk", self.folder / "throwaway.keystore"
         run("zipalign", "-p", "4", self.folder / "unaligned.apk", aligned)
         run("zipalign", "-c", "-p", "4", aligned)
@@ -106,11 +106,11 @@ class Package:
         with zipfile.ZipFile(self.signed) as archive:
             for entry in archive.infolist():
                 print(f"  {entry.file_size:8} {entry.filename}")
-        print(f"{self.signed}: {self.signed.stat().st_size} bytes, without classes.dex and the native library: they take Android's own tools.")
+        print(f"{self.signed}: {self.signed.stat().st_size} bytes, without classes.dex and the native library, which only Android's own tools can make.")
 
 
 def compare_scene(build, folder):
-    """The scene that the package shows first is what the converter makes of the sample."""
+    """Ends this script if the package's first scene is not what the converter makes of the sample."""
     made = folder / "windmill.glo"
     run(build / "tools/convert/orv-convert", ROOT / "samples/windmill/windmill.gltf", made)
     if made.read_bytes() != (MAIN / "assets/windmill.glo").read_bytes():
@@ -118,7 +118,7 @@ def compare_scene(build, folder):
 
 
 def compile_native(androidbuild):
-    """The sources for Android alone with Clang as well, by the flags of the build."""
+    """Compiles the sources for Android with Clang as well, with the flags of the build."""
     count = 0
     for entry in json.loads((androidbuild / "compile_commands.json").read_text()):
         if not re.search("platforms/android/|pss/src/android/|tools/stage/", entry["file"]):
@@ -129,13 +129,13 @@ def compile_native(androidbuild):
         flags = [flag for flag in flags[1:] if not re.match("-fno-align|-ffat-lto|-fno-inline-functions", flag)]
         run("clang++", "-fsyntax-only", "-Werror", *flags, cwd=entry["directory"])
         count += 1
-    print(f"Clang takes the {count} native sources as well.")
+    print(f"Clang compiles the {count} native sources as well.")
     if count < 10:
-        sys.exit("compile_commands.json has too few of them")
+        sys.exit("compile_commands.json has too few native sources")
 
 
 def check_exports(androidbuild, classes):
-    """Every native function of the Java class, and nothing else."""
+    """Ends this script unless the library exports every native function of the Java class and nothing else."""
     said = run(JAVA / "javap", "-p", "-cp", classes, "orv.viewer.NativeViewer")
     wanted = {f"Java_orv_viewer_NativeViewer_{name}" for name in re.findall(r" native .*?(\w+)\(", said)}
     said = run("nm", "-D", "--defined-only", androidbuild / "application/liborvviewer.so")

@@ -1,4 +1,4 @@
-// On a device the asset manager of Java holds one of libandroidfw. The stand-in for it has the path of a package.
+// On a device, Java's asset manager wraps one of libandroidfw. The stand-in for Java's has the path of a package.
 
 #include <android/asset_manager_jni.h>
 #include <androidfw/AssetManager.h>

@@ -1,4 +1,4 @@
-// What standin.Gl calls: OpenGL ES without a window, current on the thread that asks for it.
+// The native functions of standin.Gl: OpenGL ES without a window, on the calling thread.
 
 #include "headless/headless.h"
 
@@ -17,7 +17,7 @@ extern "C"
         headless::Options options;
         options.width = width;
         options.height = height;
-        options.samples = 4; // as orv-view has it, whose pictures are compared with
+        options.samples = 4; // as orv-view, whose pictures are compared
         std::string error;
         std::unique_ptr<headless::Context> context = headless::Context::create(options, error);
         if (!context)

@@ -26,18 +26,18 @@ import java.util.concurrent.Callable;
 import standin.Gl;
 import standin.MainThread;
 
-/** The application as the system runs it: its life, fingers, files of other applications, the drawing thread. */
+/** The application as the system runs it: its life cycle, touches, files of other applications, the GL thread. */
 final class ActivityChecks {
     static void runAll() throws Exception {
         check("it starts with the package's scene, which plays, pauses and rests", ActivityChecks::start);
-        check("fingers turn, move and pinch, two taps bring the picture back", ActivityChecks::fingers);
+        check("fingers turn, move and pinch; two taps restore the picture", ActivityChecks::fingers);
         check("pausing keeps the picture, with the context or without", ActivityChecks::pauses);
         check("a file chosen while paused is shown on return, with a new context", ActivityChecks::choose);
         check("a file and its picture of another application", ActivityChecks::viewIntents);
         check("what cannot be read or shown gets a message, and the next good file is shown", ActivityChecks::badFiles);
-        check("names of other applications lead nowhere else", ActivityChecks::badNames);
-        check("made anew by the system, it shows what it showed", ActivityChecks::madeAnew);
-        check("nothing is left alive", ActivityChecks::nothingLeft);
+        check("names given by other applications lead to no other folder", ActivityChecks::badNames);
+        check("created again by the system, it shows the same scene", ActivityChecks::createdAgain);
+        check("no thread and no asset is left", ActivityChecks::nothingLeft);
     }
 
     private static final class Running implements AutoCloseable {
@@ -57,7 +57,7 @@ final class ActivityChecks {
         public void close() throws Exception {
             MainThread.run(activity::standInPause);
             MainThread.run(activity::standInDestroy);
-            view.queueEvent(view::togglePaused); // too late, and harmless
+            view.queueEvent(view::togglePaused); // an event after the end does no harm
             view.standInDetach();
         }
 
@@ -119,7 +119,7 @@ final class ActivityChecks {
             }
             Thread.sleep(20);
         }
-        throw new AssertionError("waited in vain");
+        throw new AssertionError("waited too long");
     }
 
     private static Uri give(String uri, String name, byte[] content) {
@@ -225,17 +225,17 @@ final class ActivityChecks {
         GLSurfaceView.standInLosesContexts = false;
     }
 
-    // Fault caught: loading as soon as the answer is there, when no context is current.
+    // Fault caught: a file loaded as soon as it is chosen, while no context is current.
     private static void choose() throws Exception {
         GLSurfaceView.standInLosesContexts = true;
         try (Running running = new Running(new Intent("android.intent.action.MAIN"), null)) {
             running.waitForScene("windmill.glo");
             running.click(0);
-            expect(running.activity.standInQuestion != null, "nobody was asked");
+            expect(running.activity.standInQuestion != null, "no chooser of files was started");
             running.pause();
             Intent answer = duck();
             MainThread.run(() -> running.activity.standInAnswer(1, Activity.RESULT_OK, answer));
-            Thread.sleep(200); // the copying goes on while it is paused
+            Thread.sleep(200); // files are copied while the application is paused, too
             running.resume();
             running.waitForScene("duck.glo");
             expectSame(readPicture("duck.png"), running.picture(), "what was chosen");
@@ -261,6 +261,9 @@ final class ActivityChecks {
     private static void badFiles() throws Exception {
         try (Running running = new Running(view(Uri.parse("content://other/refused")), null)) {
             expect(running.waitForMessage().contains("cannot be read: gone"), running.message());
+            Uri throwing = give("content://other/5", "throwing.glo", null);
+            MainThread.run(() -> running.activity.standInNewIntent(view(throwing)));
+            waitFor(() -> running.message().contains("throwing.glo: cannot be read: not now"));
             byte[] half = java.util.Arrays.copyOf(readFile("windmill.glo"), 3000);
             Uri damaged = give("content://other/3", "half.glo", half);
             MainThread.run(() -> running.activity.standInNewIntent(view(damaged)));
@@ -287,7 +290,7 @@ final class ActivityChecks {
         expect(!Files.exists(opened.toPath().resolve("../../evil.glo")), "a file outside of the folder");
     }
 
-    private static void madeAnew() throws Exception {
+    private static void createdAgain() throws Exception {
         Bundle state = new Bundle();
         byte[] before;
         try (Running running = new Running(duck(), null)) {
@@ -297,7 +300,7 @@ final class ActivityChecks {
         }
         try (Running running = new Running(new Intent("android.intent.action.MAIN"), state)) {
             running.waitForScene("duck.glo");
-            expectSame(before, running.picture(), "made anew");
+            expectSame(before, running.picture(), "created again");
         }
     }
 

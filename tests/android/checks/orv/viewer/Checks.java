@@ -13,10 +13,10 @@ import javax.imageio.ImageIO;
 import java.awt.image.BufferedImage;
 
 /**
- * Runs the checks, a line for each:
+ * Runs the checks and prints a line for each: Checks FOLDER STRINGS.xml
  *
- * <p>Checks FOLDER STRINGS.xml, where FOLDER has app.apk (what aapt packed), test.apk (duck.glo with its picture, windmill.glo),
- * windmill.glo, duck.glo, duck.png and windmill.png as orv-view draws them. Exit code 1 if one fails.
+ * <p>FOLDER has app.apk (packed by aapt), test.apk (duck.glo with its picture, windmill.glo), duck.glo, windmill.glo, and
+ * duck.png and windmill.png as orv-view draws them. Exit code 1 if a check fails.
  */
 public final class Checks {
     interface Check {

@@ -27,12 +27,12 @@ final class NativeChecks {
         check("an asset of what aapt packed looks as orv-view draws it", NativeChecks::packedAsset);
         check("a scene with a picture: asset, file and orv-view draw the same", NativeChecks::texturedAsset);
         check("an opened file takes no pictures from the package", NativeChecks::fileAlone);
-        check("turn, pan and zoom show something else, frameAll what was before", NativeChecks::hands);
+        check("turn, pan and zoom change the picture, frameAll restores it", NativeChecks::hands);
         check("after lost contexts the same picture bit for bit", NativeChecks::lostContexts);
         check("clips play, pause and go on after a lost context", NativeChecks::clips);
         check("a missing file gets a message, the next good one is shown", NativeChecks::missing);
         check("a damaged file gets a message at every length", NativeChecks::damaged);
-        check("names and messages of any bytes come through", NativeChecks::oddNames);
+        check("names and messages may hold any bytes", NativeChecks::oddNames);
         check("without a context, and with values that are no numbers, nothing happens", NativeChecks::misuse);
         check("without a viewer no function does anything", NativeChecks::noHandle);
         check("no asset stays open", () -> expect(Gl.countOpenAssets() == 0, "open: " + Gl.countOpenAssets()));
@@ -46,7 +46,7 @@ final class NativeChecks {
         return new Shown(path(name), false);
     }
 
-    /** With a new context, which it loses in the end. */
+    /** A check with a viewer and a context of its own. */
     private interface Use {
         void of(NativeViewer viewer) throws Exception;
     }
@@ -97,7 +97,7 @@ final class NativeChecks {
         });
     }
 
-    // Fault caught: pictures of the package in the place of those of the same name that the file lacks.
+    // Fault caught: a file whose picture is missing shows a picture of the package with the same name.
     private static void fileAlone() throws Exception {
         Files.createDirectories(Checks.folder.resolve("alone"));
         Files.write(Checks.folder.resolve("alone/duck.glo"), readFile("duck.glo"));

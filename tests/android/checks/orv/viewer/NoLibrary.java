@@ -10,7 +10,7 @@ import android.widget.TextView;
 import java.io.File;
 import java.nio.file.Paths;
 
-/** On a device for which the package has no library: NoLibrary FOLDER STRINGS.xml, as {@link Checks}. */
+/** The application on a device for which the package has no library: NoLibrary FOLDER STRINGS.xml, as {@link Checks}. */
 public final class NoLibrary {
     public static void main(String[] arguments) throws Exception {
         Context.standInPackage = arguments[0] + "/test.apk";

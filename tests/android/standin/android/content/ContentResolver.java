@@ -9,7 +9,7 @@ import java.util.HashMap;
 import java.util.Map;
 
 public abstract class ContentResolver {
-    /** What another application hands over: its content, and the name that it says it has. */
+    /** A file of another application: its content, or null if the application throws, and the name that it gives. */
     public static final class StandInFile {
         public final String name;
         public final byte[] content;
@@ -26,6 +26,9 @@ public abstract class ContentResolver {
         StandInFile file = STAND_IN_FILES.get(uri.toString());
         if (file == null) {
             throw new FileNotFoundException("gone: " + uri);
+        }
+        if (file.content == null) {
+            throw new IllegalStateException("not now");
         }
         return new ByteArrayInputStream(file.content);
     }

@@ -9,8 +9,9 @@ import javax.microedition.khronos.opengles.GL10;
 import standin.Gl;
 
 /**
- * Does what the real one says it does: one thread draws; events run first, and without a context too; a context that is
- * not kept is lost when the application pauses; onSurfaceCreated() comes with each new one, onSurfaceChanged() after it.
+ * Does what Android's documentation says of it: one thread draws; events run before frames, also without a context; a context
+ * that is not preserved is lost when the application pauses; after each new context, onSurfaceCreated() and then
+ * onSurfaceChanged() are called.
  */
 public class GLSurfaceView extends SurfaceView {
     public static final int RENDERMODE_WHEN_DIRTY = 0;
@@ -26,7 +27,7 @@ public class GLSurfaceView extends SurfaceView {
     public static final int STAND_IN_WIDTH = 320;
     public static final int STAND_IN_HEIGHT = 240;
 
-    /** The device lets go of contexts though the application would have them kept. */
+    /** Whether the device drops contexts although the application asks to preserve them. */
     public static volatile boolean standInLosesContexts;
 
     private final Queue<Runnable> events = new ArrayDeque<>();
@@ -34,7 +35,7 @@ public class GLSurfaceView extends SurfaceView {
     private Thread thread;
     private boolean preserves;
     private boolean isPaused;
-    private boolean isAtRest; // the thread has seen that it is to pause
+    private boolean isAtRest; // the thread has seen isPaused
     private boolean isEnding;
     private boolean isWanted;
     private boolean isBusy;
@@ -134,7 +135,7 @@ public class GLSurfaceView extends SurfaceView {
         try {
             while (!condition.holds()) {
                 if (System.nanoTime() > end) {
-                    throw new IllegalStateException("waited in vain");
+                    throw new IllegalStateException("waited too long");
                 }
                 wait(1000);
             }

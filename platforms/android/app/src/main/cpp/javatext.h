@@ -4,8 +4,8 @@
 
 #include <jni.h>
 
-/// Text between Java and here, as arrays of UTF-8: Java's own strings come as a modified UTF-8 that no file system knows, and
-/// the virtual machine ends a program that makes one of other bytes.
+/// Passes text between Java and C++ as arrays of UTF-8 bytes. JNI's own functions for strings use a modified UTF-8, which
+/// differs from that of file names, and may abort the program if they get other bytes.
 namespace javatext
 {
 

@@ -1,5 +1,5 @@
-// What orv.viewer.NativeViewer calls. Each handle is one object here, 0 is none, and with none nothing happens. All calls
-// for one handle come one after another; those that draw or load on the thread whose GL context is current.
+// The native functions of orv.viewer.NativeViewer. A handle is a pointer to a Holder; with handle 0, they do nothing. Java
+// makes one call at a time for each handle, and draws and loads on the thread whose GL context is current.
 
 #include "javatext.h"
 #include "nativeviewer.h"
@@ -13,7 +13,7 @@
 namespace
 {
 
-/// A viewer, and what keeps the assets alive that it reads.
+/// A viewer, and a reference that keeps its assets alive.
 struct Holder
 {
     Holder(AAssetManager* manager, jobject reference) : viewer(manager), assets(reference) {}
@@ -58,7 +58,7 @@ extern "C"
         return reinterpret_cast<jlong>(holder);
     }
 
-    /// Makes no call of GL: the context goes with all that it holds, if it has not gone before.
+    /// Makes no GL call: GL objects are deleted together with their context.
     JNIEXPORT void JNICALL Java_orv_viewer_NativeViewer_destroy(JNIEnv* env, jclass, jlong handle)
     {
         Holder* holder = getHolder(handle);
@@ -130,7 +130,7 @@ extern "C"
             viewer->pan(right, down);
     }
 
-    /// @param factor  how many times as large things get, above 0.
+    /// @param factor  of the size of things on the screen, above 0.
     JNIEXPORT void JNICALL Java_orv_viewer_NativeViewer_zoom(JNIEnv*, jclass, jlong handle, jfloat factor)
     {
         android::NativeViewer* viewer = getOpenViewer(handle);

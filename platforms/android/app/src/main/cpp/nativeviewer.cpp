@@ -12,7 +12,7 @@ namespace android
 namespace
 {
 
-constexpr size_t MOST_LINES = 5; // of what is shown over a picture; the log has all
+constexpr size_t MOST_LINES = 5; // of the message over the picture; the log has all lines
 
 void writeToSystemLog(orv::LogLevel level, const char* place, const char* text, void*)
 {

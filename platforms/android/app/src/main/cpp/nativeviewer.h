@@ -7,15 +7,15 @@ struct AAssetManager;
 namespace android
 {
 
-/// The viewer of the application: scenes of the package's assets folder and of files. Its log is the system's, under the
-/// engine's tag.
+/// The viewer of the application: shows scenes of the package's assets folder and scenes in files. Writes to Android's log,
+/// with the engine's tag.
 class NativeViewer : public view::SceneViewer
 {
 public:
     /// @param assets  borrowed; has to outlive the viewer.
     explicit NativeViewer(AAssetManager* assets);
 
-    /// A new context is current. Where there was one before, it was lost, with all that it held.
+    /// A new context is current; the one before, if any, is lost.
     /// @return as SceneViewer::takeContext().
     bool replaceContext();
 

@@ -5,7 +5,7 @@ import android.view.MotionEvent;
 /** Gestures: one finger turns, two move and pinch, a double tap resets the view. */
 final class Gestures {
     interface Hand {
-        /** In units that are as large on every screen. */
+        /** In density-independent pixels. */
         void turn(float right, float down);
 
         /** In pixels. */
@@ -17,13 +17,14 @@ final class Gestures {
         void reset();
     }
 
-    private static final float SLOP = 8; // a finger that rests moves as far; as all lengths here in units of density
+    // In density-independent pixels.
+    private static final float SLOP = 8; // a resting finger moves up to this far
     private static final float TAP_DISTANCE = 40;
     private static final long TAP_MS = 300;
 
     private final Hand hand;
-    private final float density; // pixels of a unit
-    private int followed; // how many fingers the places below are of; 0 where they are none's
+    private final float density; // pixels in a density-independent one
+    private int followed; // the number of fingers that x, y and span belong to; 0 if they are unknown
     private float x;
     private float y;
     private float span;
@@ -58,7 +59,7 @@ final class Gestures {
                 }
                 followed = 0;
                 break;
-            default: // a finger more or less, or the gesture is over
+            default: // another finger came or went, or the gesture was cancelled
                 isTap = false;
                 followed = 0;
                 break;
@@ -79,7 +80,7 @@ final class Gestures {
         }
         place(event, isOne);
         if (before != followed) {
-            return; // there is nothing to compare with
+            return; // the first positions of these fingers
         }
         if (isOne) {
             hand.turn((x - oldX) / density, (y - oldY) / density);

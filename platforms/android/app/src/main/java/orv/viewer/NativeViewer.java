@@ -4,20 +4,19 @@ import android.content.res.AssetManager;
 import java.nio.charset.StandardCharsets;
 
 /**
- * The native viewer. One call at a time; {@link #replaceContext}, {@link #open} and {@link #draw} on the thread whose GL
- * context is current, the others on any. After {@link #release}, which may come at any time, nothing happens any more.
+ * The native viewer, which takes one call at a time. Call {@link #replaceContext}, {@link #open} and {@link #draw} on the
+ * thread whose GL context is current, the others on any thread. After {@link #release}, which may be called at any time,
+ * all calls do nothing.
  */
 final class NativeViewer {
     static {
         System.loadLibrary("orvviewer");
     }
 
-    private final AssetManager assets; // the native side reads from it as long as it lives
     private long handle;
 
     NativeViewer(AssetManager assets) {
-        this.assets = assets;
-        handle = create(this.assets);
+        handle = create(assets);
     }
 
     /** A new context is current, and the old one is lost: loads the scene again. */
@@ -25,7 +24,7 @@ final class NativeViewer {
         return replaceContext(handle);
     }
 
-    /** Of the surface, in pixels. */
+    /** Sets the size of the surface, in pixels. */
     synchronized void setSize(int width, int height) {
         setSize(handle, width, height);
     }
@@ -50,22 +49,22 @@ final class NativeViewer {
         return text == null ? "" : new String(text, StandardCharsets.UTF_8);
     }
 
-    /** Turns what is seen, half a degree for each unit. */
+    /** Turns the view, half a degree for each density-independent pixel. */
     synchronized void turn(float right, float down) {
         turn(handle, right, down);
     }
 
-    /** Moves what is seen, in pixels. */
+    /** Moves the view, in pixels. */
     synchronized void pan(float right, float down) {
         pan(handle, right, down);
     }
 
-    /** Zooms by a factor. */
+    /** Zooms by a factor: above 1, things get larger. */
     synchronized void zoom(float factor) {
         zoom(handle, factor);
     }
 
-    /** The whole scene, from the front. */
+    /** Shows the whole scene, from the front. */
     synchronized void frameAll() {
         frameAll(handle);
     }
@@ -90,12 +89,12 @@ final class NativeViewer {
         togglePaused(handle);
     }
 
-    /** Also where there is nothing that could play. */
+    /** Returns true as well if there is nothing to play. */
     synchronized boolean isPaused() {
         return isPaused(handle);
     }
 
-    /** Needs no context, and leaves what is in one to go with it. */
+    /** Makes no GL call: GL objects are deleted together with their context. */
     synchronized void release() {
         destroy(handle);
         handle = 0;

@@ -12,23 +12,23 @@ import java.io.OutputStream;
 import java.util.List;
 import java.util.Locale;
 
-/** Copies of what other applications hand over, in one folder: the engine reads files and knows no other applications. */
+/** Copies files of other applications into one folder, since the engine can only read files. */
 final class OpenedFiles {
     private static final String[] SCENES = {".glo", ".ap", ".sp"};
 
     private final ContentResolver resolver;
     private final File folder;
 
-    /** @param folder of the copies alone. */
+    /** @param folder for the copies; all other files in it are deleted. */
     OpenedFiles(ContentResolver resolver, File folder) {
         this.resolver = resolver;
         this.folder = folder;
     }
 
     /**
-     * Copies a scene and the files that it names, in place of those before.
+     * Copies a scene and the files that it names. Earlier copies are deleted.
      *
-     * @return the scene: the first whose name says so, or else the first of all.
+     * @return the scene: the first file with the suffix of a scene, or else the first file.
      * @throws IOException with a message for the user.
      */
     File copy(List<Uri> files) throws IOException {
@@ -52,7 +52,7 @@ final class OpenedFiles {
         return isNamed ? scene : asScene(scene);
     }
 
-    /** Names of other applications need no suffix; a scene is what is meant then, and what it is says its content. */
+    /** Adds the suffix of a scene: other applications may pass a scene under a name without one. */
     private static File asScene(File file) throws IOException {
         File named = new File(file.getPath() + SCENES[0]);
         if (!file.renameTo(named)) {
@@ -87,12 +87,12 @@ final class OpenedFiles {
             for (int count = in.read(buffer); count >= 0; count = in.read(buffer)) {
                 out.write(buffer, 0, count);
             }
-        } catch (IOException | SecurityException reason) {
+        } catch (IOException | RuntimeException reason) { // another application may throw anything
             throw new IOException(to.getName() + ": cannot be read: " + reason.getMessage(), reason);
         }
     }
 
-    /** The name alone, whatever the other application says: nothing is written outside of the folder. */
+    /** Returns a name without folders, so that nothing is written outside of the folder. */
     private String getName(Uri file) {
         String name = "file".equals(file.getScheme()) ? null : askName(file);
         if (name == null) {
@@ -106,7 +106,7 @@ final class OpenedFiles {
         String[] columns = {OpenableColumns.DISPLAY_NAME};
         try (Cursor cursor = resolver.query(file, columns, null, null, null)) {
             return cursor != null && cursor.moveToFirst() ? cursor.getString(0) : null;
-        } catch (RuntimeException refused) { // the other application's; its file may be readable all the same
+        } catch (RuntimeException refused) { // by the other application; its file may be readable nevertheless
             return null;
         }
     }

@@ -18,7 +18,7 @@ import java.io.IOException;
 import java.util.ArrayList;
 import java.util.List;
 
-/** The application: the scene, buttons below it, and a message over it where something is wrong. */
+/** The application: a scene, with buttons at the bottom and a message over it if something is wrong. */
 public final class ViewerActivity extends Activity implements ViewerView.Listener {
     private static final int CHOOSE = 1;
     private static final String PATH = "path";
@@ -41,17 +41,17 @@ public final class ViewerActivity extends Activity implements ViewerView.Listene
         message.setTextColor(0xFF202020);
         message.setPadding(24, 24, 24, 24);
         message.setVisibility(View.GONE);
-        message.setAccessibilityLiveRegion(View.ACCESSIBILITY_LIVE_REGION_POLITE); // read aloud when it comes
+        message.setAccessibilityLiveRegion(View.ACCESSIBILITY_LIVE_REGION_POLITE); // screen readers say new text
         try {
             view = new ViewerView(this, this);
-        } catch (LinkageError reason) { // at the first try, and another kind of it at every further one
+        } catch (LinkageError reason) { // UnsatisfiedLinkError at first, NoClassDefFoundError from then on
             say(getString(R.string.no_library) + " " + reason.getMessage());
         }
         if (view != null) {
             root.addView(view);
         }
         FrameLayout overlay = new FrameLayout(this);
-        overlay.setFitsSystemWindows(true); // else parts of it lie below the system's own
+        overlay.setFitsSystemWindows(true); // otherwise the system's bars would cover parts of it
         overlay.addView(message, place(Gravity.TOP));
         overlay.addView(makeBar(), place(Gravity.BOTTOM));
         root.addView(overlay);
@@ -154,7 +154,7 @@ public final class ViewerActivity extends Activity implements ViewerView.Listene
     private void choose() {
         Intent question = new Intent(Intent.ACTION_OPEN_DOCUMENT);
         question.addCategory(Intent.CATEGORY_OPENABLE);
-        question.setType("*/*"); // no system knows the type of scenes
+        question.setType("*/*"); // Android has no type for scenes
         question.putExtra(Intent.EXTRA_ALLOW_MULTIPLE, true);
         try {
             startActivityForResult(question, CHOOSE);
@@ -163,7 +163,7 @@ public final class ViewerActivity extends Activity implements ViewerView.Listene
         }
     }
 
-    /** Opens what an intent names: one file, or a scene with its pictures. Returns false where it names nothing. */
+    /** Opens what an intent names: one file, or a scene with its pictures. Returns false if it names no file. */
     private boolean openFrom(Intent intent) {
         List<Uri> files = new ArrayList<>();
         ClipData several = intent == null ? null : intent.getClipData();
@@ -179,14 +179,14 @@ public final class ViewerActivity extends Activity implements ViewerView.Listene
             return false;
         }
         OpenedFiles copies = new OpenedFiles(getContentResolver(), new File(getCacheDir(), "opened"));
-        new Thread(() -> copyAndShow(copies, files), "copies").start(); // reading may take as long as it likes
+        new Thread(() -> copyAndShow(copies, files), "copies").start(); // reading may take long
         return true;
     }
 
     private void copyAndShow(OpenedFiles copies, List<Uri> files) {
         try {
             File scene;
-            synchronized (ViewerActivity.class) { // they share a folder
+            synchronized (ViewerActivity.class) { // all copies share one folder
                 scene = copies.copy(files);
             }
             runOnUiThread(() -> show(new Shown(scene.getPath(), false)));

@@ -7,13 +7,13 @@ import javax.microedition.khronos.egl.EGLConfig;
 import javax.microedition.khronos.opengles.GL10;
 
 /**
- * The scene on the screen. All work is done on its GL thread. What draws or loads waits for {@link #onDrawFrame}, where a
- * context is current: events run without one while the application is paused.
+ * The scene on the screen. All work is done on its GL thread. Drawing and loading wait for {@link #onDrawFrame}, where a
+ * context is current: while the application is paused, events run without one.
  */
 final class ViewerView extends GLSurfaceView implements GLSurfaceView.Renderer, Gestures.Hand {
     /** Receives changes, on the user interface's thread. */
     interface Listener {
-        /** Something was loaded, or could not be. */
+        /** A scene was loaded, or could not be. */
         void onLoaded(boolean isOpen, String message, int clips, int cameras);
 
         void onPaused(boolean isPaused);
@@ -33,7 +33,7 @@ final class ViewerView extends GLSurfaceView implements GLSurfaceView.Renderer, 
         gestures = new Gestures(this, context.getResources().getDisplayMetrics().density);
         setEGLContextClientVersion(2);
         setEGLConfigChooser(8, 8, 8, 0, 16, 8);
-        setPreserveEGLContextOnPause(true); // where the device can; where not, it is lost, and all is loaded again
+        setPreserveEGLContextOnPause(true); // if the device cannot, everything is loaded again
         setRenderer(this);
         setRenderMode(RENDERMODE_WHEN_DIRTY);
     }
@@ -54,7 +54,7 @@ final class ViewerView extends GLSurfaceView implements GLSurfaceView.Renderer, 
         change(viewer::stepCamera);
     }
 
-    /** When the activity is over; the GL thread is paused then, or has ended. */
+    /** To be called at the end of the activity, when the GL thread is paused or has ended. */
     void release() {
         viewer.release();
     }
