@@ -16,8 +16,14 @@ class Server:
 
     def __init__(self, folder):
         answers = self.answers = []
+        held = self.held = {}  # by path: what its requests wait for
 
         class Handler(http.server.SimpleHTTPRequestHandler):
+            def do_GET(self):
+                if self.path in held:
+                    held[self.path].wait()
+                super().do_GET()
+
             def log_request(self, code="-", size="-"):
                 answers.append((self.path, int(code)))
 
@@ -28,6 +34,11 @@ class Server:
             ("127.0.0.1", 0), functools.partial(Handler, directory=str(folder)))
         self.address = f"http://127.0.0.1:{self.http.server_port}"
         threading.Thread(target=self.http.serve_forever, daemon=True).start()
+
+    def hold(self, path):
+        """@return an event: requests for the path wait until it is set."""
+        self.held[path] = threading.Event()
+        return self.held[path]
 
     def close(self):
         self.http.shutdown()

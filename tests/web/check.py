@@ -281,7 +281,42 @@ def context(bench):
         most = compare(before, browser.picture(), 0)[1]
         expect(most == 0, f"{page}: {most} of 255 off")
         expect(browser.run("return document.getElementById('message').hidden"), "the message stays")
-    return f"{len(cases)} views, lost twice, the same bit for bit"
+    open_while_lost(bench)
+    return f"{len(cases)} views, lost twice, the same bit for bit; opened while it was lost"
+
+
+def open_while_lost(bench):
+    """Fault caught: a scene that is opened, or still being loaded, while the context is lost, and is refused."""
+    browser = bench.browser
+    bench.show("motion", "play=0")
+    wanted = browser.picture()
+    lose = """
+        const view = document.getElementById("view");
+        window.extension = view.getContext("webgl").getExtension("WEBGL_lose_context");
+        const lost = new Promise((resolve) => view.addEventListener("webglcontextlost", () => setTimeout(resolve), {once: true}));
+        window.extension.loseContext();
+        await lost;
+        """
+    restore = """
+        window.extension.restoreContext();
+        for (let i = 0; i < 50 && orvPage.state.model !== values[0]; ++i)
+            await new Promise((resolve) => setTimeout(resolve, 100));
+        return document.getElementById("message").hidden && orvPage.state.model === values[0];"""
+    motion = pathlib.Path(bench.scene("motion")).name
+    bench.show("duck")
+    browser.run(lose + """
+        orvPage.openFiles([{ name: values[0].split("/").pop(), bytes: new Uint8Array(await (await fetch("/" + values[0])).arrayBuffer()) }]);
+        if (!document.getElementById("text").textContent.includes("context is lost"))
+            throw new Error("a file opened without a context: " + document.getElementById("text").textContent);""", bench.scene("motion"))
+    expect(browser.run(restore, motion), "a file opened without a context is not shown later")
+    browser.run("orvPage.run('play'); orvPage.run('share', 0)")
+    expect(compare(wanted, browser.picture(), 0)[1] == 0, "a file opened without a context looks otherwise")
+
+    arrives = bench.server.hold(f"/{bench.scene('motion')}")
+    browser.driver.get(f"{bench.server.address}/page/?play=0&bars=0&model=/{bench.scene('motion')}")
+    browser.run("while (!document.getElementById('welcome').hidden) await new Promise((resolve) => setTimeout(resolve, 50));" + lose)
+    arrives.set()
+    expect(browser.run(restore, motion), "a scene whose context was lost while it was loaded is not shown later")
 
 
 def growth(bench):
@@ -361,12 +396,13 @@ def damage(bench):
     browser.run("orvPage.openFiles([{ name: 'duck.glo', bytes: new Uint8Array(await (await fetch('/duck/duck.glo')).arrayBuffer()) }])")
     expect("some of its files could not be loaded" in says() and "duck" in browser.run("return document.getElementById('remarks').textContent"), says())
     for wish, words in {"model=/duck/none.glo": "none.glo cannot be fetched: 404", "model=http://127.0.0.1:1/a.glo": "its own server",
+                        "model=100%25.glo": "100%.glo cannot be fetched: 404", "model=/duck/": "names no file", "model=http://": "is not an address",
                         "model=/page/viewer.css": "cannot be opened", "model=/duck/duck.glo&camera=nobody": "no camera \"nobody\""}.items():
         bench.show("page", wish)
         expect(words in says(), f"{wish}: {says()}")
     bench.show("page", "model=/duck/duck.glo")
     expect(says().startswith("true") and browser.run("return orvPage.state.scene !== null"), "a good file after bad ones: " + says())
-    return f"{refused} of {len(bad)} damaged scenes refused, the others drawn; 6 messages"
+    return f"{refused} of {len(bad)} damaged scenes refused, the others drawn; 9 messages"
 
 
 def pages(bench):
@@ -431,7 +467,15 @@ def files(bench):
             browser.command("Input.dispatchDragEvent", type=kind, x=100, y=100,
                             data={"items": [], "files": dropped, "dragOperationsMask": 1})
         matches(what)
-    return "named, chosen, dropped, dropped as a folder: the same picture"
+    arrives = bench.server.hold(f"/{bench.scene('skin')}")
+    browser.driver.get(f"{bench.server.address}/page/?bars=0&model=/{bench.scene('skin')}")
+    browser.run("while (!document.getElementById('welcome').hidden) await new Promise((resolve) => setTimeout(resolve, 50));")
+    browser.driver.find_element(By.ID, "filechooser").send_keys("\n".join(paths))
+    matches("chosen before the scene of the address has come")
+    arrives.set()
+    browser.run("await orvPage.ready")
+    matches("chosen, and then the scene of the address comes")
+    return "named, chosen, dropped, dropped as a folder, chosen while another is loaded: the same picture"
 
 
 def requests(bench):
@@ -469,6 +513,10 @@ def sizes(bench):
         expect(found["size"] == wanted, f"{width} x {height} at {density}: {found['size']} pixels, not {wanted}")
     browser.resize(WIDTH, HEIGHT)
     browser.open(f"{bench.server.address}/skin/?play=0")
+    browser.resize(WIDTH, HEIGHT, 2)
+    moved = browser.run("orvPage.run('turn', 1, 0); await new Promise((resolve) => setTimeout(resolve, 200)); return document.getElementById('view').width")
+    expect(moved == 2 * WIDTH, f"on a display of twice the density: {moved} pixels")
+    browser.resize(WIDTH, HEIGHT)
     nodes = browser.command("Accessibility.getFullAXTree")["nodes"]
     names = {}
     for node in nodes:

@@ -48,8 +48,18 @@ export async function collectDropped(transfer) {
     return (await Promise.all(entries.map((entry) => readEntry(entry, "")))).flat();
 }
 
+/// The name of the file that an address leads to.
+export function nameFile(url) {
+    const name = url.pathname.slice(url.pathname.lastIndexOf("/") + 1);
+    try {
+        return decodeURIComponent(name);
+    } catch {
+        return name; // "100%.glo"
+    }
+}
+
 export async function fetchFile(url) {
-    const name = decodeURIComponent(url.pathname.slice(url.pathname.lastIndexOf("/") + 1));
+    const name = nameFile(url);
     let answer;
     try {
         answer = await fetch(url);

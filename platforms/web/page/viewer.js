@@ -1,6 +1,6 @@
 // The page around the engine: passes files and input to the engine, and shows its messages.
 
-import { collectDropped, fetchFile, isModel, readChosen } from "./files.js";
+import { collectDropped, fetchFile, isModel, nameFile, readChosen } from "./files.js";
 import { listenToHands, listenToKeys } from "./input.js";
 
 const FOLDER = "/scene";
@@ -12,6 +12,8 @@ const find = (id) => document.getElementById(id);
 const canvas = find("view");
 const state = { model: "", scene: null, clip: 0, background: 0, loops: true, lost: false, stopped: false };
 let engine = null;
+let contextIsThere = Promise.resolve(); // while the context is lost: fulfilled when it is restored
+let openings = 0; // a slow opening must not replace a later one
 
 // --- the engine
 
@@ -77,6 +79,7 @@ function drawFrame(now) {
     isFrameWanted = false;
     if (state.lost || state.stopped || !state.scene)
         return;
+    fitCanvas(); // the density may have changed
     const seconds = moves ? (now - lastTime) / 1000 : 0;
     lastTime = now;
     frameTimes.push(now);
@@ -205,11 +208,15 @@ function labelView() {
         `${count(scene.triangles, "triangle")}, ${camera ? `through camera ${camera}` : "seen freely"}`);
 }
 
-/// Shows the scene among some files, or adds the files to the open scene.
+/// Shows the scene among some files, or adds the files to the open scene; once the context is restored if it is lost.
 /// @param files  of {name, bytes}; names may have folders.
 function openFiles(files) {
     if (files.length === 0 || state.stopped)
         return;
+    if (state.lost) {
+        openWhenRead(contextIsThere.then(() => files));
+        return;
+    }
     const models = files.map((file) => file.name).filter(isModel).sort((one, other) =>
         isModel(one) - isModel(other) || one.split("/").length - other.split("/").length || (one < other ? -1 : 1));
     if (models.length === 0 && !state.model) {
@@ -220,22 +227,43 @@ function openFiles(files) {
     }
     const model = models.length > 0 ? models[0] : state.model;
     const folder = models.length === 0 ? model.slice(0, model.lastIndexOf("/") + 1) : "";
-    if (models.length > 0)
+    if (models.length > 0) {
+        ++openings;
         removeFiles(FOLDER);
+    }
     for (const file of files)
         writeFile(folder + file.name, file.bytes);
     show(model, load(model));
+}
+
+/// @return a URL on the page's own server, with the name of a file.
+function readAddress(address) {
+    let url;
+    try {
+        url = new URL(address, location.href);
+    } catch {
+        throw new Error(`${address} is not an address`);
+    }
+    if (url.origin !== location.origin)
+        throw new Error(`${address}: this page opens what is on its own server`);
+    if (!nameFile(url))
+        throw new Error(`${address} names no file`);
+    return url;
 }
 
 /// Shows a scene from the page's own server.
 /// @param address  relative to the page.
 /// @param names    the files that it needs, relative to the scene; without them they are requested as they are found
 ///                 missing.
+/// @return whether it is shown; if not, there is a message, or something else was opened meanwhile.
 async function openAddress(address, names) {
-    const url = new URL(address, location.href);
-    if (url.origin !== location.origin)
-        throw new Error(`${address}: this page opens what is on its own server`);
-    const model = decodeURIComponent(fileName(url.pathname));
+    const url = readAddress(address);
+    const opening = ++openings;
+    const isLatest = async () => {
+        await contextIsThere;
+        return opening === openings;
+    };
+    const model = nameFile(url);
     const tried = new Set([model]);
     const get = async (name) => {
         tried.add(name);
@@ -246,6 +274,8 @@ async function openAddress(address, names) {
     const files = [{ name: model, bytes: await fetchFile(url) }];
     if (names)
         files.push(...await Promise.all(names.filter((name) => name !== model).map(get)));
+    if (!await isLatest())
+        return false;
     removeFiles(FOLDER);
     for (const file of files)
         writeFile(file.name, file.bytes);
@@ -255,11 +285,14 @@ async function openAddress(address, names) {
         const found = (await Promise.allSettled(missing.map(get))).filter((answer) => answer.status === "fulfilled");
         if (found.length === 0)
             break;
+        if (!await isLatest())
+            return false;
         for (const answer of found)
             writeFile(answer.value.name, answer.value.bytes);
         scene = load(model);
     }
     show(model, scene);
+    return state.scene !== null;
 }
 
 // --- commands
@@ -353,9 +386,11 @@ function fitCanvas() {
 }
 
 function listenToContext() {
+    let tellThere = null;
     canvas.addEventListener("webglcontextlost", (event) => {
         event.preventDefault(); // so that it may be restored
         state.lost = true;
+        contextIsThere = new Promise((resolve) => { tellThere = resolve; });
         call("orvLoseContext");
         showMessage("The WebGL context is lost. The view returns when the browser restores it.");
     });
@@ -368,7 +403,16 @@ function listenToContext() {
         }
         hideMessage();
         requestFrame();
+        tellThere();
     });
+}
+
+/// Moving the window to another display may change the density without changing the canvas's size on the page.
+function listenToDensity() {
+    matchMedia(`(resolution: ${devicePixelRatio}dppx)`).addEventListener("change", () => {
+        requestFrame();
+        listenToDensity();
+    }, { once: true });
 }
 
 /// Opens the files of a promise, or shows the reason of its failure.
@@ -457,6 +501,7 @@ async function start() {
     listenToHands(canvas, run);
     listenToKeys(run);
     new ResizeObserver(fitCanvas).observe(canvas);
+    listenToDensity();
     fitCanvas();
     const given = JSON.parse(find("scene").textContent);
     const wishes = new URLSearchParams(location.search);
@@ -465,15 +510,14 @@ async function start() {
     if (!model)
         return;
     find("welcome").hidden = true;
-    await openAddress(model, wishes.has("model") ? undefined : given.files);
-    if (state.scene)
+    if (await openAddress(model, wishes.has("model") ? undefined : given.files))
         applyAddress(wishes);
 }
 
 /// For other scripts: ready, state, opening files of {name, bytes}, drawing a frame at once, commands.
 window.orvPage = {
     ready: start().catch((error) => {
-        find("welcome").hidden = false;
+        find("welcome").hidden = state.scene !== null;
         showMessage(error.message);
     }),
     state, openFiles, drawNow, run,
