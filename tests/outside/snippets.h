@@ -3,7 +3,6 @@
 #include <GLES2/gl2.h>
 #include <cstdio>
 #include <orv/orv.h>
-#include <orv/textlayout.h>
 #include <vector>
 
 using namespace orv;

@@ -6,7 +6,8 @@
 A row of the page's first table names a room, a row of the others a floor of a large room; the last column lists the
 rooms that it stands on. A room may include these and the rooms below them. Without --check the drawing on the page is
 made again; with it, a drawing that differs is an error, as is an include that the tables do not allow, a room that they
-do not list, an include of another room's src folder, and a folder of more than 25 sources. Exit code 1 then.
+do not list, an include of another room's src folder, a folder of more than 25 sources, and a public header that orv.h lacks.
+Exit code 1 then.
 """
 import argparse
 import collections
@@ -17,6 +18,7 @@ import sys
 ROOT = pathlib.Path(__file__).resolve().parents[2]
 PAGE = ROOT / "docs/house.md"
 FLOORED = {"engine/facility": "## The floors of the facility", "engine/render": "## The floors of the scene"}
+UMBRELLA = pathlib.Path("engine/extra/api/orv/orv.h")
 MOST_SOURCES = 25
 DRAWING = re.compile(r"(<!-- drawn by ./run house -->\n)(.*?)(<!-- end -->)", re.DOTALL)
 
@@ -124,6 +126,9 @@ def inspect(house):
     counts = collections.Counter(file.parent for file in house.files if file.suffix == ".cpp")
     faults += [f"{folder}: {count} sources; at most {MOST_SOURCES}" for folder, count in counts.items()
                if count > MOST_SOURCES]
+    included = {header for file, header in house.includes() if file == UMBRELLA}
+    faults += [f"{UMBRELLA}: lacks {file}" for file in house.files
+               if file.match("engine/*/api/orv/*.h") and file not in included | {UMBRELLA}]
     return faults, arrows, steps
 
 
