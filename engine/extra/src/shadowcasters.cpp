@@ -25,6 +25,13 @@ SharedPtr<ShaderUniform<T>> addProperty(Appearance& material, const char* name, 
         static_cast<ShaderUniform<T>*>(material.getPropertyUniform(name).get()));
 }
 
+/// Whether a program draws into the world. Others, as for a picture behind a scene, draw onto the screen.
+bool drawsIntoWorld(const ShaderProgram& program)
+{
+    return program.usesModelTransform() || program.usesJoints() ||
+           program.uniformExists("T_VIEW_PROJECTION") || program.uniformExists("T_VIEW");
+}
+
 template <class T>
 bool copyValue(const ShaderUniformBase& from, ShaderUniformBase& to)
 {
@@ -96,10 +103,12 @@ ShadowCasters::Caster& ShadowCasters::find(const Appearance& appearance)
 
 void ShadowCasters::make(const Appearance& appearance, Caster& caster) const
 {
-    const SharedPtr<ShaderProgram> program = m_programs.findDepth(*appearance.getShaderProgram());
     caster = Caster();
     caster.program = appearance.getShaderProgram();
     caster.revision = appearance.getPropertyRevision();
+    if (!drawsIntoWorld(*caster.program))
+        return;
+    const SharedPtr<ShaderProgram> program = m_programs.findDepth(*caster.program);
     auto material = makeShared<Appearance>();
     if (!program || !program->uniformExists("S_CLIP") || !material)
         return;

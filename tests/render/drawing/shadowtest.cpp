@@ -455,6 +455,15 @@ TEST_F(ShadowTest, cutOutsThrowTheirHoles)
     setFlags(*sheet, THROWS, true);
     material->setBlendFactors(BlendFactor::ONE, BlendFactor::ONE, BlendFactor::ONE, BlendFactor::ONE);
     EXPECT_FALSE(isDark(drawShadowed(), -4.0f, 1.0f));
+
+    // So does a picture behind the scene, which is not in the world.
+    const auto behind = makeShared<Appearance>();
+    behind->setShaderProgram(makeProgram(
+        "attribute vec3 a_position; void main() { gl_Position = vec4(a_position.xy, 0.99, 1.0); }",
+        "void main() { gl_FragColor = vec4(1.0); }", {}));
+    behind->setCullingMode(CullingMode::CULL_NONE);
+    sheet->setAppearance(behind);
+    EXPECT_FALSE(isDark(drawShadowed(), -4.0f, 1.0f));
 }
 
 // Faults caught: skins that cast the shadow of their rest pose, or of the last frame.

@@ -31,7 +31,8 @@ struct ShadowParts;
 ///
 /// render() draws the distances from the light to the nearest surfaces into a texture, which the materials changed by
 /// attach() look up. All opaque solids cast shadows, skinned ones in their current pose, cut-outs (CUTOFF) with their
-/// holes. Culled sides (RenderState::cullingMode), blended solids and mirrors cast none.
+/// holes. Culled sides (RenderState::cullingMode), blended solids, mirrors, and solids whose programs take no transform
+/// (such as a picture behind the scene) cast none.
 ///
 /// If the device lacks something (highp in fragment shaders, a texture to draw into), or the scene has no such light,
 /// frames have no shadows, and one message says why. A context has the shadows of one light at a time: those rendered
