@@ -14,6 +14,7 @@
 #include <algorithm>
 #include <array>
 #include <cmath>
+#include <functional>
 #include <limits>
 #include <map>
 #include <random>
@@ -544,6 +545,60 @@ TEST(SmoothMotion, framesAllocateNothing)
     for (int i = 0; i < 10; ++i)
         controller.update(0.1f);
     EXPECT_EQ(before, support::countAllocations());
+}
+
+// Faults caught: an animation destroyed while it is applied; clips, or members of a group, that move while they are walked.
+TEST(SmoothMotion, whatIsAppliedMayChangeWhatPlays)
+{
+    struct Event : Animation
+    {
+        explicit Event(bool& gone) : isGone(gone) {}
+        ~Event() override { isGone = true; }
+        void apply(float) override
+        {
+            const bool& gone = isGone;
+            happen();
+            EXPECT_FALSE(gone);
+        }
+        float getStart() const override { return 0.0f; }
+        float getEnd() const override { return 1.0f; }
+        bool& isGone;
+        std::function<void()> happen;
+    };
+    using Change = void (*)(AnimationController::Ptr&, AnimationGroup&);
+    const Change changes[] = {[](AnimationController::Ptr& controller, AnimationGroup&)
+                              { controller = nullptr; },
+                              [](AnimationController::Ptr& controller, AnimationGroup&)
+                              { controller->fadeTo(makeShared<AnimationGroup>(), 0.0f, 1.0f, 0.0f); },
+                              [](AnimationController::Ptr& controller, AnimationGroup&)
+                              {
+                                  for (int i = 0; i < 9; ++i)
+                                      controller->fadeTo(makeShared<AnimationGroup>(), 0.0f, 1.0f, 1.0f);
+                              },
+                              [](AnimationController::Ptr&, AnimationGroup& group)
+                              {
+                                  for (int i = 0; i < 99; ++i)
+                                      group.addAnimation(makeShared<AnimationGroup>());
+                              }};
+    for (const Change change : changes)
+    {
+        for (const bool isFading : {false, true})
+        {
+            bool isGone = false;
+            auto event = makeShared<Event>(isGone);
+            auto group = makeShared<AnimationGroup>();
+            group->addAnimation(event);
+            group->addAnimation(makeShared<AnimationGroup>());
+            auto controller = makeShared<AnimationController>(group);
+            if (isFading)
+                controller->fadeTo(makeShared<AnimationGroup>(), 0.0f, 1.0f, 1.0f);
+            AnimationGroup& borrowed = *group;
+            event->happen = [&] { change(controller, borrowed); };
+            event = nullptr;
+            group = nullptr;
+            controller->update(0.1f); // the controller alone holds what it applies
+        }
+    }
 }
 
 // Fault caught: animations and animators of programs, which know nothing of mixing, left out or applied where they should

@@ -4,7 +4,10 @@
 
 #include <GLES2/gl2.h>
 
+#include <functional>
 #include <limits>
+#include <string>
+#include <utility>
 
 using namespace orv;
 
@@ -67,6 +70,38 @@ TEST_F(RenderBlockTest, groupDoesNotTakeItself)
     inner->addBlock(outer);
     EXPECT_EQ(2, log.count('E')) << log.text();
     outer->render();
+}
+
+// Faults caught: a crash, or the next block left out, where a block removes itself.
+TEST_F(RenderBlockTest, groupOutlivesTheRemovalOfItsBlocks)
+{
+    struct Block : RenderBlockBase
+    {
+        explicit Block(std::function<void()> callback) : happen(std::move(callback)) {}
+        void render() override { happen(); }
+        void update(float) override { happen(); }
+        void setStereo(float, float) override { happen(); }
+        std::function<void()> happen;
+    };
+    std::string drawn;
+    auto group = makeShared<RenderBlockGroup>();
+    const auto write = [&](char letter) { return makeShared<Block>([&drawn, letter] { drawn += letter; }); };
+    const SharedPtr<RenderBlockBase> once = makeShared<Block>(
+        [&]
+        {
+            drawn += 'b';
+            group->removeBlock(once);
+            for (int i = 0; i < 9; ++i)
+                group->addBlock(write('+'));
+        });
+    group->addBlock(write('a'));
+    group->addBlock(once);
+    group->addBlock(write('c'));
+    group->addBlock(makeShared<Block>([&] { group = nullptr; }));
+    group->addBlock(write('d'));
+    group->render();
+    EXPECT_EQ("abcd", drawn);
+    EXPECT_EQ(1, once->sharedGetCount());
 }
 
 // Faults caught: a view that clears the views beside it, or leaves the box that it cleared in for the next draws.

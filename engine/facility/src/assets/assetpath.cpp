@@ -3,7 +3,6 @@
 #include "orv/detail/loadscope.h"
 #include "orv/log.h"
 
-#include <algorithm>
 #include <string_view>
 
 namespace orv::detail
@@ -84,9 +83,13 @@ std::string AssetPath::describe() const
 
 void AssetPath::explainMissing(const char* name) const
 {
-    const auto hasIt = [name](const SharedPtr<StreamSource>& source)
-    { return source && source->exists(name); };
-    if (!std::any_of(m_sources.begin(), m_sources.end(), hasIt) && LoadScope::mayExplain())
+    for (std::size_t i = 0; i < m_sources.size(); ++i)
+    {
+        const SharedPtr<StreamSource> source = m_sources[i]; // held: asking it may add and remove sources
+        if (source && source->exists(name))
+            return;
+    }
+    if (LoadScope::mayExplain())
         ORV_LOG_WARN("\"%s\" was looked for in: %s", name, describe().c_str());
 }
 

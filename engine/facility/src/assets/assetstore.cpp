@@ -40,8 +40,9 @@ SharedPtr<Shared> AssetStore::getAsset(const char* name)
 SharedPtr<Shared> AssetStore::load(const char* name)
 {
     std::list<SharedPtr<Shared>> order;
-    for (const SharedPtr<Shared>& loader : m_loaders)
+    for (std::size_t i = 0; i < m_loaders.size(); ++i)
     {
+        const SharedPtr<Shared> loader = m_loaders[i]; // held: asking it may add loaders
         if (isKnownTo(*loader, name))
             order.push_front(loader);
         else

@@ -35,7 +35,7 @@ public:
     ~AnimationController() override;
 
     /// Advances by deltaTime * speed unless paused, and applies the animation, also when paused. Does nothing
-    /// at all while disabled.
+    /// at all while disabled. An animator of your own may give this controller something else to play, or drop it.
     ///
     /// Progress is clamped to the range. While looping with loopStart < loopEnd, playing forwards from at or
     /// before loopEnd wraps from loopEnd to loopStart, and playing backwards from at or after loopStart wraps

@@ -7,7 +7,8 @@
 namespace orv
 {
 
-/// Several blocks, in order. Blocks are shared.
+/// Several blocks, in order. Blocks are shared. A block may remove itself while its group renders or updates it; blocks
+/// that are added then have their turn the next time.
 class ORV_API RenderBlockGroup : public RenderBlockBase
 {
 public:
@@ -24,6 +25,9 @@ public:
     bool contains(const RenderBlockBase& other) const override;
 
 private:
+    template <class Use>
+    ORV_LOCAL void forEachBlock(const Use& use);
+
     std::vector<SharedPtr<RenderBlockBase>> m_blocks;
 };
 

@@ -63,11 +63,13 @@ void AnimationController::update(float deltaTime)
 {
     if (!m_enabled)
         return;
+    // What is applied may drop this controller, or give it something else to play.
+    const SharedPtr<AnimationController> self(sharedGetCount() > 0 ? this : nullptr);
     move(deltaTime);
     if (m_smooth)
         applySmoothly(deltaTime);
-    else if (m_animation)
-        m_animation->apply(m_progress);
+    else if (const Animation::Ptr animation = m_animation)
+        animation->apply(m_progress);
 }
 
 void AnimationController::move(float deltaTime)

@@ -48,16 +48,17 @@ Animation::Ptr AnimationGroup::getAnimation(int index) const
     return m_animations[static_cast<size_t>(index)];
 }
 
+/// By index: what is applied may add animations, whose turn comes the next time.
 void AnimationGroup::apply(float progress)
 {
-    for (const Animation::Ptr& animation : m_animations)
-        animation->apply(progress);
+    for (size_t i = 0, count = m_animations.size(); i < count; ++i)
+        m_animations[i]->apply(progress);
 }
 
 void AnimationGroup::applyMixed(float progress, const AnimationMix& mix)
 {
-    for (const Animation::Ptr& animation : m_animations)
-        animation->applyMixed(progress, mix);
+    for (size_t i = 0, count = m_animations.size(); i < count; ++i)
+        m_animations[i]->applyMixed(progress, mix);
 }
 
 float AnimationGroup::getStart() const

@@ -193,15 +193,27 @@ void AnimationController::applySmoothly(float deltaTime)
         return;
     s.places.beginUpdate();
     detail::MixedPlaces* const places = s.isWeighted || !s.oldClips.empty() ? &s.places : nullptr;
-    for (const Smooth::OldClip& old : s.oldClips)
+
+    // Copies: what is applied may begin a fade, or set another subtree.
+    struct Layer
     {
-        if (old.player->m_animation)
-            old.player->m_animation->applyMixed(
-                old.player->m_progress, AnimationMix(s.isInterpolated, old.weight, s.subtree.get(), places));
+        Animation::Ptr animation;
+        float progress = 0.0f;
+        float weight = 0.0f;
+    };
+    Layer layers[Smooth::MOST_OLD_CLIPS + 1];
+    Layer* end = layers;
+    for (const Smooth::OldClip& old : s.oldClips)
+        *end++ = {old.player->m_animation, old.player->m_progress, old.weight};
+    *end++ = {m_animation, m_progress, s.clipWeight};
+    const SharedPtr<SceneNode> subtree = s.subtree;
+    const bool isInterpolated = s.isInterpolated;
+    for (Layer* layer = layers; layer != end; ++layer)
+    {
+        if (layer->animation)
+            layer->animation->applyMixed(layer->progress,
+                                         AnimationMix(isInterpolated, layer->weight, subtree.get(), places));
     }
-    if (m_animation)
-        m_animation->applyMixed(m_progress,
-                                AnimationMix(s.isInterpolated, s.clipWeight, s.subtree.get(), places));
 }
 
 } // namespace orv

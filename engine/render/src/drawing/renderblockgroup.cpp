@@ -37,22 +37,35 @@ void RenderBlockGroup::removeBlock(const SharedPtr<RenderBlockBase>& block)
     m_blocks.erase(std::remove(m_blocks.begin(), m_blocks.end(), block), m_blocks.end());
 }
 
+/// Calls use(block) for each block. It may drop the group, remove the block, and add others, whose turn comes the next
+/// time.
+template <class Use>
+void RenderBlockGroup::forEachBlock(const Use& use)
+{
+    const SharedPtr<RenderBlockGroup> self(sharedGetCount() > 0 ? this : nullptr);
+    size_t next = 0;
+    for (size_t left = m_blocks.size(); left > 0 && next < m_blocks.size(); --left)
+    {
+        const SharedPtr<RenderBlockBase> block = m_blocks[next];
+        use(*block);
+        if (next < m_blocks.size() && m_blocks[next] == block)
+            ++next; // otherwise the following block has taken its place
+    }
+}
+
 void RenderBlockGroup::render()
 {
-    for (const SharedPtr<RenderBlockBase>& block : m_blocks)
-        block->render();
+    forEachBlock([](RenderBlockBase& block) { block.render(); });
 }
 
 void RenderBlockGroup::update(float time)
 {
-    for (const SharedPtr<RenderBlockBase>& block : m_blocks)
-        block->update(time);
+    forEachBlock([time](RenderBlockBase& block) { block.update(time); });
 }
 
 void RenderBlockGroup::setStereo(float focalDistance, float eyeSeparation)
 {
-    for (const SharedPtr<RenderBlockBase>& block : m_blocks)
-        block->setStereo(focalDistance, eyeSeparation);
+    forEachBlock([=](RenderBlockBase& block) { block.setStereo(focalDistance, eyeSeparation); });
 }
 
 } // namespace orv
