@@ -345,6 +345,25 @@ TEST(ConvertLights, followTheSquareOfTheDistance)
     }
 }
 
+// Fault caught: a node that is flat in one or two of its axes and comes out turned, or with a node for shear.
+TEST(ConvertPlacement, keepsFlatNodes)
+{
+    const aiQuaternion turn(aiVector3D(1, 2, 3).Normalize(), 1.1f);
+    for (unsigned zeros = 0; zeros < 8; ++zeros)
+    {
+        const aiVector3D scale(zeros & 1 ? 0.0f : 2.0f, zeros & 2 ? 0.0f : -1.0f, zeros & 4 ? 0.0f : 3.0f);
+        const aiMatrix4x4 wanted = convert::compose(aiVector3D(4, 5, 6), turn, scale);
+        glo::NodeData node;
+        EXPECT_TRUE(convert::place(node, wanted)) << zeros;
+        const Vector3f axis(node.rotation.x, node.rotation.y, node.rotation.z);
+        const Quaternionf rotation = quaternionFromAxisAngle(axis, Anglef::fromRadians(node.rotation.w));
+        const Matrix4f made = toMatrix4(rotation) * scaleMatrix(node.scale);
+        const Matrix4f expected = convert::toMatrix(wanted);
+        for (int column = 0; column < 3; ++column)
+            EXPECT_LT(length(made[column] - expected[column]), 1e-5f) << zeros;
+    }
+}
+
 // Fault caught: transforms that components cannot hold and that helper nodes get wrong.
 TEST(ConvertPlacement, splitsShear)
 {

@@ -30,7 +30,11 @@ void orthonormalise(aiVector3D columns[3])
         columns, columns + 3, [](const aiVector3D& column) { return column.SquareLength() == 0.0f; });
     for (unsigned i = 0; isNothing && i < 3; ++i)
         columns[i][i] = 1.0f; // of scale zero: no rotation either, since it may grow
-    columns[0] = columns[0].SquareLength() > 0.0f ? columns[0].Normalize() : across(columns[1] ^ columns[2]);
+    if (columns[0].SquareLength() == 0.0f)
+        columns[0] = columns[1] ^ columns[2];
+    if (columns[0].Length() < 1e-6f)
+        columns[0] = across(columns[columns[1].SquareLength() > 0.0f ? 1 : 2]);
+    columns[0].Normalize();
     columns[1] -= columns[0] * (columns[0] * columns[1]);
     if (columns[1].Length() < 1e-6f)
         columns[1] = columns[2] ^ columns[0];
