@@ -572,6 +572,8 @@ TEST_F(GltfReader, refusesWithThePlace)
     }
     GltfWriter whole;
     whole.setAttribute("POSITION", whole.add(CORNERS, "VEC3"));
+    whole.file["asset"]["version"] = "2.1"; // compatible, as it does not say otherwise
+    EXPECT_EQ("", getFault(whole.write()));
     const GltfWriter::Bytes bytes = whole.write();
     for (size_t size = 0; size + 1 < bytes.size(); ++size)
         EXPECT_NE("", getFault({bytes.begin(), bytes.begin() + std::ptrdiff_t(size)})) << size;

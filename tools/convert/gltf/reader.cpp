@@ -78,10 +78,12 @@ std::unique_ptr<aiScene> readGltf(std::unique_ptr<Document> document, FileOpener
 {
     Source source(std::move(document), std::move(open), options, report);
     const Object asset = source.document.root().object("asset");
-    const std::string wanted = asset.word(asset.has("minVersion") ? "minVersion" : "version");
+    const bool saysLeast = asset.has("minVersion"); // without it, minor versions are compatible
+    const std::string wanted = asset.word(saysLeast ? "minVersion" : "version");
     if (wanted.empty())
         throw Fault("does not say which version of glTF it is");
-    if (wanted != "2.0" && wanted != "2")
+    const bool isRead = wanted == "2" || (saysLeast ? wanted == "2.0" : wanted.compare(0, 2, "2.") == 0);
+    if (!isRead)
         throw Fault("is of glTF " + wanted.substr(0, 20) + ", which is not read");
     return readScene(source);
 }
