@@ -57,6 +57,30 @@ TEST_F(ConvertTest, failuresWriteNothing)
     }
 }
 
+// Fault caught: names in a model that write lines of the report, or move the terminal's cursor.
+TEST_F(ConvertTest, printsPlainLines)
+{
+    const std::string name = "\\u001b[2J\\nb.glo: lost";
+    const std::string start =
+        R"({"asset":{"version":"2.0"},"scene":0,"scenes":[{"nodes":[0]}],"nodes":[{"mesh":0}],)";
+    const std::string mesh =
+        R"("meshes":[{"name":")" + name + R"(","primitives":[{"attributes":{"POSITION":0,"_A":0}}]}],)";
+    const std::string end =
+        R"("accessors":[{"componentType":5126,"count":3,"type":"VEC3","bufferView":0}],)"
+        R"("bufferViews":[{"buffer":0,"byteLength":36}],)"
+        R"("buffers":[{"uri":"data:;base64,AAAAAAAAAAAAAAAAAACAPwAAAAAAAAAAAAAAAAAAgD8AAAAA"}],)";
+    m_folder.write("a.gltf", start + mesh + end + R"("extensionsUsed":[")" + name + "\"]}");
+    m_folder.write("b.gltf", start + mesh + end + R"("extensionsRequired":[")" + name + "\"]}");
+    for (const char* arguments : {"a.gltf a.glo", "b.gltf b.glo", ". out"})
+    {
+        const Outcome outcome = convert(arguments);
+        EXPECT_EQ(std::string::npos, outcome.output.find('\x1b')) << outcome.output;
+        EXPECT_EQ(std::string::npos, outcome.output.find("\nb.glo: lost")) << outcome.output;
+        const bool isNamed = outcome.output.find("\\x1b[2J\\x0ab.glo: lost") != std::string::npos;
+        EXPECT_TRUE(isNamed) << arguments << outcome.output;
+    }
+}
+
 // Fault caught: half an output where the second half cannot be written.
 TEST_F(ConvertTest, allOrNothing)
 {

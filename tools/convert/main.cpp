@@ -3,6 +3,7 @@
 #include "batch/folder.h"
 
 #include "commandline/commandline.h"
+#include "commandline/terminaltext.h"
 
 #include <cstdio>
 #include <filesystem>
@@ -44,7 +45,7 @@ const char* const FOOTER =
 
 int fail(const std::string& message)
 {
-    std::fprintf(stderr, "orv-convert: %s\n", message.c_str());
+    std::fprintf(stderr, "orv-convert: %s\n", commandline::toTerminalText(message).c_str());
     return commandline::FAILED;
 }
 

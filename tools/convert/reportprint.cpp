@@ -1,5 +1,7 @@
 #include "reportprint.h"
 
+#include "commandline/terminaltext.h"
+
 #include <nlohmann/json.hpp>
 
 #include <algorithm>
@@ -11,6 +13,7 @@ namespace convert
 namespace
 {
 
+using commandline::toTerminalText;
 using Json = nlohmann::ordered_json;
 
 /// "morph-targets" and 2 become "2 morph targets", "vertices" and 1 become "1 vertex".
@@ -51,7 +54,7 @@ std::string spell(const char* kind, const std::map<Report::Finding, int>& findin
     std::string lines;
     for (const auto& [finding, times] : findings)
     {
-        lines += std::string("  ") + kind + ": " + finding.second;
+        lines += std::string("  ") + kind + ": " + toTerminalText(finding.second);
         if (times > 1)
             lines += " (" + std::to_string(times) + " times)";
         lines += "\n";
@@ -63,7 +66,7 @@ std::string spell(const ModelClip& clip)
 {
     char times[100];
     std::snprintf(times, sizeof times, "from %.2f to %.2f seconds\n", double(clip.start), double(clip.end));
-    return "  animation \"" + clip.name + "\" " + times;
+    return "  animation \"" + toTerminalText(clip.name) + "\" " + times;
 }
 
 Json toJson(const Report::Figures& figures)
@@ -87,11 +90,12 @@ Json toJson(const std::map<Report::Finding, int>& findings)
 std::string toText(const std::string& path, const std::vector<OutputFile>& files, const ConvertedModel& model)
 {
     const Report& report = model.report;
-    std::string text = path + " (" + report.getFormat() + "): " + spell(report.getIn()) + "\n";
+    std::string text =
+        toTerminalText(path) + " (" + report.getFormat() + "): " + spell(report.getIn()) + "\n";
     for (const OutputFile& file : files)
     {
         const bool isScene = &file == &files.back();
-        text += file.path + ": " + spell("bytes", file.bytes.size());
+        text += toTerminalText(file.path) + ": " + spell("bytes", file.bytes.size());
         text += isScene ? ", " + spell(report.getOut()) + "\n" : "\n";
     }
     for (const ModelClip& clip : model.clips)

@@ -4,6 +4,7 @@
 #include "print.h"
 
 #include "commandline/commandline.h"
+#include "commandline/terminaltext.h"
 
 #include <cerrno>
 #include <cstdio>
@@ -115,7 +116,8 @@ int run(const Options& options)
         const std::string failure = inspectFile(path, report);
         if (!failure.empty())
         {
-            std::fprintf(stderr, "orv-inspect: %s: %s\n", path.c_str(), failure.c_str());
+            std::fprintf(stderr, "orv-inspect: %s: %s\n", commandline::toTerminalText(path).c_str(),
+                         failure.c_str());
             json.push_back({{"file", path}, {"error", failure}});
             unread = true;
             continue;

@@ -1,5 +1,7 @@
 #include "print.h"
 
+#include "commandline/terminaltext.h"
+
 #include <algorithm>
 #include <cstdio>
 
@@ -7,6 +9,7 @@ namespace inspect
 {
 
 using namespace orv::detail::glo;
+using commandline::toTerminalText;
 using nlohmann::ordered_json;
 
 namespace
@@ -31,56 +34,6 @@ std::string toText(const ordered_json& value)
     if (text.size() > LONGEST_VALUE)
         text = text.substr(0, LONGEST_VALUE) + "...";
     return text;
-}
-
-/// The code point that begins there; its length is 0 if it is invalid UTF-8.
-uint32_t readCodePoint(const std::string& text, size_t at, size_t& length)
-{
-    const auto byte = [&](size_t i) { return i < text.size() ? uint32_t(uint8_t(text[i])) : 0u; };
-    const uint32_t first = byte(at);
-    constexpr uint32_t LEAST[] = {0, 0, 0x80, 0x800, 0x10000};
-    length = first < 0x80 ? 1 : first >> 5 == 6 ? 2 : first >> 4 == 14 ? 3 : first >> 3 == 30 ? 4 : 0;
-    if (length < 2)
-        return first;
-    uint32_t point = first & (0x7fu >> length);
-    for (size_t i = 1; i < length; ++i)
-    {
-        if (byte(at + i) >> 6 != 2)
-            length = 0;
-        point = point << 6 | (byte(at + i) & 0x3f);
-    }
-    if (length > 0 && (point < LEAST[length] || point > 0x10ffff))
-        length = 0;
-    return point;
-}
-
-/// Characters that move the cursor, set colours, begin a line or change the direction of writing.
-bool isControl(uint32_t point)
-{
-    return point < 0x20 || (point >= 0x7f && point < 0xa0) || point == 0x61c || point == 0x200e ||
-           point == 0x200f || (point >= 0x2028 && point <= 0x202e) || (point >= 0x2066 && point <= 0x2069) ||
-           (point >= 0xd800 && point < 0xe000);
-}
-
-/// Escapes text from files for terminals and line-based readers: control characters and invalid bytes become "\x1b".
-std::string escape(const std::string& text)
-{
-    std::string escaped;
-    for (size_t at = 0; at < text.size();)
-    {
-        size_t length;
-        const uint32_t point = readCodePoint(text, at, length);
-        const bool isPlain = length > 0 && !isControl(point);
-        const size_t size = std::max<size_t>(length, 1);
-        for (size_t i = at; i < at + size; ++i)
-        {
-            char code[8];
-            std::snprintf(code, sizeof(code), "\\x%02x", unsigned(uint8_t(text[i])));
-            escaped += isPlain ? std::string(1, text[i]) : code;
-        }
-        at += size;
-    }
-    return escaped;
 }
 
 void printChunk(const Chunk& chunk, int depth)
@@ -152,14 +105,14 @@ void printTree(const Report& report)
     {
         std::printf("%4d ", statement.line);
         for (const std::string& word : statement.words)
-            std::printf(" %s", escape(word).c_str());
+            std::printf(" %s", toTerminalText(word).c_str());
         std::printf("\n");
     }
 }
 
 void printTotals(const Report& report)
 {
-    std::printf("%s: %s, %s\n", escape(report.path).c_str(), report.kind.c_str(),
+    std::printf("%s: %s, %s\n", toTerminalText(report.path).c_str(), report.kind.c_str(),
                 counted(report.size, "byte", "bytes").c_str());
     if (report.kind != "scene")
         return;
@@ -197,14 +150,14 @@ void printTotals(const Report& report)
 
 void printFindings(const Report& report)
 {
-    const std::string file = escape(report.path);
+    const std::string file = toTerminalText(report.path);
     for (const Finding& finding : report.findings.getSorted())
     {
         const KindInfo& info = getInfo(finding.kind);
-        const std::string place = finding.path.empty() ? "" : ", " + escape(finding.path);
+        const std::string place = finding.path.empty() ? "" : ", " + toTerminalText(finding.path);
         std::printf("%s: %s %s at %llu%s: %s\n", file.c_str(), getName(info.severity), info.code,
                     static_cast<unsigned long long>(finding.offset), place.c_str(),
-                    escape(finding.sentence).c_str());
+                    toTerminalText(finding.sentence).c_str());
     }
     const auto count = [&report](Severity severity, const char* one, const char* many)
     { return counted(uint64_t(report.findings.count(severity)), one, many); };

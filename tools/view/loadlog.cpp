@@ -1,8 +1,11 @@
 #include "loadlog.h"
 
+#include "commandline/terminaltext.h"
+
 #include "orv/logsink.h"
 
 #include <cstdio>
+#include <sstream>
 
 namespace view::loadlog
 {
@@ -17,7 +20,11 @@ void write(orv::LogLevel level, const char* place, const char* text, void*)
 {
     if (level == orv::LogLevel::ERROR && g_errorCount++ == 0)
         g_message = text;
-    std::fprintf(stderr, "%c/ORV: %s; %s\n", level == orv::LogLevel::ERROR ? 'E' : 'W', place, text);
+    std::istringstream lines(text); // shader compilers write several
+    std::string shown;
+    for (std::string line; std::getline(lines, line);)
+        shown += (shown.empty() ? "" : "\n") + commandline::toTerminalText(line);
+    std::fprintf(stderr, "%c/ORV: %s; %s\n", level == orv::LogLevel::ERROR ? 'E' : 'W', place, shown.c_str());
 }
 
 } // namespace

@@ -7,6 +7,7 @@
 #include "viewer.h"
 
 #include "commandline/commandline.h"
+#include "commandline/terminaltext.h"
 
 #include <cstdio>
 #include <cstdlib>
@@ -54,6 +55,6 @@ int main(int argumentCount, char** arguments)
     if (run(options, error))
         return commandline::finishOutput("orv-view", EXIT_SUCCESS);
     if (!error.empty())
-        std::fprintf(stderr, "orv-view: %s\n", error.c_str());
+        std::fprintf(stderr, "orv-view: %s\n", commandline::toTerminalText(error).c_str());
     return EXIT_FAILURE;
 }

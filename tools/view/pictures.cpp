@@ -3,6 +3,7 @@
 #include "stage/framing.h"
 #include "stage/scenesize.h"
 
+#include "commandline/terminaltext.h"
 #include "glcalls/glcalls.h"
 #include "headless/headless.h"
 #include "headless/png.h"
@@ -176,7 +177,7 @@ bool Session::prepare(std::string& error)
     m_shots = chooseShots(m_options, clip);
     if (m_shots.size() > 1 && m_options.turntable == 0 && clip.end <= clip.start)
         std::fprintf(stderr, "orv-view: %s: not animated, all pictures will be the same\n",
-                     m_options.scene.path.c_str());
+                     commandline::toTerminalText(m_options.scene.path).c_str());
     if (m_options.background)
         m_stage.setBackground(*m_options.background);
     if (m_options.camera.empty())
@@ -264,7 +265,7 @@ void printStats(const Options& options, const SceneSize& size, double loadMillis
                 const FrameStats& frame)
 {
     const bool isOneOfMany = options.frames > 1 || options.turntable > 1 || options.columns > 0;
-    std::printf("%s\n", options.scene.path.c_str());
+    std::printf("%s\n", commandline::toTerminalText(options.scene.path).c_str());
     std::printf("  solids     %d\n", size.solids);
     std::printf("  draws      %llu\n", static_cast<unsigned long long>(frame.draws));
     std::printf("  triangles  %ld\n", size.triangles);
@@ -295,7 +296,8 @@ bool drawPictures(const Options& options, const std::string& scenePath, std::str
         return false;
     const SceneSize size = measureScene(stage->getScene());
     if (size.solids == 0)
-        std::fprintf(stderr, "orv-view: %s: nothing to see in it\n", options.scene.path.c_str());
+        std::fprintf(stderr, "orv-view: %s: nothing to see in it\n",
+                     commandline::toTerminalText(options.scene.path).c_str());
 
     Session session(options, *stage, *context, studio.getContext());
     const bool isDrawn = session.run(error);

@@ -7,6 +7,7 @@
 
 #include "orv/sceneutil.h"
 
+#include "commandline/terminaltext.h"
 #include "glcalls/glcalls.h"
 
 #include "orv/picking.h"
@@ -433,7 +434,7 @@ void Viewer::say(const std::string& message)
     m_messageEnd = Clock::now() + MESSAGE_TIME;
     m_needsWriting = true;
     if (!m_headsUp)
-        std::fprintf(stderr, "orv-view: %s\n", message.c_str());
+        std::fprintf(stderr, "orv-view: %s\n", commandline::toTerminalText(message).c_str());
 }
 
 void Viewer::writeHeadsUp()

@@ -1,5 +1,6 @@
 #include "folder.h"
 
+#include "commandline/terminaltext.h"
 #include "convert/files/filegate.h"
 #include "convert/lowercase.h"
 #include "convert/outputfiles.h"
@@ -27,6 +28,7 @@ namespace convert
 {
 
 namespace fs = std::filesystem;
+using commandline::toTerminalText;
 using Json = nlohmann::ordered_json;
 
 namespace
@@ -222,12 +224,12 @@ void work(const FolderJob& job, const std::vector<Model>& models, Shared& shared
         const bool isUnchanged = !job.again && item.isUnchanged(error);
         const bool isDone = isUnchanged ? error.empty() : item.convert(error);
         ++(!isDone ? shared.failed : isUnchanged ? shared.unchanged : shared.converted);
-        std::printf("%zu of %zu: %s: %s%s\n", i + 1, models.size(), models[i].path.c_str(),
+        std::printf("%zu of %zu: %s: %s%s\n", i + 1, models.size(), toTerminalText(models[i].path).c_str(),
                     isDone ? (isUnchanged ? "unchanged" : "converted") : "failed",
                     isUnchanged && !isDone ? " before, and unchanged" : "");
         std::fflush(stdout);
         if (!isDone)
-            std::fprintf(stderr, "orv-convert: %s\n", error.c_str());
+            std::fprintf(stderr, "orv-convert: %s\n", toTerminalText(error).c_str());
     }
 }
 
@@ -267,7 +269,7 @@ bool convertFolder(const FolderJob& job)
         error = job.folder + ": no models in it";
     if (!error.empty())
     {
-        std::fprintf(stderr, "orv-convert: %s\n", error.c_str());
+        std::fprintf(stderr, "orv-convert: %s\n", toTerminalText(error).c_str());
         return false;
     }
     void* const memory =
