@@ -15,7 +15,7 @@ Bytes bigs(const std::vector<int>& values, int size = 2)
     return bytes;
 }
 
-/// Every character is one of the three glyphs of makeFont().
+/// Maps each character to one of the glyphs of makeFont().
 Bytes makeCharacterMap(int format)
 {
     Bytes glyphs;
@@ -33,13 +33,13 @@ Bytes makeCharacterMap(int format)
     }
 }
 
-/// Glyph 1 followed by 2, and 2 by 1.
+/// The table "kern": glyph 1 before 2, and 2 before 1.
 Bytes makeKerning()
 {
     return join({bigs({0, 1, 0, 14 + 12, 1, 2, 12, 1, 0}), bigs({1, 2, -50, 2, 1, 30})});
 }
 
-/// The same by a list of pairs, and by classes behind an extension.
+/// The table "GPOS": a list of pairs, and classes of glyphs behind an extension.
 Bytes makePositions()
 {
     const Bytes listed =
@@ -55,7 +55,7 @@ Bytes makePositions()
 
 using Tables = std::vector<std::pair<const char*, Bytes>>;
 
-/// Those that every font here has. Two glyphs have a width of their own.
+/// The tables that every font here has. Two glyphs have a width of their own.
 Tables makeCommonTables(int mapFormat, int glyphCount)
 {
     Bytes head(54), hhea(36);
@@ -92,7 +92,7 @@ Bytes assembleFont(const Bytes& kind, const Tables& tables, uint32_t start = 0)
     return join({directory, data});
 }
 
-/// A triangle, a shape with curves, and one made of both.
+/// A TrueType font: a triangle, a shape with curves, and one composed of both.
 /// @param more   further tables.
 /// @param start  of the font in its file.
 Bytes makeFont(int mapFormat, const Tables& more = {}, uint32_t start = 0)
@@ -129,7 +129,7 @@ Bytes makeIndex(const std::vector<Bytes>& items)
     return join({list, join(items)});
 }
 
-/// Numbers and the operator behind them, in as many bytes whatever the numbers are.
+/// An entry of a dictionary: numbers and their operator. Its size does not depend on the numbers.
 Bytes makeEntry(const std::vector<size_t>& values, const Bytes& command)
 {
     Bytes entry;
@@ -143,16 +143,16 @@ struct PostScript
     std::vector<Bytes> programs; ///< of glyphs
     std::vector<Bytes> global;   ///< subroutines; the first has the number -107
     std::vector<Bytes> local;
-    Bytes
-        selection; ///< which of two parts of the font, of which the second has the local subroutines, a glyph belongs
-                   ///< to; none: the font is in one piece
+    /// Which of two parts of the font each glyph belongs to; only the second has the local subroutines. Empty: the font
+    /// has no parts.
+    Bytes selection;
 };
 
 /// The table "CFF ".
 Bytes makeOutlines(const PostScript& font)
 {
     const bool isInParts = !font.selection.empty();
-    const Bytes ownEntries = makeEntry({10}, {20}); // a width; behind it come the subroutines
+    const Bytes ownEntries = makeEntry({10}, {20}); // a width; the subroutines follow
     const Bytes own = join({ownEntries, makeEntry({ownEntries.size() + 6}, {19}), makeIndex(font.local)});
     const size_t ownSize = ownEntries.size() + 6;
     const size_t topSize = isInParts ? 17 + 6 + 7 + 7 + 7 : 6 + 11;
@@ -189,7 +189,7 @@ Bytes makePostScriptFont(const PostScript& font)
 constexpr uint8_t FIRST_SUBROUTINE = 139 - 107; ///< as a number in a program
 constexpr uint8_t CALL_LOCAL = 10, CALL_GLOBAL = 29, RETURN = 11, END = 14;
 
-/// A number of a program.
+/// A number in a program.
 Bytes number(int value)
 {
     return join({{28}, bigs({value})});
@@ -203,7 +203,7 @@ Bytes numbers(const std::vector<int>& values, const Bytes& command)
     return join({bytes, command});
 }
 
-/// Each way to draw, hints with masks, and calls of both kinds of subroutines.
+/// Uses every drawing command, hints with masks, and both kinds of subroutines.
 PostScript makeDrawing()
 {
     PostScript font;
@@ -225,14 +225,14 @@ PostScript makeDrawing()
         join({hints, move, lines, {END}}),
         join({move, {FIRST_SUBROUTINE, CALL_GLOBAL, END}}),
         join({numbers({10}, {4}), fraction, {FIRST_SUBROUTINE, CALL_LOCAL}, flexes}),
-        join({move, numbers({0, 300, 400, 150, -400, 150}, {8, END})})}; // reaches beyond its ends
+        join({move, numbers({0, 300, 400, 150, -400, 150}, {8, END})})}; // its curve reaches beyond its ends
     font.global = {join({curves, {RETURN}})};
     font.local = {join({{FIRST_SUBROUTINE, CALL_GLOBAL}, lines})};
     return font;
 }
 
 /// Subroutines that each call the next one 40 times.
-/// @param last  what the one behind these does.
+/// @param last  the subroutine that the last of them calls.
 std::vector<Bytes> makeNest(int depth, const Bytes& last)
 {
     std::vector<Bytes> subroutines;
@@ -261,7 +261,7 @@ void addFonts(std::vector<Seed>& seeds)
     seeds.push_back({"font", "none", {}, "Error reading Font \"file.ttf\"", false});
 
     PostScript drawing = makeDrawing();
-    const char* const OTHER_KIND = "Error reading Font \"file.ttf\""; // a face alone
+    const char* const OTHER_KIND = "Error reading Font \"file.ttf\""; // Font refuses it, FontFace accepts it
     const auto add = [&](const char* name) {
         seeds.push_back({"font", name, makePostScriptFont(drawing), OTHER_KIND, true});
     };
@@ -284,7 +284,7 @@ void addCostlyFonts(std::vector<Seed>& files)
     const Bytes lines = numbers({10, 10, -10, -10}, {6, RETURN});
     add("subroutines that do nothing", 9, {RETURN});
     add("subroutines that draw", 9, lines);
-    add("subroutines that draw as much as they may", 2, lines);
+    add("subroutines that draw as much as allowed", 2, lines);
     add("subroutines that draw far", 2,
         numbers({500, 700, 0, -700, 500, 0, -500, 700, -500, -700, 0, 0}, {8, RETURN}));
 }

@@ -200,8 +200,8 @@ bool loadScene(Session& session, const Bytes&, std::string& fault)
     return true;
 }
 
-/// Every glyph of some characters and of the first numbers, at two sizes, on pages that hold few of them.
-/// @return whether there is such a face.
+/// Draws the glyphs of some characters and of the first numbers, at two sizes, on small pages.
+/// @return false if the face is refused.
 bool drawFace(Session& session, const Bytes& file, std::string& fault)
 {
     MemoryStream stream(file.data(), int(file.size()));

@@ -1,5 +1,7 @@
 #include "cfftable.h"
 
+#include <algorithm>
+
 namespace orv::detail
 {
 
@@ -9,6 +11,13 @@ namespace
 constexpr unsigned MOST_PARTS = 256;          ///< their numbers are bytes
 constexpr std::size_t MOST_DICTIONARY = 4096; ///< bytes; hundreds are usual
 constexpr unsigned SELECTION_RANGES = 3;      ///< the format of m_selection that has ranges of glyphs
+constexpr std::size_t RANGE_SIZE = 3;         ///< bytes: the first glyph of a range, and its part
+
+// The first bytes of what a dictionary holds.
+constexpr unsigned ESCAPE = 12; ///< of an operator of two bytes
+constexpr unsigned FIRST_OPERAND = 28;
+constexpr unsigned LONG = 29;
+constexpr unsigned REAL = 30;
 
 FontBytes makeUnsound()
 {
@@ -17,7 +26,37 @@ FontBytes makeUnsound()
     return bytes;
 }
 
+/// @return 0 for a real number: none leads to programs.
+uint32_t readOperand(FontBytes& bytes, std::size_t& at, unsigned first)
+{
+    if (first == LONG)
+    {
+        at += 4;
+        return bytes.u32(at - 4);
+    }
+    if (first != REAL)
+        return uint32_t(readCffNumber(bytes, at, first));
+    unsigned digits = 0;
+    do
+        digits = bytes.u8(at++);
+    while (bytes.isSound() && (digits & 15) != 15 && digits >> 4 != 15);
+    return 0;
+}
+
 } // namespace
+
+int readCffNumber(FontBytes& bytes, std::size_t& at, unsigned first)
+{
+    if (first == 28)
+    {
+        at += 2;
+        return bytes.s16(at - 2);
+    }
+    if (first < 247)
+        return int(first) - 139;
+    const int low = int(bytes.u8(at++)) + 108;
+    return first < 251 ? int(first - 247) * 256 + low : -(int(first - 251) * 256 + low);
+}
 
 bool CffIndex::read(FontBytes table, std::size_t& at)
 {
@@ -63,12 +102,28 @@ struct CffTable::Dictionary
     uint32_t privateSize = 0;
     uint32_t privateAt = 0;
     uint32_t subroutines = 0; ///< relative to privateAt
+
+    void set(unsigned command, uint32_t valueBefore, uint32_t value)
+    {
+        switch (command)
+        {
+        case 17: programs = value; break;
+        case 18:
+            privateSize = valueBefore;
+            privateAt = value;
+            break;
+        case 19: subroutines = value; break;
+        case ESCAPE << 8 | 6: programType = value; break;
+        case ESCAPE << 8 | 36: parts = value; break;
+        case ESCAPE << 8 | 37: selection = value; break;
+        default:;
+        }
+    }
 };
 
-/// Operands come before their operator.
+/// Reads a dictionary: operands come before their operator.
 bool CffTable::readDictionary(FontBytes bytes, Dictionary& dictionary)
 {
-    const unsigned ESCAPE = 12, WORD = 28, LONG = 29, REAL = 30;
     if (bytes.size() > MOST_DICTIONARY)
         return false;
     uint32_t value = 0, valueBefore = 0;
@@ -76,43 +131,13 @@ bool CffTable::readDictionary(FontBytes bytes, Dictionary& dictionary)
     while (at < bytes.size() && bytes.isSound())
     {
         const unsigned first = bytes.u8(at++);
-        if (first < WORD)
+        if (first < FIRST_OPERAND)
         {
-            switch (first == ESCAPE ? ESCAPE << 8 | bytes.u8(at++) : first)
-            {
-            case 17: dictionary.programs = value; break;
-            case 18:
-                dictionary.privateSize = valueBefore;
-                dictionary.privateAt = value;
-                break;
-            case 19: dictionary.subroutines = value; break;
-            case ESCAPE << 8 | 6: dictionary.programType = value; break;
-            case ESCAPE << 8 | 36: dictionary.parts = value; break;
-            case ESCAPE << 8 | 37: dictionary.selection = value; break;
-            default:;
-            }
+            dictionary.set(first == ESCAPE ? ESCAPE << 8 | bytes.u8(at++) : first, valueBefore, value);
             continue;
         }
         valueBefore = value;
-        value = 0;
-        if (first == WORD)
-            value = uint32_t(bytes.s16(at));
-        else if (first == LONG)
-            value = bytes.u32(at);
-        else if (first == REAL)
-        {
-            unsigned digits = 0;
-            do
-                digits = bytes.u8(at++);
-            while (bytes.isSound() && (digits & 15) != 15 && digits >> 4 != 15);
-        }
-        else if (first < 247)
-            value = first - 139;
-        else if (first < 251)
-            value = (first - 247) * 256 + bytes.u8(at) + 108;
-        else if (first < 255)
-            value = 0u - ((first - 251) * 256 + bytes.u8(at) + 108);
-        at += first == WORD ? 2 : first == LONG ? 4 : first >= 247 ? 1 : 0;
+        value = readOperand(bytes, at, first);
     }
     return bytes.isSound();
 }
@@ -167,7 +192,6 @@ bool CffTable::readParts(FontBytes table, const Dictionary& top)
 
 bool CffTable::readSelection(FontBytes table, std::size_t at)
 {
-    const std::size_t RANGE_SIZE = 3;
     m_selectionFormat = table.u8(at);
     if (m_selectionFormat == 0)
         m_selection = table.part(at + 1, m_programs.getCount());
@@ -186,13 +210,13 @@ unsigned CffTable::findPart(uint32_t glyph) const
     if (m_selectionFormat != SELECTION_RANGES)
         return selection.u8(glyph);
     std::size_t low = 0;
-    std::size_t high = selection.size() / 3;
+    std::size_t high = selection.size() / RANGE_SIZE;
     while (high - low > 1)
     {
         const std::size_t middle = (low + high) / 2;
-        (selection.u16(3 * middle) <= glyph ? low : high) = middle;
+        (selection.u16(RANGE_SIZE * middle) <= glyph ? low : high) = middle;
     }
-    return selection.u8(3 * low + 2);
+    return selection.u8(RANGE_SIZE * low + 2);
 }
 
 CffTable::Program CffTable::getProgram(uint32_t glyph) const

@@ -7,6 +7,11 @@
 namespace orv::detail
 {
 
+/// Reads an integer of a dictionary or a program.
+/// @param at     in: the byte after the first; out: the end of the number.
+/// @param first  the number's first byte: 28, or 32 to 254.
+int readCffNumber(FontBytes& bytes, std::size_t& at, unsigned first);
+
 /// An INDEX: a numbered list of byte ranges, used for programs and dictionaries.
 class CffIndex
 {

@@ -69,8 +69,8 @@ float countEdges(const stbtt_vertex& from, const stbtt_vertex& to, float scale)
     return std::exp2(std::ceil(std::log2(edges)));
 }
 
-/// What a shape costs to draw: edges are sorted, which is quadratic at its worst, and each edge takes a step for each pixel
-/// along its way, or, where it leaves the glyph's box, for each pixel of the rows that it crosses.
+/// Checks the cost of drawing a shape. Sorting its edges is quadratic in the worst case. Each edge takes a step for
+/// each pixel along it or, outside the glyph's box, for each pixel of the rows that it crosses.
 /// @return null, or why it must not be drawn.
 const char* findCostFault(const Shape& shape, float scale)
 {
@@ -108,7 +108,7 @@ const char* findCostFault(const Shape& shape, float scale)
                : nullptr;
 }
 
-/// @return null, or why there is none.
+/// Reads a TrueType outline. @return null, or why there is none.
 const char* readShape(const stbtt_fontinfo& info, FontTables tables, uint32_t glyph, Shape& shape)
 {
     if (const char* fault = tables.findGlyphFault(glyph))
@@ -123,7 +123,7 @@ const char* readShape(const stbtt_fontinfo& info, FontTables tables, uint32_t gl
     return nullptr;
 }
 
-/// The same of PostScript outlines; the box is that of all points.
+/// Reads a PostScript outline; its box is that of all points, control points included.
 const char* readShape(const CffTable& outlines, FontTables tables, uint32_t glyph, Shape& shape)
 {
     if (!tables.hasMetrics(glyph))
@@ -158,7 +158,7 @@ struct FontOutlines::Rasteriser
 {
     FontTables tables;
     bool isPostScript = false;
-    stbtt_fontinfo info = {}; ///< of TrueType outlines alone: the rasteriser never sees tables of others
+    stbtt_fontinfo info = {}; ///< for TrueType outlines only: the rasteriser reads no others by itself
     CffTable outlines = {};
 
     const char* read(uint32_t glyph, Shape& shape) const

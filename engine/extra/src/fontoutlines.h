@@ -33,7 +33,7 @@ public:
     FontOutlines(unsigned char* file, const FontTables& tables);
 
     /// PostScript outlines.
-    /// @param outlines  of the same file, which stays; copied.
+    /// @param outlines  of the same file, which must outlive this object; copied.
     FontOutlines(const FontTables& tables, const CffTable& outlines);
     ~FontOutlines();
 

@@ -1,5 +1,6 @@
 #include "glyphprogram.h"
 
+#include <algorithm>
 #include <cstdlib>
 
 namespace orv::detail
@@ -62,22 +63,17 @@ void GlyphProgram::step()
 
 void GlyphProgram::readNumber(unsigned first)
 {
+    const unsigned FIXED = 255; // 16.16
     if (m_count == MOST_OPERANDS)
         return fail(DAMAGED_OUTLINE);
     Call& now = m_calls[m_depth];
-    int64_t value = 0;
-    if (first == 28)
-        value = now.bytes.s16(now.at) * ONE;
-    else if (first < 247)
-        value = (int64_t(first) - 139) * ONE;
-    else if (first < 251)
-        value = (int64_t(first - 247) * 256 + now.bytes.u8(now.at) + 108) * ONE;
-    else if (first < 255)
-        value = -(int64_t(first - 251) * 256 + now.bytes.u8(now.at) + 108) * ONE;
+    if (first == FIXED)
+    {
+        m_operands[m_count++] = int32_t(now.bytes.u32(now.at));
+        now.at += 4;
+    }
     else
-        value = int32_t(now.bytes.u32(now.at));
-    now.at += first == 28 ? 2 : first == 255 ? 4 : first >= 247 ? 1 : 0;
-    m_operands[m_count++] = value;
+        m_operands[m_count++] = readCffNumber(now.bytes, now.at, first) * ONE;
     if (!now.bytes.isSound())
         fail(DAMAGED_OUTLINE);
 }

@@ -85,7 +85,7 @@ void write32(Bytes& file, size_t at, uint32_t value)
         file.at(at + i) = uint8_t(value >> (24 - 8 * i));
 }
 
-/// Where the directory of a font's tables has a table, 0 for nowhere.
+/// @return the offset of a table's entry in the font's directory, 0 if there is none.
 size_t findEntry(const Bytes& file, const std::string& tag)
 {
     for (size_t at = 12; at < 12 + 16u * file.at(5); at += 16)
@@ -123,7 +123,7 @@ Bytes makeCollection(const Bytes& first, const Bytes& second)
     return file;
 }
 
-/// Letters, and glyphs all over the font.
+/// Letters, and every 37th glyph of the font.
 std::vector<unsigned> sampleGlyphs(const FontFace& face)
 {
     std::vector<unsigned> glyphs;
@@ -218,8 +218,8 @@ TEST(FontFace, takesEachFontOfACollection)
 TEST(FontFace, refusesWhatItCannotRead)
 {
     const Bytes sans = readFont(SANS);
-    Bytes postScript = sans;
-    std::copy_n("OTTO", 4, postScript.begin());
+    Bytes noOutlines = sans; // by its first word, it has PostScript outlines
+    std::copy_n("OTTO", 4, noOutlines.begin());
     const Bytes outlines = readFont(POST_SCRIPT);
     const size_t outlinesEntry = findEntry(outlines, "CFF ");
     Bytes variable = outlines;
@@ -227,8 +227,8 @@ TEST(FontFace, refusesWhatItCannotRead)
     Bytes noNames = outlines;
     noNames.at(read32(outlines, outlinesEntry + 8) + 4 + 2) = 9; // bytes of an offset
     Bytes old = outlines;
-    const Bytes boxEntry = {0xFA, 0xDF, 0x05},
-                oldEntry = {0x8C, 0x0C, 0x06}; // in the place of the former, type 1
+    const Bytes boxEntry = {0xFA, 0xDF, 0x05};
+    const Bytes oldEntry = {0x8C, 0x0C, 0x06}; // programs of type 1
     std::copy(oldEntry.begin(), oldEntry.end(),
               std::search(old.begin(), old.end(), boxEntry.begin(), boxEntry.end()));
     Bytes noWidths = outlines;
@@ -244,7 +244,7 @@ TEST(FontFace, refusesWhatItCannotRead)
     } cases[] = {
         {{}, "it is no TrueType font"},
         {Bytes(1000, 0xA5), "it is no TrueType font"},
-        {postScript, "a table is missing or reaches beyond the file"},
+        {noOutlines, "a table is missing or reaches beyond the file"},
         {variable, "its outlines are in the form CFF2, of variable fonts"},
         {noNames, "its outlines in PostScript form (CFF) are damaged"},
         {old, "its outlines are PostScript programs of an old type"},

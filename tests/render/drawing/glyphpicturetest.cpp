@@ -21,7 +21,7 @@ namespace
 constexpr int SIDE = 64; ///< of the frame, in pixels
 const Vector2f PEN = Vector2f(16.0f, 48.0f);
 
-/// What FreeType draws of the same glyph, without hints, in the same place.
+/// Draws a glyph with FreeType, without hints, at the same place.
 class Judge
 {
 public:
@@ -72,7 +72,7 @@ protected:
     /// Compares each step-th glyph of a font with FreeType's.
     void compareWithFreeType(const std::string& path, unsigned step)
     {
-        const int ALLOWED = 96; // of 255, where curves are cut into straight lines, or contours overlap
+        const int ALLOWED = 96; // of 255, at curves, which become straight lines, and at overlapping contours
         const float MEAN_ALLOWED = 0.5f;
         const float SIZE = 40.0f;
         registerSource(*pool, "/", false);
@@ -115,7 +115,7 @@ protected:
 
 } // namespace
 
-// Faults caught: a way to draw that is read wrongly, a subroutine of another part of the font, a glyph in another place.
+// Faults caught: a drawing command that is misread, a subroutine of another part of the font, a glyph at another place.
 TEST_F(GlyphPictureTest, looksAsFreeTypeDrawsIt)
 {
     compareWithFreeType("/usr/share/fonts/truetype/dejavu/DejaVuSans.ttf", 29);
