@@ -37,8 +37,9 @@ class FakeAnimation : public orv::Animation
 public:
     void apply(float progress) override { m_applied = progress; }
     float getStart() const override { return 0.0f; }
-    float getEnd() const override { return 10.0f; }
+    float getEnd() const override { return m_end; }
     float m_applied = -1.0f;
+    float m_end = 10.0f;
 };
 
 } // namespace
@@ -198,6 +199,20 @@ TEST_F(ViewPlayer, goesFromClipToClip)
     m_player.stepClip(-1);
     EXPECT_EQ("pose", m_player.getClip().name);
     expectAt(7.0f, false);
+}
+
+// Fault caught: a share of the time line, or a JSON text, that is no number for a file with a key at an infinite time.
+TEST(ViewClip, hasNoLengthIfItsTimesAreInfinite)
+{
+    FakeAnimation animation;
+    EXPECT_EQ(10.0f, view::makeClip("walk", animation).end);
+    for (const float end : {INFINITY, -INFINITY, NAN})
+    {
+        animation.m_end = end;
+        const view::Clip clip = view::makeClip("walk", animation);
+        EXPECT_EQ("walk", clip.name);
+        EXPECT_EQ(0.0f, clip.end - clip.start) << end;
+    }
 }
 
 // Fault caught: a comparison that passes what a person would see, or fails for what the text allows.

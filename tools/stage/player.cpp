@@ -15,6 +15,13 @@ constexpr float FASTEST = 64.0f;
 
 } // namespace
 
+Clip makeClip(const std::string& name, const orv::Animation& animation)
+{
+    const float start = animation.getStart();
+    const float end = animation.getEnd();
+    return std::isfinite(end - start) ? Clip{name, start, end} : Clip{name};
+}
+
 Player::Player(const orv::SharedPtr<orv::Animation>& animation, std::vector<Clip> clips)
     : m_controller(animation)
     , m_clips(std::move(clips))

@@ -16,6 +16,9 @@ struct Clip
     float end = 0.0f;
 };
 
+/// A clip for an animation. If its times are infinite, the clip has no length: no player could go through it.
+Clip makeClip(const std::string& name, const orv::Animation& animation);
+
 /// Plays a time line, or one clip of it. Plays in a loop at first.
 class Player
 {

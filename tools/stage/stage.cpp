@@ -198,11 +198,10 @@ bool Stage::dress(const SceneFile::Dressing& dressing, std::string& error)
 
 void Stage::findClips()
 {
-    m_clips.push_back({"all", m_animation->getStart(), m_animation->getEnd()});
+    m_clips.push_back(makeClip("all", *m_animation));
     for (int i = 0; m_glo && i < m_glo->getAnimationCount(); ++i)
     {
-        const orv::SharedPtr<orv::AnimationGroup> group = m_glo->getAnimation(i);
-        const Clip clip = {m_glo->getAnimationName(i), group->getStart(), group->getEnd()};
+        const Clip clip = makeClip(m_glo->getAnimationName(i), *m_glo->getAnimation(i));
         if (clip.start == m_clips[0].start && clip.end == m_clips[0].end)
             m_clips[0].name = clip.name;
         else if (clip.end > clip.start)
