@@ -181,7 +181,8 @@ function show(model, scene) {
     if (!isOpen) {
         canvas.setAttribute("aria-label", "Nothing is open");
         call("orvClose");
-        showMessage(`${name} cannot be opened: it is damaged, or not a scene.`, remarks);
+        showMessage(`${name} cannot be opened: it is damaged, ` +
+            (isModel(name) === 1 ? "or not a scene." : "or a file that it names is missing."), remarks);
         return;
     }
     const errors = scene.remarks.filter((remark) => remark.error).length;
