@@ -78,6 +78,7 @@ public:
         light = nullptr;
         lightCount = 0;
         solids.clear();
+        m_kept.clear();
     }
 
     bool takesSolids = true;
@@ -93,6 +94,7 @@ public:
         {
             light = found;
             lightIndex = lightCount;
+            keep(found);
         }
         ++lightCount;
     }
@@ -103,7 +105,10 @@ public:
         const ShaderProgram* const program = appearance ? appearance->getShaderProgram().get() : nullptr;
         if (takesSolids && program && solid->getMesh() && appearance->isOpaque() &&
             !program->usesMirrorTexture())
+        {
             solids.push_back(solid);
+            keep(solid);
+        }
     }
 
     const Light* light = nullptr;
@@ -112,7 +117,15 @@ public:
     std::vector<Solid*> solids;
 
 private:
+    /// Nodes of the program's own may remove others when they are visited.
+    void keep(SceneNode* node)
+    {
+        if (node->sharedGetCount() > 0)
+            m_kept.emplace_back(node);
+    }
+
     const Light* m_wanted = nullptr;
+    std::vector<SharedPtr<SceneNode>> m_kept;
 };
 
 /// A material that receives shadows. The last of its maps restores its program.
@@ -163,6 +176,7 @@ struct ShadowParts
 
     bool isComplete() const { return bool(target); }
     void warn(bool& isSaid, const char* text) const;
+    void render(Camera* camera);
     void find(SceneNode& scene, const FlagMask& renderFlags, const FlagMask& recursiveFlags);
     void findReach(Camera* camera);
     void draw(const ShadowView& view);
@@ -359,6 +373,23 @@ void ShadowParts::giveBack()
     attached.clear();
 }
 
+/// Draws and publishes the map of what find() has found.
+void ShadowParts::render(Camera* camera)
+{
+    if (!walk.light || walk.lightIndex >= MOST_LIGHTS)
+    {
+        switchOff();
+        return warn(isLightSaid,
+                    "No shadows: no directional or spot light among the first five of the scene.");
+    }
+    findReach(camera);
+    ShadowView view;
+    if (!makeShadowView(*walk.light, reach, size, view))
+        return switchOff();
+    draw(view);
+    publish(view, walk.lightIndex);
+}
+
 /// Tells programs that no light has shadows.
 void ShadowParts::switchOff()
 {
@@ -446,23 +477,11 @@ void ShadowMap::setDistance(float distance)
 void ShadowMap::render(SceneNode& scene, Camera* camera, const FlagMask& renderFlags,
                        const FlagMask& recursiveFlags)
 {
-    detail::ShadowParts& parts = *m_parts;
     if (!isComplete())
         return;
-    parts.find(scene, renderFlags, recursiveFlags);
-    const Light* const light = parts.walk.light;
-    if (!light || parts.walk.lightIndex >= detail::MOST_LIGHTS)
-    {
-        parts.switchOff();
-        return parts.warn(parts.isLightSaid,
-                          "No shadows: no directional or spot light among the first five of the scene.");
-    }
-    parts.findReach(camera);
-    detail::ShadowView view;
-    if (!detail::makeShadowView(*light, parts.reach, parts.size, view))
-        return parts.switchOff();
-    parts.draw(view);
-    parts.publish(view, parts.walk.lightIndex);
+    m_parts->find(scene, renderFlags, recursiveFlags);
+    m_parts->render(camera);
+    m_parts->walk.begin(nullptr); // keeps no solids until the next frame
 }
 
 } // namespace orv

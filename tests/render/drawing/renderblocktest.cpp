@@ -1,6 +1,8 @@
 #include "scenetest.h"
 
+#include "orv/motionblurrenderer.h"
 #include "orv/renderblockgroup.h"
+#include "orv/shadowmap.h"
 
 #include <GLES2/gl2.h>
 
@@ -102,6 +104,40 @@ TEST_F(RenderBlockTest, groupOutlivesTheRemovalOfItsBlocks)
     group->render();
     EXPECT_EQ("abcd", drawn);
     EXPECT_EQ(1, once->sharedGetCount());
+}
+
+// Fault caught: solids drawn, or a light looked at, after a node of the program's own has removed them from the scene.
+TEST_F(RenderBlockTest, nodesMayRemoveOthersWhenTheyAreVisited)
+{
+    struct Sweeper : SceneNode
+    {
+        NodeType getNodeType() const override { return 100; }
+        void accept(SceneNodeVisitor&) override
+        {
+            while (getParent()->getChild(0).get() != this)
+                getParent()->removeChild(getParent()->getChild(0));
+        }
+    };
+    const auto simple = makeShared<SimpleRenderer>(renderContext, pool);
+    const auto blurring = makeShared<MotionBlurRenderer>(renderContext, pool);
+    const auto shadows = makeShared<ShadowMap>(renderContext, pool, 64);
+    const std::function<void(SceneNode&)> uses[] = {
+        [&](SceneNode& top) { simple->render(camera.get(), top, {}, {}); },
+        [&](SceneNode& top) { blurring->render(camera.get(), top, {}, {}); },
+        [&](SceneNode& top) { shadows->render(top, camera.get()); }};
+    for (const auto& use : uses)
+    {
+        const auto top = makeShared<SceneNode>();
+        for (int i = 0; i < 9; ++i)
+            createCube(*pool, Vector2f(1, 1))->setParent(top);
+        const auto sun = makeShared<Light>();
+        sun->setLightType(Light::LightType::DIRECTIONAL);
+        sun->setParent(top);
+        makeShared<Sweeper>()->setParent(top);
+        use(*top);
+        EXPECT_EQ(1u, top->getChildCount());
+        EXPECT_EQ(1, sun->sharedGetCount());
+    }
 }
 
 // Faults caught: a view that clears the views beside it, or leaves the box that it cleared in for the next draws.

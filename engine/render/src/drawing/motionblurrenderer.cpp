@@ -2,6 +2,7 @@
 
 #include "orv/detail/eyes.h"
 #include "rendererproperties.h"
+#include "scene/scenewalk.h"
 
 #include "orv/appearance.h"
 #include "orv/assetcachepool.h"
@@ -90,7 +91,8 @@ void MotionBlurRenderer::render(Camera* camera, SceneNode& scene, const FlagMask
 {
     m_solids.clear();
     if (!m_properties->isComplete() || !m_velocity || !m_skinnedVelocity)
-        return; // logged when they were made
+        return;                          // logged when they were made
+    const detail::SceneWalk walk(scene); // what a node removes when it is visited lives until the end
     visitScene(*this, scene, renderFlags, recursiveFlags);
 
     const RenderContext::DrawScope scope(*m_context);

@@ -155,6 +155,7 @@ void SimpleRenderer::render(Camera* camera, SceneNode& scene, const FlagMask& re
 void SimpleRenderer::drawFrame(Camera* camera, SceneNode& scene, const FlagMask& renderFlags,
                                const FlagMask& recursiveFlags)
 {
+    const detail::SceneWalk walk(scene); // what a node removes when it is visited lives until the end
     if (m_culling)
     {
         detail::Eye eyes[2];
