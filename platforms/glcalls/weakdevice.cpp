@@ -7,7 +7,6 @@
 #include <cctype>
 #include <cstring>
 #include <map>
-#include <set>
 #include <sstream>
 
 namespace glcalls

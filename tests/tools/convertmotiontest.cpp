@@ -23,7 +23,6 @@
 #include <iterator>
 #include <map>
 #include <random>
-#include <tuple>
 
 using namespace orv;
 

@@ -1,7 +1,6 @@
 #include "findings.h"
 
 #include <algorithm>
-#include <iterator>
 
 namespace inspect
 {

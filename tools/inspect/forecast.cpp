@@ -7,7 +7,6 @@
 #include "orv/detail/glomaterialrules.h"
 #include "orv/detail/glovertices.h"
 
-#include <algorithm>
 #include <map>
 #include <set>
 

@@ -24,7 +24,6 @@
 #include "orv/texture2dcache.h"
 
 #include <algorithm>
-#include <limits>
 #include <mutex>
 #include <unordered_map>
 #include <vector>

@@ -5,7 +5,6 @@
 #include <assimp/anim.h>
 
 #include <algorithm>
-#include <cmath>
 
 namespace convert::gltf
 {

@@ -193,8 +193,8 @@ private:
         Highlight highlight;
         if (hasFloat(m_source, AI_MATKEY_GLOSSINESS_FACTOR))
             highlight = getGlossHighlight();
-        else if (hasFloat(m_source,
-                          AI_MATKEY_METALLIC_FACTOR) || // roughness, FBX materials of Phong have as well
+        // Roughness tells nothing: Phong materials of FBX have it, too.
+        else if (hasFloat(m_source, AI_MATKEY_METALLIC_FACTOR) ||
                  findTextureType(m_source, {aiTextureType_METALNESS, aiTextureType_DIFFUSE_ROUGHNESS}) !=
                      aiTextureType_NONE)
             highlight = getMetalHighlight();

@@ -8,8 +8,6 @@
 #include "orv/detail/programattrib.h"
 #include "orv/rendercontext.h"
 
-#include <algorithm>
-
 namespace orv
 {
 

@@ -10,7 +10,6 @@
 #include "orv/texturecubecache.h"
 #include "orv/tokenreader.h"
 
-#include <algorithm>
 #include <string_view>
 
 namespace orv

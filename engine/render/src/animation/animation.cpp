@@ -4,7 +4,6 @@
 
 #include "smoothmotion.h"
 
-#include <algorithm>
 #include <cmath>
 
 // Everything that moves along an animation's time line; log records name this file for loopSize's assertion.

@@ -8,7 +8,6 @@
 #include "orv/scenenodevisitor.h"
 
 #include <algorithm>
-#include <cmath>
 #include <cstring>
 #include <new>
 #include <utility>
