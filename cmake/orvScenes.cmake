@@ -3,7 +3,7 @@
 #   orv_add_scenes(TARGET model... [OUT folder] [OPTIONS option...])
 #
 # Converts each model with orv-convert, whenever the model or a file that it uses has changed, or the folder of a file
-# that it lacked; parallel builds convert several models at a time.
+# that it lacked, or of one whose name make cannot hold (a;b.png); parallel builds convert several models at a time.
 #
 # TARGET   an existing target, such as the program that shows the scenes, which are made before it; otherwise the name
 #          of a new target that is part of ALL. Its property ORV_SCENES lists the scene files.

@@ -110,6 +110,36 @@ TEST_F(ConvertFilesTest, buffersAndLibrariesAreFilesToo)
     EXPECT_NE(std::string::npos, convert("model/b.obj b.glo").output.find("secret.mtl\", which is not in"));
 }
 
+// Fault caught: names of a model's files that make reads as commands, or as something else than a file.
+TEST_F(ConvertFilesTest, dependenciesAreFitForMake)
+{
+    const std::string folder = fs::canonical(m_folder.path("model/pictures")).string();
+    const struct
+    {
+        std::string name;
+        std::string line; // of the dependency file
+    } cases[] = {{"a b (1).bin", folder + "/a\\ b\\ (1).bin"},
+                 {"a;touch b.bin", folder},
+                 {"a=b.bin", folder},
+                 {"a: b.bin", folder},
+                 {"a|b.bin", folder},
+                 {"a#b?.bin", folder}};
+    const float corners[9] = {0, 0, 0, 1, 0, 0, 0, 1, 0};
+    const std::string buffer(reinterpret_cast<const char*>(corners), sizeof corners);
+    char text[1000];
+    for (const auto& item : cases)
+    {
+        m_folder.write("model/pictures/" + item.name, buffer);
+        std::snprintf(text, sizeof text, GLTF, ("pictures/" + item.name).c_str());
+        m_folder.write("model/a.gltf", std::string(text));
+        convert("model/a.gltf a.glo --depfile a.d");
+        const std::vector<uint8_t> bytes = support::readFile(m_folder.path("a.d"));
+        const std::string made(bytes.begin(), bytes.end());
+        EXPECT_NE(std::string::npos, made.find("\n  " + item.line + "\n")) << made;
+        EXPECT_EQ(std::string::npos, made.find_first_of(";=|")) << made;
+    }
+}
+
 // Fault caught: a picture of the model's that is lost to one of the scene's, by name or by what the name leads to.
 TEST_F(ConvertFilesTest, inputsAreNeverWrittenOver)
 {

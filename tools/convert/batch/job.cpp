@@ -6,6 +6,8 @@
 #include "convert/progress.h"
 
 #include <algorithm>
+#include <cctype>
+#include <cstring>
 #include <filesystem>
 
 namespace convert
@@ -69,10 +71,32 @@ std::set<std::filesystem::path> findFoldersOfMissing(const Job& job, const FileG
     return folders;
 }
 
+/// Whether make, ninja or CMake would read a path as something else than one file: as a rule's commands even.
+bool isUnfitForMake(const std::string& path)
+{
+    return std::any_of(path.begin(), path.end(),
+                       [](unsigned char c) {
+                           return c < 0x80 && !std::isalnum(c) &&
+                                  (c == 0 || !std::strchr("/+,_.~(){}%@[]!- ", c));
+                       });
+}
+
+/// Instead of inputs with names unfit for make: the folders that they are in.
+std::set<std::filesystem::path> findFitInputs(const Job& job, const FileGate& gate)
+{
+    std::set<std::filesystem::path> inputs = findFoldersOfMissing(job, gate);
+    for (std::filesystem::path input : gate.getOpened())
+    {
+        while (isUnfitForMake(input.string()))
+            input = input.parent_path();
+        inputs.insert(input);
+    }
+    return inputs;
+}
+
 std::vector<uint8_t> makeDepfile(const Job& job, const FileGate& gate)
 {
-    std::set<std::filesystem::path> inputs = gate.getOpened();
-    inputs.merge(findFoldersOfMissing(job, gate));
+    const std::set<std::filesystem::path> inputs = findFitInputs(job, gate);
     std::string text = quoteForMake(job.out) + ":";
     for (const std::filesystem::path& input : inputs)
         text += " \\\n  " + quoteForMake(input.string());
