@@ -1,5 +1,7 @@
 #include "progress.h"
 
+#include "commandline/terminaltext.h"
+
 #include <algorithm>
 #include <chrono>
 #include <cstdio>
@@ -41,7 +43,7 @@ void showProgress(const std::string& what, float share)
     if (!isWatched() || now - g_start < PATIENCE || now - g_shown < BETWEEN)
         return;
     g_shown = now;
-    std::string line = what.substr(0, LONGEST);
+    std::string line = commandline::toTerminalText(what.substr(0, LONGEST));
     if (share >= 0.0f)
         line += " " + std::to_string(int(std::min(share, 1.0f) * 100.0f)) + " %";
     std::fprintf(g_stream, "\r\033[K%s", line.c_str()); // goes to the line's start and clears the line

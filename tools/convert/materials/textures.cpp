@@ -67,10 +67,10 @@ std::string makePlain(std::string name)
     return name;
 }
 
-/// For messages: a data URI may be very long.
-std::string shorten(const std::string& path)
+/// For messages: a data URI may be very long, and a picture inside the model has only a number.
+std::string getShown(const std::string& path, const FoundPicture& picture)
 {
-    return path.substr(0, 100);
+    return picture.isThere && path[0] == '*' ? picture.name : path.substr(0, 100);
 }
 
 } // namespace
@@ -126,9 +126,9 @@ std::optional<orv::Vector4f> TextureStore::getMean(const std::string& path)
 
 std::optional<TextureStore::Loaded> TextureStore::load(const std::string& path)
 {
-    const std::string shown = shorten(path);
-    showProgress("texture " + shown);
     Loaded loaded{m_finder.find(path), {}, {}};
+    const std::string shown = getShown(path, loaded.file);
+    showProgress("texture " + shown);
     if (!loaded.file.isThere)
         m_report.lose("texture-missing", "texture \"" + shown + "\", which is not there");
     else if (!readHeader(loaded.file.bytes, loaded.header))
@@ -142,7 +142,7 @@ bool TextureStore::decode(Loaded& loaded, const std::string& path)
 {
     if (decodePicture(loaded.file.bytes, loaded.header, loaded.pixels))
         return true;
-    m_report.lose("texture-unreadable", "texture \"" + shorten(path) + "\", which is damaged");
+    m_report.lose("texture-unreadable", "texture \"" + getShown(path, loaded.file) + "\", which is damaged");
     return false;
 }
 
