@@ -2,6 +2,7 @@
 
 #include "support/tempdir.h"
 
+#include "convert/formats/mending.h"
 #include "convert/gltf/reader.h"
 
 #include <assimp/GltfMaterial.h>
@@ -13,7 +14,9 @@
 #include <cmath>
 #include <filesystem>
 #include <functional>
+#include <limits>
 #include <memory>
+#include <set>
 
 using nlohmann::json;
 using Numbers = std::vector<float>;
@@ -529,6 +532,44 @@ TEST_F(GltfReader, materialExtensions)
         {"texture-unreadable", "texture \"bark\", which is in Basis Universal (KHR_texture_basisu) alone"}));
 }
 
+// Fault caught: numbers that are none in transforms, bind poses, weights and keys, which end up in the scene.
+TEST_F(GltfReader, replacesNumbersThatAreNone)
+{
+    const float none = std::numeric_limits<float>::quiet_NaN();
+    const float endless = std::numeric_limits<float>::infinity();
+    GltfWriter writer;
+    writer.setAttribute("POSITION", writer.add(CORNERS, "VEC3"));
+    writer.setAttribute("JOINTS_0", writer.add(std::vector<uint8_t>(12, 0), "VEC4"));
+    Numbers weights(12, 0.0f);
+    weights[0] = endless;
+    weights[4] = weights[8] = 1.0f;
+    writer.setAttribute("WEIGHTS_0", writer.add(weights, "VEC4"));
+    const size_t bindPose = writer.add(Numbers(16, none), "MAT4");
+    const size_t times = writer.add(Numbers{0, 1, 2}, "SCALAR");
+    const size_t keys = writer.add(Numbers{0, 0, 0, none, 0, 0, 1, 1, 1}, "VEC3");
+    writer.file["nodes"][0]["skin"] = 0;
+    writer.file["nodes"].push_back({{"name", "joint"}, {"scale", {1e30, 1e30, 1e30}}});
+    writer.file["scenes"][0]["nodes"].push_back(1);
+    writer.file["skins"] = {{{"joints", {1}}, {"inverseBindMatrices", bindPose}}};
+    writer.file["animations"] = {
+        {{"samplers", {{{"input", times}, {"output", keys}}}},
+         {"channels", {{{"sampler", 0}, {"target", {{"node", 1}, {"path", "translation"}}}}}}}};
+    read(writer.write());
+    convert::mend(*m_scene, m_report);
+    const aiBone& bone = *m_scene->mMeshes[0]->mBones[0];
+    EXPECT_TRUE(bone.mOffsetMatrix.IsIdentity());
+    EXPECT_EQ(0.0f, bone.mWeights[0].mWeight);
+    EXPECT_EQ(1.0f, bone.mWeights[1].mWeight);
+    EXPECT_TRUE(m_scene->mRootNode->FindNode("joint")->mTransformation.IsIdentity());
+    EXPECT_EQ(2u, m_scene->mAnimations[0]->mChannels[0]->mNumPositionKeys);
+    std::set<std::string> sentences;
+    for (const auto& loss : m_report.getLosses())
+        sentences.insert(loss.first.second.substr(0, loss.first.second.find(" with values")));
+    EXPECT_EQ((std::set<std::string>{"the transform of node \"joint\"", "the bind pose of joint \"joint\"",
+                                     "weights of joint \"joint\"", "keys of node \"joint\""}),
+              sentences);
+}
+
 // Fault caught: damage that is read as something else, or whose message does not say where it is.
 TEST_F(GltfReader, refusesWithThePlace)
 {
@@ -546,6 +587,7 @@ TEST_F(GltfReader, refusesWithThePlace)
         {R"({"nodes":[{"children":[0]}]})", "nodes[0] contains itself"},
         {R"({"nodes":[{"mesh":-1}]})", "nodes[0].mesh is not a whole number of 0 or more"},
         {R"({"nodes":[{"mesh":0,"scale":[1,2]}]})", "nodes[0].scale has 2 numbers instead of 3"},
+        {R"({"nodes":[{"mesh":0,"scale":[1,1e39,1]}]})", "nodes[0].scale[1] is too large"},
         {R"({"meshes":[{"primitives":[{"attributes":{"POSITION":9}}]}]})",
          "meshes[0].primitives[0].attributes asks for accessors[9], which is not there"},
         {R"({"meshes":[{"primitives":[{"mode":9,"attributes":{"POSITION":0}}]}]})",
@@ -574,6 +616,8 @@ TEST_F(GltfReader, refusesWithThePlace)
     whole.setAttribute("POSITION", whole.add(CORNERS, "VEC3"));
     whole.file["asset"]["version"] = "2.1"; // compatible, as it does not say otherwise
     EXPECT_EQ("", getFault(whole.write()));
+    const std::string huge = R"({"asset":{"version":"2.0"},"extras":1e999})";
+    EXPECT_EQ("has a number that is too large", getFault({huge.begin(), huge.end()}));
     const GltfWriter::Bytes bytes = whole.write();
     for (size_t size = 0; size + 1 < bytes.size(); ++size)
         EXPECT_NE("", getFault({bytes.begin(), bytes.begin() + std::ptrdiff_t(size)})) << size;

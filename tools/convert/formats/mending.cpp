@@ -1,5 +1,7 @@
 #include "mending.h"
 
+#include "badnumbers.h"
+
 #include <assimp/scene.h>
 
 #include <algorithm>
@@ -185,6 +187,7 @@ void mend(aiScene& scene, Report& report)
         return does;
     };
     sift(scene.mAnimations, scene.mNumAnimations, moves);
+    replaceBadNumbers(scene, report);
     for (unsigned i = 0; i < scene.mNumAnimations; ++i)
         sortKeys(*scene.mAnimations[i]);
 }

@@ -9,7 +9,7 @@ namespace convert
 
 /// Removes empty or meaningless objects that some of libassimp's importers leave in a scene: null nodes, meshes without
 /// vertices, lights and cameras without a node, animations that move nothing. The vertices of a mesh without faces
-/// become points.
+/// become points. Numbers that are not finite are replaced (badnumbers.h).
 void mend(aiScene& scene, Report& report);
 
 } // namespace convert

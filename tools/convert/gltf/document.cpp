@@ -135,6 +135,8 @@ double Object::number(const char* key, double fallback) const
         return fallback;
     if (!value->is_number())
         fail(key, "is not a number");
+    if (!std::isfinite(value->get<float>()))
+        fail(key, "is too large");
     return value->get<double>();
 }
 
@@ -165,6 +167,8 @@ std::vector<float> Object::numbers(const char* key) const
         if (!(*array)[i].is_number())
             fail(element(key, i).c_str(), "is not a number");
         made.push_back((*array)[i].get<float>());
+        if (!std::isfinite(made.back()))
+            fail(element(key, i).c_str(), "is too large");
     }
     return made;
 }
@@ -224,6 +228,10 @@ Document::Document(Bytes file) : m_file(std::move(file))
     catch (const json::parse_error& error)
     {
         throw Fault("is not JSON from byte " + std::to_string(error.byte) + " on");
+    }
+    catch (const json::out_of_range&)
+    {
+        throw Fault("has a number that is too large");
     }
     root(); // fails unless it is an object
 }
