@@ -112,6 +112,8 @@ const SceneFault SCENE_FAULTS[] = {
     {"index-bounds", [](GloScene& s) { s.geometries[0].primitiveSets[0].indices->indices[1] = 4; }},
     {"bad-number", [](GloScene& s)
      { s.geometries[0].vertices.data.bytes[3] = s.geometries[0].vertices.data.bytes[2] = 255; }},
+    {"bad-number", [](GloScene& s) { s.scene->top.children[0].transform[1].y = NAN; }},
+    {"bad-number", [](GloScene& s) { s.skins[0].attachments[1].inverseBindPose[3].x = INFINITY; }},
     {"no-positions", [](GloScene& s) { attribute(s, 0).name = "a_place"; }},
     {"primitive-type", [](GloScene& s) { s.geometries[0].primitiveSets[0].primitive = 7; }},
     {"degenerate", [](GloScene& s) { s.geometries[0].primitiveSets[0].indices->indices[1] = 0; }},
@@ -163,6 +165,8 @@ const SceneFault SCENE_FAULTS[] = {
      }},
     {"key-time", [](GloScene& s)
      { s.animations[0].channels = {makeChannel("light", "lamp", "multiplier", {1}, NOT_A_NUMBER)}; }},
+    {"bad-number", [](GloScene& s)
+     { s.animations[0].channels = {makeChannel("light", "lamp", "multiplier", {NOT_A_NUMBER}, 1)}; }},
     {"key-order",
      [](GloScene& s) {
          glo::addKey(channel(s), 0.5f, {0, 0, 0});

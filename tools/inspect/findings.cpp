@@ -43,7 +43,7 @@ const std::vector<KindInfo> INFO = {
     {Kind::ATTRIBUTE_TYPE, "attribute-type", WARNING, "an attribute's type is read as another one"},
     {Kind::NO_VERTEX_DATA, "no-vertex-data", ERROR, "there is less than a byte for each vertex"},
     {Kind::INDEX_BOUNDS, "index-bounds", ERROR, "an index refers to a missing vertex"},
-    {Kind::BAD_NUMBER, "bad-number", WARNING, "vertices have values that are not finite numbers"},
+    {Kind::BAD_NUMBER, "bad-number", WARNING, "vertices, matrices or keys have values that are not finite numbers"},
     {Kind::NO_POSITIONS, "no-positions", WARNING,
      "a geometry has no a_position, so nothing of it will be seen"},
     {Kind::PRIMITIVE_TYPE, "primitive-type", WARNING, "an unknown primitive type is drawn as a triangle fan"},

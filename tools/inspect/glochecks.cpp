@@ -8,6 +8,7 @@
 #include "orv/detail/glovertices.h"
 #include "orv/quaternion.h"
 
+#include <algorithm>
 #include <cmath>
 #include <cstring>
 #include <map>
@@ -371,6 +372,8 @@ private:
         for (size_t i = 0; i < skin.attachments.size(); ++i)
         {
             const std::string& joint = skin.attachments[i].joint;
+            checkNumbers(chunk, skin.attachments[i].inverseBindPose.data(), 16,
+                         "the bind pose of " + quote(joint));
             if (m_scene.scene && !m_scopedNodes.count(joint) && !m_nodes.count(joint))
                 report(Kind::JOINT_MISSING, chunk.find(Attachment::ID, i),
                        "the joint " + quote(joint) + " is no node of the scene; its vertices stay at rest");
@@ -415,9 +418,16 @@ private:
             checkNode(chunk.find(NodeData::ID, i), node.children[i], false);
     }
 
+    void checkNumbers(const Chunk& chunk, const float* numbers, size_t count, const std::string& what)
+    {
+        if (!std::all_of(numbers, numbers + count, [](float value) { return std::isfinite(value); }))
+            report(Kind::BAD_NUMBER, chunk, what + " has values that are no finite numbers");
+    }
+
     /// The engine uses the matrix until a component is animated, then the components.
     void checkTransform(const Chunk& chunk, const NodeData& node, bool top)
     {
+        checkNumbers(chunk, node.transform.data(), 16, "the matrix of " + quote(node.name));
         if (!hasNodeTransform(m_file.version) || (top && m_scene.upAxis != uint32_t(UpAxis::Y)))
             return;
         const orv::Quaternionf rotation =
@@ -545,7 +555,9 @@ private:
     void checkKeys(const Chunk& chunk, const Channel& channel)
     {
         const size_t keySize = 4 + size_t(channel.coefficientCount) * type::SIZES[channel.type];
+        const bool areFloats = channel.type >= 4 && channel.type <= type::FLOAT;
         bool ordered = true;
+        bool areFinite = true;
         float last = -HUGE_VALF;
         for (size_t at = 0; at + keySize <= channel.keys.size(); at += keySize)
         {
@@ -557,7 +569,11 @@ private:
             }
             ordered = ordered && time >= last;
             last = time;
+            for (size_t value = at + 4; areFloats && value < at + keySize; value += 4)
+                areFinite = areFinite && std::isfinite(readFloat(&channel.keys[value]));
         }
+        if (!areFinite)
+            report(Kind::BAD_NUMBER, chunk, "keys have values that are no finite numbers");
         if (!ordered)
             report(Kind::KEY_ORDER, chunk,
                    "the keys are not in the order of their times; the engine sorts them");
