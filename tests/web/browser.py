@@ -36,7 +36,7 @@ class Server:
         threading.Thread(target=self.http.serve_forever, daemon=True).start()
 
     def hold(self, path):
-        """@return an event: requests for the path wait until it is set."""
+        """@return an event: requests for the path wait until it is set. The browser must not have the file in its cache."""
         self.held[path] = threading.Event()
         return self.held[path]
 

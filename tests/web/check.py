@@ -301,22 +301,25 @@ def open_while_lost(bench):
         window.extension.restoreContext();
         for (let i = 0; i < 50 && orvPage.state.model !== values[0]; ++i)
             await new Promise((resolve) => setTimeout(resolve, 100));
-        return document.getElementById("message").hidden && orvPage.state.model === values[0];"""
+        const message = document.getElementById("message");
+        return orvPage.state.model === values[0] && message.hidden ? "" : `${orvPage.state.model}, ${message.innerText}`;"""
     motion = pathlib.Path(bench.scene("motion")).name
     bench.show("duck")
     browser.run(lose + """
         orvPage.openFiles([{ name: values[0].split("/").pop(), bytes: new Uint8Array(await (await fetch("/" + values[0])).arrayBuffer()) }]);
         if (!document.getElementById("text").textContent.includes("context is lost"))
             throw new Error("a file opened without a context: " + document.getElementById("text").textContent);""", bench.scene("motion"))
-    expect(browser.run(restore, motion), "a file opened without a context is not shown later")
+    said = browser.run(restore, motion)
+    expect(not said, f"a file opened without a context is not shown later: {said}")
     browser.run("orvPage.run('play'); orvPage.run('share', 0)")
     expect(compare(wanted, browser.picture(), 0)[1] == 0, "a file opened without a context looks otherwise")
 
-    arrives = bench.server.hold(f"/{bench.scene('motion')}")
-    browser.driver.get(f"{bench.server.address}/page/?play=0&bars=0&model=/{bench.scene('motion')}")
+    arrives = bench.server.hold(f"/{bench.scene('motion')}?held")
+    browser.driver.get(f"{bench.server.address}/page/?play=0&bars=0&model=/{bench.scene('motion')}?held")
     browser.run("while (!document.getElementById('welcome').hidden) await new Promise((resolve) => setTimeout(resolve, 50));" + lose)
     arrives.set()
-    expect(browser.run(restore, motion), "a scene whose context was lost while it was loaded is not shown later")
+    said = browser.run(restore, motion)
+    expect(not said, f"a scene whose context was lost while it was loaded is not shown later: {said}")
 
 
 def growth(bench):
@@ -467,8 +470,8 @@ def files(bench):
             browser.command("Input.dispatchDragEvent", type=kind, x=100, y=100,
                             data={"items": [], "files": dropped, "dragOperationsMask": 1})
         matches(what)
-    arrives = bench.server.hold(f"/{bench.scene('skin')}")
-    browser.driver.get(f"{bench.server.address}/page/?bars=0&model=/{bench.scene('skin')}")
+    arrives = bench.server.hold(f"/{bench.scene('skin')}?held")
+    browser.driver.get(f"{bench.server.address}/page/?bars=0&model=/{bench.scene('skin')}?held")
     browser.run("while (!document.getElementById('welcome').hidden) await new Promise((resolve) => setTimeout(resolve, 50));")
     browser.driver.find_element(By.ID, "filechooser").send_keys("\n".join(paths))
     matches("chosen before the scene of the address has come")
