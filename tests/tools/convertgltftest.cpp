@@ -457,12 +457,12 @@ TEST_F(GltfReader, scenesHoldWhatTheFileHas)
     writer.file["scenes"] = {{{"nodes", {0}}}, {{"nodes", {1, 2, 3}}}};
     writer.file["scene"] = 1;
     writer.file["nodes"] = {
-        {{"name", "elsewhere"}, {"mesh", 0}},
+        {{"name", "elsewhere"}, {"mesh", 0}, {"skin", nullptr}}, // null: as if it were not there
         {{"name", "many"},
          {"mesh", 0},
          {"extensions",
           {{"EXT_mesh_gpu_instancing", {{"attributes", {{"TRANSLATION", places}, {"ROTATION", turns}}}}}}}},
-        {{"name", "hidden"}, {"mesh", 0}, {"extensions", {{"KHR_node_visibility", {{"visible", false}}}}}},
+        {{"name", nullptr}, {"mesh", 0}, {"extensions", {{"KHR_node_visibility", {{"visible", false}}}}}},
         {{"name", "many"},
          {"rotation", {0, 0, 1, 1}},
          {"scale", {2, 3, 4}},

@@ -70,7 +70,7 @@ const json* Object::find(const char* key) const
     if (!m_value)
         return nullptr;
     const auto found = m_value->find(key);
-    return found != m_value->end() ? &*found : nullptr;
+    return found != m_value->end() && !found->is_null() ? &*found : nullptr;
 }
 
 const json* Object::findArray(const char* key) const

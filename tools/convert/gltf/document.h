@@ -60,7 +60,7 @@ public:
     [[noreturn]] void fail(const char* key, const std::string& what) const;
 
 private:
-    const nlohmann::json* find(const char* key) const;
+    const nlohmann::json* find(const char* key) const; ///< nothing for null too, which some exporters write
     const nlohmann::json* findArray(const char* key) const;
 
     const nlohmann::json* m_value = nullptr;
