@@ -61,6 +61,49 @@ private:
     bool m_sound = true;
 };
 
+/// One coordinate of a glyph's points, each relative to the one before, in none, one or two bytes by the point's flag.
+struct FontAxis
+{
+    unsigned isByte, isSame; ///< flags; where the first is set, the second is the byte's sign
+    std::size_t at = 0;
+    int value = 0;
+
+    unsigned getSize(unsigned flag) const { return flag & isByte ? 1u : (flag & isSame ? 0u : 2u); }
+
+    /// @return its distance from 0.
+    int read(FontBytes& from, unsigned flag)
+    {
+        if (flag & isByte)
+            value += flag & isSame ? int(from.u8(at)) : -int(from.u8(at));
+        else if (!(flag & isSame))
+            value += from.s16(at);
+        at += getSize(flag);
+        return std::abs(value);
+    }
+};
+
+/// Calls use(flag) for each point. A repeated flag stands in the file once, with its count.
+/// @return where the flags end.
+template <class Use>
+std::size_t forEachFlag(FontBytes& glyph, std::size_t at, int pointCount, const Use& use)
+{
+    const unsigned REPEAT = 8;
+    unsigned flag = 0;
+    unsigned repeat = 0;
+    for (int i = 0; i < pointCount; ++i)
+    {
+        if (repeat > 0)
+            --repeat;
+        else
+        {
+            flag = glyph.u8(at++);
+            repeat = flag & REPEAT ? glyph.u8(at++) : 0;
+        }
+        use(flag);
+    }
+    return at;
+}
+
 /// The tables of one font, as the rasteriser finds and reads them, which believes whatever the file says.
 ///
 /// Nothing is copied, and nothing outside of the file is read. Once something would have been, everything is faulty from then
@@ -122,6 +165,7 @@ private:
 
     Outline measureGlyph(uint32_t glyph, int depth);
     Outline measureContours(FontBytes& glyph, unsigned contourCount);
+    Outline measurePoints(FontBytes& glyph, std::size_t flagsStart, int pointCount, bool endsInOnePoint);
     Outline measureComponents(FontBytes& glyph, int depth);
 
     static constexpr int MAX_POINTS = 16384;  ///< of one character, all parts together
@@ -241,29 +285,8 @@ inline FontTables::Outline FontTables::measureGlyph(uint32_t glyph, int depth)
     return contourCount < 0 ? measureComponents(data, depth) : Outline{};
 }
 
-/// A flag for each point, repeated ones only counted; all x, then all y, each relative to the one before, in
-/// none, one or two bytes by the flag.
 inline FontTables::Outline FontTables::measureContours(FontBytes& glyph, unsigned contourCount)
 {
-    const unsigned ON_CURVE = 1, REPEAT = 8;
-    struct Axis
-    {
-        unsigned isByte, isSame; ///< flags; where the first is set, the second is the byte's sign
-        std::size_t at = 0;
-        int value = 0;
-
-        unsigned getSize(unsigned flag) const { return flag & isByte ? 1u : (flag & isSame ? 0u : 2u); }
-        int read(FontBytes& from, unsigned flag)
-        {
-            if (flag & isByte)
-                value += flag & isSame ? int(from.u8(at)) : -int(from.u8(at));
-            else if (!(flag & isSame))
-                value += from.s16(at);
-            at += getSize(flag);
-            return std::abs(value);
-        }
-    };
-
     int lastStart = 0;
     int end = -1;
     for (unsigned i = 0; i < contourCount; ++i)
@@ -280,41 +303,33 @@ inline FontTables::Outline FontTables::measureContours(FontBytes& glyph, unsigne
 
     const std::size_t instructions = GLYPH_HEADER_SIZE + 2 * std::size_t(contourCount);
     const std::size_t flagsStart = instructions + 2 + glyph.u16(instructions);
-    const auto forEachFlag = [&glyph, flagsStart, pointCount](const auto& use)
-    {
-        std::size_t at = flagsStart;
-        unsigned flag = 0;
-        unsigned repeat = 0;
-        for (int i = 0; i < pointCount; ++i)
-        {
-            if (repeat > 0)
-                --repeat;
-            else
-            {
-                flag = glyph.u8(at++);
-                repeat = flag & REPEAT ? glyph.u8(at++) : 0;
-            }
-            use(flag);
-        }
-        return at;
-    };
+    return measurePoints(glyph, flagsStart, pointCount, lastStart == end);
+}
 
-    Axis x = {2, 16};
-    Axis y = {4, 32};
+/// The flags of all points come first, then all x, then all y.
+inline FontTables::Outline FontTables::measurePoints(FontBytes& glyph, std::size_t flagsStart, int pointCount,
+                                                     bool endsInOnePoint)
+{
+    const unsigned ON_CURVE = 1;
+    FontAxis x = {2, 16};
+    FontAxis y = {4, 32};
     unsigned lastFlag = 0;
-    x.at = forEachFlag(
-        [&](unsigned flag)
-        {
-            y.at += x.getSize(flag);
-            lastFlag = flag;
-        });
+    x.at = forEachFlag(glyph, flagsStart, pointCount,
+                       [&](unsigned flag)
+                       {
+                           y.at += x.getSize(flag);
+                           lastFlag = flag;
+                       });
     y.at += x.at;
     // Looking for a point on the curve to start from, the rasteriser goes on to the next point, whatever is there.
-    if (lastStart == end && !(lastFlag & ON_CURVE))
+    if (endsInOnePoint && !(lastFlag & ON_CURVE))
         return {0.0f, DAMAGED_OUTLINE};
 
     int reach = 0;
-    forEachFlag([&](unsigned flag) { reach = std::max({reach, x.read(glyph, flag), y.read(glyph, flag)}); });
+    forEachFlag(glyph, flagsStart, pointCount,
+                [&](unsigned flag) {
+                    reach = std::max({reach, x.read(glyph, flag), y.read(glyph, flag)});
+                });
     if (!glyph.isSound() || reach > INT16_MAX)
         return {0.0f, DAMAGED_OUTLINE};
     return {float(reach), nullptr};
