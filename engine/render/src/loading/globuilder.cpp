@@ -74,30 +74,9 @@ SharedPtr<Glo> GloBuilder::build(const SharedPtr<SceneNode>& parent, MeshData wa
         std::qsort(m_names.data(), m_names.size(), sizeof(NamedPlace), compare);
         std::qsort(m_scopedNames.data(), m_scopedNames.size(), sizeof(NamedPlace), compare);
     }
-    m_glo->m_animationGroup = makeShared<AnimationGroup>();
-    if (!m_glo->m_animationGroup)
+    if (!makeAnimations() || !linkSkins())
         return {};
-    for (const AnimationData& animation : m_scene.animations)
-    {
-        // Groups are added while empty: adding searches the whole group.
-        const SharedPtr<AnimationGroup> group = makeShared<AnimationGroup>();
-        if (!group)
-            return {};
-        m_glo->m_animations.push_back({animation.name, group});
-        m_glo->m_animationGroup->addAnimation(group);
-        if (!makeAnimation(animation, *group))
-            return {};
-    }
-    if (!linkSkins())
-        return {};
-    for (auto& [name, material] : m_materials)
-    {
-        material.choosePrograms();
-        m_glo->m_appearances[name] = material.getAppearance();
-        const std::string& key = name;
-        material.forEachAppearance([&](const SharedPtr<Appearance>& appearance, bool skinned)
-                                   { m_glo->m_kinds[skinned ? 1 : 0][key] = appearance; });
-    }
+    finishMaterials();
 
     if (top)
     {
@@ -109,6 +88,38 @@ SharedPtr<Glo> GloBuilder::build(const SharedPtr<SceneNode>& parent, MeshData wa
     m_glo->m_topNode = top;
     m_glo->m_fileVersion = Version(m_version.first, m_version.second, m_version.third, nullptr);
     return m_glo;
+}
+
+bool GloBuilder::makeAnimations()
+{
+    m_glo->m_animationGroup = makeShared<AnimationGroup>();
+    if (!m_glo->m_animationGroup)
+        return false;
+    for (const AnimationData& animation : m_scene.animations)
+    {
+        // Groups are added while empty: adding searches the whole group.
+        const SharedPtr<AnimationGroup> group = makeShared<AnimationGroup>();
+        if (!group)
+            return false;
+        m_glo->m_animations.push_back({animation.name, group});
+        m_glo->m_animationGroup->addAnimation(group);
+        if (!makeAnimation(animation, *group))
+            return false;
+    }
+    return true;
+}
+
+/// When everything that decides the programs is known.
+void GloBuilder::finishMaterials()
+{
+    for (auto& [name, material] : m_materials)
+    {
+        material.choosePrograms();
+        m_glo->m_appearances[name] = material.getAppearance();
+        const std::string& key = name;
+        material.forEachAppearance([&](const SharedPtr<Appearance>& appearance, bool skinned)
+                                   { m_glo->m_kinds[skinned ? 1 : 0][key] = appearance; });
+    }
 }
 
 bool GloBuilder::fail(const char* format) const

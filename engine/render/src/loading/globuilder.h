@@ -75,6 +75,7 @@ private:
 
     bool makeGeometries(MeshData wanted);
     bool makeMaterials();
+    void finishMaterials();
     SharedPtr<SceneNode> makeNode(const glo::NodeData& data, const SharedPtr<SceneNode>& parent);
     void setTransform(SceneNode& node, const glo::NodeData& data, bool top) const;
     bool makeObjects(const glo::NodeData& data, Objects& objects);
@@ -94,6 +95,7 @@ private:
     bool fail(const char* format) const;
     bool failUnknown(const char* kind, const std::string& name) const;
 
+    bool makeAnimations();
     bool makeAnimation(const glo::AnimationData& data, AnimationGroup& group);
     bool makeChannel(const glo::Channel& channel, AnimationGroup& group);
     bool makeNodeChannel(const glo::Channel& channel, const std::string& target, AnimationGroup& group);

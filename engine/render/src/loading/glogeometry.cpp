@@ -177,6 +177,48 @@ bool isInside(const PrimitiveSet& set, uint32_t vertexCount)
     return vertexCount > UINT16_MAX || isBelow(indices.data(), indices.size(), uint16_t(vertexCount));
 }
 
+/// Whether there are bytes for the vertices, and vertices for the indices; logs otherwise.
+bool isSound(const Geometry& geometry, const char* fileName)
+{
+    const uint32_t vertexCount = geometry.vertices.vertexCount;
+    if (vertexCount > geometry.vertices.data.bytes.size())
+    {
+        ORV_GLO_ERROR("Geometry \"%s\" has no data for its %u vertices in %s", geometry.name.c_str(),
+                      vertexCount, fileName);
+        return false;
+    }
+    for (const PrimitiveSet& set : geometry.primitiveSets)
+    {
+        if (!isInside(set, vertexCount))
+        {
+            ORV_GLO_ERROR("Geometry \"%s\" has an index beyond its %u vertices in %s", geometry.name.c_str(),
+                          vertexCount, fileName);
+            return false;
+        }
+    }
+    return true;
+}
+
+/// @param vertices  empty if no geometry is kept.
+SharedPtr<Mesh> makeMesh(AssetCachePool& pool, const PrimitiveSet& set,
+                         const SharedPtr<VertexBuffer>& vertexBuffer, uint32_t vertexCount,
+                         const SharedPtr<MeshVertices>& vertices, MeshData wanted)
+{
+    MeshHeader header;
+    const SharedPtr<MeshGeometry> geometry = makeMeshGeometry(set, vertices);
+    if (geometry)
+        header.boundingRadius = getRadius(*geometry);
+    const SharedPtr<IndexBuffer> indexBuffer = makeIndexBuffer(*pool.getIndexBufferCache(), set, vertexCount);
+    const SharedPtr<Mesh> mesh = indexBuffer
+                                     ? pool.getMeshCache()->create(header, indexBuffer, vertexBuffer, nullptr)
+                                     : SharedPtr<Mesh>();
+    if (mesh && geometry)
+        setBounds(*mesh, *geometry);
+    if (mesh && wanted == MeshData::GEOMETRY)
+        mesh->setGeometry(geometry);
+    return mesh;
+}
+
 } // namespace
 
 bool makeGeometry(AssetCachePool& pool, Geometry& geometry, FileVersion version, const char* fileName,
@@ -187,21 +229,8 @@ bool makeGeometry(AssetCachePool& pool, Geometry& geometry, FileVersion version,
     std::vector<VertexBuffer::AttribDescription> descriptions;
     if (!describe(geometry, version, fileName, descriptions))
         return false;
-    if (vertices.vertexCount > bytes.size())
-    {
-        ORV_GLO_ERROR("Geometry \"%s\" has no data for its %u vertices in %s", geometry.name.c_str(),
-                      vertices.vertexCount, fileName);
+    if (!isSound(geometry, fileName))
         return false;
-    }
-    for (const PrimitiveSet& set : geometry.primitiveSets)
-    {
-        if (!isInside(set, vertices.vertexCount))
-        {
-            ORV_GLO_ERROR("Geometry \"%s\" has an index beyond its %u vertices in %s", geometry.name.c_str(),
-                          vertices.vertexCount, fileName);
-            return false;
-        }
-    }
     made.jointCount = countJoints(geometry);
 
     const SharedPtr<VertexBuffer> vertexBuffer = pool.getVertexBufferCache()->create(nullptr);
@@ -217,21 +246,9 @@ bool makeGeometry(AssetCachePool& pool, Geometry& geometry, FileVersion version,
     bytes = {};
     for (const PrimitiveSet& set : geometry.primitiveSets)
     {
-        MeshHeader header;
-        const SharedPtr<MeshGeometry> meshGeometry = makeMeshGeometry(set, places);
-        if (meshGeometry)
-            header.boundingRadius = getRadius(*meshGeometry);
-        const SharedPtr<IndexBuffer> indexBuffer =
-            makeIndexBuffer(*pool.getIndexBufferCache(), set, vertices.vertexCount);
-        const SharedPtr<Mesh> mesh =
-            indexBuffer ? pool.getMeshCache()->create(header, indexBuffer, vertexBuffer, nullptr)
-                        : SharedPtr<Mesh>();
+        const SharedPtr<Mesh> mesh = makeMesh(pool, set, vertexBuffer, vertices.vertexCount, places, wanted);
         if (!mesh)
             return fail(geometry, fileName);
-        if (meshGeometry)
-            setBounds(*mesh, *meshGeometry);
-        if (wanted == MeshData::GEOMETRY)
-            mesh->setGeometry(meshGeometry);
         made.meshes.push_back(mesh);
     }
     return true;
