@@ -372,8 +372,9 @@ private:
         for (size_t i = 0; i < skin.attachments.size(); ++i)
         {
             const std::string& joint = skin.attachments[i].joint;
-            checkNumbers(chunk, skin.attachments[i].inverseBindPose.data(), 16,
-                         "the bind pose of " + quote(joint));
+            if (!areFinite(skin.attachments[i].inverseBindPose))
+                report(Kind::BAD_NUMBER, chunk.find(Attachment::ID, i),
+                       "the bind pose of " + quote(joint) + " has values that are no finite numbers");
             if (m_scene.scene && !m_scopedNodes.count(joint) && !m_nodes.count(joint))
                 report(Kind::JOINT_MISSING, chunk.find(Attachment::ID, i),
                        "the joint " + quote(joint) + " is no node of the scene; its vertices stay at rest");
@@ -418,16 +419,18 @@ private:
             checkNode(chunk.find(NodeData::ID, i), node.children[i], false);
     }
 
-    void checkNumbers(const Chunk& chunk, const float* numbers, size_t count, const std::string& what)
+    static bool areFinite(const orv::Matrix4f& matrix)
     {
-        if (!std::all_of(numbers, numbers + count, [](float value) { return std::isfinite(value); }))
-            report(Kind::BAD_NUMBER, chunk, what + " has values that are no finite numbers");
+        return std::all_of(matrix.data(), matrix.data() + 16,
+                           [](float value) { return std::isfinite(value); });
     }
 
     /// The engine uses the matrix until a component is animated, then the components.
     void checkTransform(const Chunk& chunk, const NodeData& node, bool top)
     {
-        checkNumbers(chunk, node.transform.data(), 16, "the matrix of " + quote(node.name));
+        if (!areFinite(node.transform))
+            report(Kind::BAD_NUMBER, chunk,
+                   "the matrix of " + quote(node.name) + " has values that are no finite numbers");
         if (!hasNodeTransform(m_file.version) || (top && m_scene.upAxis != uint32_t(UpAxis::Y)))
             return;
         const orv::Quaternionf rotation =

@@ -227,9 +227,7 @@ bool makeGeometry(AssetCachePool& pool, Geometry& geometry, FileVersion version,
     VertexSet& vertices = geometry.vertices;
     RawVector<uint8_t>& bytes = vertices.data.bytes;
     std::vector<VertexBuffer::AttribDescription> descriptions;
-    if (!describe(geometry, version, fileName, descriptions))
-        return false;
-    if (!isSound(geometry, fileName))
+    if (!describe(geometry, version, fileName, descriptions) || !isSound(geometry, fileName))
         return false;
     made.jointCount = countJoints(geometry);
 
