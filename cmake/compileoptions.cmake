@@ -14,7 +14,7 @@ if(ORV_SANITIZE)
     target_compile_options(orv_options INTERFACE ${sanitizers} -fno-omit-frame-pointer)
     target_link_options(orv_options INTERFACE ${sanitizers})
 endif()
-if(ORV_BUILD_FUZZ)
+if(ORV_BUILD_FUZZ AND ORV_SANITIZE)
     target_compile_options(orv_options INTERFACE -fsanitize=fuzzer-no-link) # libFuzzer follows the branches taken
 endif()
 
@@ -39,7 +39,7 @@ target_link_options(orv_engine_options INTERFACE ${ORV_PREFIX_MAPS})
 # with GCC use link-time optimisation (ORV_LTO); for a static library the program's link does it. The objects hold
 # ordinary code as well, which the tests link much faster. Unwind tables are kept for crash reporters, and for
 # exceptions that pass through.
-set(ORV_OPTIMISED $<NOT:$<OR:$<CONFIG:Debug>,$<BOOL:${ORV_SANITIZE}>,$<BOOL:${ORV_BUILD_FUZZ}>>>)
+set(ORV_OPTIMISED $<NOT:$<OR:$<CONFIG:Debug>,$<BOOL:${ORV_SANITIZE}>>>)
 set(ORV_WHOLE
     $<AND:${ORV_OPTIMISED},$<BOOL:${ORV_LTO}>,$<NOT:$<BOOL:${ORV_STATIC}>>,$<STREQUAL:${CMAKE_CXX_COMPILER_ID},GNU>>)
 target_compile_options(orv_engine_options INTERFACE
@@ -49,8 +49,8 @@ if(NOT EMSCRIPTEN) # WebAssembly programs cannot reach return addresses, and nee
     target_compile_options(orv_engine_options INTERFACE -funwind-tables -fstack-protector)
 endif()
 
-# orv_hot_sources(source...): sources of the current room that run for every frame, solid or pixel. They get no inlining
-# that increases size, and no padding.
+# orv_hot_sources(source...): sources of the current room that run for every frame, solid or pixel.
+# They get no inlining that increases size, and no padding.
 set(ORV_UNPADDED "")
 if(CMAKE_CXX_COMPILER_ID STREQUAL GNU)
     set(ORV_UNPADDED -fno-align-functions -fno-align-loops -fno-align-jumps)

@@ -233,8 +233,8 @@ private:
             LLVMFuzzerMutate(bytes, size, size);
     }
 
-    template <class Element>
-    void changeList(std::vector<Element>& elements)
+    template <class Element, class Allocator>
+    void changeList(std::vector<Element, Allocator>& elements)
     {
         const size_t at = elements.empty() ? 0 : m_dice.roll(elements.size());
         switch (elements.empty() ? 0 : m_dice.roll(4))
