@@ -49,7 +49,7 @@ if(NOT EMSCRIPTEN) # WebAssembly programs cannot reach return addresses, and nee
     target_compile_options(orv_engine_options INTERFACE -funwind-tables -fstack-protector)
 endif()
 
-# orv_hot_sources(source...): sources of the current room that run for every frame, solid or pixel.
+# orv_hot_sources(source...): sources of the current room that run for every frame, solid, pixel or field of a file.
 # They get no inlining that increases size, and no padding.
 set(ORV_UNPADDED "")
 if(CMAKE_CXX_COMPILER_ID STREQUAL GNU)

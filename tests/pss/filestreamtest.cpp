@@ -5,6 +5,8 @@
 
 #include <gtest/gtest.h>
 
+#include <iterator>
+#include <random>
 #include <string>
 
 #include <sys/stat.h>
@@ -49,4 +51,36 @@ TEST(FileStream, goesOnAfterAShortRead)
     EXPECT_EQ(10, total);
     EXPECT_TRUE(stream->eof());
     EXPECT_EQ(10, stream->size());
+}
+
+// Faults caught: bytes of the wrong place where a read begins in the buffer and ends beyond it, where it ends just at
+// the buffer's edge, or after seeking back; a position that does not follow.
+TEST(FileStream, givesTheBytesOfAnyPlace)
+{
+    std::mt19937 random(7);
+    std::string bytes;
+    for (int i = 0; i < 50000; ++i)
+        bytes.push_back(char(random()));
+    const support::TempDir dir;
+    dir.write("file", bytes);
+    const SharedPtr<Stream> stream = FileStreamSource(dir.path().c_str()).open("file", false);
+    ASSERT_TRUE(stream);
+    const unsigned int counts[] = {0, 1, 3, 4, 100, 4092, 4095, 4096, 4097, 9000, 60000};
+    size_t place = 0;
+    for (int i = 0; i < 20000; ++i)
+    {
+        if (random() % 8 == 0)
+        {
+            place = random() % (bytes.size() + 10);
+            ASSERT_EQ(int32_t(place), stream->seek(unsigned(place)));
+        }
+        const unsigned int count = random() % 2 ? 4 : counts[random() % std::size(counts)];
+        const std::string expected = place < bytes.size() ? bytes.substr(place, count) : std::string();
+        std::string buffer(count, '?');
+        ASSERT_EQ(int32_t(expected.size()), stream->read(buffer.data(), count));
+        ASSERT_EQ(expected, buffer.substr(0, expected.size()));
+        ASSERT_EQ(expected.size() < count, stream->eof());
+        place += expected.size();
+        ASSERT_EQ(int32_t(place), stream->tell());
+    }
 }

@@ -1,8 +1,13 @@
 #include "filestream.h"
 
+#include <fcntl.h>
 #include <sys/stat.h>
+#include <sys/uio.h>
+#include <unistd.h>
 
 #include <algorithm>
+#include <cerrno>
+#include <cstring>
 #include <limits>
 
 namespace orv::detail
@@ -13,41 +18,35 @@ namespace
 
 const unsigned int LARGEST = std::numeric_limits<int32_t>::max();
 
-/// Standard streams open directories as well, and opening a pipe would block.
-bool isRegularFile(const char* path)
-{
-    struct stat status;
-    return stat(path, &status) == 0 && S_ISREG(status.st_mode);
-}
-
 /// A position or size as the interface gives it, -1 for one that does not fit.
-int32_t toInt32(std::streamoff offset)
+int32_t toInt32(int64_t offset)
 {
-    return offset <= std::streamoff(LARGEST) ? int32_t(offset) : -1;
+    return offset <= int64_t(LARGEST) ? int32_t(offset) : -1;
 }
 
 } // namespace
 
-FileInputStream::FileInputStream(const char* path)
+void FileDescriptor::close()
 {
-    if (!isRegularFile(path))
-    {
-        m_file.setstate(std::ios::failbit);
-        return;
-    }
+    if (isOpen())
+        ::close(m_number);
+    m_number = -1;
+}
 
-    m_file.open(path, std::ios::in | std::ios::binary);
-    const std::streamoff start = m_file.tellg();
-    m_file.seekg(0, std::ios::end);
-    m_size = toInt32(m_file.tellg() - start);
-    m_file.seekg(start);
+/// A pipe is opened without waiting for its writer, to see that it is none of our files.
+FileInputStream::FileInputStream(const char* path)
+    : m_file(open(path, O_RDONLY | O_CLOEXEC | O_NONBLOCK | O_NOCTTY))
+{
+    struct stat status;
+    if (m_file.isOpen() && fstat(m_file.get(), &status) == 0 && S_ISREG(status.st_mode))
+        m_size = toInt32(status.st_size);
     if (m_size < 0)
-        m_file.setstate(std::ios::failbit);
+        m_file.close();
 }
 
 bool FileInputStream::valid() const
 {
-    return !m_file.fail(); // also true of a bad stream
+    return m_file.isOpen() && !m_isBad;
 }
 
 bool FileInputStream::eof() const
@@ -63,28 +62,64 @@ int32_t FileInputStream::size() const
 int32_t FileInputStream::seek(unsigned int position)
 {
     m_isAtEnd = false;
-    m_file.seekg(position, std::ios::beg);
-    m_position = toInt32(m_file.tellg());
+    m_position = toInt32(position);
     return tell();
 }
 
-/// Asking the file takes a call of the system.
 int32_t FileInputStream::tell() const
 {
-    return m_file.fail() ? -1 : m_position;
+    return valid() ? m_position : -1;
 }
 
 int32_t FileInputStream::read(void* buffer, unsigned int count)
 {
-    if (m_file.bad() || !buffer)
+    if (!valid() || !buffer)
         return 0;
 
-    m_file.read(static_cast<char*>(buffer), std::min(count, LARGEST));
-    m_isAtEnd = m_file.eof();
-    if (m_isAtEnd)
-        m_file.clear(m_file.rdstate() & std::ios::badbit); // a short read is no failure: the stream goes on
-    m_position += int32_t(m_file.gcount());
-    return int32_t(m_file.gcount());
+    const int32_t wanted = int32_t(std::min(count, LARGEST));
+    const int32_t most = std::min(wanted, m_position < 0 ? 0 : int32_t(LARGEST) - m_position);
+    const int32_t taken = readBuffered(static_cast<unsigned char*>(buffer), most);
+    m_position += taken;
+    m_isAtEnd = !m_isBad && taken < wanted;
+    return taken;
+}
+
+int32_t FileInputStream::readBuffered(unsigned char* bytes, int32_t count)
+{
+    const int32_t inBuffer = m_position - m_bufferStart;
+    int32_t taken = 0;
+    if (inBuffer >= 0 && inBuffer < m_bufferedSize)
+    {
+        taken = std::min(count, m_bufferedSize - inBuffer);
+        std::memcpy(bytes, m_buffer + inBuffer, size_t(taken));
+    }
+    return taken < count ? taken + readFile(bytes + taken, count - taken, m_position + taken) : taken;
+}
+
+/// From a place of the file to memory, and what follows to the buffer, in one call of the system.
+/// @return less than count at the end of the file, or if the system refuses.
+int32_t FileInputStream::readFile(unsigned char* bytes, int32_t count, int32_t position)
+{
+    m_bufferedSize = 0;
+    if (m_filePosition != position && lseek(m_file.get(), off_t(position), SEEK_SET) < 0)
+        m_isBad = true;
+    int32_t taken = 0;
+    while (taken < count && !m_isBad)
+    {
+        const int32_t rest = count - taken;
+        const iovec parts[] = {{bytes + taken, size_t(rest)}, {m_buffer, sizeof(m_buffer)}};
+        const ssize_t some = readv(m_file.get(), parts, 2);
+        if (some < 0 && errno == EINTR)
+            continue;
+        m_isBad = some < 0;
+        if (some <= 0)
+            break;
+        taken += int32_t(std::min<ssize_t>(some, rest));
+        m_bufferedSize = int32_t(std::max<ssize_t>(some - rest, 0));
+    }
+    m_bufferStart = position + taken;
+    m_filePosition = int64_t(m_bufferStart) + m_bufferedSize;
+    return taken;
 }
 
 int32_t FileInputStream::write(const void*, unsigned int)
@@ -93,19 +128,18 @@ int32_t FileInputStream::write(const void*, unsigned int)
 }
 
 FileOutputStream::FileOutputStream(const char* path)
+    : m_file(open(path, O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC | O_NOCTTY, 0666))
 {
-    m_file.rdbuf()->pubsetbuf(nullptr, 0);
-    m_file.open(path, std::ios::out | std::ios::binary | std::ios::trunc);
 }
 
 bool FileOutputStream::valid() const
 {
-    return !m_file.bad();
+    return !m_isBad;
 }
 
 bool FileOutputStream::eof() const
 {
-    return m_file.eof();
+    return false;
 }
 
 int32_t FileOutputStream::size() const
@@ -115,14 +149,14 @@ int32_t FileOutputStream::size() const
 
 int32_t FileOutputStream::seek(unsigned int position)
 {
-    if (m_file.is_open() && !m_file.fail())
-        m_file.seekp(position, std::ios::beg);
+    if (m_file.isOpen() && !m_isBad && lseek(m_file.get(), off_t(position), SEEK_SET) >= 0)
+        m_position = position;
     return tell();
 }
 
 int32_t FileOutputStream::tell() const
 {
-    return toInt32(m_file.tellp());
+    return m_file.isOpen() && !m_isBad ? toInt32(m_position) : -1;
 }
 
 int32_t FileOutputStream::read(void*, unsigned int)
@@ -132,15 +166,24 @@ int32_t FileOutputStream::read(void*, unsigned int)
 
 int32_t FileOutputStream::write(const void* buffer, unsigned int count)
 {
-    if (m_file.bad() || !buffer)
+    if (m_isBad || !buffer)
         return 0;
 
-    const std::streamsize wanted = std::min(count, LARGEST);
-    const std::streamsize taken =
-        m_file.fail() ? 0 : m_file.rdbuf()->sputn(static_cast<const char*>(buffer), wanted);
-    if (taken < wanted)
-        m_file.setstate(std::ios::badbit);
-    return int32_t(taken);
+    const int32_t wanted = int32_t(std::min(count, LARGEST));
+    int32_t taken = 0;
+    while (m_file.isOpen() && taken < wanted)
+    {
+        const ssize_t some =
+            ::write(m_file.get(), static_cast<const unsigned char*>(buffer) + taken, size_t(wanted - taken));
+        if (some < 0 && errno == EINTR)
+            continue;
+        if (some <= 0)
+            break;
+        taken += int32_t(some);
+    }
+    m_isBad = taken < wanted;
+    m_position += taken;
+    return taken;
 }
 
 } // namespace orv::detail
