@@ -1,7 +1,8 @@
 // The cost of loading: a scene file of 200,000 triangles beside read() and glBufferData() of the same bytes, and the
 // time from a program's start to its first frame beside a bare context that links one program.
 //
-// "ms" are medians of wall time on the real driver, with the shader program already loaded. "Instructions" are the
+// "ms" are medians of wall time on the real driver, with the shader program and the file's pages already loaded. In the
+// first load of a program the kernel gives it the memory, in later ones malloc() has it. "Instructions" are the
 // engine's in one load, without GL calls and without the C library's copying and filling of memory, which callgrind
 // tells apart where valgrind is installed; files of the same number of chunks and a quarter of the triangles show what
 // depends on the size. "Heap peak" is the largest heap use of C++ code during a load, relative to the start.
@@ -36,7 +37,9 @@
 #include <cstring>
 #include <filesystem>
 #include <fstream>
+#include <memory>
 #include <new>
+#include <string_view>
 
 using namespace orv;
 
@@ -46,14 +49,19 @@ namespace
 constexpr int GEOMETRIES = 4;
 constexpr int LARGE = 250; // columns and, times 0.4, rows of squares of each: 200,000 triangles in all
 constexpr int SMALL = 125;
-constexpr int RUNS = 21;
+constexpr int LOADS = 101;
+constexpr int PROCESSES = 11;
+constexpr int STARTS = 21;
 
-const char* const FOR_COUNTING = "--for-counting"; // what runs under callgrind
+const char* const FOR_COUNTING = "--for-counting";     // what runs under callgrind
+const char* const LOAD_BY_ENGINE = "--load-by-engine"; // print times
+const char* const LOAD_BY_HAND = "--load-by-hand";
 const char* const START_ENGINE = "--start-engine"; // draw one frame and leave
 const char* const START_BARE = "--start-bare";
 
-size_t g_heapBytes = 0;
-size_t g_heapPeak = 0;
+bool g_countsHeap = false; // not while time is measured
+ptrdiff_t g_heapBytes = 0;
+ptrdiff_t g_heapPeak = 0;
 
 [[noreturn]] void giveUp(const std::string& reason)
 {
@@ -67,8 +75,11 @@ size_t g_heapPeak = 0;
 [[gnu::noinline]] void* operator new(size_t size, const std::nothrow_t&) noexcept
 {
     void* memory = std::malloc(std::max<size_t>(size, 1));
-    g_heapBytes += malloc_usable_size(memory);
-    g_heapPeak = std::max(g_heapPeak, g_heapBytes);
+    if (g_countsHeap)
+    {
+        g_heapBytes += ptrdiff_t(malloc_usable_size(memory));
+        g_heapPeak = std::max(g_heapPeak, g_heapBytes);
+    }
     return memory;
 }
 
@@ -80,7 +91,8 @@ size_t g_heapPeak = 0;
 
 [[gnu::noinline]] void operator delete(void* memory) noexcept
 {
-    g_heapBytes -= malloc_usable_size(memory);
+    if (g_countsHeap)
+        g_heapBytes -= ptrdiff_t(malloc_usable_size(memory));
     std::free(memory);
 }
 
@@ -104,7 +116,7 @@ struct File
 
     std::string name;
     size_t size = 0;
-    size_t largestChunk = 0;
+    size_t largestGeometry = 0; ///< bytes of its vertices and indices
     std::vector<Chunk> chunks;
 };
 
@@ -148,12 +160,17 @@ File writeFile(const std::string& folder, int columns)
 {
     glo::GloScene scene;
     scene.scene.emplace().top.name = "top";
+    glo::Material& material = scene.materials.emplace_back();
+    material.name = "paint";
+    material.techniques.emplace_back();
     for (int i = 0; i < GEOMETRIES; ++i)
     {
         scene.geometries.push_back(makeGrid(i, columns));
         glo::NodeData& node = scene.scene->top.children.emplace_back();
         node.name = "node" + std::to_string(i);
-        node.geometry.emplace().geometry = scene.geometries.back().name;
+        glo::GeometryReference& reference = node.geometry.emplace();
+        reference.geometry = scene.geometries.back().name;
+        reference.materials = {material.name};
     }
     std::vector<uint8_t> bytes;
     std::string error;
@@ -179,69 +196,115 @@ File writeFile(const std::string& folder, int columns)
         file.chunks.push_back({GL_ELEMENT_ARRAY_BUFFER, start, indexBytes});
         if (std::memcmp(bytes.data() + start, indices.data(), indexBytes) != 0)
             giveUp("the file is not laid out as expected");
-        file.largestChunk = std::max({file.largestChunk, vertices.size(), indexBytes});
+        file.largestGeometry = std::max(file.largestGeometry, vertices.size() + indexBytes);
     }
     return file;
 }
 
+/// What loading by hand gives, deleted after the time was taken.
+class Buffers
+{
+public:
+    explicit Buffers(size_t count) : m_names(count) { glGenBuffers(GLsizei(count), m_names.data()); }
+    ~Buffers() { glDeleteBuffers(GLsizei(m_names.size()), m_names.data()); }
+    Buffers(const Buffers&) = delete;
+    Buffers& operator=(const Buffers&) = delete;
+
+    GLuint operator[](size_t index) const { return m_names[index]; }
+
+private:
+    std::vector<GLuint> m_names;
+};
+
 /// The reference: reads the whole file at once, then fills every buffer from it.
-void loadByHand(const std::string& folder, const File& file)
+std::unique_ptr<Buffers> loadByHand(const std::string& folder, const File& file)
 {
     const std::unique_ptr<char[]> bytes(new char[file.size]);
     const int handle = open((folder + "/" + file.name).c_str(), O_RDONLY);
     if (handle < 0 || read(handle, bytes.get(), file.size) != ssize_t(file.size))
         giveUp("the file cannot be read");
     close(handle);
-    std::vector<GLuint> buffers(file.chunks.size());
-    glGenBuffers(GLsizei(buffers.size()), buffers.data());
-    for (size_t i = 0; i < buffers.size(); ++i)
+    auto buffers = std::make_unique<Buffers>(file.chunks.size());
+    for (size_t i = 0; i < file.chunks.size(); ++i)
     {
         const File::Chunk& chunk = file.chunks[i];
-        glBindBuffer(chunk.target, buffers[i]);
+        glBindBuffer(chunk.target, (*buffers)[i]);
         glBufferData(chunk.target, GLsizeiptr(chunk.size), bytes.get() + chunk.start, GL_STATIC_DRAW);
     }
     glFinish();
-    glDeleteBuffers(GLsizei(buffers.size()), buffers.data());
+    return buffers;
 }
 
-void loadByEngine(AssetCachePool& pool, const File& file)
+/// What the engine loads, dropped after the time was taken.
+class Scene
 {
-    if (!loadGloFile(pool, {}, file.name.c_str()))
+public:
+    Scene(AssetCachePool& pool, const SharedPtr<Glo>& glo) : m_pool(pool), m_glo(glo) {}
+    ~Scene()
+    {
+        m_glo = nullptr;
+        m_pool.flush();
+        m_pool.flush();
+    }
+    Scene(const Scene&) = delete;
+    Scene& operator=(const Scene&) = delete;
+
+    bool isLoaded() const { return bool(m_glo); }
+
+private:
+    AssetCachePool& m_pool;
+    SharedPtr<Glo> m_glo;
+};
+
+std::unique_ptr<Scene> loadByEngine(AssetCachePool& pool, const File& file)
+{
+    auto scene = std::make_unique<Scene>(pool, loadGloFile(pool, {}, file.name.c_str()));
+    if (!scene->isLoaded())
         giveUp("the engine does not load the file");
     glFinish();
-    pool.flush();
-    pool.flush();
+    return scene;
 }
 
+/// Without the time to drop what the work returns.
 template <class Work>
-double measureMedianMs(Work work)
+double measureMs(Work work)
 {
     using Clock = std::chrono::steady_clock;
-    std::vector<double> times;
-    for (int i = 0; i < RUNS; ++i)
-    {
-        const Clock::time_point start = Clock::now();
-        work();
-        times.push_back(std::chrono::duration<double, std::milli>(Clock::now() - start).count());
-    }
-    std::nth_element(times.begin(), times.begin() + RUNS / 2, times.end());
-    return times[RUNS / 2];
+    const Clock::time_point start = Clock::now();
+    [[maybe_unused]] const auto result = work();
+    return std::chrono::duration<double, std::milli>(Clock::now() - start).count();
+}
+
+double getMedian(std::vector<double> times)
+{
+    const auto middle = times.begin() + std::ptrdiff_t(times.size() / 2);
+    std::nth_element(times.begin(), middle, times.end());
+    return *middle;
+}
+
+void printComparison(const char* what, const std::vector<double>& engineMs, const char* reference,
+                     const std::vector<double>& referenceMs)
+{
+    const double engine = getMedian(engineMs);
+    const double other = getMedian(referenceMs);
+    std::printf("%s, ms: engine %.3f, %s %.3f, ratio %.2f\n", what, engine, reference, other, engine / other);
 }
 
 struct Loader
 {
     AssetCachePool* pool;
     const File* file;
+    std::unique_ptr<Scene> scene; ///< dropped after the count was taken
 };
 
 void loadForCounting(AssetCachePool& pool, const File& file)
 {
     loadByEngine(pool, file);
-    Loader loader{&pool, &file};
+    Loader loader{&pool, &file, nullptr};
     const auto load = [](void* object, int)
     {
-        const Loader& what = *static_cast<Loader*>(object);
-        loadByEngine(*what.pool, *what.file);
+        Loader& what = *static_cast<Loader*>(object);
+        what.scene = loadByEngine(*what.pool, *what.file);
     };
     callgrind::measure(load, &loader, 0);
 }
@@ -289,37 +352,96 @@ void drawBareFrame()
     _exit(EXIT_SUCCESS);
 }
 
-double measureStartMs(const char* argument)
+struct LoadTimes
 {
-    const std::string self = std::filesystem::read_symlink("/proc/self/exe").string();
-    return measureMedianMs(
-        [&]
-        {
-            std::string copy = argument;
-            char* const arguments[] = {const_cast<char*>(self.c_str()), copy.data(), nullptr};
-            pid_t child;
-            int status = 0;
-            if (posix_spawn(&child, self.c_str(), nullptr, nullptr, arguments, environ) != 0 ||
-                waitpid(child, &status, 0) != child || status != 0)
-                giveUp("the program does not start once more");
-        });
+    double firstMs;
+    double laterMs; ///< the median of the others
+};
+
+/// Runs in a program of its own, so that neither side finds memory that the other one used.
+template <class Work>
+void printLoadTimes(Work load)
+{
+    malloc_trim(0); // what writing the files took
+    const double firstMs = measureMs(load);
+    std::vector<double> later(LOADS);
+    for (double& ms : later)
+        ms = measureMs(load);
+    std::printf("%f %f\n", firstMs, getMedian(later));
 }
 
-void compareLoads(AssetCachePool& pool, const std::string& folder, const File& large)
+std::string getProgram()
 {
-    loadByEngine(pool, large); // loads everything that stays, and warms the file cache
-    loadByHand(folder, large);
-    const double engineMs = measureMedianMs([&] { loadByEngine(pool, large); });
-    const double handMs = measureMedianMs([&] { loadByHand(folder, large); });
-    std::printf("200,000 triangles, ms: engine %.2f, read and glBufferData %.2f, ratio %.2f\n", engineMs,
-                handMs, engineMs / handMs);
+    return std::filesystem::read_symlink("/proc/self/exe").string();
+}
 
-    const size_t before = g_heapBytes;
-    g_heapPeak = g_heapBytes;
-    loadByEngine(pool, large);
-    const double peak = double(g_heapPeak - before);
-    std::printf("Heap peak: %.0f bytes; the file has %zu, its largest chunk %zu: file + %.2f chunks\n", peak,
-                large.size, large.largestChunk, (peak - double(large.size)) / double(large.largestChunk));
+LoadTimes measureLoads(const char* argument)
+{
+    LoadTimes times;
+    FILE* const output = popen((getProgram() + " " + argument).c_str(), "r");
+    if (!output || std::fscanf(output, "%lf %lf", &times.firstMs, &times.laterMs) != 2 || pclose(output) != 0)
+        giveUp("the program does not start once more");
+    return times;
+}
+
+void compareLoads()
+{
+    std::vector<double> first[2], later[2];
+    for (int i = 0; i < PROCESSES; ++i)
+    {
+        for (const int side : {0, 1})
+        {
+            const LoadTimes times = measureLoads(side == 0 ? LOAD_BY_ENGINE : LOAD_BY_HAND);
+            first[side].push_back(times.firstMs);
+            later[side].push_back(times.laterMs);
+        }
+    }
+    const char* const reference = "read and glBufferData";
+    printComparison("200,000 triangles, a program's first load", first[0], reference, first[1]);
+    printComparison("200,000 triangles, again and again", later[0], reference, later[1]);
+}
+
+void printHeapPeak(AssetCachePool& pool, const File& file)
+{
+    loadByEngine(pool, file);
+    g_countsHeap = true;
+    loadByEngine(pool, file);
+    g_countsHeap = false;
+    std::printf("Heap peak, bytes: %td; the file has %zu, its largest geometry %zu: ratio %.2f\n", g_heapPeak,
+                file.size, file.largestGeometry, double(g_heapPeak) / double(file.largestGeometry));
+}
+
+void printInstructions()
+{
+    const std::vector<uint64_t> counts =
+        callgrind::isAvailable() ? callgrind::count(FOR_COUNTING, {"gl", "__mem"}) : std::vector<uint64_t>();
+    if (counts.size() == 2)
+        std::printf("Instructions: %llu for 200,000 triangles, %llu for 50,000\n",
+                    static_cast<unsigned long long>(counts[0]), static_cast<unsigned long long>(counts[1]));
+}
+
+int start(const char* argument)
+{
+    const std::string self = getProgram();
+    std::string copy = argument;
+    char* const arguments[] = {const_cast<char*>(self.c_str()), copy.data(), nullptr};
+    pid_t child;
+    int status = 0;
+    if (posix_spawn(&child, self.c_str(), nullptr, nullptr, arguments, environ) != 0 ||
+        waitpid(child, &status, 0) != child || status != 0)
+        giveUp("the program does not start once more");
+    return status;
+}
+
+void compareStarts()
+{
+    std::vector<double> engine, bare;
+    for (int i = 0; i < STARTS; ++i)
+    {
+        engine.push_back(measureMs([] { return start(START_ENGINE); }));
+        bare.push_back(measureMs([] { return start(START_BARE); }));
+    }
+    printComparison("Start to first frame", engine, "context and one program", bare);
 }
 
 } // namespace
@@ -331,9 +453,10 @@ int main(int argc, char** argv)
     const auto surface = headless::Context::create({}, error);
     if (!surface)
         giveUp(error);
-    if (argc == 2 && !std::strcmp(argv[1], START_ENGINE))
+    const std::string_view mode = argc == 2 ? argv[1] : "";
+    if (mode == START_ENGINE)
         drawEngineFrame();
-    if (argc == 2 && !std::strcmp(argv[1], START_BARE))
+    if (mode == START_BARE)
         drawBareFrame();
 
     namespace fs = std::filesystem;
@@ -350,26 +473,23 @@ int main(int argc, char** argv)
             makeShared<SceneNode>(); // keeps the program and the pictures that both files' materials share
         if (!loadGloFile(pool, kept, small.name.c_str()))
             giveUp("the engine does not load the file");
-        if (argc == 2 && !std::strcmp(argv[1], FOR_COUNTING))
+        if (mode == FOR_COUNTING)
         {
             loadForCounting(pool, large);
             loadForCounting(pool, small);
         }
+        else if (mode == LOAD_BY_ENGINE)
+            printLoadTimes([&] { return loadByEngine(pool, large); });
+        else if (mode == LOAD_BY_HAND)
+            printLoadTimes([&] { return loadByHand(folder, large); });
         else
         {
             std::printf("%s\n\n", surface->describe().c_str());
-            compareLoads(pool, folder, large);
-            const std::vector<uint64_t> counts = callgrind::isAvailable()
-                                                     ? callgrind::count(FOR_COUNTING, {"gl", "__mem"})
-                                                     : std::vector<uint64_t>();
-            if (counts.size() == 2)
-                std::printf("Instructions: %llu for 200,000 triangles, %llu for 50,000\n",
-                            static_cast<unsigned long long>(counts[0]),
-                            static_cast<unsigned long long>(counts[1]));
-            const double engineMs = measureStartMs(START_ENGINE);
-            const double bareMs = measureStartMs(START_BARE);
-            std::printf("Start to first frame, ms: engine %.1f, context and one program %.1f, ratio %.2f\n",
-                        engineMs, bareMs, engineMs / bareMs);
+            std::fflush(stdout);
+            compareLoads();
+            printHeapPeak(pool, large);
+            printInstructions();
+            compareStarts();
         }
         kept = nullptr;
         pool.flush();

@@ -14,6 +14,8 @@
 #include <optional>
 #include <random>
 #include <type_traits>
+#include <utility>
+#include <vector>
 
 extern "C" size_t LLVMFuzzerMutate(uint8_t* data, size_t size, size_t mostSize);
 
@@ -288,10 +290,30 @@ void changeScene(GloScene& scene, Dice& dice)
     fields(second, scene);
 }
 
+class GeometryList final : public orv::detail::GeometryReceiver
+{
+public:
+    bool receive(Geometry& geometry, FileVersion) override
+    {
+        m_geometries.push_back(std::move(geometry));
+        return true;
+    }
+
+    std::vector<Geometry>& get() { return m_geometries; }
+
+private:
+    std::vector<Geometry> m_geometries;
+};
+
 std::optional<GloScene> readScene(const uint8_t* data, size_t size)
 {
-    orv::detail::GloReader reader(orv::makeShared<orv::MemoryStream>(data, int(size)), "fuzz");
-    return reader.read() ? std::optional(reader.scene()) : std::nullopt;
+    const auto stream = orv::makeShared<orv::MemoryStream>(data, int(size));
+    GeometryList geometries;
+    orv::detail::GloReader reader(*stream, geometries, "fuzz");
+    if (!reader.read())
+        return std::nullopt;
+    reader.scene().geometries = std::move(geometries.get());
+    return std::move(reader.scene());
 }
 
 /// @return 0 if the scene cannot be written or has grown too large.

@@ -50,7 +50,12 @@ bool isAllocatable(size_t size)
 
 } // namespace
 
-GloReader::GloReader(const SharedPtr<Stream>& stream, const char* name) : m_stream(stream), m_name(name) {}
+GloReader::GloReader(Stream& stream, GeometryReceiver& geometries, const char* name)
+    : m_stream(stream)
+    , m_geometries(geometries)
+    , m_name(name)
+{
+}
 
 bool GloReader::read()
 {
@@ -133,7 +138,7 @@ bool GloReader::skipChunk(uint32_t id, uint32_t size)
     const uint32_t left = remaining();
     if (size > left)
         return sizeMismatch(id, left, size);
-    if (m_stream->seek(position() + size) >= 0)
+    if (m_stream.seek(position() + size) >= 0)
         return true;
     ORV_GLO_ERROR("Failed to skip %s chunk in %s", ChunkName(id).text, m_name.c_str());
     return false;
@@ -149,21 +154,21 @@ bool GloReader::sizeMismatch(uint32_t id, uint32_t consumed, uint32_t size) cons
 /// The end of the stream also when the position is unknown, as after a short read from a file, or beyond it.
 uint32_t GloReader::position() const
 {
-    const int32_t size = m_stream->size();
-    const int32_t position = m_ended ? -1 : m_stream->tell();
+    const int32_t size = m_stream.size();
+    const int32_t position = m_ended ? -1 : m_stream.tell();
     const int32_t known = position < 0 || position > size ? size : position;
     return known < 0 ? 0 : uint32_t(known);
 }
 
 uint32_t GloReader::remaining() const
 {
-    const int32_t size = m_stream->size();
+    const int32_t size = m_stream.size();
     return size < 0 ? 0 : uint32_t(size) - position();
 }
 
 bool GloReader::readExactly(void* buffer, uint32_t size)
 {
-    return m_stream->read(buffer, size) == int32_t(size);
+    return m_stream.read(buffer, size) == int32_t(size);
 }
 
 bool GloReader::readField(const char* label, void* buffer, uint32_t size)
@@ -265,7 +270,7 @@ bool GloReader::acceptTool(const std::string& text)
 
 bool GloReader::body(GloScene& scene)
 {
-    while (!m_ended && !m_stream->eof())
+    while (!m_ended && !m_stream.eof())
     {
         OpenChunk opened;
         const Opening opening = open(BODY_CHUNKS, true, opened);
@@ -323,11 +328,22 @@ bool GloReader::chunks(uint32_t count, std::vector<Record>& records, bool skipUn
         if (opening == Opening::SKIPPED)
             continue;
         Record record;
-        if (!close(opened, fields(*this, record)))
+        if (!close(opened, fields(*this, record)) || !keep(record, records))
             return false;
-        records.push_back(std::move(record));
     }
     return true;
+}
+
+template <class Record>
+bool GloReader::keep(Record& record, std::vector<Record>& records)
+{
+    records.push_back(std::move(record));
+    return true;
+}
+
+bool GloReader::keep(Geometry& geometry, std::vector<Geometry>&)
+{
+    return m_geometries.receive(geometry, m_version);
 }
 
 template <class Element, class Fields>

@@ -38,10 +38,11 @@ const Record* findRecord(const std::map<std::string_view, const Record*>& record
 
 } // namespace
 
-GloBuilder::GloBuilder(AssetCachePool& pool, GloScene& scene, FileVersion version, AuthoringTool tool,
-                       uint32_t fileSize, const char* name)
+GloBuilder::GloBuilder(AssetCachePool& pool, GloScene& scene, const GloGeometries& geometries,
+                       FileVersion version, AuthoringTool tool, uint32_t fileSize, const char* name)
     : m_pool(pool)
     , m_scene(scene)
+    , m_geometries(geometries)
     , m_version(version)
     , m_tool(tool)
     , m_name(name)
@@ -55,14 +56,14 @@ GloBuilder::GloBuilder(AssetCachePool& pool, GloScene& scene, FileVersion versio
 
 GloBuilder::~GloBuilder() = default;
 
-SharedPtr<Glo> GloBuilder::build(const SharedPtr<SceneNode>& parent, MeshData wanted)
+SharedPtr<Glo> GloBuilder::build(const SharedPtr<SceneNode>& parent)
 {
     if (m_scene.scene && m_scene.upAxis > uint32_t(UpAxis::Z))
     {
         fail("Unrecognized up-axis option in %s");
         return {};
     }
-    if (!makeGeometries(wanted) || !makeMaterials())
+    if (!makeMaterials())
         return {};
 
     SharedPtr<SceneNode> top;
@@ -137,18 +138,6 @@ bool GloBuilder::failUnknown(const char* kind, const std::string& name) const
 bool GloBuilder::spend(uint64_t bytes)
 {
     return m_credit.spend(bytes) || fail("References in %s ask for more than a file of its size may have");
-}
-
-bool GloBuilder::makeGeometries(MeshData wanted)
-{
-    for (Geometry& geometry : m_scene.geometries)
-    {
-        GloGeometry made;
-        if (!makeGeometry(m_pool, geometry, m_version, m_name, wanted, made))
-            return false;
-        m_geometries.emplace(geometry.name, std::move(made));
-    }
-    return true;
 }
 
 bool GloBuilder::makeMaterials()
@@ -232,11 +221,11 @@ bool GloBuilder::makeObjects(const NodeData& data, Objects& objects)
 bool GloBuilder::makeSolids(const std::string& geometry, const std::vector<std::string>& materials,
                             bool skinned, std::vector<SharedPtr<Solid>>& solids)
 {
-    const auto found = m_geometries.find(geometry);
-    if (found == m_geometries.end())
+    const GloGeometry* const found = m_geometries.find(geometry);
+    if (!found)
         return failUnknown("geometry", geometry);
     bool missing = false;
-    const std::vector<SharedPtr<Mesh>>& meshes = found->second.meshes;
+    const std::vector<SharedPtr<Mesh>>& meshes = found->meshes;
     if (!spend(GloCredit::solids(meshes.size())))
         return false;
     for (size_t i = 0; i < meshes.size(); ++i)
@@ -284,7 +273,7 @@ bool GloBuilder::makeSkinnedSolids(const SkinReference& reference, std::vector<S
     SkinnedSolids skinned{skin, &reference, {}};
     if (!makeSolids(skin->geometry, reference.materials, true, skinned.solids))
         return false;
-    if (size_t(m_geometries.find(skin->geometry)->second.jointCount) > skin->attachments.size())
+    if (size_t(m_geometries.find(skin->geometry)->jointCount) > skin->attachments.size())
         ORV_GLO_WARN("Geometry \"%s\" names joints that skin \"%s\" lacks in %s; the last one moves them",
                      skin->geometry.c_str(), skin->name.c_str(), m_name);
     for (const SharedPtr<Solid>& solid : skinned.solids)

@@ -17,19 +17,20 @@
 namespace orv::detail
 {
 
-/// Makes engine objects from the records of a scene file. One per load; every failure is logged once.
+/// Makes a scene from its geometries and the other records of its file. One per load; every failure is logged once.
 class GloBuilder
 {
 public:
-    /// @param scene     borrowed; its bulk data is freed in the process.
-    /// @param fileSize  in bytes; limits the cost of the scene.
-    /// @param name      the file, for messages; borrowed.
-    GloBuilder(AssetCachePool& pool, glo::GloScene& scene, glo::FileVersion version, glo::AuthoringTool tool,
-               uint32_t fileSize, const char* name);
+    /// @param scene       borrowed.
+    /// @param geometries  borrowed.
+    /// @param fileSize    in bytes; limits the cost of the scene.
+    /// @param name        the file, for messages; borrowed.
+    GloBuilder(AssetCachePool& pool, glo::GloScene& scene, const GloGeometries& geometries,
+               glo::FileVersion version, glo::AuthoringTool tool, uint32_t fileSize, const char* name);
     ~GloBuilder();
 
     /// @return empty, with parent unchanged, on failure.
-    SharedPtr<Glo> build(const SharedPtr<SceneNode>& parent, MeshData wanted);
+    SharedPtr<Glo> build(const SharedPtr<SceneNode>& parent);
 
 private:
     using Objects = std::vector<SharedPtr<SceneNode>>;
@@ -73,7 +74,6 @@ private:
 
     bool spend(uint64_t bytes);
 
-    bool makeGeometries(MeshData wanted);
     bool makeMaterials();
     void finishMaterials();
     SharedPtr<SceneNode> makeNode(const glo::NodeData& data, const SharedPtr<SceneNode>& parent);
@@ -104,6 +104,7 @@ private:
 
     AssetCachePool& m_pool;
     glo::GloScene& m_scene;
+    const GloGeometries& m_geometries;
     glo::FileVersion m_version;
     glo::AuthoringTool m_tool;
     const char* m_name;
@@ -112,7 +113,6 @@ private:
     RecordsByName<glo::LightDefinition> m_lightDefinitions;
     RecordsByName<glo::CameraDefinition> m_cameraDefinitions;
     SharedPtr<Glo> m_glo;
-    std::map<std::string, GloGeometry, std::less<>> m_geometries;
     std::map<std::string, GloMaterial, std::less<>> m_materials;
     SharedPtr<Appearance> m_defaultAppearances[2]; ///< plain, skinned
     std::vector<Place> m_places;

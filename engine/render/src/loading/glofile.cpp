@@ -31,12 +31,13 @@ SharedPtr<Glo> loadGloFile(AssetCachePool& pool, const SharedPtr<SceneNode>& par
         return {};
     }
     detail::LoadScope::addRead(uint64_t(std::max(stream->size(), 0)));
-    detail::GloReader reader(stream, name);
+    detail::GloGeometries geometries(pool, meshData, name);
+    detail::GloReader reader(*stream, geometries, name);
     if (!reader.read())
         return {};
-    detail::GloBuilder builder(pool, reader.scene(), reader.version(), reader.tool(),
+    detail::GloBuilder builder(pool, reader.scene(), geometries, reader.version(), reader.tool(),
                                uint32_t(std::max(stream->size(), 0)), name);
-    return builder.build(parent, meshData);
+    return builder.build(parent);
 }
 
 } // namespace orv

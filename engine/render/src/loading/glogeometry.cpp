@@ -13,6 +13,7 @@
 #include <cstdint>
 #include <cstring>
 #include <iterator>
+#include <utility>
 
 namespace orv::detail
 {
@@ -221,32 +222,54 @@ SharedPtr<Mesh> makeMesh(AssetCachePool& pool, const PrimitiveSet& set,
 
 } // namespace
 
-bool makeGeometry(AssetCachePool& pool, Geometry& geometry, FileVersion version, const char* fileName,
-                  MeshData wanted, GloGeometry& made)
+GloGeometries::GloGeometries(AssetCachePool& pool, MeshData wanted, const char* fileName)
+    : m_pool(pool)
+    , m_wanted(wanted)
+    , m_fileName(fileName)
+{
+}
+
+bool GloGeometries::receive(Geometry& geometry, FileVersion version)
+{
+    GloGeometry made;
+    if (!make(geometry, version, made))
+        return false;
+    m_geometries.emplace(std::move(geometry.name), std::move(made));
+    return true;
+}
+
+const GloGeometry* GloGeometries::find(const std::string& name) const
+{
+    const auto found = m_geometries.find(name);
+    return found != m_geometries.end() ? &found->second : nullptr;
+}
+
+bool GloGeometries::make(Geometry& geometry, FileVersion version, GloGeometry& made)
 {
     VertexSet& vertices = geometry.vertices;
     RawVector<uint8_t>& bytes = vertices.data.bytes;
     std::vector<VertexBuffer::AttribDescription> descriptions;
-    if (!describe(geometry, version, fileName, descriptions) || !isSound(geometry, fileName))
+    if (!describe(geometry, version, m_fileName, descriptions) || !isSound(geometry, m_fileName))
         return false;
     made.jointCount = countJoints(geometry);
 
-    const SharedPtr<VertexBuffer> vertexBuffer = pool.getVertexBufferCache()->create(nullptr);
+    const SharedPtr<VertexBuffer> vertexBuffer = m_pool.getVertexBufferCache()->create(nullptr);
     const bool hasVertices = vertices.vertexCount > 0;
     if (!vertexBuffer ||
         (hasVertices &&
          !vertexBuffer->setAllAttributes(descriptions.data(), static_cast<unsigned int>(descriptions.size()),
                                          bytes.data(), static_cast<unsigned int>(bytes.size()))))
-        return fail(geometry, fileName);
+        return fail(geometry, m_fileName);
 
     const SharedPtr<MeshVertices> places =
-        wanted != MeshData::NONE ? readVertices(geometry, version) : SharedPtr<MeshVertices>();
+        m_wanted != MeshData::NONE ? readVertices(geometry, version) : SharedPtr<MeshVertices>();
     bytes = {};
     for (const PrimitiveSet& set : geometry.primitiveSets)
     {
-        const SharedPtr<Mesh> mesh = makeMesh(pool, set, vertexBuffer, vertices.vertexCount, places, wanted);
+        const SharedPtr<Mesh> mesh =
+            makeMesh(m_pool, set, vertexBuffer, vertices.vertexCount, places, m_wanted);
         if (!mesh)
-            return fail(geometry, fileName);
+            return fail(geometry, m_fileName);
         made.meshes.push_back(mesh);
     }
     return true;

@@ -9,14 +9,27 @@
 namespace orv::detail
 {
 
+/// Receives the geometries of a scene file, nearly all of its bytes, each before the next one is read.
+class GeometryReceiver
+{
+public:
+    virtual ~GeometryReceiver() = default;
+
+    /// @param version  of the file, as read so far; writers put it first.
+    /// @return false, after logging, to end the reading.
+    virtual bool receive(glo::Geometry& geometry, glo::FileVersion version) = 0;
+};
+
 /// Reads a scene file into plain records and checks every chunk against its size.
 ///
 /// One per load. The first failure is logged and ends the reading.
 class GloReader
 {
 public:
-    /// @param name  for messages.
-    GloReader(const SharedPtr<Stream>& stream, const char* name);
+    /// @param stream      borrowed.
+    /// @param geometries  borrowed; gets the geometries, which are not in the scene's records.
+    /// @param name        for messages.
+    GloReader(Stream& stream, GeometryReceiver& geometries, const char* name);
 
     /// The whole file. @return false, after logging, with the scene in part read.
     bool read();
@@ -71,6 +84,9 @@ private:
     bool close(const OpenChunk& chunk, bool isRead);
     bool bodyChunk(uint32_t id, glo::GloScene& scene);
     bool skipChunk(uint32_t id, uint32_t size);
+    template <class Record>
+    bool keep(Record& record, std::vector<Record>& records);
+    bool keep(glo::Geometry& geometry, std::vector<glo::Geometry>& records);
     bool readExactly(void* buffer, uint32_t size);
     template <class Element>
     bool readElements(RawVector<Element>& elements, uint32_t count);
@@ -79,7 +95,8 @@ private:
     uint32_t remaining() const;
     bool sizeMismatch(uint32_t id, uint32_t consumed, uint32_t size) const;
 
-    SharedPtr<Stream> m_stream;
+    Stream& m_stream;
+    GeometryReceiver& m_geometries;
     std::string m_name;
     bool m_ended = false; ///< the stream had no further chunk
     uint32_t m_chunkSize = 0;
