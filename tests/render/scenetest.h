@@ -102,6 +102,18 @@ protected:
         return appearance;
     }
 
+    /// Shows the middle of the reflection everywhere.
+    orv::SharedPtr<orv::Appearance> makeMirror()
+    {
+        auto appearance = orv::makeShared<orv::Appearance>();
+        appearance->setShaderProgram(makeProgram(
+            "attribute vec3 a_position; uniform mat4 u_transform;"
+            "void main() { gl_Position = u_transform * vec4(a_position, 1.0); }",
+            "uniform sampler2D u_mirror; void main() { gl_FragColor = texture2D(u_mirror, vec2(0.5)); }",
+            {{"u_transform", "T_MODEL_VIEW_PROJECTION"}, {"u_mirror", "M_MIRROR_TEXTURE"}}));
+        return appearance;
+    }
+
     orv::SharedPtr<orv::RenderTarget> makeTarget(unsigned width, unsigned height)
     {
         const auto texture = pool->getTexture2DCache()->create(

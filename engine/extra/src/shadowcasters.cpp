@@ -58,6 +58,8 @@ void ShadowCasters::finish()
 
 void ShadowCasters::draw(RenderContext& context, Solid& solid)
 {
+    if (!solid.getAppearance() || !solid.getMesh())
+        return; // taken away by a node of the program's own that was visited later
     Caster& caster = find(*solid.getAppearance());
     if (!caster.material)
         return;
@@ -106,7 +108,7 @@ void ShadowCasters::make(const Appearance& appearance, Caster& caster) const
     caster = Caster();
     caster.program = appearance.getShaderProgram();
     caster.revision = appearance.getPropertyRevision();
-    if (!drawsIntoWorld(*caster.program))
+    if (!caster.program || !drawsIntoWorld(*caster.program))
         return;
     const SharedPtr<ShaderProgram> program = m_programs.findDepth(*caster.program);
     auto material = makeShared<Appearance>();

@@ -27,12 +27,7 @@ TEST_F(AllocationTest, framesAllocateNothing)
     const Glo::Ptr loaded = loadGloFile(*pool, scene, "test.glo");
     ASSERT_TRUE(loaded);
 
-    const auto mirror = makeShared<Appearance>();
-    mirror->setShaderProgram(makeProgram(
-        "attribute vec3 a_position; void main() { gl_Position = vec4(a_position, 1.0); }",
-        "uniform sampler2D u_mirror; void main() { gl_FragColor = texture2D(u_mirror, vec2(0.5)); }",
-        {{"u_mirror", "M_MIRROR_TEXTURE"}}));
-    addSquare(Vector3f(), 1.0f, mirror);
+    addSquare(Vector3f(), 1.0f, makeMirror());
     camera->setStereo(3.0f, 0.1f);
     renderer->setOpaqueGrouped(true);
 

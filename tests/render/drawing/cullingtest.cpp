@@ -484,13 +484,7 @@ TEST_F(CullingTest, leavesNothingOutThatMayBeSeen)
 TEST_F(CullingTest, leavesNothingOutThatAMirrorMayShow)
 {
     makeScene();
-    const auto appearance = makeShared<Appearance>();
-    appearance->setShaderProgram(makeProgram(
-        "attribute vec3 a_position; uniform mat4 u_transform;"
-        "void main() { gl_Position = u_transform * vec4(a_position, 1.0); }",
-        "uniform sampler2D u_mirror; void main() { gl_FragColor = texture2D(u_mirror, vec2(0.5)); }",
-        {{"u_transform", "T_MODEL_VIEW_PROJECTION"}, {"u_mirror", "M_MIRROR_TEXTURE"}}));
-    addSolid(makeMesh(true), appearance, scene);
+    addSolid(makeMesh(true), makeMirror(), scene);
     const SharedPtr<Solid> added = items[lastCount].solid;
     for (int frame = 0; frame < FRAMES / 4 && !HasFailure(); ++frame)
     {
@@ -543,16 +537,10 @@ TEST_F(CullingTest, largePointsAreDrawn)
 // Fault caught: a mirror that takes the place in a list of those before it, which are hidden and have none.
 TEST_F(CullingTest, drawsAMirrorBehindHiddenOnes)
 {
-    const auto program = makeProgram(
-        "attribute vec3 a_position; uniform mat4 u_transform;"
-        "void main() { gl_Position = u_transform * vec4(a_position, 1.0); }",
-        "uniform sampler2D u_mirror; void main() { gl_FragColor = texture2D(u_mirror, vec2(0.5)); }",
-        {{"u_transform", "T_MODEL_VIEW_PROJECTION"}, {"u_mirror", "M_MIRROR_TEXTURE"}});
     SharedPtr<Appearance> last;
     for (int i = 0; i < 9; ++i)
     {
-        last = makeShared<Appearance>();
-        last->setShaderProgram(program);
+        last = makeMirror();
         const auto square = createSquare(*pool, Vector2f(1, 1));
         square->setAppearance(last);
         square->setPosition(Vector3f(0, 0, i < 8 ? 50.0f : -5.0f)); // behind the eye, and before it

@@ -128,12 +128,7 @@ TEST_F(GroupingTest, everyProgramMaterialAndMeshIsTakenOnce)
     // A material has three meshes; the first of the next material is another one than the last.
     EXPECT_EQ((std::vector<uint64_t>{2, 4, 4 * 3, 60}), count(true));
 
-    const auto mirror = makeShared<Appearance>();
-    mirror->setShaderProgram(makeProgram(
-        "attribute vec3 a_position; void main() { gl_Position = vec4(a_position, 1.0); }",
-        "uniform sampler2D u_mirror; void main() { gl_FragColor = texture2D(u_mirror, vec2(0.5)); }",
-        {{"u_mirror", "M_MIRROR_TEXTURE"}}));
-    addSquare(Vector3f(0, 0, -4), 1.0f, mirror);
+    addSquare(Vector3f(0, 0, -4), 1.0f, makeMirror());
     const std::vector<uint64_t> both = count(true);
     EXPECT_EQ(2u + 2u + 1u, both[0]);
     EXPECT_EQ(4u + 4u, both[1]);

@@ -1,5 +1,6 @@
 #include "scenetest.h"
 
+#include "orv/mesh.h"
 #include "orv/motionblurrenderer.h"
 #include "orv/renderblockgroup.h"
 #include "orv/shadowmap.h"
@@ -137,6 +138,68 @@ TEST_F(RenderBlockTest, nodesMayRemoveOthersWhenTheyAreVisited)
         use(*top);
         EXPECT_EQ(1u, top->getChildCount());
         EXPECT_EQ(1, sun->sharedGetCount());
+    }
+}
+
+// Fault caught: a material, program or mesh looked for in a solid that a node of the program's own has emptied since the
+// solid was met, or what was drawn before drawn in its place.
+TEST_F(RenderBlockTest, nodesMayEmptyOthersWhenTheyAreVisited)
+{
+    struct Emptier : SceneNode
+    {
+        NodeType getNodeType() const override { return 100; }
+        void accept(SceneNodeVisitor&) override
+        {
+            for (Solid* const solid : solids)
+                empty(*solid);
+        }
+        std::vector<Solid*> solids;
+        std::function<void(Solid&)> empty;
+    };
+    const auto simple = makeShared<SimpleRenderer>(renderContext, pool);
+    const auto culled = makeShared<SimpleRenderer>(renderContext, pool);
+    culled->setCulled(true);
+    culled->setOpaqueGrouped(true);
+    const auto blurring = makeShared<MotionBlurRenderer>(renderContext, pool);
+    const auto shadows = makeShared<ShadowMap>(renderContext, pool, 64);
+    const std::function<void(SceneNode&)> uses[] = {
+        [&](SceneNode& top) { simple->render(camera.get(), top, {}, {}); },
+        [&](SceneNode& top) { culled->render(camera.get(), top, {}, {}); },
+        [&](SceneNode& top) { blurring->render(camera.get(), top, {}, {}); },
+        [&](SceneNode& top) { shadows->render(top, camera.get()); }};
+    const std::function<void(Solid&)> ways[] = {[](Solid& solid) { solid.setAppearance(nullptr); },
+                                                [](Solid& solid) { solid.setMesh(nullptr); },
+                                                [](Solid& solid)
+                                                {
+                                                    if (solid.getAppearance())
+                                                        solid.getAppearance()->setShaderProgram(nullptr);
+                                                }};
+    for (const auto& use : uses)
+    {
+        for (const auto& way : ways)
+        {
+            const auto top = makeShared<SceneNode>();
+            const auto emptier = makeShared<Emptier>();
+            const auto transparent = makePaint(Colour4f::RED);
+            transparent->setBlendFactors(BlendFactor::ONE, BlendFactor::ONE, BlendFactor::ONE,
+                                         BlendFactor::ONE);
+            const SharedPtr<Appearance> materials[] = {makePaint(Colour4f::RED), transparent, makeMirror(),
+                                                       makePaint(Colour4f::GREEN)};
+            for (const SharedPtr<Appearance>& material : materials)
+            {
+                const auto solid = createCube(*pool, Vector2f(1, 1));
+                solid->setAppearance(material);
+                solid->setParent(top);
+                emptier->solids.push_back(solid.get());
+            }
+            emptier->solids.pop_back();
+            emptier->empty = way;
+            const auto sun = makeShared<Light>();
+            sun->setLightType(Light::LightType::DIRECTIONAL);
+            sun->setParent(top);
+            emptier->setParent(top);
+            use(*top);
+        }
     }
 }
 

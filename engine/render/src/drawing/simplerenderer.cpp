@@ -236,7 +236,7 @@ void SimpleRenderer::renderEye(const detail::Eye& eye, const detail::Viewport& v
     for (size_t i = 0; i < m_mirrors.size(); ++i)
     {
         Solid* mirror = m_mirrors[i];
-        if (m_culling && m_culling->hides(*mirror, view, eye.projection))
+        if (!mirror->getAppearance() || (m_culling && m_culling->hides(*mirror, view, eye.projection)))
             continue;
         if (prepareMirrorTarget())
         {

@@ -26,7 +26,7 @@ void SolidPainter::draw(Solid* const* solids, size_t count)
     for (Solid* const* next = solids; next != solids + count; ++next)
     {
         const Solid& solid = **next;
-        const bool isReady = solid.getAppearance().get() == m_appearance && m_revision == g_lastRevision &&
+        const bool isReady = solid.getAppearance().get() == m_material && m_revision == g_lastRevision &&
                              !solid.hasSkin() && solid.getWorldMirrored() == m_turnsWinding;
         if (!isReady && !takeMaterial(solid))
             continue;
@@ -44,22 +44,23 @@ bool SolidPainter::takeMaterial(const Solid& solid)
 {
     if (solid.hasSkin() || m_hadJoints)
         publishJoints(solid);
-    if (!solid.getMesh())
-        return false;
-    Appearance& appearance = *solid.getAppearance().get();
-    const ShaderProgram* const program = appearance.getShaderProgram().get();
+    Appearance* const material = solid.getAppearance().get();
+    const ShaderProgram* const program = material ? material->getShaderProgram().get() : nullptr;
+    if (!program || !solid.getMesh())
+        return false; // taken away by a node of the program's own that was visited later
+    Appearance& appearance = *material;
     if (program != m_program || m_revision != g_lastRevision)
         m_mesh = nullptr;
     m_program = program;
 
     m_turnsWinding = solid.turnsWinding(program);
     m_sources = appearance.prepare(m_context, m_turnsWinding);
-    m_appearance = m_sources && !m_hadJoints ? &appearance : nullptr;
+    m_material = m_sources && !m_hadJoints ? static_cast<const void*>(material) : this;
     if (m_sources && m_sources->readsTransforms) [[unlikely]]
     {
         publishTransforms(solid);
         m_sources = appearance.prepare(m_context, m_turnsWinding);
-        m_appearance = nullptr;
+        m_material = this;
     }
     if (m_sources && m_sources->transforms[int(DrawTransform::OLD_MODEL_VIEW_PROJECTION)])
         ShaderProgram::sendHeldTransform(*m_sources, DrawTransform::OLD_MODEL_VIEW_PROJECTION); // not ours

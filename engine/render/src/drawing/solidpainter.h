@@ -51,7 +51,8 @@ private:
     const ModelProjection m_modelProjection;
 
     // Of the previous solid; null forces all checks.
-    const Appearance* m_appearance = nullptr;
+    const void* m_material =
+        this; ///< whose values are sent; itself for none, since a solid may have no material
     const ShaderProgram* m_program = nullptr;
     const Mesh* m_mesh = nullptr; ///< bound for m_program
     uint64_t m_revision = 0;      ///< the process's last revision when its material was ready
