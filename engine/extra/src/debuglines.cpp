@@ -65,6 +65,7 @@ DebugLines::DebugLines(AssetCachePool& pool) : m_cache(pool.getVertexBufferCache
     appearance->setBlendFactors(BlendFactor::SRC_ALPHA, BlendFactor::ONE, BlendFactor::ONE_MINUS_SRC_ALPHA,
                                 BlendFactor::ONE_MINUS_SRC_ALPHA);
     appearance->setDepthWriteEnabled(false);
+    appearance->setDepthTestFunction(DepthFunction::LEQUAL); // lines on a surface are seen
     appearance->addProperty<Matrix4f>("T_MODEL_VIEW_PROJECTION", 1);
     m_transform = SharedPtr<ShaderUniform<Matrix4f>>(static_cast<ShaderUniform<Matrix4f>*>(
         appearance->getPropertyUniform("T_MODEL_VIEW_PROJECTION").get()));

@@ -73,7 +73,8 @@ public:
     int getLineCount() const { return int(m_vertices.size() / 2); } ///< Lines added since clear().
     void clear();                                                   ///< Removes all lines.
 
-    /// Whether nearer surfaces hide lines (the default), or lines are drawn over everything. Depth is never written.
+    /// Whether nearer surfaces hide lines (the default), or lines are drawn over everything. Depth is never written;
+    /// lines as far away as a surface are seen.
     void setDepthTested(bool tested);
 
     /// Draws into the viewport with this camera, in stereo into both halves. Call it after the block, with the block's
