@@ -286,7 +286,7 @@ TEST_F(HostileDriverTest, whatIsNoFile)
     {
         std::filesystem::create_directory(directory.path(std::string("folder") + suffix));
         const std::string path = directory.write(std::string("huge") + suffix, std::string());
-        ASSERT_EQ(0, truncate(path.c_str(), off_t(3) << 30));
+        ASSERT_EQ(0, truncate64(path.c_str(), int64_t(3) << 30));
     }
     heap().start();
     loadAll("folder");
