@@ -30,7 +30,10 @@ check(liborv1 "libc6.*libegl1.*libgles2.*libstdc" "/liborv\\.so\\.1" "/usr/share
 check(liborv-dev "liborv1 \\(= " "/liborv\\.so -> liborv\\.so\\.1" "/liborvextra\\.a" "/usr/include/orv/orv\\.h" "/usr/include/orv/.*\\.h"
     "/cmake/orv/orvConfig\\.cmake" "/cmake/orv/orv.*\\.cmake" "/pkgconfig/orv\\.pc" "/share/doc/liborv-dev/copyright"
     "/share/doc/liborv-dev/")
+if(EXISTS ${CMAKE_CURRENT_LIST_DIR}/../build/web/page) # built by ./run web, and then installed
+    set(page "/share/orv/web/")
+endif()
 check(orv-tools "libassimp.*libsdl2" "/usr/bin/orv-convert" "/usr/bin/orv-inspect" "/usr/bin/orv-view"
     "/man1/orv-(convert|inspect|view)\\.1" "/bash-completion/completions/orv-" "/zsh/vendor-completions/_orv-"
     "/fish/vendor_completions\\.d/orv-.*\\.fish" "/applications/orv-view\\.desktop"
-    "/thumbnailers/orv-view\\.thumbnailer" "/mime/packages/orv\\.xml" "/share/doc/orv-tools/copyright")
+    "/thumbnailers/orv-view\\.thumbnailer" "/mime/packages/orv\\.xml" "/share/doc/orv-tools/copyright" ${page})
