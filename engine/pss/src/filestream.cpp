@@ -100,9 +100,10 @@ int32_t FileInputStream::readBuffered(unsigned char* bytes, int32_t count)
 /// @return less than count at the end of the file, or if the system refuses.
 int32_t FileInputStream::readFile(unsigned char* bytes, int32_t count, int32_t position)
 {
-    m_bufferedSize = 0;
-    if (m_filePosition != position && lseek(m_file.get(), off_t(position), SEEK_SET) < 0)
+    const int64_t filePosition = int64_t(m_bufferStart) + m_bufferedSize;
+    if (filePosition != position && lseek(m_file.get(), off_t(position), SEEK_SET) < 0)
         m_isBad = true;
+    m_bufferedSize = 0;
     int32_t taken = 0;
     while (taken < count && !m_isBad)
     {
@@ -118,7 +119,6 @@ int32_t FileInputStream::readFile(unsigned char* bytes, int32_t count, int32_t p
         m_bufferedSize = int32_t(std::max<ssize_t>(some - rest, 0));
     }
     m_bufferStart = position + taken;
-    m_filePosition = int64_t(m_bufferStart) + m_bufferedSize;
     return taken;
 }
 

@@ -51,9 +51,8 @@ private:
     bool m_isBad = false; ///< the system refused a read
     bool m_isAtEnd = false;
     int32_t m_size = -1;
-    int32_t m_position = 0;     ///< -1 if it does not fit
-    int64_t m_filePosition = 0; ///< of the descriptor: the end of the buffer
-    int32_t m_bufferStart = 0;  ///< where in the file the buffer begins
+    int32_t m_position = 0;    ///< -1 if it does not fit
+    int32_t m_bufferStart = 0; ///< where in the file the buffer begins; the descriptor stands at its end
     int32_t m_bufferedSize = 0;
     unsigned char m_buffer[BUFFER_SIZE];
 };

@@ -48,18 +48,17 @@ bool SolidPainter::takeMaterial(const Solid& solid)
     const ShaderProgram* const program = material ? material->getShaderProgram().get() : nullptr;
     if (!program || !solid.getMesh())
         return false; // taken away by a node of the program's own that was visited later
-    Appearance& appearance = *material;
     if (program != m_program || m_revision != g_lastRevision)
         m_mesh = nullptr;
     m_program = program;
 
     m_turnsWinding = solid.turnsWinding(program);
-    m_sources = appearance.prepare(m_context, m_turnsWinding);
+    m_sources = material->prepare(m_context, m_turnsWinding);
     m_material = m_sources && !m_hadJoints ? static_cast<const void*>(material) : this;
     if (m_sources && m_sources->readsTransforms) [[unlikely]]
     {
         publishTransforms(solid);
-        m_sources = appearance.prepare(m_context, m_turnsWinding);
+        m_sources = material->prepare(m_context, m_turnsWinding);
         m_material = this;
     }
     if (m_sources && m_sources->transforms[int(DrawTransform::OLD_MODEL_VIEW_PROJECTION)])
