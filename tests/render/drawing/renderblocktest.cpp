@@ -1,5 +1,6 @@
 #include "scenetest.h"
 
+#include "glcalls/glcalls.h"
 #include "orv/mesh.h"
 #include "orv/motionblurrenderer.h"
 #include "orv/renderblockgroup.h"
@@ -11,6 +12,7 @@
 #include <limits>
 #include <string>
 #include <utility>
+#include <vector>
 
 using namespace orv;
 
@@ -174,6 +176,7 @@ TEST_F(RenderBlockTest, nodesMayEmptyOthersWhenTheyAreVisited)
                                                     if (solid.getAppearance())
                                                         solid.getAppearance()->setShaderProgram(nullptr);
                                                 }};
+    std::vector<uint64_t> draws;
     for (const auto& use : uses)
     {
         for (const auto& way : ways)
@@ -198,9 +201,13 @@ TEST_F(RenderBlockTest, nodesMayEmptyOthersWhenTheyAreVisited)
             sun->setLightType(Light::LightType::DIRECTIONAL);
             sun->setParent(top);
             emptier->setParent(top);
+            glcalls::resetCounts();
             use(*top);
+            draws.push_back(glcalls::count(glDrawElements));
         }
     }
+    // The last cube is whole. An empty mirror still reflects it; velocities need no material.
+    EXPECT_EQ((std::vector<uint64_t>{1, 2, 2, 1, 2, 2, 4, 1, 4, 1, 1, 1}), draws);
 }
 
 // Faults caught: a view that clears the views beside it, or leaves the box that it cleared in for the next draws.
