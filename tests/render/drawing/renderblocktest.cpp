@@ -77,7 +77,7 @@ TEST_F(RenderBlockTest, groupDoesNotTakeItself)
     outer->render();
 }
 
-// Faults caught: a crash, or the next block left out, where a block removes itself.
+// Faults caught: a crash, or the next block left out, where a block removes itself or blocks before it.
 TEST_F(RenderBlockTest, groupOutlivesTheRemovalOfItsBlocks)
 {
     struct Block : RenderBlockBase
@@ -91,6 +91,8 @@ TEST_F(RenderBlockTest, groupOutlivesTheRemovalOfItsBlocks)
     std::string drawn;
     auto group = makeShared<RenderBlockGroup>();
     const auto write = [&](char letter) { return makeShared<Block>([&drawn, letter] { drawn += letter; }); };
+    const SharedPtr<RenderBlockBase> first = write('a');
+    const SharedPtr<RenderBlockBase> later = write('e');
     const SharedPtr<RenderBlockBase> once = makeShared<Block>(
         [&]
         {
@@ -99,13 +101,22 @@ TEST_F(RenderBlockTest, groupOutlivesTheRemovalOfItsBlocks)
             for (int i = 0; i < 9; ++i)
                 group->addBlock(write('+'));
         });
-    group->addBlock(write('a'));
+    group->addBlock(first);
     group->addBlock(once);
     group->addBlock(write('c'));
-    group->addBlock(makeShared<Block>([&] { group = nullptr; }));
+    const SharedPtr<RenderBlockBase> sweeper = makeShared<Block>(
+        [&]
+        {
+            for (const auto& block : {first, once, sweeper, later})
+                group->removeBlock(block);
+        });
+    group->addBlock(sweeper);
     group->addBlock(write('d'));
+    group->addBlock(later);
+    group->addBlock(makeShared<Block>([&] { group = nullptr; }));
+    group->addBlock(write('f'));
     group->render();
-    EXPECT_EQ("abcd", drawn);
+    EXPECT_EQ("abcdf", drawn);
     EXPECT_EQ(1, once->sharedGetCount());
 }
 

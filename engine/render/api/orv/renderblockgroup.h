@@ -7,8 +7,8 @@
 namespace orv
 {
 
-/// Several blocks, in order. Blocks are shared. A block may remove itself while its group renders or updates it; blocks
-/// that are added then have their turn the next time.
+/// Several blocks, in order. Blocks are shared. A block may remove itself and others while its group renders or updates
+/// it; blocks that are added then have their turn the next time.
 class ORV_API RenderBlockGroup : public RenderBlockBase
 {
 public:
@@ -27,8 +27,10 @@ public:
 private:
     template <class Use>
     ORV_LOCAL void forEachBlock(const Use& use);
+    ORV_LOCAL void closeGaps();
 
     std::vector<SharedPtr<RenderBlockBase>> m_blocks;
+    int m_walks = 0; ///< calls of forEachBlock() that have not ended
 };
 
 } // namespace orv

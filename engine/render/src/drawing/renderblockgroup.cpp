@@ -26,7 +26,7 @@ bool RenderBlockGroup::contains(const RenderBlockBase& other) const
 {
     for (const SharedPtr<RenderBlockBase>& block : m_blocks)
     {
-        if (block->contains(other))
+        if (block && block->contains(other))
             return true;
     }
     return this == &other;
@@ -34,23 +34,31 @@ bool RenderBlockGroup::contains(const RenderBlockBase& other) const
 
 void RenderBlockGroup::removeBlock(const SharedPtr<RenderBlockBase>& block)
 {
-    m_blocks.erase(std::remove(m_blocks.begin(), m_blocks.end(), block), m_blocks.end());
+    std::replace(m_blocks.begin(), m_blocks.end(), block, SharedPtr<RenderBlockBase>());
+    closeGaps();
 }
 
-/// Calls use(block) for each block. It may drop the group, remove the block, and add others, whose turn comes the next
+/// Calls use(block) for each block. It may drop the group, remove blocks, and add others, whose turn comes the next
 /// time.
 template <class Use>
 void RenderBlockGroup::forEachBlock(const Use& use)
 {
     const SharedPtr<RenderBlockGroup> self(sharedGetCount() > 0 ? this : nullptr);
-    size_t next = 0;
-    for (size_t left = m_blocks.size(); left > 0 && next < m_blocks.size(); --left)
+    ++m_walks;
+    for (size_t i = 0, count = m_blocks.size(); i < count; ++i)
     {
-        const SharedPtr<RenderBlockBase> block = m_blocks[next];
-        use(*block);
-        if (next < m_blocks.size() && m_blocks[next] == block)
-            ++next; // otherwise the following block has taken its place
+        if (const SharedPtr<RenderBlockBase> block = m_blocks[i])
+            use(*block);
     }
+    --m_walks;
+    closeGaps();
+}
+
+/// Walks count places, so removed blocks leave theirs empty until no walk is left.
+void RenderBlockGroup::closeGaps()
+{
+    if (m_walks == 0)
+        m_blocks.erase(std::remove(m_blocks.begin(), m_blocks.end(), nullptr), m_blocks.end());
 }
 
 void RenderBlockGroup::render()
