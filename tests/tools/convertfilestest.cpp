@@ -3,6 +3,7 @@
 #include "headless/png.h"
 
 #include <filesystem>
+#include <iterator>
 
 namespace fs = std::filesystem;
 
@@ -163,12 +164,35 @@ TEST_F(ConvertFilesTest, inputsAreNeverWrittenOver)
             const Outcome outcome = convert("model/duck.obj model/duck.glo");
             EXPECT_EQ(0, outcome.exitCode) << outcome.output;
             EXPECT_EQ(before, support::readFile(kept)) << way;
-            EXPECT_NE(std::string::npos, outcome.output.find("duck-CM-2.png")) << outcome.output;
+            EXPECT_NE(std::string::npos, outcome.output.find("duck-CM_2.png")) << outcome.output;
         }
         EXPECT_EQ(way == std::string("symbolic link"), fs::is_symlink(kept));
         EXPECT_EQ(support::readFile(m_folder.path("model/CM.png")),
-                  support::readFile(m_folder.path("model/duck-CM-2.png")));
+                  support::readFile(m_folder.path("model/duck-CM_2.png")));
     }
+}
+
+// Fault caught: a picture that is lost to another scene's in the same folder.
+TEST_F(ConvertFilesTest, scenesOfAFolderHaveTheirOwnPictures)
+{
+    const struct
+    {
+        std::string scene;
+        std::string picture;
+    } models[] = {{"house", "roof-tiles.png"},        {"house-roof", "tiles.png"},
+                  {"two words", "own.png"},           {"two_words", "own.png"},
+                  {"\xe5\xae\xb6", "own.png"},        {"\xe6\xa9\x8b", "own.png"},
+                  {std::string(101, 'l'), "own.png"}, {std::string(102, 'l'), "own.png"}};
+    fs::create_directories(m_folder.path("out"));
+    for (const auto& model : models)
+    {
+        writePicture("model/" + model.picture, 255, 255);
+        writeModel("model/a.obj", {model.picture});
+        const Outcome outcome = convert("model/a.obj 'out/" + model.scene + ".glo'");
+        EXPECT_EQ(0, outcome.exitCode) << outcome.output;
+    }
+    const auto files = fs::directory_iterator(m_folder.path("out"));
+    EXPECT_EQ(std::ptrdiff_t(2 * std::size(models)), std::distance(begin(files), end(files)));
 }
 
 // Fault caught: the same for names that the user gave, where there is no other to take.

@@ -132,7 +132,7 @@ TEST_F(ConvertTest, classicMaterials)
     ASSERT_TRUE(loaded);
     EXPECT_TRUE(reports("lost: texture \"nowhere.png\", which is not there")) << m_outcome.output;
     EXPECT_TRUE(m_folder.exists("out-a.png"));
-    EXPECT_TRUE(m_folder.exists("out-A-2.png"));
+    EXPECT_TRUE(m_folder.exists("out-A_2.png"));
     ASSERT_EQ(7u, loaded->getAppearances().size());
 
     Vector4f colour;

@@ -1,6 +1,7 @@
 #include "folder.h"
 
 #include "commandline/terminaltext.h"
+#include "convert/digest.h"
 #include "convert/files/filegate.h"
 #include "convert/lowercase.h"
 #include "convert/outputfiles.h"
@@ -48,15 +49,6 @@ struct Shared
     std::atomic<unsigned> unchanged{0};
     std::atomic<unsigned> failed{0};
 };
-
-/// Hash of bytes, the same on every machine (FNV-1a).
-uint64_t digest(const std::string& text)
-{
-    uint64_t value = 14695981039346656037u;
-    for (const char c : text)
-        value = (value ^ uint8_t(c)) * 1099511628211u;
-    return value;
-}
 
 /// Whether a name has a model's extension. Files that models refer to, such as materials, are not models.
 std::vector<Model> findModels(const FolderJob& job, std::string& error)

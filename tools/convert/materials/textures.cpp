@@ -1,10 +1,12 @@
 #include "textures.h"
 
+#include "convert/digest.h"
 #include "convert/lowercase.h"
 #include "convert/progress.h"
 
 #include <algorithm>
 #include <cctype>
+#include <cstdio>
 
 namespace convert
 {
@@ -77,7 +79,14 @@ std::string getShown(const std::string& path, const FoundPicture& picture)
 
 std::string getPictureStem(const std::string& stem)
 {
-    return makePlain(stem.substr(0, 100)) + "-";
+    std::string plain = makePlain(stem.substr(0, 100));
+    if (plain != stem)
+    {
+        char number[16];
+        std::snprintf(number, sizeof number, "_%08x", unsigned(digest(stem)));
+        plain += number;
+    }
+    return plain + "-";
 }
 
 TextureStore::TextureStore(const aiScene& scene, ModelFiles& files, const std::string& stem,
@@ -243,11 +252,13 @@ TextureStore::Size TextureStore::getFittingSize(int width, int height, bool repe
 
 std::string TextureStore::makeName(const std::string& name, const std::string& extension)
 {
-    const std::string wanted = m_stem + makePlain(name.substr(0, 100));
+    std::string picture = makePlain(name.substr(0, 100));
+    std::replace(picture.begin(), picture.end(), '-', '_'); // the last one ends the scene's name
+    const std::string wanted = m_stem + picture;
     std::string made = wanted;
     // Without the extension: the engine prefers a .pvr of the same name.
     for (int number = 2; !m_names.insert(toLowerCase(made)).second; ++number)
-        made = wanted + "-" + std::to_string(number);
+        made = wanted + "_" + std::to_string(number);
     return made + extension;
 }
 

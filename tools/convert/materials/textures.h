@@ -56,7 +56,8 @@ struct TextureUse
     bool isPowerOfTwo = true;    ///< both sides are
 };
 
-/// The prefix of the names of a scene's pictures.
+/// The prefix of the names of a scene's pictures, which no other scene's pictures have: it ends with the last '-' of the
+/// name, and a hash stands for what file names cannot hold.
 /// @param stem  the scene file's name without its extension.
 std::string getPictureStem(const std::string& stem);
 
