@@ -34,7 +34,8 @@ bool RenderBlockGroup::contains(const RenderBlockBase& other) const
 
 void RenderBlockGroup::removeBlock(const SharedPtr<RenderBlockBase>& block)
 {
-    std::replace(m_blocks.begin(), m_blocks.end(), block, SharedPtr<RenderBlockBase>());
+    const SharedPtr<RenderBlockBase> kept = block; // so that no destructor runs while the list changes
+    std::replace(m_blocks.begin(), m_blocks.end(), kept, SharedPtr<RenderBlockBase>());
     closeGaps();
 }
 
