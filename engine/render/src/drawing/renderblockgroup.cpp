@@ -3,6 +3,7 @@
 #include "orv/log.h"
 
 #include <algorithm>
+#include <utility>
 
 namespace orv
 {
@@ -34,8 +35,12 @@ bool RenderBlockGroup::contains(const RenderBlockBase& other) const
 
 void RenderBlockGroup::removeBlock(const SharedPtr<RenderBlockBase>& block)
 {
-    const SharedPtr<RenderBlockBase> kept = block; // so that no destructor runs while the list changes
-    std::replace(m_blocks.begin(), m_blocks.end(), kept, SharedPtr<RenderBlockBase>());
+    SharedPtr<RenderBlockBase> removed; // no destructor runs while the list changes
+    for (SharedPtr<RenderBlockBase>& each : m_blocks)
+    {
+        if (each == block)
+            removed = std::exchange(each, nullptr);
+    }
     closeGaps();
 }
 
