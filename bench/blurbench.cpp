@@ -6,13 +6,13 @@
 // "Driver" times are whole frames up to glFinish; for "alone" times every GL call is dropped, which leaves the engine's
 // own cost. Medians of many frames.
 
+#include "timing.h"
+
 #include "glcalls/glcalls.h"
 #include "headless/headless.h"
 
 #include <orv/orv.h>
 
-#include <algorithm>
-#include <chrono>
 #include <cstdio>
 #include <cstdlib>
 #include <vector>
@@ -150,18 +150,16 @@ private:
 
 double measureMedianMs(const Wall& wall, RenderBlockBase& frame)
 {
-    using Clock = std::chrono::steady_clock;
     std::vector<double> times;
     for (int i = 0; i < WARM_FRAMES + TIMED_FRAMES; ++i)
-    {
-        const Clock::time_point start = Clock::now();
-        wall.draw(frame, i + 1);
-        glFinish();
-        times.push_back(std::chrono::duration<double, std::milli>(Clock::now() - start).count());
-    }
+        times.push_back(measureMs(
+            [&]
+            {
+                wall.draw(frame, i + 1);
+                glFinish();
+            }));
     times.erase(times.begin(), times.begin() + WARM_FRAMES);
-    std::nth_element(times.begin(), times.begin() + TIMED_FRAMES / 2, times.end());
-    return times[TIMED_FRAMES / 2];
+    return getMedian(times);
 }
 
 void report(const char* name, const Wall& wall, RenderBlockBase& frame)

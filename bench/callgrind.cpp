@@ -1,4 +1,5 @@
 #include "callgrind.h"
+#include "timing.h"
 
 #include <unistd.h>
 #if __has_include(<valgrind/callgrind.h>)
@@ -70,8 +71,7 @@ std::vector<uint64_t> count(const std::string& arguments, const std::vector<std:
     const std::string command =
         "valgrind --tool=callgrind --instr-atstart=no --collect-atstart=no --toggle-collect=callgrindMeasure"
         " --dump-after=callgrindMeasure --compress-strings=no --compress-pos=no --callgrind-out-file='" +
-        output + "' '" + fs::read_symlink("/proc/self/exe").string() + "' " + arguments + " >'" + output +
-        ".log' 2>&1";
+        output + "' '" + getProgram() + "' " + arguments + " >'" + output + ".log' 2>&1";
     std::vector<uint64_t> counts;
     if (std::system(command.c_str()) == 0)
     {

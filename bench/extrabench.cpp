@@ -5,13 +5,13 @@
 // "Driver" times are whole frames up to glFinish; for "alone" times every GL call is dropped, which leaves the engine's
 // own cost. Medians.
 
+#include "timing.h"
+
 #include "glcalls/glcalls.h"
 #include "headless/headless.h"
 
 #include <orv/orv.h>
 
-#include <algorithm>
-#include <chrono>
 #include <cmath>
 #include <cstdio>
 #include <cstdlib>
@@ -35,21 +35,6 @@ constexpr int RAYS = 20001;
 {
     std::fprintf(stderr, "extrabench: %s\n", reason);
     std::exit(EXIT_FAILURE);
-}
-
-double getMedian(std::vector<double>& values)
-{
-    const auto middle = values.begin() + std::ptrdiff_t(values.size() / 2);
-    std::nth_element(values.begin(), middle, values.end());
-    return *middle;
-}
-
-template <class Work>
-double measureMs(const Work& work)
-{
-    const auto start = std::chrono::steady_clock::now();
-    work();
-    return std::chrono::duration<double, std::milli>(std::chrono::steady_clock::now() - start).count();
 }
 
 /// One line of the table: a frame's times, calls and draws.

@@ -8,6 +8,7 @@
 // depends on the size. "Heap peak" is the largest heap use of C++ code during a load, relative to the start.
 
 #include "callgrind.h"
+#include "timing.h"
 
 #include "glcalls/glcalls.h"
 #include "glo/glowriter.h"
@@ -31,7 +32,6 @@
 #include <unistd.h>
 
 #include <algorithm>
-#include <chrono>
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
@@ -265,23 +265,6 @@ std::unique_ptr<Scene> loadByEngine(AssetCachePool& pool, const File& file)
     return scene;
 }
 
-/// Without the time to drop what the work returns.
-template <class Work>
-double measureMs(Work work)
-{
-    using Clock = std::chrono::steady_clock;
-    const Clock::time_point start = Clock::now();
-    [[maybe_unused]] const auto result = work();
-    return std::chrono::duration<double, std::milli>(Clock::now() - start).count();
-}
-
-double getMedian(std::vector<double> times)
-{
-    const auto middle = times.begin() + std::ptrdiff_t(times.size() / 2);
-    std::nth_element(times.begin(), middle, times.end());
-    return *middle;
-}
-
 void printComparison(const char* what, const std::vector<double>& engineMs, const char* reference,
                      const std::vector<double>& referenceMs)
 {
@@ -370,11 +353,6 @@ void printLoadTimes(Work load)
     std::printf("%f %f\n", firstMs, getMedian(later));
 }
 
-std::string getProgram()
-{
-    return std::filesystem::read_symlink("/proc/self/exe").string();
-}
-
 LoadTimes measureLoads(const char* argument)
 {
     LoadTimes times;
@@ -420,7 +398,7 @@ void printInstructions()
                     static_cast<unsigned long long>(counts[0]), static_cast<unsigned long long>(counts[1]));
 }
 
-int start(const char* argument)
+void start(const char* argument)
 {
     const std::string self = getProgram();
     std::string copy = argument;
@@ -430,7 +408,6 @@ int start(const char* argument)
     if (posix_spawn(&child, self.c_str(), nullptr, nullptr, arguments, environ) != 0 ||
         waitpid(child, &status, 0) != child || status != 0)
         giveUp("the program does not start once more");
-    return status;
 }
 
 void compareStarts()
@@ -438,8 +415,8 @@ void compareStarts()
     std::vector<double> engine, bare;
     for (int i = 0; i < STARTS; ++i)
     {
-        engine.push_back(measureMs([] { return start(START_ENGINE); }));
-        bare.push_back(measureMs([] { return start(START_BARE); }));
+        engine.push_back(measureMs([] { start(START_ENGINE); }));
+        bare.push_back(measureMs([] { start(START_BARE); }));
     }
     printComparison("Start to first frame", engine, "context and one program", bare);
 }

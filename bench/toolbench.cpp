@@ -8,6 +8,8 @@
 // also applies libassimp's preset TargetRealtime_Quality. The difference between the first and the converter is the
 // converter's own work: normals, tangents, joining, ordering, textures and writing.
 
+#include "timing.h"
+
 #include "glo/glowriter.h"
 #include "headless/headless.h"
 #include "headless/png.h"
@@ -31,7 +33,6 @@
 #include <unistd.h>
 
 #include <algorithm>
-#include <chrono>
 #include <cmath>
 #include <cstdio>
 #include <cstdlib>
@@ -107,24 +108,17 @@ struct Times
     double median = 0.0;
 };
 
-Times measureMs(int runs, const std::vector<std::string>& command)
+Times measureRuns(int runs, const std::vector<std::string>& command)
 {
-    using Clock = std::chrono::steady_clock;
     std::vector<double> times;
     for (int i = 0; i < runs; ++i)
-    {
-        const Clock::time_point start = Clock::now();
-        if (run(command) != EXIT_SUCCESS)
-            giveUp(command[0] + " fails on " + command.back());
-        times.push_back(std::chrono::duration<double, std::milli>(Clock::now() - start).count());
-    }
-    std::sort(times.begin(), times.end());
-    return {times.front(), times[times.size() / 2]};
-}
-
-std::string findSelf()
-{
-    return fs::read_symlink("/proc/self/exe").string();
+        times.push_back(measureMs(
+            [&]
+            {
+                if (run(command) != EXIT_SUCCESS)
+                    giveUp(command[0] + " fails on " + command.back());
+            }));
+    return {*std::min_element(times.begin(), times.end()), getMedian(times)};
 }
 
 void compareConversions(const fs::path& models, const std::string& folder)
@@ -137,9 +131,9 @@ void compareConversions(const fs::path& models, const std::string& folder)
         const std::string path = (models / model).string();
         if (!fs::exists(path))
             continue;
-        const double plain = measureMs(CONVERSIONS, {findSelf(), READ, path}).median;
-        const double forDrawing = measureMs(CONVERSIONS, {findSelf(), READ_FOR_DRAWING, path}).median;
-        const double ours = measureMs(CONVERSIONS, {ORV_CONVERT, path, folder + "/model.glo"}).median;
+        const double plain = measureRuns(CONVERSIONS, {getProgram(), READ, path}).median;
+        const double forDrawing = measureRuns(CONVERSIONS, {getProgram(), READ_FOR_DRAWING, path}).median;
+        const double ours = measureRuns(CONVERSIONS, {ORV_CONVERT, path, folder + "/model.glo"}).median;
         std::printf("%-55s %8.1f %12.1f %8.1f %6.2f\n", model, plain, forDrawing, ours, ours / plain);
         read += plain;
         readForDrawing += forDrawing;
@@ -242,11 +236,11 @@ void measureViews(const std::string& folder)
     writeScene(folder + "/100000.glo", 500, 100);
     const std::string picture = folder + "/picture.png";
     print("10,000 triangles to PNG by orv-view, ms",
-          measureMs(STARTS, {ORV_VIEW, folder + "/10000.glo", "--out", picture}));
+          measureRuns(STARTS, {ORV_VIEW, folder + "/10000.glo", "--out", picture}));
     print("100,000 triangles to PNG by orv-view, ms",
-          measureMs(STARTS, {ORV_VIEW, folder + "/100000.glo", "--out", picture}));
+          measureRuns(STARTS, {ORV_VIEW, folder + "/100000.glo", "--out", picture}));
     print("100,000 triangles to first frame in a bare program, ms",
-          measureMs(STARTS, {findSelf(), DRAW, folder, "100000.glo"}));
+          measureRuns(STARTS, {getProgram(), DRAW, folder, "100000.glo"}));
 }
 
 int readModel(const char* path, unsigned steps)
