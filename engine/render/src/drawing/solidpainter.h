@@ -51,8 +51,7 @@ private:
     const ModelProjection m_modelProjection;
 
     // Of the previous solid; null forces all checks.
-    const void* m_material =
-        this; ///< whose values are sent; itself for none, since a solid may have no material
+    const void* m_material = this; ///< this forces all checks: null is that of a solid without one
     const ShaderProgram* m_program = nullptr;
     const Mesh* m_mesh = nullptr; ///< bound for m_program
     uint64_t m_revision = 0;      ///< the process's last revision when its material was ready
